@@ -6,6 +6,28 @@
 
 namespace fotomill {
 
+namespace {
+
+constexpr int32_t kLeastRows = 16;  // of a band
+
+// Replaces each pixel of a mask by a function of it and its coverage.
+template <typename Combine>
+Status ForCoverage(const Shape& shape, PackedImage& mask, const Work& work, Combine combine) {
+  const ShapeCoverage coverage(shape);
+  return ForBands(mask.Height(), kLeastRows, work, [&](int32_t first, int32_t end) {
+    for (int32_t y = first; y < end; ++y) {
+      const auto row = mask.Row(y);
+      for (int32_t x = 0; x < mask.Width(); ++x) {
+        uint8_t& pixel = row[static_cast<size_t>(x)];
+        pixel = combine(pixel, coverage.At(x, y));
+      }
+    }
+    return Status::Ok;
+  });
+}
+
+}  // namespace
+
 ShapeCoverage::ShapeCoverage(const Shape& shape)
     : shape_(shape),
       cosine_(std::cos(shape.angle * std::numbers::pi / 180)),
@@ -22,26 +44,15 @@ uint8_t ShapeCoverage::At(int32_t x, int32_t y) const {
   return static_cast<uint8_t>(std::floor(std::clamp(0.5 - distance, 0.0, 1.0) * 255 + 0.5));
 }
 
-void DrawShape(const Shape& shape, PackedImage& mask) {
-  const ShapeCoverage coverage(shape);
-  for (int32_t y = 0; y < mask.Height(); ++y) {
-    const auto row = mask.Row(y);
-    for (int32_t x = 0; x < mask.Width(); ++x) {
-      uint8_t& pixel = row[static_cast<size_t>(x)];
-      pixel = std::max(pixel, coverage.At(x, y));
-    }
-  }
+Status DrawShape(const Shape& shape, PackedImage& mask, const Work& work) {
+  return ForCoverage(shape, mask, work,
+                     [](uint8_t pixel, uint8_t cover) { return std::max(pixel, cover); });
 }
 
-void CutShape(const Shape& shape, PackedImage& mask) {
-  const ShapeCoverage coverage(shape);
-  for (int32_t y = 0; y < mask.Height(); ++y) {
-    const auto row = mask.Row(y);
-    for (int32_t x = 0; x < mask.Width(); ++x) {
-      uint8_t& pixel = row[static_cast<size_t>(x)];
-      pixel = std::min(pixel, static_cast<uint8_t>(255 - coverage.At(x, y)));
-    }
-  }
+Status CutShape(const Shape& shape, PackedImage& mask, const Work& work) {
+  return ForCoverage(shape, mask, work, [](uint8_t pixel, uint8_t cover) {
+    return std::min(pixel, static_cast<uint8_t>(255 - cover));
+  });
 }
 
 }  // namespace fotomill

@@ -3,6 +3,7 @@
 #include <cstdint>
 
 #include "picture/packed_image.h"
+#include "processing/bands.h"
 
 namespace fotomill {
 
@@ -27,8 +28,9 @@ class ShapeCoverage {
 };
 
 // Adds a shape to an alpha plane: each pixel becomes the maximum of its value and its coverage.
-void DrawShape(const Shape& shape, PackedImage& mask);
-// Removes a shape from an alpha plane.
-void CutShape(const Shape& shape, PackedImage& mask);
+// Statuses as ForBands.
+Status DrawShape(const Shape& shape, PackedImage& mask, const Work& work = {});
+// Removes a shape from an alpha plane. Statuses as ForBands.
+Status CutShape(const Shape& shape, PackedImage& mask, const Work& work = {});
 
 }  // namespace fotomill

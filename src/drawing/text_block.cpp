@@ -5,13 +5,12 @@
 #include <numbers>
 #include <string>
 
-#include "core/utf8.h"
+#include "drawing/text_shaping.h"
 
 namespace fotomill {
 
 namespace {
 
-constexpr char32_t kUnknown = 0xFFFD;
 constexpr double kFraction = 64;
 
 // Whether a line may be broken before and after a non-blank character.
@@ -21,67 +20,76 @@ bool IsIdeograph(char32_t c) {
          (c >= 0x20000 && c <= 0x3FFFF);
 }
 
-std::string_view WithoutBlanksBehind(std::string_view text) {
-  while (text.ends_with(' ')) text.remove_suffix(1);
-  return text;
+// The length of a text without the blanks at its end.
+size_t LengthWithoutBlanks(std::u32string_view text) {
+  const size_t last = text.find_last_not_of(U' ');
+  return last == std::u32string_view::npos ? 0 : last + 1;
 }
 
-// The bytes up to the next line break opportunity: a word with the blanks after it,
-// or an ideograph.
-size_t PieceLength(std::string_view text) {
-  std::string_view rest = text;
-  bool blank = false;
-  while (!rest.empty()) {
-    std::string_view behind = rest;
-    const char32_t c = NextCharacter(behind, kUnknown);
-    const bool first = rest.size() == text.size();
-    if (c != ' ' && (blank || (!first && IsIdeograph(c)))) break;
-    blank = blank || c == ' ';
-    rest = behind;
-    if (IsIdeograph(c) && !rest.starts_with(' ')) break;
-  }
-  return text.size() - rest.size();
+// Whether a line may be broken before a character: after the blanks that follow a word, and on
+// both sides of an ideograph.
+bool MayBreak(std::u32string_view text, size_t place) {
+  const char32_t before = text[place - 1], behind = text[place];
+  return behind != ' ' && (before == ' ' || IsIdeograph(before) || IsIdeograph(behind));
 }
 
+// Breaks paragraphs into lines.
 class Breaker {
  public:
   Breaker(TextFont& font, const TextLayout& layout) : font_(font), layout_(layout) {}
 
-  void Add(std::string_view line) {
-    if (line.empty()) return Put(line);
-    size_t taken = 0;
-    while (taken < line.size()) {
-      const size_t more = PieceLength(line.substr(taken));
-      if (Fits(line.substr(0, taken + more))) {
-        taken += more;
-        continue;
-      }
-      if (taken == 0) taken = LongestStart(line.substr(0, more));
-      Put(WithoutBlanksBehind(line.substr(0, taken)));
-      line.remove_prefix(taken);
-      taken = 0;
-    }
-    if (!line.empty()) Put(line);
+  void Add(std::string_view text) {
+    const TextParagraph paragraph = ReadParagraph(text);
+    const size_t end = paragraph.characters.size();
+    size_t start = 0;
+    do {
+      const size_t next = NextBreak(paragraph, start);
+      const std::u32string_view line =
+          std::u32string_view(paragraph.characters).substr(start, next - start);
+      const size_t length = next < end ? LengthWithoutBlanks(line) : line.size();
+      lines_.push_back(font_.Shape(paragraph, start, length, layout_.spacing));
+      start = next;
+    } while (start < end);
   }
   std::vector<TextLine> Take() { return std::move(lines_); }
 
  private:
-  bool Fits(std::string_view text) {
+  // The end of the line that begins at `start`, blanks included.
+  size_t NextBreak(const TextParagraph& paragraph, size_t start) {
+    const std::u32string_view text = paragraph.characters;
+    const size_t fitting = LongestStart(paragraph, start);
+    if (fitting == text.size()) return fitting;
+    size_t end = fitting;
+    while (end < text.size() && text[end] == ' ') ++end;  // blanks may stick out
+    for (; end > start; --end) {
+      if (end < text.size() && !MayBreak(text, end)) continue;
+      if (Fits(paragraph, start, end)) return end;
+    }
+    return std::max(fitting, start + 1);
+  }
+
+  // The end of the longest text that fits, found by doubling and bisection: shaping all of a long
+  // paragraph for every line would take quadratic time.
+  size_t LongestStart(const TextParagraph& paragraph, size_t start) {
+    const size_t left = paragraph.characters.size() - start;
+    size_t fits = 0, tried = std::min<size_t>(left, 16);
+    while (fits < left && Fits(paragraph, start, start + tried)) {
+      fits = tried;
+      tried = std::min(2 * tried, left);
+    }
+    for (size_t beyond = tried; fits + 1 < beyond;) {
+      const size_t middle = (fits + beyond) / 2;
+      (Fits(paragraph, start, start + middle) ? fits : beyond) = middle;
+    }
+    return start + fits;
+  }
+
+  bool Fits(const TextParagraph& paragraph, size_t start, size_t end) {
     if (layout_.width <= 0) return true;
-    const TextLine line = font_.Shape(WithoutBlanksBehind(text), layout_.spacing);
+    const auto text = std::u32string_view(paragraph.characters).substr(start, end - start);
+    const TextLine line = font_.Shape(paragraph, start, LengthWithoutBlanks(text), layout_.spacing);
     return line.width <= layout_.width * kFraction;
   }
-  // As many characters as fit, at least one.
-  size_t LongestStart(std::string_view word) {
-    size_t length = 0;
-    for (std::string_view rest = word; !rest.empty();) {
-      (void)NextCharacter(rest, kUnknown);
-      if (length > 0 && !Fits(word.substr(0, word.size() - rest.size()))) break;
-      length = word.size() - rest.size();
-    }
-    return length;
-  }
-  void Put(std::string_view line) { lines_.push_back(font_.Shape(line, layout_.spacing)); }
 
   TextFont& font_;
   const TextLayout& layout_;
@@ -108,7 +116,7 @@ TextBlock LayOutText(TextFont& font, std::string_view text, const TextLayout& la
 }
 
 Status DrawTextBlock(const TextFont& font, const TextBlock& block, const LinePlace& center,
-                     PackedImage& mask) {
+                     PackedImage& mask, const Work& work) {
   const double radians = center.angle * std::numbers::pi / 180, cosine = std::cos(radians),
                sine = std::sin(radians);
   const double left = -block.width / 2, top = -block.height / 2;
@@ -122,7 +130,7 @@ Status DrawTextBlock(const TextFont& font, const TextBlock& block, const LinePla
     place.x = center.x + across * cosine - down * sine;
     place.y = center.y + across * sine + down * cosine;
     if (center.angle == 0) place.y = std::round(place.y);
-    RETURN_IF_BAD(font.Draw(block.lines[i], place, mask));
+    RETURN_IF_BAD(font.Draw(block.lines[i], place, mask, work));
   }
   return Status::Ok;
 }

@@ -35,8 +35,8 @@ struct TextBlock {
 TextBlock LayOutText(TextFont& font, std::string_view text, const TextLayout& layout);
 
 // Draws a block centered at (x, y) of a mask, rotated about that point by `angle` degrees
-// clockwise; `stroke` as in LinePlace. MemoryAllocationError.
+// clockwise; `stroke` as in LinePlace. Statuses as DrawLine.
 Status DrawTextBlock(const TextFont& font, const TextBlock& block, const LinePlace& center,
-                     PackedImage& mask);
+                     PackedImage& mask, const Work& work = {});
 
 }  // namespace fotomill

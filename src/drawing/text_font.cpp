@@ -29,11 +29,18 @@ double TextFont::Ascent() const { return fonts_->Ascent(); }
 double TextFont::LineHeight() const { return fonts_->Ascent() + fonts_->Descent(); }
 
 TextLine TextFont::Shape(std::string_view text, double spacing) {
-  return ShapeLine(*fonts_, text, spacing);
+  const TextParagraph paragraph = ReadParagraph(text);
+  return ShapeLine(*fonts_, paragraph, 0, paragraph.characters.size(), spacing);
 }
 
-Status TextFont::Draw(const TextLine& line, const LinePlace& place, PackedImage& mask) const {
-  return DrawLine(*fonts_, line, place, mask);
+TextLine TextFont::Shape(const TextParagraph& paragraph, size_t start, size_t count,
+                         double spacing) {
+  return ShapeLine(*fonts_, paragraph, start, count, spacing);
+}
+
+Status TextFont::Draw(const TextLine& line, const LinePlace& place, PackedImage& mask,
+                      const Work& work) const {
+  return DrawLine(*fonts_, line, place, mask, work);
 }
 
 int32_t TextFont::WidthOf(std::string_view text) { return (Shape(text).width + 63) >> 6; }

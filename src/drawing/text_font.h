@@ -9,6 +9,7 @@
 #include "drawing/text_line.h"
 #include "picture/packed_image.h"
 #include "picture/rectangle.h"
+#include "processing/bands.h"
 
 namespace fotomill {
 
@@ -34,15 +35,18 @@ class TextFont {
   double Ascent() const;      // pixels above the baseline
   double LineHeight() const;  // from the top of the tallest letters to the deepest bottom
 
-  // A line of text, see ShapeLine.
+  // A text as one line, see ShapeLine. `spacing` pixels are added after each character.
   TextLine Shape(std::string_view text, double spacing = 0);
+  // `count` characters of a paragraph from `start` on as a line.
+  TextLine Shape(const TextParagraph& paragraph, size_t start, size_t count, double spacing);
   // Width of a text in pixels.
   int32_t WidthOf(std::string_view text);
   // The text, with an ellipsis replacing its end if it is wider than `width`.
   std::string Fitted(std::string_view text, int32_t width);
 
   // Adds a line to a mask, see DrawLine.
-  Status Draw(const TextLine& line, const LinePlace& place, PackedImage& mask) const;
+  Status Draw(const TextLine& line, const LinePlace& place, PackedImage& mask,
+              const Work& work = {}) const;
   // Draws one line onto a 24-bit image: centered horizontally in `band`, at its top, anti-aliased
   // and clipped to the band. MemoryAllocationError.
   Status DrawCentered(PackedImage& image, const Rectangle& band, std::string_view text,

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <string>
 #include <vector>
 
 namespace fotomill {
@@ -17,6 +18,12 @@ struct PlacedGlyph {
 struct TextLine {
   std::vector<PlacedGlyph> glyphs;
   int32_t width = 0;  // 64ths of a pixel
+};
+
+// A text without line feeds, to be shaped in one or more lines, which all have its direction.
+struct TextParagraph {
+  std::u32string characters;   // controls and invalid UTF-8 are U+FFFD, tabs are spaces
+  std::vector<int8_t> levels;  // embedding level of each character; odd: right to left
 };
 
 // Position and style of a line.

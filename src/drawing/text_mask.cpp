@@ -155,9 +155,12 @@ class LineDrawing {
 }  // namespace
 
 Status DrawLine(const FontFaces& fonts, const TextLine& line, const LinePlace& place,
-                PackedImage& mask) {
+                PackedImage& mask, const Work& work) {
   LineDrawing drawing(fonts, place, mask);
-  for (const PlacedGlyph& glyph : line.glyphs) RETURN_IF_BAD(drawing.Draw(glyph));
+  for (const PlacedGlyph& glyph : line.glyphs) {
+    if (!work.GoesOn()) return Status::FunctionCancelled;
+    RETURN_IF_BAD(drawing.Draw(glyph));
+  }
   return Status::Ok;
 }
 

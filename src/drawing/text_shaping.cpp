@@ -21,7 +21,7 @@ struct TextRun {
   size_t start, count;
   size_t face;
   hb_script_t script;
-  FriBidiLevel level;
+  int8_t level;
 };
 
 std::u32string Characters(std::string_view text) {
@@ -34,27 +34,31 @@ std::u32string Characters(std::string_view text) {
   return characters;
 }
 
-std::vector<FriBidiLevel> Levels(const std::u32string& text) {
+std::vector<int8_t> Levels(const std::u32string& text) {
+  static_assert(sizeof(FriBidiLevel) == sizeof(int8_t));
   const auto count = static_cast<FriBidiStrIndex>(text.size());
   const std::vector<FriBidiChar> characters(text.begin(), text.end());
   std::vector<FriBidiCharType> types(text.size());
   std::vector<FriBidiBracketType> brackets(text.size());
-  std::vector<FriBidiLevel> levels(text.size());
+  std::vector<int8_t> levels(text.size());
   fribidi_get_bidi_types(characters.data(), count, types.data());
   fribidi_get_bracket_types(characters.data(), count, types.data(), brackets.data());
   FriBidiParType direction = FRIBIDI_PAR_ON;
   if (fribidi_get_par_embedding_levels_ex(types.data(), brackets.data(), count, &direction,
                                           levels.data()) == 0)
-    std::ranges::fill(levels, FriBidiLevel{0});
+    std::ranges::fill(levels, int8_t{0});
   return levels;
 }
 
 class Shaper {
  public:
-  Shaper(FontFaces& fonts, std::string_view text, double spacing)
+  Shaper(FontFaces& fonts, const TextParagraph& paragraph, size_t start, size_t count,
+         double spacing)
       : fonts_(fonts),
         shaping_(*LoadedHarfBuzz()),
-        text_(Characters(text)),
+        paragraph_(paragraph),
+        text_(std::u32string_view(paragraph.characters).substr(start, count)),
+        start_(start),
         spacing_(static_cast<int32_t>(std::lround(spacing * kFraction))) {}
 
   TextLine Shape() {
@@ -98,7 +102,7 @@ class Shaper {
   }
 
   std::vector<TextRun> Runs() {
-    const std::vector<FriBidiLevel> levels = Levels(text_);
+    const int8_t* const levels = paragraph_.levels.data() + start_;
     const std::vector<hb_script_t> scripts = Scripts();
     std::vector<TextRun> runs;
     for (size_t i = 0, end = 0; i < text_.size(); i = end) {
@@ -118,9 +122,9 @@ class Shaper {
   // Rule L2: from the highest level down to the lowest odd one, reverses all runs at that
   // level or higher.
   static void OrderRuns(std::vector<TextRun>& runs) {
-    FriBidiLevel highest = 0;
+    int8_t highest = 0;
     for (const TextRun& run : runs) highest = std::max(highest, run.level);
-    for (FriBidiLevel level = highest; level > 0; --level) {
+    for (int8_t level = highest; level > 0; --level) {
       for (size_t i = 0; i < runs.size(); ++i) {
         size_t end = i;
         while (end < runs.size() && runs[end].level >= level) ++end;
@@ -134,9 +138,11 @@ class Shaper {
   void ShapeRun(const TextRun& run) {
     hb_buffer_t* const buffer = buffer_.get();
     shaping_.hb_buffer_clear_contents(buffer);
-    shaping_.hb_buffer_add_utf32(buffer, reinterpret_cast<const uint32_t*>(text_.data()),
-                                 static_cast<int>(text_.size()),
-                                 static_cast<unsigned>(run.start), static_cast<int>(run.count));
+    // all of the paragraph, as letters join those beyond a run
+    const std::u32string& all = paragraph_.characters;
+    shaping_.hb_buffer_add_utf32(
+        buffer, reinterpret_cast<const uint32_t*>(all.data()), static_cast<int>(all.size()),
+        static_cast<unsigned>(start_ + run.start), static_cast<int>(run.count));
     shaping_.hb_buffer_set_direction(buffer,
                                      run.level % 2 != 0 ? HB_DIRECTION_RTL : HB_DIRECTION_LTR);
     shaping_.hb_buffer_set_script(buffer, run.script);
@@ -163,7 +169,9 @@ class Shaper {
   };
   FontFaces& fonts_;
   const HarfBuzz& shaping_;
-  const std::u32string text_;
+  const TextParagraph& paragraph_;
+  const std::u32string_view text_;  // of the line
+  const size_t start_;              // of the line in the paragraph
   const int32_t spacing_;
   std::unique_ptr<hb_buffer_t, BufferDeleter> buffer_;
   int32_t pen_ = 0;
@@ -172,8 +180,15 @@ class Shaper {
 
 }  // namespace
 
-TextLine ShapeLine(FontFaces& fonts, std::string_view text, double spacing) {
-  return Shaper(fonts, text, spacing).Shape();
+TextParagraph ReadParagraph(std::string_view text) {
+  TextParagraph paragraph{.characters = Characters(text), .levels = {}};
+  paragraph.levels = Levels(paragraph.characters);
+  return paragraph;
+}
+
+TextLine ShapeLine(FontFaces& fonts, const TextParagraph& paragraph, size_t start, size_t count,
+                   double spacing) {
+  return Shaper(fonts, paragraph, start, count, spacing).Shape();
 }
 
 }  // namespace fotomill

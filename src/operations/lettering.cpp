@@ -89,16 +89,13 @@ Status LetteringDrawing::Draw(double x, double y, const Work& work, PictureRecor
   inner.width -= 2 * lettering_.frame;
   inner.height -= 2 * lettering_.frame;
   const auto letters = [&](double away, double stroke) {
-    return DrawTextBlock(font_, block_, {x + away, y + away, lettering_.rotation, stroke}, mask);
+    return DrawTextBlock(font_, block_, {x + away, y + away, lettering_.rotation, stroke}, mask,
+                         work);
   };
-  const auto box = [&] {
-    DrawShape(outer, mask);
-    return Status::Ok;
-  };
+  const auto box = [&] { return DrawShape(outer, mask, work); };
   const auto frame = [&] {
-    DrawShape(outer, mask);
-    CutShape(inner, mask);
-    return Status::Ok;
+    const Status drawn = DrawShape(outer, mask, work);
+    return drawn == Status::Ok ? CutShape(inner, mask, work) : drawn;
   };
   const auto shadow = [&] {
     const Status drawn = letters(lettering_.shadow, 0);

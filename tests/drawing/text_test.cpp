@@ -165,6 +165,52 @@ TEST(TextBlock, BreaksLinesWhereTheyMayEnd) {
   EXPECT_EQ(two.height, one.height + one.step + 7);
 }
 
+TEST(TextBlock, KeepsTheDirectionOfAParagraph) {
+  TextFont font;
+  ASSERT_EQ(font.Open(kFont, 20), Status::Ok);
+  const auto alef = Glyphs(font, "א"), bet = Glyphs(font, "ב"), blank = Glyphs(font, " "),
+             a = Glyphs(font, "a"), stop = Glyphs(font, ".");
+  const double width = font.Shape("a אבא.").width / 64.0 + 1;
+  const struct {
+    const char* name;
+    const char* text;
+    std::vector<std::vector<uint32_t>> lines;
+  } rows[] = {
+      {"a line that begins with a Latin word",
+       "אבאבא a אב.",
+       {Joined({alef, bet, alef, bet, alef}), Joined({stop, bet, alef, blank, a})}},
+      {"Hebrew within Latin",
+       "aaaaa אב a.",
+       {Joined({a, a, a, a, a}), Joined({bet, alef, blank, a, stop})}},
+      {"each paragraph for itself",
+       "אב a\na אב",
+       {Joined({a, blank, bet, alef}), Joined({a, blank, bet, alef})}},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    const TextBlock block = LayOutText(font, row.text, {.width = width});
+    ASSERT_EQ(block.lines.size(), row.lines.size());
+    for (size_t i = 0; i < row.lines.size(); ++i) {
+      std::vector<uint32_t> glyphs;
+      for (const PlacedGlyph& glyph : block.lines[i].glyphs) glyphs.push_back(glyph.glyph);
+      EXPECT_EQ(glyphs, row.lines[i]) << i;
+    }
+  }
+}
+
+TEST(TextBlock, StopsBetweenLetters) {
+  TextFont font;
+  ASSERT_EQ(font.Open(kFont, 20), Status::Ok);
+  PackedImage mask;
+  ASSERT_EQ(NewAlphaPlane(200, 25, mask), Status::Ok);
+  int left = 5;  // letters
+  const Work work{.goesOn = [&] { return left-- > 0; }};
+  EXPECT_EQ(DrawTextBlock(font, LayOutText(font, "HHHHHHHH", {}), {100, 12, 0, 0}, mask, work),
+            Status::FunctionCancelled);
+  EXPECT_EQ(left, -1);
+  EXPECT_EQ(DrawShape({100, 12, 50, 10}, mask, work), Status::FunctionCancelled);
+}
+
 TEST(TextBlock, AlignsLines) {
   TextFont font;
   ASSERT_EQ(font.Open(kFont, 20), Status::Ok);
@@ -184,16 +230,16 @@ TEST(TextBlock, AlignsLines) {
 TEST(ShapeMask, CoversWhatItShould) {
   PackedImage mask;
   ASSERT_EQ(NewAlphaPlane(60, 50, mask), Status::Ok);
-  DrawShape({30, 25, 40, 20}, mask);
+  ASSERT_EQ(DrawShape({30, 25, 40, 20}, mask), Status::Ok);
   EXPECT_EQ(InkOf(mask).bounds, (Rectangle{10, 15, 40, 20}));
   EXPECT_EQ(InkOf(mask).pixels, 800) << "edges along pixels are sharp";
-  CutShape({30, 25, 36, 16}, mask);
+  ASSERT_EQ(CutShape({30, 25, 36, 16}, mask), Status::Ok);
   EXPECT_EQ(InkOf(mask).pixels, 800 - 36 * 16);
   ASSERT_EQ(NewAlphaPlane(60, 50, mask), Status::Ok);
-  DrawShape({30, 25, 40, 20, 30, 0}, mask);
+  ASSERT_EQ(DrawShape({30, 25, 40, 20, 30, 0}, mask), Status::Ok);
   EXPECT_NEAR(InkOf(mask).pixels, 800, 8) << "turned";
   ASSERT_EQ(NewAlphaPlane(60, 50, mask), Status::Ok);
-  DrawShape({30, 25, 40, 20, 0, 8}, mask);
+  ASSERT_EQ(DrawShape({30, 25, 40, 20, 0, 8}, mask), Status::Ok);
   EXPECT_NEAR(InkOf(mask).pixels, 800 - (4 - std::numbers::pi) * 64, 2) << "with round corners";
 }
 

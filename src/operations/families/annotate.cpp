@@ -129,7 +129,7 @@ Status Caption(PictureRecord& picture, const Arguments& arguments,
   const double room = std::max((style.layout.width - block.width) / 2, 0.0);
   const double aside[] = {-room, 0, room};
   const double x = whole.width / 2.0 + aside[arguments.Choice("align")];
-  RETURN_IF_BAD(DrawTextBlock(font, block, {x, rows / 2, 0, 0}, mask));
+  RETURN_IF_BAD(DrawTextBlock(font, block, {x, rows / 2, 0, 0}, mask, context.work));
   return PaintThroughMask(picture, mask, 0, top, ink);
 }
 
