@@ -1,16 +1,16 @@
-# The libraries that decode and encode pictures and draw text, as `image_libraries` and `image_include_folders`, and which of
-# them are in the program and which it loads, for the program's own list: `linked_libraries`, NAME=VERSION=inside|shared.
+# The libraries for decoding and encoding pictures and drawing text, as `image_libraries` and `image_include_folders`, and
+# for the program's own list which are linked and how: `linked_libraries`, NAME=VERSION=inside|shared.
 #
-# They are linked statically where the system has them so: loading them would cost every run, and most runs need none.
-# Which archives a static library needs in turn differs between releases; pkg-config knows. Where an archive is missing, or
-# the static set does not link, the shared libraries serve.
+# They are linked statically if the system has static libraries: loading them would slow down every run, and most runs need
+# none. The dependencies of static libraries differ between releases; pkg-config knows them. If an archive is missing, or
+# static linking fails, shared libraries are used.
 find_package(PkgConfig REQUIRED)
 pkg_check_modules(IMAGES REQUIRED libtiff-4 libwebp libjpeg libpng lcms2 freetype2 fribidi libdeflate zlib)
-# Only headers: both are loaded when the first text is drawn.
+# Headers only: both are loaded when text is first drawn.
 pkg_check_modules(TEXTS REQUIRED harfbuzz fontconfig)
 set(image_include_folders ${IMAGES_INCLUDE_DIRS} ${TEXTS_INCLUDE_DIRS})
 
-set(c_library_parts c m pthread dl rt stdc++ gcc_s)  # never from an archive in a program that loads the C library
+set(c_library_parts c m pthread dl rt stdc++ gcc_s)  # never linked statically, as the program loads the shared C library
 set(static_set "")
 foreach(name IN LISTS IMAGES_STATIC_LIBRARIES)
   set(item ${name})

@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""apply: several outputs of one decode, files of a certain size, and pictures that are decoded smaller."""
+"""apply: several outputs of one decode, files of a given size, and reduced-size decoding."""
 import json
 import os
 import subprocess
@@ -18,7 +18,7 @@ faults = []
 
 
 def photo(width, height):
-    """Slopes with texture, as a camera sees them."""
+    """Gradients with texture, like a photograph."""
     texture = Image.effect_noise((width // 4, height // 4), 40).resize((width, height), Image.Resampling.BICUBIC)
     slope = Image.linear_gradient("L").resize((width, height))
     return Image.merge("RGB", (slope, texture, ImageChops.add(slope, texture, 2)))
@@ -62,7 +62,7 @@ def limits(work):
 
 
 def reduced(work):
-    """What is decoded smaller is within 3 levels of what is not; a first step that changes nothing keeps it from being so."""
+    """Reduced-size decoding differs by at most 3 levels; a no-op as first step prevents it."""
     for source in ("a.jpg", "odd.jpg", "turned.jpg"):
         for line in ("resize 300", "resize 12%", "resize 200x200 fill", "resize 250x80 stretch filter=lanczos3", "resize 100 filter=mitchell"):
             pictures = []
@@ -78,7 +78,7 @@ def reduced(work):
 
 
 def hints(work):
-    """What operations lack is named, and the text of a macro is not read as one of the recipe."""
+    """Missing resources of operations are named, and a macro's text is not parsed as a recipe."""
     (work / "fonts.conf").write_text("<fontconfig></fontconfig>")
     for steps, text in (("text x", "No font was found"), ("output a\n  caption x", "No font was found")):
         environment = dict(os.environ, LC_ALL="C", FONTCONFIG_FILE=str(work / "fonts.conf"))

@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""What a picture says of itself beside its pixels goes along, or the pixels are changed so that it looks the same. Pillow judges."""
+"""Metadata is kept, or the pixels are converted so that the picture looks the same. Pillow is the reference."""
 import json
 import os
 import subprocess
@@ -30,7 +30,7 @@ def run(*arguments):
 
 
 def scene(width=64, height=48):
-    """A picture without symmetry, smooth enough for JPEG."""
+    """An asymmetric picture, smooth enough for JPEG."""
     picture = Image.new("RGB", (width, height))
     picture.putdata([(x * 255 // width, y * 255 // height,
                       (x + 2 * y) * 255 // (width + 2 * height)) for y in range(height)
@@ -39,7 +39,7 @@ def scene(width=64, height=48):
 
 
 def difference(a, b):
-    """The largest difference of two pictures' samples; 999 for those of different sizes."""
+    """The maximum difference between two pictures' samples; 999 if the sizes differ."""
     a, b = a.convert("RGB"), b.convert("RGB")
     if a.size != b.size:
         return 999
@@ -54,7 +54,7 @@ def exif(orientation):
 
 
 def wide_profile():
-    """An RGB profile far from sRGB: the sRGB one with red and green exchanged."""
+    """An RGB profile far from sRGB: sRGB with red and green exchanged."""
     profile = bytearray(ImageCms.ImageCmsProfile(ImageCms.createProfile("sRGB")).tobytes())
     count = int.from_bytes(profile[128:132], "big")
     entries = {bytes(profile[132 + 12 * i:136 + 12 * i]): 132 + 12 * i for i in range(count)}
@@ -73,7 +73,7 @@ def orientations(folder):
             made = folder / f"turned{tag}.{format_}"
             run("convert", source, "-o", made, "--reduce", "--overwrite", "replace")
             seen = Image.open(made)
-            seen.load()  # Pillow turns TIFF pictures upright by itself
+            seen.load()  # Pillow rotates TIFF pictures upright by itself
             seen = seen if format_ == "tif" else ImageOps.exif_transpose(seen)
             limit = {"gif": 90, "webp": 60}.get(format_, 2)
             check(difference(seen, upright) <= limit,
@@ -91,7 +91,7 @@ def orientations(folder):
                 run(*keys, "-o", made, "--overwrite", "replace")
                 picture = Image.open(made)
                 check(not picture.getexif(), f"{keys[1]} to {format_} leaves no EXIF")
-                # decoders round rows and columns in different ways
+                # decoders round rows and columns differently
                 limit = 4 if "strip" in keys and format_ == "jpg" else 12
                 check(difference(picture, upright) <= limit, 
                       f"strip turns {tag} upright in {format_}: {difference(picture, upright)}")
@@ -149,7 +149,7 @@ def profiles(folder):
         folder / "wide.icc")
     check(Image.open(folder / "graygiven.png").info.get("icc_profile") == wide,
           "gray pictures take an RGB profile too")
-    # a profile of inks does not go into a picture of light
+    # ink profiles do not fit RGB pictures
     ink = Image.new("CMYK", (16, 16), (0, 128, 128, 0))
     fake = bytearray(wide)
     fake[16:20] = b"CMYK"
@@ -204,7 +204,7 @@ def pixels_of(path):
 
 
 def strips(folder):
-    """--metadata strip drops segments and encodes nothing again."""
+    """--metadata strip removes segments without encoding again."""
     wide = wide_profile()
     block = exif(1)
     block[0x8298] = "Copyright SECRET"
@@ -248,13 +248,13 @@ def strips(folder):
                 check(difference(before, after) == 0, f"page {page} of {source.name}")
         shrinks = made.stat().st_size < source.stat().st_size
         check(shrinks or (source.suffix == ".tif" and made.stat().st_size == source.stat().st_size), f"{source.name} gets smaller")
-    # what asks for more is encoded
+    # requests beyond that are encoded
     for more in (["--quality", "30"], ["--profile", "srgb"], ["--page", "1"]):
         source = folder / ("bare.tif" if more[0] == "--page" else "bare.jpg")
         made = folder / "out2" / source.name
         run("convert", source, "-o", made, "--metadata", "strip", "--overwrite", "replace", *more)
         check(pixels_of(made) != pixels_of(source), f"{more} encodes")
-    # turned without loss where that can be, else with the source's own quality
+    # rotated losslessly if possible, else with the source's own quality
     for size, exact in (((64, 48), True), ((61, 45), False)):
         source, made = folder / "camera.jpg", folder / "turned.jpg"
         scene(*size).save(source, quality=93, exif=exif(6))
@@ -266,7 +266,7 @@ def strips(folder):
             tables = [sorted(table) for p in (picture, Image.open(source)) for table in p.quantization.values()]
             check(len(tables) == 4 and tables[:2] == tables[2:], "with its own quality")
         check(("encoded again" in result.stderr) == (not exact), f"it says so: {result.stderr}")
-    # a 16-bit TIFF with an orientation keeps tag and depth
+    # a 16-bit TIFF with an orientation keeps tag and bit depth
     Image.frombytes("I;16", (16, 8), bytes(range(256))).save(folder / "deep.tif", tiffinfo={274: 6, 270: "SECRET"})
     run("convert", folder / "deep.tif", "-o", folder / "out" / "deep.tif", "--metadata", "strip")
     with Image.open(folder / "out" / "deep.tif") as picture:
@@ -341,7 +341,7 @@ def salvages(folder):
     for name, options in (("cut.jpg", {"quality": 95}), ("steps.jpg", {"quality": 95, "progressive": True}), ("cut.png", {}), ("cut.gif", {"interlace": 0}),
                           ("cut.bmp", {}), ("cut.webp", {"quality": 90}), ("lossless.webp", {"lossless": True}), ("cut.pcx", {}), ("cut.tga", {}), ("runs.tga", {"compression": "tga_rle"})):
         whole.save(folder / name, **options)
-    # TIFF with its directory in front, as scanners write it
+    # TIFF that starts with its directory, as written by scanners
     subprocess.run(["convert", folder / "cut.bmp", "-define", "tiff:rows-per-strip=8", "-compress", "None", folder / "behind.tif"], check=False, stderr=subprocess.DEVNULL)
     strips_ = b"".join(whole.crop((0, y, 200, y + 8)).tobytes() for y in range(0, 160, 8))
     entries = [(256, 4, 1, 200), (257, 4, 1, 160), (258, 3, 1, 8), (259, 3, 1, 1), (262, 3, 1, 2), (273, 4, 20, 300), (277, 3, 1, 3), (278, 4, 1, 8), (279, 4, 20, 400)]
@@ -375,7 +375,7 @@ def salvages(folder):
         check(result.returncode == 0 and "only a part is shown" in result.stderr, f"{name} is drawn small: {result.stderr}")
         result = run("thumbs", "make", "--force", path)
         check(result.returncode == 0 and "only a part is shown" in result.stderr, f"{name} gets a thumbnail: {result.stderr}")
-        # nothing of the pixels: nothing to salvage
+        # no pixels: nothing to salvage
         path.write_bytes(data[:len(data) // 100 if name != "cut.tif" else 300])
         result = run("convert", path, "-o", made, "--overwrite", "replace", "--salvage")
         check(result.returncode in (0, 1) and not result.stderr.startswith("Traceback"), f"{name} without pixels: {result.returncode}")
@@ -385,7 +385,7 @@ def salvages(folder):
 def codecs(folder):
     import io
     import struct
-    # gray pixels in the first JPEG form of TIFF
+    # gray pixels in old-style JPEG in TIFF
     gray = scene().convert("L")
     stream = io.BytesIO()
     gray.save(stream, "JPEG", quality=90)
@@ -412,7 +412,7 @@ def codecs(folder):
 
 
 def frames_of(path):
-    """Composed frames with their delays, and how often they are played."""
+    """Composed frames with their delays, and the number of loops."""
     with Image.open(path) as picture:
         frames = []
         for i in range(getattr(picture, "n_frames", 1)):
@@ -462,14 +462,14 @@ def animations(folder):
                     check(played in (wanted, loop, loop + 1, loop - 1), f"{what}: played {plays}")
                     worst = max(far(a, b) for (a, _), b in zip(after, frames))
                     check(worst == 0, f"{what}: frames differ by {worst}")
-    # round trips keep the number of plays
+    # round trips keep the number of loops
     for loop in (0, 2, 5):
         frames[0].save(folder / "source.gif", save_all=True, append_images=frames[1:], duration=delays, loop=loop)
         run("convert", folder / "source.gif", "-o", folder / "way.webp", "--overwrite", "replace")
         run("convert", folder / "way.webp", "-o", folder / "way.png", "--overwrite", "replace")
         run("convert", folder / "way.png", "-o", folder / "back.gif", "--overwrite", "replace")
         check(frames_of(folder / "back.gif")[1] == loop, f"loop {loop} becomes {frames_of(folder / 'back.gif')[1]}")
-    # each frame goes through the steps; many colors need --reduce
+    # steps apply to each frame; many colors need --reduce
     busy = [Image.effect_noise((60, 40), 90 + i).convert("RGB") for i in range(3)]
     busy = [Image.merge("RGB", (b.split()[0], b.transpose(Image.Transpose.ROTATE_180).split()[0], b.transpose(Image.Transpose.FLIP_LEFT_RIGHT).split()[0])) for b in busy]
     busy[0].save(folder / "busy.webp", save_all=True, append_images=busy[1:], duration=50, lossless=True)
@@ -480,13 +480,13 @@ def animations(folder):
     result = run("apply", folder / "busy.webp", "-o", folder / "small.webp", "--do", "resize 30x20")
     small, _ = frames_of(folder / "small.webp")
     check(len(small) == 3 and small[0][0].size == (30, 20), f"frames are resized: {result.stderr}")
-    # one frame when it is asked for
+    # a single frame on request
     run("convert", folder / "source.webp", "-o", folder / "one.png", "--page", "3")
     one, _ = frames_of(folder / "one.png")
     check(len(one) == 1 and far(one[0][0], drawn(2, True)) == 0, "a frame that was asked for")
     run("convert", folder / "source.png", "-o", folder / "two.bmp", "--page", "2")
     check((folder / "two.bmp").exists(), "a frame of an animated PNG")
-    # files that end within the last frame, or before one that they claim
+    # files truncated within the last frame, or before one in the header's count
     for source, cut in (("gif", 20), ("png", 60), ("png", 12)):
         path, made = folder / f"cut.{source}", folder / "cut_made.webp"
         data = (folder / f"source.{source}").read_bytes()

@@ -1,11 +1,11 @@
 #!/bin/bash
-# Completes command lines with the scripts that the program prints: bash here, zsh and fish where
-# there are such shells.
+# Completes command lines with the scripts printed by the program: bash here, zsh and fish if
+# installed.
 set -u
 faults=0
 source <("$FOTOMILL" completion bash) || exit 1
 
-# complete WORD... EXPECTED: the last word but one is being typed.
+# complete WORD... EXPECTED: completes the last word before EXPECTED.
 check() {
   local expected=${*: -1}
   COMP_WORDS=("${@:1:$#-1}")
@@ -50,7 +50,7 @@ _fotomill
 [[ "${COMPREPLY[*]}" == *"describe                 (explain keys"* ]] || { echo "bash shows no descriptions: ${COMPREPLY[*]}"; faults=1; }
 unset COMP_TYPE
 
-# zsh and fish complete the same, where there are such shells.
+# The same with zsh and fish, if installed.
 if command -v zsh > /dev/null; then
   "$FOTOMILL" completion zsh > "$folder/_fotomill"
   zshWords() { # WORD...: what _describe is given, or *files
@@ -100,7 +100,7 @@ if command -v fish > /dev/null; then
   fishCheck "fotomill completion z" "zsh"
 fi
 
-# The lists of the script for PowerShell, which is rarely there to try it: balanced, and quotes doubled.
+# The lists in the PowerShell script, which is rarely installed to run it: balanced, and quotes doubled.
 "$FOTOMILL" completion powershell > "$folder/fotomill.ps1"
 python3 - "$folder/fotomill.ps1" << 'END' || faults=1
 import re, sys

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Runs `fotomill config` and `--set` on data folders of its own."""
+"""Runs `fotomill config` and `--set` with temporary data folders."""
 import json
 import os
 import subprocess
@@ -24,7 +24,7 @@ def check(what, found, expected):
 
 
 # (arguments after "config", exit status, standard output, part of standard error, file afterwards);
-# a file of None: as before
+# None: the file is unchanged
 STEPS = [
     (["get", "JpegCompression"], 0, b"75\n", "", None),
     (["set", "JpegCompression", "80"], 0, b"JpegCompression: 75 -> 80\n", "",

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""A dry run tells the failures that the run has, and changes nothing. $FOTOMILL names the program."""
+"""A dry run reports the failures of the real run, and changes nothing. $FOTOMILL names the program."""
 import sys
 
 from place import Place, bitmap, check, finish
@@ -15,7 +15,7 @@ def snapshot(place):
             for path in place.path.rglob("*") if not {"data", "tmp"} & set(path.parts)}
 
 
-# Arguments, whether the folder "shut" may be written, whether a file fails.
+# Arguments, whether the folder "shut" is writable, whether a file fails.
 ROWS = [
     (["rename", "shut"], False, True),
     (["rename", "shut"], True, False),

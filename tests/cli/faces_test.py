@@ -1,6 +1,6 @@
 #!/usr/bin/python3
-"""Faces: where they are found, and what is cut, corrected and framed by them. The faces are drawn here; the detector takes
-them for real ones. Left out where the detector or Pillow is not there."""
+"""Faces: detection, and cropping, red-eye correction and framing based on it. The faces are drawings that the detector
+recognizes. Skipped without the detector or Pillow."""
 import json
 import os
 import subprocess
@@ -16,7 +16,7 @@ except ImportError:
 FOTOMILL = os.environ["FOTOMILL"]
 WORK = tempfile.TemporaryDirectory()
 FOLDER = Path(WORK.name)
-FACES = [(200, 220, 90), (470, 260, 55)]  # middle and size, the larger one first
+FACES = [(200, 220, 90), (470, 260, 55)]  # center and size, the larger one first
 failures = 0
 
 
@@ -61,7 +61,7 @@ def found(*arguments):
 
 
 def covers(face, drawn, scale=1):
-    """Whether a rectangle is that face: around its middle, neither tiny nor huge."""
+    """Whether a rectangle is that face: around its center, of plausible size."""
     x, y, size = (value * scale for value in drawn)
     inside = face["x"] < x < face["x"] + face["width"] and face["y"] < y < face["y"] + face["height"]
     return inside and size < face["width"] < 3.2 * size
@@ -76,7 +76,7 @@ probe = run("faces", "two.png")
 if "not installed" in probe.stderr:
     sys.exit(77)
 
-# Where they are.
+# Positions.
 answer, _ = found("two.png", "none.png")
 check("both, the largest first", len(answer[0]["faces"]) == 2 and all(map(covers, answer[0]["faces"], FACES)), answer)
 check("a picture without", answer[1]["faces"] == [] and answer[1]["status"] == 0, answer)
@@ -93,7 +93,7 @@ check("upright", answer[0]["width"] == 640 and len(answer[0]["faces"]) == 2 and 
 answer, _ = found("--set", "FaceDetectPercentage=30", "two.png")
 check("the smallest that counts", len(answer[0]["faces"]) == 1 and covers(answer[0]["faces"][0], FACES[0]), answer)
 
-# Where nobody can look.
+# Without a detector.
 for cascade in ("nothing.xml", "", "two.png"):
     answer, result = found("--set", f"FaceDetectThumbnailCascade={cascade}", "two.png")
     check(f"classifier {cascade!r}", answer[0]["status"] == 22 and "not installed" in result.stderr and result.returncode == 1, result)
@@ -103,7 +103,7 @@ check("a classifier that is none", answer[0]["status"] == 22 and result.returnco
 answer, result = found("missing.png")
 check("no such file", answer[0]["status"] == 1 and answer[0]["faces"] == [], result)
 
-# What is cut and corrected by them.
+# Cropping and correction.
 picture(FACES[1:]).save(FOLDER / "right.png")
 run("apply", "right.png", "--do", "crop 200x200 gravity=faces", "--out", "cut.png")
 cut = Image.open(FOLDER / "cut.png").convert("RGB")
@@ -120,7 +120,7 @@ check("red eyes in faces", both.getpixel(eye)[0] > 180 and eyes.getpixel(eye)[0]
 check("red outside of faces", eyes.getpixel((610, 30)) == (230, 20, 20), eyes.getpixel((610, 30)))
 check("red-eye needs one of them", run("apply", "red.png", "--do", "red-eye", "--out", "x.png").returncode == 2)
 
-# What shows them: a face takes several times the room that it has in the whole picture.
+# Thumbnails: a face takes several times the space it has in the whole picture.
 def skin(path):
     image = Image.open(path).convert("RGB")
     return sum(r > 190 > b for r, g, b in image.getdata()) / (image.width * image.height)

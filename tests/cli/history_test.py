@@ -8,7 +8,7 @@ from place import Place, check, finish
 ALL = "FileHistoryFunctions=1048575"
 
 ROWS = [
-    # arguments, functions that are recorded
+    # arguments, functions recorded
     (["convert", "a.bmp", "--to", "pcx"], ["Convert"]),
     (["rename", "a.bmp"], ["Move and copy"]),
     (["turn", "a.bmp", "--rotate", "left", "--dest", "out"], ["Transform"]),

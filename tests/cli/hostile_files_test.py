@@ -1,6 +1,6 @@
 #!/usr/bin/env python3
-"""Small files that promise a lot: no command takes more than 1.25 GiB or more than seconds for one,
-and one large picture does not keep the program from ending when it is asked to."""
+"""Small files with huge claims: no command uses more than 1.25 GiB or more than seconds for one,
+and one large picture does not keep the program from ending on request."""
 import os
 import resource
 import signal
@@ -13,8 +13,8 @@ import zlib
 from pathlib import Path
 
 FOTOMILL = os.environ["FOTOMILL"]
-MOST_KIB = 1280 * 1024  # memory of one file
-MOST_SECONDS = 12       # each of these takes well below one
+MOST_KIB = 1280 * 1024  # per file
+MOST_SECONDS = 12       # each takes well below one
 faults = []
 
 
@@ -28,7 +28,7 @@ def segment(marker, data):
 
 
 def jpeg(width, height, components=3, frame=0xC2, head=b""):
-    """A JPEG file of some size whose scans say nothing; progressive unless the frame says otherwise."""
+    """A JPEG file of some size with empty scans; progressive unless the frame says otherwise."""
     parts = b"".join(bytes((i + 1, 0x11, 0)) for i in range(components))
     tables = segment(0xDB, bytes(1) + bytes([1] * 64)) + segment(0xC4,
                                                                  b"\0" + b"\1" + bytes(15) + b"\0")
@@ -53,7 +53,7 @@ def png(width, height, between=b"", rows=None):
 
 
 def gray_png(side):
-    """A picture that is as large as it says."""
+    """A picture as large as it claims."""
     packer = zlib.compressobj(1)
     row = bytes(1) + bytes(i * 7 & 255 for i in range(side))
     return png(side, side,
@@ -61,7 +61,7 @@ def gray_png(side):
 
 
 def webp(width, height):
-    """Lossless, each pixel the same: nothing but the head and five codes of one symbol."""
+    """Lossless, all pixels equal: a header and five codes with one symbol."""
     stream = b"\x2f" + struct.pack("<I",
                                    width - 1 | height - 1 << 14) + b"\x88\x88\x08\x88\x88\x88\x88\x00\x00\x00\x00\x00"
     stream += bytes(len(stream) % 2)
@@ -70,7 +70,7 @@ def webp(width, height):
 
 
 def tiff(pages):
-    """So many directories one after the other, of the same 8 x 8 grays."""
+    """Many directories in a chain, with the same 8 x 8 grays."""
     entries = [(256, 3, 8), (257, 3, 8), (258, 3, 8), (259, 3, 1), (262, 3, 1), (273, 4, 8),
                (277, 3, 1), (278, 3, 8), (279, 4, 64)]
     directory = struct.pack("<H", len(entries)) + b"".join(struct.pack("<HHII", tag, kind, 1, value)
@@ -82,7 +82,7 @@ def tiff(pages):
 
 
 def run(name, *arguments):
-    """Runs the program on a file and holds it to the limits; its exit status."""
+    """Runs the program on a file and checks the limits; returns its exit status."""
     begun = time.monotonic()
     process = subprocess.Popen([FOTOMILL, *map(str, arguments)], stdin=subprocess.DEVNULL,
                                stdout=subprocess.DEVNULL,
@@ -106,7 +106,7 @@ def run(name, *arguments):
 
 
 def claims(folder):
-    """Sizes that a header claims."""
+    """Sizes claimed in a header."""
     for name, content in (("color.jpg", jpeg(30000, 30000)), ("huge.jpg", jpeg(65500, 65500)),
                           ("gray.jpg", jpeg(30000, 30000, 1)),
                           ("apart.jpg", jpeg(18000, 18000)), ("lossless.webp", webp(16383, 16383))):
@@ -136,7 +136,7 @@ def counts(folder):
 
 
 def holes(folder):
-    """A terabyte of nothing behind the first bytes."""
+    """A hole of a terabyte after the first bytes."""
     heads = {"jpg": b"\xff\xd8\xff\xe0\0\x10JFIF\0", "png": b"\x89PNG\r\n\x1a\n",
              "webp": b"RIFF\xff\xff\xff\xffWEBP", "gif": b"GIF89a\x10\0\x10\0\0\0\0",
              "tif": b"II*\0\x08\0\0\0", "bmp": b"BM", "tga": b"\0\0\2", "ico": b"\0\0\1\0\1\0",
@@ -147,7 +147,7 @@ def holes(folder):
             file.write(head)
             try:
                 file.truncate(1 << 40)
-            except OSError:  # not every file system can
+            except OSError:  # not supported by all file systems
                 return
         for words in (("info", path), ("convert", path, "--to", "png", "--dest", folder / "out")):
             run(f"{words[0]} {path.name}", *words)
@@ -155,7 +155,7 @@ def holes(folder):
 
 
 def ending(folder):
-    """A request to end is seen inside one picture."""
+    """An interrupt takes effect within a picture."""
     source = folder / "large.png"
     source.write_bytes(gray_png(14000))
     out = folder / "ended"

@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# What an installed tree holds and that it works on its own: programs, man pages, completions,
-# plug-ins; and that uninstalling takes exactly that away again.
+# An installed tree is complete and works on its own: programs, man pages, completions, plug-ins;
+# and uninstalling removes exactly that.
 set -u
 project=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd -P)
 build=${FOTOMILL%/fotomill}
@@ -26,7 +26,7 @@ for component in "${components[@]}"; do
   }
 done
 
-# The program alone, without the tree it was built in.
+# The program without its build tree.
 Expect "German is found" "*Befehle:*" \
   "$(LANGUAGE=de LC_ALL=C.UTF-8 "$prefix/bin/fotomill" --lang de help)"
 printf 'P6\n2 1\n255\n\1\2\3\4\5\6' >"$work/a.ppm"
@@ -35,7 +35,7 @@ Expect "the plug-in is found" "0" \
 Expect "what it wrote" "2x1" "$("$prefix/bin/fotomill" info --json "$work/a.bmp" |
   python3 -c 'import json,sys; p=json.load(sys.stdin)[0]; print("%dx%d" % (p["width"], p["height"]))')"
 
-# Every command has its man page, and groff has nothing to say about any.
+# Every command has a man page, and groff reports no warnings.
 commands=$("$prefix/bin/fotomill" help | sed -nE '/^Commands/,/^$/ s/^  ([a-z -]+[a-z])  .*/\1/p' |
   grep -vx help | tr ' ' '-' | sort)
 Expect "a page a command" "$commands" \
@@ -62,7 +62,7 @@ if [[ -x $prefix/bin/fotomill-desktop ]]; then
       "$(appstreamcli validate --no-net "$prefix/share/metainfo/fotomill-desktop.metainfo.xml" >"$work/log" 2>&1; echo $?)"
 fi
 
-# Uninstalling: what is ours goes, what is not stays.
+# Uninstalling removes our files and keeps others.
 mkdir -p "$prefix/share/fotomill"
 for component in "${components[@]}"; do
   sed -e '$a\' "$build/install_manifest_$component.txt"

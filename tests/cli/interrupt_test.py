@@ -1,6 +1,6 @@
 #!/usr/bin/env python3
-"""A conversion that is asked to end stops between two files, leaves whole files only, and says so
-by its exit status; on a terminal it asks, shows how far it is, and can be ended while it asks."""
+"""An interrupted conversion stops between two files, leaves only complete files, and reports it by
+its exit status; on a terminal it prompts, shows progress, and can be interrupted at a prompt."""
 import json
 import os
 import pty
@@ -32,7 +32,7 @@ def bitmap(width, height):
 
 
 def signalled(folder, number, jobs):
-    """Asks a run to end after its first result; its exit status and its results."""
+    """Interrupts a run after its first result; returns its exit status and results."""
     out = folder / f"out{number}{jobs}"
     with open(folder / "messages", "w+", encoding="utf-8") as log:
         run = subprocess.Popen([FOTOMILL, "convert", folder / "in", "--to", "bmp", "--dest", out,
@@ -58,7 +58,7 @@ def signalled(folder, number, jobs):
 
 
 class Terminal:
-    """The program on a terminal of its own."""
+    """The program on a pseudoterminal."""
 
     def __init__(self, *arguments):
         self.seen = ""
@@ -70,7 +70,7 @@ class Terminal:
         ready, _, _ = select.select([self.handle], [], [], seconds)
         try:
             text = os.read(self.handle, 65536) if ready else b""
-        except OSError:  # the other end is gone
+        except OSError:  # the other end is closed
             return False
         self.seen += text.decode()
         return bool(text)
@@ -115,7 +115,7 @@ def terminal(folder):
 
 
 def closed_streams(folder):
-    """Without an output to write to, no picture gets what was meant for it."""
+    """If the output cannot be written, no picture is replaced by it."""
     small = folder / "small"
     small.mkdir()
     for i in range(20):

@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""Every command line of docs/user/jobs.md works as it stands, one after the other, and leaves something to see."""
+"""Every command line of docs/user/jobs.md works as written, in sequence, and produces a result."""
 import os
 import subprocess
 import sys
@@ -13,7 +13,7 @@ except ImportError:
 
 PROJECT = Path(__file__).resolve().parents[2]
 FOTOMILL = Path(os.environ["FOTOMILL"])
-WRITES = {"--dest": Path.is_dir, "--out": Path.is_file}  # what the option behind which it stands must be afterwards
+WRITES = {"--dest": Path.is_dir, "--out": Path.is_file}  # the expected result for the option's value
 
 
 def photo(path, seed, size=(320, 240), orientation=1):

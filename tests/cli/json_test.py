@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Every command that says something says it in JSON as well; -v and -q work everywhere; colors stay away from dumb terminals."""
+"""Every command with output supports JSON; -v and -q work everywhere; dumb terminals get no colors."""
 import json
 import os
 import pty
@@ -24,7 +24,7 @@ def check(what, found, expected):
         faults.append(f"{what}: expected {expected!r}, found {found!r}")
 
 
-# (arguments, status, members of the first element that matter)
+# (arguments, status, relevant members of the first element)
 COMMANDS = [
     ("history add a.bmp --function View", 0, {"functionName": "View", "recorded": True}),
     ("history list", 0, {"functionName": "View"}),

@@ -1,7 +1,8 @@
 #!/usr/bin/env python3
-"""Nothing is lost where others write at the same time, where one may not write, and where a run is killed.
+"""Nothing is lost when other programs write at the same time, without permissions, or when a run is
+killed.
 
-The program is run as an ordinary user: root hides half of the faults. $FOTOMILL names it.
+The program is run as an ordinary user, as root would hide half of the errors. $FOTOMILL names it.
 """
 import fcntl
 import os
@@ -28,7 +29,7 @@ def check(good, what):
 
 
 def bitmap(width, height, seed=0):
-    """A BMP of 24 bits whose pixels all differ."""
+    """A 24-bit BMP with all pixels different."""
     row = (width * 3 + 3) // 4 * 4
     pixels = b"".join(bytes((x * 7 + y * 13 + seed) % 256 for x in range(row))
                       for y in range(height))
@@ -37,7 +38,7 @@ def bitmap(width, height, seed=0):
 
 
 class Place:
-    """A folder with files, and the program run in it by an ordinary user."""
+    """A folder with files, where an ordinary user runs the program."""
 
     def __init__(self):
         self.path = Path(tempfile.mkdtemp(prefix="losses-"))
@@ -113,7 +114,7 @@ def reasons():
 
 
 def turns_at_once():
-    """Two quarter turns make a half turn, in whatever order; one that was lost makes none."""
+    """Two 90-degree rotations make 180 degrees, in either order, unless one is lost."""
     with Place() as place:
         expected = {}
         for i in range(60):
@@ -122,7 +123,7 @@ def turns_at_once():
             check(place.run("turn", name, "--rotate", "180", "-d", "expected")[0] == 0,
                   "the expected picture")
             expected[name] = (place.path / "expected" / name).read_bytes()
-        names = sorted(expected)  # with one thread each, the runs go side by side
+        names = sorted(expected)  # single-threaded, so runs can overlap
         runs = [place.start("turn", *names, "--rotate", "right", "--in-place", "-j", "1")
                 for _ in range(2)]
         for process in runs:
@@ -134,7 +135,7 @@ def turns_at_once():
 
 
 def replaced_meanwhile():
-    """What another program saves while a file is turned stays, or the turn saw it."""
+    """If another program saves a file while it is rotated, its changes are kept or included."""
     with Place() as place:
         old, theirs = bitmap(1500, 1200), bitmap(5, 4, 9)
         for delay in range(12):

@@ -1,4 +1,4 @@
-"""What the scripts of this folder share: a folder with files in which the program is run, and checks."""
+"""Shared by the scripts of this folder: a folder with files where the program is run, and checks."""
 import os
 import shutil
 import struct
@@ -32,7 +32,7 @@ def bitmap(width=3, height=2):
 
 
 class Place:
-    """With `ordinary`, the program is run by a user whom permissions bind."""
+    """With `ordinary`, the program is run by a user without root privileges."""
 
     def __init__(self, ordinary=False):
         self.user = {"user": NOBODY, "group": NOBODY, "extra_groups": []} if ordinary and os.geteuid() == 0 else {}
@@ -51,7 +51,7 @@ class Place:
         shutil.rmtree(self.path)
 
     def files(self, *names, contents=None, time=None):
-        """Makes files with their folders; bitmaps unless contents are given. `time` is in nanoseconds."""
+        """Creates files with their folders; bitmaps unless contents are given. `time` is in nanoseconds."""
         for name in names:
             path = self.path / name
             path.parent.mkdir(parents=True, exist_ok=True)
@@ -70,7 +70,7 @@ class Place:
                                 env=self.environment, **self.user, **more)
 
     def run_bytes(self, *arguments, given=None, **more):
-        """Exit status, standard output and standard error; `given` comes on standard input."""
+        """Exit status, standard output and standard error; `given` is standard input."""
         process = self.start(*arguments, stdin=subprocess.DEVNULL if given is None else subprocess.PIPE, **more)
         try:
             out, err = process.communicate(given, timeout=60)
@@ -81,6 +81,6 @@ class Place:
         return process.returncode, out, err
 
     def run(self, *arguments, given=None, **more):
-        """The same as text."""
+        """As above, as text."""
         status, out, err = self.run_bytes(*arguments, given=given, **more)
         return status, out.decode(), err.decode()

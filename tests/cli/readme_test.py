@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""README.md promises exactly the commands and formats that the program has."""
+"""README.md lists exactly the program's commands and formats."""
 import json
 import os
 import re

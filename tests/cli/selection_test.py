@@ -7,7 +7,7 @@ from place import Place, bitmap, check, finish
 
 
 def dated_jpeg(date):
-    """No picture, but EXIF with DateTimeOriginal."""
+    """Not a picture, but EXIF with DateTimeOriginal."""
     text = date.encode() + b"\0"
     directory = struct.pack(">HHHIII", 1, 0x8769, 4, 1, 26, 0) + struct.pack(">HHHIII", 1, 0x9003, 2, len(text), 44, 0) + text
     block = b"Exif\0\0MM\0*\0\0\0\x08" + directory

@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""Pictures that look alike are found, and a second search reads none of them again."""
+"""Similar pictures are found, and a second search reads none of them again."""
 import json
 import os
 import subprocess
@@ -19,7 +19,7 @@ faults = []
 
 
 def scene(seed):
-    """Blobs of different places and brightness."""
+    """Blobs of random position and brightness."""
     small = Image.new("RGB", (8, 6))
     value = seed * 7919 + 17
     pixels = []
@@ -55,7 +55,7 @@ with tempfile.TemporaryDirectory() as name:
     two.save(work / "f.bmp")
     scene(3).save(work / "g.png")
     Path(work, "broken.png").write_bytes(b"\x89PNG\r\n\x1a\nnothing")
-    for path in work.iterdir():  # files that were changed just now are not kept
+    for path in work.iterdir():  # recently changed files are not cached
         os.utime(path, (time.time() - 100, time.time() - 100))
 
     alike = [["a.png", "b.jpg", "c.bmp"], ["e.png", "f.bmp"]]
@@ -71,7 +71,7 @@ with tempfile.TemporaryDirectory() as name:
     expect("named twice", search(data, work / "a.png", work / "a.png", work / "g.png"), [])
     expect("nothing", search(data, work / "a.png", work / "g.png"), [])
 
-    # What the store knows is not read again: same size and time, other contents.
+    # Cached files are not read again: same size and time, other contents.
     times = (work / "g.png").stat()
     Path(work, "g.png").write_bytes(b"x" * times.st_size)
     os.utime(work / "g.png", (times.st_mtime, times.st_mtime))

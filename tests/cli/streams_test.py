@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""Pictures and lists through standard input, pictures and results through standard output, and readers that go away. $FOTOMILL
+"""Pictures and lists from standard input, pictures and results to standard output, and readers that close the pipe. $FOTOMILL
 names the program."""
 import json
 import os
@@ -165,7 +165,7 @@ def readers_that_go():
         ]
         for arguments, status, folder in rows:
             reader, writer = os.pipe()
-            os.close(reader)  # before the program begins, however fast it is
+            os.close(reader)  # closed before the program starts
             process = place.start(*arguments, stdout=writer)
             os.close(writer)
             err = process.stderr.read().decode()

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""--version names what the program file really asks the system for, and says the same in each of its forms."""
+"""--version lists the libraries the program really loads, consistently in all formats."""
 import json
 import os
 import re
@@ -8,7 +8,7 @@ import subprocess
 import sys
 
 PROGRAM = os.environ["FOTOMILL"]
-# Of the compiler and the system itself.
+# The compiler's and the system's own.
 SYSTEM = re.compile(r"(libc|libm|libdl|libpthread|librt|ld-linux.*|libgcc_s|libasan|libubsan)\.so")
 
 
@@ -17,7 +17,7 @@ def output(*arguments):
 
 
 def plain(name):
-    """libpng16.so.16, libpng -> png: what names have in common."""
+    """libpng16.so.16, libpng -> png: the common part of names."""
     return re.sub(r"[0-9.-]+$|-turbo$", "", re.sub(r"^lib|\.so.*", "", name.lower()))
 
 
@@ -48,7 +48,7 @@ def main():
         if not library["license"] or f": {library['license']}\n  Copyright {library['copyright']}\n" not in licenses:
             faults.append(f"license of {name}: {library['license']}")
 
-    # Topics are in the manual too.
+    # Topics are also in the manual.
     listed = output("help").split("\nTopics:\n")[1].split("\n\n")[0]
     topics = re.findall(r"^  ([a-z-]+) ", listed, re.MULTILINE)
     manual = os.path.join(os.environ.get("TMPDIR", "/tmp"), f"fotomill-manual-{os.getpid()}")

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""What a screen reader hears of the real program: every control that takes the focus has a name, and Tab gets to each of them."""
+"""Accessibility of the real program: every control that takes the focus has a name, and is reached with Tab."""
 import os
 import re
 import subprocess
@@ -10,7 +10,7 @@ from pathlib import Path
 try:
     from gi.repository import Gio, GLib
 except ImportError:
-    # the system's bindings are for its own Python
+    # the system's bindings require its own Python
     if sys.executable != "/usr/bin/python3" and Path("/usr/bin/python3").exists():
         os.execv("/usr/bin/python3", ["/usr/bin/python3", *sys.argv])
     print("python3-gi is not installed: left out")
@@ -19,17 +19,17 @@ except ImportError:
 from driven_desktop import BARE, PATIENCE, Desktop, Failure, make_pictures, run
 
 ACCESSIBLE = "org.a11y.atspi.Accessible"
-# Bits of the states of the accessibility interface.
+# State bits of the accessibility interface.
 ENABLED, FOCUSABLE, FOCUSED, SHOWING, MANAGES_DESCENDANTS = 8, 11, 12, 25, 31
-# Frames of what scrolls pass the focus on to what they hold; of radio buttons Tab meets the one
-# that is chosen.
+# Scrolled frames pass the focus on to their contents; Tab reaches the selected one of several radio
+# buttons.
 PASSED_ON = {"scroll pane", "viewport"}
 NOT_BY_TAB = PASSED_ON | {"radio button", "menu", "menu item", "check menu item", "radio menu item",
                           "icon"}
 
 
 class Heard:
-    """One accessible object as it is now."""
+    """The current state of one accessible object."""
 
     def __init__(self, reader, reference):
         self.reader, self.reference = reader, reference
@@ -46,7 +46,7 @@ class Heard:
         return f"{self.role} {self.name!r} ({self.description!r})"
 
     def below(self):
-        """Everything in it that is on the screen."""
+        """All its descendants on the screen."""
         if self.has(MANAGES_DESCENDANTS):
             return
         for child in self.reader.call(self.reference, ACCESSIBLE, "GetChildren"):
@@ -57,7 +57,7 @@ class Heard:
 
 
 class ReadDesktop(Desktop):
-    """The program with a bus of its own, and an ear on it."""
+    """The program with its own accessibility bus, and a listener."""
 
     def start(self):
         del self.environment["NO_AT_BRIDGE"]
@@ -103,7 +103,7 @@ class ReadDesktop(Desktop):
                          GLib.Variant("(ss)", (ACCESSIBLE, name)))
 
     def window(self, title):
-        """What is heard of the top window of a title."""
+        """The accessible text of the top window with a title."""
         root = Heard(self, ("org.a11y.atspi.Registry", "/org/a11y/atspi/accessible/root"))
         for program in self.call(root.reference, ACCESSIBLE, "GetChildren"):
             for child in self.call(program, ACCESSIBLE, "GetChildren"):
@@ -117,7 +117,7 @@ class ReadDesktop(Desktop):
                 or heard.role == "combo box"]
 
     def check(self, title, tab=True):
-        """Every control of a window has a name, and Tab comes to each one that can be used."""
+        """Every control of a window has a name, and Tab reaches each one that is enabled."""
         self.settle()
         takers = self.takers(title)
         nameless = [str(heard) for heard in takers if not heard.name.strip()]
@@ -137,20 +137,20 @@ class ReadDesktop(Desktop):
             self.settle()
             while GLib.MainContext.default().iteration(False):
                 pass
-            # What is heard of a choice is its button, which is found by name only.
+            # A choice is represented by its button, which is found by name only.
             met = set(self.focused)
             for reference in set(self.focused):
                 try:
                     met.add(self.property(reference, "Name"))
-                except GLib.Error:  # it has gone since
+                except GLib.Error:  # it no longer exists
                     pass
             missed = [heard for heard in takers
                       if heard.has(ENABLED) and heard.role not in NOT_BY_TAB
                       and not {heard.reference, heard.name} & met]
 
 
-# Windows over the browser: the keys that open them, the log's line, the title. Without keys: words
-# for the command finder.
+# Windows opened from the browser: the keys to open them, the log line, the title. Without keys:
+# words for the command finder.
 WINDOWS = [
     ("ctrl+e", r"prompt destination", "Convert"),
     ("shift+F2", r"prompt sequential-rename", "Sequential Rename"),
@@ -187,7 +187,7 @@ def every_window_is_heard(folder):
             desktop.focus(f"^{title}$")
             desktop.check(title)
             desktop.key("Escape")
-        # The canvases say what they show.
+        # The canvases describe their contents.
         for keys, place in (("Right", "b.png, 2 of 2, selected"),
                             ("Left", "a.bmp, 1 of 2, selected")):
             desktop.focus("Fotomill Professional")

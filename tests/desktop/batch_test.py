@@ -6,7 +6,7 @@ from driven_desktop import Desktop, Failure, make_pictures, run
 
 
 def start_convert(desktop):
-    """Convert with the settings of the dialog as it opens."""
+    """Convert with the dialog's initial settings."""
     desktop.focus("Fotomill Professional")
     desktop.key("ctrl+a", "ctrl+e")
     desktop.wait(r"prompt destination")
@@ -47,7 +47,7 @@ def convert_and_collide(folder):
         desktop.key("Escape")
         assert (out / "one.png").read_bytes() == b"old"
         assert (out / "two.png").read_bytes()[:4] == b"\x89PNG"
-        # Typed over with another name, both stay.
+        # With another name typed, both files are kept.
         start_convert(desktop)
         confirm(desktop)
         desktop.wait(r"prompt overwrite .*one.png")
@@ -61,7 +61,7 @@ def convert_and_collide(folder):
         desktop.wait(r"batch ended status=0")
         assert (out / "one.png").read_bytes() == b"old"
         assert sorted(path.name for path in out.iterdir()) == ["one.png", "three.png", "two.png"]
-        # What took nobody's place can be taken back.
+        # Files that replaced nothing can be undone.
         desktop.focus("^Progress$")
         desktop.key("Escape")
         desktop.focus("Fotomill Professional")
@@ -80,11 +80,11 @@ def destination_step(folder):
         desktop.key("ctrl+a", "ctrl+e")
         desktop.wait(r"destination First: .*/pictures/one.jpg ")
         desktop.focus("^Convert$")
-        # A bare name is a folder of the folder shown.
+        # A bare name is a subfolder of the current folder.
         desktop.key("alt+i", "Tab", "ctrl+a")
         desktop.type("out")
         desktop.wait(r"destination First: .*/pictures/out/one.jpg ")
-        # Shift brings up the format's options; Cancel there goes back to the step.
+        # Shift opens the format's options; Cancel returns to the previous step.
         desktop.key("shift+Return")
         desktop.wait(r"prompt options jpg")
         desktop.focus("^JPG options$")
@@ -131,7 +131,7 @@ def errors_stay_and_abort_stops(folder):
         for path in written:
             if path.read_bytes()[:2] not in (b"II", b"MM") or path.stat().st_size < 1000:
                 raise Failure(f"{path.name} is not whole")
-        # It begins, and the box of the first one stays to be read.
+        # It starts, while the first one's box stays open for reading.
         desktop.wait(r"prompt format")
         desktop.focus("^Destination$")
         desktop.key("Return")

@@ -10,7 +10,7 @@ NAMES = ["a1.bmp", "a2.png", "a10.jpg", "b.tif"]
 
 
 def register_programs(home, marker):
-    """Programs for PNG files: the one chosen, which makes a file; another one; one for terminals; one that was taken out."""
+    """Programs for PNG files: the user's default, which creates a file; another one; one for terminals; a removed one."""
     data = home / ".local/share"
     (data / "applications").mkdir(parents=True)
     (home / ".config").mkdir(exist_ok=True)
@@ -37,7 +37,7 @@ def open_select_view(folder):
         desktop.wait(r"browser tabs=1 lines=6 items=6 selected=0 missing=0 listing=0")
         desktop.screenshot("browser")
         desktop.focus("Fotomill Professional")
-        # Numbers in names count: a1, a2, a10.
+        # Natural sort order: a1, a2, a10.
         desktop.key("Home", "Right", "Right")
         desktop.wait(r"selected=1 .*focus=a2.png")
         desktop.key("shift+Right")
@@ -48,7 +48,7 @@ def open_select_view(folder):
         desktop.wait(r"selected=0")
         desktop.key("b", "r")
         desktop.wait(r"selected=1 .*focus=broken.gif")
-        # Selected by pattern, and opened with a program that is registered for PNG files.
+        # Selected by pattern, and opened with a program registered for PNG files.
         desktop.key("ctrl+s")
         desktop.wait("prompt select")
         desktop.focus("Select by pattern")
@@ -68,10 +68,10 @@ def open_select_view(folder):
             if time.monotonic() > end:
                 raise Failure("the program was not started")
             time.sleep(0.05)
-        # A changed folder shows itself.
+        # Changes in the folder are detected.
         make_pictures(pictures, ["c.bmp"])
         desktop.wait(r"lines=7 .*listing=0 .*focus=a2.png")
-        # The tip of the file below the pointer.
+        # The tooltip of the file below the pointer.
         window = desktop.focus("Fotomill Professional")
         desktop.xdotool("mousemove", "--window", window, 330, 280)
         desktop.xdotool("mousemove", "--window", window, 335, 285)
@@ -87,7 +87,7 @@ def open_select_view(folder):
         desktop.key("ctrl+2")
         desktop.wait(r"view=1")
         desktop.screenshot("details")
-        # The columns are chosen from a menu; the first one that can be is the type.
+        # Columns are chosen from a menu; the first optional one is the type.
         desktop.key("ctrl+k")
         desktop.focus("Find")
         desktop.type("columns")
@@ -104,7 +104,7 @@ def open_select_view(folder):
         desktop.focus("View")
         desktop.key("space")
         desktop.wait(r"view place=2/6 .*status=0 .*a2.png")
-        # Each switch of the pictures' look loads the picture again; the zoom's does not.
+        # Each display option reloads the picture; zooming does not.
         for key, look in (("m", "profiles=0 checkerboard=0"), ("b", "profiles=0 checkerboard=1")):
             desktop.key(key)
             desktop.wait(f"view-look {look} keepzoom=0")
@@ -124,7 +124,7 @@ def open_select_view(folder):
         desktop.key("Escape")
         desktop.wait(r"browser .*selected=1 ")
         desktop.focus("Fotomill Professional")
-        # Each folder keeps how it was asked to be shown, in the next run as well.
+        # Each folder keeps its view settings, also for the next run.
         desktop.key("ctrl+5", "Home", "Return")
         desktop.wait(r"listing=0 view=4 .*/sub$")
         desktop.key("ctrl+1")
@@ -133,7 +133,7 @@ def open_select_view(folder):
         desktop.wait(r"listing=0 view=4 .*/pictures$")
         desktop.key("ctrl+d")
         desktop.wait(r"favourites 1")
-        # The menu of folders gone through, and one that is typed and completed.
+        # The menu of visited folders, and a typed path with completion.
         desktop.key("alt+Down")
         desktop.wait(r"folder-menu 3")
         desktop.settle()
@@ -172,7 +172,7 @@ def compare(folder):
                      r"4/4 status=3 .*d.gif"):
             desktop.wait("compare pane=" + pane)
         desktop.focus("Compare")
-        # Joined panes zoom together, others alone.
+        # Linked panes zoom together, others separately.
         desktop.key("plus")
         desktop.wait(r"compare-zoom joined=1 125% 125% 125%")
         desktop.key("j", "Tab")
@@ -183,7 +183,7 @@ def compare(folder):
         desktop.wait(r"compare-focus 1/4")
         desktop.wait(r"compare-zoom joined=1 (\d+%) \1 \1")
         desktop.screenshot("compare")
-        # What was written meanwhile is loaded again.
+        # Modified files are reloaded.
         with (pictures / "c.jpg").open("ab") as file:
             file.write(b"more")
         desktop.focus("Fotomill Professional")
@@ -195,7 +195,7 @@ def compare(folder):
         desktop.wait(r"files Deletion of c.jpg done=1")
         if (pictures / "c.jpg").exists():
             raise Failure("c.jpg is still there")
-        for name in ("d.gif", "b.png", "a.bmp"):  # with the last pane the window goes
+        for name in ("d.gif", "b.png", "a.bmp"):  # closing the last pane closes the window
             desktop.key("Delete")
             desktop.wait(f"files Deletion of {name} done=1")
         desktop.focus("Fotomill Professional")
@@ -222,8 +222,7 @@ def play_animation(folder):
         desktop.wait(rf"view-frame frame {(paused + 3) % 5 + 1} of 5, paused")
         desktop.key("space")
         desktop.wait(r"view-frame frame 1 of 5$")
-        # A slideshow waits until an animation that takes longer was shown once, and ends with the
-        # last picture.
+        # A slideshow waits for long animations to play once, and ends with the last picture.
         desktop.key("Escape")
         desktop.focus("Fotomill Professional")
         desktop.key("Home", "Return")
@@ -234,12 +233,12 @@ def play_animation(folder):
         desktop.wait(r"view-frame frame 5 of 5$")
         desktop.wait(r"view place=2/2 ")
         desktop.wait(r"slideshow ended")
-    # Where the system's animations are off, it waits to be asked.
+    # If animations are disabled on the system, it only starts on request.
     (folder / "home/.config/gtk-3.0").mkdir(parents=True, exist_ok=True)
     (folder / "home/.config/gtk-3.0/settings.ini").write_text("[Settings]\ngtk-enable-animations=0\n")
     with Desktop(folder, pictures / "a.gif") as desktop:
         desktop.wait(r"view-frame frame 1 of 5, paused")
-        # the frame comes behind the picture, and would take the keyboard
+        # the frame is behind the picture, and would take the focus
         desktop.wait(r"painted-files")
         desktop.focus("View")
         desktop.key("space")
@@ -251,7 +250,7 @@ def later_starts(folder):
     make_pictures(pictures, NAMES)
     make_pictures(other, ["c.bmp"])
     with Desktop(folder, pictures / "a2.png") as desktop:
-        # A file is shown first; its neighbours come when the folder has been listed.
+        # A file is shown at once; its neighbors are known when the folder has been listed.
         desktop.wait(r"view place=1/1 .*status=0 .*a2.png")
         desktop.wait(r"view-list 2/4")
         later = desktop.start_again(other)
@@ -259,7 +258,7 @@ def later_starts(folder):
         assert later.wait(30) == 0
         desktop.wait(r"browser tabs=2 lines=1 .*listing=0 .*folder=.*other$")
         desktop.focus("Fotomill Professional")
-        # A button is taken out of the toolbar.
+        # Removes a toolbar button.
         desktop.key("ctrl+k")
         desktop.wait(r"finder found=")
         desktop.focus("^Find command$")
@@ -279,7 +278,7 @@ def later_starts(folder):
         desktop.wait(r"browser tabs=1 lines=1 .*listing=0 .*folder=.*other$")
         own.terminate()
         own.wait()
-        # One that hangs keeps nobody waiting, and does not do later what the other has done
+        # A hanging instance does not block others, and does not repeat later what they have done
         # meanwhile.
         desktop.program.send_signal(signal.SIGSTOP)
         later = desktop.start_again(other)
@@ -287,7 +286,7 @@ def later_starts(folder):
         desktop.program.send_signal(signal.SIGCONT)
         later.terminate()
         later.wait()
-        # One that was killed leaves nothing in the way.
+        # A killed instance leaves nothing in the way.
         desktop.program.kill()
         desktop.program.wait()
         assert "taken-over" not in desktop.log_text()[desktop.seen:]

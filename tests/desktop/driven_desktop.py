@@ -1,8 +1,8 @@
-"""Drives the real desktop program on a display of its own: keys and mouse go in, its event log
-comes out.
+"""Drives the real desktop program on its own display: sends keys and mouse events, reads its event
+log.
 
-Tests wait for what the log tells, never for a time. Each test gets its own display, data folder and
-home; screenshots are kept in build/screenshots.
+Tests wait for log lines, never for a time. Each test gets its own display, data folder and home;
+screenshots are kept in build/screenshots.
 """
 import os
 import re
@@ -20,7 +20,7 @@ PROJECT = Path(__file__).resolve().parents[2]
 BARE, OPENBOX = "bare", "openbox"  # displays without and with a window manager
 PATIENCE = 60  # seconds until a test gives up waiting
 
-# Focus follows requests and clicks; no keys of its own.
+# Focus follows requests and clicks; no key bindings.
 OPENBOX_RULES = """<?xml version="1.0"?>
 <openbox_config xmlns="http://openbox.org/3.4/rc">
 <focus><focusNew>yes</focusNew></focus>
@@ -43,9 +43,9 @@ def skip_without_display():
 
 
 class Desktop:
-    """The program with a display. `arguments` and `settings` (lines of the configuration file) as it starts."""
+    """The program with a display, started with `arguments` and `settings` (lines of the configuration file)."""
 
-    managed = False  # displays have a window manager; run() sets it
+    managed = False  # whether displays have a window manager; set by run()
 
     def __init__(self, folder, *arguments, settings=(), size=(1280, 900)):
         self.folder = Path(folder)
@@ -90,7 +90,7 @@ class Desktop:
         return self
 
     def start_manager(self):
-        """A window manager: windows are raised, maximized, and given the keyboard as on a user's screen."""
+        """A window manager: windows are raised, maximized, and focused as on a user's screen."""
         rules = self.folder / "openbox.xml"
         rules.write_text(OPENBOX_RULES)
         manager = subprocess.Popen(["openbox", "--sm-disable", "--config-file", str(rules)],
@@ -133,17 +133,18 @@ class Desktop:
                                             stdin=subprocess.DEVNULL)
 
     def start_again(self, *arguments):
-        """A later start of the program, beside the one that runs. Its events go to the same log."""
+        """A second instance of the program. Its events go to the same log."""
         return subprocess.Popen([self.program.args[0], *map(str, arguments)], env=self.environment,
                                 stdin=subprocess.DEVNULL)
 
-    # --- what comes out ---
+    # --- output ---
 
     def log_text(self):
         return self.log.read_text(errors="replace")
 
     def wait(self, pattern, again=False):
-        """The first line from here on that matches; from the last one found on when `again`."""
+        """The first matching line after the previous match; with `again`, from the previous match
+        on."""
         end = time.monotonic() + PATIENCE
         while time.monotonic() < end:
             text = self.log_text()
@@ -163,7 +164,7 @@ class Desktop:
         if status != 0:
             raise Failure(f"the program ended with {status}")
 
-    # --- what goes in ---
+    # --- input ---
 
     def xdotool(self, *arguments):
         done = subprocess.run(["xdotool", *map(str, arguments)], env=self.environment,
@@ -171,9 +172,9 @@ class Desktop:
         return done.stdout.split()
 
     def focus(self, title, settle=True, native=False):
-        """Gives the keyboard to the window of a title: on a bare display nobody else does it. Waits
-        until the window has been drawn, unless it is one that goes on changing. A `native` box is
-        the toolkit's own: the log never tells of it."""
+        """Focuses the window with a title, since there may be no window manager. Waits until the
+        window has been drawn, unless it keeps changing. A `native` box is the toolkit's own,
+        which is not in the log."""
         end = time.monotonic() + PATIENCE
         while time.monotonic() < end:
             windows = self.xdotool("search", "--onlyvisible", "--name", title)
@@ -184,7 +185,7 @@ class Desktop:
                     known = self.log_text().count(" active ")
                     self.xdotool("windowactivate" if self.managed else "windowfocus", "--sync",
                                  windows[-1])
-                    # Keys that come before the program knows of it go nowhere.
+                    # Keys sent before the window is ready would be lost.
                     while not native and self.log_text().count(" active ") == known:
                         if time.monotonic() >= end:
                             break
@@ -219,7 +220,7 @@ class Desktop:
 
 
 def png_of_xwd(data):
-    """A PNG of the frame buffer that Xvfb keeps as an X window dump of 32 bits a pixel."""
+    """Converts the frame buffer, an X window dump of Xvfb with 32 bits per pixel, to PNG."""
     header_size, _, _, _, width, height = struct.unpack(">6I", data[:24])
     stride, = struct.unpack(">I", data[48:52])
     colors, = struct.unpack(">I", data[76:80])
@@ -241,14 +242,14 @@ def png_of_xwd(data):
 
 
 def needs_manager(test):
-    """Marks a test that means nothing on a bare display."""
+    """Marks a test as not applicable to bare displays."""
     test.needs_manager = True
     return test
 
 
 def run(*tests, displays=(BARE, OPENBOX)):
-    """Runs test functions of a folder each on these displays; exits with their outcome. Names of tests as arguments of
-    the script run these alone."""
+    """Runs test functions on these displays, with a folder for each; exits with their result. Test names as arguments
+    of the script select tests."""
     skip_without_display()
     failed = 0
     for display in displays:
@@ -280,7 +281,7 @@ def succeeds(test):
 
 
 def gif_of_frames(delays, size=(400, 300)):
-    """An animation of frames in one color each, for ever; delays in hundredths of a second."""
+    """An endless animation of single-color frames; delays in hundredths of a second."""
     def block(data):
         return b"".join(bytes([len(data[i:i + 255])]) + data[i:i + 255]
                         for i in range(0, len(data), 255)) + b"\0"
@@ -290,7 +291,7 @@ def gif_of_frames(delays, size=(400, 300)):
     gif = b"GIF89a" + struct.pack("<2H3B", width, height, 0xF2, 0, 0)
     gif += colors + b"!\xff\x0bNETSCAPE2.0\3\1\0\0\0"
     for number, delay in enumerate(delays):
-        # A code of 4 bits a pixel, and a clear code often enough that codes stay that long.
+        # 4-bit codes, with clear codes often enough to keep them that short.
         codes = [code for i in range(width * height)
                  for code in ([8, number % 8] if i % 6 == 0 else [number % 8])] + [9]
         codes += [0] * (len(codes) % 2)

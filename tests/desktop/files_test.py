@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""What the real program does to files, and takes back; thumbnail files; the session that comes back."""
+"""File operations of the real program and their undo; thumbnail files; session restore."""
 import os
 
 from driven_desktop import Desktop, make_pictures, run
@@ -16,7 +16,7 @@ def rename_delete_undo_paste(folder):
     with Desktop(folder, pictures, settings=["UpdateThumbnailsFlag=0"]) as desktop:
         desktop.wait(r"lines=2 .*missing=0 listing=0")
         desktop.focus("Fotomill Professional")
-        # The base name is marked: what is typed replaces it and leaves the extension.
+        # The base name is selected: typing replaces it and keeps the extension.
         desktop.key("Home", "F2")
         desktop.type("zebra")
         desktop.key("Return")
@@ -33,7 +33,7 @@ def rename_delete_undo_paste(folder):
         desktop.wait(r"files Undo rename of a.bmp done=1")
         desktop.wait(r"listed 2")
         assert names(pictures) == ["a.bmp", "b.bmp"], names(pictures)
-        # Copied here, pasted there; pasted where it is, it gets a number.
+        # Copy and paste between folders; pasting into the same folder appends a number.
         desktop.key("ctrl+a", "ctrl+c", "ctrl+v")
         desktop.wait(r"files Copy of 2 files done=2 failed=0")
         assert names(pictures) == ["a [1].bmp", "a.bmp", "b [1].bmp", "b.bmp"], names(pictures)
@@ -46,7 +46,7 @@ def rename_delete_undo_paste(folder):
         desktop.wait(r"lines=2 .*listing=0 .*folder=.*other$")
         desktop.key("alt+Left")
         desktop.wait(r"lines=4 .*listing=0 .*folder=.*pictures$")
-        # The picture on the clipboard becomes a file, and goes again.
+        # A clipboard picture is pasted as a file, and undone.
         desktop.key("Home", "Return")
         desktop.wait(r"view place=1/4 .*status=0 .*a \[1\].bmp")
         desktop.focus("View$")
@@ -58,7 +58,7 @@ def rename_delete_undo_paste(folder):
         desktop.key("ctrl+z")
         desktop.wait(r"files Undo output of Picture from clipboard.png done=1")
         desktop.wait(r"lines=4 .*listing=0")
-        # Deleted while it is looked at: the next one comes.
+        # Deleting a file in the view window shows the next one.
         desktop.key("Home", "Return")
         desktop.wait(r"view place=1/4 .*status=0 .*a \[1\].bmp")
         desktop.focus("View$")
@@ -69,7 +69,7 @@ def rename_delete_undo_paste(folder):
 
 
 def names_that_are_not_utf8(folder):
-    """Such a folder comes by the command line, such files by the clipboard."""
+    """Such a folder from the command line, such files from the clipboard."""
     pictures, other = os.fsencode(folder) + b"/caf\xe9", folder / "other"
     os.mkdir(pictures)
     make_pictures(folder / "made", ["a.bmp", "b.bmp"])
@@ -159,7 +159,7 @@ def turn_and_take_back(folder):
         desktop.key("Home", "Return")
         desktop.wait(r"view place=1/2 .*status=0 .*a.bmp")
         desktop.focus("View$")
-        # A turn belongs to the view until it is saved.
+        # A rotation affects only the view until it is saved.
         desktop.key("r", "space")
         desktop.wait(r"view-turned 6 .*a.bmp")
         desktop.wait(r"view place=2/2 .*b.jpg")
@@ -189,7 +189,7 @@ def turn_and_take_back(folder):
         desktop.key("ctrl+y")
         desktop.wait(r"files Redo rotation of 2 files done=2 failed=0")
         assert changed() == [True, True], changed()
-        # Undone once more, a file that somebody has worked on since stays.
+        # Another undo leaves a file alone that was modified since.
         paths[1].write_bytes(paths[1].read_bytes() + b"more")
         desktop.key("ctrl+z")
         desktop.wait(r"files Undo rotation of 2 files done=1 failed=1")

@@ -32,7 +32,7 @@ def setup_round_trip(folder):
         desktop.wait(r"setup applied changed=1")
         text = ini.read_text()
         assert "JpegCompression=55\n" in text and "NotOurs=1\n" in text, text
-        # A page at its defaults takes its keys' defaults along; Cancel takes up nothing.
+        # Resetting a page resets its keys; Cancel changes nothing.
         desktop.key("alt+r")
         desktop.wait(r"setup reset")
         desktop.key("Escape")
@@ -49,7 +49,7 @@ def setup_round_trip(folder):
         desktop.key("alt+a")
         desktop.wait(r"setup applied changed=1")
         assert "JpegCompression=75\n" in ini.read_text(), ini.read_text()
-        # A format is switched at once, whatever becomes of the box.
+        # A format is switched at once, however the box is closed.
         desktop.key("Down", "Down", "Down", "Down", "Down", "Down")
         desktop.wait(r"setup page=Formats")
         desktop.key("Tab", "Down", "space")

@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""Animations that Pillow writes have the delays, rounds and composed frames that Pillow reads from them."""
+"""Delays, loops and composed frames of animations written by Pillow are the same as read by Pillow."""
 import io
 import json
 import os
@@ -19,7 +19,7 @@ DELAYS = [0, 20, 70, 650, 100, 30]
 
 
 def frames(seed, alpha):
-    """Pictures that differ in places, some of them transparent."""
+    """Pictures that differ in some areas, partly transparent."""
     draw_random = random.Random(seed)
     for _ in DELAYS:
         picture = Image.new("RGBA", (61, 37), (0, 0, 0, 0) if alpha else (250, 240, 10, 255))
@@ -44,7 +44,7 @@ def page(path, number, folder):
 
 
 def visible(picture):
-    """Pixels, with one value for all that are wholly transparent."""
+    """Pixels, with the same value for all that are fully transparent."""
     return [pixel if pixel[3] else (0, 0, 0, 0) for pixel in picture.getdata()]
 
 
@@ -63,7 +63,7 @@ def check(path, rounds, folder):
 
 
 def cut_in_a_frame(path, folder):
-    """A file that ends within a later frame is damaged, though its first one can be shown."""
+    """A file truncated within a later frame is damaged, though its first frame can be shown."""
     broken = folder / ("cut" + path.suffix)
     broken.write_bytes(path.read_bytes()[:-60])
     page(broken, 1, folder / "pages")
@@ -76,7 +76,7 @@ def chunk(name, data):
 
 
 def animated_cursor(path, pictures, sixtieths):
-    """Writes an animated cursor whose pictures are icon files of Pillow's."""
+    """Writes an animated cursor with icon files by Pillow."""
     icons = b""
     for picture in pictures:
         file = io.BytesIO()
@@ -104,7 +104,7 @@ def check_animated_cursor(folder):
 
 
 def written_cursor(folder):
-    """The cursor in an animated one that the program writes is a file that Pillow reads."""
+    """Pillow reads the cursor embedded in an animated cursor written by the program."""
     source = folder / "opaque.png"
     next(frames(3, False)).save(source)
     path = folder / "opaque.ani"
@@ -120,7 +120,7 @@ def main():
     with tempfile.TemporaryDirectory() as name:
         folder = Path(name)
         (folder / "pages").mkdir()
-        # loop as the file has it: none at all, for ever, a number of repetitions
+        # loops in the file: none, endless, a number of repetitions
         for disposal, alpha, loop, rounds in ((0, False, None, 1), (1, True, 0, 0), (2, True, 1, 2),
                                               (3, True, 9, 10)):
             path = folder / f"disposal{disposal}.gif"

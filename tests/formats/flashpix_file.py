@@ -1,14 +1,15 @@
-"""Makes FlashPix files from what the format's specification and [MS-CFB] say, for tests."""
+"""Creates FlashPix files according to the specification and [MS-CFB], for tests."""
 import struct
 
 SECTOR, SHORT, LIMIT = 512, 64, 4096
 END, FREE, TABLE, LIST = 0xFFFFFFFE, 0xFFFFFFFF, 0xFFFFFFFD, 0xFFFFFFFC
 
-CLASS = bytes.fromhex("00676156 54C1 CE11 8553 00AA00A1F95B")  # of a picture
+CLASS = bytes.fromhex("00676156 54C1 CE11 8553 00AA00A1F95B")  # of pictures
 
 
 def compound(tree, scatter=False):
-    """A compound file of a tree: names to bytes, or to trees. With `scatter`, streams skip every other sector."""
+    """A compound file from a tree: names to bytes, or to subtrees. With `scatter`, streams use every other
+    sector."""
     entries = [["Root Entry", 5, None, -1]]  # name, kind, data, child
 
     def add(storage, folder):
@@ -56,7 +57,7 @@ def compound(tree, scatter=False):
     list_first = place(b"".join(struct.pack("<I", n) for n in short_table))
     directory = b""
     for index, (name, kind, data, _) in enumerate(entries):
-        # the neighbors make a tree that leans to the right
+        # siblings form a tree that leans to the right
         owner = next((s for s, children in siblings.items() if index in children), None)
         right = -1
         if owner is not None:
@@ -68,7 +69,7 @@ def compound(tree, scatter=False):
         directory += wide.ljust(64, b"\0") + struct.pack("<HBBiii", len(wide), kind, 1, -1, right, child)
         directory += (CLASS if index == 0 else bytes(16)) + bytes(20) + struct.pack("<III", start, size, 0)
     directory_first = place(directory)
-    # the table has itself and the list of its sectors, as far as the header has no room for it, in it
+    # the table includes itself and the sectors that continue the list in the header
     needed = lists = 0
     while needed * 128 < len(table) + needed + lists:
         needed += 1
@@ -123,7 +124,7 @@ def colors(space, channels, opacity=False):
 
 
 def flashpix(width, height, tiles, space, channels, tables=None, opacity=False, tile=64, smaller=None, scatter=False, extra=None):
-    """A picture. A tile: compression, subtype, data. `smaller` are width, height, tiles of a size before the largest."""
+    """A picture. A tile: compression, subtype, data. `smaller` has width, height, tiles of a smaller resolution."""
     sizes = ([smaller] if smaller else []) + [(width, height, tiles)]
     properties = {0x01000000: number(len(sizes)), 0x01000002: number(width), 0x01000003: number(height)}
     store = {}

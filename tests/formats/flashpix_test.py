@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""FlashPix pictures made from the format's description are read as what was put in; JPEG tiles as Pillow decodes them."""
+"""FlashPix pictures created according to the specification are read correctly; JPEG tiles are compared with Pillow."""
 import io
 import os
 import subprocess
@@ -29,7 +29,7 @@ def pattern(width, height, channels):
 
 
 def cut(image):
-    """The tiles of a picture; what is outside of it is black."""
+    """The tiles of a picture, padded with black."""
     for top in range(0, image.height, SIDE):
         for left in range(0, image.width, SIDE):
             yield image.crop((left, top, left + SIDE, top + SIDE))
@@ -42,7 +42,7 @@ def jpeg(image, **options):
 
 
 def without_tables(stream):
-    """A JPEG stream split into one of tables and one of the rest, and no JFIF."""
+    """A JPEG stream split into tables and the rest, without JFIF."""
     tables, rest, at = b"\xff\xd8", b"\xff\xd8", 2
     while True:
         marker, length = stream[at + 1], int.from_bytes(stream[at + 2:at + 4], "big")
@@ -69,7 +69,7 @@ def decoded(streams):
 
 
 def cases():
-    """Name, file, the picture that is expected, and the most that a sample may differ by."""
+    """Name, file, expected picture, and maximum difference of a sample."""
     for name, width, height in (("one tile", 10, 7), ("six tiles", 130, 70)):
         for channels, space in ((1, fpx.GRAY), (3, fpx.RGB)):
             image = pattern(width, height, channels)

@@ -1,8 +1,8 @@
 #!/usr/bin/env python3
-"""Pictures that the program writes are read by programs of others, and look as they did before.
+"""Other programs read the pictures we write, and see the same pixels.
 
-A row: the format, the sample that is converted to it, and the command that makes a portable anymap
-of standard input.
+A row: the format, the sample to convert, and the command that converts standard input to a portable
+anymap.
 """
 import os
 import shutil
@@ -35,7 +35,7 @@ ROWS = [
     ("img", "bmp-mono.bmp", "gemtopnm"),
 ]
 
-# The same for programs that are not always there and read a file: the command has its name for {}.
+# As above, for optional programs that read a file: {} in the command is the file name.
 FILE_ROWS = [
     ("cut", "bmp-256-colors.bmp", "gm convert {} ppm:-"),
     ("cut", "bmp-16-colors.bmp", "gm convert {} ppm:-"),
@@ -50,17 +50,17 @@ FILE_ROWS = [
 
 
 def bitmap_of_array(data):
-    """The only bitmap of an OS/2 array as a file of its own, which starts 14 bytes later."""
+    """The only bitmap of an OS/2 array as a separate file, which starts 14 bytes later."""
     offset = int.from_bytes(data[24:28], "little") - 14
     return data[14:24] + offset.to_bytes(4, "little") + data[28:]
 
 
-# What the peers read of a format that they do not know.
+# What the peers read of formats they do not support.
 INNER = {"bga": bitmap_of_array}
 
 
 def anymap(command, data):
-    """Width, height and the red, green, blue bytes of the anymap that a command makes of `data`."""
+    """Width, height and the red, green, blue bytes of the anymap that a command converts `data` to."""
     shown = subprocess.run(command.split(), input=data, capture_output=True, check=True).stdout
     kind, size, rest = shown.split(b"\n", 2)
     width, height = map(int, size.split())

@@ -1,13 +1,13 @@
-"""Makes Photo CD files of all sizes, from what is publicly known of the format, for tests.
+"""Creates Photo CD files of all resolutions, from public knowledge of the format, for tests.
 
-The pictures are patterns; what the larger sizes add are a few rows of deltas that repeat.
+The pictures are patterns; the larger resolutions add a few repeating rows of deltas.
 """
 import random
 
 SECTOR = 2048
 FULL, ROWS_16 = (3072, 2048), 16
 
-# Prefix codes of deltas, from short to the longest that the format allows; none begins with twelve ones.
+# Prefix codes of deltas, from short to the maximum length; none starts with twelve ones.
 CODES = [
     {0: "0", 1: "100", -1: "101", 4: "1100", -4: "1101", 20: "11100", -20: "11101", 90: "111100", -90: "111101", 2: "1111100",
      -2: "11111010", 127: "111110110000", -128: "1111101100010", 33: "1111101100011000"},
@@ -17,14 +17,14 @@ CODES = [
 
 
 def table(code):
-    """A code as a file holds it."""
+    """A code as stored in the file."""
     words = b"".join(bytes([len(bits) - 1]) + int(bits.ljust(16, "0"), 2).to_bytes(2, "big") + (delta & 255).to_bytes(1, "big")
                      for delta, bits in code.items())
     return bytes([len(code) - 1]) + words
 
 
 def sectors(data):
-    """Filled up to whole sectors."""
+    """Padded to whole sectors."""
     return data + bytes(-len(data) % SECTOR)
 
 
@@ -33,7 +33,8 @@ def luma(x, y):
 
 
 def plain(width, height, shift):
-    """The plain samples of a size, whose pixels are 2 ** `shift` of the 768 x 512 ones apart."""
+    """The directly stored samples of a resolution with pixels 2 ** `shift` of the 768 x 512 ones
+    apart."""
     data = bytearray()
     for y in range(0, height, 2):
         for row in (y, y + 1):
@@ -50,7 +51,7 @@ def coded_row(plane, row, width, code, seed):
 
 
 def deltas(width, height, planes):
-    """Marks and rows of all planes. Rows of a plane are of ROWS_16 kinds."""
+    """Marks and rows of all planes. There are ROWS_16 different rows per plane."""
     kinds = {plane: [coded_row(plane, i, width >> (plane > 0), CODES[max(plane - 1, 0)], 100 * plane + i + width)
                      for i in range(ROWS_16)] for plane in planes}
     bits = []
@@ -75,7 +76,7 @@ def header(turns, begin16):
 
 
 def make(turns=0, sizes=5):
-    """A file that holds the first `sizes` sizes."""
+    """A file with the first `sizes` resolutions."""
     file = bytearray(384 * SECTOR)
     for sector, width, height, shift in ((4, 192, 128, 2), (23, 384, 256, 1), (96, 768, 512, 0)):
         data = plain(width, height, shift)

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""The larger sizes of Photo CD files look as GraphicsMagick shows them, which has a brightness curve of its own."""
+"""The larger resolutions of Photo CD files match GraphicsMagick, which uses a different tone curve."""
 import os
 import shutil
 import subprocess
@@ -11,10 +11,10 @@ from pathlib import Path
 import photo_cd_file
 
 FOTOMILL = os.environ["FOTOMILL"]
-RARE = 20000  # colors that neither shows well differ by more
-MOST_SPREAD = 5  # of the other program's values for one value of ours
+RARE = 20000  # out-of-gamut colors differ by more
+MOST_SPREAD = 5  # of the other program's values for one of ours
 
-ROWS = [  # quarter turns, sizes in the file, the size that both are to show
+ROWS = [  # rotations by 90 degrees, resolutions in the file, the size to compare
     (0, 5, "3072x2048"),
     (1, 4, "1536x1024"),
     (3, 4, "1536x1024"),
@@ -40,7 +40,7 @@ def faults(folder, turns, sizes, shown):
     pairs = [pair for pair, count in counts.items() if count > len(ours[1]) / RARE]
     for value in range(256):
         seen = [other for own, other in pairs if own == value]
-        # where all that is bright becomes the same, the curves differ
+        # the curves differ where highlights are compressed
         if seen and value < 240 and max(seen) - min(seen) > MOST_SPREAD:
             yield f"{value} is {min(seen)} to {max(seen)}"
     if len(pairs) < 150:

@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""Pictor pictures of ours are read by ffmpeg, and those made from the format's description by both as what was put in."""
+"""ffmpeg reads our Pictor pictures, and both read those created according to the specification."""
 import os
 import random
 import shutil
@@ -39,7 +39,7 @@ def ours(source, to, folder):
 
 
 def packed(rows, bits):
-    """Rows of values, each row whole bytes."""
+    """Rows of values, each padded to whole bytes."""
     data = b""
     for row in rows:
         text = "".join(f"{value:0{bits}b}" for value in row)
@@ -49,7 +49,7 @@ def packed(rows, bits):
 
 
 def blocks(data, size):
-    """Blocks of a run-length code that has literals, short and long runs."""
+    """Run-length coded blocks with literals, short and long runs."""
     out = []
     for begin in range(0, len(data), size):
         piece = data[begin:begin + size]
@@ -71,7 +71,7 @@ def blocks(data, size):
 
 
 def pictor(width, rows, bits, planes, kind, palette, plain=False, block=4000):
-    """`rows` from the top down."""
+    """`rows` are top first."""
     upward = rows[::-1]
     if planes == 1:
         data = packed(upward, bits)
@@ -82,7 +82,7 @@ def pictor(width, rows, bits, planes, kind, palette, plain=False, block=4000):
 
 
 def made():
-    """Name, file, size, colors and pixels, whether ffmpeg reads it as well."""
+    """Name, file, size, colors and pixels, whether ffmpeg supports it."""
     draw = random.Random(7)
 
     def rows(width, height, most):

@@ -1,6 +1,5 @@
 #!/usr/bin/env bash
-# ./fotomill and ./check on a small project of their own: what is built when, what reaches standard
-# output, how tests count.
+# ./fotomill and ./check in a small project: what is built when, standard output, test counts.
 set -u
 project=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd -P)
 work=$(mktemp -d)

@@ -1,10 +1,9 @@
 #!/usr/bin/env python3
-"""Holds the sources to the order of the house: who may include whom, where a system shows, how long
-a file may be.
+"""Checks the structure of the sources: include layers, system dependencies, file lengths.
 
-house_test.py [PROJECT] prints each breach as FILE:LINE: MESSAGE and fails if there is one. Before
-it judges the project it judges a small tree with one breach of every rule, so that a rule that no
-longer bites fails as well.
+house_test.py [PROJECT] prints each violation as FILE:LINE: MESSAGE and fails if there are any. It
+first checks a small tree with one violation of every rule, so that a rule that no longer triggers
+fails as well.
 """
 import re
 import sys
@@ -12,8 +11,8 @@ import tempfile
 from collections import Counter
 from pathlib import Path
 
-# The rooms of src/ from the ground up. A file includes from its own room and from rooms of lower
-# floors.
+# The layers of src/ from the bottom up. A file may include from its own folder and from folders of
+# lower layers.
 FLOORS = [
     ["platform"],
     ["core"],
@@ -30,16 +29,15 @@ FLOORS = [
     ["files"],
     ["archive"],
     ["operations"],
-    ["settings"],  # below here, what a job needs of the settings comes in its options
+    ["settings"],  # lower layers get settings as options of a job
     ["batch"],
     ["pages"],
     ["cli", "desktop"],
 ]
 FLOOR = {room: floor for floor, rooms in enumerate(FLOORS) for room in rooms}
 
-# What only the folder of one system may include or ask for. Files are read and written through
-# src/platform. What a plug-in author includes stands alone, so it may ask which system it is
-# compiled for.
+# System headers and macros are allowed only in a system's own folder. Files are accessed through
+# src/platform. The plug-in authors' header is standalone, so it may check the system.
 SYSTEM_HEADERS = {"src/plugins/fotomill_plugin.h"}
 SYSTEM_FOLDERS = {"src/platform/posix", "src/platform/windows"}
 SYSTEM_HEADER = re.compile(
@@ -50,31 +48,30 @@ SYSTEM_HEADER = re.compile(
 SYSTEM_MACRO = re.compile(
     r"\s*#\s*(if|elif|ifdef|ifndef).*(_WIN32|_WIN64|\bWIN32|__WINDOWS__|__linux|__unix|__APPLE__|"
     r"__MINGW|_MSC_VER|__FreeBSD__|__ANDROID__)")
-# Who begins a thread: the pool, and what the system needs one for. Everybody else gives the pool a
-# task.
+# Only the pool and system-specific code start threads. All other code gives tasks to the pool.
 THREAD = re.compile(r"std::(j?thread\b(?!::)|async\b)|\bpthread_create\b|\bwxThread\b")
 THREAD_FOLDERS = ("src/core/workers/worker_pool.", "src/platform/")
 INCLUDE = re.compile(r'\s*#\s*include\s*(["<])([^">]+)[">]')
 
-# Rooms above the settings that know them in one place only, where jobs are made.
+# Layers above the settings that may access them only where jobs are created.
 SETTINGS_DOORS = {"batch": {"batch/new_job.cpp"}, "pages": set()}
 
 LONGEST_FILE = 900
-MOST_FILES = 40  # sources in one folder of src/, headers counted
+MOST_FILES = 40  # in one folder of src/, including headers
 
-# What windows show is known without them, so that it is tested without a display.
+# Models must not depend on windows, so that they can be tested without a display.
 MODELS, WINDOWS = "desktop/models/", "desktop/windows/"
 DRAWERS = {"util", "utils", "misc", "common", "helper", "helpers", "stuff"}
 
 
 def room_of(path):
-    """The room of a file, given as its path below src/."""
+    """The layer folder of a file, given as its path below src/."""
     parts = path.split("/")
     return parts[0] if len(parts) > 1 else None
 
 
 def include_breaches(path, line):
-    """Breaches by one include line of the file src/`path`."""
+    """Violations in one include line of the file src/`path`."""
     match = INCLUDE.match(line)
     if not match:
         return
@@ -102,7 +99,7 @@ def include_breaches(path, line):
 
 
 def circle_breaches(includes):
-    """Files that include each other, directly or around corners. `includes` maps a file to what it includes."""
+    """Files that include each other, directly or indirectly. `includes` maps a file to what it includes."""
     state = {}
 
     def visit(path, trail):
@@ -120,7 +117,7 @@ def circle_breaches(includes):
 
 
 def crowd_breaches(sources):
-    """Folders of src/ that hold too many sources to find one's way in. `sources` are paths below the project."""
+    """Folders of src/ with too many sources to navigate. `sources` are paths below the project."""
     crowds = Counter(Path(name).parent.as_posix() for name in sources if name.startswith("src/"))
     for folder, count in sorted(crowds.items()):
         if count > MOST_FILES:
@@ -128,7 +125,7 @@ def crowd_breaches(sources):
 
 
 def breaches(project):
-    """Every breach in a project as (file, line, message)."""
+    """All violations in a project as (file, line, message)."""
     includes = {}
     sources = [path for folder in ("src", "tests", "fuzz", "bench", "samples")
                for path in sorted((project / folder).rglob("*"))
@@ -162,7 +159,7 @@ def breaches(project):
     yield from crowd_breaches(source.relative_to(project).as_posix() for source in sources)
 
 
-# One breach of each rule: file, contents, the message's tell-tale (None: must pass).
+# One violation of each rule: file, contents, part of the message (None: must pass).
 EXAMPLES = [
     ("src/core/text.cpp", '#include "core/text.h"\n#include <string>\n', None),
     ("src/core/text.h", '#include "platform/files.h"\n', None),
@@ -208,10 +205,10 @@ EXAMPLES = [
 
 
 def own_faults():
-    """Where the rules do not give what EXAMPLES say."""
+    """Examples where the rules do not report what EXAMPLES say."""
     with tempfile.TemporaryDirectory() as folder:
         for name, contents, _ in EXAMPLES:
-            if contents is None:  # a folder, filled by the examples after it
+            if contents is None:  # a folder with the files of the following examples
                 continue
             path = Path(folder, name)
             path.parent.mkdir(parents=True, exist_ok=True)

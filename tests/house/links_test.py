@@ -1,21 +1,21 @@
 #!/usr/bin/env python3
-"""Every link of the documentation leads to a file and a heading, every file that a page names exists, and every page can be
-reached from the README. Pages for users, which are installed alone, link to nothing outside their folder."""
+"""Every link in the documentation leads to an existing file and heading, every file mentioned on a page exists, and every
+page can be reached from the README. Pages for users, which are installed separately, only link within their folder."""
 import re
 import sys
 import tempfile
 from pathlib import Path
 
 LINK = re.compile(r"\]\(([^)\s]+)\)")
-# Paths in backticks, as far as they name one file: no patterns, no NAME to be filled in.
+# Paths in backticks that name a single file: no patterns, no placeholders.
 PATH = re.compile(r"`((?:src|docs|tests|packaging|samples|fuzz|bench|modules|po)/[A-Za-z0-9_./-]*[a-z0-9_-])`")
 FILLED_IN = re.compile(r"\b[A-Z]{4,}\b")
-PLANNED = re.compile(r"^src/platform/windows|/gri?d\b|/grid_")  # the port, and the format that docs/dev/formats.md invents
+PLANNED = re.compile(r"^src/platform/windows|/gri?d\b|/grid_")  # the port, and the fictitious format in docs/dev/formats.md
 USER = "docs/user/"
 
 
 def anchors(text):
-    """The names that headings have as targets of links."""
+    """The link targets of headings."""
     titles = re.findall(r"^#+ (.*)$", text, re.MULTILINE)
     return {re.sub(r"[^\w\- ]", "", title.lower()).replace(" ", "-") for title in titles}
 
@@ -48,7 +48,7 @@ def faults_of(project):
 
 
 def trial_faults():
-    """What is found in a small tree with one fault of each kind."""
+    """The findings in a small tree with one error of each kind."""
     with tempfile.TemporaryDirectory() as name:
         project = Path(name).resolve()
         for path, text in {

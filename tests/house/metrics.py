@@ -1,10 +1,10 @@
 #!/usr/bin/env python3
-"""Figures of the sources that are watched but break nothing.
+"""Source metrics that are reported but not enforced.
 
-metrics.py [-v] [PROJECT] prints how many public declarations in headers carry a comment, the
-longest include chain, and how many lines outside of tables are wider than 100 columns; -v names the
-places too. A declaration is a function, a type, an alias or a constant that a header of src/ shows
-at namespace level or as a public method. Its comment stands directly above or behind it.
+metrics.py [-v] [PROJECT] prints how many public declarations in headers have a comment, the longest
+include chain, and how many lines outside of tables are wider than 100 columns; -v lists the
+locations. A declaration is a function, a type, an alias or a constant in a header of src/ at
+namespace level or as a public method. Its comment is directly above or on the same line.
 """
 import re
 import sys
@@ -15,7 +15,7 @@ AIM_COMMENTED, AIM_CHAIN = 85, 9
 INCLUDE = re.compile(r'^\s*#\s*include\s*"([^"]+)"', re.MULTILINE)
 SCOPE = re.compile(r"^(namespace\b|extern \"C\")")
 TYPE = re.compile(r"^(template\s*<.*>\s*)?(class|struct|union|enum( class)?)\s+\w+[^;()]*\{")
-# What the language asks for, and what the base or the line above has said already.
+# Boilerplate, and overrides documented in the base class or on the line above.
 SILENT = re.compile(
     r"^(friend\b|using namespace\b|[\w:]+;|(class|struct|enum class) [\w:]+(?: : \w+)?;|#|"
     r"explicit operator bool)"
@@ -30,7 +30,7 @@ def without_strings(line):
 def declarations(text):
     """Each public declaration of a header as (line number, text, whether it has a comment)."""
     scopes = []  # of each open brace: "namespace", "public", "private" (of a class) or "body"
-    above = False  # the line before was a comment
+    above = False  # the previous line was a comment
     pending, start, commented = "", 0, False
     for number, raw in enumerate(text.splitlines(), 1):
         line = raw.strip()
@@ -87,7 +87,7 @@ def is_declaration(code, inside):
 
 
 def longest_chain(source):
-    """The longest way down from a file by its includes, files named from src/."""
+    """The longest include chain from a file, with paths relative to src/."""
     includes = {
         path.relative_to(source).as_posix(): INCLUDE.findall(path.read_text(encoding="utf-8"))
         for path in source.rglob("*") if path.suffix in {".h", ".cpp"}}
@@ -95,7 +95,7 @@ def longest_chain(source):
 
     def chain(name):
         if name not in known:
-            known[name] = [name]  # a circle ends here; the house test names it
+            known[name] = [name]  # ends a cycle, which the house test reports
             below = [chain(target) for target in includes[name] if target in includes]
             known[name] = [name] + max(below, key=len, default=[])
         return known[name]
@@ -104,7 +104,7 @@ def longest_chain(source):
 
 
 def wide_lines(project):
-    """Places of lines that are too wide and in no table, of which clang-format keeps off."""
+    """Locations of overlong lines outside of tables, which are exempt from clang-format."""
     for folder in ("src", "tests", "fuzz", "bench", "samples"):
         for path in sorted((project / folder).rglob("*")):
             if path.suffix in {".h", ".cpp", ".c", ".py", ".sh"}:

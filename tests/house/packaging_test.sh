@@ -1,6 +1,6 @@
 #!/usr/bin/env bash
-# The scripts that pack a release: the source archive depends on the files alone, and packaging/release refuses what is no
-# release. The packages themselves are tried by packaging/deb/try, in bare systems.
+# Release packaging scripts: the source archive depends only on the files, and packaging/release rejects anything that is
+# not a release. The packages themselves are tested by packaging/deb/try, on bare systems.
 set -u
 root=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd -P)
 . "$root/packaging/prepare.sh"
@@ -17,7 +17,7 @@ Expect() {  # Expect NAME WANTED FOUND
   failures=$((failures + 1))
 }
 
-# A small project with the scripts of this one.
+# A small project with this project's scripts.
 project=$work/project
 mkdir -p "$project/build" "$project/src"
 cp -a "$root/packaging" "$root/packages.txt" "$project"
@@ -29,7 +29,7 @@ echo x >"$project/src/a b.cpp"
 ln -s 'a b.cpp' "$project/src/link"
 git -C "$project" init -q && git -C "$project" add -A && git -C "$project" commit -qm one
 
-# What git knows and what changed since, without build/; the same from a folder without git.
+# Committed and changed files, without build/; the same from a folder without git.
 echo new >"$project/src/new.cpp"
 mkdir "$work/one" "$work/two" "$work/one/t" "$work/two/t"
 CopyTree "$project" "$work/one/t"
@@ -42,7 +42,7 @@ for name in one two; do ArchiveTree "$work/$name" t "$work/$name.tar.xz"; done
 Expect "the same bytes" "same" "$(cmp "$work/one.tar.xz" "$work/two.tar.xz" && echo same)"
 Expect "its date" "*2023-11-14 *t/CMakeLists.txt*" "$(TZ=UTC tar -tvf "$work/one.tar.xz")"
 
-# Every obstacle is named, and nothing is made.
+# Every obstacle is reported, and nothing is created.
 Release() { (cd "$work" && "$project/packaging/release" "$@" 2>&1; echo "status $?"); }
 Expect "changes and no date" '*changes that are not committed*no line "## 1.2.3 (YYYY-MM-DD)"*status 1' "$(Release)"
 git -C "$project" add -A && git -C "$project" commit -qm two
@@ -57,7 +57,7 @@ Expect "tests that fail" '*./check fails*status 1' "$(Release)"
 Expect "nothing made" "made" "$(ls "$project/build")"
 Expect "a wrong option" "usage:*status 2" "$(Release --chek)"
 
-# What the packages are built with is what packages.txt has.
+# The packages' build dependencies are those of packages.txt.
 Expect "groups" "*g++*cmake*libtiff-dev*" "$(root=$root PackagesOf build cli | tr '\n' ' ')"
 Expect "a place for them" "1" "$(grep -c '^Build-Depends: .*@BUILD_PACKAGES@$' "$root/packaging/deb/debian/control")"
 exit $((failures > 0))

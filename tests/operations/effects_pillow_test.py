@@ -1,5 +1,6 @@
 #!/usr/bin/python3
-"""Judges effects, color reduction and resizing by Pillow, on a made picture and, where FOTOMILL_CORPUS is set, on a photo."""
+"""Compares effects, color reduction and resizing with Pillow, on a generated picture and, if FOTOMILL_CORPUS is set, on a
+photo."""
 import colorsys
 import os
 import subprocess
@@ -18,7 +19,7 @@ faults = []
 
 
 def made_picture():
-    """All colors of a coarse grid, smooth sweeps, and noise."""
+    """All colors of a coarse grid, smooth gradients, and noise."""
     picture = Image.new("RGB", (240, 180))
     pixels = []
     for y in range(180):
@@ -44,12 +45,12 @@ def photo():
 
 
 def unclipped(picture):
-    """The same between 64 and 191, so that no filter overshoots the range of levels."""
+    """As above, between 64 and 191, so that no filter overshoots."""
     return picture.point(lambda v: 64 + v // 2)
 
 
 def apply(folder, source, recipe):
-    """What the program makes of a picture."""
+    """The program's result for a picture."""
     source.save(folder / "in.png")
     result = subprocess.run([PROGRAM, "apply", str(folder / "in.png"), "--do", recipe, "--to",
                              "png", "--out", str(folder / "out.png"),
@@ -93,7 +94,7 @@ def hue_turned(picture, degrees):
 
 SEPIA = (0.393, 0.769, 0.189, 0, 0.349, 0.686, 0.168, 0, 0.272, 0.534, 0.131, 0)
 
-# (operation, what Pillow makes of the picture, levels that they may differ by)
+# (operation, Pillow's equivalent, maximum difference in levels)
 EFFECTS = [
     ("brightness 20", lambda p: p.point(lambda v: min(v + 51, 255)), 0),
     ("gamma 1.8", lambda p: p.point(lambda v: int(255 * (v / 255) ** (1 / 1.8) + 0.5)), 0),
@@ -116,14 +117,14 @@ EFFECTS = [
 ]
 
 # (operation, size, Pillow's filter): within one level where nothing clips, since Pillow clamps
-# between its two passes.
+# between its two passes
 FILTERS = {"box": Image.Resampling.BOX, "triangle": Image.Resampling.BILINEAR,
            "bicubic": Image.Resampling.BICUBIC,
            "lanczos3": Image.Resampling.LANCZOS}
 SIZES = [(480, 360), (360, 270), (241, 181), (97, 61), (33, 400), (700, 50)]
 
-# (operation, Pillow's own reduction, how much noisier than Pillow's the result may be, dB). Both
-# are judged blurred, as the eye sees them from afar.
+# (operation, Pillow's own reduction, maximum noise compared with Pillow's, dB). Both are compared
+# after blurring, as seen from a distance.
 REDUCTIONS = [
     ("reduce 256", lambda p: p.quantize(256, dither=Image.Dither.FLOYDSTEINBERG), 0),
     ("reduce 64", lambda p: p.quantize(64, dither=Image.Dither.FLOYDSTEINBERG), 0),
@@ -171,7 +172,7 @@ def judge(folder, name, picture):
 
 
 def judge_alpha(folder, picture):
-    """Effects leave alpha alone: so the result equals the formula wherever one can see it."""
+    """Effects do not change alpha: the result equals the formula for all visible pixels."""
     alpha = picture.convert("L").point(lambda v: v if v > 40 else 0)
     with_alpha = picture.copy()
     with_alpha.putalpha(alpha)

@@ -1,5 +1,5 @@
 #!/usr/bin/python3
-"""Operations give what Pillow gives, where Pillow computes the same."""
+"""Operations match Pillow if Pillow computes the same."""
 import os
 import subprocess
 import sys
@@ -19,7 +19,7 @@ LOGO = os.path.join(tempfile.gettempdir(), f"fotomill-peers-{os.getpid()}.png")
 
 
 def sample():
-    """Slopes, edges and some texture."""
+    """Gradients, edges and some texture."""
     picture = Image.new("RGB", (WIDTH, HEIGHT))
     picture.putdata([((x * 255 // WIDTH) ^ (y // 3 & 31), 230 if (x // 20 + y // 15) % 2 else 40,
                       (x * y // 7 + 60) % 256)
@@ -28,13 +28,13 @@ def sample():
 
 
 def perspective(picture):
-    """Output (x, y) comes from (x + 0.2 y + 10, y + 5) - a map that Pillow takes as it is."""
+    """Output (x, y) comes from (x + 0.2 y + 10, y + 5), the same form as Pillow's."""
     return picture.transform((100, 70), Image.Transform.AFFINE, (1, 0.2, 10, 0, 1, 5),
                              Image.Resampling.BILINEAR)
 
 
 def shadowed(picture):
-    """A shadow 9 to the right and 5 down of a Gaussian of sigma 4; Pillow cuts its blur off a little earlier."""
+    """A shadow 9 to the right and 5 down, blurred with sigma 4; Pillow truncates its Gaussian a little earlier."""
     canvas = Image.new("RGB", (WIDTH + 3 + 21, HEIGHT + 7 + 17), "white")
     mask = Image.new("L", canvas.size)
     mask.paste(153, (3 + 9, 7 + 5, 3 + 9 + WIDTH, 7 + 5 + HEIGHT))
@@ -44,7 +44,7 @@ def shadowed(picture):
 
 
 def rounded(picture):
-    """Drawn eight times as large and scaled down, since Pillow's own corners are not smooth."""
+    """Drawn at eight times the size and scaled down, since Pillow's corners are not anti-aliased."""
     mask = Image.new("L", (WIDTH * 8, HEIGHT * 8))
     ImageDraw.Draw(mask).rounded_rectangle((0, 0, WIDTH * 8 - 1, HEIGHT * 8 - 1), 20 * 8, 255)
     canvas = Image.new("RGB", picture.size, "red")
@@ -53,14 +53,14 @@ def rounded(picture):
 
 
 def stamped(picture):
-    """A logo with alpha, as large as the picture, at 60 %."""
+    """A logo with alpha, of the picture's size, at 60 %."""
     logo = Image.open(LOGO)
     alpha = logo.getchannel("A").point(lambda v: v * 153 / 255 + 0.5)
     logo.putalpha(alpha)
     return Image.alpha_composite(picture.convert("RGBA"), logo).convert("RGB")
 
 
-# line of a recipe, what Pillow makes of the picture, most levels apart, pixels of the border that are left out
+# recipe line, Pillow's equivalent, maximum difference in levels, ignored border pixels
 ROWS = [
     ("rotate 7 filter=bilinear mode=keep", lambda p: p.rotate(-7, Image.Resampling.BILINEAR), 2,
      None),
@@ -76,7 +76,7 @@ ROWS = [
      lambda p: p.filter(ImageFilter.Kernel((3, 3), (1, 2, 1, 2, 4, 2, 1, 2, 1))), 1, 1),
     ("kernel '-1 -2 0 -2 9 1 0 1 0' divisor=4 bias=30",
      lambda p: p.filter(ImageFilter.Kernel((3, 3), (0, 1, 0, -2, 9, 1, -1, -2, 0), 4, 30)), 1, 1),
-     # Pillow counts rows from below
+     # Pillow counts rows from the bottom
     ("median 2", lambda p: p.filter(ImageFilter.MedianFilter(5)), 0, 2),
     ("minimum 1", lambda p: p.filter(ImageFilter.MinFilter(3)), 0, 1),
     ("box-blur 3", lambda p: p.filter(ImageFilter.BoxBlur(3)), 1, 0),
@@ -96,7 +96,7 @@ def pasted(picture):
 
 
 def letters():
-    """What the text operation covers, and what Pillow's own text does, with the same font at the same place."""
+    """The coverage of the text operation and of Pillow's text, with the same font and position."""
     font = next(iter(sorted(Path("/usr/share/fonts").rglob("DejaVuSans.ttf"))), None)
     if font is None:
         return
@@ -114,7 +114,7 @@ def letters():
 
 
 def folder_picture(line):
-    """A white pixel, put through a recipe."""
+    """A white pixel after a recipe."""
     with tempfile.TemporaryDirectory() as name:
         Image.new("L", (1, 1), 255).save(Path(name, "a.png"))
         run = subprocess.run([FOTOMILL, "apply", Path(name, "a.png"), "--do", line, "--out",
@@ -127,7 +127,7 @@ def folder_picture(line):
 
 
 def inside(picture, expected, border):
-    """The part that both compute alike: with rotations, away from where the background mixes in."""
+    """The part that both compute the same way: for rotations, away from the blended background."""
     width, height = picture.size
     if border is None:
         return (width * 2 // 5, height // 3, width * 3 // 5, height * 2 // 3)

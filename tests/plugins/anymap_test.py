@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""What the sample plug-in writes, netpbm reads as the same picture, and the other way round."""
+"""netpbm reads what the sample plug-in writes as the same picture, and vice versa."""
 import os
 import shutil
 import subprocess

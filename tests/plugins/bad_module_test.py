@@ -1,5 +1,6 @@
 #!/usr/bin/env python3
-"""Modules that end the program: it says so, never with status 0, and one that does it while it is loaded is tried once."""
+"""Modules that crash or exit the program: reported, never with status 0; one that does so while loading is tried only
+once."""
 import os
 import shutil
 import subprocess
@@ -18,7 +19,7 @@ def check(what, found, expected):
 
 
 def install(folder, oddity):
-    """A program of its own in `folder`, with one module beside it."""
+    """A separate copy of the program in `folder`, with one module next to it."""
     (folder / "plugin").mkdir()
     (folder / "data").mkdir()
     if FOTOMILL.stat().st_dev == folder.stat().st_dev:
@@ -29,7 +30,7 @@ def install(folder, oddity):
 
 
 def run(folder, *arguments):
-    # The program's own answer to a signal is tried, not the sanitizer's.
+    # Tests the program's own signal handler, not the sanitizer's.
     sanitizer = os.environ.get("ASAN_OPTIONS", "") + ":handle_segv=0:handle_abort=0:detect_leaks=0"
     result = subprocess.run([folder / "fotomill", "--data", folder / "data", *arguments],
                             cwd=folder, capture_output=True,

@@ -1,6 +1,6 @@
 #!/bin/sh
-# The blocks that modules see have their stated layout with 4-byte pointers too, whatever this
-# build's pointers are.
+# The plug-in ABI structs have the documented layout with 4-byte pointers, too, whatever this build
+# uses.
 project=$(cd "$(dirname "$0")/../.." && pwd)
 compiler=${CXX:-g++}
 layouts="$compiler -m32 -ffreestanding -fsyntax-only -std=c++20 -I$project/src $project/src/plugins/block_layouts.cpp"

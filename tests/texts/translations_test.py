@@ -1,6 +1,6 @@
 #!/usr/bin/env python3
-"""Translated texts: the template is current, the translations are well formed, and the program follows --lang and the
-environment in what people read, and in nothing else."""
+"""Translations: the template is current, the translations are well formed, and the program follows --lang and the
+environment in texts for people only."""
 import json
 import os
 import shutil
@@ -54,7 +54,7 @@ def check_help():
            "Unbekannter Befehl „conver“. Meinten Sie „convert“?")
 
 
-# variables, whether the answer is German
+# variables, whether the output is German
 ENVIRONMENTS = [
     ({}, False),
     ({"LANG": "de_DE.UTF-8"}, True),
@@ -77,7 +77,7 @@ def check_environment():
 
 
 def check_results():
-    """What programs read is the same in every language, and so are exit statuses."""
+    """Machine-readable output is the same in every language, and so are exit statuses."""
     with tempfile.TemporaryDirectory() as folder:
         missing = os.path.join(folder, "missing.bmp")
         for arguments in (["info", "--json", str(PICTURE), missing], ["formats", "--json"],
