@@ -13,7 +13,7 @@ namespace {
 
 constexpr double kFraction = 64;
 
-// Whether a line may be broken before and after a non-blank character.
+// Whether a line may be broken before and after this character.
 bool IsIdeograph(char32_t c) {
   return (c >= 0x2E80 && c <= 0x9FFF) || (c >= 0xAC00 && c <= 0xD7A3) ||
          (c >= 0xF900 && c <= 0xFAFF) || (c >= 0xFF01 && c <= 0xFF60) ||
@@ -60,7 +60,7 @@ class Breaker {
     const size_t fitting = LongestStart(paragraph, start);
     if (fitting == text.size()) return fitting;
     size_t end = fitting;
-    while (end < text.size() && text[end] == ' ') ++end;  // blanks may stick out
+    while (end < text.size() && text[end] == ' ') ++end;  // trailing blanks may exceed the width
     for (; end > start; --end) {
       if (end < text.size() && !MayBreak(text, end)) continue;
       if (Fits(paragraph, start, end)) return end;

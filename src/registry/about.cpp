@@ -26,7 +26,8 @@ namespace {
 constexpr char kFreeTypeVersion[] =
     FOTOMILL_NUMBERS(FREETYPE_MAJOR, FREETYPE_MINOR, FREETYPE_PATCH);
 
-// How a library is known that the linker does not know, or that tells its version better itself.
+// Version information for a library that is loaded at run time, or that reports its
+// version better itself.
 struct Loaded {
   bool present = false;
   std::string version = {};
@@ -52,15 +53,15 @@ Loaded FindFontconfig() {
 
 Loaded FindOpenCv() { return {CanFindFaces({})}; }
 
-// Facts about a library that do not depend on the build. Licenses are SPDX expressions.
+// Build-independent facts about a library. Licenses are SPDX expressions.
 struct Row {
   const char* name;
-  const char* linked;  // as the linker knows it, one name or several; null: it does not
+  const char* linked;  // pkg-config names; null if not linked
   const char* license;
   const char* copyright;
-  const char* purpose;            // null: the formats say
-  Loaded (*loaded)() = nullptr;   // finds what is loaded when needed
-  const char* version = nullptr;  // by its headers, where pkg-config counts otherwise
+  const char* purpose;            // null: the formats that use it
+  Loaded (*loaded)() = nullptr;   // finds a library loaded at run time
+  const char* version = nullptr;  // from its headers, if pkg-config uses another numbering
 };
 
 // clang-format off
@@ -92,8 +93,8 @@ constexpr Row kRows[] = {
 };
 // clang-format on
 
-// A library that the build linked: FOTOMILL_LINKED_LIBRARIES has NAME=VERSION=inside|shared, each
-// with a blank behind it.
+// A library linked by the build, from FOTOMILL_LINKED_LIBRARIES, a blank-separated
+// list of NAME=VERSION=inside|shared.
 struct LinkedLibrary {
   std::string_view name, version;
   Linking linking;
@@ -121,8 +122,8 @@ bool HasWord(std::string_view list, std::string_view word) {
   return false;
 }
 
-// What the build, the codecs and the front end say about the library of a row; false when none of
-// them knows it. What was linked is taken out of `linked`.
+// Combines a row with what the build, the codecs and the front end know about the library; false if
+// none of them does. Removes it from `linked`.
 bool Complete(const Row& row, std::vector<LinkedLibrary>& linked,
               const std::vector<FormatLibrary>& ofFormats, std::span<const OwnLibrary> own,
               Library& library) {
@@ -142,7 +143,7 @@ bool Complete(const Row& row, std::vector<LinkedLibrary>& linked,
   }
   for (const FormatLibrary& codec : ofFormats) {
     if (library.name != codec.name) continue;
-    const std::string version = codec.version();  // or one of two words
+    const std::string version = codec.version();  // or a message of two words
     library.present = version != "missing";
     if (version != "missing" && version != "present") library.version = version;
     library.purpose = codec.purpose;
@@ -167,7 +168,7 @@ std::vector<Library> LibrariesOf(std::span<const OwnLibrary> own) {
     Library library{row.name, {}, row.license, row.copyright, row.purpose, Linking::Loaded, true};
     if (Complete(row, linked, ofFormats, own, library)) libraries.push_back(std::move(library));
   }
-  for (const LinkedLibrary& one : linked) {  // a row is missing above
+  for (const LinkedLibrary& one : linked) {  // those without a row above
     libraries.push_back({std::string(one.name), std::string(one.version), "", "",
                          TrLater("unknown"), one.linking, true});
   }

@@ -68,7 +68,7 @@ TEST(CatalogueDrawing, FrameAndPicture) {
   }
 }
 
-TEST(CatalogueDrawing, NamesStayInTheirBand) {
+TEST(CatalogueDrawing, NamesStayInTheirArea) {
   TextFont font;
   ASSERT_EQ(font.OpenForLine("No Such Family", kCaptionHeight), Status::Ok);
   const std::string name = "a & b.jpg", lengthy(100, 'w'), odd = "\xff\xc0\xaf\x01\xe2\x82";
@@ -127,7 +127,7 @@ TEST(CataloguePage, FirstFreeNames) {
   EXPECT_EQ(folder.Names().size(), 4u);
 }
 
-TEST(CataloguePage, SheetsAreTheSameWithAnyNumberOfJobs) {
+TEST(CataloguePage, IsTheSameWithAnyNumberOfJobs) {
   const TemporaryFolder folder;
   std::vector<BatchFile> files;
   for (int i = 0; i < 9; ++i) {
@@ -172,7 +172,7 @@ class AbortingBox : public ProgressBox {
   const std::string last_;
 };
 
-TEST(CataloguePage, APageThatIsNotFullIsNotWrittenAfterAbort) {
+TEST(CataloguePage, WritesNoPartialPageAfterAbort) {
   const TemporaryFolder folder;
   std::vector<BatchFile> files;
   for (int i = 0; i < 5; ++i) {

@@ -98,7 +98,7 @@ TEST(DestinationName, SearchesForNamesEnd) {
   EXPECT_FALSE(outcome.skipped);
 }
 
-TEST(DestinationName, ExtensionsFollowTheSourcesCase) {
+TEST(DestinationName, ExtensionsMatchTheSourcesCase) {
   const struct {
     const char *format, *source;
     const char* styles[3];
@@ -137,7 +137,7 @@ TEST(DestinationName, FolderPrefixAndTree) {
   EXPECT_EQ(CompletedDestination("names", std::string(255, 'f')), std::nullopt);
 }
 
-TEST(DestinationName, WhatBecomesOfATakenName) {
+TEST(DestinationName, ExistingNames) {
   const OverwriteChecks ask{}, replace{.keepBoth = false};
   const struct {
     const char* name;
@@ -198,7 +198,7 @@ TEST(DestinationName, WhatBecomesOfATakenName) {
   }
 }
 
-TEST(DestinationName, AnswersHoldForTheRest) {
+TEST(DestinationName, AnswersApplyToTheRest) {
   ScriptedPrompts prompts;
   prompts.answers = {{true, {.applyToRest = true}, "a", false}};
   BatchJob job;

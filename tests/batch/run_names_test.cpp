@@ -11,7 +11,7 @@ namespace fotomill::test {
 namespace {
 
 // Files whose names depend on other files of the run must wait for those.
-TEST(RunNames, OnlyFilesThatNobodyElseConcernsGoAhead) {
+TEST(RunNames, OnlyIndependentFilesRunAhead) {
   // sources and outputs; the prompt is about the first one
   using Plan = std::vector<std::pair<const char*, const char*>>;
   const struct {
@@ -42,7 +42,7 @@ TEST(RunNames, OnlyFilesThatNobodyElseConcernsGoAhead) {
   }
 }
 
-TEST(RunNames, AreTakenUntilTheyAreGivenBack) {
+TEST(RunNames, AreReservedUntilReleased) {
   const TemporaryFolder folder;
   WriteText(folder.Path("there"), "");
   RunNames names;

@@ -49,7 +49,7 @@ class Run : public testing::Test {
   const ScopedSettings keep_;
 };
 
-TEST_F(Run, SeveralAtATimeGiveWhatOneAfterTheOtherGives) {
+TEST_F(Run, ParallelResultsEqualSequentialOnes) {
   std::vector<BatchFile> files;
   for (const char* folder : {"one", "two", "three"}) {
     fs::create_directory(In(folder));
@@ -104,7 +104,7 @@ TEST_F(Run, SeveralAtATimeGiveWhatOneAfterTheOtherGives) {
   }
 }
 
-TEST_F(Run, FunctionsPutTheirPrefixInFrontBeforeNamesCollide) {
+TEST_F(Run, PrefixesApplyBeforeCollisions) {
   WriteBytes(In("a.bmp"), BitmapFile(8, 8, 24));
   const BatchFile file{In("a.bmp"), {}, Status::Ok, {}};
   const struct {
@@ -121,7 +121,7 @@ TEST_F(Run, FunctionsPutTheirPrefixInFrontBeforeNamesCollide) {
   }
 }
 
-TEST_F(Run, AnOutputThatFailedLeavesItsNameToTheNext) {
+TEST_F(Run, FailedOutputsReleaseTheirName) {
   fs::create_directory(In("two"));
   WriteBytes(In("a.bmp"), BitmapFile(70000, 1, 24));  // too wide for JPEG
   WriteBytes(In("two/a.bmp"), BitmapFile(8, 8, 24));
@@ -140,7 +140,7 @@ TEST_F(Run, AnOutputThatFailedLeavesItsNameToTheNext) {
   }
 }
 
-TEST_F(Run, AVariantMayBeTooLongWhereItsNameWasNot) {
+TEST_F(Run, NumberedNamesMayBecomeTooLong) {
   fs::create_directory(In("out"));
   const std::string base(260 - In("out/.pcx").size(), 'n');
   const BatchFile file{In(base + ".bmp"), {}, Status::Ok, {}};
@@ -154,7 +154,7 @@ TEST_F(Run, AVariantMayBeTooLongWhereItsNameWasNot) {
   EXPECT_EQ(Outputs().size(), 1u);
 }
 
-TEST_F(Run, ASourceWaitsForTheOutputThatTakesItsPlace) {
+TEST_F(Run, SourcesAreReadBeforeTheyAreReplaced) {
   // Each file's output is the next one's source and replaces it: the last output has
   // the first picture.
   for (const uint32_t jobs : {1u, 4u}) {
@@ -174,7 +174,7 @@ TEST_F(Run, ASourceWaitsForTheOutputThatTakesItsPlace) {
   }
 }
 
-TEST_F(Run, NeverMorePicturesThanJobsAndNothingBegunAfterAbort) {
+TEST_F(Run, KeepsToTheJobLimitAndStartsNothingAfterAbort) {
   std::vector<BatchFile> files;
   for (int i = 0; i < 60; ++i) {
     files.push_back({In("p" + std::to_string(i) + ".bmp"), {}, Status::Ok, {}});
@@ -208,7 +208,7 @@ TEST_F(Run, NeverMorePicturesThanJobsAndNothingBegunAfterAbort) {
   }
 }
 
-TEST_F(Run, WhateverFailsNoFileIsLost) {
+TEST_F(Run, NoFaultLosesAFile) {
   const std::string bin = In("home/Trash/files/a.pcx");
   const ScopedEnvironment environment("XDG_DATA_HOME", In("home"));
   WriteBytes(In("a.bmp"), BitmapFile(8, 8, 24));

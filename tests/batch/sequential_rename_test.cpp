@@ -150,7 +150,7 @@ TEST_F(Rename, Names) {
 }
 
 // The settings may change while a run waits for others.
-TEST_F(Rename, RunsByTheRulesThatItWasStartedWith) {
+TEST_F(Rename, KeepsTheRulesItWasStartedWith) {
   Make({"a.jpg", "b.jpg"});
   settings.SequentialRenameIncrement = 5;
   const RenameOptions options{.rules = SequentialRenameRulesFromSettings()};
@@ -162,7 +162,7 @@ TEST_F(Rename, RunsByTheRulesThatItWasStartedWith) {
   EXPECT_THAT(There(), ElementsAre("PICTURE0001.jpg=a.jpg", "PICTURE0006.jpg=b.jpg"));
 }
 
-TEST_F(Rename, TakenBack) {
+TEST_F(Rename, Undo) {
   Make({"a.jpg", "b.jpg", "c.jpg"});
   const BatchJob job = RunAsSet({"a.jpg", "b.jpg", "c.jpg"});
   ASSERT_EQ(job.uses.size(), 6u);
@@ -183,7 +183,7 @@ TEST_F(Rename, TakenBack) {
 }
 
 // Renames are logged first: a run that is killed in between has either lost nothing or not started.
-TEST_F(Rename, KilledRunsCanBeTakenBack) {
+TEST_F(Rename, KilledRunsCanBeUndone) {
   Make({"a.jpg", "b.jpg"});
   const std::string a = folder_.Path("p/a.jpg"), b = folder_.Path("p/b.jpg");
   {
@@ -211,7 +211,7 @@ TEST_F(Rename, KilledRunsCanBeTakenBack) {
   EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg"));
 }
 
-TEST_F(Rename, RunsAtTheSameTimeAreBothTakenBack) {
+TEST_F(Rename, ConcurrentRunsAreBothUndone) {
   Make({"a.jpg", "b.jpg"});
   const auto rename = [&](RenameLog& log, const std::string& from, const std::string& to) {
     ASSERT_TRUE(log.Intend({folder_.Path(from), folder_.Path(to)}));
@@ -242,7 +242,7 @@ TEST_F(Rename, RunsAtTheSameTimeAreBothTakenBack) {
   EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg"));
 }
 
-TEST_F(Rename, UndoGivesTheNumbersBack) {
+TEST_F(Rename, UndoRestoresTheNumber) {
   Make({"a.jpg", "b.jpg"});
   settings.SequentialRenameBaseNumber = 7;
   RunAsSet({"a.jpg", "b.jpg"});
@@ -254,7 +254,7 @@ TEST_F(Rename, UndoGivesTheNumbersBack) {
   EXPECT_EQ(settings.SequentialRenameBaseNumber, 7u);
 }
 
-TEST_F(Rename, RandomOrderIsThatOfItsSeed) {
+TEST_F(Rename, RandomOrderDependsOnTheSeed) {
   EXPECT_THAT(RandomOrder(8, 1), testing::UnorderedElementsAre(0, 1, 2, 3, 4, 5, 6, 7));
   EXPECT_EQ(RandomOrder(100, 5), RandomOrder(100, 5));
   EXPECT_NE(RandomOrder(100, 5), RandomOrder(100, 6));

@@ -28,7 +28,7 @@ std::vector<std::string> LinesOf(const BatchJob& job) {
   return lines;
 }
 
-TEST(Turn, FilesChangeOnlyWhereNothingIsLost) {
+TEST(Turn, ChangesFilesOnlyWithoutLoss) {
   const TemporaryFolder folder;
   const PicturePointer picture = PatternPicture(32, 16, 24);
   const struct {
@@ -96,7 +96,7 @@ TEST(Turn, StopsWithinAFile) {
   }
 }
 
-TEST(Turn, AFileThatWouldLoseItsTextsStaysAsItIs) {
+TEST(Turn, SkipsFilesThatWouldLoseTexts) {
   const ScopedSettings scoped;
   const TemporaryFolder folder;
   const PicturePointer commented = PatternPicture(9, 5, 24), tagged = PatternPicture(9, 5, 24);
@@ -124,7 +124,7 @@ TEST(Turn, AFileThatWouldLoseItsTextsStaysAsItIs) {
   }
 }
 
-TEST(Turn, SelectionsKeepTheirNamesAndTheirOldFiles) {
+TEST(Turn, KeepsNamesAndOldFiles) {
   const TemporaryFolder folder;
   const std::vector<uint8_t> bitmap = BitmapFile(9, 5, 24);
   for (const char* name : {"a.bmp", "b.bmp", "c.bmp"}) WriteBytes(folder.Path(name), bitmap);
@@ -162,7 +162,7 @@ TEST(Turn, SelectionsKeepTheirNamesAndTheirOldFiles) {
   EXPECT_FALSE(TurnPictureFile(folder.Path("c.bmp"), folder.Path("c.bmp"), {}, {}, {}).changed);
 }
 
-TEST(Turn, WhateverFailsTheOldFileIsThere) {
+TEST(Turn, KeepsTheOldFileOnEveryFault) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("a.jpg");
   const std::vector<uint8_t> file = Encode(JpegWrite, *PatternPicture(32, 16, 24));

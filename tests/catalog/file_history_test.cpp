@@ -115,7 +115,7 @@ TEST_F(FileHistory, IsLimitedByCountOrByDays) {
   EXPECT_THAT(List(), IsEmpty());
 }
 
-TEST_F(FileHistory, RefusesWhatItCannotKeep) {
+TEST_F(FileHistory, RejectsInvalidEntries) {
   const std::string a = File("a");
   std::filesystem::create_directory(folder_.Path("folder"));
   std::string deep = folder_.Path();
@@ -159,7 +159,7 @@ TEST_F(FileHistory, RefusesWhatItCannotKeep) {
   }
 }
 
-TEST_F(FileHistory, WritesItsLinesToTheByte) {
+TEST_F(FileHistory, HasTheDocumentedLayout) {
   const std::string path = folder_.Path("data/a");
   WriteText(path, "");
   EXPECT_TRUE(Record(path, 9, 0));
@@ -174,7 +174,7 @@ TEST_F(FileHistory, WritesItsLinesToTheByte) {
   EXPECT_EQ(ReadBytes(Store()), wanted);
 }
 
-TEST_F(FileHistory, ReadsLinesAsTheyCome) {
+TEST_F(FileHistory, ReadsAllKindsOfLines) {
   File("a");
   File("b");
   const std::string good = Line("a", "\tFUNCTION:3\tACCESSED:1699999990\tEND:");
@@ -209,7 +209,7 @@ TEST_F(FileHistory, ReadsLinesAsTheyCome) {
   }
 }
 
-TEST_F(FileHistory, LeavesAloneWhatItCannotRead) {
+TEST_F(FileHistory, LeavesUnreadableFilesAlone) {
   const FileUse use{File("a"), FileFunction::View};
   EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}), HistoryUpdate::Done);
   for (const std::string text : {"a letter to my aunt\n", "\x89PNG\r\n"}) {
@@ -227,7 +227,7 @@ TEST_F(FileHistory, LeavesAloneWhatItCannotRead) {
   EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}), HistoryUpdate::Failed);
 }
 
-TEST_F(FileHistory, SwitchedOffIsDeletedAtTheNextSave) {
+TEST_F(FileHistory, IsDeletedWhenSwitchedOff) {
   const FileUse use{File("a"), FileFunction::View};
   EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}), HistoryUpdate::Done);
   settings.FileHistoryEnable = 0;
@@ -238,7 +238,7 @@ TEST_F(FileHistory, SwitchedOffIsDeletedAtTheNextSave) {
 }
 
 // The list grows to 128 x 128 slots and more, but only slots with entries may use memory.
-TEST_F(FileHistory, GrowsWithoutTouchingWhatItReserves) {
+TEST_F(FileHistory, GrowsWithoutTouchingReservedMemory) {
   settings.FileHistoryWindowType = choice::kLimitDays;
   const std::string file = File("a");
   int64_t recorded = 0;
@@ -259,7 +259,7 @@ TEST_F(FileHistory, GrowsWithoutTouchingWhatItReserves) {
 #endif
 }
 
-TEST_F(FileHistory, SlotsHoldTheThumbnailsOfTheirFiles) {
+TEST_F(FileHistory, SlotsMatchTheirFiles) {
   settings.FileHistoryWindowType = choice::kLimitDays;
   const auto put = [&](const std::string& name, uint8_t value) {
     ThumbnailRecord record;
@@ -287,7 +287,7 @@ TEST_F(FileHistory, SlotsHoldTheThumbnailsOfTheirFiles) {
   EXPECT_EQ(shown(0), -1);
 }
 
-TEST_F(FileHistory, FaultsLoseNothingThatWasThere) {
+TEST_F(FileHistory, FaultsLoseNoEntry) {
   const FileUse first{File("a"), FileFunction::View, kOwnTime, static_cast<int32_t>(kNow - 9)};
   EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&first, 1}), HistoryUpdate::Done);
   const std::string old = ReadText(Store());

@@ -38,7 +38,7 @@ PictureHashes HashesOf(const PictureRecord& picture) {
   return hashes;
 }
 
-TEST(PictureHash, IsThatOfTheSamePictureInAnotherForm) {
+TEST(PictureHash, IsTheSameForOtherVersionsOfAPicture) {
   for (int32_t seed = 1; seed < 5; ++seed) {
     const PictureHash own = HashesOf(*Landscape(160, 100, seed))[0];
     EXPECT_LE(HashDistance(own, HashesOf(*Landscape(80, 50, seed))[0]), 6) << "smaller";
@@ -47,7 +47,7 @@ TEST(PictureHash, IsThatOfTheSamePictureInAnotherForm) {
   }
 }
 
-TEST(PictureHash, KnowsAllWaysToTurnAPicture) {
+TEST(PictureHash, FindsRotatedPictures) {
   const auto source = Landscape(96, 96, 3);
   const PictureHashes own = HashesOf(*source);
   std::set<PictureHash> found;
@@ -118,7 +118,7 @@ TEST(SimilarGroups, AreLinkedWithinTheLimit) {
   EXPECT_TRUE(FindSimilar(pictures, 3, false, [] { return false; }).empty());
 }
 
-TEST(SimilarGroups, PartsFindWhatAllPairsFind) {
+TEST(SimilarGroups, IndexedSearchMatchesAllPairs) {
   std::vector<PictureHashes> pictures;
   for (int32_t i = 0; i < 3000; ++i) {
     // Clusters of five around scattered centers, a few bits apart.
@@ -175,7 +175,7 @@ HashRecord RecordOf(uint64_t size, PictureHash hash) {
   return record;
 }
 
-TEST(HashStore, KeepsWhatWasPut) {
+TEST(HashStore, StoresHashes) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("new/store");
   {
@@ -206,7 +206,7 @@ TEST(HashStore, KeepsWhatWasPut) {
   EXPECT_EQ(store.Find("/fresh", 1, int64_t{1} << 40), nullptr);
 }
 
-TEST(HashStore, EndsWhereAProgramWasStopped) {
+TEST(HashStore, SurvivesTruncation) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("store");
   HashStore first(path);
@@ -235,7 +235,7 @@ TEST(HashStore, EndsWhereAProgramWasStopped) {
   }
 }
 
-TEST(HashStore, IsSharedAndNeverTakesWhatIsNotItsOwn) {
+TEST(HashStore, IsSharedAndRejectsForeignFiles) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("store");
   HashStore one(path), two(path);

@@ -69,7 +69,7 @@ bool Append(ThumbnailDatabase& database, const std::string& path, const std::str
   return database.AppendDatabaseRecords({&record, 1}, replace);
 }
 
-TEST_F(Database, IsLaidOutToTheByte) {
+TEST_F(Database, HasTheDocumentedLayout) {
   ThumbnailDatabase database;
   EXPECT_EQ(database.OpenThumbnailDatabase(Path(), false), Opened::Missing);
   ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
@@ -124,7 +124,7 @@ TEST_F(Database, NamesVolumes) {
 
 // Every lookup must return the same as a scan from the first record, whatever happened before, and
 // through any handle.
-TEST_F(Database, FindsWhatAScanFinds) {
+TEST_F(Database, LookupsMatchAScan) {
   ThumbnailDatabase one, two;
   ASSERT_EQ(one.OpenThumbnailDatabase(Path(), true), Opened::Done);
   ASSERT_EQ(two.OpenThumbnailDatabase(Path(), false), Opened::Done);
@@ -191,7 +191,7 @@ TEST_F(Database, FindsWhatAScanFinds) {
   }
 }
 
-TEST_F(Database, ComparesExtensionsAsItIsTold) {
+TEST_F(Database, ComparesExtensionsByOption) {
   ThumbnailDatabase database;
   ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
   ASSERT_TRUE(Append(database, "/p.x/a.jpg", "v", 1) && Append(database, "/p.x/a.png", "w", 2) &&
@@ -217,7 +217,7 @@ TEST_F(Database, ComparesExtensionsAsItIsTold) {
 }
 
 // Lookups are right whatever happened to the saved index.
-TEST_F(Database, ASavedIndexIsOnlyAHelp) {
+TEST_F(Database, SavedIndexIsOnlyAHint) {
   constexpr int kMany = 1200;
   const std::string index = Path() + ".index";
   std::vector<DatabaseRecord> records;
@@ -301,7 +301,7 @@ TEST(ThumbnailIndex, KnowsEveryRecordInOrderThroughChanges) {
   }
 }
 
-TEST_F(Database, LeavesAloneWhatItCannotRead) {
+TEST_F(Database, LeavesUnreadableFilesAlone) {
   ThumbnailDatabase database;
   ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
   ASSERT_TRUE(Append(database, "/a", "v", 1));
@@ -353,7 +353,7 @@ TEST_F(Database, LeavesAloneWhatItCannotRead) {
   }
 }
 
-TEST_F(Database, PurgesOnlyWhereItCanTell) {
+TEST_F(Database, PurgesOnlyAvailableVolumes) {
   static platform::DriveKind kind;
   static std::string label;
   platform::ReplaceVolumeFunction([](const std::string&) {
@@ -453,7 +453,7 @@ TEST_F(Database, TwoProcessesAppendAndCompact) {
 
 // Records whose append was reported exist, and the database is readable, whenever the
 // writer is killed.
-TEST_F(Database, AKilledWriterLosesNothingReported) {
+TEST_F(Database, AKilledWriterLosesNoReportedRecord) {
   for (int round = 0; round < 12; ++round) {
     int reported[2];
     ASSERT_EQ(pipe(reported), 0);
@@ -507,7 +507,7 @@ TEST_F(Database, AFullDiskFailsAndCountsNothing) {
   EXPECT_THAT(Records(), ElementsAre("/a v 1", "/c v 3"));
 }
 
-TEST_F(Database, CommandsDoAsTheySay) {
+TEST_F(Database, Commands) {
   platform::FixNow(-1);
   const auto in = [&](const char* name) { return folder_.Path(name); };
   WriteBytes(in("a.bmp"), BitmapFile(5, 3, 24));

@@ -80,7 +80,7 @@ TEST(DrawThumbnail, FillsTheSquareOfItsFlags) {
   EXPECT_EQ(canvas.PixelAt(1, 0), (255 * 5 + 3) / 6 * 0x010101);
 }
 
-TEST(DrawThumbnail, TurnsGrayTermByTermAndClips) {
+TEST(DrawThumbnail, ConvertsToGrayTermByTermAndClips) {
   ThumbnailRecord record;
   record.Fill(0x3264ff);  // blue 50, green 100, red 255
   PackedImage canvas = Canvas(10);
@@ -165,7 +165,7 @@ class Lookup : public testing::Test {
   std::string picture_ = folder_.Path("a b.bmp");
 };
 
-TEST_F(Lookup, TakesTheSystemsThumbnailWhileItIsValid) {
+TEST_F(Lookup, UsesTheSystemsThumbnailWhileValid) {
   LargeThumbnailRecord record;
   EXPECT_FALSE(ReadSystemThumbnail(picture_, 0xabcdef, record));
   const struct {
@@ -200,7 +200,7 @@ TEST_F(Lookup, TakesTheSystemsThumbnailWhileItIsValid) {
   EXPECT_THAT(record.StoredRow(38).subspan(38 * 3, 3), testing::Not(testing::ElementsAre(0xab, 0xcd, 0xef)));
 }
 
-TEST_F(Lookup, AsksWhereTheModeSays) {
+TEST_F(Lookup, SearchesAccordingToMode) {
   ThumbnailDatabase database;
   ASSERT_EQ(database.OpenThumbnailDatabase(folder_.Path("Fotomill.tdb"), true), ThumbnailDatabase::Opened::Done);
   const DatabaseRecord stored{Flat(3), picture_, VolumeKeyFor(picture_), false};

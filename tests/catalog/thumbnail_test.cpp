@@ -41,7 +41,7 @@ std::vector<uint8_t> Head(const ThumbnailRecord& record, size_t count) {
   return {record.bytes.begin(), record.bytes.begin() + static_cast<ptrdiff_t>(count)};
 }
 
-TEST(ThumbnailRecord, IsLaidOutToTheByte) {
+TEST(ThumbnailRecord, HasTheDocumentedLayout) {
   ThumbnailRecord record;
   ASSERT_TRUE(MakeThumbnailRecord(record, *Plain(10, 20, 1, 2, 3), {.matte = kMatte}));
   std::vector<uint8_t> wanted = Hex("54 48 4E 4C   # THNL\n 00 02  # version 512");
@@ -53,7 +53,7 @@ TEST(ThumbnailRecord, IsLaidOutToTheByte) {
   EXPECT_EQ(Head(record, wanted.size()), wanted);
 }
 
-TEST(ThumbnailRecord, PlacesPicturesInTheMiddle) {
+TEST(ThumbnailRecord, CentersPictures) {
   const struct {
     const char* name;
     int32_t width, height;
@@ -129,7 +129,7 @@ TEST(ThumbnailRecord, BlendsAlpha) {
   EXPECT_EQ(PixelOf(record, 50, 50), (std::vector<uint8_t>{128, 127 + 50, 50}));
 }
 
-TEST(ThumbnailFile, IsNamedByReplacingTheExtension) {
+TEST(ThumbnailFile, ReplacesTheExtension) {
   EXPECT_EQ(ThumbnailPathFor("/d.x/name.ext"), "/d.x/name.THN");
   EXPECT_EQ(ThumbnailPathFor("/d.x/name"), "/d.x/name.THN");
   EXPECT_EQ(ThumbnailPathFor("a.tar.gz"), "a.tar.THN");
@@ -187,7 +187,7 @@ TEST(ThumbnailFile, ReadsNewAndOldRecords) {
   EXPECT_FALSE(ReadThumbnailFile(read, folder.Path("pipe.THN")));
 }
 
-TEST(ThumbnailFile, IsWrittenInOneStep) {
+TEST(ThumbnailFile, IsWrittenAtomically) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("a.THN");
   ThumbnailRecord old, record;
@@ -231,7 +231,7 @@ class ThumbsCommand : public testing::Test {
   TemporaryFolder folder_;
 };
 
-TEST_F(ThumbsCommand, MakesWhatIsMissingAndCleansWhatIsLeft) {
+TEST_F(ThumbsCommand, CreatesMissingAndRemovesOrphanedThumbnails) {
   for (const char* name : {"a.bmp", "b.bmp", "c.bmp"}) Put(name);
   WriteText(In("bad.bmp"), "BM");
   WriteText(In("b.THN"), "broken");
@@ -270,7 +270,7 @@ TEST_F(ThumbsCommand, MakesWhatIsMissingAndCleansWhatIsLeft) {
   EXPECT_EQ(RunCommand({"thumbs", "clean", In("nothere")}).status, 1);
 }
 
-TEST_F(ThumbsCommand, PicturesOfOneNameShareTheLastOnesThumbnail) {
+TEST_F(ThumbsCommand, PicturesWithTheSameNameShareAThumbnail) {
   Put("a.bmp");
   WriteBytes(In("a.dib"), BitmapFile(3, 5, 1));
   ASSERT_EQ(RunCommand({"thumbs", "make", In("a.dib")}).status, 0);
@@ -281,7 +281,7 @@ TEST_F(ThumbsCommand, PicturesOfOneNameShareTheLastOnesThumbnail) {
   }
 }
 
-TEST_F(ThumbsCommand, DrawsAPictureSmall) {
+TEST_F(ThumbsCommand, DrawsPictures) {
   WriteBytes(In("a.bmp"), BitmapFile(300, 100, 24));
   WriteText(In("t.bmp"), "");
   EXPECT_EQ(RunCommand({"thumbs", "draw", In("a.bmp"), "--out", In("t.bmp"), "--side", "90"}).status, 1);
@@ -292,7 +292,7 @@ TEST_F(ThumbsCommand, DrawsAPictureSmall) {
   EXPECT_TRUE(RunCommand({"thumbs", "draw", In("x.bmp"), "--out", In("u.bmp")}).Says(In("x.bmp") + ": File open error."));
 }
 
-TEST_F(ThumbsCommand, ShowsAThumbnailAsAPicture) {
+TEST_F(ThumbsCommand, ExportsThumbnails) {
   Put("a.bmp");
   ASSERT_EQ(RunCommand({"thumbs", "make", In("a.bmp")}).status, 0);
   EXPECT_EQ(RunCommand({"thumbs", "show", In("a.THN"), "--out", In("t.bmp")}).status, 0);

@@ -71,7 +71,7 @@ class ThumbnailUpdate : public testing::Test {
   Face face_;
 };
 
-TEST_F(ThumbnailUpdate, IsOfferedWhereItMakesSense) {
+TEST_F(ThumbnailUpdate, IsOfferedIfUseful) {
   const struct {
     const char* name;
     choice::ThumbnailMode mode;
@@ -108,7 +108,7 @@ TEST_F(ThumbnailUpdate, IsOfferedWhereItMakesSense) {
   }
 }
 
-TEST_F(ThumbnailUpdate, TakesTheAnswer) {
+TEST_F(ThumbnailUpdate, StoresTheAnswer) {
   const struct {
     int32_t stored, selected, answer, storedAfter, flagAfter;
     bool asksAfter, builds, keeps;
@@ -140,7 +140,7 @@ TEST_F(ThumbnailUpdate, TakesTheAnswer) {
   EXPECT_FALSE(OfferThumbnailUpdate(browser_, face_)) << "none is missing";
 }
 
-TEST_F(ThumbnailUpdate, RemovesOrphansOnceInAWhile) {
+TEST_F(ThumbnailUpdate, RemovesOrphansPeriodically) {
   browser_.lastCompaction = kNow - 30 * kDay;
   EXPECT_FALSE(IsCompactionDue(browser_));
   --browser_.lastCompaction;

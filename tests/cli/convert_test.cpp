@@ -57,7 +57,7 @@ TEST_F(Convert, WritesBesideTheSourceIntoAFolderOrUnderAName) {
   EXPECT_EQ(ReadBytes(In("odd.name")), ReadBytes(In("named.pcx")));
 }
 
-TEST_F(Convert, UsageErrorsTouchNothing) {
+TEST_F(Convert, UsageErrorsChangeNothing) {
   const std::vector<std::string> before = folder_.Names();
   const struct {
     const char* name;
@@ -91,7 +91,7 @@ TEST_F(Convert, UsageErrorsTouchNothing) {
   }
 }
 
-TEST_F(Convert, FailuresLeaveNothingBehindAndStopNobody) {
+TEST_F(Convert, FailuresLeaveNothingBehindAndDoNotStopTheRun) {
   WriteText(In("broken.bmp"), "no bitmap");
   fs::create_directory(In("out"));
   fs::create_directory(In("out/a.pcx"));
@@ -149,7 +149,7 @@ TEST_F(Convert, ExistingDestinations) {
   }
 }
 
-TEST_F(Convert, AnswersForAllThatFollow) {
+TEST_F(Convert, AnswersApplyToTheRest) {
   fs::create_directory(In("out"));
   WriteText(In("out/a.pcx"), "old");
   WriteText(In("out/mono.pcx"), "old");
@@ -160,7 +160,7 @@ TEST_F(Convert, AnswersForAllThatFollow) {
   EXPECT_NE(ReadText(In("out/mono.pcx")), "old");
 }
 
-TEST_F(Convert, SourcesOfOneNameNeverReplaceEachOther) {
+TEST_F(Convert, SourcesWithTheSameNameNeverReplaceEachOther) {
   EXPECT_EQ(Run({In("a.bmp"), "-o", In("tree/a.pcx")}).status, 0);
   for (const char* policy : {"keep-both", "replace"}) {
     SCOPED_TRACE(policy);
@@ -205,7 +205,7 @@ TEST_F(Convert, NumberedVariantsStayInTheirRange) {
   EXPECT_EQ(folder_.Names().size(), 6u);
 }
 
-TEST_F(Convert, KeepsTheTreeAndTheTimes) {
+TEST_F(Convert, KeepsFoldersAndTimes) {
   const auto then = fs::file_time_type::clock::now() - std::chrono::hours(1000);
   fs::last_write_time(In("tree/top.bmp"), then);
   EXPECT_EQ(Run({In("tree"), "-r", "-t", "pcx", "-d", In("out"), "--keep-tree", "--keep-times"}).status, 0);
@@ -222,7 +222,7 @@ TEST_F(Convert, DepthIsReducedOnlyWhenAskedFor) {
   EXPECT_EQ(Run({In("mono.bmp"), "-t", "mac", "-d", In("out")}).status, 0);
 }
 
-TEST_F(Convert, DryRunSaysTheSameAndDoesNothing) {
+TEST_F(Convert, DryRunPrintsTheSameAndChangesNothing) {
   WriteText(In("broken.bmp"), "no bitmap");
   const std::vector<std::string> arguments{folder_.Path(), In("tree"), "-t",
                                            "pcx",          "-d",       In("out")};

@@ -65,7 +65,7 @@ TEST_F(ExifCommand, ShowsTypesWhenAsked) {
   EXPECT_THAT(lines, HasSubstr("    Unknown (50341) [UNDEFINED]\t1 2 3 4\n"));
 }
 
-TEST_F(ExifCommand, EscapesWhatValuesMayHold) {
+TEST_F(ExifCommand, EscapesValues) {
   BlockBuilder blocks;
   const uint32_t text = blocks.Bytes(Hex("61 0A 1B 5B 6D 7F C3A9 C285 E9 00"));
   blocks.Patch32(4, blocks.Directory({{0x010e, 2, 11, text}}));

@@ -88,7 +88,7 @@ TEST_F(FileCommands, SelectionKeepsItsOrder) {
   EXPECT_EQ(RunCommand({"info", "--files-from", In("missing")}).status, 2);
 }
 
-TEST_F(FileCommands, WhatCannotBeOpenedFailsAloneWithAMessage) {
+TEST_F(FileCommands, FilesThatCannotBeOpenedFailIndividually) {
   mkfifo(In("pipe.bmp").c_str(), 0600);
   fs::create_symlink(In("nowhere.bmp"), In("dangling.bmp"));
   WriteText(In("empty.bmp"), "");
@@ -212,7 +212,7 @@ TEST_F(FileCommands, HostileNames) {
   EXPECT_EQ(failing.err.find('\x1b'), std::string::npos);
 }
 
-TEST_F(FileCommands, VerifyDecodesWhatInfoOnlyLooksAt) {
+TEST_F(FileCommands, VerifyDecodesPixelsThatInfoSkips) {
   std::vector<uint8_t> cut = BitmapFile(64, 64, 24);
   cut.resize(cut.size() / 2);
   Put("cut.bmp", cut);
@@ -223,7 +223,7 @@ TEST_F(FileCommands, VerifyDecodesWhatInfoOnlyLooksAt) {
 }
 
 // Every command opens a picture with the wrong extension, and reports its format.
-TEST_F(FileCommands, OpensFilesWhoseNamesLie) {
+TEST_F(FileCommands, OpensFilesWithWrongExtensions) {
   ASSERT_EQ(RunCommand({"convert", In("a.bmp"), "--to", "jpg", "--out", In("made.jpg")}).status, 0);
   fs::rename(In("made.jpg"), In("photo.png"));
   const json facts = json::parse(RunCommand({"info", "--json", In("photo.png")}).out)[0];
@@ -243,7 +243,7 @@ TEST_F(FileCommands, OpensFilesWhoseNamesLie) {
   EXPECT_THAT(off.err, HasSubstr("Damaged file. It looks like JPEG."));
 }
 
-TEST_F(FileCommands, MatchLooksIntoFiles) {
+TEST_F(FileCommands, MatchChecksContents) {
   ASSERT_EQ(RunCommand({"convert", In("a.bmp"), "--to", "jpg", "--out", In("made.jpg")}).status, 0);
   fs::copy(In("made.jpg"), In("made.scr"));
   fs::copy(In("made.jpg"), In("made"));
@@ -266,7 +266,7 @@ TEST_F(FileCommands, MatchLooksIntoFiles) {
   EXPECT_EQ(array[1]["looksLike"], "AVIF");
 }
 
-TEST(MatchCommand, TellsTheRowAndTheRule) {
+TEST(MatchCommand, ShowsTheRowAndTheRule) {
   const CommandResult text = RunCommand({"match", "scan.tiff", "x.bmp", "odd.abc"});
   EXPECT_EQ(text.status, 1);
   EXPECT_EQ(text.out,
@@ -293,7 +293,7 @@ TEST(FormatsCommand, ListsTheRegistry) {
   EXPECT_THAT(RunCommand({"formats", "--filter"}).out, HasSubstr("\n(BMP) Windows bitmap\t*.BMP\n"));
 }
 
-TEST(DoctorCommand, TellsWhatIsWrongWithTheConfiguration) {
+TEST(DoctorCommand, ReportsConfigurationErrors) {
   const TemporaryFolder folder;
   WriteText(folder.Path("Fotomill Professional 11.ini"),
             "[Fotomill]\nJpegCompression=high\nPngCompression=6\n");

@@ -88,7 +88,7 @@ TEST(Frame, ExitStatusesAndMessages) {
 }
 
 // Names are passed through byte for byte, whatever they look like.
-TEST(Frame, NamesComeThroughUnchanged) {
+TEST(Frame, PrintsNamesUnchanged) {
   for (const std::string name :
        {"[a,b].bmp", "[x]", "{}", "%%", "", " ", "a\nb.bmp", "\xff\xfe.bmp", "--", "-x.bmp",
         "--json", "a=b", "++", "/?", "match", "-5", "\"quoted\""}) {
@@ -111,7 +111,7 @@ TEST(Frame, EveryCommandHasAPageWithAnExample) {
   }
 }
 
-TEST(Frame, UnwritableOutputIsAFailure) {
+TEST(Frame, UnwritableOutputFails) {
   std::FILE* full = std::fopen("/dev/full", "w");
   if (full == nullptr) GTEST_SKIP() << "no device that is always full";
   std::FILE* messages = std::tmpfile();
@@ -121,7 +121,7 @@ TEST(Frame, UnwritableOutputIsAFailure) {
   std::fclose(messages);
 }
 
-TEST(Frame, ColorFollowsOptionTerminalAndEnvironment) {
+TEST(Frame, ColorDependsOnOptionTerminalAndEnvironment) {
   const struct {
     const char* name;
     std::vector<std::string> options;

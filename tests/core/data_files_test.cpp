@@ -17,7 +17,7 @@ using namespace std::string_literals;
 using test::TemporaryFolder;
 using Texts = std::vector<std::string>;
 
-TEST(FolderOverride, SetsWhatItHolds) {
+TEST(FolderOverride, SetsItsModes) {
   const BrowserModes current{1, 2, 3};
   struct Row {
     const char* name;
@@ -40,7 +40,7 @@ TEST(FolderOverride, SetsWhatItHolds) {
   }
 }
 
-TEST(FolderOverride, CountsOnlyWhereItIsWanted) {
+TEST(FolderOverride, AppliesOnlyIfEnabled) {
   const test::ScopedSettings saved;
   const TemporaryFolder folder;
   const BrowserModes current{1, 2, 3};
@@ -61,7 +61,7 @@ class DataFilesTest : public testing::Test {
   TemporaryFolder folder_;
 };
 
-TEST_F(DataFilesTest, HistoryHasTheLatestFirst) {
+TEST_F(DataFilesTest, HistoryListsTheLatestFirst) {
   settings.CopyHistoryMax = 3;
   EXPECT_EQ(LoadHistoryList(HistoryList::MoveCopy), Texts{});
   for (const char* entry : {"/a", "/b", "~~~DEFAULT~~~", "/b", "/c"}) {
@@ -84,7 +84,7 @@ TEST_F(DataFilesTest, HistoryHasTheLatestFirst) {
   EXPECT_TRUE(ClearHistoryList(HistoryList::PictureSearch));
 }
 
-TEST_F(DataFilesTest, HistoryTextIsTakenAsFarAsItGoes) {
+TEST_F(DataFilesTest, ReadsDamagedHistories) {
   const std::string longest(260, 'x');
   EXPECT_EQ(ParseHistoryList("\r\n/a\r\n\n/b\n/a\n" + longest + "\n" + longest + "y\nz\0\nlast"s, 10),
             (Texts{"/a", "/b", longest, "last"}));
@@ -93,7 +93,7 @@ TEST_F(DataFilesTest, HistoryTextIsTakenAsFarAsItGoes) {
             (std::vector<RecentFile>{{"/a", 1}, {"/b,c", 2}, {"/e", -3}}));
 }
 
-TEST_F(DataFilesTest, RecentFilesComeBackAsTheyWere) {
+TEST_F(DataFilesTest, RecentFilesRoundTrip) {
   const std::vector<RecentFile> files{{"/pictures/a, b,c", 2}, {"/x\ty,", -1}};
   for (auto file = files.rbegin(); file != files.rend(); ++file) EXPECT_TRUE(AddRecentFile(*file));
   EXPECT_EQ(LoadRecentFiles(), files);
@@ -115,7 +115,7 @@ TEST_F(DataFilesTest, NoFaultHarmsAHistory) {
   EXPECT_EQ(platform::ListFolder(DataFolder())->size(), 1u);
 }
 
-TEST_F(DataFilesTest, PreviousVersionIsCarriedOverOnce) {
+TEST_F(DataFilesTest, CarriesOverThePreviousVersionOnce) {
   const std::string previous = folder_.Path("previous");
   ASSERT_TRUE(platform::MakeFolders(previous + "/folder.txt"));
   const Texts carried{"FMWFileHistoryDatabase.fhdb",
@@ -149,7 +149,7 @@ TEST_F(DataFilesTest, PreviousVersionIsCarriedOverOnce) {
   EXPECT_FALSE(platform::FileExists(folder_.Path("never")));
 }
 
-TEST_F(DataFilesTest, CarryingOverIsWholeOrNotAtAll) {
+TEST_F(DataFilesTest, CarryOverIsAtomic) {
   const std::string previous = folder_.Path("previous");
   ASSERT_TRUE(platform::MakeFolders(previous));
   test::WriteText(previous + "/a.txt", "whole");

@@ -9,7 +9,7 @@ namespace {
 
 using namespace std::string_literals;
 
-TEST(IniFile, ReadsTheValueThatCounts) {
+TEST(IniFile, ReadsTheEffectiveValue) {
   struct Row {
     const char* name;
     std::string text;
@@ -44,7 +44,7 @@ TEST(IniFile, ReadsTheValueThatCounts) {
   }
 }
 
-TEST(IniFile, ChangesOnlyWhatIsAskedFor) {
+TEST(IniFile, ChangesOnlyTheGivenKeys) {
   const std::vector<IniEdit> set{{"Key", "new"}};
   const std::vector<IniEdit> two{{"Zeta", "9"}, {"Key", "new"}};
   const std::vector<IniEdit> remove{{"Key", std::nullopt}};

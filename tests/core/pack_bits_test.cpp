@@ -16,7 +16,7 @@ Bytes Packed(const Bytes& row) {
   return code;
 }
 
-TEST(PackBits, PacksRunsAndBytesAsTheyAre) {
+TEST(PackBits, PacksRunsAndLiterals) {
   struct Row {
     const char* name;
     Bytes row, code;
@@ -35,7 +35,7 @@ TEST(PackBits, PacksRunsAndBytesAsTheyAre) {
   }
 }
 
-TEST(PackBits, EverythingComesBackAndCutCodeIsRefused) {
+TEST(PackBits, RoundTripsAndRejectsTruncatedData) {
   for (const size_t size : {1, 127, 128, 129, 130, 5000}) {
     for (const int mask : {0xff, 0x01, 0x00}) {
       SCOPED_TRACE(size);
@@ -53,7 +53,7 @@ TEST(PackBits, EverythingComesBackAndCutCodeIsRefused) {
   }
 }
 
-TEST(PackBits, ReadsWhatOthersWrite) {
+TEST(PackBits, ReadsOtherEncoders) {
   struct Row {
     const char* name;
     Bytes code;

@@ -7,7 +7,7 @@ namespace {
 
 constexpr char32_t kUnknown = 0xFFFD;
 
-TEST(Utf8, CharactersAreReadOneByOne) {
+TEST(Utf8, ReadsCharacters) {
   struct Row {
     std::string_view text;
     std::u32string_view characters;

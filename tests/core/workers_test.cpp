@@ -55,7 +55,7 @@ class Gate {
   bool open_ = false;
 };
 
-TEST(WorkerPool, TasksThatComputeKeepNoMoreCoresBusyThanThereAre) {
+TEST(WorkerPool, ComputingTasksUseNoMoreThanAllCores) {
   std::atomic<int> now{0}, most{0}, done{0};
   {
     WorkerPool pool(3);
@@ -74,7 +74,7 @@ TEST(WorkerPool, TasksThatComputeKeepNoMoreCoresBusyThanThereAre) {
   EXPECT_EQ(most, 3);
 }
 
-TEST(WorkerPool, WhatWaitsKeepsNobodyFromComputing) {
+TEST(WorkerPool, BlockingTasksDoNotOccupyCores) {
   Gate hanging, computing, urgent;
   std::atomic<int> computed{0};
   WorkerPool pool(2);
@@ -117,7 +117,7 @@ TEST(WorkerPool, AnExceptionEndsOneTaskOnly) {
   EXPECT_EQ(Guarded([] { return Status::DamagedFile; }), Status::DamagedFile);
 }
 
-TEST(ShareOut, UsesCoresThatAreFreeAndOnlyThose) {
+TEST(ShareOut, UsesFreeCoresOnly) {
   // Alone, the work runs on all cores; while other tasks occupy the rest, on the calling thread.
   for (const bool busy : {false, true}) {
     SCOPED_TRACE(busy);
@@ -179,7 +179,7 @@ TEST(ShareOut, EndsWithTheFirstFailure) {
   EXPECT_EQ(ShareOut(0, [](int32_t) { return Status::DamagedFile; }, {}, pool), Status::Ok);
 }
 
-TEST(OrderedRun, TellsWhatRanOutOfMemoryAndGoesOn) {
+TEST(OrderedRun, ReportsLackOfMemoryAndContinues) {
   for (const uint32_t jobs : {1u, 4u}) {
     WorkerPool pool(2);
     std::vector<Status> delivered;
@@ -203,7 +203,7 @@ TEST(OrderedRun, TellsWhatRanOutOfMemoryAndGoesOn) {
   }
 }
 
-TEST(OrderedRun, AQuestionHoldsNoCore) {
+TEST(OrderedRun, WaitingForAnAnswerHoldsNoCore) {
   // The first item asks; the next ones wait for their turn. Other work continues meanwhile.
   WorkerPool pool(2);
   std::atomic<bool> othersDone = false;
@@ -233,7 +233,7 @@ TEST(OrderedRun, AQuestionHoldsNoCore) {
   EXPECT_EQ(turns, (std::vector<size_t>{0, 1, 2, 3, 4, 5}));
 }
 
-TEST(LatestWork, DoesWhatIsWantedByThen) {
+TEST(LatestWork, DoesTheLatestRequests) {
   WorkerPool pool(2);
   Gate first;
   std::mutex mutex;
@@ -273,7 +273,7 @@ TEST(LatestWork, DoesWhatIsWantedByThen) {
   EXPECT_EQ(done, (std::vector<int>{1, 4, 5}));
 }
 
-TEST(BackgroundTask, GoesWithItsOwnerAndSaysHowItEnded) {
+TEST(BackgroundTask, EndsWithItsOwnerAndReportsItsStatus) {
   std::atomic<int> ended{-1};
   std::atomic<bool> saw = false;
   {
@@ -304,7 +304,7 @@ platform::Volume FarVolume(const std::string& path) {
   return volume;
 }
 
-TEST(FolderScope, ATaskWithAFileOnTheNetworkHoldsNoCore) {
+TEST(FolderScope, ReleasesTheCoreForNetworkFiles) {
   platform::ReplaceVolumeFunction(FarVolume);
   Gate far, near;
   {

@@ -113,7 +113,7 @@ TEST(AnimationPlayer, ShowsEachFrameForItsTime) {
   }
 }
 
-TEST(AnimationPlayer, PausesStepsAndPlaysOn) {
+TEST(AnimationPlayer, PausesStepsAndResumes) {
   for (const uint64_t capacity : {uint64_t{1} << 28, uint64_t{0}}) {
     Player player(Gif({10, 10, 10, 10}, -1), capacity);
     EXPECT_EQ(player.At(0), "0:black");  // does not start by itself
@@ -138,7 +138,7 @@ TEST(AnimationPlayer, PausesStepsAndPlaysOn) {
   }
 }
 
-TEST(AnimationPlayer, EndsWhereTheFileIsBroken) {
+TEST(AnimationPlayer, EndsAtDamagedData) {
   std::vector<uint8_t> file = Gif({10, 10, 10}, 0);
   file.resize(file.size() - 4);  // within the pixels of the last frame
   Player player(file, 1 << 20);
@@ -184,7 +184,7 @@ TEST(Slideshow, ChoicesAreKept) {
   SetDataFolder(before);
 }
 
-TEST(Slideshow, GoesThroughTheList) {
+TEST(Slideshow, VisitsTheList) {
   using Places = std::vector<size_t>;
   EXPECT_EQ(Order({.repeat = true}, 3, 1, 4), (Places{1, 2, 0, 1, 2}));
   EXPECT_EQ(Order({.repeat = false}, 3, 1, 4), (Places{1, 2}));

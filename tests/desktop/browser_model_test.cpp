@@ -67,7 +67,7 @@ std::string Shown(const BrowserModel& model) {
   return text;
 }
 
-TEST(BrowserModel, SelectionSurvivesOrderFilterAndListing) {
+TEST(BrowserModel, SelectionSurvivesSortingFilteringAndRelisting) {
   BrowserModel model;
   model.SetFolder("/p");
   model.SetItems(Items({"b10.png", "sub", "b2.png", "a.gif"}));
@@ -89,7 +89,7 @@ TEST(BrowserModel, SelectionSurvivesOrderFilterAndListing) {
   EXPECT_EQ(Shown(model), "sub b2.png* [b10.png*] c.gif");
 }
 
-TEST(BrowserModel, FocusGoesToTheNextFileWhenItsFileHasGone) {
+TEST(BrowserModel, FocusMovesToTheNextFileIfItsFileIsDeleted) {
   BrowserModel model;
   model.SetItems(Items({"a.png", "b.png", "c.png"}));
   model.Selected().SelectOnly(1);
@@ -102,7 +102,7 @@ TEST(BrowserModel, FocusGoesToTheNextFileWhenItsFileHasGone) {
   EXPECT_EQ(model.CountText(), "0 files");
 }
 
-TEST(BrowserModel, KnownFactsStayWithUnchangedFiles) {
+TEST(BrowserModel, KeepsFactsOfUnchangedFiles) {
   BrowserModel model;
   model.SetItems(Items({"a.png"}));
   FolderItem known = model.Item(0);
@@ -145,7 +145,7 @@ TEST(PathBar, CrumbsAndTrail) {
   EXPECT_EQ(trail.FolderAt(-99), "/50");
 }
 
-TEST(DetailColumns, AreArrangedByAText) {
+TEST(DetailColumns, AreConfiguredByText) {
   const DetailColumns all = ParseDetailColumns("");
   ASSERT_EQ(all.size(), AllDetails().size());
   const DetailColumns arranged =
@@ -178,7 +178,7 @@ TEST(BrowserModel, TypingFinds) {
   EXPECT_EQ(model.FocusText(), "ab.png, 1 of 4");
 }
 
-TEST(Toolbar, KeepsOrderAndSetAndTakesNewButtonsIn) {
+TEST(Toolbar, KeepsItsButtonsAndAddsNewOnes) {
   const std::vector<std::string> known{"view", "convert", "info", "setup"};
   const std::vector<ToolbarButton> expected{
       {"setup", true}, {"view", false}, {"convert", true}, {"info", true}};

@@ -40,7 +40,7 @@ class DesktopFilesTest : public testing::Test {
   test::ScopedEnvironment data_;
 };
 
-TEST_F(DesktopFilesTest, TurnsGiveTheFileBackAndTheirThumbnailsGo) {
+TEST_F(DesktopFilesTest, RotationsAreUndoneAndTheirThumbnailsRemoved) {
   const std::string data = DataFolder();
   SetDataFolder(folder_.Path("data"));
   const std::string path = From("turned.bmp");
@@ -81,7 +81,7 @@ TEST_F(DesktopFilesTest, TurnsGiveTheFileBackAndTheirThumbnailsGo) {
   SetDataFolder(data);
 }
 
-TEST_F(DesktopFilesTest, APastedPictureTakesAFreeName) {
+TEST_F(DesktopFilesTest, PastedPicturesGetAFreeName) {
   PastedPicture pasted{FilledImage(2, 1, 0x332211), {255, 7}};
   for (const char* name : {"Picture from clipboard.png", "Picture from clipboard [1].png"}) {
     const FileOperationResult result = KeepPastedPicture(pasted, folder_.Path("to"));
@@ -111,7 +111,7 @@ TEST(Favourites, AreKeptInOrderAndFollowRenames) {
   SetDataFolder(before);
 }
 
-TEST(TabSets, AreFilesOfTheDataFolder) {
+TEST(TabSets, AreStoredInTheDataFolder) {
   const test::TemporaryFolder folder;
   const std::string before = DataFolder();
   SetDataFolder(folder.Path());
@@ -139,7 +139,7 @@ TEST(FolderViews, AreKeptPerFolderTheLatestFirst) {
   EXPECT_EQ(views.Find("/a,b", otherwise), (FolderView{{2, 4, 2}, true}));
 }
 
-TEST(Session, ComesBackAndForgivesOddLines) {
+TEST(Session, RoundTripsAndIgnoresInvalidLines) {
   Session session{900,  600,
                   true, "Size:9",
                   1,    {{"/a=b [Tab]", {{1, 4, 3}, true}, 1234, "x.png"}, {"/c", {}, 0, ""}}};

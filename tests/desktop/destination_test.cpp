@@ -14,7 +14,7 @@ namespace {
 
 namespace fs = std::filesystem;
 
-TEST(Destination, OutlookIsOfTheFolderThatIsWrittenTo) {
+TEST(Destination, PreviewsTheOutputFolder) {
   const test::ScopedSettings keep;
   const test::TemporaryFolder folder;
   fs::create_directories(folder.Path("in"));
@@ -41,7 +41,7 @@ TEST(Destination, OutlookIsOfTheFolderThatIsWrittenTo) {
   }
 }
 
-TEST(Destination, TypedFoldersAreInTheFolderShown) {
+TEST(Destination, TypedFoldersAreRelativeToTheCurrentFolder) {
   const struct {
     const char *typed, *whole;
   } rows[] = {{"", ""},

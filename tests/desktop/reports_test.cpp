@@ -33,7 +33,7 @@ namespace {
 using testing::ElementsAre;
 using testing::HasSubstr;
 
-TEST(FileTip, TellsFactsOrWhatIsWrong) {
+TEST(FileTip, ShowsFactsOrTheError) {
   const test::TemporaryFolder folder;
   const PicturePointer picture = test::PatternPicture(40, 30, 24);
   const std::string words = "holiday";
@@ -75,7 +75,7 @@ class Reports : public testing::Test {
   test::TemporaryFolder folder_;
 };
 
-TEST_F(Reports, ExifRowsAreTheLinesOfTheText) {
+TEST_F(Reports, ExifRowsMatchTheText) {
   const std::string path = folder_.Path("a.tif");
   test::WriteBytes(path, test::BigEndianBlock());
   for (const int32_t types : {0, 1}) {
@@ -193,7 +193,7 @@ TEST_F(Reports, HistorySortsRemovesAndForgets) {
   EXPECT_FALSE(list.Read());
 }
 
-TEST_F(Reports, CompactionTellsWhatItDid) {
+TEST_F(Reports, CompactionReportsItsResult) {
   const std::string path = folder_.Path("Fotomill.tdb");
   const auto outcome = [&] {
     DatabaseCompaction compaction(path, false, true);
@@ -218,7 +218,7 @@ TEST_F(Reports, CompactionTellsWhatItDid) {
   EXPECT_EQ(test::ReadText(path), "something else");
 }
 
-TEST_F(Reports, OrphansBelowAreFoundWhenAskedFor) {
+TEST_F(Reports, OrphansBelowAreFoundOnRequest) {
   Sample("a.bmp");
   ASSERT_TRUE(platform::MakeFolders(folder_.Path("sub")));
   for (const char* name : {"A.THN", "gone.thn", ".hidden.THN", "sub/gone.THN"})
@@ -235,7 +235,7 @@ TEST_F(Reports, OrphansBelowAreFoundWhenAskedFor) {
   EXPECT_THAT(DeleteThumbnails(all), all) << "what is not there cannot be deleted";
 }
 
-TEST_F(Reports, SettingsTravel) {
+TEST_F(Reports, SettingsRoundTrip) {
   EXPECT_FALSE(ExportConfiguration(folder_.Path("out.ini")).ok) << "there is nothing yet";
   settings.JpegCompression = 42;
   settings.PrefixCrop = std::string_view("Cut ");

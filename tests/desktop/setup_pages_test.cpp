@@ -50,7 +50,7 @@ TEST(SetupPages, ShowSettingsThatDoSomethingAndExplainThem) {
 
 // The page of format options has each format in one group, with all of its settings except those on
 // other pages.
-TEST(SetupPages, FormatsHaveAGroupEach) {
+TEST(SetupPages, EveryFormatHasAGroup) {
   std::set<std::string_view> groups;
   for (const FormatSettings* const codec : SettingsOfFormats()) {
     EXPECT_TRUE(groups.insert(codec->group).second) << codec->group;
@@ -86,7 +86,7 @@ TEST(SetupPages, SearchFindsEveryWord) {
   EXPECT_TRUE(FindSettings("quality zebra").empty());
 }
 
-TEST(SetupHelp, EntriesArePlainTextAndEndWhereTheNextBegins) {
+TEST(SetupHelp, EntriesArePlainTextAndSeparate) {
   const HelpText help = HelpOn("JpegStoreDPI");
   EXPECT_EQ(help.title, "JpegStoreDPI");
   EXPECT_EQ(help.text, "The picture's resolution is written into JPEG files.");

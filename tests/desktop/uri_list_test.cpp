@@ -10,7 +10,7 @@ namespace {
 using testing::ElementsAreArray;
 using Strings = std::vector<std::string>;
 
-TEST(UriList, NamesOfAnyBytesComeBack) {
+TEST(UriList, AnyNameRoundTrips) {
   const struct {
     std::string path, uri;
   } rows[] = {
@@ -32,7 +32,7 @@ TEST(UriList, NamesOfAnyBytesComeBack) {
   EXPECT_THAT(PathsOfUriList(list), ElementsAreArray(paths));
 }
 
-TEST(UriList, ReadsWhatOtherProgramsWrite) {
+TEST(UriList, ReadsOtherPrograms) {
   const struct {
     std::string list;
     Strings paths;

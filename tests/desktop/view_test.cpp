@@ -80,7 +80,7 @@ std::vector<int> Greens(const RgbImage& canvas, int32_t y) {
   return values;
 }
 
-TEST(DrawView, PlacesCopiesAndSamples) {
+TEST(DrawView, PositionsCopiesAndSamples) {
   const PackedImage image = Ramp(2, 2);  // greens 1 4 / 41 44
   const PackedImage opaque;
   const ViewSource source{image, opaque};
@@ -106,7 +106,7 @@ TEST(DrawView, PlacesCopiesAndSamples) {
   EXPECT_EQ(Greens(canvas, 3), (std::vector<int>(6, 44)));
 }
 
-TEST(DrawView, SquaresShowThroughAndStayInPlace) {
+TEST(DrawView, CheckerboardShowsThroughAndStaysInPlace) {
   const PackedImage image = Ramp(4, 2);  // greens 1 4 7 10 / 41 44 47 50
   PackedImage alpha;
   ASSERT_EQ(NewAlphaPlane(4, 2, alpha), Status::Ok);
@@ -134,7 +134,7 @@ TEST(DrawView, SquaresShowThroughAndStayInPlace) {
   EXPECT_EQ(Greens(canvas, 0), (std::vector<int>(6, 10)));
 }
 
-TEST(ViewPicture, FollowsItsProfileAndKeepsItsAlpha) {
+TEST(ViewPicture, AppliesItsProfileAndKeepsItsAlpha) {
   const test::TemporaryFolder folder;
   const std::string path = folder.Path("a.png");
   PicturePointer picture = NewPictureRecord();
@@ -169,7 +169,7 @@ TEST(ViewPicture, FollowsItsProfileAndKeepsItsAlpha) {
   EXPECT_GT(managed->Bytes(), plain->Bytes());
 }
 
-TEST(PhotoFacts, TellWhatPhotographersAsk) {
+TEST(PhotoFacts, SummarizeExposure) {
   const std::vector<std::string> little = {"Acme", "1/60 s"};
   EXPECT_EQ(PhotoFacts(test::BigEndianBlock()), little);
   EXPECT_EQ(PhotoFacts(test::LittleEndianBlock()), little);
@@ -205,7 +205,7 @@ TEST(Thumbnail, MatteIsCutOff) {
   EXPECT_GT(WithoutMatte(FilledImage(6, 6, 0x112233), 0x112233).width, 0);
 }
 
-TEST(Thumbnail, DatabaseModesKeepWhatTheyMade) {
+TEST(Thumbnail, DatabaseModesStoreThumbnails) {
   const test::TemporaryFolder folder;
   const std::string picture = folder.Path("a.bmp");
   std::filesystem::copy_file(test::SourcePath("samples/bmp-true-color.bmp"), picture);
@@ -232,7 +232,7 @@ TEST(Thumbnail, DatabaseModesKeepWhatTheyMade) {
 
 // A placeholder is the file's embedded thumbnail, upright like the picture; if there is none,
 // nothing is decoded.
-TEST(Thumbnail, StandInsComeFromTheExif) {
+TEST(Thumbnail, PlaceholdersComeFromExif) {
   const test::TemporaryFolder folder;
   const std::string small = folder.Path("small.jpg"), large = folder.Path("large.jpg"),
                     plain = folder.Path("plain.bmp");
@@ -274,7 +274,7 @@ ThumbnailPointer SlowThumbnail(const ThumbnailRequest& request) {
   return thumbnail;
 }
 
-TEST(ThumbnailLoader, ForgetsWhatIsNoLongerWanted) {
+TEST(ThumbnailLoader, DropsOutdatedRequests) {
   std::atomic<int> wakes{0};
   ThumbnailLoader loader(
       1, [&] { ++wakes; }, SlowThumbnail);
@@ -295,7 +295,7 @@ TEST(ThumbnailLoader, ForgetsWhatIsNoLongerWanted) {
   EXPECT_GT(wakes, 0);
 }
 
-TEST(ThumbnailLoader, AReadyThumbnailIsLoadedOnce) {
+TEST(ThumbnailLoader, LoadsEachThumbnailOnce) {
   static std::atomic<int> calls;
   static std::atomic<bool> idle;
   const auto load = [](const ThumbnailRequest& request) {
@@ -322,7 +322,7 @@ TEST(ThumbnailLoader, AReadyThumbnailIsLoadedOnce) {
   EXPECT_EQ(order, "ready embedded? none?- embedded none ");
 }
 
-TEST(ThumbnailLoader, AFileThatNeedsTooMuchMemoryIsNoEndOfTheProgram) {
+TEST(ThumbnailLoader, SurvivesFilesThatNeedTooMuchMemory) {
   static std::atomic<bool> idle;
   const auto load = [](const ThumbnailRequest& request) -> ThumbnailPointer {
     if (request.path == "huge") throw std::bad_alloc();
@@ -339,7 +339,7 @@ TEST(ThumbnailLoader, AFileThatNeedsTooMuchMemoryIsNoEndOfTheProgram) {
   EXPECT_EQ(loader.Pending(), 0u);
 }
 
-TEST(ThumbnailCache, KeepsTheLastUsedWithinItsBytes) {
+TEST(ThumbnailCache, KeepsTheLatestWithinItsLimit) {
   const auto picture = [] {
     auto thumbnail = std::make_shared<Thumbnail>();
     thumbnail->pixels = FilledImage(10, 10, 0);

@@ -54,7 +54,7 @@ Ink Drawn(TextFont& font, std::string_view text, const LinePlace& place, Size si
   return InkOf(mask);
 }
 
-TEST(TextShaping, OrdersWhatRunsFromRightToLeft) {
+TEST(TextShaping, OrdersRightToLeftRuns) {
   TextFont font;
   ASSERT_EQ(font.Open(kFont, 40), Status::Ok);
   const auto alef = Glyphs(font, "א"), bet = Glyphs(font, "ב"), blank = Glyphs(font, " "),
@@ -69,7 +69,7 @@ TEST(TextShaping, OrdersWhatRunsFromRightToLeft) {
     EXPECT_GE(line.glyphs[i].x, line.glyphs[i - 1].x);
 }
 
-TEST(TextShaping, JoinsStacksAndStandsIn) {
+TEST(TextShaping, JoinsStacksAndFallsBack) {
   TextFont font;
   ASSERT_EQ(font.Open(kFont, 40), Status::Ok);
   EXPECT_NE(Glyphs(font, "بب"), Joined({Glyphs(font, "ب"), Glyphs(font, "ب")}));
@@ -88,7 +88,7 @@ TEST(TextShaping, JoinsStacksAndStandsIn) {
   EXPECT_EQ(mixed.glyphs[0].face, mixed.glyphs[2].face);
 }
 
-TEST(TextShaping, ShowsABoxForWhatNoFontHas) {
+TEST(TextShaping, ShowsABoxForMissingCharacters) {
   TextFont font;
   ASSERT_EQ(font.Open(kFont, 40), Status::Ok);
   const TextLine line = font.Shape("a\U0010FFFDb");
@@ -112,7 +112,7 @@ TEST(TextFont, NamesWeightAndSlant) {
   EXPECT_NEAR(line.LineHeight(), 14, 0.01);
 }
 
-TEST(TextMask, TurnsStrokesAndClips) {
+TEST(TextMask, RotatesStrokesAndClips) {
   TextFont font;
   ASSERT_EQ(font.Open(kFont, 40), Status::Ok);
   const Ink flat = Drawn(font, "HE", {50, 100}, {200, 200});
@@ -134,7 +134,7 @@ TEST(TextMask, TurnsStrokesAndClips) {
   }
 }
 
-TEST(TextBlock, BreaksLinesWhereTheyMayEnd) {
+TEST(TextBlock, BreaksLines) {
   TextFont font;
   ASSERT_EQ(font.Open(kFont, 20), Status::Ok);
   const double five = font.Shape("aaaaa").width / 64.0 + 1;
@@ -227,7 +227,7 @@ TEST(TextBlock, AlignsLines) {
   }
 }
 
-TEST(ShapeMask, CoversWhatItShould) {
+TEST(ShapeMask, CoversShapes) {
   PackedImage mask;
   ASSERT_EQ(NewAlphaPlane(60, 50, mask), Status::Ok);
   ASSERT_EQ(DrawShape({30, 25, 40, 20}, mask), Status::Ok);

@@ -82,7 +82,7 @@ TEST_F(FileOperationTest, NothingIsEverReplaced) {
   EXPECT_EQ(ReadText(To("c.png")), "was worked on");
 }
 
-TEST_F(FileOperationTest, AFolderDoesNotGoIntoItself) {
+TEST_F(FileOperationTest, FoldersCannotBeMovedIntoThemselves) {
   for (const FileOperationKind kind : {FileOperationKind::Move, FileOperationKind::Copy}) {
     EXPECT_EQ(CarryOut(PlanFileOperation(kind, {From("sub")}, From("sub"))).failures.size(), 1u);
   }
@@ -95,7 +95,7 @@ TEST_F(FileOperationTest, AFolderDoesNotGoIntoItself) {
   EXPECT_EQ(ReadText(To("kept")), "kept");
 }
 
-TEST(UndoList, KeepsSoMany) {
+TEST(UndoList, KeepsALimitedNumber) {
   UndoList list(2);
   const auto operation = [](const char* name) {
     return FileOperation{FileOperationKind::Rename, {{name, "x"}}};

@@ -66,7 +66,7 @@ std::string Played(const Bytes& file, Status* end = nullptr) {
   return text;
 }
 
-TEST(Ani, StepsArePlayedAsTheChunksSay) {
+TEST(Ani, PlaysStepsAccordingToTheChunks) {
   const struct {
     const char* name;
     std::string chunks;
@@ -117,7 +117,7 @@ TEST(Ani, PagesAreSteps) {
   }
 }
 
-TEST(Ani, WhatIsMissingIsTold) {
+TEST(Ani, ReportsMissingParts) {
   const std::tuple<const char*, std::string, Status, bool> rows[] = {
       {"a picture less than the header has", Header(4, 6) + kPictures, Status::Ok, true},
       {"a step to no picture", Header(3, 6) + Chunk(kSeq, Hex32(0) + Hex32(9)) + kPictures, Status::Ok, true},
@@ -137,7 +137,7 @@ TEST(Ani, WhatIsMissingIsTold) {
   EXPECT_EQ(Decode(AniRead, Hex("52494646 FFFFFF7F 57454250")).status, Status::DamagedFile);
 }
 
-TEST(Ani, WrittenFilesAreWholeByTheirChunks) {
+TEST(Ani, WritesCompleteChunks) {
   const PicturePointer picture = PatternPicture(3, 2, 24);
   picture->hotSpotX = 2;
   picture->hotSpotY = 1;

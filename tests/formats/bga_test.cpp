@@ -89,7 +89,7 @@ TEST(Bga, ReadsItsEntries) {
   EXPECT_EQ(hot.picture->hotSpotY, 1);
 }
 
-TEST(Bga, CountsEntriesAsFarAsTheyGoForward) {
+TEST(Bga, StopsAtBackwardLinks) {
   const std::string first = Header("424D", "5C000000", "0100 0100 0100 1800"),
                     second = Header("424D", "60000000", "0100 0100 0100 1800"),
                     pixels = "030201 00  060504 00";
@@ -124,7 +124,7 @@ TEST(Bga, WritesAnArrayOfOneBitmap) {
   EXPECT_TRUE(SamePixels(Decode(BgaRead, Encode(BgaWrite, *wide)).picture->image, wide->image));
 }
 
-TEST(Rle, CodesRunsAndPlainPixels) {
+TEST(Rle, EncodesRunsAndLiterals) {
   const struct {
     const char* name;
     std::vector<int> pixels;

@@ -181,7 +181,7 @@ TEST(BmpRead, FourthChannelBecomesAlpha) {
   EXPECT_EQ(decoded.picture->alphaFlags, kHasAlpha);
 }
 
-TEST(BmpRead, PaddingTravelsWithTheRow) {
+TEST(BmpRead, CopiesPadding) {
   const Decoded decoded = Decode(BmpRead, Indexed({1, 1, 8}, "01 AABBCC"));
   EXPECT_THAT(decoded.picture->image.StoredRow(0), ElementsAreArray(Hex("01AABBCC")));
 }

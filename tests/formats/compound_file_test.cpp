@@ -127,7 +127,7 @@ TEST(CompoundFile, Damaged) {
   }
 }
 
-TEST(CompoundFile, CutShort) {
+TEST(CompoundFile, Truncated) {
   const Bytes whole = File();
   for (size_t length = 0; length < whole.size(); length += length < 600 ? 1 : 97) {
     CompoundFile compound;

@@ -101,7 +101,7 @@ const struct {
      Hex("52494646 00000000 57454250  41414141 00000000  42424242 010000"), "AAAA@20+0 "},
 };
 
-TEST(ContainerWalks, FindTheSameInMemoryAndInPlaces) {
+TEST(ContainerWalks, FindTheSameInMemoryAndInAFile) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("file");
   for (const auto& row : kFiles) {
@@ -114,7 +114,7 @@ TEST(ContainerWalks, FindTheSameInMemoryAndInPlaces) {
   }
 }
 
-TEST(ContainerWalks, ReadNoMorePlacesThanAllowed) {
+TEST(ContainerWalks, KeepToTheLimitOfOffsets) {
   const TemporaryFolder folder;
   WriteBytes(folder.Path("fill"), std::vector<uint8_t>(1000, 0xFF));
   platform::FileView head;

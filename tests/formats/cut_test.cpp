@@ -16,7 +16,7 @@ namespace {
 using Bytes = std::vector<uint8_t>;
 using Names = std::vector<std::string>;
 
-TEST(Cut, ReadsRowsAsFarAsTheirCodeGoes) {
+TEST(Cut, ReadsIncompleteRows) {
   const struct {
     const char* name;
     const char* file;
@@ -70,7 +70,7 @@ Bytes SmallPalette(const std::string& index, const std::string& highest) {
              "44722E2048616C6F 00000000 00000000 00000000  0100 0200 0300  3F00 1F00 FF00");
 }
 
-TEST(Cut, ColorsComeFromThePaletteBeside) {
+TEST(Cut, ReadsThePaletteFile) {
   const Bytes file = Hex("0100 0100 0000  0300 01 01 00");
   const struct {
     const char* name;

@@ -29,7 +29,7 @@ Bytes Collection() {
   return file;
 }
 
-TEST(Dcx, PagesAreReadByNumberEachWithItsOwnPalette) {
+TEST(Dcx, ReadsPagesWithTheirPalettes) {
   const TemporaryFolder folder;
   WriteBytes(folder.Path("a.dcx"), Collection());
   const std::pair<int32_t, int32_t> pages[] = {{0, 5}, {1, 9}};
@@ -49,7 +49,7 @@ TEST(Dcx, PagesAreReadByNumberEachWithItsOwnPalette) {
   }
 }
 
-TEST(Dcx, BadCollectionsAreRefused) {
+TEST(Dcx, RejectsInvalidCollections) {
   Bytes behind = Collection(), none = Collection(), other = Collection(), itself = Collection();
   Put(behind, 4, 0xFFFFFFF0);
   Put(none, 4, 0);

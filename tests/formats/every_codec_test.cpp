@@ -213,7 +213,7 @@ TEST(EveryCodec, WritesUpToTheLimitsOfItsRow) {
   });
 }
 
-TEST(EveryCodec, KeepsAlphaThatItsRowPromises) {
+TEST(EveryCodec, KeepsAlphaAccordingToItsRow) {
   const TemporaryFolder folder;
   ForEachRow(true, [&](const FormatEntry& row) {
     if ((row.flags & FMT_ALPHA) == 0) return;
@@ -257,7 +257,7 @@ TEST(EveryCodec, ReadsGoodPictures) {
   }
 }
 
-TEST(EveryCodec, RefusesBadPictures) {
+TEST(EveryCodec, RejectsBadPictures) {
   const std::vector<std::string> files = Fixtures("bad");
   EXPECT_FALSE(files.empty());
   for (const std::string& file : files) {
@@ -295,7 +295,7 @@ void ExpectClean(const FormatEntry& row, const std::string& path) {
   EXPECT_LE(frames, animation->Delays().size());
 }
 
-TEST(EveryCodec, EndsCleanlyOnFilesCutShort) {
+TEST(EveryCodec, FailsCleanlyOnTruncatedFiles) {
   const TemporaryFolder folder;
   for (const std::string& file : GoodPictures()) {
     SCOPED_TRACE(file);
@@ -312,7 +312,7 @@ TEST(EveryCodec, EndsCleanlyOnFilesCutShort) {
   }
 }
 
-TEST(EveryCodec, EndsCleanlyWhenTheSystemFails) {
+TEST(EveryCodec, FailsCleanlyOnSystemErrors) {
   for (const std::string& file : GoodPictures()) {
     SCOPED_TRACE(file);
     const FormatEntry& row = FormatRow(FindFormatByName(file));
@@ -344,7 +344,7 @@ TEST(EveryCodec, FailedWriteLeavesTheDestinationAlone) {
   });
 }
 
-TEST(EveryCodec, ReadsOrRefusesRealPictures) {
+TEST(EveryCodec, ReadsOrRejectsRealPictures) {
   if (CorpusFolder().empty()) GTEST_SKIP() << "FOTOMILL_CORPUS names no folder";
   size_t count = 0;
   for (const auto& entry : fs::recursive_directory_iterator(CorpusFolder())) {

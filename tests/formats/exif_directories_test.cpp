@@ -27,7 +27,7 @@ std::vector<std::string> PictureLines(const std::vector<uint8_t>& block) {
   return LinesOf(MakeExifBlock(ParseExifBlock(block)));
 }
 
-TEST(ExifDirectories, TravelThroughFilesOfDirectories) {
+TEST(ExifDirectories, RoundTripThroughFiles) {
   struct Row {
     const char* name;
     WriteOperation write;
@@ -57,7 +57,7 @@ TEST(ExifDirectories, TravelThroughFilesOfDirectories) {
   }
 }
 
-TEST(ExifDirectories, DamagedBlocksAreTakenAsFarAsTheyGo) {
+TEST(ExifDirectories, ReadsDamagedBlocksPartially) {
   const std::vector<uint8_t> block = BigEndianBlock();
   for (size_t length = 0; length < block.size(); ++length) {
     const ExifDirectories directories = ParseExifBlock(std::span(block).first(length));

@@ -89,7 +89,7 @@ TEST(Fits, WritesGrayOfEveryDepth) {
 }
 
 // Rows long enough for all code paths, of odd length.
-TEST(Fits, GrayOfEveryLevelFollowsTheFormula) {
+TEST(Fits, ConvertsEveryLevelToGray) {
   Bytes row, expected;
   for (unsigned i = 0; i < 3 * 1024 + 13; ++i) {
     const unsigned level = i % 256, others = i * 7 / 3 % 256, blue = i < 256 ? level : others,
@@ -183,7 +183,7 @@ TEST(Fits, FindsTheEndOfTheHeader) {
   }
 }
 
-TEST(Fits, ShowsTheBytesOfEachRowAsTheyAre) {
+TEST(Fits, ShowsTheRawBytesOfEachRow) {
   const struct {
     const char* name;
     const char* cards;
@@ -210,7 +210,7 @@ TEST(Fits, ShowsTheBytesOfEachRowAsTheyAre) {
   }
 }
 
-TEST(Fits, DetailsListTheCards) {
+TEST(Fits, ListsTheCardsInDetails) {
   const TemporaryFolder folder;
   const PicturePointer picture = NewPictureRecord();
   const std::string path = folder.Path("details.fits");

@@ -19,7 +19,7 @@ std::string Header(const char* planes, const char* size, const char* words = "00
 const std::string kFour =
     "58494D47 0000  03E8 03E8 03E8  03E8 0000 0000  0000 01F4 0000  0000 0000 0000  ";
 
-TEST(Gem, ReadsItsKinds) {
+TEST(Gem, ReadsAllVariants) {
   const std::string two = " 80 02 55 33 ";  // a line of two planes of one byte each
   const struct {
     const char* name;
@@ -70,7 +70,7 @@ TEST(Gem, ReadsItsKinds) {
   }
 }
 
-TEST(Gem, GraysWithoutAPaletteHaveTheirLowestBitFirst) {
+TEST(Gem, ReversesBitsOfGraysWithoutAPalette) {
   const Decoded decoded = Describe(GemInfo, Hex(Header("0008", "0008 0001")));
   ASSERT_EQ(decoded.status, Status::Ok);
   const Palette& palette = decoded.picture->palette;
@@ -131,7 +131,7 @@ TEST(Gem, EncodesLines) {
   }
 }
 
-TEST(Gem, WritesWhatOthersRead) {
+TEST(Gem, WritesCompatibleFiles) {
   const PicturePointer mono = PatternPicture(9, 3, 1);
   // black on the left
   for (int32_t i = 0; i < 27; ++i) SetPixel(mono->image, i % 9, i / 9, i % 9 != 0);

@@ -75,7 +75,7 @@ TEST(GifRead, Frames) {
   }
 }
 
-TEST(GifRead, LaterFramesStandOnTheOnesBefore) {
+TEST(GifRead, ComposesFrames) {
   // Two by one: red red, then a green pixel on the right with each disposal, then a blue one
   // on the left.
   const auto file = [](const char* disposal) {
@@ -110,7 +110,7 @@ TEST(GifRead, LaterFramesStandOnTheOnesBefore) {
   }
 }
 
-TEST(GifWrite, LongStringsAndFullTablesComeBack) {
+TEST(GifWrite, LongStringsAndFullTablesRoundTrip) {
   const ScopedSettings scoped;
   for (const bool interlaced : {false, true}) {
     settings.WriteGIFInterlaced = interlaced;

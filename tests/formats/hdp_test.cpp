@@ -15,7 +15,7 @@
 namespace fotomill::test {
 namespace {
 
-TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
+TEST(Hdp, QuantizerZeroIsLosslessAndOthersAreClose) {
   if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
   const ScopedSettings scoped;
   // A camera maker without the terminating NUL: the peer stops reading if it is missing.
@@ -55,7 +55,7 @@ TEST(Hdp, QuantizerZeroKeepsEveryPixelAndOthersStayClose) {
 }
 
 // The library trusts its input and often crashes; the program must not.
-TEST(Hdp, DamagedDataNeverEndTheProgram) {
+TEST(Hdp, DamagedDataNeverCrashTheProgram) {
   if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
   const std::vector<uint8_t> good =
       ReadBytes(SourcePath("tests/formats/hdp/good/lossless-by-frequency.wdp"));
@@ -80,7 +80,7 @@ class Stopping : public ProgressSink {
   StopSource source;
 };
 
-TEST(Hdp, TheChildProcessStopsWithItsJob) {
+TEST(Hdp, ChildProcessesStopWithTheirJob) {
   if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
   const TemporaryFolder folder;
   const std::string path = folder.Path("large.hdp");
@@ -95,7 +95,7 @@ TEST(Hdp, TheChildProcessStopsWithItsJob) {
   EXPECT_EQ(HdpRead(*picture, {.fileName = path}), Status::FunctionCancelled);
 }
 
-TEST(Hdp, ColorsThatWereMultipliedByAlphaAreDividedAgain) {
+TEST(Hdp, UnpremultipliesColors) {
   if (!HdpWorksHere()) GTEST_SKIP() << "libjxr is not installed";
   std::vector<uint8_t> file = ReadBytes(SourcePath("tests/formats/hdp/good/alpha-multiplied.wdp"));
   const Decoded decoded = Decode(HdpRead, file);
@@ -122,7 +122,7 @@ TEST(Hdp, ColorsThatWereMultipliedByAlphaAreDividedAgain) {
   }
 }
 
-TEST(Hdp, DirectoriesThatLeadBackToThemselvesEnd) {
+TEST(Hdp, CyclesOfDirectoriesEnd) {
   std::vector<uint8_t> file = ReadBytes(SourcePath("tests/formats/hdp/good/tiles-by-place.hdp"));
   const auto link = [&file] {  // after the first directory
     const size_t at = static_cast<size_t>(file[4] | file[5] << 8);

@@ -58,7 +58,7 @@ TEST(IcoRead, Entries) {
   }
 }
 
-TEST(IcoRead, TheLargestThenDeepestEntryWinsAndPagesSelect) {
+TEST(IcoRead, PrefersLargestThenDeepestAndSelectsPages) {
   const std::string small =
       "28000000 01000000 02000000 0100 1800 00000000 00000000 00000000 00000000 00000000 00000000 "
       "0A0B0C 00 00000000 ";                                                             // 48 bytes
@@ -79,7 +79,7 @@ TEST(IcoRead, TheLargestThenDeepestEntryWinsAndPagesSelect) {
 }
 
 // PNG entries of the same size: the directory has their depth.
-TEST(IcoRead, OfEqualSizesTheDeepestWins) {
+TEST(IcoRead, PrefersTheDeepestOfEqualSizes) {
   const auto shallow = Encode(PngWrite, *PatternPicture(20, 20, 4)),
              deep = Encode(PngWrite, *PatternPicture(20, 20, 24));
   const auto entry = [](uint8_t bits, size_t size, size_t offset) {

@@ -24,7 +24,7 @@ std::string Body(const char* size, const char* data) {
   return std::string(" 424F4459 ") + size + " " + data;
 }
 
-TEST(IffRead, Kinds) {
+TEST(IffRead, Variants) {
   const std::string two = Header("0003 0001", "02 00 00");
   const std::string hamRow = Body("0000000C", "8000 4000 0000 0000 4000 0000");
   struct Row {
@@ -111,7 +111,7 @@ TEST(IffRead, PalettesOfOldPrograms) {
   EXPECT_EQ(half.picture->palette[99], 0x7f);
 }
 
-TEST(IffWrite, ObeysItsKeys) {
+TEST(IffWrite, FollowsItsKeys) {
   const ScopedSettings scope;
   const PicturePointer picture = PatternPicture(33, 5, 4);
   const auto kindOf = [&] {

@@ -41,7 +41,7 @@ int32_t LargestError(const PackedImage& a, const PackedImage& b) {
   return largest;
 }
 
-TEST(Jpeg, PicturesComeBackCloselyInEveryForm) {
+TEST(Jpeg, RoundTripsAreCloseInEveryVariant) {
   const ScopedSettings scoped;
   const PicturePointer picture = SmoothPicture(65, 49);
   settings.JpegCompression = 95;
@@ -67,7 +67,7 @@ TEST(Jpeg, GraysStayGray) {
   EXPECT_EQ(back.picture->bitsPerPixel, 8);
 }
 
-TEST(Jpeg, MetadataTravel) {
+TEST(Jpeg, MetadataRoundTrips) {
   const ScopedSettings scoped;
   settings.JpegStoreDPI = 1;
   const PicturePointer picture = SmoothPicture(8, 8);
@@ -87,7 +87,7 @@ TEST(Jpeg, MetadataTravel) {
   EXPECT_EQ(back.picture->comment, picture->comment);
 }
 
-TEST(Jpeg, FilesThatEndTooEarlyFail) {
+TEST(Jpeg, TruncatedFilesFail) {
   const Bytes file = Encode(JpegWrite, *PatternPicture(64, 64, 24));
   const std::span<const uint8_t> whole(file);
   EXPECT_EQ(Decode(JpegRead, whole.first(file.size() / 2)).status, Status::FileReadError);
@@ -97,7 +97,7 @@ TEST(Jpeg, FilesThatEndTooEarlyFail) {
   EXPECT_EQ(Decode(JpegRead, Hex("47494638")).status, Status::DamagedFile);
 }
 
-TEST(Jpeg, FaultsThatArePassedOverAreTold) {
+TEST(Jpeg, ReportsToleratedErrors) {
   Bytes file = Encode(JpegWrite, *PatternPicture(64, 64, 24));
   const size_t middle = file.size() * 3 / 4;
   file[middle] = 0xFF;
@@ -130,7 +130,7 @@ Bytes OneBlock(const char* frame, const Bytes& scans) {
   return file;
 }
 
-TEST(Jpeg, InkBecomesLight) {
+TEST(Jpeg, ConvertsCmykToRgb) {
   const struct {
     const char *name, *adobe, *data;
     int32_t color;
@@ -153,7 +153,7 @@ TEST(Jpeg, InkBecomesLight) {
 }
 
 // Every scan takes a pass over the picture, but only ten bytes.
-TEST(Jpeg, ScansWithoutEndAreRefused) {
+TEST(Jpeg, RejectsEndlessScans) {
   for (const int count : {1, 400, 600}) {
     SCOPED_TRACE(count);
     Bytes scans;
@@ -168,7 +168,7 @@ TEST(Jpeg, ScansWithoutEndAreRefused) {
   }
 }
 
-TEST(Jpeg, ThumbnailsDecodeAtTheSmallestSizeThatServes) {
+TEST(Jpeg, ThumbnailsDecodeAtTheSmallestSufficientSize) {
   TemporaryFolder folder;
   WriteBytes(folder.Path("a.jpg"), Encode(JpegWrite, *SmoothPicture(800, 600)));
   struct Row {
@@ -184,7 +184,7 @@ TEST(Jpeg, ThumbnailsDecodeAtTheSmallestSizeThatServes) {
   }
 }
 
-TEST(Jpeg, SaysWhatNoSegmentHolds) {
+TEST(Jpeg, ReportsMetadataTooLargeForASegment) {
   const PicturePointer picture = PatternPicture(8, 8, 24);
   picture->metadata.exif.assign(70000, 1);
   picture->metadata.xmp.assign(70000, 'x');

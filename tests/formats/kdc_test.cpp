@@ -143,7 +143,7 @@ Bytes PreviewFile(bool big, bool jpeg) {
   return file.Finish(file.Directory(entries, next));
 }
 
-TEST(Kdc, SensorDataAreDeveloped) {
+TEST(Kdc, DecodesSensorData) {
   if (!HasRawLibrary()) GTEST_SKIP() << "LibRaw is not installed";
   const Decoded described = Describe(KdcInfo, SensorFile()),
                 decoded = Decode(KdcRead, SensorFile());
@@ -161,7 +161,7 @@ TEST(Kdc, SensorDataAreDeveloped) {
   EXPECT_TRUE(decoded.picture->note.empty());
 }
 
-TEST(Kdc, PreviewsStandInForUnknownCameras) {
+TEST(Kdc, FallsBackToPreviews) {
   for (const bool big : {false, true}) {
     SCOPED_TRACE(big ? "big-endian" : "little-endian");
     const Decoded rgb = Decode(KdcRead, PreviewFile(big, false));
@@ -177,7 +177,7 @@ TEST(Kdc, PreviewsStandInForUnknownCameras) {
   }
 }
 
-TEST(Kdc, OtherFilesAreRefused) {
+TEST(Kdc, RejectsOtherFiles) {
   TiffFile empty(false), loop(true);
   constexpr uint32_t next = 8;
   (void)empty.Data(Bytes(200));  // the library rejects shorter files
@@ -191,7 +191,7 @@ TEST(Kdc, OtherFilesAreRefused) {
   EXPECT_EQ(Decode(KdcRead, Jpeg(9)).status, Status::DamagedFile);
 }
 
-TEST(RawPreview, ClaimsAreHeldAgainstTheFile) {
+TEST(RawPreview, ValidatesTheFilesClaims) {
   Bytes file = PreviewFile(false, false);
   RawPreview preview;
   ASSERT_TRUE(FindRawPreview(file, preview));

@@ -98,7 +98,7 @@ TEST(Mac, UnpacksRowsOneByOne) {
   }
 }
 
-TEST(Mac, FindsWhereTheRowsBegin) {
+TEST(Mac, FindsTheStartOfTheRows) {
   Bytes macBinary = Times(kMacBinary, 0);
   std::copy_n("PNTG", 4, macBinary.begin() + 65);
   Bytes nonZero = macBinary;
@@ -202,7 +202,7 @@ TEST(Mac, PutsThePictureOnAWhitePage) {
   }
 }
 
-TEST(Mac, RefusesWithItsStatus) {
+TEST(Mac, RejectsInvalidFiles) {
   const TemporaryFolder folder;
   const PicturePointer picture = MakePicture(8, 8, 8);
   EXPECT_EQ(MacInfo(*picture, {.fileName = folder.Path("none.mac"), .signedOnly = true}), Status::UnsupportedFormat);

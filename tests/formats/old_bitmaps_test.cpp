@@ -21,7 +21,7 @@ struct ReadRow {
   const char* pixels;
 };
 
-TEST(OldBitmaps, AreReadAsTheirMakersMeantThem) {
+TEST(OldBitmaps, ReadsOldVariants) {
   const std::string ras8 = "59A66A95 00000003 00000002 00000008 00000000 ",
                     ras24 = "59A66A95 00000001 00000001 00000018 00000000 ";
   const std::string plainMap = "00000001 00000000 00000000 ", coded = "00000002 00000000 00000000 ";
@@ -83,7 +83,7 @@ Bytes Drawing(const std::string& records) {
   return file;
 }
 
-TEST(OldBitmaps, DrawingsAreTurnedUpright) {
+TEST(OldBitmaps, RotatesDrawingsUpright) {
   const std::pair<const char*, const char*> rows[] = {
       {"rorient: 000,270", "1 0 / 0 0 / 0 0"}, {"RORIENT:000,090 ", "0 0 / 0 0 / 1 0"}, {"rorient: 180,090", "0 1 / 0 0 / 0 0"},
       {"rorient: 180,270", "0 0 / 0 0 / 0 1"}, {"rorient: 270,270", "0 0 1 / 0 0 0"},   {"rorient: 090,270", "0 0 0 / 1 0 0"},
@@ -105,7 +105,7 @@ TEST(OldBitmaps, DrawingsAreTurnedUpright) {
 }
 
 // White on black is stored as such, in whichever order the palette has the two colors.
-TEST(OldBitmaps, TheDarkerColorIsBlack) {
+TEST(OldBitmaps, StoresTheDarkerColorAsBlack) {
   const PicturePointer picture = PatternPicture(8, 1, 1);
   for (int32_t x = 0; x < 8; ++x) SetPixel(picture->image, x, 0, x == 0);
   EXPECT_EQ(Encode(WbmpWrite, *picture), Hex("00 00 08 01 80"));

@@ -169,7 +169,7 @@ Bytes PlainFile(int32_t sizes, uint8_t turns = 0) {
   return file;
 }
 
-TEST(PcdRead, TurnsUpright) {
+TEST(PcdRead, RotatesUpright) {
   struct Case {
     uint8_t turns;
     int32_t width, x, y, secondX, secondY;
@@ -195,7 +195,7 @@ TEST(PcdRead, TurnsUpright) {
   }
 }
 
-TEST(PcdRead, SizesThatAreAskedFor) {
+TEST(PcdRead, RequestedSizes) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("a.pcd");
   WriteBytes(path, PlainFile(3));
@@ -220,7 +220,7 @@ TEST(PcdRead, SizesThatAreAskedFor) {
   }
 }
 
-TEST(PcdRead, Refused) {
+TEST(PcdRead, RejectsInvalidFiles) {
   Bytes overview(41 * 2048);
   std::ranges::copy(std::string_view("PCD_OPA"), overview.begin());
   const Bytes empty = overview;

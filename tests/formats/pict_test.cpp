@@ -61,7 +61,7 @@ TEST(PictRead, Kinds) {
 }
 
 // Two bitmaps side by side: each is scaled to its rectangle.
-TEST(PictRead, PiecesShareTheFrame) {
+TEST(PictRead, BitmapsShareTheFrame) {
   const auto piece = [](const char* columns, const char* pixel) {
     return std::string(
                " 009A 000000FF 8004 0000 0000 0001 0001 0000 0001 00000000 00480000 00480000 0010 "

@@ -54,7 +54,7 @@ TEST(PicRead, Pictor) {
   }
 }
 
-TEST(PictorRuns, EverythingComesBack) {
+TEST(PictorRuns, RoundTrip) {
   for (const size_t length : {size_t{1}, size_t{255}, size_t{256}, kPictorBlock}) {
     for (const int mask : {0xFF, 0x01, 0x00}) {
       SCOPED_TRACE(length);

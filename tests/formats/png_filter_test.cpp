@@ -43,7 +43,7 @@ uint64_t Sum(const std::vector<uint8_t>& row) {
   return sum;
 }
 
-TEST(PngFilter, UndoesAndChoosesAsDefined) {
+TEST(PngFilter, MatchesTheDefinition) {
   uint32_t state = 7;
   const auto next = [&state] { return (state = state * 1664525 + 1013904223) >> 16; };
   for (const size_t step : {1, 2, 3, 4, 6, 8}) {

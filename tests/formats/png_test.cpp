@@ -12,7 +12,7 @@
 namespace fotomill::test {
 namespace {
 
-TEST(Png, MetadataTravels) {
+TEST(Png, MetadataRoundTrips) {
   const ScopedSettings scoped;
   const PicturePointer picture = PatternPicture(5, 3, 24);
   picture->metadata.exif = {'I', 'I', 42, 0, 8, 0, 0, 0, 0, 0, 0, 0, 0, 0};
@@ -94,7 +94,7 @@ TEST(Png, AlphaOfPalettePicturesIsKept) {
   EXPECT_TRUE(SamePixels(back.picture->image, picture->image));
 }
 
-TEST(Png, BrokenFilesFailWithTheirStatus) {
+TEST(Png, InvalidFilesFail) {
   const std::vector<uint8_t> file = Encode(PngWrite, *PatternPicture(40, 40, 8));
   std::vector<uint8_t> flipped = file;
   flipped[file.size() / 2] ^= 0x55;

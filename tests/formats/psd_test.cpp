@@ -105,7 +105,7 @@ TEST(PsdRead, Kinds) {
 }
 
 // A gray picture of 2 x 1 without a merged picture: a layer that extends beyond the left edge.
-TEST(PsdRead, LayersWhereTheMergedPictureIsMissing) {
+TEST(PsdRead, LayersWithoutAMergedPicture) {
   const std::string sides = "00000000 FFFFFFFF 00000001 00000001";
   const std::string layer =
       sides + " 0002 0000 00000004 FFFF 00000004 3842494D 6E6F726D FF 00 00 00 00000000";
@@ -120,7 +120,7 @@ TEST(PsdRead, LayersWhereTheMergedPictureIsMissing) {
   EXPECT_EQ(PixelText(decoded.picture->alpha), "128 0");
 }
 
-TEST(PsdWrite, MetadataComesBack) {
+TEST(PsdWrite, MetadataRoundTrips) {
   const PicturePointer picture = PatternPicture(5, 3, 24);
   picture->metadata.icc = {1, 2, 3};
   picture->metadata.exif = {4, 5};

@@ -58,7 +58,7 @@ TEST(SgiRead, Kinds) {
   }
 }
 
-TEST(SgiRuns, EverythingComesBackInLittleRoom) {
+TEST(SgiRuns, RoundTripWithinTheLimit) {
   for (const size_t width : {1, 2, 3, 126, 127, 128, 1000}) {
     for (const int mask : {0xff, 0x01, 0x00}) {
       SCOPED_TRACE(width);

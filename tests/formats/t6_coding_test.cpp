@@ -91,7 +91,7 @@ TIFF* OpenFax(const std::string& path, const Picture& picture) {
   return file;
 }
 
-TEST(T6Coding, LibtiffReadsWhatIsWrittenAndTheOtherWayRound) {
+TEST(T6Coding, AgreesWithLibtiff) {
   const TemporaryFolder folder;
   for (const Picture& picture : Pictures()) {
     SCOPED_TRACE(picture.name);
@@ -120,7 +120,7 @@ TEST(T6Coding, LibtiffReadsWhatIsWrittenAndTheOtherWayRound) {
   }
 }
 
-TEST(T6Coding, DataThatEndEarlyOrMeanNothingAreRefused) {
+TEST(T6Coding, RejectsTruncatedAndInvalidData) {
   for (const Picture& picture : Pictures()) {
     SCOPED_TRACE(picture.name);
     const Bytes coded = Encoded(picture);

@@ -27,7 +27,7 @@ TEST(TiffLzw, CodesAsDefined) {
   EXPECT_EQ(Decoded(coded, plain.size()), plain);
 }
 
-TEST(TiffLzw, EverythingComesBack) {
+TEST(TiffLzw, RoundTrips) {
   TiffLzwEncoder encoder;
   Bytes coded;
   // around table resets and width changes
@@ -53,7 +53,7 @@ TEST(TiffLzw, EverythingComesBack) {
   }
 }
 
-TEST(TiffLzw, BadCodesAreRefused) {
+TEST(TiffLzw, RejectsInvalidCodes) {
   struct Row {
     const char* name;
     const char* coded;

@@ -112,7 +112,7 @@ TEST(Tiff, ColorMapsHoldSixteenBitsOrEight) {
   }
 }
 
-TEST(Tiff, BrokenFilesFailWithTheirStatus) {
+TEST(Tiff, InvalidFilesFail) {
   const std::vector<uint8_t> pixels(64, 7);
   struct Row {
     const char* name;
@@ -142,7 +142,7 @@ TEST(Tiff, BrokenFilesFailWithTheirStatus) {
   }
 }
 
-TEST(Tiff, FilesCutShortEndCleanly) {
+TEST(Tiff, TruncatedFilesFailCleanly) {
   const std::vector<uint8_t> bare = Page(8, 8, 8, 1, 1, 339, 1, std::vector<uint8_t>(64, 7));
   const std::vector<uint8_t> packed = Encode(TiffWrite, *PatternPicture(30, 20, 24));
   for (size_t length = 0; length < bare.size(); ++length) {
@@ -155,7 +155,7 @@ TEST(Tiff, FilesCutShortEndCleanly) {
   }
 }
 
-TEST(Tiff, MetadataTravels) {
+TEST(Tiff, MetadataRoundTrips) {
   const ScopedSettings scoped;
   const PicturePointer picture = PatternPicture(5, 3, 24);
   picture->metadata.icc.assign(200, 9);
@@ -181,7 +181,7 @@ TEST(Tiff, MetadataTravels) {
 }
 
 // Large enough for several strips and for patching a header that was already flushed.
-TEST(Tiff, EveryCompressionKeepsEveryPixel) {
+TEST(Tiff, EveryCompressionIsLossless) {
   const ScopedSettings scoped;
   for (int32_t option = choice::kTiffNone; option < choice::kTiffJpeg; ++option) {
     settings.TiffOptions = option;
@@ -200,7 +200,7 @@ TEST(Tiff, EveryCompressionKeepsEveryPixel) {
   }
 }
 
-TEST(Tiff, OthersReadWhatIsWritten) {
+TEST(Tiff, WrittenFilesAreCompatible) {
   if (!HasProgram("tifftopnm")) GTEST_SKIP() << "netpbm is not installed";
   const ScopedSettings scoped;
   const TemporaryFolder folder;

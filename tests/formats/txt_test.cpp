@@ -18,7 +18,7 @@ using Lines = std::vector<std::u32string>;
 Bytes BytesOf(std::string_view text) { return {text.begin(), text.end()}; }
 std::string TextOf(const Bytes& bytes) { return {bytes.begin(), bytes.end()}; }
 
-TEST(Txt, TakesLinesApart) {
+TEST(Txt, SplitsLines) {
   const struct {
     const char* name;
     std::string text;

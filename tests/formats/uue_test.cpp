@@ -93,7 +93,7 @@ TEST(Uuencode, EncodesLines) {
   EXPECT_EQ(back.bytes, long46);
 }
 
-TEST(Uue, TheFileInsideIsReadByItsRow) {
+TEST(Uue, ReadsTheEmbeddedFileByItsRow) {
   const ScopedSettings scope;
   const PicturePointer picture = PatternPicture(5, 3, 24);
   const Bytes bitmap = Encode(BmpWrite, *picture);
@@ -142,7 +142,7 @@ TEST(Uue, TheFileInsideIsReadByItsRow) {
   EXPECT_EQ(Decode(UueRead, BytesOf(stray)).status, Status::Ok);
 }
 
-TEST(Uue, WrapsWhatSuitsThePicture) {
+TEST(Uue, ChoosesTheEmbeddedFormat) {
   const TemporaryFolder folder;
   const std::pair<int32_t, const char*> rows[] = {{1, ".gif"}, {8, ".gif"}, {24, ".jpg"}};
   for (const auto& [bits, extension] : rows) {

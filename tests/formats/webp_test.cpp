@@ -23,7 +23,7 @@ PicturePointer TransparentPicture() {
   return picture;
 }
 
-TEST(Webp, LosslessKeepsEveryPixel) {
+TEST(Webp, LosslessIsExact) {
   const ScopedSettings scoped;
   settings.WebPLossless = 1;
   const PicturePointer plain = PatternPicture(50, 40, 24), transparent = TransparentPicture();
@@ -40,7 +40,7 @@ TEST(Webp, LosslessKeepsEveryPixel) {
   }
 }
 
-TEST(Webp, MetadataTravels) {
+TEST(Webp, MetadataRoundTrips) {
   const ScopedSettings scoped;
   for (const bool alpha : {false, true}) {
     const PicturePointer picture = alpha ? TransparentPicture() : PatternPicture(5, 3, 24);
@@ -61,7 +61,7 @@ TEST(Webp, MetadataTravels) {
   }
 }
 
-TEST(Webp, FramesAreDrawnOverEachOther) {
+TEST(Webp, ComposesFrames) {
   const std::vector<uint8_t> replacing =
       ReadBytes(SourcePath("tests/formats/webp/good/frames.webp"));
   std::vector<uint8_t> blending = replacing;
@@ -104,7 +104,7 @@ TEST(Webp, FramesAreDrawnOverEachOther) {
   }
 }
 
-TEST(Webp, BrokenFilesFail) {
+TEST(Webp, InvalidFilesFail) {
   const std::vector<uint8_t> file = Encode(WebpWrite, *PatternPicture(40, 40, 24));
   for (size_t length = 0; length < file.size() - 1; ++length) {  // the last byte may be padding
     const Decoded decoded = Decode(WebpRead, std::span(file).first(length));

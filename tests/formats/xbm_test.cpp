@@ -150,7 +150,7 @@ TEST(Xbm, ReadsText) {
   }
 }
 
-TEST(Xbm, RefusesSizes) {
+TEST(Xbm, RejectsInvalidSizes) {
   const struct {
     const char* name;
     std::string text;
@@ -242,7 +242,7 @@ TEST(Xbm, AgreesWithNetpbmAtWholeBytes) {
   }
 }
 
-TEST(Xbm, ReadsTheBitmapsOfXAsNetpbmDoes) {
+TEST(Xbm, ReadsXBitmapsLikeNetpbm) {
   const char* const bitmaps = "/usr/include/X11/bitmaps";
   if (!HasProgram("xbmtopbm") || !std::filesystem::is_directory(bitmaps))
     GTEST_SKIP() << "netpbm or xbitmaps is missing";

@@ -95,7 +95,7 @@ TEST(ExifEdit, CutsOffAThumbnailAtTheEnd) {
   EXPECT_EQ(LinesOf(blocks.block), LinesOf(rest));
 }
 
-TEST(ExifEdit, DroppingSparesWhatTheThumbnailClaimsToCover) {
+TEST(ExifEdit, DroppingTheThumbnailSparesOverlappingData) {
   // The thumbnail claims the whole block, and its directory shares the offset of the EXIF directory
   // and links to itself.
   BlockBuilder blocks;
@@ -125,7 +125,7 @@ TEST(ExifEdit, ReplacesTheThumbnail) {
   }
 }
 
-TEST(ExifEdit, LeavesAloneWhatIsNoBlock) {
+TEST(ExifEdit, LeavesInvalidBlocksAlone) {
   for (const char* hex :
        {"", "4949", "4949 2B00 08000000 0100 0001 0300 01000000 05000000 00000000",
         "4949 2A00 00000000", "4949 2A00 08000000", "4949 2A00 08000000 0000 00000000",

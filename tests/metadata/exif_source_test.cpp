@@ -33,7 +33,7 @@ Bytes WebpChunk(std::string_view type, const Bytes& contents) {
   return Of(type) + Bytes{size[1], size[0], 0, 0} + contents + Bytes(contents.size() % 2);
 }
 
-TEST(ExifSource, FindsTheBlockOfEveryKindOfFile) {
+TEST(ExifSource, FindsTheBlockInEveryFormat) {
   const Bytes block = BigEndianBlock(), little = LittleEndianBlock(), none;
   const Bytes mark = Hex("45786966 0000"), far(20000);  // beyond the head that is read first
   const Bytes start = Hex("FFD8"), app1 = Segment(0xe1, mark + block), scan = Hex("FFDA 0002");
@@ -80,7 +80,7 @@ TEST(ExifSource, FindsTheBlockOfEveryKindOfFile) {
   }
 }
 
-TEST(ExifSource, SaysWhatItCannotRead) {
+TEST(ExifSource, ReportsReadErrors) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("picture");
   ExifSource source;

@@ -165,7 +165,7 @@ TEST(ExifValue, NormalisesRawCopies) {
   }
 }
 
-TEST(ExifTags, LookUpFunctionsKnowTagsAndOthers) {
+TEST(ExifTags, LookUpKnownAndUnknownTags) {
   for (size_t i = 0; i < ExifTags().size(); ++i)
     EXPECT_EQ(ExifTagIndex(ExifTags()[i].tag), static_cast<int32_t>(i));
   EXPECT_EQ(ExifTagIndex(0xc4a5), kNoExifTag);

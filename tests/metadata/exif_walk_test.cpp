@@ -100,7 +100,7 @@ TEST(ExifWalk, TakesTheLastThumbnailTags) {
   EXPECT_EQ(findings.thumbnailSize, 2u);
 }
 
-TEST(ExifWalk, KeepsToItsLimitsAndSaysSo) {
+TEST(ExifWalk, KeepsToItsLimitsAndReportsThem) {
   // Two directories of 40,000 entries: the walk ends with entry 65,536.
   BlockBuilder blocks;
   const std::vector<BlockBuilder::Entry> many(40000, {kWidth, 3, 1, 1});

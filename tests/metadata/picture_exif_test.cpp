@@ -9,7 +9,7 @@
 namespace fotomill::test {
 namespace {
 
-TEST(PictureExif, UprightPicturesTellTheTruth) {
+TEST(PictureExif, UprightPicturesHaveMatchingExif) {
   const PicturePointer picture = PatternPicture(3, 2, 8);
   const int32_t topLeft = picture->image.PixelAt(0, 0);
   picture->metadata.exif = Hex(R"(49492A00 08000000 0300

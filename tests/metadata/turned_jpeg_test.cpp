@@ -34,7 +34,7 @@ bool LookAlike(const Bytes& a, const Bytes& b) {
          SamePixels(one.picture->image, other.picture->image);
 }
 
-TEST(TurnedJpeg, PixelsAreThoseOfJpegtran) {
+TEST(TurnedJpeg, MatchesJpegtran) {
   if (!HasProgram("jpegtran")) GTEST_SKIP();
   const ScopedSettings scoped;
   const TemporaryFolder folder;
@@ -99,7 +99,7 @@ Bytes FullFile(int32_t width, int32_t height, const PicturePointer& thumbnail) {
   return file;
 }
 
-TEST(TurnedJpeg, WhatBelongsToAPictureTurnsWithIt) {
+TEST(TurnedJpeg, RotatesThumbnailAndMetadata) {
   struct Row {
     Orientation turn;
     int32_t width, height, thumbnailWidth;  // of the thumbnail: 32 is whole blocks, 30 is not
@@ -138,7 +138,7 @@ TEST(TurnedJpeg, WhatBelongsToAPictureTurnsWithIt) {
   }
 }
 
-TEST(TurnedJpeg, UnfitFilesKeepTheirPixels) {
+TEST(TurnedJpeg, UnsuitableFilesKeepTheirPixels) {
   const Bytes sound = FullFile(64, 48, PatternPicture(32, 24, 24));
   Bytes flawed = sound, several = sound, split = sound;
   const auto middle = flawed.begin() + static_cast<std::ptrdiff_t>(flawed.size() - 400);
@@ -173,7 +173,7 @@ TEST(TurnedJpeg, UnfitFilesKeepTheirPixels) {
   EXPECT_TRUE(made.empty());
 }
 
-TEST(TurnedJpeg, AnOrientationIsAddedInTheOrderOfTheTags) {
+TEST(TurnedJpeg, AddsTheOrientationInTagOrder) {
   const Bytes first = Hex(
       "4D4D002A 00000008 0002  010F 0002 00000004 41424300  0132 0002 00000002 44000000  00000000");
   for (const Bytes& block : {Bytes(), first, Hex("49492A00 08000000 0000 00000000")}) {

@@ -79,7 +79,7 @@ TEST(Overlay, IsPorterAndDuffsOver) {
   }
 }
 
-TEST(Caption, AddsAStripThatLeavesThePictureAlone) {
+TEST(Caption, AddsAStripWithoutChangingThePicture) {
   for (const bool above : {false, true}) {
     const auto source =
         MakePicture(300, 40, [](int32_t x, int32_t y) { return Scatter(x, y) & 0xffffff; });
@@ -121,7 +121,7 @@ TEST(Caption, TakesItsDefaultsFromTheConfiguration) {
   EXPECT_EQ(ColorAt(*made, 3, 33), 0x00ff00u);
 }
 
-TEST(Caption, StandsWhereItIsAligned) {
+TEST(Caption, IsAligned) {
   const char* kAligns[] = {"left", "center", "right"};
   const double expected[] = {10, 150, 290};  // left edge, center, right edge of the letters
   for (size_t i = 0; i < 3; ++i) {
@@ -134,7 +134,7 @@ TEST(Caption, StandsWhereItIsAligned) {
   }
 }
 
-TEST(DrawnText, StandsWhereGravitySays) {
+TEST(DrawnText, IsPlacedByGravity) {
   const struct {
     const char* gravity;
     double x, y;  // position as a share of the free space
@@ -172,7 +172,7 @@ TEST(DrawnText, HasOutlineShadowBoxAndOpacity) {
   EXPECT_EQ(brightest, 0x90a0b0u);
 }
 
-TEST(DrawnText, KeepsTransparencyAround) {
+TEST(DrawnText, KeepsSurroundingTransparency) {
   auto picture = Plain(60, 40);
   AddAlpha(*picture, [](int32_t, int32_t) { return 0; });
   picture = Applied(std::move(picture), "text H size=30px color=#ff0000 font='DejaVu Sans Bold'");
@@ -195,7 +195,7 @@ class Watermarks : public testing::Test {
   const std::string name_ = folder_.Path("logo.png");
 };
 
-TEST_F(Watermarks, OfPicturesFitAndStand) {
+TEST_F(Watermarks, FitAndPositionPictures) {
   const std::string line = "watermark picture='" + name_ + "' opacity=100 ";
   const auto ink = [&](const std::string& more) {
     return Changed(*Applied(Plain(100, 60), line + more));
@@ -306,7 +306,7 @@ TEST(Borders, KeepPalettes) {
   EXPECT_EQ(Applied(Plain(200, 100), "border 10%")->width, 220) << "of the shorter edge";
 }
 
-TEST(Shadows, LieBehind) {
+TEST(Shadows, AreBehindThePicture) {
   const auto sharp =
       Applied(Plain(20, 20), "shadow 6 4 blur=0 opacity=50 color=black background=white");
   EXPECT_EQ(sharp->width, 26);

@@ -158,7 +158,7 @@ TEST(Effects, FollowTheirFormulas) {
   }
 }
 
-TEST(Effects, StretchLevelsAsTheirHistogramSays) {
+TEST(Effects, StretchLevelsByHistogram) {
   struct Case {
     const char* text;
     std::vector<int32_t> before, after;  // a row of grays
@@ -192,7 +192,7 @@ TEST(Effects, StretchLevelsAsTheirHistogramSays) {
   EXPECT_EQ(Colors(*each), (std::vector<uint32_t>{0x000000, 0xffffff}));
 }
 
-TEST(Effects, LeaveAlphaAloneButForChannels) {
+TEST(Effects, LeaveAlphaAloneExceptChannels) {
   const auto make = [] {
     PicturePointer picture = Grid();
     AddAlpha(*picture, [](int32_t x, int32_t) { return x % 256; });
@@ -209,7 +209,7 @@ TEST(Effects, LeaveAlphaAloneButForChannels) {
   EXPECT_EQ(ColorAt(*opaque, 77, 3), 0xffffffu);
 }
 
-TEST(Effects, VignetteDarkensCornersAndKeepsTheMiddle) {
+TEST(Effects, VignetteDarkensCornersAndKeepsTheCenter) {
   const PicturePointer picture = MakePicture(101, 61, [](int32_t, int32_t) { return 0xc8c8c8u; });
   ASSERT_EQ(Apply("vignette 50 40 #ff0000", *picture), Status::Ok);
   EXPECT_EQ(ColorAt(*picture, 50, 30), 0xc8c8c8u);
@@ -224,7 +224,7 @@ TEST(Effects, VignetteDarkensCornersAndKeepsTheMiddle) {
   EXPECT_EQ(ColorAt(*picture, 0, 30) & 255, static_cast<uint32_t>(200 - 100 * s * s * (3 - 2 * s) + 0.5));
 }
 
-TEST(Effects, RefuseWhatMakesNoSense) {
+TEST(Effects, RejectInvalidParameters) {
   for (const char* text :
        {"levels 200 100", "tint #ff000080", "channels", "channels keep=red swap=red-blue",
         "channels mix=\"1 2\"", "channels mix=\"1 2 3 4 5 6 7 8 nan\"",

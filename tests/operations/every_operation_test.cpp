@@ -76,7 +76,7 @@ std::string LineAt(const Operation& operation, bool most) {
   return line;
 }
 
-TEST(EveryOperation, HasARowThatFaceAndEngineCanUse) {
+TEST(EveryOperation, HasAValidRow) {
   for (const Operation* operation : Operations()) {
     SCOPED_TRACE(operation->name);
     EXPECT_EQ(FindOperation(operation->name), operation) << "two operations of one name";
@@ -125,7 +125,7 @@ TEST(EveryOperation, WorksOnEveryKindOfPicture) {
   }
 }
 
-TEST(EveryOperation, GivesAPaletteWhatItGivesThePromotedPicture) {
+TEST(EveryOperation, TreatsPalettePicturesLikePromotedOnes) {
   for (const Operation* operation : Operations()) {
     if (operation->works != Works::Point) continue;
     SCOPED_TRACE(operation->name);
@@ -142,7 +142,7 @@ TEST(EveryOperation, GivesAPaletteWhatItGivesThePromotedPicture) {
   }
 }
 
-TEST(EveryOperation, ComputesAPartAsThatPartOfTheWhole) {
+TEST(EveryOperation, ComputesTilesLikeTheWhole) {
   std::vector<std::string> texts{"gray; blur 5; contrast 20; sharpen 0.7",
                                  "flip; blur 9; unsharp 2 0.5 3"};
   for (const Operation* operation : Operations()) texts.emplace_back(operation->example);
@@ -168,7 +168,7 @@ TEST(EveryOperation, ComputesAPartAsThatPartOfTheWhole) {
   }
 }
 
-TEST(Engine, FusesPointOperationsWithoutChangingAByte) {
+TEST(Engine, FusesPointOperationsExactly) {
   const PicturePointer fused = TestPicture(64, 40, 24, false),
                        apart = TestPicture(64, 40, 24, false);
   const Recipe recipe = Read("brightness 12; gamma 1.7; gray; contrast -20; invert");
@@ -178,7 +178,7 @@ TEST(Engine, FusesPointOperationsWithoutChangingAByte) {
   EXPECT_EQ(Looks(*fused), Looks(*apart));
 }
 
-TEST(Engine, RefusesWhatCannotBeHeldAndStopsWhenAsked) {
+TEST(Engine, RejectsHugePicturesAndCanBeCanceled) {
   const PicturePointer picture = TestPicture(20, 20, 24, false);
   const std::vector<uint8_t> before = Looks(*picture);
   EXPECT_EQ(ApplySteps(*picture, Read("resize 1000000x1000000 stretch").common, kSerial), Status::MemoryAllocationError);

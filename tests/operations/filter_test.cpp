@@ -63,7 +63,7 @@ double Median3(const Channel& at, int32_t x, int32_t y) {
   return levels[4];
 }
 
-TEST(Filters, ComputeTheirFormulas) {
+TEST(Filters, MatchTheirFormulas) {
   const struct {
     const char* line;
     double (*of)(const Channel& at, int32_t x, int32_t y);
@@ -137,7 +137,7 @@ TEST(Filters, ComputeTheirFormulas) {
   }
 }
 
-TEST(Filters, OilTakesTheMostFrequentRange) {
+TEST(Filters, OilUsesTheMostFrequentRange) {
   const PicturePointer picture = Source(), source = Source();
   ASSERT_EQ(Apply(*picture, "oil 2 levels=8"), Status::Ok);
   const Channel blue{*source, 0}, green{*source, 8}, red{*source, 16};
@@ -202,7 +202,7 @@ TEST(Filters, NoiseHasItsDistribution) {
   for (const uint32_t color : Colors(*gray)) EXPECT_EQ(color, (color & 255) * 0x010101);
 }
 
-TEST(Filters, RedEyesLoseTheirRedWithinTheAreaOnly) {
+TEST(Filters, RemoveRedEyeWithinTheAreaOnly) {
   const auto make = [] {
     return MakePicture(6, 4, [](int32_t x, int32_t) { return x % 2 == 0 ? 0xd02030u : 0x806050u; });
   };
@@ -217,7 +217,7 @@ TEST(Filters, RedEyesLoseTheirRedWithinTheAreaOnly) {
   }
 }
 
-TEST(Filters, OfAFaceOnlyPupilsLoseTheirRed) {
+TEST(Filters, RemoveRedFromPupilsOnlyWithinAFace) {
   const auto color = [](int32_t x, int32_t y) {
     const bool inSpot = x >= 25 && x < 33 && ((y >= 35 && y < 43) || (y >= 80 && y < 88));
     const bool inStrip = y >= 20 && y < 24;  // wider than an eye
@@ -235,7 +235,7 @@ TEST(Filters, OfAFaceOnlyPupilsLoseTheirRed) {
 }
 
 // The colors of transparent pixels must not bleed.
-TEST(Filters, ColorsCountByTheirAlpha) {
+TEST(Filters, WeightColorsByAlpha) {
   for (const char* line : {"motion-blur 5 20", "radial-blur zoom 60", "radial-blur spin 40",
                            "surface-blur 3 255", "oil 2", "mosaic 7", "kernel '1 1 1 1 1 1 1 1 1'",
                            "despeckle threshold=0", "rotate 20 background=#00000000", "swirl 90"}) {

@@ -28,7 +28,7 @@ size_t ColorsUsed(const PictureRecord& picture) {
   return std::set(all.begin(), all.end()).size();
 }
 
-TEST(Reduce, GivesTheDepthOfItsColorsWithEveryDither) {
+TEST(Reduce, UsesTheMinimumDepthWithEveryDither) {
   const struct {
     const char* text;
     int32_t bits;
@@ -60,7 +60,7 @@ TEST(Reduce, GivesTheDepthOfItsColorsWithEveryDither) {
 
 // Dithering preserves the mean of an area if the palette includes black and white. Atkinson drops
 // errors, so it does not.
-TEST(Reduce, DithersKeepTheMean) {
+TEST(Reduce, DithersPreserveTheMean) {
   for (const char* reduce : {"mono", "reduce 2 fixed", "reduce 4 gray"}) {
     for (const char* dither :
          {"floyd-steinberg", "stucki", "burkes", "sierra", "bayer4", "bayer8"}) {
@@ -132,7 +132,7 @@ std::string ActOf(int32_t colors, bool trailer) {
   return bytes;
 }
 
-TEST(ColorTable, ReadsEveryKindAndRefusesTheRest) {
+TEST(ColorTable, ReadsEveryTypeAndRejectsOthers) {
   const struct {
     const char* name;
     std::string contents;
@@ -175,7 +175,7 @@ TEST(ColorTable, ReadsEveryKindAndRefusesTheRest) {
   EXPECT_EQ(ReadColorTable(lines, palette, count), Status::DamagedFile);
 }
 
-TEST(Reduce, TakesTheColorsOfAFile) {
+TEST(Reduce, UsesTheColorsOfAFile) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("colors.ccl");
   WriteText(path, "255 0 0\n0 255 0\n0 0 255\n");

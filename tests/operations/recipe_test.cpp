@@ -7,7 +7,7 @@
 namespace fotomill::test {
 namespace {
 
-TEST(Recipe, IsReadAndPrinted) {
+TEST(Recipe, ParsesAndPrints) {
   const struct {
     const char* name;
     const char* text;
@@ -33,7 +33,7 @@ TEST(Recipe, IsReadAndPrinted) {
   }
 }
 
-TEST(Recipe, MistakesTellWhereAndWhatWasMeant) {
+TEST(Recipe, ErrorsShowPositionAndSuggestion) {
   const struct {
     const char* text;
     int32_t line;
@@ -70,7 +70,7 @@ TEST(Recipe, MistakesTellWhereAndWhatWasMeant) {
   }
 }
 
-TEST(Macros, TagsHaveTheNamesOfTheStandardToo) {
+TEST(Macros, TagsAlsoHaveStandardNames) {
   PictureRecord picture;
   picture.metadata.exif = {'I', 'I', 42, 0, 8, 0,   0,   0,   1, 0, 0x10, 0x01, 2,
                            0,   4,   0,  0, 0, 'C', 'a', 'm', 0, 0, 0,    0,    0};
@@ -79,7 +79,7 @@ TEST(Macros, TagsHaveTheNamesOfTheStandardToo) {
   EXPECT_EQ(ExpandMacros("%E{Make}", {}, picture), "");
 }
 
-TEST(Macros, AreExpandedAndMadeSafeForNames) {
+TEST(Macros, AreExpandedAndSanitizedForNames) {
   PictureRecord picture;
   picture.width = 30;
   picture.height = 20;

@@ -42,7 +42,7 @@ PicturePointer SmallPicture(int32_t bits, int32_t used) {
   return picture;
 }
 
-TEST(Transforms, ThatMoveWholePixelsKeepTheDepth) {
+TEST(Transforms, KeepTheDepthWhenMovingWholePixels) {
   constexpr int32_t kNone = -1;  // the background
   struct Place {
     int32_t x, y;
@@ -89,7 +89,7 @@ TEST(Transforms, ThatMoveWholePixelsKeepTheDepth) {
   }
 }
 
-TEST(Transforms, CanvasBringsAlphaWithATransparentBackground) {
+TEST(Transforms, TransparentCanvasAddsAlpha) {
   for (const int32_t bits : {1, 8, 24}) {
     const PicturePointer picture = SmallPicture(bits, 2);
     ASSERT_EQ(Apply(*picture, "canvas 6x3 gravity=left background=#00000000"), Status::Ok);
@@ -99,7 +99,7 @@ TEST(Transforms, CanvasBringsAlphaWithATransparentBackground) {
   }
 }
 
-TEST(Transforms, TrimCutsTheBorderOff) {
+TEST(Transforms, TrimRemovesTheBorder) {
   const struct {
     const char* line;
     Rectangle kept;
@@ -171,7 +171,7 @@ Spot Turned(Spot spot, double degrees) {
   return {c * spot.x + s * spot.y, c * spot.y - s * spot.x};
 }
 
-TEST(Transforms, SampleWhereTheFormulaSays) {
+TEST(Transforms, SampleAccordingToTheFormula) {
   const struct {
     const char* line;
     int32_t width, height;
@@ -276,7 +276,7 @@ TEST(Transforms, SamplesAreTheSameOnEveryProcessor) {
   }
 }
 
-TEST(Transforms, FindHowAPageIsTurned) {
+TEST(Transforms, DetectSkew) {
   for (const double angle : {0.0, 1.3, -4.75, 11.0}) {
     const double slope = std::tan(angle * kDegree);
     const PicturePointer page = MakePicture(700, 500, [&](int32_t x, int32_t y) {
@@ -295,7 +295,7 @@ TEST(Transforms, FindHowAPageIsTurned) {
   EXPECT_EQ(found, 0);
 }
 
-TEST(Transforms, RefuseWhatMakesNoPicture) {
+TEST(Transforms, RejectInvalidResults) {
   const struct {
     const char* line;
     Status status;

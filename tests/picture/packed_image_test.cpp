@@ -7,7 +7,7 @@
 namespace fotomill {
 namespace {
 
-TEST(PackedImage, StrideAndSizeFollowDepth) {
+TEST(PackedImage, StrideAndSizeDependOnDepth) {
   struct Row {
     const char* name;
     int32_t width, height, bitsPerPixel;
@@ -31,7 +31,7 @@ TEST(PackedImage, StrideAndSizeFollowDepth) {
   }
 }
 
-TEST(PackedImage, RefusesWhatCannotBeHeld) {
+TEST(PackedImage, RejectsHugePictures) {
   PackedImage image;
   EXPECT_EQ(NewPackedImage(0, 5, nullptr, 8, image), Status::DamagedFile);
   EXPECT_EQ(NewPackedImage(5, -1, nullptr, 8, image), Status::DamagedFile);

@@ -65,7 +65,7 @@ TEST(FileView, ShowsTheWholeFileOrItsHead) {
   }
 }
 
-TEST(FileView, WhatIsNoRegularFileDoesNotOpen) {
+TEST(FileView, OpensRegularFilesOnly) {
   const TemporaryFolder folder;
   ASSERT_EQ(mkfifo(folder.Path("fifo").c_str(), 0600), 0);
   fs::create_directory(folder.Path("folder"));
@@ -84,7 +84,7 @@ TEST(FileView, WhatIsNoRegularFileDoesNotOpen) {
   }
 }
 
-TEST(FileView, AFileCutShortReadsAsZerosAndIsNotIntact) {
+TEST(FileView, TruncatedFilesReadAsZerosAndAreNotIntact) {
   const TemporaryFolder folder;
   constexpr size_t kSize = 1'000'000;
   const std::vector<uint8_t> bytes = Pattern(kSize);
@@ -109,7 +109,7 @@ TEST(FileView, AFileCutShortReadsAsZerosAndIsNotIntact) {
   }
 }
 
-TEST(FileView, OtherBusErrorsStillEndTheProgram) {
+TEST(FileView, OtherBusErrorsStillCrash) {
   const TemporaryFolder folder;
   WriteBytes(folder.Path("file"), Pattern(1'000'000));
   const int status = test::InChild([&] {
@@ -123,7 +123,7 @@ TEST(FileView, OtherBusErrorsStillEndTheProgram) {
   EXPECT_FALSE(WIFEXITED(status) && WEXITSTATUS(status) > 90) << status;  // signal or sanitizer
 }
 
-TEST(FileView, MoreViewsThanTheTableHolds) {
+TEST(FileView, MoreViewsThanTableSlots) {
   const TemporaryFolder folder;
   const std::vector<uint8_t> bytes = Pattern(300'000);
   WriteBytes(folder.Path("file"), bytes);
@@ -132,7 +132,7 @@ TEST(FileView, MoreViewsThanTheTableHolds) {
   for (const FileView& view : views) ASSERT_TRUE(Equal(view.Bytes(), bytes));
 }
 
-TEST(FileView, FailsCleanlyWhateverFails) {
+TEST(FileView, FailsCleanlyOnEveryFault) {
   const TemporaryFolder folder;
   for (const size_t size : {size_t{1000}, size_t{500'000}}) {
     const std::vector<uint8_t> bytes = Pattern(size);

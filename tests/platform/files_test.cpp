@@ -21,7 +21,7 @@ using test::TemporaryFolder;
 using test::WriteText;
 using testing::ElementsAre;
 
-TEST(Paths, SplitIntoPartsThatJoinToThePathAgain) {
+TEST(Paths, SplitAndJoin) {
   const struct {
     const char *path, *folder, *base, *extension;
   } rows[] = {
@@ -107,7 +107,7 @@ TEST_F(FilesTest, KindsOfEverything) {
   EXPECT_EQ(listed, 7u);
 }
 
-TEST_F(FilesTest, FactsTellSizeTimesAndIdentity) {
+TEST_F(FilesTest, FactsHaveSizeTimesAndIdentity) {
   const timeval times[2] = {{5, 0}, {1'000'000'000, 0}};
   ASSERT_EQ(utimes(Path("regular").c_str(), times), 0);
   const FileFacts facts = FactsOf(Path("to regular"));
@@ -137,7 +137,7 @@ TEST(Files, ListingKeepsAnyNameInByteOrder) {
             10);
 }
 
-TEST_F(FilesTest, MakesFoldersWithTheirParents) {
+TEST_F(FilesTest, CreatesFoldersWithTheirParents) {
   EXPECT_TRUE(MakeFolders(Path("a/b//c/")));
   EXPECT_TRUE(IsFolder(Path("a/b/c")));
   EXPECT_TRUE(MakeFolders(Path("a/b")));
@@ -159,7 +159,7 @@ TEST_F(FilesTest, DeletesFilesAndLinksNeverFolders) {
 constexpr RefusingRename allWays[] = {RefusingRename::Directly, RefusingRename::ByLink,
                                       RefusingRename::ByPlaceholder};
 
-TEST_F(FilesTest, RenamesAsAsked) {
+TEST_F(FilesTest, Renames) {
   WriteText(Path("new"), "new");
   for (const RefusingRename way : allWays) {
     SCOPED_TRACE(static_cast<int>(way));
@@ -259,7 +259,7 @@ TEST_F(FilesTest, ReadsWholeSmallFiles) {
   EXPECT_EQ(ReadWholeFile("/proc/self/status", 20, contents), ReadResult::TooLarge);
 }
 
-TEST_F(FilesTest, WholeFileIsOldOrNewWhateverFails) {
+TEST_F(FilesTest, WholeFileIsOldOrNewOnEveryFault) {
   const std::vector<std::string> before = folder_.Names();
   const std::string text(100'000, 'n');
   EXPECT_GE(test::ForEachFault([&] {

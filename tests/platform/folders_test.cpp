@@ -14,7 +14,7 @@ using test::ScopedEnvironment;
 using test::TemporaryFolder;
 using test::WriteText;
 
-TEST(Folders, FollowTheBaseDirectoryRules) {
+TEST(Folders, FollowTheBaseDirectorySpecification) {
   const TemporaryFolder folder;
   const ScopedEnvironment home("HOME", folder.Path() + "/");
   const struct {
@@ -41,7 +41,7 @@ TEST(Folders, FollowTheBaseDirectoryRules) {
   }
 }
 
-TEST(Folders, UserFoldersComeFromTheUsersList) {
+TEST(Folders, UserFoldersComeFromUserDirs) {
   const TemporaryFolder folder;
   const ScopedEnvironment home("HOME", folder.Path());
   const ScopedEnvironment configuration("XDG_CONFIG_HOME", folder.Path());
@@ -81,7 +81,7 @@ TEST(Folders, PathsBecomeAbsolute) {
   EXPECT_EQ(AbsolutePath(""), current);
 }
 
-TEST(Folders, ADeletedCurrentFolderIsNone) {
+TEST(Folders, ADeletedCurrentFolderIsEmpty) {
   const std::string before = CurrentFolder();
   {
     const TemporaryFolder folder;
@@ -93,7 +93,7 @@ TEST(Folders, ADeletedCurrentFolderIsNone) {
   ASSERT_EQ(chdir(before.c_str()), 0);
 }
 
-TEST(Folders, TheProgramKnowsItsOwnFile) {
+TEST(Folders, ProgramPathIsThisProgram) {
   EXPECT_TRUE(IsRegularFile(ProgramPath()));
   EXPECT_TRUE(ProgramPath().ends_with("/test_platform")) << ProgramPath();
   EXPECT_EQ(ProgramFolder() + "/test_platform", ProgramPath());

@@ -75,7 +75,7 @@ void SaveBeside(const std::string& path) {
 }
 void Remove(const std::string& path) { fs::remove(path); }
 
-TEST_P(HeldFileTest, WhatOthersWriteMeanwhileStays) {
+TEST_P(HeldFileTest, ConcurrentChangesAreKept) {
   const struct {
     const char* name;
     void (*change)(const std::string& path);
@@ -119,7 +119,7 @@ TEST_P(HeldFileTest, WhatOthersWriteMeanwhileStays) {
 }
 
 // Each appends its letter to the contents; without the lock, letters would be lost.
-TEST_P(HeldFileTest, RunsKeepApart) {
+TEST_P(HeldFileTest, RunsAreSerialized) {
   constexpr int kRuns = 8, kTimes = 20;
   WriteText(Path(), "");
   pid_t children[kRuns];
@@ -141,7 +141,7 @@ TEST_P(HeldFileTest, RunsKeepApart) {
   EXPECT_EQ(ReadText(Path()), std::string(kRuns * kTimes, 'x'));
 }
 
-TEST(ReplacedFile, KeepsWhatBelongsToTheFile) {
+TEST(ReplacedFile, KeepsTheFilesAttributes) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("file");
   WriteText(path, "old");
@@ -188,7 +188,7 @@ TEST(ReplacedFile, KeepsWhatBelongsToTheFile) {
   EXPECT_EQ(TakeLostAttributes(), "");
 }
 
-TEST(ReplacedFile, LinksOfTheSystemStay) {
+TEST(ReplacedFile, SystemLinksAreKept) {
   const TemporaryFolder folder;
   fs::create_directory(folder.Path("folder"));
   fs::create_symlink("folder", folder.Path("to-folder"));
@@ -200,7 +200,7 @@ TEST(ReplacedFile, LinksOfTheSystemStay) {
   }
 }
 
-TEST(Existence, HasThreeAnswers) {
+TEST(Existence, HasThreeValues) {
   const TemporaryFolder folder;
   fs::create_directory(folder.Path("locked"));
   WriteText(folder.Path("locked/there"), "");
@@ -223,7 +223,7 @@ TEST(Existence, HasThreeAnswers) {
   ASSERT_EQ(chmod(folder.Path("locked").c_str(), 0755), 0);
 }
 
-TEST(StaleFiles, OfKilledRunsGo) {
+TEST(StaleFiles, OfKilledRunsAreDeleted) {
   const TemporaryFolder folder;
   std::string dead, live = OwnerOfTemporary();
   int ends[2];

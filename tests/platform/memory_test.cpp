@@ -58,7 +58,7 @@ TEST(MemoryBlock, ResizeKeepsTheContentsAndAddsZeros) {
   EXPECT_TRUE(AllAre(block.Bytes().subspan(5 * kMega), 0));
 }
 
-TEST(MemoryBlock, WhatCannotBeHadFails) {
+TEST(MemoryBlock, FailsIfMemoryRunsOut) {
   for (const uint64_t size : {UINT64_MAX, UINT64_MAX / 2, UINT64_MAX - kMega, uint64_t{1} << 47}) {
     MemoryBlock block;
     ASSERT_TRUE(block.Allocate(3 * kMega));
@@ -103,7 +103,7 @@ TEST(MemoryBlock, ManyThreadsShareThePool) {
   EXPECT_EQ(faults, 0);
 }
 
-TEST(ReservedMemory, HoldsMoreThanTheMachineAndSurvivesWhatCannotBeHad) {
+TEST(ReservedMemory, CanExceedPhysicalMemoryAndFailsCleanly) {
   ReservedMemory room;
   constexpr uint64_t kSize = uint64_t{1} << 38;
   ASSERT_TRUE(room.Reserve(kSize));

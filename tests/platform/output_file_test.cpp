@@ -69,7 +69,7 @@ TEST_P(OutputFileTest, AppearsWholeUnderAnyName) {
   EXPECT_EQ(folder_.Names(), names);
 }
 
-TEST_P(OutputFileTest, WhatMayNotBecomeAFileStays) {
+TEST_P(OutputFileTest, InvalidDestinationsAreUnchanged) {
   fs::create_directory(Path("folder"));
   WriteText(Path("folder/inner"), "inner");
   ASSERT_EQ(mkfifo(Path("fifo").c_str(), 0600), 0);
@@ -129,7 +129,7 @@ TEST_P(OutputFileTest, PermissionsFollowTheMaskOrTheOldFile) {
   umask(saved);
 }
 
-TEST_P(OutputFileTest, OldOrNewAndNothingBesideWhateverFails) {
+TEST_P(OutputFileTest, OldOrNewAndNoLeftoversOnEveryFault) {
   const std::string text(300'000, 'n');
   const struct {
     const char* name;
@@ -172,7 +172,7 @@ TEST_P(OutputFileTest, AFullDiskLeavesTheOldFile) {
   EXPECT_THAT(folder_.Names(), ElementsAre("file"));
 }
 
-TEST_P(OutputFileTest, AnEndedProgramLeavesNothing) {
+TEST_P(OutputFileTest, AKilledProgramLeavesNothing) {
   for (const int number : {SIGKILL, SIGTERM}) {
     // only a named file can be left behind
     if (number == SIGKILL && GetParam() == UnnamedFiles::DoNotWork) continue;

@@ -22,7 +22,7 @@ using test::ScopedEnvironment;
 using test::TemporaryFolder;
 using test::WriteText;
 
-TEST(Clock, MayBeFixed) {
+TEST(Clock, CanBeFixed) {
   EXPECT_GT(Now(), 1'600'000'000);
   FixNow(1234);
   EXPECT_EQ(Now(), 1234);
@@ -32,7 +32,7 @@ TEST(Clock, MayBeFixed) {
   EXPECT_GE(MonotonicSeconds(), before);
 }
 
-TEST(Clock, TellsTheWallClock) {
+TEST(Clock, ReturnsLocalTime) {
   const ScopedEnvironment zone("TZ", "XYZ-2");
   tzset();
   const LocalTime time = LocalTimeOf(951782399);  // 2000-02-28 23:59:59 UTC
@@ -51,7 +51,7 @@ std::string ArgumentPrinter(const TemporaryFolder& folder, const std::string& ou
   return path;
 }
 
-TEST(Process, ArgumentsArriveAsTheyAre) {
+TEST(Process, PassesArgumentsUnchanged) {
   const TemporaryFolder folder;
   const std::string out = folder.Path("out");
   const std::string printer = ArgumentPrinter(folder, out);
@@ -68,7 +68,7 @@ TEST(Process, ArgumentsArriveAsTheyAre) {
   EXPECT_EQ(ReadText(out), "later\n");
 }
 
-TEST(Process, WhatIsNoProgramDoesNotStart) {
+TEST(Process, RejectsNonPrograms) {
   const TemporaryFolder folder;
   WriteText(folder.Path("text"), "#!/bin/sh\n");
   WriteText(folder.Path("garbage"), "no program at all");
@@ -83,7 +83,7 @@ TEST(Process, WhatIsNoProgramDoesNotStart) {
   EXPECT_EQ(ProgramFor("/-a\n.bmp"), (std::vector<std::string>{folder.Path("xdg-open"), "/-a\n.bmp"}));
 }
 
-TEST(Process, TheFirstRequestToEndIsRememberedTheSecondEnds) {
+TEST(Process, TheSecondTerminationRequestEndsTheProgram) {
   for (const int number : {SIGINT, SIGTERM}) {
     const int once = InChild([number] {
       CatchTermination();
@@ -111,7 +111,7 @@ TEST(Process, TheFirstRequestToEndIsRememberedTheSecondEnds) {
   }
 }
 
-TEST(Process, TellsOfTheMachine) {
+TEST(Process, MachineFacts) {
   EXPECT_GE(CoreCount(), 1u);
   EXPECT_FALSE(IsTerminal(99));
   EXPECT_GT(TerminalWidth(), 0);

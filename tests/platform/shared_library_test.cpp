@@ -47,7 +47,7 @@ TEST(SharedLibrary, LoadsModulesByAbsolutePath) {
   EXPECT_TRUE(moved.Load(folder.Path("link.so")));
 }
 
-TEST(SharedLibrary, RefusesWhatIsNoModule) {
+TEST(SharedLibrary, RejectsNonModules) {
   const TemporaryFolder folder;
   test::WriteText(folder.Path("text.so"), "no module");
   test::WriteText(folder.Path("empty.so"), "");

@@ -81,7 +81,7 @@ TEST(StoreFile, ReadsAndWritesAllOrFails) {
   EXPECT_EQ(ReadText(folder.Path("store")), "abcdef");
 }
 
-TEST(StoreFile, KnowsWhenItsNameWentToAnother) {
+TEST(StoreFile, DetectsReplacement) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("store");
   WriteText(path, "old");
@@ -107,7 +107,7 @@ void Count(const std::string& path, int rounds) {
   }
 }
 
-TEST(StoreFile, TheLockKeepsThreadsAndProcessesApart) {
+TEST(StoreFile, LockIsExclusiveForThreadsAndProcesses) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("store");
   WriteText(path, "1000");
@@ -126,7 +126,7 @@ TEST(StoreFile, TheLockKeepsThreadsAndProcessesApart) {
   EXPECT_EQ(ReadText(path), "1500");
 }
 
-TEST(StoreFile, TheLockDiesWithItsProcessAndHearsTheUser) {
+TEST(StoreFile, LockEndsWithItsProcessAndCanBeInterrupted) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("store");
   WriteText(path, "x");

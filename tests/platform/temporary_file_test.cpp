@@ -42,7 +42,7 @@ class TemporaryFileTest : public testing::Test {
   std::string before_;
 };
 
-TEST_F(TemporaryFileTest, KeepsWhatAFileWasUntilItIsReplaced) {
+TEST_F(TemporaryFileTest, KeepsTheOldContentsOfAFile) {
   const std::string path = current_.Path("a.txt");
   // another volume
   for (const std::string& folder :
@@ -67,7 +67,7 @@ TEST_F(TemporaryFileTest, KeepsWhatAFileWasUntilItIsReplaced) {
   EXPECT_FALSE(kept.Keep(current_.Path(), current_.Path()));
 }
 
-TEST_F(TemporaryFileTest, HasAUniqueNameAndGoesWithItsOwner) {
+TEST_F(TemporaryFileTest, HasAUniqueNameAndIsDeletedWithItsOwner) {
   std::set<std::string> paths;
   {
     TemporaryFile files[5];
@@ -117,7 +117,7 @@ TEST_F(TemporaryFileTest, DoesNotWriteThroughALinkPutInItsPlace) {
   EXPECT_FALSE(file.Create("/../x"));
 }
 
-TEST_F(TemporaryFileTest, LeavesNothingWhateverFails) {
+TEST_F(TemporaryFileTest, LeavesNothingOnEveryFault) {
   EXPECT_GE(test::ForEachFault([&] {
               {
                 TemporaryFile file;
@@ -131,7 +131,7 @@ TEST_F(TemporaryFileTest, LeavesNothingWhateverFails) {
             3);
 }
 
-TEST_F(TemporaryFileTest, GoesEvenWhenASecondRequestEndsTheProgram) {
+TEST_F(TemporaryFileTest, IsDeletedEvenByASecondTerminationRequest) {
   const int status = test::InChild([&] {
     TemporaryFile file, kept;
     if (!file.Create() || !kept.Create()) _exit(1);

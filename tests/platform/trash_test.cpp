@@ -46,7 +46,7 @@ class TrashTest : public testing::Test {
   ScopedEnvironment data_, zone_;
 };
 
-TEST_F(TrashTest, RemembersWhereAndWhen) {
+TEST_F(TrashTest, RecordsPathAndTime) {
   const std::string name = "100% \"a\"\n\xC3\xA9\xFF.bmp";
   WriteText(Picture(name), "pixels");
   EXPECT_TRUE(HasTrash(Picture(name)));
@@ -60,7 +60,7 @@ TEST_F(TrashTest, RemembersWhereAndWhen) {
   EXPECT_EQ(fs::status(Trash("")).permissions(), fs::perms::owner_all);
 }
 
-TEST_F(TrashTest, KeepsWhatHasTheSameName) {
+TEST_F(TrashTest, KeepsFilesWithTheSameName) {
   for (const char* text : {"1", "2", "3"}) {
     WriteText(Picture("a.b.bmp"), text);
     ASSERT_TRUE(MoveToTrash(Picture("a.b.bmp")));
@@ -75,7 +75,7 @@ TEST_F(TrashTest, KeepsWhatHasTheSameName) {
   EXPECT_FALSE(FileExists(Trash("info/left.trashinfo")));
 }
 
-TEST_F(TrashTest, BringsBackWhatWasDeletedLast) {
+TEST_F(TrashTest, RestoresTheLastDeleted) {
   for (const char* text : {"older", "newer"}) {
     WriteText(Picture("a%.bmp"), text);
     ASSERT_TRUE(MoveToTrash(Picture("a%.bmp")));
@@ -93,7 +93,7 @@ TEST_F(TrashTest, BringsBackWhatWasDeletedLast) {
   EXPECT_THAT(NamesIn(Trash("info")), IsEmpty());
 }
 
-TEST_F(TrashTest, TakesFoldersLinksAndLongNames) {
+TEST_F(TrashTest, AcceptsFoldersLinksAndLongNames) {
   fs::create_directories(Picture("folder/inner"));
   fs::create_symlink("folder", Picture("link"));
   fs::create_symlink("nothing", Picture("dangling"));
@@ -111,7 +111,7 @@ TEST_F(TrashTest, TakesFoldersLinksAndLongNames) {
   EXPECT_THAT(ReadText(Trash("info/" + std::string(200, 'n') + ".bmp.trashinfo")), testing::HasSubstr("/" + longName + "\n"));
 }
 
-TEST_F(TrashTest, LeavesNothingBehindWhenItCannot) {
+TEST_F(TrashTest, FailsWithoutLeftovers) {
   const std::vector<std::string> before = folder_.Names();
   for (const std::string& path :
        {Picture("missing"), Picture("no/such"), Picture("."), Picture(".."), std::string("/"), std::string()}) {
@@ -150,7 +150,7 @@ bool MountVolume(const std::string& folder) {
 
 constexpr int kNotAllowed = 77;
 
-TEST_F(TrashTest, AnotherVolumeHasItsOwn) {
+TEST_F(TrashTest, OtherVolumesHaveTheirOwn) {
   const int status = test::InChild([&] {
     if (!MountVolume(Picture(""))) _exit(kNotAllowed);
     const std::string user = std::to_string(getuid());

@@ -103,7 +103,7 @@ TEST_F(MountTest, EveryMountIsDescribed) {
   EXPECT_NE(DescribeMount(mounts[0], 99, root_.Path()).serial, DescribeMount(mounts[3], 99, root_.Path()).serial);
 }
 
-TEST(Volumes, ThoseOfTheUser) {
+TEST(Volumes, UserVolumes) {
   const auto mounts = ParseMountTable(
       "1 0 8:1 / / rw - ext4 /dev/sda1 rw\n2 1 8:2 / /mnt/d\\040e rw - ext4 /dev/sda2 rw\n3 1 8:3 / /media/me/A rw - vfat "
       "/dev/sdb1 rw\n"
@@ -111,7 +111,7 @@ TEST(Volumes, ThoseOfTheUser) {
   EXPECT_EQ(UserVolumesAmong(mounts), (std::vector<std::string>{"/media/me/A", "/mnt/d e"}));
 }
 
-TEST(Volumes, TheSystemsOwnAnswer) {
+TEST(Volumes, SystemVolume) {
   const TemporaryFolder folder;
   WriteText(folder.Path("file"), "");
   const Volume volume = VolumeOf(folder.Path("file"));

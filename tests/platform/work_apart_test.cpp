@@ -25,7 +25,7 @@ std::span<const uint8_t> Bytes(std::string_view text) {
 // Whether this process has children, running or not yet reaped.
 bool HasChildren() { return waitpid(-1, nullptr, WNOHANG) >= 0 || errno != ECHILD; }
 
-TEST(WorkApart, GivesBackWhatItSharesAndStaysForTheNext) {
+TEST(WorkApart, ReturnsItsReplyAndStaysForTheNextTask) {
   std::vector<int32_t> processes;
   for (const char* text : {"a first input", "another one"}) {
     SharedBlock block;
@@ -45,7 +45,7 @@ TEST(WorkApart, GivesBackWhatItSharesAndStaysForTheNext) {
   EXPECT_FALSE(HasChildren());
 }
 
-TEST(WorkApart, SaysHowItEnded) {
+TEST(WorkApart, ReportsItsResult) {
   const test::TemporaryFolder folder;
   const std::string path = folder.Path("made");
   const struct {
@@ -75,7 +75,7 @@ TEST(WorkApart, SaysHowItEnded) {
   EXPECT_FALSE(HasChildren());
 }
 
-TEST(WorkApart, EndsWhenNobodyWantsItAnyMore) {
+TEST(WorkApart, EndsWhenCanceled) {
   SharedBlock block;
   ASSERT_TRUE(block.Allocate(10));
   const double begun = MonotonicSeconds();
@@ -87,7 +87,7 @@ TEST(WorkApart, EndsWhenNobodyWantsItAnyMore) {
   EXPECT_FALSE(HasChildren());
 }
 
-TEST(WorkApart, ALackOfMemoryOrProcessesIsNotStarted) {
+TEST(WorkApart, FailsToStartWithoutResources) {
   SharedBlock block;
   ASSERT_TRUE(block.Allocate(10));
   const int64_t faults = test::ForEachFault([&] {

@@ -52,7 +52,7 @@ TEST_F(Plugins, ModulesAreRegisteredOrSkipped) {
   EXPECT_EQ(ScanPlugins(OddFolder("FORTY_FORMATS")), kFormatsPerModule);
 }
 
-TEST_F(Plugins, TextsWithoutEndAreCut) {
+TEST_F(Plugins, UnterminatedTextsAreCut) {
   ASSERT_EQ(ScanPlugins(OddFolder("UNTERMINATED_TEXTS")), 1);
   std::string a, b;
   ASSERT_TRUE(PluginTextA(0, a));
@@ -81,7 +81,7 @@ TEST_F(Plugins, OnlyModulesByNameAreLoaded) {
   EXPECT_FALSE(PluginCanHandle("x.xyz"));
 }
 
-TEST_F(Plugins, AModuleThatIsOffIsPassedOver) {
+TEST_F(Plugins, DisabledModulesAreSkipped) {
   SetDataFolder(folder_.Path("data"));
   (void)LoadConfiguration();
   const std::string module = OddFolder("GAPS_IN_LIST") + "/FMWPL_odd.so";
@@ -103,7 +103,7 @@ TEST_F(Plugins, AModuleThatIsOffIsPassedOver) {
   (void)LoadConfiguration();
 }
 
-TEST_F(Plugins, WhatAModuleReturnsIsChecked) {
+TEST_F(Plugins, ValidatesWhatModulesReturn) {
   struct Row {
     const char* module;
     Status status;
@@ -149,7 +149,7 @@ TEST_F(Plugins, AFailedWriteLeavesTheDestinationAlone) {
   }
 }
 
-TEST_F(Plugins, AWriterGetsTheDestinationsName) {
+TEST_F(Plugins, WritersGetTheDestinationsName) {
   test::TemporaryFolder temporary;
   const char* const before = std::getenv("TMPDIR");
   const std::string kept = before == nullptr ? "/tmp" : before;
@@ -179,7 +179,7 @@ TEST_F(Plugins, ErrorNumbersAreNamed) {
   EXPECT_EQ(StatusText(Status::DamagedFile), "Damaged file.");
 }
 
-TEST_F(Plugins, FlagsOfTheProgramStayTheProgramsOwn) {
+TEST_F(Plugins, ModulesCannotSetTheProgramsFlags) {
   EnablePlugins(OddFolder("ALL_FLAGS"));
   ASSERT_EQ(FindFormatByName("x.odd"), kSpareRow);
   const FormatEntry& row = FormatRow(kSpareRow);
@@ -188,7 +188,7 @@ TEST_F(Plugins, FlagsOfTheProgramStayTheProgramsOwn) {
   EXPECT_EQ(PluginRow(0).flags2, 0xffffffffu);
 }
 
-TEST_F(Plugins, CommentsComeWithTheFacts) {
+TEST_F(Plugins, InfoIncludesComments) {
   EnablePlugins(OddFolder("COMMENTS"));
   const std::string file = folder_.Path("x.odd");
   test::WriteText(file, "");
@@ -217,7 +217,7 @@ TEST_F(Plugins, AnExtensionOfTwoModulesIsListedOnce) {
   EXPECT_EQ(PluginFormatCount(), 4);
 }
 
-TEST_F(Plugins, AModuleThatIsCutOffIsSkipped) {
+TEST_F(Plugins, TruncatedModulesAreSkipped) {
   const std::string whole = OddFolder("GAPS_IN_LIST") + "/FMWPL_odd.so";
   const auto size = std::filesystem::file_size(whole);
   const std::string copy = folder_.Path("FMWPL_odd.so");
@@ -229,7 +229,7 @@ TEST_F(Plugins, AModuleThatIsCutOffIsSkipped) {
   }
 }
 
-TEST_F(Plugins, OlderModulesFillLess) {
+TEST_F(Plugins, OlderModulesSetFewerFields) {
   EnablePlugins(OddFolder("OLDER"));
   test::WriteText(folder_.Path("x.odd"), "");
   PicturePointer picture;
@@ -239,7 +239,7 @@ TEST_F(Plugins, OlderModulesFillLess) {
   EXPECT_EQ(picture->width, 2);
 }
 
-TEST_F(Plugins, ProgressIsThatOfTheOuterCallAgainAfterAnInnerOne) {
+TEST_F(Plugins, ProgressReturnsToTheOuterCall) {
   class Sink : public ProgressSink {
    public:
     void Step(int32_t done, int32_t total) override { steps.push_back({done, total}); }
@@ -263,7 +263,7 @@ TEST_F(Plugins, AModuleWithoutWriterIsReadOnly) {
   for (const std::string& extension : DestinationExtensions()) EXPECT_NE(extension, "def");
 }
 
-TEST_F(Plugins, SampleModuleReadsEveryKind) {
+TEST_F(Plugins, SampleModuleReadsEveryVariant) {
   EnablePlugins(SAMPLE_MODULES);
   struct Row {
     const char* name;
@@ -309,7 +309,7 @@ TEST_F(Plugins, OnePluginFormatConvertsToAnother) {
   EXPECT_EQ(test::ReadText(folder_.Path("c.ppm")), "P6\n2 1\n255\n\x01\x02\x03\xff\xfe\xfd");
 }
 
-TEST_F(Plugins, FilesWhoseNamesLieAreOpenedByTheirContents) {
+TEST_F(Plugins, WrongExtensionsAreOpenedByContents) {
   EnablePlugins(SAMPLE_MODULES);
   const char* const contents = "P6\n2 1\n255\n\x01\x02\x03\xff\xfe\xfd";
   for (const char* const name : {"a.bmp", "a.pgmx", "a"}) {
@@ -327,7 +327,7 @@ TEST_F(Plugins, FilesWhoseNamesLieAreOpenedByTheirContents) {
   EXPECT_FALSE(OpenedByContents(*picture));
 }
 
-TEST_F(Plugins, ListsShowPluginFormatsBehindTheRows) {
+TEST_F(Plugins, ListsShowPluginFormatsLast) {
   EnablePlugins(SAMPLE_MODULES);
   const auto filter = OpenFileFilter();
   EXPECT_EQ(filter.back().description, "(PPM) Plugin Portable anymap");

@@ -58,7 +58,7 @@ std::array<double, 3> WideInSrgb(uint32_t color) {
           Encoded(0.0556434 * x - 0.2040259 * y + 1.0572252 * z)};
 }
 
-TEST(ColorTransform, CanBeStopped) {
+TEST(ColorTransform, CanBeCanceled) {
   const StopSource stop;
   const auto picture = test::MakePicture(
       900, 900, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
@@ -69,7 +69,7 @@ TEST(ColorTransform, CanBeStopped) {
   EXPECT_EQ(test::Colors(*picture), before);
 }
 
-TEST(ColorTransform, BringsWideColorsToTheScreen) {
+TEST(ColorTransform, ConvertsWideGamutColors) {
   const ColorTransform transform(WideProfile());
   ASSERT_TRUE(transform.ChangesColors());
   const auto picture = test::MakePicture(

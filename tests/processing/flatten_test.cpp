@@ -21,7 +21,7 @@ TEST(Flatten, BlendIsTheRoundedQuotientForEveryInput) {
   EXPECT_EQ(wrong, 0);
 }
 
-TEST(Flatten, EveryPixelOfEveryWidthMeetsItsOwnAlpha) {
+TEST(Flatten, UsesEachPixelsAlphaAtEveryWidth) {
   for (int32_t width = 1; width < 200; width += width < 70 ? 1 : 43) {
     for (const bool own : {false, true}) {
       const PicturePointer picture = test::MakePicture(

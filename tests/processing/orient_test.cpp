@@ -11,7 +11,7 @@ namespace {
 using test::Colors;
 using test::MakePicture;
 
-TEST(Orient, TheLetterFStandsUpright) {
+TEST(Orient, TheLetterFIsUpright) {
   // An F of 2 x 3 pixels, numbered 1 to 6 row by row, as each orientation stores it.
   struct Row {
     int32_t orientation;
@@ -37,7 +37,7 @@ TEST(Orient, TheLetterFStandsUpright) {
   }
 }
 
-TEST(Orient, TwoTurnsAreOne) {
+TEST(Orient, ComposesTwoRotations) {
   for (int32_t pair = 0; pair < 64; ++pair) {
     const auto first = static_cast<Orientation>(1 + pair / 8),
                then = static_cast<Orientation>(1 + pair % 8);

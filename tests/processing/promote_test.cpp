@@ -17,7 +17,7 @@ PicturePointer PictureOfColors(uint32_t count) {
   });
 }
 
-TEST(Promote, FewColorsArePackedExactlyAndComeBack) {
+TEST(Promote, FewColorsRoundTripExactly) {
   struct Row {
     const char* name;
     uint32_t colors;

@@ -23,7 +23,7 @@ PicturePointer Sweep(int32_t width, int32_t height) {
   });
 }
 
-TEST(Reduce, DepthFollowsTheAim) {
+TEST(Reduce, DepthFollowsTheMaximum) {
   struct Row {
     int32_t aim, bits;
   };
@@ -64,7 +64,7 @@ TEST(Reduce, FewColorsAreKeptExactly) {
 }
 
 // Dithering must preserve the mean of any area, at every gray level and in both scan directions.
-TEST(Reduce, DitheredGraysKeepTheirMean) {
+TEST(Reduce, DitheredGraysPreserveTheMean) {
   for (const Dither dither : {Dither::Ordered, Dither::FloydSteinberg}) {
     for (const bool serpentine : {false, true}) {
       for (int32_t level = 0; level <= 255; level += 5) {
@@ -85,7 +85,7 @@ TEST(Reduce, DitheredGraysKeepTheirMean) {
   }
 }
 
-TEST(Reduce, ThresholdPartsDarkFromBright) {
+TEST(Reduce, ThresholdSeparatesDarkAndBright) {
   const auto makeSteps = [] {
     return MakePicture(4, 1, [](int32_t x, int32_t) { return Gray(40 + 20 * x * x); });
   };  // 40 60 120 220
@@ -111,7 +111,7 @@ TEST(Reduce, ThresholdPartsDarkFromBright) {
   }
 }
 
-TEST(Reduce, AlphaGoesToTheBackgroundFirst) {
+TEST(Reduce, FlattensAlphaFirst) {
   const PicturePointer picture =
       MakePicture(20, 20, [](int32_t x, int32_t y) { return test::Scatter(x, y) & 0xffffff; });
   test::AddAlpha(*picture, [](int32_t, int32_t) { return 0; });
@@ -134,7 +134,7 @@ double Likeness(const std::vector<uint32_t>& a, const std::vector<uint32_t>& b) 
 
 // Slightly below the values measured when they were set: the palette quality must
 // not silently degrade.
-TEST(Reduce, PalettesStayTrueToThePicture) {
+TEST(Reduce, PaletteQualityDoesNotDegrade) {
   const auto waves = [](int32_t x, int32_t y) {
     const auto level = [](double t) { return static_cast<uint32_t>(127.5 + 120 * std::sin(t)); };
     return level(x / 40.0) << 16 | level(y / 30.0 + 1) << 8 | level((x + y) / 70.0);
@@ -205,7 +205,7 @@ TEST(Reduce, NearestColorIsNearest) {
   }
 }
 
-TEST(Reduce, GraysAreEvenAndOnlyGrays) {
+TEST(Reduce, GraysAreEvenlySpaced) {
   for (const int32_t levels : {0, 2, 5}) {
     SCOPED_TRACE(levels);
     const PicturePointer picture = Sweep(90, 70);
@@ -245,7 +245,7 @@ TEST(Reduce, AdjustmentsMoveTheMean) {
   }
 }
 
-TEST(Reduce, NoMemoryLeavesThePictureWhole) {
+TEST(Reduce, LackOfMemoryLeavesThePictureValid) {
   for (const int32_t bits : {1, 4, 8}) {
     SCOPED_TRACE(bits);
     const PicturePointer picture = Sweep(40, 30);

@@ -50,7 +50,7 @@ TEST(Scale, Sizes) {
   }
 }
 
-TEST(Scale, KeysSelectTheFilterThatTheirListNames) {
+TEST(Scale, KeysSelectTheListedFilter) {
   constexpr std::pair<const char*, ScaleFilter> names[] = {{"Lanczos", ScaleFilter::Lanczos},
                                                            {"Bicubic", ScaleFilter::Bicubic},
                                                            {"Bilinear", ScaleFilter::Bilinear},
@@ -129,7 +129,7 @@ struct Reference {
   }
 };
 
-TEST(Scale, FollowsTheFiltersDefinition) {
+TEST(Scale, MatchesTheFiltersDefinition) {
   struct Row {
     const char* name;
     Size source, size;
@@ -179,7 +179,7 @@ TEST(Scale, FollowsTheFiltersDefinition) {
 constexpr Size kOddSizes[] = {{1, 1},   {1, 7},   {9, 1},   {2, 300},
                               {300, 2}, {21, 22}, {64, 64}, {3, 1000}};
 
-TEST(Scale, OneColorStaysThatColorAtEverySize) {
+TEST(Scale, SingleColorsAreExactAtEverySize) {
   for (const uint32_t color : {0x000000u, 0xffffffu, 0x01fe80u}) {
     for (const bool alpha : {false, true}) {
       for (const Size from : kOddSizes) {
@@ -237,7 +237,7 @@ TEST(Scale, MirrorsStayMirrors) {
 }
 
 // A slope must be preserved: a shift by half a pixel would be a constant difference.
-TEST(Scale, NothingMovesAside) {
+TEST(Scale, KeepsPositions) {
   for (const int32_t width : {32, 100, 255, 700}) {
     for (const ScaleFilter filter : kFilters) {
       SCOPED_TRACE(testing::Message() << "to " << width << ", filter " << static_cast<int32_t>(filter));
@@ -283,7 +283,7 @@ TEST(Scale, TransparentColorsLeaveNoFringe) {
 }
 
 // Block averaging must not be visible: over 45 dB compared with the full filter.
-TEST(Scale, GreatReductionsStayTrueToTheFilter) {
+TEST(Scale, LargeReductionsStayCloseToTheFilter) {
   const auto smooth = [](int32_t x, int32_t y) {
     const auto wave = [](double t) { return static_cast<uint32_t>(127.5 + 127 * std::sin(t)); };
     return wave(x / 31.0 + y / 57.0) | wave(y / 23.0) << 8 | (Scatter(x / 9, y / 9) & 0xff0000);
@@ -344,7 +344,7 @@ TEST(Scale, ThreadsAndPointsAndPalettes) {
   }
 }
 
-TEST(Scale, EveryProcessorsLoopsGiveTheSame) {
+TEST(Scale, IsTheSameOnEveryProcessor) {
   const ResampleKernels& here = ResampleKernelsHere();
   const ResampleKernels& baseline = BaselineResampleKernels();
   std::mt19937 random(7);
@@ -383,7 +383,7 @@ TEST(Scale, EveryProcessorsLoopsGiveTheSame) {
   }
 }
 
-TEST(Scale, NoMemoryLeavesThePictureWhole) {
+TEST(Scale, LackOfMemoryLeavesThePictureValid) {
   for (const bool alpha : {false, true}) {
     for (const ScaleFilter filter : kFilters) {
       SCOPED_TRACE(testing::Message() << "filter " << static_cast<int32_t>(filter) << ", alpha " << alpha);

@@ -66,7 +66,7 @@ std::vector<uint32_t> Expected(const Filter& filter, const PictureRecord& pictur
   return colors;
 }
 
-TEST(WindowFilters, AreWhatTheyAreCalled) {
+TEST(WindowFilters, MatchTheirDefinition) {
   struct Row {
     int32_t width, height, radius;
   };
@@ -90,7 +90,7 @@ TEST(WindowFilters, AreWhatTheyAreCalled) {
 }
 
 // The colors of transparent pixels must not bleed.
-TEST(WindowFilters, ColorsCountByTheirAlpha) {
+TEST(WindowFilters, WeightColorsByAlpha) {
   for (const Filter& filter : kFilters) {
     SCOPED_TRACE(filter.name);
     const auto isSeen = [](int32_t x) { return x < 10; };
@@ -130,7 +130,7 @@ TEST(WindowFilters, MediansAreTheSameOnEveryProcessor) {
   }
 }
 
-TEST(WindowFilters, StopWhenAsked) {
+TEST(WindowFilters, CanBeCanceled) {
   for (const Filter& filter : kFilters) {
     const PicturePointer picture = MakePicture(50, 1600, Scatter);
     const std::vector<uint32_t> before = Colors(*picture);

@@ -16,7 +16,7 @@ const Library* Find(const std::vector<Library>& libraries, const std::string& na
 }
 
 // A linked library missing in the table is listed last, without a license.
-TEST(About, EveryLibraryOfTheBuildHasItsLicense) {
+TEST(About, EveryLinkedLibraryHasALicense) {
   std::set<std::string> names;
   for (const Library& library : LibrariesOf({})) {
     SCOPED_TRACE(library.name);
@@ -31,7 +31,7 @@ TEST(About, EveryLibraryOfTheBuildHasItsLicense) {
     EXPECT_EQ(names.count(name), 1u) << name;
 }
 
-TEST(About, OwnLibrariesAreThoseOfTheFrontEnd) {
+TEST(About, IncludesLibrariesOfTheFrontEnd) {
   EXPECT_EQ(Find(LibrariesOf({}), "wxWidgets"), nullptr);
   const OwnLibrary own[] = {{"wxWidgets", "3.2.9", Linking::Shared},
                             {"libstdc++", "12.2.0", Linking::Inside}};

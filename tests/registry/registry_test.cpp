@@ -66,7 +66,7 @@ TEST(FindFormat, FirstRowThatMatchesWins) {
   }
 }
 
-TEST(FindFormat, PlugInsAreAskedLastAndListedLast) {
+TEST(FindFormat, PlugInsAreSearchedAndListedLast) {
   const size_t filter = OpenFileFilter().size(), destinations = DestinationExtensions().size();
   constexpr PluginSource kSource{[](std::string_view name, int32_t parameter) {
                                    return name == "x.heic" && parameter == 5 ? kSpareRow
@@ -89,7 +89,7 @@ TEST(FindFormat, PlugInsAreAskedLastAndListedLast) {
   EXPECT_EQ(OpenFileFilter().size(), filter);
 }
 
-TEST(FormatLists, LeaveOutWhatTheirFlagsSay) {
+TEST(FormatLists, FollowTheFlags) {
   const std::vector<int32_t> destinations = DestinationRows();
   EXPECT_EQ(destinations.size(), 35u);
   const std::vector<FilterPair> filter = OpenFileFilter();
@@ -121,7 +121,7 @@ TEST(FormatLists, LeaveOutWhatTheirFlagsSay) {
   EXPECT_EQ(FormatListLine(7), " \t(EXE) Self-displaying image");
 }
 
-TEST(DescribeFileType, WholeExtensionsOfRowsThatAreOn) {
+TEST(DescribeFileType, MatchesWholeExtensionsOfEnabledRows) {
   EXPECT_EQ(DescribeFileType("a.bmp"), "(BMP) Windows bitmap");
   EXPECT_EQ(DescribeFileType("a.jpeg"), "(JPEG) Jpeg");
   EXPECT_EQ(DescribeFileType("a.jpe"), "(JPE) JPE file");  // its row is off
@@ -132,7 +132,7 @@ TEST(DescribeFileType, WholeExtensionsOfRowsThatAreOn) {
   EXPECT_EQ(DescribeFileType("x"), "()  file");
 }
 
-TEST(WritePicture, RefusesInOrder) {
+TEST(WritePicture, RejectsInOrder) {
   const TemporaryFolder folder;
   const struct {
     const char* name;
@@ -155,7 +155,7 @@ TEST(WritePicture, RefusesInOrder) {
   EXPECT_THAT(folder.Names(), ElementsAre("x.pcx"));
 }
 
-TEST(WritePicture, KeepsTheSourceNameAndFlattensWhereAlphaCannotGo) {
+TEST(WritePicture, KeepsTheSourceNameAndFlattensUnsupportedAlpha) {
   const TemporaryFolder folder;
   // Blue, green, red of 100, 150, 200 at alpha 0, 1, 128 and 255, on a background of red 10, green
   // 20, blue 30.
@@ -211,7 +211,7 @@ TEST(LoadPicture, NoRecordWithoutAPicture) {
 }
 
 // A picture of 3 x 2 pixels with the extension of another format.
-TEST(LoadPicture, OpensByContentsWhatTheNameHides) {
+TEST(LoadPicture, OpensWrongExtensionsByContents) {
   const TemporaryFolder folder;
   const auto write = [&](const char* extension, const std::string& name) {
     const PicturePointer picture = MakePicture(3, 2, 8);
@@ -255,7 +255,7 @@ TEST(LoadPicture, OpensByContentsWhatTheNameHides) {
   }
 }
 
-TEST(LoadPicture, ContentsThatFitNothingLeaveTheStatusOfTheName) {
+TEST(LoadPicture, UnknownContentsKeepTheStatusOfTheName) {
   const TemporaryFolder folder;
   WriteText(folder.Path("cut.png"), "\xff\xd8\xff");
   WriteText(folder.Path("photo.pcx"), std::string("\0\0\0\x1c", 4) + "ftypavif....");
@@ -267,7 +267,7 @@ TEST(LoadPicture, ContentsThatFitNothingLeaveTheStatusOfTheName) {
 }
 
 // Assumptions about rows made by loops and codecs.
-TEST(Registry, RowsKeepTheirPromises) {
+TEST(Registry, RowsAreConsistent) {
   for (int32_t i = 0; i < formatCount; ++i) {
     const FormatEntry& row = FormatRow(i);
     SCOPED_TRACE(i);
@@ -282,7 +282,7 @@ TEST(Registry, RowsKeepTheirPromises) {
   }
 }
 
-TEST(Registry, HoldsEveryRowOfTheFamilies) {
+TEST(Registry, HasEveryRowOfTheFamilies) {
   std::set<std::string_view> seen;
   for (const std::span<const FormatEntry> family : FormatFamilies()) {
     EXPECT_FALSE(family.empty());

@@ -14,7 +14,7 @@ std::vector<uint8_t> Behind(size_t zeros, const std::vector<uint8_t>& bytes) {
   return all;
 }
 
-TEST(Signature, KnowsFilesWhateverTheirName) {
+TEST(Signature, IdentifiesFilesByContents) {
   const struct {
     std::vector<uint8_t> head;
     const char* name;
@@ -44,7 +44,7 @@ TEST(Signature, KnowsFilesWhateverTheirName) {
   }
 }
 
-TEST(Signature, TellsTheRowsThatMeanSuchFiles) {
+TEST(Signature, NamesTheMatchingRows) {
   const struct {
     std::vector<uint8_t> head;
     std::vector<std::string_view> extensions;

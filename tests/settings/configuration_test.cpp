@@ -38,7 +38,7 @@ class ConfigurationTest : public testing::Test {
   TemporaryFolder folder_;
 };
 
-TEST_F(ConfigurationTest, TakesWhatTheFileHolds) {
+TEST_F(ConfigurationTest, LoadsTheFile) {
   const std::string forty(40, 'x'), long260(260, 'p'), long261(261, 'p');
   struct Row {
     const char* name;
@@ -103,7 +103,7 @@ TEST_F(ConfigurationTest, TakesWhatTheFileHolds) {
   }
 }
 
-TEST_F(ConfigurationTest, StandsOnItsDefaultsWithoutAUsableFile) {
+TEST_F(ConfigurationTest, UsesDefaultsWithoutAUsableFile) {
   limits.listFileBytes = 1000;
   const std::string tooLong(1001, '\n');
   struct Row {
@@ -139,7 +139,7 @@ TEST_F(ConfigurationTest, StandsOnItsDefaultsWithoutAUsableFile) {
   EXPECT_EQ(SaveConfiguration(), SaveResult::Unreadable);
 }
 
-TEST_F(ConfigurationTest, SaveKeepsWhatItDoesNotKnow) {
+TEST_F(ConfigurationTest, SaveKeepsUnknownContents) {
   Write(
       "; by "
       "hand\r\n[Other]\r\nJpegCompression=1\r\n[Fotomill]\r\nFutureKey=5\r\nJpegCompression="
@@ -163,7 +163,7 @@ TEST_F(ConfigurationTest, SaveKeepsWhatItDoesNotKnow) {
   EXPECT_EQ(Read(), saved);
 }
 
-TEST_F(ConfigurationTest, EveryKeyComesBackAsItWasSaved) {
+TEST_F(ConfigurationTest, EveryKeyRoundTrips) {
   ASSERT_EQ(LoadConfiguration(), ConfigurationState::Missing);
   const auto give = [](const KeyRow& row) -> std::string {
     if ((row.type & KEY_TEXT) != 0)
@@ -200,7 +200,7 @@ TEST_F(ConfigurationTest, EveryKeyComesBackAsItWasSaved) {
   }
 }
 
-TEST_F(ConfigurationTest, ValuesForOneRunAreNotWritten) {
+TEST_F(ConfigurationTest, ValuesForThisRunAreNotSaved) {
   Write("[Fotomill]\nJpegCompression=80\n");
   LoadConfiguration();
   struct Row {
@@ -252,7 +252,7 @@ TEST_F(ConfigurationTest, ValuesForOneRunAreNotWritten) {
   EXPECT_EQ(Read(), "[Fotomill]\nUndoLevels=3\nAlphaBackground=5\n");
 }
 
-TEST_F(ConfigurationTest, MergesWithWhatOthersWroteMeanwhile) {
+TEST_F(ConfigurationTest, MergesConcurrentChanges) {
   Write("[Fotomill]\nJpegCompression=80\nUndoLevels=5\n");
   LoadConfiguration();
   const int status = test::InChild([] {
@@ -295,7 +295,7 @@ TEST_F(ConfigurationTest, NoFaultHarmsTheFile) {
   EXPECT_EQ(platform::ListFolder(DataFolder())->size(), 1u) << "no lock and no temporary file is left";
 }
 
-TEST_F(ConfigurationTest, EarlyKeysComeStraightFromTheFile) {
+TEST_F(ConfigurationTest, ReadsEarlyKeysDirectlyFromTheFile) {
   Write(
       "[Fotomill]\nLogoDelay=1\nShowStartupWindow=1\nSmallTextFontSize=x\nNormalThumbFontSize="
       "99\n");
@@ -308,13 +308,13 @@ TEST_F(ConfigurationTest, EarlyKeysComeStraightFromTheFile) {
   EXPECT_EQ(settings.LogoDelay, 6000) << "the settings wait for the load";
 }
 
-TEST_F(ConfigurationTest, BlockIsTheFileBehindItsHeader) {
+TEST_F(ConfigurationTest, BlockIsTheFileAfterItsHeader) {
   EXPECT_EQ(LoadConfigurationBlock(), std::nullopt);
   Write("[Fotomill]\nA=\xFF\0\n"s);
   EXPECT_EQ(LoadConfigurationBlock(), ";\r\n;\r\n;------ INI FILE ------\r\n;\r\n;\r\n[Fotomill]\nA=\xFF\0\n"s);
 }
 
-TEST(DataFolderTest, IsTheFirstOfOptionVariableAndSystem) {
+TEST(DataFolderTest, PrefersOptionThenVariableThenSystem) {
   const test::ScopedEnvironment config("XDG_CONFIG_HOME", "/x/config");
   {
     const test::ScopedEnvironment variable("FOTOMILL_DATA", "/x/variable");

@@ -10,7 +10,7 @@
 namespace fotomill {
 namespace {
 
-TEST(FormatSwitches, LastUntilTheyAreTheDefaultAgain) {
+TEST(FormatSwitches, AreStoredUnlessDefault) {
   const test::ScopedSettings settingsBefore;
   const test::TemporaryFolder folder;
   SetDataFolder(folder.Path());

@@ -20,7 +20,7 @@ TEST(JobOptions, DefaultsAreThoseOfTheSettings) {
 }
 
 // Every format key in Setup must reach its codec or the batch.
-TEST(JobOptions, HoldEveryKeyOfTheFormats) {
+TEST(JobOptions, CoverEveryFormatKey) {
   for (const FormatSettings* const codec : SettingsOfFormats()) {
     for (const FormatSetting& setting : codec->keys) {
       if (*setting.label == '\0') continue;

@@ -32,7 +32,7 @@ void AddKeysOf(const std::string& text, std::set<std::string>& used) {
   }
 }
 
-TEST(KeyHelp, ExplainsTheKeysThatAreUsedAndNoOthers) {
+TEST(KeyHelp, ExplainsExactlyTheUsedKeys) {
   std::set<std::string> used;
   for (const auto& entry : std::filesystem::recursive_directory_iterator(test::SourcePath("src"))) {
     const std::string extension = entry.path().extension().string();

@@ -12,7 +12,7 @@ namespace fotomill {
 namespace {
 
 // Each key is found by its name and its control only, and its default is valid.
-TEST(KeyTable, RowsAreSound) {
+TEST(KeyTable, RowsAreValid) {
   for (const KeyRow& row : Keys()) {
     SCOPED_TRACE(row.name);
     EXPECT_EQ(FindKey(row.name), &row);
@@ -43,7 +43,7 @@ TEST(KeyTable, StoredTextsStayWithinTheirLimit) {
   EXPECT_EQ(settings.PrefixCrop.view(), "Cropped_ ");
 }
 
-TEST(KeyTable, NearestKeyIsAlwaysNamed) {
+TEST(KeyTable, AlwaysFindsANearestKey) {
   const std::pair<const char*, const char*> rows[] = {
       {"FindSimilarDistance", "FindSimlarDistance"}, {"jpegcompression", "JpegCompression"},
       {"PngCompresion", "PngCompression"},           {"", "AllowDestinationOverrides"},
@@ -52,7 +52,7 @@ TEST(KeyTable, NearestKeyIsAlwaysNamed) {
   for (const auto& [typed, nearest] : rows) EXPECT_EQ(NearestKey(typed), nearest) << typed;
 }
 
-TEST(PlainName, LeadsNowhere) {
+TEST(PlainName, RejectsPaths) {
   for (const char* name : {"", "Cropped_ ", ".hidden", "a.b", "\xC3\xA4\xFF", "a b [1]"})
     EXPECT_TRUE(IsPlainName(name)) << name;
   using namespace std::string_view_literals;

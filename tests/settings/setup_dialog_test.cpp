@@ -110,7 +110,7 @@ TEST_F(SetupDialogTest, ShowsEachKindAsItsControlDoes) {
   }
 }
 
-TEST_F(SetupDialogTest, TakesUpWhatWasChanged) {
+TEST_F(SetupDialogTest, StoresChangedValues) {
   FakeDialog& dialog =
       Filled({WriteOS2Bitmaps, FileTipDelay, PrefixCrop, FXBrightness, JpegCompression,
               AlphaBackground, TiffOptions, DefaultViewZoom, JpegProcessor, DefaultFileExtension});
@@ -142,7 +142,7 @@ TEST_F(SetupDialogTest, TakesUpWhatWasChanged) {
   EXPECT_EQ(settings.FileTipDelay, 500) << "on again is the default number";
 }
 
-TEST_F(SetupDialogTest, WhatIsChosenIsSavedWhateverTheCommandLineSaid) {
+TEST_F(SetupDialogTest, ChosenValuesOverrideTheCommandLine) {
   const test::TemporaryFolder folder;
   SetDataFolder(folder.Path());
   LoadConfiguration();
@@ -158,7 +158,7 @@ TEST_F(SetupDialogTest, WhatIsChosenIsSavedWhateverTheCommandLineSaid) {
   SetDataFolder({});
 }
 
-TEST_F(SetupDialogTest, RefusesAllWhenOneIsWrong) {
+TEST_F(SetupDialogTest, RejectsAllIfOneIsInvalid) {
   struct Row {
     KeyNumber key;
     const char* text;
@@ -184,7 +184,7 @@ TEST_F(SetupDialogTest, RefusesAllWhenOneIsWrong) {
   }
 }
 
-TEST_F(SetupDialogTest, RangeIsWhatTheDialogSays) {
+TEST_F(SetupDialogTest, RangeComesFromTheDialog) {
   const uint32_t range = KeyOf(JpegCompression).control + 10000;
   dialog_.At(range).text = "10,50,5";
   FakeDialog& dialog = Filled({JpegCompression});
@@ -199,7 +199,7 @@ TEST_F(SetupDialogTest, RangeIsWhatTheDialogSays) {
   EXPECT_EQ(settings.JpegCompression, 60);
 }
 
-TEST_F(SetupDialogTest, TextThatTheDialogFillsIsOnlyRead) {
+TEST_F(SetupDialogTest, FilledTextsAreOnlyRead) {
   KeyRow rows[] = {KeyOf(AnnotateText)};
   rows[0].type |= KEY_FILLED_TEXT;
   dialog_.Add(AnnotateText);
@@ -210,7 +210,7 @@ TEST_F(SetupDialogTest, TextThatTheDialogFillsIsOnlyRead) {
   EXPECT_EQ(settings.AnnotateText.view(), "its own");
 }
 
-TEST_F(SetupDialogTest, MarkTellsThatWindowsHaveToFollow) {
+TEST_F(SetupDialogTest, ChangesSetTheSetupMark) {
   FakeDialog& dialog = Filled({WatchFolders, WriteOS2Bitmaps});
   dialog.At(WriteOS2Bitmaps).checked = true;
   EXPECT_FALSE(Read());
@@ -225,7 +225,7 @@ TEST_F(SetupDialogTest, MarkTellsThatWindowsHaveToFollow) {
   EXPECT_TRUE(TakeSetupChanged());
 }
 
-TEST_F(SetupDialogTest, MarksWhatIsNotTheDefaultAndPutsTheDefaultBack) {
+TEST_F(SetupDialogTest, MarksAndResetsChangedValues) {
   const KeyNumber keys[] = {WriteOS2Bitmaps, FileTipDelay,  PrefixCrop,          JpegCompression,
                             AlphaBackground, JpegProcessor, DefaultFileExtension};
   settings.WriteOS2Bitmaps = settings.JpegProcessor = settings.AlphaBackground =

@@ -14,7 +14,7 @@
 namespace fotomill {
 namespace {
 
-TEST(Texts, ArgumentsTakeTheirPlaces) {
+TEST(Texts, ReplacesArguments) {
   EXPECT_EQ(Tr("%2 of %1", 7, "three"), "three of 7");
   EXPECT_EQ(Tr("%1%1", std::string("ab")), "abab");
   EXPECT_EQ(Tr("100% of %1, 5%", "all"), "100% of all, 5%");
@@ -22,7 +22,7 @@ TEST(Texts, ArgumentsTakeTheirPlaces) {
   EXPECT_EQ(Tr("%1", "%1 is not read again"), "%1 is not read again");
 }
 
-TEST(Texts, CountsChooseTheForm) {
+TEST(Texts, ChoosesThePluralForm) {
   EXPECT_EQ(TrCount("one file", "%1 files", 1), "one file");
   EXPECT_EQ(TrCount("one file", "%1 files", 0), "0 files");
   EXPECT_EQ(TrCount("%1 file in %2", "%1 files in %2", 12345, "x"), "12345 files in x");
