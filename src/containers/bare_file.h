@@ -4,6 +4,7 @@
 #include <span>
 #include <vector>
 
+#include "containers/file_pieces.h"
 #include "core/status.h"
 
 namespace fotomill {
@@ -14,13 +15,33 @@ namespace fotomill {
 // file. DamagedFile (2) or FileReadError (3) if the file's structure is invalid; nothing is
 // decoded, so damaged pixels go unnoticed.
 
+// What is kept, and what is put in.
+struct BareOptions {
+  bool profile = true;      // the color profile
+  bool orientation = true;  // of directories, where it is part of the picture's own
+  bool texts = false;       // JPEG comments, PNG texts except XMP
+  bool iptc = false;        // in JPEG and TIFF
+  bool xmp = false;         // of directories; other files get it anew
+  // JPEG: new blocks, from the byte order on; empty: none
+  std::span<const uint8_t> newExif = {}, newXmp = {};
+};
+
 // Also removes everything after the end of the picture: further pictures, movies.
 Status MakeBareJpeg(std::span<const uint8_t> file, std::vector<uint8_t>& bare);
 Status MakeBarePng(std::span<const uint8_t> file, std::vector<uint8_t>& bare);
 Status MakeBareWebp(std::span<const uint8_t> file, std::vector<uint8_t>& bare);
 // Directories and values keep their offsets, and removed ones are overwritten with zeros; the file
 // is truncated after the last byte in use. The orientation is kept, as it is part of the picture's
-// own directory.
+// own directory. Also for HD Photo.
 Status MakeBareTiff(std::span<const uint8_t> file, std::vector<uint8_t>& bare);
+
+// The same as the options say; a JPEG file as parts of the old one, which must stay.
+Status MakeBareJpeg(std::span<const uint8_t> file, const BareOptions& options, FilePieces& bare);
+Status MakeBarePng(std::span<const uint8_t> file, const BareOptions& options,
+                   std::vector<uint8_t>& bare);
+Status MakeBareWebp(std::span<const uint8_t> file, const BareOptions& options,
+                    std::vector<uint8_t>& bare);
+Status MakeBareTiff(std::span<const uint8_t> file, const BareOptions& options,
+                    std::vector<uint8_t>& bare);
 
 }  // namespace fotomill

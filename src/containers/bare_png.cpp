@@ -3,6 +3,7 @@
 
 #include "containers/bare_file.h"
 #include "containers/png_chunks.h"
+#include "core/byte_reader.h"
 
 namespace fotomill {
 
@@ -13,16 +14,31 @@ constexpr std::string_view kPicture[] = {
     "IHDR", "PLTE", "IDAT", "IEND", "tRNS", "cHRM", "gAMA", "iCCP", "sBIT", "sRGB", "cICP", "mDCv",
     "mDCV", "cLLi", "cLLI", "bKGD", "hIST", "pHYs", "sPLT", "oFFs", "acTL", "fcTL", "fdAT"};
 
+constexpr std::string_view kTexts[] = {"tEXt", "zTXt", "iTXt"};
+constexpr std::string_view kXmp = "XML:com.adobe.xmp", kRawProfile = "Raw profile type ";
+
+bool Belongs(const PngPlace& chunk, std::span<const uint8_t> file, const BareOptions& options) {
+  if (chunk.type == "iCCP" && !options.profile) return false;
+  if (std::ranges::find(kPicture, chunk.type) != std::end(kPicture)) return true;
+  if (!options.texts || std::ranges::find(kTexts, chunk.type) == std::end(kTexts)) return false;
+  ByteReader text(file.subspan(chunk.data, chunk.size));
+  return !text.Match(kXmp) && !text.Match(kRawProfile);  // those are blocks in disguise
+}
+
 }  // namespace
 
 Status MakeBarePng(std::span<const uint8_t> file, std::vector<uint8_t>& bare) {
+  return MakeBarePng(file, {}, bare);
+}
+
+Status MakeBarePng(std::span<const uint8_t> file, const BareOptions& options,
+                   std::vector<uint8_t>& bare) {
   bare.assign(kPngSignature.begin(), kPngSignature.end());
   PngWalk walk(file);
   for (PngPlace chunk; walk.Next(chunk);) {
     if (chunk.End() > file.size()) return Status::FileReadError;
     const auto whole = file.subspan(chunk.data - 8, chunk.End() - chunk.data + 8);
-    const bool belongs = std::ranges::find(kPicture, chunk.type) != std::end(kPicture);
-    if (belongs) bare.insert(bare.end(), whole.begin(), whole.end());
+    if (Belongs(chunk, file, options)) bare.insert(bare.end(), whole.begin(), whole.end());
   }
   return walk.Outcome();
 }

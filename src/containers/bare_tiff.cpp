@@ -23,7 +23,11 @@ constexpr TagRange kPicture[] = {
     {290, 293},     {296, 297},     {301, 301},     {317, 332},     {334, 334},
     {336, 347},     {512, 521},     {529, 532},     {559, 559},     {32995, 32998},
     {34675, 34675}, {34908, 34910}, {37439, 37439}, {50674, 50674},
+    {0xBC01, 0xBCFF},  // those of HD Photo
 };
+constexpr uint32_t kOrientation = 274, kProfile = 34675, kXmp = 700, kIptc = 33723;
+constexpr uint32_t kHdpOrientation = 0xBC02, kHdpOffset = 0xBCC0, kHdpSize = 0xBCC1;
+constexpr uint32_t kHdpAlphaOffset = 0xBCC2, kHdpAlphaSize = 0xBCC3;
 constexpr uint32_t kStripOffsets = 273, kStripSizes = 279, kTileOffsets = 324, kTileSizes = 325;
 constexpr uint32_t kSubDirectories = 330, kJpegOffset = 513, kJpegSize = 514;
 // offsets of the tables of old-style JPEG: quantization, and two kinds of Huffman tables
@@ -34,7 +38,11 @@ constexpr uint8_t kTypeBytes[] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8, 4, 8, 4, 0, 0
 constexpr int32_t kDeepest = 4;            // nesting depth of directories
 constexpr uint64_t kMostPieces = 1 << 23;  // strips and tiles of all pages
 
-bool BelongsToPicture(uint32_t tag) {
+bool BelongsToPicture(uint32_t tag, const BareOptions& options) {
+  if (tag == kOrientation || tag == kHdpOrientation) return options.orientation;
+  if (tag == kProfile) return options.profile;
+  if (tag == kXmp) return options.xmp;
+  if (tag == kIptc) return options.iptc;
   return std::ranges::any_of(
       kPicture, [tag](const TagRange& range) { return tag >= range.first && tag <= range.last; });
 }
@@ -54,14 +62,16 @@ struct Entry {
 
 class BareTiff {
  public:
-  BareTiff(std::span<const uint8_t> file, std::vector<uint8_t>& bare) : file_(file), bare_(bare) {}
+  BareTiff(std::span<const uint8_t> file, const BareOptions& options, std::vector<uint8_t>& bare)
+      : file_(file), options_(options), bare_(bare) {}
 
   Status Make() {
     ByteReader head(file_);
     bigEndian_ = head.Match("MM");
     if (!bigEndian_ && !head.Match("II")) return Status::DamagedFile;
     const uint64_t version = Number(2, 2);
-    if (version != 42 && version != 43) return Status::DamagedFile;
+    const bool hdPhoto = version == 0x01BC && !bigEndian_;
+    if (version != 42 && version != 43 && !hdPhoto) return Status::DamagedFile;
     wide_ = version == 43;
     bare_.assign(file_.begin(), file_.end());
     const uint64_t first = wide_ ? 8 : 4;
@@ -132,7 +142,7 @@ class BareTiff {
     const uint64_t end = next_, following = Number(next_, Word());
     uint64_t target = at + CountBytes();  // where the next kept entry goes
     for (const Entry& entry : entries) {
-      if (!BelongsToPicture(entry.tag)) {
+      if (!BelongsToPicture(entry.tag, options_)) {
         DropEntry(entry, 0);
         continue;
       }
@@ -184,7 +194,9 @@ class BareTiff {
     };
     for (const auto& [offsets, sizes] : {std::pair(find(kStripOffsets), find(kStripSizes)),
                                          std::pair(find(kTileOffsets), find(kTileSizes)),
-                                         std::pair(find(kJpegOffset), find(kJpegSize))}) {
+                                         std::pair(find(kJpegOffset), find(kJpegSize)),
+                                         std::pair(find(kHdpOffset), find(kHdpSize)),
+                                         std::pair(find(kHdpAlphaOffset), find(kHdpAlphaSize))}) {
       if (offsets == nullptr) continue;
       pieces_ += offsets->count;
       if (pieces_ > kMostPieces) return Status::UnsupportedFormat;
@@ -247,6 +259,7 @@ class BareTiff {
   }
 
   const std::span<const uint8_t> file_;
+  const BareOptions& options_;
   std::vector<uint8_t>& bare_;
   bool bigEndian_ = false, wide_ = false;
   uint64_t next_ = 0;    // offset after the entries of the last directory
@@ -259,7 +272,12 @@ class BareTiff {
 }  // namespace
 
 Status MakeBareTiff(std::span<const uint8_t> file, std::vector<uint8_t>& bare) {
-  return BareTiff(file, bare).Make();
+  return MakeBareTiff(file, {}, bare);
+}
+
+Status MakeBareTiff(std::span<const uint8_t> file, const BareOptions& options,
+                    std::vector<uint8_t>& bare) {
+  return BareTiff(file, options, bare).Make();
 }
 
 }  // namespace fotomill

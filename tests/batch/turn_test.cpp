@@ -1,4 +1,4 @@
-#include "batch/turn_run.h"
+#include "batch/rewrite/turn_run.h"
 
 #include <gtest/gtest.h>
 
@@ -57,7 +57,7 @@ TEST(Turn, ChangesFilesOnlyWithoutLoss) {
     WriteBytes(path, row.bytes);
     ASSERT_TRUE(platform::SetModificationTime(path, {1'000'000'000, 500}));
     const TurnRequest right{.turn = Orientation::QuarterRight, .keepTime = true};
-    const TurnedFile turned = TurnPictureFile(path, path, right, {}, {});
+    const RewrittenFile turned = TurnPictureFile(path, path, right, {}, {});
     EXPECT_EQ(platform::FactsOf(path).modified, 1'000'000'000);
     if (row.hint != nullptr) {
       EXPECT_NE(turned.status, Status::Ok);
@@ -115,7 +115,7 @@ TEST(Turn, SkipsFilesThatWouldLoseTexts) {
     for (const bool kept : {false, true}) {
       settings.PreserveEXIF = kept;
       WriteBytes(path, file);
-      const TurnedFile turned = TurnPictureFile(path, path, {.turn = Orientation::QuarterRight}, {},
+      const RewrittenFile turned = TurnPictureFile(path, path, {.turn = Orientation::QuarterRight}, {},
                                                 {.encode = EncodeOptionsFromSettings()});
       EXPECT_EQ(turned.status, kept ? Status::Ok : Status::UnsuitableImage);
       EXPECT_EQ(turned.hint, kept ? "" : row.hint);

@@ -5,6 +5,7 @@
 #include "cli/commands/convert.h"
 #include "cli/commands/doctor.h"
 #include "cli/commands/exif.h"
+#include "cli/commands/exif_edit.h"
 #include "cli/commands/faces.h"
 #include "cli/commands/formats.h"
 #include "cli/commands/history.h"
@@ -42,6 +43,12 @@ constexpr Command kCommands[] = {
     {"formats", TrLater("list the formats and what this build can do with them"),       Needs::Formats,  SetUpFormats},
     {"match",   TrLater("show which format a file name selects, without opening it"),   Needs::Formats,  SetUpMatch},
     {"exif",    TrLater("show EXIF, or extract the embedded thumbnail"),                Needs::Formats,  SetUpExif},
+    {"exif set",    TrLater("set EXIF tags, everything else unchanged"),                Needs::Formats,  SetUpExifSet},
+    {"exif unset",  TrLater("remove EXIF tags, everything else unchanged"),             Needs::Formats,  SetUpExifUnset},
+    {"exif copy",   TrLater("copy EXIF from one picture to others"),                    Needs::Formats,  SetUpExifCopy},
+    {"exif shift",  TrLater("move the dates and times in EXIF"),                        Needs::Formats,  SetUpExifShift},
+    {"exif owner",  TrLater("set owner, copyright and equipment from the configuration"), Needs::Formats, SetUpExifOwner},
+    {"exif strip",  TrLater("remove metadata for good, pixels unchanged"),              Needs::Formats,  SetUpExifStrip},
     {"faces",   TrLater("find faces in pictures"),                                      Needs::Formats,  SetUpFaces},
     {"plugins", TrLater("list the plug-in formats"),                                    Needs::Settings, SetUpPlugins},
     {"similar", TrLater("find pictures that look alike"),                               Needs::Formats,  SetUpSimilar},

@@ -63,14 +63,17 @@ bool BeginsCommandGroup(const std::string& word) {
   return false;
 }
 
+// A command that begins a group as well, such as "exif", takes the second word only where it comes
+// right behind it: elsewhere it may be the value of an option, or a file.
 CommandName NameOfCommand(const Arguments& arguments, size_t place) {
   CommandName result{arguments[place], {place}};
-  if (FindCommand(result.name) != nullptr || !BeginsCommandGroup(result.name)) return result;
-  if (const auto second = FindWord(arguments, place + 1)) {
-    result.name += " " + arguments[*second];
-    result.places.push_back(*second);
-  }
-  return result;
+  if (!BeginsCommandGroup(result.name)) return result;
+  const bool alone = FindCommand(result.name) != nullptr;
+  if (alone && place + 1 >= arguments.size()) return result;
+  const auto second = alone ? std::optional(place + 1) : FindWord(arguments, place + 1);
+  const std::string both = second ? result.name + " " + arguments[*second] : std::string();
+  if (!second || (alone && FindCommand(both) == nullptr)) return result;
+  return {both, {place, *second}};
 }
 
 int RefuseCommand(const std::string& name, const Io& io) {

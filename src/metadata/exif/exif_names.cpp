@@ -1,5 +1,6 @@
 #include "metadata/exif/exif_names.h"
 
+#include <charconv>
 #include <string>
 
 #include "core/text.h"
@@ -82,10 +83,21 @@ std::optional<uint16_t> UnknownTag(std::string_view plain) {
   return ParseNumber<uint16_t>(plain.substr(kStart.size(), plain.size() - kStart.size() - 1));
 }
 
+// The number in "0x9003".
+std::optional<uint16_t> NumberedTag(std::string_view plain) {
+  if (!plain.starts_with("0x")) return std::nullopt;
+  plain.remove_prefix(2);
+  uint16_t tag = 0;
+  const auto [end, error] = std::from_chars(plain.data(), plain.data() + plain.size(), tag, 16);
+  if (error != std::errc{} || end != plain.data() + plain.size()) return std::nullopt;
+  return tag;
+}
+
 }  // namespace
 
 std::optional<uint16_t> FindExifTagByName(std::string_view name) {
   const std::string plain = Plain(name);
+  if (const auto tag = NumberedTag(plain)) return tag;
   for (const FieldName& field : kFieldNames) {
     if (Plain(field.name) == plain) return field.tag;
   }

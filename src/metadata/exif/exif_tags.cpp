@@ -12,18 +12,18 @@ using enum ExifRule;
 using enum ExifWordKey;
 
 // Values in the order of the words that they select.
-constexpr uint16_t kNorth[] = {'N'};
-constexpr uint16_t kEast[] = {'E'};
-constexpr uint16_t kActive[] = {'A'};
-constexpr uint16_t kTwo[] = {'2'};
+constexpr uint16_t kNorth[] = {'N', 'S'};
+constexpr uint16_t kEast[] = {'E', 'W'};
+constexpr uint16_t kActive[] = {'A', 'V'};
+constexpr uint16_t kTwo[] = {'2', '3'};
 constexpr uint16_t kSpeedUnits[] = {'K', 'M', 'N'};
-constexpr uint16_t kTrue[] = {'T'};
-constexpr uint16_t kResolutionUnits[] = {2, 3};
+constexpr uint16_t kTrue[] = {'T', 'M'};
+constexpr uint16_t kResolutionUnits[] = {2, 3, 1};
 constexpr uint16_t kCompressions[] = {1, 6};
 constexpr uint16_t kMeteringModes[] = {0, 1, 2, 3, 4, 5, 6, 255};
 constexpr uint16_t kLightSources[] = {0,  1,  2,  3,  4,  9,  10, 11, 12, 13, 14,
                                       15, 17, 18, 19, 20, 21, 22, 23, 24, 255};
-constexpr uint16_t kColorSpaces[] = {0, 1};
+constexpr uint16_t kColorSpaces[] = {0xffff, 1};
 
 // Users know the lists as they stand, though some are not those of the standard: the orientations 3
 // and 4 carry each other's words, a white balance of 0 reads "None", and a sensing method has the

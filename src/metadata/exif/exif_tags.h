@@ -49,7 +49,8 @@ enum class ExifWordKey : uint8_t {
 };
 
 // A word list: items separated by ";" and picked by index. Without `codes` the index is the value
-// itself, with them it is the value's position among them, or `otherwise` when it is not there.
+// itself, with them it is the value's position among them, or `otherwise` when it is not there. A
+// word is written as the code at its position.
 struct ExifWordList {
   std::string_view words;
   ExifWordKey key = ExifWordKey::Number;

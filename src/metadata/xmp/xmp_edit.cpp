@@ -6,7 +6,10 @@
 #include "metadata/xmp/xmp_edit.h"
 
 #include <algorithm>
+#include <string>
 #include <string_view>
+
+#include "containers/walked_bytes.h"
 
 namespace fotomill {
 
@@ -46,6 +49,39 @@ void SetXmpOrientation(std::span<uint8_t> packet, int32_t orientation) {
                           (packet[value + 1] < '0' || packet[value + 1] > '9');
     if (oneDigit) packet[value] = static_cast<uint8_t>('0' + orientation);
   }
+}
+
+bool BlankXmpPlaces(std::span<uint8_t> packet) {
+  constexpr std::string_view kPlace = "exif:GPS";
+  const std::string_view text = TextOf(packet);
+  bool found = false;
+  for (size_t at = 0; (at = text.find(kPlace, at)) != std::string_view::npos;) {
+    const size_t name = at;
+    at = text.find_first_of("= \t\r\n/>", at);
+    if (at == std::string_view::npos) break;
+    const std::string tag(text.substr(name, at - name));
+    size_t begin = name, end = 0;
+    if (name > 0 && text[name - 1] == '<') {
+      begin = name - 1;
+      const size_t close = text.find('>', at);
+      if (close == std::string_view::npos) break;
+      const std::string closing = "</" + tag;
+      const size_t last = text[close - 1] == '/' ? close : text.find('>', text.find(closing, close));
+      if (last == std::string_view::npos) break;
+      end = last + 1;
+    } else {
+      const size_t quote = text.find_first_of("\"'", at);
+      if (quote == std::string_view::npos) break;
+      const size_t last = text.find(text[quote], quote + 1);
+      if (last == std::string_view::npos) break;
+      end = last + 1;
+    }
+    std::fill(packet.begin() + static_cast<ptrdiff_t>(begin), packet.begin() + static_cast<ptrdiff_t>(end),
+              uint8_t{' '});
+    found = true;
+    at = end;
+  }
+  return found;
 }
 
 }  // namespace fotomill

@@ -1,6 +1,6 @@
 #include "desktop/models/files/turn_one_file.h"
 
-#include "batch/turn_file.h"
+#include "batch/rewrite/turn_file.h"
 #include "desktop/models/thumbnails/thumbnail.h"
 #include "files/previous_file.h"
 #include "platform/files.h"
@@ -20,7 +20,7 @@ FileOperationResult TurnOneFile(const std::string& path, Orientation turn) {
   bool kept = true;
   options.makeWay = [&] { return kept = previous.Keep(path); };
   const TurnRequest request{.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0};
-  const TurnedFile turned =
+  const RewrittenFile turned =
       TurnPictureFile(path, path, request, ReadOptionsFromSettings(), options);
   if (turned.changed) previous.Replaced(path);
   FileOperationResult result{previous.Operation(), {}, turned.note.shown};

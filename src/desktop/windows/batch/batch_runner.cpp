@@ -4,7 +4,7 @@
 #include <wx/textdlg.h>
 
 #include "batch/new_job.h"
-#include "batch/turn_run.h"
+#include "batch/rewrite/turn_run.h"
 #include "desktop/models/batch/destination_choice.h"
 #include "desktop/models/thumbnails/thumbnail.h"
 #include "files/previous_file.h"

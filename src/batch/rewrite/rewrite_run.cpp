@@ -1,4 +1,4 @@
-#include "batch/turn_run.h"
+#include "batch/rewrite/rewrite_run.h"
 
 #include <mutex>
 #include <optional>
@@ -21,9 +21,9 @@ FileOutcome Failure(const BatchFile& file, Status status, std::string hint) {
   return {.source = file.name, .status = status, .hint = std::move(hint)};
 }
 
-class TurnBatch {
+class RewriteBatch {
  public:
-  TurnBatch(std::span<const BatchFile> files, const TurnFunction& function, BatchJob& job)
+  RewriteBatch(std::span<const BatchFile> files, const RewriteFunction& function, BatchJob& job)
       : files_(files),
         function_(function),
         job_(job),
@@ -33,8 +33,8 @@ class TurnBatch {
                     const auto outcome = Process(i);
                     return outcome ? std::vector{*outcome} : std::vector<FileOutcome>();
                   },
-              .history = FileFunction::Transform,
-              .dryRun = function.request.dryRun}) {
+              .history = function.history,
+              .dryRun = function.dryRun}) {
     for (const BatchFile& file : files_) {
       if (file.status == Status::Ok) {
         names_.AddSource(file.name);
@@ -71,7 +71,7 @@ class TurnBatch {
       return std::nullopt;
     }
     if (!goesOn && outcome.status != Status::Ok && job_.stop.Token().Asked()) return std::nullopt;
-    if (goesOn) Turn(outcome);
+    if (goesOn) Rewrite(outcome);
     return outcome;
   }
 
@@ -81,7 +81,7 @@ class TurnBatch {
     const std::string planned = outcome.destination;
     if (function_.inPlace) {
       outcome.skipped = names_.TakenByRun(planned, outcome.source);
-      if (outcome.skipped) outcome.hint = Tr("listed twice; already turned.");
+      if (outcome.skipped) outcome.hint = Tr(function_.listedTwice);
       outcome.replaced = true;
     } else if (const platform::Existence taken = names_.Taken(planned, outcome.source);
                taken == platform::Existence::Yes) {
@@ -117,7 +117,7 @@ class TurnBatch {
     if (destination.search != VariantSearch::Found) SayNoName(destination, outcome);
   }
 
-  void Turn(FileOutcome& outcome) const {
+  void Rewrite(FileOutcome& outcome) const {
     const std::string folder(platform::SplitPath(outcome.destination).folder);
     WriteOptions options{.encode = job_.encode};
     options.comment = job_.writeComments;
@@ -126,34 +126,32 @@ class TurnBatch {
     if (function_.inPlace && function_.keepPrevious) {
       options.makeWay = [&] { return kept = function_.keepPrevious(outcome.source); };
     }
-    TurnedFile turned;
-    const bool ready = function_.request.dryRun
+    RewrittenFile made;
+    const bool ready = function_.dryRun
                            ? platform::IsFolder(folder) || platform::MayCreate(outcome.destination)
                            : platform::MakeFolders(folder);
     if (!folder.empty() && !ready) {
-      turned = {.status = Status::ErrorCreatingFile,
-                .hint = WithReason(Tr("The folder \"%1\" does not exist.", folder))};
+      made = {.status = Status::ErrorCreatingFile,
+              .hint = WithReason(Tr("The folder \"%1\" does not exist.", folder))};
     } else {
-      TurnRequest request = function_.request;
-      request.stop = job_.stop.Token();
-      turned = TurnPictureFile(outcome.source, outcome.destination, request, job_.read, options);
+      made = function_.rewrite(outcome.source, outcome.destination,
+                               {function_.keepTimes, function_.dryRun, job_.stop.Token()}, options);
     }
-    if (turned.changed && function_.inPlace && function_.replaced)
-      function_.replaced(outcome.source);
-    outcome.status = turned.status;
+    if (made.changed && function_.inPlace && function_.replaced) function_.replaced(outcome.source);
+    outcome.status = made.status;
     outcome.hint =
-        kept ? turned.hint
+        kept ? made.hint
              : std::string(Tr("There is not enough disk space to keep the old file for undo."));
-    outcome.note = turned.note;
-    if (turned.changed) NoteLostAttributes(outcome);
-    outcome.skipped = turned.status == Status::Ok && !turned.changed;
+    outcome.note = made.note;
+    if (made.changed) NoteLostAttributes(outcome);
+    outcome.skipped = made.status == Status::Ok && !made.changed;
     if (outcome.skipped)
-      outcome.hint = turned.note.empty() ? Tr("already in this orientation.") : turned.note.shown;
-    if (turned.status != Status::Ok) outcome.destination.clear();
+      outcome.hint = made.note.empty() ? Tr(function_.unchanged) : made.note.shown;
+    if (made.status != Status::Ok) outcome.destination.clear();
   }
 
   const std::span<const BatchFile> files_;
-  const TurnFunction& function_;
+  const RewriteFunction& function_;
   BatchJob& job_;
   std::mutex mutex_;  // over what is given to names_
   RunNames names_;
@@ -162,9 +160,9 @@ class TurnBatch {
 
 }  // namespace
 
-Status RunTurn(std::span<const BatchFile> files, const TurnFunction& function, BatchJob& job) {
+Status RunRewrite(std::span<const BatchFile> files, const RewriteFunction& function, BatchJob& job) {
   if (!OpenProgressBox(job)) return Status::FunctionCancelled;
-  TurnBatch(files, function, job).Run();
+  RewriteBatch(files, function, job).Run();
   FinishProgress(job);
   return Status::Ok;
 }

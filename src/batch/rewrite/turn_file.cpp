@@ -1,16 +1,12 @@
-#include "batch/turn_file.h"
+#include "batch/rewrite/turn_file.h"
 
 #include <algorithm>
 #include <vector>
 
 #include "batch/picture_failure.h"
-#include "core/byte_writer.h"
 #include "files/turned_jpeg.h"
 #include "metadata/exif/picture_exif.h"
 #include "platform/file_view.h"
-#include "platform/files.h"
-#include "platform/held_file.h"
-#include "platform/output_file.h"
 #include "platform/paths.h"
 #include "platform/temporary_file.h"
 #include "registry/registry.h"
@@ -66,42 +62,33 @@ class Turning {
   Turning(const std::string& source, const std::string& destination, const TurnRequest& request,
           const ReadOptions& read, const WriteOptions& options)
       : source_(source),
-        destination_(destination),
         request_(request),
         read_(read),
-        options_(options) {}
+        options_(options),
+        rewriting_{request.keepTime, request.dryRun, request.stop},
+        rewrite_(source, destination, rewriting_, options) {}
 
-  TurnedFile Run() {
-    result_.status = Turn();
-    return std::move(result_);
+  RewrittenFile Run() {
+    rewrite_.result.status = Turn();
+    return std::move(rewrite_.result);
   }
 
  private:
-  Status Fail(Status status, std::string hint) {
-    result_.hint = std::move(hint);
-    return status;
-  }
+  Status Fail(Status status, std::string hint) { return rewrite_.Fail(status, std::move(hint)); }
 
   ReadRequest Reading(const std::string& file) const {
     return {.fileName = file, .stop = request_.stop, .options = read_};
   }
 
   Status Turn() {
-    if (source_ == destination_ && !request_.dryRun && !held_.Hold(source_))
-      return Fail(Status::ErrorCreatingFile, ReasonSentence());
-    stamp_ = source_ == destination_ ? held_.Stamp() : platform::StampOf(source_);
+    RETURN_IF_BAD(rewrite_.Begin());
     PicturePointer picture;
     if (const Status status = LoadPictureInfo(Reading(source_), picture);
         status != Status::Ok) {
       return Fail(status, OpenHint(source_, status));
     }
-    const auto time = request_.keepTime ? platform::ModificationTime(source_) : std::nullopt;
-    RETURN_IF_BAD(FormatRow(picture->formatIndex).turnsWithoutLoss ? TurnAsJpeg() : TurnDecoded(std::move(picture)));
-    if (!result_.changed || !time || request_.dryRun ||
-        platform::SetModificationTime(destination_, *time))
-      return Status::Ok;
-    return Fail(Status::ErrorWritingFile,
-                Tr("The file was rotated, but its time could not be set."));
+    return FormatRow(picture->formatIndex).turnsWithoutLoss ? TurnAsJpeg()
+                                                            : TurnDecoded(std::move(picture));
   }
 
   Status TurnAsJpeg() {
@@ -119,12 +106,12 @@ class Turning {
       return Fail(status, turned.obstacle.shown);
     }
     if (!file.Intact()) return Status::FileReadError;
-    if (turned.method == JpegTurnMethod::Trimmed) result_.note = TrRecorded("An edge was cropped.");
+    if (turned.method == JpegTurnMethod::Trimmed) rewrite_.result.note = TrRecorded("An edge was cropped.");
     if (!turned.obstacle.empty()) {
       const bool tag = turned.method == JpegTurnMethod::Tag;
-      result_.note = tag ? TrRecorded("Only the EXIF orientation was changed.")
+      rewrite_.result.note = tag ? TrRecorded("Only the EXIF orientation was changed.")
                          : TrRecorded("Left unchanged.");
-      result_.note.Append(turned.obstacle);
+      rewrite_.result.note.Append(turned.obstacle);
     }
     return WriteUnlessThere(turned.method == JpegTurnMethod::Nothing ? file.Bytes() : made,
                             turned.method == JpegTurnMethod::Nothing);
@@ -185,50 +172,21 @@ class Turning {
     return WriteUnlessThere(file.Bytes(), false);
   }
 
-  // An unchanged picture is copied, unless source and destination are the same.
   Status WriteUnlessThere(std::span<const uint8_t> bytes, bool same) {
-    if (same && source_ == destination_) return Status::Ok;
-    if (request_.dryRun) {
-      result_.changed = platform::MayCreate(destination_);
-      return result_.changed ? Status::Ok : Fail(Status::ErrorCreatingFile, CannotCreate());
-    }
-    ByteWriter out;
-    const bool replaces =
-        source_ != destination_ && options_.existing == platform::Existing::Replace;
-    if (replaces && !held_.Hold(destination_))
-      return Fail(Status::ErrorCreatingFile, ReasonSentence());
-    if (!out.Create(destination_)) return Fail(Status::ErrorCreatingFile, CannotCreate());
-    out.Bytes(bytes);
-    WriteOptions options = options_;
-    bool unchanged = true;  // a file that another program changed meanwhile is not replaced
-    options.makeWay = [&] {
-      return (!options_.makeWay || options_.makeWay()) &&
-             (unchanged = platform::StampOf(source_) == stamp_);
-    };
-    const Status status = CommitOutput(out, options);
-    if (!unchanged || held_.Changed())
-      return Fail(Status::FileReadError, Tr("The file was changed by another program."));
-    if (status != Status::Ok) return Fail(status, ReasonSentence());
-    result_.changed = true;
-    return Status::Ok;
+    return rewrite_.Write({&bytes, 1}, same);
   }
 
-  std::string CannotCreate() const {
-    return WithReason(Tr("\"%1\" cannot be created.", destination_));
-  }
-
-  const std::string &source_, &destination_;
+  const std::string& source_;
   const TurnRequest& request_;
   const ReadOptions& read_;
   const WriteOptions& options_;
-  platform::HeldFile held_;    // the file to be replaced
-  platform::FileStamp stamp_;  // of the source when it was not read yet
-  TurnedFile result_;
+  const RewriteRequest rewriting_;
+  FileRewrite rewrite_;
 };
 
 }  // namespace
 
-TurnedFile TurnPictureFile(const std::string& source, const std::string& destination,
+RewrittenFile TurnPictureFile(const std::string& source, const std::string& destination,
                            const TurnRequest& request, const ReadOptions& read,
                            const WriteOptions& options) {
   return Turning(source, destination, request, read, options).Run();

@@ -6,7 +6,7 @@
 #include <string>
 
 #include "batch/run.h"
-#include "batch/turn_file.h"
+#include "batch/rewrite/turn_file.h"
 
 namespace fotomill {
 

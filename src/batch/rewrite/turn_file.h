@@ -2,12 +2,12 @@
 
 #include <string>
 
+#include "batch/rewrite/rewrite_file.h"
 #include "core/status.h"
 #include "core/workers/stop_token.h"
 #include "picture/read_request.h"
 #include "picture/write_options.h"
 #include "processing/geometry/orient.h"
-#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -22,20 +22,12 @@ struct TurnRequest {
   StopToken stop = {};                      // ends the work with FunctionCancelled (4)
 };
 
-// The result for one file.
-struct TurnedFile {
-  Status status = Status::Ok;
-  std::string hint = {};  // to a failure, as a sentence
-  RecordedText note = {};  // how it was turned if not as usual
-  bool changed = false;   // false: nothing was written, the orientation is already right
-};
-
 // Writes a turned copy of a picture file, or replaces it; `options` say what to do if the
 // destination exists. JPEG pictures are turned losslessly, or only their orientation is changed.
 // Others are decoded, turned and written in their own format, but only if the new file has every
 // pixel unchanged: otherwise UnsuitableImage (13), with a hint. Nothing is written unless Ok.
-TurnedFile TurnPictureFile(const std::string& source, const std::string& destination,
-                           const TurnRequest& request, const ReadOptions& read,
-                           const WriteOptions& options);
+RewrittenFile TurnPictureFile(const std::string& source, const std::string& destination,
+                              const TurnRequest& request, const ReadOptions& read,
+                              const WriteOptions& options);
 
 }  // namespace fotomill

@@ -1,0 +1,64 @@
+#include "batch/rewrite/rewrite_file.h"
+
+#include <utility>
+
+#include "core/byte_writer.h"
+#include "platform/output_file.h"
+#include "texts/system_reason.h"
+
+namespace fotomill {
+
+Status FileRewrite::Fail(Status status, std::string hint) {
+  result.hint = std::move(hint);
+  return status;
+}
+
+Status FileRewrite::Begin() {
+  if (source_ == destination_ && !request_.dryRun && !held_.Hold(source_))
+    return Fail(Status::ErrorCreatingFile, ReasonSentence());
+  stamp_ = source_ == destination_ && !request_.dryRun ? held_.Stamp() : platform::StampOf(source_);
+  if (request_.keepTime) time_ = platform::ModificationTime(source_);
+  return Status::Ok;
+}
+
+Status FileRewrite::Write(std::span<const std::span<const uint8_t>> parts, bool same) {
+  if (same && source_ == destination_) return Status::Ok;
+  if (request_.dryRun) {
+    result.changed = platform::MayCreate(destination_);
+    return result.changed ? Status::Ok : Fail(Status::ErrorCreatingFile, CannotCreate());
+  }
+  ByteWriter out;
+  const bool replaces =
+      source_ != destination_ && options_.existing == platform::Existing::Replace;
+  if (replaces && !held_.Hold(destination_))
+    return Fail(Status::ErrorCreatingFile, ReasonSentence());
+  if (!out.Create(destination_)) return Fail(Status::ErrorCreatingFile, CannotCreate());
+  for (const auto& part : parts) {
+    if (request_.stop.Asked()) return Status::FunctionCancelled;
+    out.Bytes(part);
+  }
+  WriteOptions options = options_;
+  bool unchanged = true;  // a file that another program changed meanwhile is not replaced
+  options.makeWay = [&] {
+    return (!options_.makeWay || options_.makeWay()) &&
+           (unchanged = platform::StampOf(source_) == stamp_);
+  };
+  const Status status = CommitOutput(out, options);
+  if (!unchanged || held_.Changed())
+    return Fail(Status::FileReadError, Tr("The file was changed by another program."));
+  if (status != Status::Ok) return Fail(status, ReasonSentence());
+  result.changed = true;
+  return KeepTime();
+}
+
+Status FileRewrite::KeepTime() {
+  if (!time_ || platform::SetModificationTime(destination_, *time_)) return Status::Ok;
+  return Fail(Status::ErrorWritingFile,
+              Tr("The file was written, but its time could not be set."));
+}
+
+std::string FileRewrite::CannotCreate() const {
+  return WithReason(Tr("\"%1\" cannot be created.", destination_));
+}
+
+}  // namespace fotomill

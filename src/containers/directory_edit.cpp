@@ -1,0 +1,414 @@
+// Source: Adobe, "TIFF Revision 6.0" (1992), section 2; the libtiff project, "The BigTIFF Design";
+// CIPA DC-008-2012, section 4.6.
+#include "containers/directory_edit.h"
+
+#include <algorithm>
+#include <unordered_set>
+
+#include "core/limits.h"
+#include "texts/texts.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr uint16_t kExifPointer = 0x8769, kGpsPointer = 0x8825, kInteroperabilityPointer = 0xA005;
+constexpr uint16_t kSubDirectories = 0x014A;
+constexpr uint16_t kFirstHdpData = 0xBCC0;
+constexpr uint16_t kLong = 4, kLong8 = 16;
+constexpr int32_t kDeepest = 4;            // directories within directories
+constexpr uint64_t kMostPieces = 1 << 23;  // strips and tiles of all pages
+// Bytes of a value, and of the numbers in it, by type.
+constexpr uint8_t kTypeBytes[] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8, 4, 8, 4, 0, 0, 8, 8, 8};
+constexpr uint8_t kNumberBytes[] = {0, 1, 1, 2, 4, 4, 1, 1, 2, 4, 4, 4, 8, 4, 0, 0, 8, 8, 8};
+
+// Entries that say where data is, and those that say how long it is; 0: unknown, to the end.
+constexpr struct {
+  uint16_t offsets, sizes;
+} kDataTags[] = {{0x0111, 0x0117}, {0x0144, 0x0145}, {0x0201, 0x0202}, {0x0207, 0},
+                 {0x0208, 0},      {0x0209, 0},      {0xBCC0, 0xBCC1}, {0xBCC2, 0xBCC3}};
+
+struct Range {
+  uint64_t begin, end;
+};
+
+struct Entry {
+  uint16_t tag = 0, type = 0;
+  uint64_t count = 0;
+  std::vector<uint8_t> field = {};  // as stored: the values, or their offset
+  uint64_t value = 0, size = 0;  // where the values are; size 0: unknown type
+  bool outside = false;          // of the entry
+};
+
+struct Directory {
+  uint64_t at = 0;
+  std::vector<Entry> entries;
+  uint64_t next = 0;
+  uint64_t oldEnd = 0;  // behind it in the file
+  size_t oldCount = 0;
+  bool dirty = false;
+};
+
+class Editor {
+ public:
+  Editor(std::span<const uint8_t> file, DirectoryEdit& edit, std::string& reason)
+      : file_(file), edit_(edit), reason_(reason) {}
+
+  Status Run(std::span<const DirectoryChange> changes) {
+    edit_ = {};
+    if (!ReadHeader()) return Damaged();
+    for (uint64_t at = Number(firstAt_, Word()); at != 0;) {
+      if (!Map(at, 0)) break;
+      at = mappedNext_;
+    }
+    Directory first;
+    if (!ReadDirectory(Number(firstAt_, Word()), first)) return Damaged();
+    RETURN_IF_BAD(EditSub(kExifPointer, ExifPlace::Exif, changes, first));
+    RETURN_IF_BAD(EditSub(kGpsPointer, ExifPlace::Gps, changes, first));
+    for (const DirectoryChange& change : changes) {
+      if (change.place == ExifPlace::First) Apply(change, first);
+    }
+    if (first.dirty) {
+      const uint64_t at = Place(first, true);
+      if (at != first.at) Patch(firstAt_, Bytes(at, Word()));
+    }
+    std::ranges::sort(edit_.patches, {}, &DirectoryEdit::Patch::at);
+    return CheckGrowth();
+  }
+
+  DirectoryValue Find(uint16_t tag) {
+    Directory first;
+    if (!ReadHeader() || !ReadDirectory(Number(firstAt_, Word()), first)) return {};
+    const auto found = std::ranges::find(first.entries, tag, &Entry::tag);
+    if (found == first.entries.end() || !Holds(found->value, found->size)) return {};
+    return {found->type, file_.subspan(found->value, found->size)};
+  }
+
+ private:
+  uint64_t Word() const { return wide_ ? 8 : 4; }
+  uint64_t CountBytes() const { return wide_ ? 8 : 2; }
+  uint64_t EntryBytes() const { return wide_ ? 20 : 12; }
+
+  Status Damaged() {
+    reason_ = Tr("The directories of its EXIF are damaged.");
+    return Status::DamagedFile;
+  }
+
+  bool ReadHeader() {
+    constexpr uint64_t kClassic = 42, kBig = 43, kHdPhoto = 0x01BC;
+    if (file_.size() < 8 || file_[0] != file_[1] || (file_[0] != 'I' && file_[0] != 'M'))
+      return false;
+    bigEndian_ = file_[0] == 'M';
+    const uint64_t version = Number(2, 2);
+    wide_ = version == kBig;
+    firstAt_ = wide_ ? 8 : 4;
+    used_.push_back({0, firstAt_ + Word()});
+    return version == kClassic || (version == kBig && Number(4, 2) == 8) ||
+           (version == kHdPhoto && !bigEndian_);
+  }
+
+  bool Holds(uint64_t at, uint64_t size) const {
+    return at <= file_.size() && size <= file_.size() - at;
+  }
+  uint64_t Number(uint64_t at, uint64_t size) const {
+    uint64_t number = 0;
+    if (!Holds(at, size)) return 0;
+    for (uint64_t i = 0; i < size; ++i)
+      number = number << 8 | file_[at + (bigEndian_ ? i : size - 1 - i)];
+    return number;
+  }
+  std::vector<uint8_t> Bytes(uint64_t number, uint64_t size) const {
+    std::vector<uint8_t> bytes(size);
+    for (uint64_t i = 0; i < size; ++i)
+      bytes[bigEndian_ ? size - 1 - i : i] = static_cast<uint8_t>(number >> 8 * i);
+    return bytes;
+  }
+  static uint64_t BytesOf(uint64_t type) {
+    return type < std::size(kTypeBytes) ? kTypeBytes[type] : 0;
+  }
+  // Number `i` of an entry's values, 0 when the file does not hold it.
+  uint64_t NumberOf(const Entry& entry, uint64_t i) const {
+    const uint64_t each = BytesOf(entry.type);
+    return each == 0 ? 0 : Number(entry.value + i * each, each);
+  }
+
+  // False when the file does not hold it as a whole.
+  bool ReadDirectory(uint64_t at, Directory& directory) {
+    if (at < 8 || !Holds(at, CountBytes())) return false;
+    const uint64_t count = Number(at, CountBytes()), entries = at + CountBytes();
+    if (count > limits.exifEntries || !Holds(entries, count * EntryBytes())) return false;
+    directory.at = at;
+    directory.oldCount = count;
+    for (uint64_t i = 0; i < count; ++i) directory.entries.push_back(ReadEntry(entries + i * EntryBytes()));
+    directory.oldEnd = entries + count * EntryBytes();
+    if (!Holds(directory.oldEnd, Word())) return true;  // blocks that end here have no next one
+    directory.next = Number(directory.oldEnd, Word());
+    directory.oldEnd += Word();
+    return true;
+  }
+
+  Entry ReadEntry(uint64_t at) const {
+    Entry entry;
+    entry.tag = static_cast<uint16_t>(Number(at, 2));
+    entry.type = static_cast<uint16_t>(Number(at + 2, 2));
+    entry.count = Number(at + 4, Word());
+    entry.value = at + 4 + Word();
+    const auto field = file_.subspan(entry.value, Word());
+    entry.field.assign(field.begin(), field.end());
+    const uint64_t each = BytesOf(entry.type);
+    // a count that no file can hold
+    entry.size = each == 0 || entry.count > UINT64_MAX / 16 ? 0 : each * entry.count;
+    entry.outside = entry.size > Word();
+    if (entry.outside) entry.value = Number(entry.value, Word());
+    return entry;
+  }
+
+  // Notes what a directory and all below it use of the file. False when it was seen before, or is
+  // not in the file as a whole.
+  bool Map(uint64_t at, int32_t depth) {
+    Directory directory;
+    if (visited_.size() >= limits.filePages || mappedEntries_ > limits.exifEntries) return false;
+    if (!visited_.insert(at).second || !ReadDirectory(at, directory)) return false;
+    mappedEntries_ += directory.oldCount;
+    used_.push_back({at, directory.oldEnd});
+    for (const Entry& entry : directory.entries) {
+      if (entry.outside) Use(entry.value, entry.size);
+      MapBelow(entry, depth);
+    }
+    for (const auto& tags : kDataTags) MapData(directory, tags.offsets, tags.sizes);
+    mappedNext_ = directory.next;
+    return true;
+  }
+
+  void MapBelow(const Entry& entry, int32_t depth) {
+    const bool leads = entry.tag == kExifPointer || entry.tag == kGpsPointer ||
+                       entry.tag == kInteroperabilityPointer || entry.tag == kSubDirectories;
+    if (!leads || depth >= kDeepest || entry.size == 0 || !Holds(entry.value, entry.size)) return;
+    for (uint64_t i = 0; i < entry.count; ++i) {
+      uint64_t at = NumberOf(entry, i);
+      // pages below a page may be chained; the others are not
+      while (at != 0 && Map(at, depth + 1)) at = entry.tag == kSubDirectories ? mappedNext_ : 0;
+    }
+  }
+
+  void MapData(const Directory& directory, uint16_t offsetsTag, uint16_t sizesTag) {
+    const auto find = [&](uint16_t tag) {
+      const auto found = std::ranges::find(directory.entries, tag, &Entry::tag);
+      return found == directory.entries.end() || !Holds(found->value, found->size) ? nullptr : &*found;
+    };
+    const Entry *offsets = find(offsetsTag), *sizes = sizesTag == 0 ? nullptr : find(sizesTag);
+    if (offsets == nullptr) return;
+    for (uint64_t i = 0; i < offsets->count && pieces_ < kMostPieces; ++i, ++pieces_) {
+      const uint64_t at = NumberOf(*offsets, i);
+      const bool sized = sizes != nullptr && i < sizes->count;
+      const uint64_t rest = file_.size() - std::min<uint64_t>(at, file_.size());
+      uint64_t size = sized ? NumberOf(*sizes, i) : rest;
+      // writers of HD Photo count an alpha codestream from the start of the file
+      if (offsetsTag >= kFirstHdpData) size = std::min(size, rest);
+      if (at != 0) Use(at, size);
+    }
+  }
+
+  void Use(uint64_t at, uint64_t size) {
+    pointsBeyond_ = pointsBeyond_ || !Holds(at, size);
+    if (at < file_.size()) used_.push_back({at, at + std::min<uint64_t>(size, file_.size() - at)});
+  }
+
+  // Whether nothing but its owner uses a range.
+  bool Exclusive(const Range& range) const {
+    const auto overlaps = [&](const Range& other) {
+      return other.begin < range.end && range.begin < other.end;
+    };
+    return range.end <= file_.size() && pieces_ < kMostPieces &&
+           std::ranges::count_if(used_, overlaps) == 1;
+  }
+
+  void Patch(uint64_t at, std::vector<uint8_t> bytes) {
+    edit_.patches.push_back({at, std::move(bytes)});
+  }
+  void Erase(const Range& range) {
+    if (range.begin < range.end && Exclusive(range))
+      Patch(range.begin, std::vector<uint8_t>(range.end - range.begin));
+  }
+  void EraseValue(const Entry& entry) {
+    if (entry.outside && Holds(entry.value, entry.size))
+      Erase({entry.value, entry.value + entry.size});
+  }
+
+  // Puts bytes behind the end, at an even offset, which is returned.
+  uint64_t Append(const std::vector<uint8_t>& bytes) {
+    if ((file_.size() + edit_.tail.size()) % 2 != 0) edit_.tail.push_back(0);
+    const uint64_t at = file_.size() + edit_.tail.size();
+    edit_.tail.insert(edit_.tail.end(), bytes.begin(), bytes.end());
+    return at;
+  }
+
+  void Apply(const DirectoryChange& change, Directory& directory) {
+    auto& entries = directory.entries;
+    auto found = std::ranges::find(entries, change.tag, &Entry::tag);
+    if (!change.entry) {
+      const auto goes = [&](const Entry& entry) { return change.all || entry.tag == change.tag; };
+      for (const Entry& entry : entries) {
+        if (goes(entry)) EraseValue(entry);
+      }
+      directory.dirty = std::erase_if(entries, goes) > 0 || directory.dirty;
+      return;
+    }
+    std::vector<uint8_t> values = change.entry->value;
+    if (bigEndian_) SwapExifNumbers(change.entry->type, values);
+    if (found == entries.end()) {
+      found = std::ranges::find_if(entries, [&](const Entry& e) { return e.tag > change.tag; });
+      found = entries.insert(found, Entry{.tag = change.tag});
+    } else if (IsSame(*found, *change.entry, values)) {
+      return;
+    }
+    directory.dirty = true;
+    SetValue(*found, *change.entry, std::move(values));
+  }
+
+  bool IsSame(const Entry& old, const ExifEntry& entry, const std::vector<uint8_t>& values) const {
+    return old.type == entry.type && old.count == entry.count && Holds(old.value, old.size) &&
+           std::ranges::equal(file_.subspan(old.value, old.size), values);
+  }
+
+  void SetValue(Entry& target, const ExifEntry& entry, std::vector<uint8_t> values) {
+    const Range old{target.value, target.value + target.size};
+    const bool fits = target.outside && values.size() > Word() && values.size() <= target.size &&
+                      Holds(target.value, target.size) && Exclusive(old);
+    if (fits) {
+      values.resize(target.size);
+      Patch(target.value, std::move(values));
+    } else {
+      EraseValue(target);
+      if (values.size() > Word()) values = Bytes(Append(values), Word());
+      values.resize(Word());
+      target.field = std::move(values);
+    }
+    target.type = entry.type;
+    target.count = entry.count;
+    target.outside = false;  // its old value is done with
+  }
+
+  // The directory's bytes.
+  std::vector<uint8_t> Laid(const Directory& directory) const {
+    std::vector<uint8_t> bytes = Bytes(directory.entries.size(), CountBytes());
+    const auto add = [&](const std::vector<uint8_t>& more) {
+      bytes.insert(bytes.end(), more.begin(), more.end());
+    };
+    for (const Entry& entry : directory.entries) {
+      add(Bytes(entry.tag, 2));
+      add(Bytes(entry.type, 2));
+      add(Bytes(entry.count, Word()));
+      add(entry.field);
+    }
+    add(Bytes(directory.next, Word()));
+    return bytes;
+  }
+
+  // Writes a changed directory where it was, or behind the end; returns where. An empty one is 0,
+  // unless it is `needed`.
+  uint64_t Place(const Directory& directory, bool needed) {
+    const Range old{directory.at, directory.oldEnd};
+    if (directory.entries.empty() && !needed) {
+      Erase(old);
+      return 0;
+    }
+    std::vector<uint8_t> bytes = Laid(directory);
+    if (directory.at != 0 && bytes.size() <= old.end - old.begin && Exclusive(old)) {
+      bytes.resize(old.end - old.begin);
+      Patch(old.begin, std::move(bytes));
+      return directory.at;
+    }
+    if (directory.at != 0) Erase(old);
+    return Append(bytes);
+  }
+
+  // Applies what concerns the directory that an entry of the first one leads to.
+  Status EditSub(uint16_t pointerTag, ExifPlace place, std::span<const DirectoryChange> changes,
+                 Directory& first) {
+    const auto concerns = [&](const DirectoryChange& change) { return change.place == place; };
+    if (std::ranges::none_of(changes, concerns)) return Status::Ok;
+    const auto pointer = std::ranges::find(first.entries, pointerTag, &Entry::tag);
+    Directory directory;
+    const bool there = pointer != first.entries.end();
+    if (there && !ReadDirectory(NumberOf(*pointer, 0), directory)) return Damaged();
+    for (const DirectoryChange& change : changes) {
+      if (concerns(change)) Apply(change, directory);
+    }
+    if (!directory.dirty) return Status::Ok;
+    const uint64_t at = Place(directory, false);
+    if (at == directory.at) return Status::Ok;
+    DirectoryChange change{.tag = pointerTag};
+    if (at != 0) {
+      const uint16_t type = at > UINT32_MAX ? kLong8 : kLong;
+      change.entry = ExifEntry{pointerTag, type, 1, std::vector<uint8_t>(kTypeBytes[type])};
+      for (size_t i = 0; i < change.entry->value.size(); ++i)
+        change.entry->value[i] = static_cast<uint8_t>(at >> 8 * i);
+    }
+    Apply(change, first);
+    return Status::Ok;
+  }
+
+  Status CheckGrowth() {
+    if (edit_.tail.empty()) return Status::Ok;
+    if (pointsBeyond_) {
+      reason_ = Tr("Its directories point beyond their end, so nothing can be added safely.");
+      return Status::UnsuitableImage;
+    }
+    if (!wide_ && file_.size() + edit_.tail.size() > UINT32_MAX) {
+      reason_ = Tr("A file of this kind cannot be larger than 4 GB.");
+      return Status::UnsuitableImage;
+    }
+    return Status::Ok;
+  }
+
+  const std::span<const uint8_t> file_;
+  DirectoryEdit& edit_;
+  std::string& reason_;
+  bool bigEndian_ = false, wide_ = false;
+  uint64_t firstAt_ = 4;  // where the offset of the first directory is
+  std::unordered_set<uint64_t> visited_;
+  std::vector<Range> used_;
+  uint64_t mappedNext_ = 0, mappedEntries_ = 0, pieces_ = 0;
+  bool pointsBeyond_ = false;  // something is said to be behind the end
+};
+
+}  // namespace
+
+void SwapExifNumbers(uint16_t type, std::span<uint8_t> values) {
+  const size_t unit = type < std::size(kNumberBytes) ? kNumberBytes[type] : 1;
+  if (unit < 2) return;
+  for (size_t i = 0; i + unit <= values.size(); i += unit)
+    std::reverse(values.begin() + static_cast<ptrdiff_t>(i),
+                 values.begin() + static_cast<ptrdiff_t>(i + unit));
+}
+
+Status EditDirectories(std::span<const uint8_t> file, std::span<const DirectoryChange> changes,
+                       DirectoryEdit& edit, std::string& reason) {
+  return Editor(file, edit, reason).Run(changes);
+}
+
+DirectoryValue FindDirectoryValue(std::span<const uint8_t> file, uint16_t tag) {
+  DirectoryEdit edit;
+  std::string reason;
+  return Editor(file, edit, reason).Find(tag);
+}
+
+void AddEdited(std::span<const uint8_t> file, DirectoryEdit edit, FilePieces& pieces) {
+  uint64_t at = 0;
+  for (DirectoryEdit::Patch& patch : edit.patches) {
+    pieces.Keep(file.subspan(at, patch.at - at));
+    at = patch.at + patch.bytes.size();
+    pieces.Add(std::move(patch.bytes));
+  }
+  pieces.Keep(file.subspan(at));
+  pieces.Add(std::move(edit.tail));
+}
+
+std::vector<uint8_t> EditedBlock(std::span<const uint8_t> block, DirectoryEdit edit) {
+  FilePieces pieces;
+  AddEdited(block, std::move(edit), pieces);
+  return pieces.Joined();
+}
+
+}  // namespace fotomill

@@ -1,0 +1,152 @@
+#include <algorithm>
+#include <cstring>
+
+#include "containers/jpeg_segments.h"
+#include "containers/png_chunks.h"
+#include "containers/riff_chunks.h"
+#include "core/byte_reader.h"
+#include "metadata/edit/picture_edit.h"
+#include "metadata/edit/strip.h"
+#include "metadata/exif/exif_walk.h"
+#include "texts/texts.h"
+
+namespace fotomill {
+
+namespace {
+
+constexpr const char* kOrientationName = TrLater("orientation");
+constexpr const char* kExifName = TrLater("EXIF");
+constexpr const char* kGpsName = TrLater("GPS");
+constexpr const char* kMakerNoteName = TrLater("maker notes");
+constexpr const char* kThumbnailName = TrLater("thumbnail");
+constexpr const char* kProfileName = TrLater("color profile");
+constexpr const char* kXmpName = TrLater("XMP");
+constexpr const char* kIptcName = TrLater("IPTC or Photoshop data");
+constexpr const char* kCommentsName = TrLater("comments");
+constexpr const char* kTimeName = TrLater("time");
+constexpr const char* kOtherName = TrLater("other data");
+
+class Found {
+ public:
+  void Add(const char* name) {
+    if (std::ranges::find(names_, name) == names_.end()) names_.push_back(name);
+  }
+  void AddExif(const ExifDirectories& exif) {
+    constexpr uint16_t kOrientation = 0x0112, kMakerNote = 0x927c;
+    if (FindExifEntry(exif.first, kOrientation) != nullptr) Add(kOrientationName);
+    const bool more = std::ranges::any_of(
+        exif.first, [](const ExifEntry& entry) { return entry.tag != kOrientation; });
+    if (more || !exif.exif.empty()) Add(kExifName);
+    if (!exif.gps.empty()) Add(kGpsName);
+    if (FindExifEntry(exif.exif, kMakerNote) != nullptr) Add(kMakerNoteName);
+  }
+  // Of a block of its own.
+  void AddBlock(std::span<const uint8_t> block) {
+    ExifFindings findings;
+    if (WalkExif(block, nullptr, &findings) && findings.thumbnailOffset != 0) Add(kThumbnailName);
+  }
+  std::vector<const char*> Take() { return std::move(names_); }
+
+ private:
+  std::vector<const char*> names_;
+};
+
+// Where the picture ends: behind the first EOI that is not in a segment.
+uint64_t EndOfJpeg(std::span<const uint8_t> file, uint64_t at) {
+  for (;;) {
+    const void* found = at < file.size() ? std::memchr(&file[at], 0xFF, file.size() - at) : nullptr;
+    if (found == nullptr) return file.size();
+    at = static_cast<uint64_t>(static_cast<const uint8_t*>(found) - file.data());
+    ByteReader bytes(file.subspan(at + 1));
+    const uint8_t marker = bytes.U8();
+    if (marker == 0xD9) return at + 2;
+    const bool alone = marker == 0 || marker == 0xFF || (marker >= 0xD0 && marker <= 0xD7);
+    at += marker == 0xFF ? 1 : alone ? 2 : 2 + std::max<uint64_t>(bytes.Be16(), 2);
+  }
+}
+
+void LookIntoJpeg(std::span<const uint8_t> file, Found& found) {
+  JpegHead head;
+  if (ParseJpegHead(file, head) != Status::Ok) return;
+  for (const JpegSegment& segment : head.segments) {
+    const uint8_t marker = segment.marker;
+    const bool application = (marker >= 0xE0 && marker <= 0xEF) || marker == 0xFE;
+    if (!application || (marker == 0xE0 && segment.Starts(std::string_view("JFIF\0", 5))) ||
+        (marker == 0xEE && segment.Starts("Adobe")))
+      continue;
+    if (marker == 0xE1 && segment.Starts("Exif")) {
+      found.AddBlock(segment.data.subspan(std::min(kExifHead.size(), segment.data.size())));
+    } else if (marker == 0xE1 && segment.Starts("http://ns.adobe.com/")) {
+      found.Add(kXmpName);
+    } else if (marker == 0xE2 && segment.Starts("ICC_PROFILE")) {
+      found.Add(kProfileName);
+    } else if (marker == 0xED) {
+      found.Add(kIptcName);
+    } else {
+      found.Add(marker == 0xFE ? kCommentsName : kOtherName);
+    }
+  }
+  if (EndOfJpeg(file, head.scan) < file.size()) found.Add(kOtherName);
+}
+
+void LookIntoPng(std::span<const uint8_t> file, Found& found) {
+  // chunks of the picture begin with a capital; these belong to it too
+  constexpr std::string_view kPicture[] = {"tRNS", "cHRM", "gAMA", "sBIT", "sRGB", "cICP", "mDCv",
+                                           "mDCV", "cLLi", "cLLI", "bKGD", "hIST", "pHYs", "sPLT",
+                                           "oFFs", "acTL", "fcTL", "fdAT"};
+  PngChunks chunks(file);
+  for (PngChunk chunk; chunks.Next(chunk);) {
+    const std::string_view type = chunk.type;
+    if (type[0] < 'a' || std::ranges::find(kPicture, type) != std::end(kPicture)) continue;
+    const bool text = type == "tEXt" || type == "zTXt" || type == "iTXt";
+    if (type == "eXIf") {
+      found.AddBlock(chunk.data);
+    } else if (text) {
+      found.Add(ByteReader(chunk.data).Match("XML:com.adobe.xmp") ? kXmpName : kCommentsName);
+    } else {
+      found.Add(type == "iCCP" ? kProfileName : type == "tIME" ? kTimeName : kOtherName);
+    }
+  }
+}
+
+void LookIntoWebp(std::span<const uint8_t> file, Found& found) {
+  constexpr std::string_view kPicture[] = {"VP8X", "ANIM", "ANMF", "ALPH", "VP8 ", "VP8L"};
+  RiffWalk walk(file);
+  for (RiffPlace chunk; walk.Next(chunk);) {
+    if (std::ranges::find(kPicture, chunk.name) != std::end(kPicture)) continue;
+    if (chunk.name == "EXIF") {
+      found.AddBlock(file.subspan(chunk.data, chunk.size));
+    } else {
+      found.Add(chunk.name == "ICCP" ? kProfileName : chunk.name == "XMP " ? kXmpName : kOtherName);
+    }
+  }
+}
+
+void LookIntoDirectory(std::span<const uint8_t> file, Found& found) {
+  constexpr struct {
+    uint16_t tag;
+    const char* name;
+  } kTags[] = {{700, kXmpName}, {33723, kIptcName}, {34377, kIptcName}, {34675, kProfileName},
+               {0xBC02, kOrientationName}};
+  for (const auto& tag : kTags) {
+    if (!FindDirectoryValue(file, tag.tag).bytes.empty()) found.Add(tag.name);
+  }
+}
+
+}  // namespace
+
+std::vector<const char*> MetadataLeft(std::span<const uint8_t> file) {
+  Found found;
+  found.AddExif(GatherPictureExif(file));
+  switch (MetadataFormOf(file)) {
+    case MetadataForm::Jpeg: LookIntoJpeg(file, found); break;
+    case MetadataForm::Png: LookIntoPng(file, found); break;
+    case MetadataForm::Webp: LookIntoWebp(file, found); break;
+    case MetadataForm::Tiff:
+    case MetadataForm::HdPhoto: LookIntoDirectory(file, found); break;
+    case MetadataForm::None: break;
+  }
+  return found.Take();
+}
+
+}  // namespace fotomill
