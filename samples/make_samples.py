@@ -102,7 +102,8 @@ def oval(column, row):
 # Fewer colors.
 
 def chosen_palette(picture, count):
-    """`count` colors: boxes of pixels are halved at the median of their widest channel, the most spread box first."""
+    """`count` colors: boxes of pixels are halved at the median of their widest channel, the most
+    spread box first."""
     def width(box, channel):
         return max(pixel[channel] for pixel in box) - min(pixel[channel] for pixel in box)
 
@@ -121,7 +122,8 @@ def chosen_palette(picture, count):
 
 
 def indexed(picture, palette, dither):
-    """The picture as rows of palette indexes; with `dither` each error spreads to the neighbours still to come."""
+    """The picture as rows of palette indexes; with `dither` each error spreads to the neighbors
+    still to come."""
     nearest = {}
     rows = [[list(pixel) for pixel in row] for row in picture]
     result = [[0] * WIDTH for _ in rows]
@@ -138,7 +140,8 @@ def indexed(picture, palette, dither):
             for dx, dy, share in ((1, 0, 7), (-1, 1, 3), (0, 1, 5), (1, 1, 1)):
                 if 0 <= x + dx < WIDTH and y + dy < HEIGHT:
                     for c in range(3):
-                        rows[y + dy][x + dx][c] += (wanted[c] - palette[result[y][x]][c]) * share / 16
+                        error = wanted[c] - palette[result[y][x]][c]
+                        rows[y + dy][x + dx][c] += error * share / 16
     return result
 
 
@@ -154,7 +157,8 @@ def packed(indexes, bits):
 
 
 def bmp_rows(rows, row_bytes):
-    """Rows from top to bottom as BMP stores them: bottom row first, each padded to a multiple of four bytes."""
+    """Rows from top to bottom as BMP stores them: bottom row first, each padded to a multiple of
+    four bytes."""
     return b"".join(row_bytes(row) + bytes(-len(row_bytes(row)) % 4) for row in reversed(rows))
 
 
@@ -165,8 +169,8 @@ def blue_first(row):
 def high_color(row, green_bits):
     """16-bit pixels: 5 bits of red and blue with 5 or 6 of green between them."""
     green_most = 2 ** green_bits - 1
-    return b"".join(struct.pack("<H",
-                                r * 31 // 255 << (5 + green_bits) | g * green_most // 255 << 5 | b * 31 // 255)
+    return b"".join(struct.pack("<H", r * 31 // 255 << (5 + green_bits) |
+                                g * green_most // 255 << 5 | b * 31 // 255)
                     for r, g, b in row)
 
 
@@ -197,7 +201,8 @@ def run_length(row, at):
 
 
 def bmp_runs(rows, bits):
-    """Rows from top to bottom in BMP's run-length code: runs of three and more, absolute runs between them."""
+    """Rows from top to bottom in BMP's run-length code: runs of three and more, absolute runs
+    between them."""
     out = b""
     for row in reversed(rows):
         at = 0
@@ -236,7 +241,8 @@ def pcx_runs(line):
 
 
 def pcx(bits, rows, palette=()):
-    """`rows` holds for each row its planes as byte strings; they are made an even number of bytes long."""
+    """`rows` holds for each row its planes as byte strings; they are made an even number of bytes
+    long."""
     rows = [[plane + bytes(len(plane) % 2) for plane in row] for row in rows]
     first = b"".join(bytes(color) for color in palette[:16]).ljust(48, b"\0")
     header = struct.pack("<4B6H48sBBHH58x", 10, 5, 1, bits, 0, 0, WIDTH - 1, HEIGHT - 1, 72, 72,
@@ -263,7 +269,8 @@ def xbm(rows, name):
     values = [f"0x{255 - int(''.join(map(str, row[at:at + 8][::-1])), 2):02x}"
               for row in rows for at in range(0, len(row), 8)]
     lines = [", ".join(values[at:at + 12]) for at in range(0, len(values), 12)]
-    return (f"#define {name}_width {len(rows[0])}\n#define {name}_height {len(rows)}\nstatic char {name}_bits[] = {{\n"
+    return (f"#define {name}_width {len(rows[0])}\n#define {name}_height {len(rows)}\n"
+            f"static char {name}_bits[] = {{\n"
             + ",\n".join(lines) + "};\n").encode()
 
 
@@ -285,7 +292,8 @@ def pack_bits(line):
 
 
 def mac_paint(rows, name):
-    """`rows` are indexes, 0 black. They stand in the middle of the page, behind a MacBinary header without dates."""
+    """`rows` are indexes, 0 black. They stand in the middle of the page, behind a MacBinary header
+    without dates."""
     left, top = (576 - len(rows[0])) // 2, (720 - len(rows)) // 2
     page = [[0] * 576 for _ in range(720)]
     for y, row in enumerate(rows):

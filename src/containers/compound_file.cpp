@@ -11,8 +11,8 @@
 //       68    8  first sector that continues the list below, and number of such sectors
 //       76  436  the sectors of the sector table
 //
-// The sector table (FAT) has 4 bytes per sector: the next sector of the same stream, or FFFFFFFE and
-// above at its end. The directory is such a chain of 128-byte entries:
+// The sector table (FAT) has 4 bytes per sector: the next sector of the same stream, or FFFFFFFE
+// and above at its end. The directory is such a chain of 128-byte entries:
 //
 //        0   64  name, UTF-16
 //       64    2  its size in bytes, including the terminator

@@ -19,13 +19,15 @@ faults = []
 
 def photo(width, height):
     """Gradients with texture, like a photograph."""
-    texture = Image.effect_noise((width // 4, height // 4), 40).resize((width, height), Image.Resampling.BICUBIC)
+    texture = Image.effect_noise((width // 4, height // 4), 40).resize((width, height),
+                                                                       Image.Resampling.BICUBIC)
     slope = Image.linear_gradient("L").resize((width, height))
     return Image.merge("RGB", (slope, texture, ImageChops.add(slope, texture, 2)))
 
 
 def apply(*arguments, status=0):
-    run = subprocess.run([FOTOMILL, "apply", *map(str, arguments), "--json"], capture_output=True, text=True, check=False)
+    run = subprocess.run([FOTOMILL, "apply", *map(str, arguments), "--json"], capture_output=True,
+                         text=True, check=False)
     if run.returncode != status:
         faults.append(f"{arguments}: status {run.returncode}: {run.stderr}")
     return json.loads(run.stdout or "[]")
@@ -43,9 +45,12 @@ def outputs(work):
                       "output small\n  resize 100x100 pad background=white\n  save to=webp max-bytes=2k dest=small\n"
                       "output named\n  gray\n  save to=png name=\"%F of %W\"\n")
     results = apply(work / "a.jpg", "--recipe", recipe, "--dest", work / "out")
-    expect(f"outputs: {results}", [result.get("output") for result in results] == ["large", "small", "named"])
+    expect(f"outputs: {results}",
+           [result.get("output") for result in results] == ["large", "small", "named"])
     places = [Path(result["destination"]).relative_to(work / "out") for result in results]
-    expect(f"places: {places}", [str(place) for place in places] == ["Cropped_ a-large.jpg", "small/Cropped_ a-small.webp", "a of 800.png"])
+    expect(f"places: {places}",
+           [str(place) for place in places] ==
+           ["Cropped_ a-large.jpg", "small/Cropped_ a-small.webp", "a of 800.png"])
     sizes = [Image.open(work / "out" / place).size for place in places]
     expect(f"sizes: {sizes}", sizes == [(400, 300), (100, 100), (800, 600)])
     expect("max-bytes", 500 < (work / "out" / places[1]).stat().st_size <= 2048)
@@ -53,7 +58,8 @@ def outputs(work):
 
 
 def limits(work):
-    results = apply(work / "a.jpg", "--do", "save max-bytes=200", "--dest", work / "tight", status=1)
+    results = apply(work / "a.jpg", "--do", "save max-bytes=200", "--dest", work / "tight",
+                    status=1)
     expect(f"too tight: {results}", [result["status"] for result in results] == [13])
     expect("too tight: a file", not any((work / "tight").glob("*")))
     results = apply(work / "a.jpg", "--do", "save max-bytes=60k", "--dest", work / "fits")
@@ -64,11 +70,13 @@ def limits(work):
 def reduced(work):
     """Reduced-size decoding differs by at most 3 levels; a no-op as first step prevents it."""
     for source in ("a.jpg", "odd.jpg", "turned.jpg"):
-        for line in ("resize 300", "resize 12%", "resize 200x200 fill", "resize 250x80 stretch filter=lanczos3", "resize 100 filter=mitchell"):
+        for line in ("resize 300", "resize 12%", "resize 200x200 fill",
+                     "resize 250x80 stretch filter=lanczos3", "resize 100 filter=mitchell"):
             pictures = []
             for i, steps in enumerate((line, "offset 0 0; " + line)):
                 target = work / f"{i}.png"
-                apply(work / source, "--do", steps, "--to", "png", "--out", target, "--overwrite", "replace")
+                apply(work / source, "--do", steps, "--to", "png", "--out", target, "--overwrite",
+                      "replace")
                 pictures.append(Image.open(target).convert("RGB"))
             if pictures[0].size != pictures[1].size:
                 faults.append(f"{source}: {line}: {pictures[0].size}, not {pictures[1].size}")
@@ -80,9 +88,11 @@ def reduced(work):
 def hints(work):
     """Missing resources of operations are named, and a macro's text is not parsed as a recipe."""
     (work / "fonts.conf").write_text("<fontconfig></fontconfig>")
-    for steps, text in (("text x", "No font was found"), ("output a\n  caption x", "No font was found")):
+    for steps, text in (("text x", "No font was found"),
+                        ("output a\n  caption x", "No font was found")):
         environment = dict(os.environ, LC_ALL="C", FONTCONFIG_FILE=str(work / "fonts.conf"))
-        run = subprocess.run([FOTOMILL, "apply", work / "a.jpg", "--do", steps, "--dest", work / "none"], env=environment,
+        run = subprocess.run([FOTOMILL, "apply", work / "a.jpg", "--do", steps, "--dest",
+                              work / "none"], env=environment,
                              capture_output=True, text=True, check=False)
         expect(f"{steps}: {run.stderr}", run.returncode == 1 and text in run.stderr)
     (work / "b\\n1.jpg").write_bytes((work / "a.jpg").read_bytes())

@@ -47,7 +47,8 @@ COMP_TYPE=63
 check fotomill config un "unset"
 COMP_WORDS=(fotomill config "") COMP_CWORD=2 COLUMNS=60
 _fotomill
-[[ "${COMPREPLY[*]}" == *"describe                 (explain keys"* ]] || { echo "bash shows no descriptions: ${COMPREPLY[*]}"; faults=1; }
+[[ "${COMPREPLY[*]}" == *"describe                 (explain keys"* ]] ||
+  { echo "bash shows no descriptions: ${COMPREPLY[*]}"; faults=1; }
 unset COMP_TYPE
 
 # The same with zsh and fish, if installed.
@@ -100,7 +101,7 @@ if command -v fish > /dev/null; then
   fishCheck "fotomill completion z" "zsh"
 fi
 
-# The lists in the PowerShell script, which is rarely installed to run it: balanced, and quotes doubled.
+# The lists in the PowerShell script, which is rarely installed to run it: balanced, quotes doubled.
 "$FOTOMILL" completion powershell > "$folder/fotomill.ps1"
 python3 - "$folder/fotomill.ps1" << 'END' || faults=1
 import re, sys
@@ -115,7 +116,8 @@ if wrong:
     sys.exit("PowerShell: " + ", ".join(wrong))
 END
 if command -v pwsh > /dev/null; then
-  found=$(pwsh -NoProfile -Command ". $folder/fotomill.ps1; (TabExpansion2 'fotomill config g' 17).CompletionMatches.CompletionText")
+  matches="(TabExpansion2 'fotomill config g' 17).CompletionMatches.CompletionText"
+  found=$(pwsh -NoProfile -Command ". $folder/fotomill.ps1; $matches")
   [[ "$found" == get ]] || { echo "PowerShell: $found"; faults=1; }
 fi
 exit $faults

@@ -38,16 +38,24 @@ STEPS = [
     (["set", "PrefixCrop", "x" * 33], 2, b"", "at most 32 characters", None),
     (["set", "-n", "UseAlphaChannels", "No"], 0, b"UseAlphaChannels: 1 -> 0\n", "", None),
     (["set", "-n", "WriteOS2Bitmaps", "on"], 0, b"WriteOS2Bitmaps: 0 -> 1\n", "", None),
-    (["set", "UseAlphaChannels", "maybe"], 2, b"", "UseAlphaChannels takes yes or no (1 or 0).", None),
-    (["set", "-n", "AlphaBackground", "#FF8000"], 0, b"AlphaBackground: 16777215 -> 33023\n", "", None),
-    (["set", "-n", "AlphaBackground", "#F80"], 0, b"AlphaBackground: 16777215 -> 35071\n", "", None),
-    (["set", "-n", "AlphaBackground", "navy"], 0, b"AlphaBackground: 16777215 -> 8388608\n", "", None),
-    (["set", "-n", "AlphaBackground", "33023"], 0, b"AlphaBackground: 16777215 -> 33023\n", "", None),
+    (["set", "UseAlphaChannels", "maybe"], 2, b"", "UseAlphaChannels takes yes or no (1 or 0).",
+     None),
+    (["set", "-n", "AlphaBackground", "#FF8000"], 0, b"AlphaBackground: 16777215 -> 33023\n", "",
+     None),
+    (["set", "-n", "AlphaBackground", "#F80"], 0, b"AlphaBackground: 16777215 -> 35071\n", "",
+     None),
+    (["set", "-n", "AlphaBackground", "navy"], 0, b"AlphaBackground: 16777215 -> 8388608\n", "",
+     None),
+    (["set", "-n", "AlphaBackground", "33023"], 0, b"AlphaBackground: 16777215 -> 33023\n", "",
+     None),
     (["set", "AlphaBackground", "#FF80"], 2, b"", "#RRGGBB", None),
     (["set", "AlphaBackground", "transparent"], 2, b"", "a name such as orange", None),
-    (["set", "-n", "ArchiveSortMode", "3"], 0, b"ArchiveSortMode: 0 -> 3\n", "This build does not use ArchiveSortMode.", None),
-    (["describe", "PngCompression"], 0, b"PngCompression=9\n    Default: 9\n    Takes a number from 0 to 9.\n"
-     b"    Compression effort of PNG files, 0 to 9. Always lossless; 9 takes longest\n    and gives the smallest files.\n", "", None),
+    (["set", "-n", "ArchiveSortMode", "3"], 0, b"ArchiveSortMode: 0 -> 3\n",
+     "This build does not use ArchiveSortMode.", None),
+    (["describe", "PngCompression"], 0,
+     b"PngCompression=9\n    Default: 9\n    Takes a number from 0 to 9.\n"
+     b"    Compression effort of PNG files, 0 to 9. Always lossless; 9 takes longest\n"
+     b"    and gives the smallest files.\n", "", None),
     (["describe", "ThumbnailMatte"], 0, None, "", None),
     (["describe", "PngCompresion"], 2, b"", "PngCompression", None),
     (["set", "VersionNumber", "1"], 2, b"", "internal value", None),
@@ -89,19 +97,25 @@ def test_set_wins_for_one_run(folder):
 
 def test_json(folder):
     keys = json.loads(run(folder, "config", "list", "--json")[1])
-    check("fields", {tuple(key) for key in keys}, {("name", "type", "value", "default", "used", "values", "description")})
+    check("fields", {tuple(key) for key in keys},
+          {("name", "type", "value", "default", "used", "values", "description")})
     by_name = {key["name"]: key for key in keys}
     check("first and last", (keys[0]["name"], keys[-1]["name"]),
           ("AllowDestinationOverrides", "WriteOS2Bitmaps"))
     check("levels", by_name["TextCharacterLevels"]["value"], "\u00ff.:-+|=%o#&XOB@")
     quality = by_name["JpegCompression"]
-    check("number", (quality["name"], quality["type"], quality["value"], quality["default"], quality["values"], quality["used"]),
+    check("number", (quality["name"], quality["type"], quality["value"], quality["default"],
+                     quality["values"], quality["used"]),
           ("JpegCompression", 0x44, 75, 75, "a number from 0 to 100", True))
-    check("unused", (by_name["ArchiveSortMode"]["used"], by_name["ArchiveSortMode"]["description"]), (False, ""))
+    check("unused", (by_name["ArchiveSortMode"]["used"], by_name["ArchiveSortMode"]["description"]),
+          (False, ""))
     used = run(folder, "config", "list", "--used")[1].decode("latin-1").split("\n")
-    check("used", [line.split("=")[0] for line in used[:-1]], [key["name"] for key in keys if key["used"]])
-    check("color for people", b"ThumbnailMatte=#CCCCCC\n    Default: #CCCCCC\n" in run(folder, "config", "describe", "ThumbnailMatte")[1], True)
-    check("verbose list", b"PngCompression=9\n    Default: 9\n" in run(folder, "config", "list", "-v")[1], True)
+    check("used", [line.split("=")[0] for line in used[:-1]],
+          [key["name"] for key in keys if key["used"]])
+    described = run(folder, "config", "describe", "ThumbnailMatte")[1]
+    check("color for people", b"ThumbnailMatte=#CCCCCC\n    Default: #CCCCCC\n" in described, True)
+    check("verbose list", b"PngCompression=9\n    Default: 9\n" in run(folder, "config", "list",
+                                                                       "-v")[1], True)
     text = run(folder, "config", "list")[1].split(b"\n")
     check("same rows as text", [line.split(b"=")[0].decode() for line in text[:-1]],
           [key["name"] for key in keys])
@@ -111,7 +125,8 @@ def test_many_at_once(folder):
     names = [key["name"] for key in json.loads(run(folder, "config", "list", "--json")[1])
              if key["type"] == 4][:40]
     command = [PROGRAM, "--data", str(folder), "config", "set"]
-    for process in [subprocess.Popen([*command, name, "77"], stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL) for name in names]:
+    for process in [subprocess.Popen([*command, name, "77"], stdout=subprocess.DEVNULL,
+                                     stderr=subprocess.DEVNULL) for name in names]:
         check("exit status", process.wait(), 0)
     lines = (folder / NAME).read_text().split("\n")
     check("every process's key", sorted(lines[1:-1]), sorted(f"{name}=77" for name in names))

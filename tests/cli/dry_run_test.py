@@ -1,5 +1,6 @@
 #!/usr/bin/env python3
-"""A dry run reports the failures of the real run, and changes nothing. $FOTOMILL names the program."""
+"""A dry run reports the failures of the real run, and changes nothing. $FOTOMILL names the
+program."""
 import sys
 
 from place import Place, bitmap, check, finish
@@ -49,7 +50,8 @@ def main():
             check(place.names("data"), [], f"{arguments}: the data folder after a dry run")
             check(status, 1 if fails else 0, f"{arguments}: status of the dry run")
             real = place.run(*arguments)
-            check((real[0], real[1], failed(real[2])), (status, out, failed(err)), f"{arguments}: the run after it")
+            check((real[0], real[1], failed(real[2])), (status, out, failed(err)),
+                  f"{arguments}: the run after it")
     return finish()
 
 

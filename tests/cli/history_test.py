@@ -27,10 +27,13 @@ def main():
         for options, expected in (([], functions), (["--no-history"], [])):
             with Place() as place:
                 place.files("a.bmp")
-                check(place.run("--set", ALL, *arguments, *options)[0], 0, f"{arguments} {options}: status")
+                check(place.run("--set", ALL, *arguments, *options)[0], 0,
+                      f"{arguments} {options}: status")
                 lines = place.run("--set", ALL, "history", "list")[1].splitlines()
-                check([line.split("\t")[1] for line in lines], expected, f"{arguments} {options}: history")
-                check("FMWFileHistoryDatabase.fhdb" in place.names("data"), expected != [], f"{arguments} {options}: its file")
+                check([line.split("\t")[1] for line in lines], expected,
+                      f"{arguments} {options}: history")
+                check("FMWFileHistoryDatabase.fhdb" in place.names("data"), expected != [],
+                      f"{arguments} {options}: its file")
     return finish()
 
 

@@ -62,8 +62,8 @@ def gray_png(side):
 
 def webp(width, height):
     """Lossless, all pixels equal: a header and five codes with one symbol."""
-    stream = b"\x2f" + struct.pack("<I",
-                                   width - 1 | height - 1 << 14) + b"\x88\x88\x08\x88\x88\x88\x88\x00\x00\x00\x00\x00"
+    stream = b"\x2f" + struct.pack("<I", width - 1 | height - 1 << 14)
+    stream += b"\x88\x88\x08\x88\x88\x88\x88\x00\x00\x00\x00\x00"
     stream += bytes(len(stream) % 2)
     riff = b"WEBPVP8L" + struct.pack("<I", len(stream)) + stream
     return b"RIFF" + struct.pack("<I", len(riff)) + riff

@@ -33,7 +33,9 @@ printf 'P6\n2 1\n255\n\1\2\3\4\5\6' >"$work/a.ppm"
 Expect "the plug-in is found" "0" \
   "$("$prefix/bin/fotomill" convert "$work/a.ppm" --to bmp >/dev/null 2>&1; echo $?)"
 Expect "what it wrote" "2x1" "$("$prefix/bin/fotomill" info --json "$work/a.bmp" |
-  python3 -c 'import json,sys; p=json.load(sys.stdin)[0]; print("%dx%d" % (p["width"], p["height"]))')"
+  python3 -c 'import json,sys
+p = json.load(sys.stdin)[0]
+print("%dx%d" % (p["width"], p["height"]))')"
 
 # Every command has a man page, and groff reports no warnings.
 commands=$("$prefix/bin/fotomill" help | sed -nE '/^Commands/,/^$/ s/^  ([a-z -]+[a-z])  .*/\1/p' |
@@ -50,8 +52,9 @@ for file in bash-completion/completions/fotomill zsh/site-functions/_fotomill \
 done
 
 if [[ -x $prefix/bin/fotomill-desktop ]]; then
-  for file in man/man1/fotomill-desktop.1 applications/fotomill-desktop.desktop icons/hicolor/scalable/apps/fotomill-desktop.svg \
-    mime/packages/fotomill-formats.xml thumbnailers/fotomill.thumbnailer metainfo/fotomill-desktop.metainfo.xml; do
+  for file in man/man1/fotomill-desktop.1 applications/fotomill-desktop.desktop \
+    icons/hicolor/scalable/apps/fotomill-desktop.svg mime/packages/fotomill-formats.xml \
+    thumbnailers/fotomill.thumbnailer metainfo/fotomill-desktop.metainfo.xml; do
     Expect "$file" "yes" "$([[ -s $prefix/share/$file ]] && echo yes)"
   done
   ! command -v desktop-file-validate >/dev/null ||

@@ -105,8 +105,8 @@ def terminal(folder):
         expect(f"answer {answer!r}", run.end() == status, run.seen)
         expect(f"answer {answer!r}: the name", name is None or (out.parent / name).exists(),
                run.seen)
-    expect("names on the terminal", sorted(path.name
-                                           for path in out.parent.iterdir()) == ["one.pcx", "other.pcx"])
+    expect("names on the terminal",
+           sorted(path.name for path in out.parent.iterdir()) == ["one.pcx", "other.pcx"])
 
     run = Terminal("convert", folder / "in", "--to", "gif", "--reduce", "--dest", out.parent)
     run.until(" left")

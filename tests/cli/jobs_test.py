@@ -13,12 +13,14 @@ except ImportError:
 
 PROJECT = Path(__file__).resolve().parents[2]
 FOTOMILL = Path(os.environ["FOTOMILL"])
-WRITES = {"--dest": Path.is_dir, "--out": Path.is_file}  # the expected result for the option's value
+WRITES = {"--dest": Path.is_dir,
+          "--out": Path.is_file}  # the expected result for the option's value
 
 
 def photo(path, seed, size=(320, 240), orientation=1):
     image = Image.radial_gradient("L").resize(size).convert("RGB")
-    ImageDraw.Draw(image).rectangle([seed * 9, 40, seed * 9 + 60, 120], fill=(200, seed * 20 % 256, 40))
+    ImageDraw.Draw(image).rectangle([seed * 9, 40, seed * 9 + 60, 120],
+                                    fill=(200, seed * 20 % 256, 40))
     exif = Image.Exif()
     exif[0x0112] = orientation
     exif[0x0132] = f"2026:07:{seed:02} 10:00:00"
@@ -67,17 +69,22 @@ def main():
     with tempfile.TemporaryDirectory() as name:
         folder = Path(name)
         prepare(folder)
-        environment = dict(os.environ, PATH=f"{FOTOMILL.parent}:{os.environ['PATH']}", FOTOMILL_DATA=str(folder / "data"))
+        environment = dict(os.environ, PATH=f"{FOTOMILL.parent}:{os.environ['PATH']}",
+                           FOTOMILL_DATA=str(folder / "data"))
         for line in jobs():
             count += 1
-            result = subprocess.run(["bash", "-o", "pipefail", "-c", line], cwd=folder, env=environment, capture_output=True,
+            result = subprocess.run(["bash", "-o", "pipefail", "-c", line], cwd=folder,
+                                    env=environment, capture_output=True,
                                     text=True, stdin=subprocess.DEVNULL)
             words = line.split()
-            wanted = [(folder / words[i + 1], WRITES[word]) for i, word in enumerate(words) if word in WRITES]
-            missing = [path.name for path, is_there in wanted if "--dry-run" not in words and not is_there(path)]
+            wanted = [(folder / words[i + 1], WRITES[word]) for i, word in enumerate(words)
+                      if word in WRITES]
+            missing = [path.name for path, is_there in wanted if "--dry-run" not in words
+                       and not is_there(path)]
             if result.returncode != 0 or missing or not (result.stdout or wanted):
                 failures += 1
-                print(f"{line}\n  status {result.returncode}, missing {missing}\n{result.stdout}{result.stderr}")
+                print(f"{line}\n  status {result.returncode}, missing {missing}")
+                print(f"{result.stdout}{result.stderr}")
         renamed = sorted(path.name for path in (folder / "holiday").glob("*.jpg"))
         if renamed != [f"IMG_{i}.jpg" for i in range(1, 5)]:
             failures += 1

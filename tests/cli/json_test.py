@@ -1,5 +1,6 @@
 #!/usr/bin/env python3
-"""Every command with output supports JSON; -v and -q work everywhere; dumb terminals get no colors."""
+"""Every command with output supports JSON; -v and -q work everywhere; dumb terminals get no
+colors."""
 import json
 import os
 import pty
@@ -14,7 +15,8 @@ faults = []
 
 
 def run(folder, *arguments):
-    result = subprocess.run([PROGRAM, "--data", str(folder / "data"), *arguments], cwd=folder, stdin=subprocess.DEVNULL,
+    result = subprocess.run([PROGRAM, "--data", str(folder / "data"), *arguments], cwd=folder,
+                            stdin=subprocess.DEVNULL,
                             capture_output=True, text=True, env={**os.environ, "LC_ALL": "C"})
     return result.returncode, result.stdout, result.stderr
 
@@ -31,7 +33,8 @@ COMMANDS = [
     ("history clear -n", 0, {"deleted": False}),
     ("history clear", 0, {"deleted": True}),
     ("thumbs make a.bmp", 0, {"file": "a.bmp", "made": True}),
-    ("thumbs show a.THN --out t.bmp", 0, {"file": "a.THN", "destination": "t.bmp", "status": 0, "message": "Ok"}),
+    ("thumbs show a.THN --out t.bmp", 0, {"file": "a.THN", "destination": "t.bmp", "status": 0,
+                                          "message": "Ok"}),
     ("thumbs show a.THN --out t.bmp", 1, {"file": "t.bmp", "status": 10}),
     ("thumbs draw a.bmp --out d.bmp", 0, {"destination": "d.bmp"}),
     ("thumbs draw none.bmp --out e.bmp", 1, {"file": "none.bmp", "status": 1}),
@@ -68,7 +71,8 @@ def test_json(folder):
 
 
 def test_global_options(folder):
-    names = [line.split("  ")[1] for line in run(folder, "help")[1].split("\n\n")[2].split("\n")[1:] if line.startswith("  ")]
+    names = [line.split("  ")[1] for line in run(folder, "help")[1].split("\n\n")[2].split("\n")[1:]
+             if line.startswith("  ")]
     for name in names:
         if name == "help":
             continue
@@ -80,15 +84,20 @@ def test_global_options(folder):
     check("verbose", (status, error.count("It took ")), (0, 1))
     check("quiet", run(folder, "verify", "-v", "-q", str(SAMPLE))[2], "")
     (folder / "bad.bmp").write_bytes(b"BM")
-    check("count line", run(folder, "verify", str(SAMPLE), "bad.bmp")[2].split("\n")[1:], ["There were errors", "2 files were processed, 1 failed.", ""])
-    lines = run(folder, "convert", str(SAMPLE), "bad.bmp", "--to", "pcx", "--dest", "out")[2].split("\n")
-    check("lines of a batch", lines[1:], ["One file failed.", "There were errors", "2 files were processed.", ""])
+    check("count line", run(folder, "verify", str(SAMPLE), "bad.bmp")[2].split("\n")[1:],
+          ["There were errors", "2 files were processed, 1 failed.", ""])
+    lines = run(folder, "convert", str(SAMPLE), "bad.bmp", "--to", "pcx", "--dest",
+                "out")[2].split("\n")
+    check("lines of a batch", lines[1:], ["One file failed.", "There were errors",
+                                          "2 files were processed.", ""])
 
 
 def error_on_terminal(folder, terminal):
     master, slave = pty.openpty()
-    subprocess.run([PROGRAM, "verify", "bad.bmp"], cwd=folder, stdin=subprocess.DEVNULL, stdout=subprocess.DEVNULL, stderr=slave,
-                   env={**{k: v for k, v in os.environ.items() if k != "NO_COLOR"}, "TERM": terminal})
+    subprocess.run([PROGRAM, "verify", "bad.bmp"], cwd=folder, stdin=subprocess.DEVNULL,
+                   stdout=subprocess.DEVNULL, stderr=slave,
+                   env={**{k: v for k, v in os.environ.items() if k != "NO_COLOR"},
+                        "TERM": terminal})
     os.close(slave)
     text = os.read(master, 10000)
     os.close(master)

@@ -1,4 +1,5 @@
-"""Shared by the scripts of this folder: a folder with files where the program is run, and checks."""
+"""Shared by the scripts of this folder: a folder with files where the program is run, and
+checks."""
 import os
 import shutil
 import struct
@@ -27,7 +28,8 @@ def finish():
 def bitmap(width=3, height=2):
     """A black BMP of 24 bits."""
     row = (width * 3 + 3) // 4 * 4
-    return struct.pack("<2sIHHIIiiHHIIiiII", b"BM", 54 + row * height, 0, 0, 54, 40, width, height, 1, 24, 0, row * height,
+    return struct.pack("<2sIHHIIiiHHIIiiII", b"BM", 54 + row * height, 0, 0, 54, 40, width, height,
+                       1, 24, 0, row * height,
                        0, 0, 0, 0) + bytes(row * height)
 
 
@@ -35,7 +37,8 @@ class Place:
     """With `ordinary`, the program is run by a user without root privileges."""
 
     def __init__(self, ordinary=False):
-        self.user = {"user": NOBODY, "group": NOBODY, "extra_groups": []} if ordinary and os.geteuid() == 0 else {}
+        self.user = {"user": NOBODY, "group": NOBODY,
+                     "extra_groups": []} if ordinary and os.geteuid() == 0 else {}
 
     def __enter__(self):
         self.path = Path(tempfile.mkdtemp(prefix="place-"))
@@ -43,7 +46,8 @@ class Place:
             (self.path / name).mkdir()
         for path in (self.path, self.path / "data", self.path / "tmp"):
             path.chmod(0o777)
-        self.environment = {**os.environ, "FOTOMILL_DATA": str(self.path / "data"), "TMPDIR": str(self.path / "tmp")}
+        self.environment = {**os.environ, "FOTOMILL_DATA": str(self.path / "data"),
+                            "TMPDIR": str(self.path / "tmp")}
         return self
 
     def __exit__(self, *_):
@@ -51,7 +55,8 @@ class Place:
         shutil.rmtree(self.path)
 
     def files(self, *names, contents=None, time=None):
-        """Creates files with their folders; bitmaps unless contents are given. `time` is in nanoseconds."""
+        """Creates files with their folders; bitmaps unless contents are given. `time` is in
+        nanoseconds."""
         for name in names:
             path = self.path / name
             path.parent.mkdir(parents=True, exist_ok=True)
@@ -66,12 +71,14 @@ class Place:
         return sorted(path.name for path in (self.path / folder).iterdir())
 
     def start(self, *arguments, stdin=subprocess.DEVNULL, stdout=subprocess.PIPE, **more):
-        return subprocess.Popen([PROGRAM, *arguments], cwd=self.path, stdin=stdin, stdout=stdout, stderr=subprocess.PIPE,
+        return subprocess.Popen([PROGRAM, *arguments], cwd=self.path, stdin=stdin, stdout=stdout,
+                                stderr=subprocess.PIPE,
                                 env=self.environment, **self.user, **more)
 
     def run_bytes(self, *arguments, given=None, **more):
         """Exit status, standard output and standard error; `given` is standard input."""
-        process = self.start(*arguments, stdin=subprocess.DEVNULL if given is None else subprocess.PIPE, **more)
+        process = self.start(*arguments, stdin=subprocess.DEVNULL
+                             if given is None else subprocess.PIPE, **more)
         try:
             out, err = process.communicate(given, timeout=60)
         except subprocess.TimeoutExpired:

@@ -31,7 +31,8 @@ def scene(seed):
 
 
 def search(data, *arguments, status=0):
-    run = subprocess.run([FOTOMILL, "similar", "--data", data, "--json", *map(str, arguments)], capture_output=True, text=True, check=False)
+    run = subprocess.run([FOTOMILL, "similar", "--data", data, "--json", *map(str, arguments)],
+                         capture_output=True, text=True, check=False)
     if run.returncode != status:
         faults.append(f"{arguments}: status {run.returncode}: {run.stderr}")
     return json.loads(run.stdout or "[]")
@@ -61,12 +62,14 @@ with tempfile.TemporaryDirectory() as name:
     alike = [["a.png", "b.jpg", "c.bmp"], ["e.png", "f.bmp"]]
     groups = search(data, work, status=1)
     expect("alike", groups, alike)
-    if groups and (groups[0]["files"][1].get("width"), groups[0]["files"][1].get("height")) != (211, 158):
+    second = groups[0]["files"][1] if groups else {}
+    if groups and (second.get("width"), second.get("height")) != (211, 158):
         faults.append(f"size: {groups[0]['files'][1]}")
     if groups and groups[0]["files"][0].get("bytes") != (work / "a.png").stat().st_size:
         faults.append("bytes")
     (work / "broken.png").unlink()
-    expect("turned", search(data, work, "--transforms"), [["a.png", "b.jpg", "c.bmp", "d.png"], ["e.png", "f.bmp"]])
+    expect("turned", search(data, work, "--transforms"),
+           [["a.png", "b.jpg", "c.bmp", "d.png"], ["e.png", "f.bmp"]])
     expect("exact", search(data, work, "--exact"), [["e.png", "f.bmp"]])
     expect("named twice", search(data, work / "a.png", work / "a.png", work / "g.png"), [])
     expect("nothing", search(data, work / "a.png", work / "g.png"), [])

@@ -27,14 +27,18 @@ def main():
     faults = []
 
     if shutil.which("readelf"):
-        dynamic = subprocess.run(["readelf", "-d", PROGRAM], capture_output=True, text=True, check=True).stdout
-        needed = {plain(name) for name in re.findall(r"NEEDED.*\[(.*)\]", dynamic) if not SYSTEM.match(name)}
-        shared = {plain(name) for name, library in libraries.items() if library["linking"] == "shared"}
+        dynamic = subprocess.run(["readelf", "-d", PROGRAM], capture_output=True, text=True,
+                                 check=True).stdout
+        needed = {plain(name) for name in re.findall(r"NEEDED.*\[(.*)\]", dynamic)
+                  if not SYSTEM.match(name)}
+        shared = {plain(name) for name, library in libraries.items()
+                  if library["linking"] == "shared"}
         shared -= {"stdc++"} - needed
         needed = {{"z": "zlib", "webpmux": "webp"}.get(name, name) for name in needed}
         if needed - shared:
             faults.append(f"the program needs {needed - shared}, --version has {shared}")
-        inside = {plain(name) for name, library in libraries.items() if library["linking"] == "inside"}
+        inside = {plain(name) for name, library in libraries.items()
+                  if library["linking"] == "inside"}
         if needed & inside:
             faults.append(f"not inside, but loaded: {needed & inside}")
 
@@ -45,7 +49,8 @@ def main():
         faults.append(f"--version has other libraries than --json: {lines[1:]}")
     licenses = output("--version", "--licenses")
     for name, library in libraries.items():
-        if not library["license"] or f": {library['license']}\n  Copyright {library['copyright']}\n" not in licenses:
+        told = f": {library['license']}\n  Copyright {library['copyright']}\n"
+        if not library["license"] or told not in licenses:
             faults.append(f"license of {name}: {library['license']}")
 
     # Topics are also in the manual.

@@ -1,5 +1,6 @@
 #!/usr/bin/env python3
-"""Accessibility of the real program: every control that takes the focus has a name, and is reached with Tab."""
+"""Accessibility of the real program: every control that takes the focus has a name, and is reached
+with Tab."""
 import os
 import re
 import subprocess

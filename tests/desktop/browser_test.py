@@ -10,7 +10,8 @@ NAMES = ["a1.bmp", "a2.png", "a10.jpg", "b.tif"]
 
 
 def register_programs(home, marker):
-    """Programs for PNG files: the user's default, which creates a file; another one; one for terminals; a removed one."""
+    """Programs for PNG files: the user's default, which creates a file; another one; one for
+    terminals; a removed one."""
     data = home / ".local/share"
     (data / "applications").mkdir(parents=True)
     (home / ".config").mkdir(exist_ok=True)

@@ -26,7 +26,8 @@ TEST(Destination, PreviewsTheOutputFolder) {
   // the setting determines the initial choice, not the operation
   for (const int32_t beside : {0, 1}) {
     settings.DestForceSourceDir = beside;
-    const DestinationChoice into{.extension = "png", .folder = folder.Path("out")}, own{.extension = "png", .folder = {}};
+    const DestinationChoice into{.extension = "png", .folder = folder.Path("out")};
+    const DestinationChoice own{.extension = "png", .folder = {}};
     DestinationOutlook outlook = OutlookOf(into, files);
     EXPECT_EQ(outlook.first, folder.Path("out/a.png"));
     EXPECT_EQ(outlook.existing, 2u);

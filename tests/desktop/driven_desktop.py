@@ -43,7 +43,8 @@ def skip_without_display():
 
 
 class Desktop:
-    """The program with a display, started with `arguments` and `settings` (lines of the configuration file)."""
+    """The program with a display, started with `arguments` and `settings` (lines of the
+    configuration file)."""
 
     managed = False  # whether displays have a window manager; set by run()
 
@@ -248,8 +249,8 @@ def needs_manager(test):
 
 
 def run(*tests, displays=(BARE, OPENBOX)):
-    """Runs test functions on these displays, with a folder for each; exits with their result. Test names as arguments
-    of the script select tests."""
+    """Runs test functions on these displays, with a folder for each; exits with their result. Test
+    names as arguments of the script select tests."""
     skip_without_display()
     failed = 0
     for display in displays:

@@ -85,7 +85,8 @@ def names_that_are_not_utf8(folder):
         desktop.wait(r"lines=0 .*listing=0 .*folder=.*other$")
         desktop.key("ctrl+v")
         desktop.wait(r"files Copy of 2 files done=2 failed=0")
-        assert sorted(os.listdir(os.fsencode(other))) == [b"na\xefve.bmp", b"p%20 q#.bmp"], os.listdir(other)
+        assert sorted(os.listdir(os.fsencode(other))) == [b"na\xefve.bmp",
+                                                          b"p%20 q#.bmp"], os.listdir(other)
 
 
 def rename_in_sequence(folder):
@@ -198,4 +199,5 @@ def turn_and_take_back(folder):
         desktop.key("Return")
 
 
-run(rename_delete_undo_paste, names_that_are_not_utf8, rename_in_sequence, thumbnails_and_session, turn_and_take_back)
+run(rename_delete_undo_paste, names_that_are_not_utf8, rename_in_sequence, thumbnails_and_session,
+    turn_and_take_back)

@@ -1,5 +1,6 @@
 #!/usr/bin/python3
-"""Delays, loops and composed frames of animations written by Pillow are the same as read by Pillow."""
+"""Delays, loops and composed frames of animations written by Pillow are the same as read by
+Pillow."""
 import io
 import json
 import os
@@ -84,8 +85,9 @@ def animated_cursor(path, pictures, sixtieths):
         icons += chunk(b"icon", file.getvalue())
     steps = [0, 3, 1, 2, 5, 4, 0, 0]
     words = lambda numbers: b"".join(number.to_bytes(4, "little") for number in numbers)
-    body = (b"ACON" + chunk(b"anih", words([36, len(DELAYS), len(steps), 0, 0, 0, 0, 6, 3])) + chunk(b"seq ", words(steps)) +
-            chunk(b"rate", words(sixtieths)) + chunk(b"LIST", b"fram" + icons))
+    body = (b"ACON" + chunk(b"anih", words([36, len(DELAYS), len(steps), 0, 0, 0, 0, 6, 3])) +
+            chunk(b"seq ", words(steps)) + chunk(b"rate", words(sixtieths)) +
+            chunk(b"LIST", b"fram" + icons))
     path.write_bytes(chunk(b"RIFF", body))
     return steps
 
@@ -108,10 +110,12 @@ def written_cursor(folder):
     source = folder / "opaque.png"
     next(frames(3, False)).save(source)
     path = folder / "opaque.ani"
-    subprocess.run([FOTOMILL, "convert", "-q", "--out", path, "-t", "ani", source], stdout=subprocess.DEVNULL, check=True)
+    subprocess.run([FOTOMILL, "convert", "-q", "--out", path, "-t", "ani", source],
+                   stdout=subprocess.DEVNULL, check=True)
     data = path.read_bytes()
     start = data.index(b"icon") + 8
-    judge = Image.open(io.BytesIO(data[start:start + int.from_bytes(data[start - 4:start], "little")]))
+    judge = Image.open(io.BytesIO(data[start:start + int.from_bytes(data[start - 4:start],
+                                                                    "little")]))
     assert judge.format == "CUR", judge.format
     assert visible(judge.convert("RGBA")) == visible(Image.open(source).convert("RGBA"))
 

@@ -8,15 +8,16 @@ CLASS = bytes.fromhex("00676156 54C1 CE11 8553 00AA00A1F95B")  # of pictures
 
 
 def compound(tree, scatter=False):
-    """A compound file from a tree: names to bytes, or to subtrees. With `scatter`, streams use every other
-    sector."""
+    """A compound file from a tree: names to bytes, or to subtrees. With `scatter`, streams use
+    every other sector."""
     entries = [["Root Entry", 5, None, -1]]  # name, kind, data, child
 
     def add(storage, folder):
         indices = []
         for name, content in folder.items():
             indices.append(len(entries))
-            entries.append([name, 2 if isinstance(content, bytes) else 1, content if isinstance(content, bytes) else None, -1])
+            entries.append([name, 2 if isinstance(content, bytes) else 1, content
+                            if isinstance(content, bytes) else None, -1])
             if not isinstance(content, bytes):
                 add(indices[-1], content)
         siblings[storage] = indices
@@ -65,9 +66,12 @@ def compound(tree, scatter=False):
             right = siblings[owner][at + 1] if at + 1 < len(siblings[owner]) else -1
         child = siblings[index][0] if siblings.get(index) else -1
         wide = name.encode("utf-16le") + b"\0\0"
-        start, size = (root_first, len(short)) if index == 0 else (starts.get(index, 0), len(data or b""))
-        directory += wide.ljust(64, b"\0") + struct.pack("<HBBiii", len(wide), kind, 1, -1, right, child)
-        directory += (CLASS if index == 0 else bytes(16)) + bytes(20) + struct.pack("<III", start, size, 0)
+        start, size = (root_first, len(short)) if index == 0 else (starts.get(index, 0),
+                                                                   len(data or b""))
+        directory += wide.ljust(64, b"\0") + struct.pack("<HBBiii", len(wide), kind, 1, -1, right,
+                                                         child)
+        directory += (CLASS if index == 0 else bytes(16)) + bytes(20)
+        directory += struct.pack("<III", start, size, 0)
     directory_first = place(directory)
     # the table includes itself and the sectors that continue the list in the header
     needed = lists = 0
@@ -84,9 +88,11 @@ def compound(tree, scatter=False):
     for i in range(lists):
         follows = list_begin + i + 1 if i + 1 < lists else END
         sectors.append(struct.pack("<128I", *numbers[109 + 127 * i:109 + 127 * (i + 1)], follows))
-    header = b"\xd0\xcf\x11\xe0\xa1\xb1\x1a\xe1" + bytes(16) + struct.pack("<HHHHH", 0x3E, 3, 0xFFFE, 9, 6) + bytes(10)
+    header = b"\xd0\xcf\x11\xe0\xa1\xb1\x1a\xe1" + bytes(16) + struct.pack("<HHHHH", 0x3E, 3,
+                                                                           0xFFFE, 9, 6) + bytes(10)
     header += struct.pack("<IIIII", needed, directory_first, 0, LIMIT, list_first)
-    header += struct.pack("<III", (4 * len(short_table) + SECTOR - 1) // SECTOR, list_begin if lists else END, lists)
+    header += struct.pack("<III", (4 * len(short_table) + SECTOR - 1) // SECTOR, list_begin
+                          if lists else END, lists)
     return header + struct.pack("<109I", *numbers[:109]) + b"".join(sectors)
 
 
@@ -123,10 +129,13 @@ def colors(space, channels, opacity=False):
     return blob(struct.pack("<II", 1, channels) + b"".join(struct.pack("<I", n) for n in numbers))
 
 
-def flashpix(width, height, tiles, space, channels, tables=None, opacity=False, tile=64, smaller=None, scatter=False, extra=None):
-    """A picture. A tile: compression, subtype, data. `smaller` has width, height, tiles of a smaller resolution."""
+def flashpix(width, height, tiles, space, channels, tables=None, opacity=False, tile=64,
+             smaller=None, scatter=False, extra=None):
+    """A picture. A tile: compression, subtype, data. `smaller` has width, height, tiles of a
+    smaller resolution."""
     sizes = ([smaller] if smaller else []) + [(width, height, tiles)]
-    properties = {0x01000000: number(len(sizes)), 0x01000002: number(width), 0x01000003: number(height)}
+    properties = {0x01000000: number(len(sizes)), 0x01000002: number(width),
+                  0x01000003: number(height)}
     store = {}
     for index, (wide, high, listed) in enumerate(sizes):
         properties[0x02000002 | index << 16] = colors(space, channels, opacity)
@@ -134,9 +143,12 @@ def flashpix(width, height, tiles, space, channels, tables=None, opacity=False, 
         for compression, subtype, content in listed:
             entries += struct.pack("<IIII", len(data) - 28, len(content), compression, subtype)
             data += content
-        head = STREAM_HEAD + struct.pack("<IIIIIIIII", 36, wide, high, len(listed), tile, tile, channels, 36, 16) + entries
-        store[f"Resolution {index:04d}"] = {"Subimage 0000 Header": head, "Subimage 0000 Data": data}
+        head = STREAM_HEAD + struct.pack("<IIIIIIIII", 36, wide, high, len(listed), tile, tile,
+                                         channels, 36, 16) + entries
+        store[f"Resolution {index:04d}"] = {"Subimage 0000 Header": head,
+                                            "Subimage 0000 Data": data}
     for table, stream in (tables or {}).items():
         properties[0x03000001 | table << 16] = blob(stream)
     store["\5Image Contents"] = property_set(properties)
-    return compound({"\5Global Info": b"x" * 100, "Data Object Store 000001": store, **(extra or {})}, scatter)
+    return compound({"\5Global Info": b"x" * 100, "Data Object Store 000001": store,
+                     **(extra or {})}, scatter)

@@ -60,7 +60,8 @@ INNER = {"bga": bitmap_of_array}
 
 
 def anymap(command, data):
-    """Width, height and the red, green, blue bytes of the anymap that a command converts `data` to."""
+    """Width, height and the red, green, blue bytes of the anymap that a command converts `data`
+    to."""
     shown = subprocess.run(command.split(), input=data, capture_output=True, check=True).stdout
     kind, size, rest = shown.split(b"\n", 2)
     width, height = map(int, size.split())

@@ -9,16 +9,19 @@ FULL, ROWS_16 = (3072, 2048), 16
 
 # Prefix codes of deltas, from short to the maximum length; none starts with twelve ones.
 CODES = [
-    {0: "0", 1: "100", -1: "101", 4: "1100", -4: "1101", 20: "11100", -20: "11101", 90: "111100", -90: "111101", 2: "1111100",
+    {0: "0", 1: "100", -1: "101", 4: "1100", -4: "1101", 20: "11100", -20: "11101", 90: "111100",
+     -90: "111101", 2: "1111100",
      -2: "11111010", 127: "111110110000", -128: "1111101100010", 33: "1111101100011000"},
-    {0: "00", 3: "01", -3: "10", 11: "1100", -11: "11010", 60: "110110000000001", -60: "110110000000010"},
+    {0: "00", 3: "01", -3: "10", 11: "1100", -11: "11010", 60: "110110000000001",
+     -60: "110110000000010"},
     {0: "1000", 5: "00", -5: "01", 40: "1001", -40: "101"},
 ]
 
 
 def table(code):
     """A code as stored in the file."""
-    words = b"".join(bytes([len(bits) - 1]) + int(bits.ljust(16, "0"), 2).to_bytes(2, "big") + (delta & 255).to_bytes(1, "big")
+    words = b"".join(bytes([len(bits) - 1]) + int(bits.ljust(16, "0"), 2).to_bytes(2, "big") +
+                     (delta & 255).to_bytes(1, "big")
                      for delta, bits in code.items())
     return bytes([len(code) - 1]) + words
 
@@ -52,13 +55,15 @@ def coded_row(plane, row, width, code, seed):
 
 def deltas(width, height, planes):
     """Marks and rows of all planes. There are ROWS_16 different rows per plane."""
-    kinds = {plane: [coded_row(plane, i, width >> (plane > 0), CODES[max(plane - 1, 0)], 100 * plane + i + width)
+    kinds = {plane: [coded_row(plane, i, width >> (plane > 0), CODES[max(plane - 1, 0)],
+                               100 * plane + i + width)
                      for i in range(ROWS_16)] for plane in planes}
     bits = []
     for row in range(height):
         for plane in planes:
             if plane == 0 or row % 2 == 0:
-                bits.append("1" * 23 + "0" + f"{plane:02b}{row:013b}0" + kinds[plane][row * 7 % ROWS_16])
+                bits.append("1" * 23 + "0" + f"{plane:02b}{row:013b}0"
+                            + kinds[plane][row * 7 % ROWS_16])
     bits.append("1" * 23 + "0" + f"00{height:013b}0" + "0" * 64)
     text = "".join(bits)
     text += "0" * (-len(text) % 8)
@@ -87,8 +92,10 @@ def make(turns=0, sizes=5):
         file += bytes(4 * SECTOR) + sectors(table(CODES[0])) + sectors(deltas(1536, 1024, [0]))
     if sizes > 4:
         begin = len(file) // SECTOR
-        file[388 * SECTOR - SECTOR + 510:388 * SECTOR - SECTOR + 512] = (begin - 1 - 384).to_bytes(2, "big")
+        file[388 * SECTOR - SECTOR + 510:388 * SECTOR - SECTOR
+             + 512] = (begin - 1 - 384).to_bytes(2, "big")
         file[SECTOR:2 * SECTOR] = header(turns, begin)
-        file += b"\xff" * SECTOR + bytes(11 * SECTOR) + sectors(b"".join(map(table, CODES))) + bytes(SECTOR)
+        file += b"\xff" * SECTOR + bytes(11 * SECTOR)
+        file += sectors(b"".join(map(table, CODES))) + bytes(SECTOR)
         file += sectors(deltas(*FULL, [0, 2, 3]))
     return bytes(file)

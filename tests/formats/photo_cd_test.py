@@ -1,5 +1,6 @@
 #!/usr/bin/env python3
-"""The larger resolutions of Photo CD files match GraphicsMagick, which uses a different tone curve."""
+"""The larger resolutions of Photo CD files match GraphicsMagick, which uses a different tone
+curve."""
 import os
 import shutil
 import subprocess
@@ -29,10 +30,13 @@ def anymap(data):
 def faults(folder, turns, sizes, shown):
     source = Path(folder) / "picture.pcd"
     source.write_bytes(photo_cd_file.make(turns, sizes))
-    subprocess.run([FOTOMILL, "--quiet", "convert", source, "--to", "bmp", "--dest", folder, "--overwrite", "replace"],
+    subprocess.run([FOTOMILL, "--quiet", "convert", source, "--to", "bmp", "--dest", folder,
+                    "--overwrite", "replace"],
                    check=True, stdout=subprocess.DEVNULL)
-    ours = anymap(subprocess.run(["gm", "convert", Path(folder) / "picture.bmp", "ppm:-"], capture_output=True, check=True).stdout)
-    theirs = anymap(subprocess.run(["gm", "convert", "-size", shown, source, "ppm:-"], capture_output=True, check=True).stdout)
+    ours = anymap(subprocess.run(["gm", "convert", Path(folder) / "picture.bmp", "ppm:-"],
+                                 capture_output=True, check=True).stdout)
+    theirs = anymap(subprocess.run(["gm", "convert", "-size", shown, source, "ppm:-"],
+                                   capture_output=True, check=True).stdout)
     if ours[0] != theirs[0]:
         yield f"{ours[0]} is not {theirs[0]}"
         return

@@ -49,7 +49,8 @@ int main(int n, char** v) { printf("$1"); for (int i = 1; i < n; ++i) printf(" %
 C
 }
 Case() {  # Case NAME STATEMENTS: a test program
-  printf '#include <stdio.h>\n#include <stdlib.h>\nint main(void) { setbuf(stdout, 0); %s return 0; }\n' "$2" >"$tree/tests/$1.c"
+  printf '#include <%s.h>\n' stdio stdlib >"$tree/tests/$1.c"
+  printf 'int main(void) { setbuf(stdout, 0); %s return 0; }\n' "$2" >>"$tree/tests/$1.c"
 }
 
 # The launcher.
@@ -61,7 +62,8 @@ Expect "standard output holds results only" "" "$("$tree/fotomill" 2>&1 >/dev/nu
 ln -s "$tree/fotomill" link
 Expect "through a link" "one x" "$(./link x </dev/null 2>&1)"
 PATH=/usr/bin:/bin
-mkdir "$work/bin" && printf '#!/bin/sh\necho called >&2\nexit 1\n' | tee "$work/bin/ninja" "$work/bin/cmake" >"$work/bin/dpkg-query"
+mkdir "$work/bin" && printf '#!/bin/sh\necho called >&2\nexit 1\n' |
+  tee "$work/bin/ninja" "$work/bin/cmake" >"$work/bin/dpkg-query"
 chmod +x "$work"/bin/*
 Expect "up to date: no tool is called" "one" \
   "$(PATH=$work/bin:$PATH "$tree/fotomill" </dev/null 2>&1)"
@@ -71,7 +73,8 @@ printf 'int broken(\n' >>"$tree/src/main.c"
 Expect "a source that does not compile" "*main.c*error*1" \
   "$("$tree/fotomill" </dev/null 2>&1; echo $?)"
 Program three
-Expect "two at a time" "three three" "$(echo $("$tree/fotomill" </dev/null 2>/dev/null & "$tree/fotomill" </dev/null 2>/dev/null; wait; echo) |
+Run() { "$tree/fotomill" </dev/null 2>/dev/null; }
+Expect "two at a time" "three three" "$(echo $(Run & Run; wait; echo) |
   sed 's/threethree/three three/')"
 mv "$tree" "$work/moved" && tree=$work/moved
 Expect "a tree that was moved" "three" "$("$tree/fotomill" </dev/null 2>/dev/null)"
@@ -86,20 +89,25 @@ chmod +x "$work"/bin/* && rm "$work"/bin/{ninja,cmake,dpkg-query}
 Expect "a package that cannot be had" "*as root run:*no-such-package-anywhere*1" \
   "$(PATH=$work/bin:$PATH "$tree/fotomill" </dev/null 2>&1; echo $?)"
 printf '[build]\nno-such-package | bash\nno-such-package | nor-this\n[cli]\n' >"$tree/packages.txt"
-Expect "alternatives, one of them there" "*satisfy --no-install-recommends 'no-such-package | nor-this'*1" \
+Expect "alternatives, one of them there" \
+  "*satisfy --no-install-recommends 'no-such-package | nor-this'*1" \
   "$(PATH=$work/bin:$PATH "$tree/fotomill" </dev/null 2>&1; echo $?)"
 printf '[build]\nbash\n[cli]\n[test]\n' >"$tree/packages.txt"
 
 # The check.
-Check() { (cd / && "$tree/check" "$@" 2>"$work/log" | tail -n 1; echo "${PIPESTATUS[0]}") | tr '\n' ' '; }
-Case good 'puts("[       OK ] A.a (0 ms)"); puts("noise[       OK ] A.b (1 ms)"); puts("[  SKIPPED ] A.c (0 ms)");'
+Check() {
+  (cd / && "$tree/check" "$@" 2>"$work/log" | tail -n 1; echo "${PIPESTATUS[0]}") | tr '\n' ' '
+}
+Case good 'puts("[       OK ] A.a (0 ms)"); puts("noise[       OK ] A.b (1 ms)");
+puts("[  SKIPPED ] A.c (0 ms)");'
 printf '#!/bin/sh\ntest -x "$FOTOMILL"\n' >"$tree/tests/cli/some_test.sh"
 printf '#!/bin/sh\nexit 77\n' >"$tree/tests/cli/left_test.sh"
 printf '#!/bin/sh\nexit 0\n' >"$tree/tests/house/order_test.sh"
 chmod +x "$tree"/tests/*/*.sh
 Expect "both builds and the house" "7 passed, 0 failed 0 " "$(Check)"
 Expect "fast" "4 passed, 0 failed 0 " "$(Check --fast)"
-Case bad 'puts("[       OK ] A.a (0 ms)"); puts("[  FAILED  ] A.b (3 ms)"); puts("[  FAILED  ] A.b"); exit(1);'
+Case bad 'puts("[       OK ] A.a (0 ms)"); puts("[  FAILED  ] A.b (3 ms)");
+puts("[  FAILED  ] A.b"); exit(1);'
 Case crash 'puts("[       OK ] A.a (0 ms)"); abort();'
 Case empty 'puts("[  PASSED  ] 0 tests.");'
 Expect "a failed case, a crash, no case at all" "6 passed, 3 failed 1 " "$(Check --fast)"

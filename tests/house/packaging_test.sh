@@ -1,13 +1,15 @@
 #!/usr/bin/env bash
-# Release packaging scripts: the source archive depends only on the files, and packaging/release rejects anything that is
-# not a release. The packages themselves are tested by packaging/deb/try, on bare systems.
+# Release packaging scripts: the source archive depends only on the files, and packaging/release
+# rejects anything that is not a release. The packages themselves are tested by packaging/deb/try,
+# on bare systems.
 set -u
 root=$(cd "$(dirname "${BASH_SOURCE[0]}")/../.." && pwd -P)
 . "$root/packaging/prepare.sh"
 command -v git >/dev/null || exit 77
 work=$(mktemp -d)
 trap 'rm -rf "$work"' EXIT
-export GIT_CONFIG_GLOBAL=/dev/null GIT_CONFIG_SYSTEM=/dev/null GIT_AUTHOR_NAME=a GIT_AUTHOR_EMAIL=a@example.org \
+export GIT_CONFIG_GLOBAL=/dev/null GIT_CONFIG_SYSTEM=/dev/null
+export GIT_AUTHOR_NAME=a GIT_AUTHOR_EMAIL=a@example.org \
   GIT_COMMITTER_NAME=a GIT_COMMITTER_EMAIL=a@example.org SOURCE_DATE_EPOCH=1700000000
 failures=0
 Expect() {  # Expect NAME WANTED FOUND
@@ -36,7 +38,8 @@ CopyTree "$project" "$work/one/t"
 cp -a "$project" "$work/plain" && rm -rf "$work/plain/.git"
 (umask 077 && CopyTree "$work/plain" "$work/two/t")
 Expect "copied" "a b.cpp link new.cpp " "$(cd "$work/one/t/src" && printf '%s ' *)"
-Expect "build/ is left out" "no" "$([[ -e $work/one/t/build || -e $work/two/t/build ]] && echo yes || echo no)"
+Expect "build/ is left out" "no" \
+  "$([[ -e $work/one/t/build || -e $work/two/t/build ]] && echo yes || echo no)"
 find "$work/two/t" -exec touch -h -d 2001-01-01 {} +
 for name in one two; do ArchiveTree "$work/$name" t "$work/$name.tar.xz"; done
 Expect "the same bytes" "same" "$(cmp "$work/one.tar.xz" "$work/two.tar.xz" && echo same)"
@@ -44,7 +47,8 @@ Expect "its date" "*2023-11-14 *t/CMakeLists.txt*" "$(TZ=UTC tar -tvf "$work/one
 
 # Every obstacle is reported, and nothing is created.
 Release() { (cd "$work" && "$project/packaging/release" "$@" 2>&1; echo "status $?"); }
-Expect "changes and no date" '*changes that are not committed*no line "## 1.2.3 (YYYY-MM-DD)"*status 1' "$(Release)"
+Expect "changes and no date" \
+  '*changes that are not committed*no line "## 1.2.3 (YYYY-MM-DD)"*status 1' "$(Release)"
 git -C "$project" add -A && git -C "$project" commit -qm two
 Expect "no date" 'release: CHANGELOG.md has no line*status 1' "$(Release)"
 sed -i 's/not released yet/2026-11-22/' "$project/CHANGELOG.md"
@@ -59,5 +63,6 @@ Expect "a wrong option" "usage:*status 2" "$(Release --chek)"
 
 # The packages' build dependencies are those of packages.txt.
 Expect "groups" "*g++*cmake*libtiff-dev*" "$(root=$root PackagesOf build cli | tr '\n' ' ')"
-Expect "a place for them" "1" "$(grep -c '^Build-Depends: .*@BUILD_PACKAGES@$' "$root/packaging/deb/debian/control")"
+Expect "a place for them" "1" \
+  "$(grep -c '^Build-Depends: .*@BUILD_PACKAGES@$' "$root/packaging/deb/debian/control")"
 exit $((failures > 0))

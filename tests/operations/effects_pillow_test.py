@@ -1,6 +1,6 @@
 #!/usr/bin/python3
-"""Compares effects, color reduction and resizing with Pillow, on a generated picture and, if FOTOMILL_CORPUS is set, on a
-photo."""
+"""Compares effects, color reduction and resizing with Pillow, on a generated picture and, if
+FOTOMILL_CORPUS is set, on a photo."""
 import colorsys
 import os
 import subprocess

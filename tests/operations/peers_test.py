@@ -34,7 +34,8 @@ def perspective(picture):
 
 
 def shadowed(picture):
-    """A shadow 9 to the right and 5 down, blurred with sigma 4; Pillow truncates its Gaussian a little earlier."""
+    """A shadow 9 to the right and 5 down, blurred with sigma 4; Pillow truncates its Gaussian a
+    little earlier."""
     canvas = Image.new("RGB", (WIDTH + 3 + 21, HEIGHT + 7 + 17), "white")
     mask = Image.new("L", canvas.size)
     mask.paste(153, (3 + 9, 7 + 5, 3 + 9 + WIDTH, 7 + 5 + HEIGHT))
@@ -44,7 +45,8 @@ def shadowed(picture):
 
 
 def rounded(picture):
-    """Drawn at eight times the size and scaled down, since Pillow's corners are not anti-aliased."""
+    """Drawn at eight times the size and scaled down, since Pillow's corners are not
+    anti-aliased."""
     mask = Image.new("L", (WIDTH * 8, HEIGHT * 8))
     ImageDraw.Draw(mask).rounded_rectangle((0, 0, WIDTH * 8 - 1, HEIGHT * 8 - 1), 20 * 8, 255)
     canvas = Image.new("RGB", picture.size, "red")
@@ -101,7 +103,8 @@ def letters():
     if font is None:
         return
     text, size = "Wagner & Söhne, fjord", (400, 60)
-    ours = folder_picture(f"canvas 400x60 background=white; text '{text}' font='DejaVu Sans' size=30px color=black")
+    ours = folder_picture("canvas 400x60 background=white; "
+                          f"text '{text}' font='DejaVu Sans' size=30px color=black")
     expected = Image.new("L", size, 255)
     draw = ImageDraw.Draw(expected)
     draw.text((200, 30), text, 0, ImageFont.truetype(str(font), 30), anchor="mm")
@@ -109,7 +112,8 @@ def letters():
              for picture in (ours, expected)]
     widths, heights = ([box[2 + i] - box[i] for box in boxes] for i in (0, 1))
     inks = [sum(255 - v for v in picture.getdata()) for picture in (ours, expected)]
-    if abs(widths[0] - widths[1]) > 4 or abs(heights[0] - heights[1]) > 2 or not 0.93 < inks[0] / inks[1] < 1.07:
+    if (abs(widths[0] - widths[1]) > 4 or abs(heights[0] - heights[1]) > 2
+            or not 0.93 < inks[0] / inks[1] < 1.07):
         faults.append(f"letters: {boxes}, ink {inks}")
 
 

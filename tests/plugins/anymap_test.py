@@ -34,8 +34,8 @@ with tempfile.TemporaryDirectory() as folder:
             print(f"{name}: no such sample")
             failed += 1
             continue
-        expected = netpbm("pnmtoplainpnm", data=netpbm("pnmtopnm",
-                                                       data=netpbm("ppmtoppm", data=netpbm("bmptopnm", str(source)))))
+        colors = netpbm("ppmtoppm", data=netpbm("bmptopnm", str(source)))
+        expected = netpbm("pnmtoplainpnm", data=netpbm("pnmtopnm", data=colors))
         written = convert(source, "ppm", folder)
         if netpbm("pnmtoplainpnm", data=written.read_bytes()) != expected:
             print(f"{name}: netpbm sees another picture")

@@ -1,6 +1,6 @@
 #!/usr/bin/env python3
-"""Modules that crash or exit the program: reported, never with status 0; one that does so while loading is tried only
-once."""
+"""Modules that crash or exit the program: reported, never with status 0; one that does so while
+loading is tried only once."""
 import os
 import shutil
 import subprocess

@@ -3,8 +3,9 @@
 # uses.
 project=$(cd "$(dirname "$0")/../.." && pwd)
 compiler=${CXX:-g++}
-layouts="$compiler -m32 -ffreestanding -fsyntax-only -std=c++20 -I$project/src $project/src/plugins/block_layouts.cpp"
-if ! echo 'static_assert(sizeof(void*) == 4);' | $compiler -m32 -ffreestanding -fsyntax-only -x c++ - 2>/dev/null; then
+syntax="-m32 -ffreestanding -fsyntax-only"
+layouts="$compiler $syntax -std=c++20 -I$project/src $project/src/plugins/block_layouts.cpp"
+if ! echo 'static_assert(sizeof(void*) == 4);' | $compiler $syntax -x c++ - 2>/dev/null; then
   echo "skipped: $compiler has no 32-bit target"
   exit 77
 fi

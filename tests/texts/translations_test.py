@@ -1,6 +1,6 @@
 #!/usr/bin/env python3
-"""Translations: the template is current, the translations are well formed, and the program follows --lang and the
-environment in texts for people only."""
+"""Translations: the template is current, the translations are well formed, and the program follows
+--lang and the environment in texts for people only."""
 import json
 import os
 import shutil

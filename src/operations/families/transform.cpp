@@ -118,8 +118,9 @@ bool IsKept(const Arguments& arguments, Size picture, Size scaled) {
   return arguments.Choice<Only>("only") == Only::Shrink ? grows : shrinks;
 }
 
-// A picture that shrinks to half and less may be decoded smaller: smooth filters make the same of it
-// within a few levels. Nearest and box pick whole pixels, and light adds up otherwise than levels.
+// A picture that shrinks to half and less may be decoded smaller: smooth filters make the same of
+// it within a few levels. Nearest and box pick whole pixels, and light adds up otherwise than
+// levels.
 int32_t ResizeSide(const Arguments& arguments, Size whole, const PictureMetadata& metadata) {
   const ScaleFilter filter = kFilters[arguments.Choice("filter")];
   if (arguments.Flag("linear") || filter == ScaleFilter::Nearest || filter == ScaleFilter::Box)

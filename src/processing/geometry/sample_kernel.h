@@ -35,7 +35,7 @@ inline void SampleBgrPlain(const uint8_t* const rows[4], const Weights& across, 
 }
 
 #if VECTOR_HAS_AVX2  // x86-64, which always has SSE2
-// Four column sums, for bytes 4 n to 4 n + 3: `upper` has those bytes of rows 0 and 1 interleaved as
+// Four column sums, for bytes 4 n to 4 n + 3: `upper` has those of rows 0 and 1 interleaved as
 // words, `lower` those of rows 2 and 3.
 inline __m128i ColumnSums(__m128i upper, __m128i lower, __m128i upperWeights,
                           __m128i lowerWeights) {
