@@ -91,8 +91,8 @@ struct ControlValue {
   std::string fault;  // the valid values, if this is not one
 };
 
-// A check box only knows off and on: a nonzero number is kept, and turning it on sets the default
-// if that is nonzero.
+// A check box only knows off and on: an unchanged number is kept, and turning it on sets 1, or the
+// default of a loose flag.
 int32_t FlagIn(const SetupDialog& dialog, const KeyRow& row) {
   const bool checked = dialog.IsChecked(row.control);
   if (checked == (NumberIn(row) != 0)) return NumberIn(row);

@@ -53,7 +53,7 @@ struct FitsCard {
 };
 
 struct FitsHeader {
-  // absolute value of BITPIX; this and the next are unchecked until CheckHeader
+  // absolute value of BITPIX; this and the next three are unchecked until CheckHeader
   int64_t bitsPerValue = 1;
   int64_t axes = 0;
   int64_t width = 0;

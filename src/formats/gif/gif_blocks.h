@@ -86,7 +86,7 @@ void TakeColors(const GifFrame& frame, Palette& palette);
 int32_t InterlacedRow(int32_t r, int32_t height);
 // The indices of a frame in file order; the reader is left after it. FileReadError, before
 // allocating memory, if the data are too short for that many. With `done`, which receives the
-// number decoded, truncation is not an error until after the last pixel; missing pixels are 0.
+// number decoded, it is only returned after decoding all available pixels; the rest are 0.
 Status DecodeFrame(ByteReader& bytes, const GifFrame& frame, platform::MemoryBlock& pixels,
                    uint64_t* done = nullptr);
 

@@ -25,7 +25,7 @@ std::string LineOf(const std::string& path) {
 
 }  // namespace
 
-// /proc/locks has lines such as "3: FLOCK ADVISORY WRITE 123 08:01:4567 0 EOF", with the inode
+// /proc/locks has lines such as "3: FLOCK  ADVISORY  WRITE 123 08:01:4567 0 EOF", with the inode
 // after the device; some file systems report a different device there than in stat, so only the
 // inode is compared.
 std::string LockHolder(int handle) {
