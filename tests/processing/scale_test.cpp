@@ -367,6 +367,12 @@ TEST(Scale, IsTheSameOnEveryProcessor) {
       {"four", [&](auto& k, auto& out) { k.scaleFour(shorts.data(), windows.data(), 50, 14, out.data()); }},
       {"widen", [&](auto& k, auto& out) { k.widen(bytes.data(), 301, out.data()); }},
       {"multiply", [&](auto& k, auto& out) { k.multiply(bytes.data(), bytes.data() + 999, 77, out.data()); }},
+      {"sharpen",
+       [&](auto& k, auto& out) {
+         std::copy_n(shorts.data(), 401, out.begin());
+         k.sharpen(bytes.data(), 201, 1 << 14, 90, out.data());
+         k.sharpen(bytes.data() + 201, 200, 700, 0, out.data() + 201);
+       }},
       {"narrow",
        [&](auto& k, auto& out) {
          std::vector<uint8_t> levels(401);

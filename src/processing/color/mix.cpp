@@ -100,33 +100,62 @@ struct Sector {
 constexpr Sector kSectors[6] = {{2, 1, 0, true}, {1, 2, 0, false}, {1, 0, 2, true},
                                 {0, 1, 2, false}, {0, 2, 1, true}, {2, 0, 1, false}};
 
-int SectorOf(const uint8_t* bgr) {
+uint32_t SectorOf(const uint8_t* bgr) {
+  // by whether red >= green, green >= blue, blue > red; the first and the last cannot be
+  constexpr uint8_t kSectorOf[] = {0, 3, 1, 2, 5, 4, 0, 0};
   const uint8_t b = bgr[0], g = bgr[1], r = bgr[2];
-  if (r >= g && g >= b) return 0;
-  if (g > r && r >= b) return 1;
-  if (g >= b && b > r) return 2;
-  if (b > g && g > r) return 3;
-  if (b > r && r >= g) return 4;
-  return 5;
+  return kSectorOf[(r >= g) << 2 | (g >= b) << 1 | static_cast<int>(b > r)];
 }
 
-// `turn`: 0 to 6 sectors. Avoids division: positions on the circle are in units of the
-// pixel's own chroma.
-void TurnHue(uint8_t* bgr, double turn) {
-  const int from = SectorOf(bgr);
-  const Sector& old = kSectors[from];
-  const int32_t most = bgr[old.largest], least = bgr[old.smallest], between = bgr[old.between],
-                chroma = most - least;
-  if (chroma == 0) return;
-  const double place = turn * chroma + (old.rises ? between - least : most - between);
-  auto sectors = static_cast<int32_t>(turn);
-  if (place >= (sectors + 1) * chroma) ++sectors;
-  const double rest = place - sectors * chroma;
-  const Sector& next = kSectors[(from + sectors) % 6];
-  bgr[next.largest] = static_cast<uint8_t>(most);
-  bgr[next.smallest] = static_cast<uint8_t>(least);
-  bgr[next.between] = RoundedLevel((next.rises ? least + rest : most - rest) + 1e-9);
-}
+// What a turn of all hues by 0 to 6 sectors makes of a position within a sector. Positions are in
+// units of the pixel's own chroma, which avoids division.
+class HueTurn {
+ public:
+  explicit HueTurn(double turn) : sectors_(static_cast<uint32_t>(turn)) {
+    for (int32_t rising = 0; rising < 2; ++rising) {
+      for (int32_t chroma = 0; chroma < 256; ++chroma) {
+        for (int32_t place = 0; place <= chroma; ++place)
+          At(rising != 0, chroma, place) = Place(turn, rising != 0, chroma, place);
+      }
+    }
+  }
+
+  void Apply(uint8_t* bgr) {
+    const uint32_t from = SectorOf(bgr);
+    const Sector& old = kSectors[from];
+    const int32_t most = bgr[old.largest], least = bgr[old.smallest], between = bgr[old.between];
+    const NewPlace& place =
+        At(old.rises, most - least, old.rises ? between - least : most - between);
+    const uint32_t to = from + sectors_ + place.further;
+    const Sector& next = kSectors[to < 6 ? to : to - 6];
+    bgr[next.largest] = static_cast<uint8_t>(most);
+    bgr[next.smallest] = static_cast<uint8_t>(least);
+    bgr[next.between] = static_cast<uint8_t>(least + place.level);
+  }
+
+ private:
+  struct NewPlace {
+    uint8_t level;    // of the channel between, above the least
+    uint8_t further;  // 1: in the sector after that of the turn
+  };
+
+  NewPlace& At(bool rising, int32_t chroma, int32_t place) {
+    return places_[static_cast<size_t>((rising ? 1 << 16 : 0) | chroma << 8 | place)];
+  }
+
+  static NewPlace Place(double turn, bool rising, int32_t chroma, int32_t place) {
+    const double turned = turn * chroma + place;
+    auto sectors = static_cast<int32_t>(turn);
+    const uint8_t further = turned >= (sectors + 1) * chroma && chroma > 0 ? 1 : 0;
+    sectors += further;
+    const double rest = turned - sectors * chroma;
+    const bool rises = rising == (sectors % 2 == 0);
+    return {RoundedLevel((rises ? rest : chroma - rest) + 1e-9), further};
+  }
+
+  const uint32_t sectors_;
+  std::array<NewPlace, 2 << 16> places_{};
+};
 
 }  // namespace
 
@@ -175,7 +204,8 @@ PointEffect ThresholdEffect(int32_t t) {
 PointEffect HueEffect(double degrees) {
   double turn = std::fmod(degrees / 60, 6);
   if (turn < 0) turn += 6;
-  return EachColor([turn](uint8_t* bgr) { TurnHue(bgr, turn); });
+  const auto table = std::make_shared<HueTurn>(turn);
+  return EachColor([table](uint8_t* bgr) { table->Apply(bgr); });
 }
 
 PointEffect ColorizeEffect(const BgrColor& color, const BgrColor& dark, const BgrColor& light) {

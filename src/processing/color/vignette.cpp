@@ -1,8 +1,6 @@
 #include "processing/color/vignette.h"
 
-#include <algorithm>
-#include <cmath>
-
+#include "processing/color/vignette_row.h"
 #include "processing/promote.h"
 
 namespace fotomill {
@@ -29,19 +27,15 @@ Status ApplyVignette(PictureRecord& picture, const Vignette& vignette, const Wor
   double* const across = block.Items<double>().data();
   for (int32_t x = 0; x < width; ++x)
     across[x] = SquareAcross(vignette.left + x, vignette.whole.width);
-  const double untouched = vignette.size * vignette.size;
+  const ShadeRow shade = ShadeRowHere();
   return ForBands(picture.image.Height(), kLeastRows, work, [&](int32_t first, int32_t end) {
     for (int32_t y = first; y < end; ++y) {
-      const double down = SquareAcross(vignette.top + y, vignette.whole.height);
-      uint8_t* bgr = picture.image.Row(y).data();
-      for (int32_t x = 0; x < width; ++x, bgr += 3) {
-        const double square = across[x] + down;
-        if (square <= untouched) continue;
-        const double s = std::min((std::sqrt(square) - vignette.size) / (1 - vignette.size), 1.0);
-        const double share = vignette.amount * s * s * (3 - 2 * s);
-        for (size_t c = 0; c < 3; ++c)
-          bgr[c] = RoundedLevel(bgr[c] + (vignette.color[c] - bgr[c]) * share);
-      }
+      const VignetteRow row{across,
+                            SquareAcross(vignette.top + y, vignette.whole.height),
+                            vignette.size,
+                            vignette.amount,
+                            {vignette.color[0], vignette.color[1], vignette.color[2]}};
+      shade(row, picture.image.Row(y).data(), static_cast<size_t>(width));
     }
     return Status::Ok;
   });

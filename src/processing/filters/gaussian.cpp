@@ -335,8 +335,7 @@ Status BlurPicture(PictureRecord& picture, double sigma, const GaussianPlace& pl
 
 Status UnsharpPicture(PictureRecord& picture, double sigma, double amount, double threshold,
                       const GaussianPlace& place, const Work& work) {
-  constexpr int kAmountBits = 10;
-  const auto factor = static_cast<int64_t>(std::lround(std::ldexp(amount, kAmountBits)));
+  const auto factor = static_cast<int32_t>(std::lround(std::ldexp(amount, kSharpenBits)));
   const auto least = static_cast<int32_t>(std::ceil(threshold * (1 << kFraction)));
   if (picture.image.Empty()) return Status::EmptyImage;
   RETURN_IF_BAD(PromotePicture(picture));
@@ -347,14 +346,11 @@ Status UnsharpPicture(PictureRecord& picture, double sigma, double amount, doubl
     const uint8_t* alpha = hasAlpha ? picture.alpha.Row(y).data() : nullptr;
     const auto sharpened = [=](int32_t v, int32_t blurred) {
       const int32_t difference = v - blurred;
-      const int64_t more = std::abs(difference) >= least ? (factor * difference) >> kAmountBits : 0;
-      return static_cast<int16_t>(std::clamp<int64_t>(v + more, 0, kOpaque));
+      const int32_t more =
+          std::abs(difference) >= least ? (factor * difference) >> kSharpenBits : 0;
+      return static_cast<int16_t>(std::clamp(v + more, 0, kOpaque));
     };
-    if (!hasAlpha) {
-      for (size_t i = 0; i < 3 * width; ++i)
-        samples[i] = sharpened(bgr[i] << kFraction, samples[i]);
-      return;
-    }
+    if (!hasAlpha) return ResampleKernelsHere().sharpen(bgr, 3 * width, factor, least, samples);
     std::array<int16_t, 4> own;
     for (size_t x = 0; x < width; ++x, samples += 4) {
       ResampleKernelsHere().multiply(bgr + 3 * x, alpha + x, 1, own.data());
