@@ -2,6 +2,10 @@
 
 #include <algorithm>
 #include <cstring>
+#include <utility>
+
+#include "processing/geometry/cut.h"
+#include "processing/promote.h"
 
 namespace fotomill {
 
@@ -46,6 +50,22 @@ Rectangle ChangedArea(const Canvas& before, const Canvas& after) {
   }
   if (right < 0) return {0, 0, 1, 1};
   return {left, top, right - left + 1, bottom - top + 1};
+}
+
+Status CutToChange(PictureRecord& picture, int32_t grid, Canvas& screen, Rectangle& area) {
+  RETURN_IF_BAD(PromoteToAlpha(picture));
+  const int32_t width = picture.image.Width(), height = picture.image.Height();
+  const bool first = screen.image.Empty();
+  if (!first && (width != screen.image.Width() || height != screen.image.Height()))
+    return Status::UnsuitableImage;
+  Canvas frame{std::move(picture.image), std::move(picture.alpha)};
+  area = first ? Rectangle{0, 0, width, height} : ChangedArea(screen, frame);
+  const int32_t left = area.x % grid, top = area.y % grid;
+  area = {area.x - left, area.y - top, area.width + left, area.height + top};
+  RETURN_IF_BAD(CutImage(frame.image, area, picture.image));
+  RETURN_IF_BAD(CutImage(frame.alpha, area, picture.alpha));
+  screen = std::move(frame);
+  return Status::Ok;
 }
 
 }  // namespace fotomill

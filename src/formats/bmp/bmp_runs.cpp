@@ -4,6 +4,7 @@
 #include <cstring>
 
 #include "core/byte_reader.h"
+#include "formats/split_runs.h"
 
 namespace fotomill {
 
@@ -110,19 +111,10 @@ Status DecodeBmpRuns(platform::FileView& file, const BmpRuns& runs, const Pictur
 }
 
 void EncodeRle8Row(std::span<const uint8_t> row, ByteWriter& out) {
-  size_t plain = 0;  // start of the pending literal pixels
-  for (size_t x = 0; x < row.size();) {
-    const size_t end = std::min(row.size(), x + kMostInToken);
-    size_t next = x + 1;
-    while (next < end && row[next] == row[x]) ++next;
-    if (next - x >= kShortestRun) {
-      PutPlain(row.subspan(plain, x - plain), out);
-      PutRun(next - x, row[x], out);
-      plain = next;
-    }
-    x = next;
-  }
-  PutPlain(row.subspan(plain), out);
+  SplitRuns(
+      row, kShortestRun, kMostInToken,
+      [&](std::span<const uint8_t> pixels) { PutPlain(pixels, out); },
+      [&](size_t count, uint8_t value) { PutRun(count, value, out); });
 }
 
 }  // namespace fotomill

@@ -21,6 +21,7 @@
 #include "core/byte_writer.h"
 #include "formats/drhalo/halo_palette.h"
 #include "formats/plain_codec.h"
+#include "formats/split_runs.h"
 #include "processing/promote.h"
 
 namespace fotomill {
@@ -101,31 +102,14 @@ Status Decode(platform::FileView& file, const CutHeader& header, const PictureRe
   return Status::Ok;
 }
 
-void PutPlain(std::span<const uint8_t> bytes, std::vector<uint8_t>& code) {
-  while (!bytes.empty()) {
-    const auto part = bytes.first(std::min(bytes.size(), kMostInToken));
-    code.push_back(static_cast<uint8_t>(part.size()));
-    code.insert(code.end(), part.begin(), part.end());
-    bytes = bytes.subspan(part.size());
-  }
-}
-
 void EncodeRow(std::span<const uint8_t> row, std::vector<uint8_t>& code) {
   code.clear();
-  size_t plain = 0;  // start of the pending literal bytes
-  for (size_t x = 0; x < row.size();) {
-    const size_t end = std::min(row.size(), x + kMostInToken);
-    size_t next = x + 1;
-    while (next < end && row[next] == row[x]) ++next;
-    if (next - x >= kShortestRun) {
-      PutPlain(row.subspan(plain, x - plain), code);
-      code.push_back(static_cast<uint8_t>(kRun | (next - x)));
-      code.push_back(row[x]);
-      plain = next;
-    }
-    x = next;
-  }
-  PutPlain(row.subspan(plain), code);
+  SplitRuns(
+      row, kShortestRun, kMostInToken,
+      [&](std::span<const uint8_t> bytes) { AppendCounted(bytes, kMostInToken, code); },
+      [&](size_t count, uint8_t value) {
+        code.insert(code.end(), {static_cast<uint8_t>(kRun | count), value});
+      });
   code.push_back(0);
 }
 

@@ -26,6 +26,7 @@
 #include "core/byte_reader.h"
 #include "core/byte_writer.h"
 #include "formats/plain_codec.h"
+#include "formats/split_runs.h"
 #include "processing/palette/two_colors.h"
 
 namespace fotomill {
@@ -119,30 +120,15 @@ void WriteHeader(ByteWriter& out, const PackedImage& image) {
   out.Zeros(6);
 }
 
-void PutBytes(std::span<const uint8_t> bytes, std::vector<uint8_t>& code) {
-  while (!bytes.empty()) {
-    const auto part = bytes.first(std::min(bytes.size(), kMostInToken));
-    code.push_back(static_cast<uint8_t>(part.size()));
-    code.insert(code.end(), part.begin(), part.end());
-    bytes = bytes.subspan(part.size());
-  }
-}
-
 void EncodeRow(std::span<const uint8_t> row, std::vector<uint8_t>& code) {
   code.clear();
   if (std::ranges::all_of(row, [](uint8_t byte) { return byte == kWhite; })) return;
-  size_t plain = 0;  // start of the pending literal bytes
-  for (size_t x = 0; x < row.size();) {
-    size_t run = 1;
-    while (x + run < row.size() && run < kMostInToken && row[x + run] == row[x]) ++run;
-    if (run >= kShortestRun) {
-      PutBytes(row.subspan(plain, x - plain), code);
-      code.insert(code.end(), {0, static_cast<uint8_t>(run), row[x]});
-      plain = x + run;
-    }
-    x += run;
-  }
-  PutBytes(row.subspan(plain), code);
+  SplitRuns(
+      row, kShortestRun, kMostInToken,
+      [&](std::span<const uint8_t> bytes) { AppendCounted(bytes, kMostInToken, code); },
+      [&](size_t count, uint8_t value) {
+        code.insert(code.end(), {0, static_cast<uint8_t>(count), value});
+      });
 }
 
 // UnsuitableImage if a packed row is too long for its size field.

@@ -18,8 +18,6 @@
 #include "platform/file_view.h"
 #include "platform/temporary_file.h"
 #include "processing/changed_area.h"
-#include "processing/geometry/cut.h"
-#include "processing/promote.h"
 
 namespace fotomill {
 
@@ -60,18 +58,10 @@ class PngSequence final : public SequenceWriter {
 
   Status Add(PictureRecord& picture, int32_t delayMs) override {
     // all frames must have the same pixel format
-    RETURN_IF_BAD(PromoteToAlpha(picture));
     const bool first = screen_.image.Empty();
-    const int32_t width = picture.image.Width(), height = picture.image.Height();
-    if (first) RETURN_IF_BAD(NewCanvas(width, height, screen_));
-    if (width != screen_.image.Width() || height != screen_.image.Height())
-      return Status::UnsuitableImage;
-    Canvas frame{std::move(picture.image), std::move(picture.alpha)};
-    const Rectangle area = first ? Rectangle{0, 0, width, height} : ChangedArea(screen_, frame);
-    RETURN_IF_BAD(CutImage(frame.image, area, picture.image));
-    RETURN_IF_BAD(CutImage(frame.alpha, area, picture.alpha));
+    Rectangle area;
+    RETURN_IF_BAD(CutToChange(picture, 1, screen_, area));
     RETURN_IF_BAD(WriteFrame(picture, area, delayMs, first));
-    screen_ = std::move(frame);
     ++done_;
     return out_.Failed() ? Status::ErrorWritingFile : Status::Ok;
   }

@@ -14,8 +14,6 @@
 #include "formats/webp/webp.h"
 #include "picture/animation.h"
 #include "processing/changed_area.h"
-#include "processing/geometry/cut.h"
-#include "processing/promote.h"
 
 namespace fotomill {
 
@@ -153,20 +151,10 @@ class WebpSequence final : public SequenceWriter {
   }
 
   Status Add(PictureRecord& picture, int32_t delayMs) override {
-    RETURN_IF_BAD(PromoteToAlpha(picture));
-    const bool first = screen_.image.Empty();
-    if (first) RETURN_IF_BAD(Begin(picture));
-    const int32_t width = picture.image.Width(), height = picture.image.Height();
-    if (width != screen_.image.Width() || height != screen_.image.Height())
-      return Status::UnsuitableImage;
-    Canvas frame{std::move(picture.image), std::move(picture.alpha)};
-    Rectangle area = first ? Rectangle{0, 0, width, height} : ChangedArea(screen_, frame);
-    // offsets are stored divided by two
-    area = {area.x & ~1, area.y & ~1, area.width + (area.x & 1), area.height + (area.y & 1)};
-    RETURN_IF_BAD(CutImage(frame.image, area, picture.image));
-    RETURN_IF_BAD(CutImage(frame.alpha, area, picture.alpha));
+    if (screen_.image.Empty()) Begin(picture);
+    Rectangle area;
+    RETURN_IF_BAD(CutToChange(picture, 2, screen_, area));  // offsets are stored divided by two
     RETURN_IF_BAD(WriteFrame(picture, area, std::clamp(delayMs, 0, kLongestDelay)));
-    screen_ = std::move(frame);
     return out_.Failed() ? Status::ErrorWritingFile : Status::Ok;
   }
 
@@ -180,7 +168,7 @@ class WebpSequence final : public SequenceWriter {
   }
 
  private:
-  Status Begin(const PictureRecord& picture) {
+  void Begin(const PictureRecord& picture) {
     if (options_.KeepsMetadata()) metadata_ = picture.metadata;
     metadata_.icc = picture.metadata.icc;
     out_.Text("RIFF");
@@ -196,7 +184,6 @@ class WebpSequence final : public SequenceWriter {
     out_.Le32(6);
     out_.Le32(0);  // transparent background
     out_.Le16(static_cast<uint16_t>(std::clamp(facts_.rounds, 0, int32_t{UINT16_MAX})));
-    return NewCanvas(picture.image.Width(), picture.image.Height(), screen_);
   }
 
   Status WriteFrame(const PictureRecord& picture, const Rectangle& area, int32_t delay) {

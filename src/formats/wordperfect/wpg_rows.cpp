@@ -2,6 +2,8 @@
 
 #include <algorithm>
 
+#include "formats/split_runs.h"
+
 namespace fotomill {
 
 namespace {
@@ -86,28 +88,12 @@ bool WpgRows::TakeToken2() {
 }
 
 void EncodeWpgRow(std::span<const uint8_t> row, std::vector<uint8_t>& code) {
-  const auto putPlain = [&](std::span<const uint8_t> bytes) {
-    while (!bytes.empty()) {
-      const auto part = bytes.first(std::min(bytes.size(), kMostInToken));
-      code.push_back(static_cast<uint8_t>(part.size()));
-      code.insert(code.end(), part.begin(), part.end());
-      bytes = bytes.subspan(part.size());
-    }
-  };
-  size_t plain = 0;  // start of the pending literal bytes
-  for (size_t x = 0; x < row.size();) {
-    const size_t end = std::min(row.size(), x + kMostInToken);
-    size_t next = x + 1;
-    while (next < end && row[next] == row[x]) ++next;
-    if (next - x >= kShortestRun) {
-      putPlain(row.subspan(plain, x - plain));
-      code.push_back(static_cast<uint8_t>(kRun | (next - x)));
-      code.push_back(row[x]);
-      plain = next;
-    }
-    x = next;
-  }
-  putPlain(row.subspan(plain));
+  SplitRuns(
+      row, kShortestRun, kMostInToken,
+      [&](std::span<const uint8_t> bytes) { AppendCounted(bytes, kMostInToken, code); },
+      [&](size_t count, uint8_t value) {
+        code.insert(code.end(), {static_cast<uint8_t>(kRun | count), value});
+      });
 }
 
 }  // namespace fotomill

@@ -36,18 +36,6 @@ constexpr int kAcross = 2;                                           // panes be
 // around the pane with the focus
 constexpr int kFrameWidth = 3;
 
-template <void (CompareFrame::*action)()>
-void Of(CompareFrame& compare) {
-  (compare.*action)();
-}
-template <void (ViewCanvas::*action)()>
-void OfCanvas(CompareFrame& compare) {
-  (compare.Canvas().*action)();
-}
-template <ZoomMode mode>
-void Zoom(CompareFrame& compare) {
-  compare.Canvas().SetZoom(mode);
-}
 template <int step>
 void StepPane(CompareFrame& compare) {
   compare.StepPane(step);

@@ -7,6 +7,7 @@
 #include <wx/sizer.h>
 
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/widgets/button_row.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -32,15 +33,10 @@ std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title,
   row->Add(folder, wxSizerFlags(1));
   row->Add(browse, wxSizerFlags().Border(wxLEFT, gap));
   sizer->Add(row, wxSizerFlags().Expand().Border(wxALL, gap));
-  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   auto* ok = new wxButton(&dialog, wxID_OK, "&" + verb);
-  buttons->AddStretchSpacer();
-  buttons->Add(new wxButton(&dialog, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
-  buttons->Add(ok);
-  sizer->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap));
+  sizer->Add(BuildAnswerRow(dialog, *ok), wxSizerFlags().Expand().Border(wxALL, gap));
   dialog.SetSizerAndFit(sizer);
   dialog.CentreOnParent();
-  ok->SetDefault();
   const auto isFolder = [&] {
     return platform::IsFolder(platform::AbsolutePath(Utf8(folder->GetValue())));
   };

@@ -9,6 +9,7 @@
 
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/widgets/button_row.h"
 #include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
@@ -40,15 +41,10 @@ bool AskAndSelect(wxWindow& parent, BrowserModel& model) {
   auto* mode = new wxRadioBox(&dialog, wxID_ANY, Label("Selection"), wxDefaultPosition,
                               wxDefaultSize, 3, modes, 1, wxRA_SPECIFY_ROWS);
   sizer->Add(mode, wxSizerFlags().Expand().Border(wxALL, gap));
-  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   auto* ok = new wxButton(&dialog, wxID_OK, Label("S&elect"));
-  buttons->AddStretchSpacer();
-  buttons->Add(new wxButton(&dialog, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
-  buttons->Add(ok);
-  sizer->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap));
+  sizer->Add(BuildAnswerRow(dialog, *ok), wxSizerFlags().Expand().Border(wxALL, gap));
   dialog.SetSizerAndFit(sizer);
   dialog.CentreOnParent();
-  ok->SetDefault();
   pattern->Bind(wxEVT_TEXT, [&](wxCommandEvent&) { ok->Enable(!pattern->IsEmpty()); });
   pattern->SetFocus();
   pattern->SelectAll();

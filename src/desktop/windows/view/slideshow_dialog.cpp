@@ -9,6 +9,7 @@
 #include <wx/stattext.h>
 
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/widgets/button_row.h"
 #include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
@@ -34,18 +35,13 @@ std::optional<SlideshowChoices> AskForSlideshow(wxWindow& parent, const Slidesho
   grid->Add(order);
   auto* repeat = new wxCheckBox(&dialog, wxID_ANY, Label("&Repeat from the start"));
   repeat->SetValue(choices.repeat);
-  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   auto* start = new wxButton(&dialog, wxID_OK, Label("S&tart"));
-  buttons->AddStretchSpacer();
-  buttons->Add(new wxButton(&dialog, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
-  buttons->Add(start);
   auto* column = new wxBoxSizer(wxVERTICAL);
   column->Add(grid, wxSizerFlags().Border(wxALL, gap));
   column->Add(repeat, wxSizerFlags().Border(wxLEFT | wxRIGHT, gap));
-  column->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap));
+  column->Add(BuildAnswerRow(dialog, *start), wxSizerFlags().Expand().Border(wxALL, gap));
   dialog.SetSizerAndFit(column);
   dialog.CentreOnParent();
-  start->SetDefault();
   seconds->SetFocus();
   LogEvent("prompt", "slideshow");
   if (dialog.ShowModal() != wxID_OK) return std::nullopt;

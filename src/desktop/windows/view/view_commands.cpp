@@ -21,21 +21,9 @@ template <int step>
 void StepFrame(ViewFrame& view) {
   view.StepFrame(step);
 }
-template <ZoomMode mode>
-void Zoom(ViewFrame& view) {
-  view.Canvas().SetZoom(mode);
-}
 template <Orientation turn>
 void Turn(ViewFrame& view) {
   view.Turn(turn);
-}
-template <void (ViewFrame::*action)()>
-void Of(ViewFrame& view) {
-  (view.*action)();
-}
-template <void (ViewCanvas::*action)()>
-void OfCanvas(ViewFrame& view) {
-  (view.Canvas().*action)();
 }
 template <int32_t Settings::*setting>
 constexpr auto Switch = SwitchSetting<ViewFrame, setting>;

@@ -6,6 +6,16 @@
 
 namespace fotomill::desktop {
 
+wxSizer* BuildAnswerRow(wxWindow& dialog, wxButton& answer) {
+  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
+  buttons->AddStretchSpacer();
+  buttons->Add(new wxButton(&dialog, wxID_CANCEL),
+               wxSizerFlags().Border(wxRIGHT, dialog.FromDIP(10)));
+  buttons->Add(&answer);
+  answer.SetDefault();
+  return buttons;
+}
+
 wxSizer* BuildButtonRow(wxFrame& frame, wxWindow& panel, std::span<const RowButton> rows) {
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);
   for (const RowButton& row : rows) {

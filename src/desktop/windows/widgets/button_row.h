@@ -6,6 +6,8 @@
 #include <functional>
 #include <span>
 
+class wxButton;
+
 namespace fotomill::desktop {
 
 // A button of the row; wxID_CLOSE is the one apart.
@@ -14,6 +16,10 @@ struct RowButton {
   const char* label;  // in English
   std::function<void()> run;  // when the button is pressed
 };
+
+// The buttons at the foot of a dialog, at the right: `answer`, which becomes its default, behind
+// Cancel.
+wxSizer* BuildAnswerRow(wxWindow& dialog, wxButton& answer);
 
 // The buttons at the foot of a frame, on its panel, the one that closes it apart at the right. A
 // button runs when it is pressed and when the frame's accelerators send its number, as long as it

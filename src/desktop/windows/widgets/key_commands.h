@@ -58,6 +58,20 @@ void ShowCommandMenu(std::span<const KeyCommand<Window>> commands, Window& windo
   owner.PopupMenu(&menu, place);
 }
 
+// Members as commands: of the window itself, and of the canvas in it that has the focus.
+template <auto action, typename Window>
+void Of(Window& window) {
+  (window.*action)();
+}
+template <auto action, typename Window>
+void OfCanvas(Window& window) {
+  (window.Canvas().*action)();
+}
+template <auto mode, typename Window>
+void Zoom(Window& window) {
+  window.Canvas().SetZoom(mode);
+}
+
 // A setting that is on or off, as a command of windows that follow it.
 template <typename Window, int32_t Settings::*setting>
 void SwitchSetting(Window& window) {
