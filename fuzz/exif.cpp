@@ -31,7 +31,7 @@ class Reader : public ExifSink {
     Read(line.text);
     ExifRawValue copy;
     if (!CopyExifValue(line.value, copy)) return;
-    NormaliseExifValue(copy);
+    NormalizeExifValue(copy);
     for (const uint8_t byte : copy.data.Bytes()) sum_ = sum_ + byte;
   }
   bool WithinLimit() const { return size_ <= limits.exifTextBytes + 16 * limits.exifDirectories; }

@@ -87,7 +87,7 @@ struct BatchJob {
   bool noSummary = false;           // no closing count line
   // the overwrite prompt is not shown and counts as answered with OK
   bool applyToRest = false;
-  uint32_t cataloguePage = 0;
+  uint32_t catalogPage = 0;
   SequentialRenameState rename;
   bool filesChanged = false;  // a file was renamed or written: browsers must refresh
 

@@ -32,9 +32,10 @@ class FontFaces {
   double Em() const { return em_; }             // pixels, of all faces
   double Ascent() const { return ascent_; }     // pixels above the baseline, of the family's font
   double Descent() const { return descent_; }   // pixels below it
-  FT_Library Library() const { return library_; }
+  FT_Library Library() const { return library_; }  // owned here, as what follows; null until opened
+  // `face` as FaceFor returns it.
   FT_Face Outlines(size_t face) const { return faces_[face].outlines; }
-  hb_font_t* Shaper(size_t face) const { return faces_[face].shaper; }
+  hb_font_t* Shaper(size_t face) const { return faces_[face].shaper; }  // of the same face and size
 
   // The first face that has all of the characters, else the first that has the first of them, else
   // the family's own.

@@ -22,13 +22,14 @@ class FontFiles {
   // fontconfig. Cached; thread-safe.
   static std::shared_ptr<const FontFiles> Of(std::string_view family);
 
+  // Asks fontconfig, which takes a while; Of caches.
   explicit FontFiles(std::string_view family);
   ~FontFiles();
   FontFiles(const FontFiles&) = delete;
   FontFiles& operator=(const FontFiles&) = delete;
 
-  size_t Count() const;
-  const FontFile& At(size_t index) const;
+  size_t Count() const;                    // 0 without any font
+  const FontFile& At(size_t index) const;  // below Count, the best first
   // Whether a font has a glyph for a character.
   bool Has(size_t index, char32_t character) const;
 

@@ -87,23 +87,25 @@ std::string FileOperationName(const FileOperation& operation);
 // What can be undone and redone, up to a number of operations.
 class UndoList {
  public:
-  explicit UndoList(size_t most) : most_(most) {}
+  explicit UndoList(size_t most) : most_(most) {}  // keeps that many
   // A new operation; what had been undone can no longer be redone. Operations without steps are not
   // kept.
   void Add(FileOperation operation);
-  bool CanUndo() const { return !done_.empty(); }
-  bool CanRedo() const { return !undone_.empty(); }
+  bool CanUndo() const { return !done_.empty(); }    // there is something to take back
+  bool CanRedo() const { return !undone_.empty(); }  // something taken back can be done again
+  // What Undo would take back, as FileOperationName says it; empty for nothing.
   std::string UndoName() const {
     return CanUndo() ? FileOperationName(done_.back()) : std::string();
   }
+  // What Redo would do again; empty for nothing.
   std::string RedoName() const {
     return CanRedo() ? FileOperationName(undone_.back()) : std::string();
   }
   // Hands out the step to undo or redo; the result comes back by Undone or Redone.
   FileOperation PopUndo();
-  FileOperation PopRedo();
-  void Undone(FileOperation operation);
-  void Redone(FileOperation operation);
+  FileOperation PopRedo();               // as PopUndo; the list must not be empty
+  void Undone(FileOperation operation);  // the steps that were taken back; they can be redone
+  void Redone(FileOperation operation);  // the steps that were done again
 
  private:
   void Keep(std::vector<FileOperation>& list, FileOperation operation);

@@ -133,7 +133,7 @@ def open_select_view(folder):
         desktop.key("alt+Up")
         desktop.wait(r"listing=0 view=4 .*/pictures$")
         desktop.key("ctrl+d")
-        desktop.wait(r"favourites 1")
+        desktop.wait(r"favorites 1")
         # The menu of visited folders, and a typed path with completion.
         desktop.key("alt+Down")
         desktop.wait(r"folder-menu 3")

@@ -6,7 +6,7 @@
 #include "core/data_folder.h"
 #include "desktop/models/files/operation_options.h"
 #include "desktop/models/files/pasted_picture.h"
-#include "desktop/models/shell/favourites.h"
+#include "desktop/models/shell/favorites.h"
 #include "desktop/models/shell/session.h"
 #include "desktop/models/shell/tab_sets.h"
 #include "desktop/models/thumbnails/thumbnail.h"
@@ -95,19 +95,19 @@ TEST_F(DesktopFilesTest, PastedPicturesGetAFreeName) {
   EXPECT_EQ(KeepPastedPicture(pasted, folder_.Path("none")).failures.size(), 1u);
 }
 
-TEST(Favourites, AreKeptInOrderAndFollowRenames) {
+TEST(Favorites, AreKeptInOrderAndFollowRenames) {
   const test::TemporaryFolder folder;
   const std::string before = DataFolder();
   SetDataFolder(folder.Path());
-  Favourites favourites;
-  for (const char* added : {"/b", "/a/c", "/b", "/a b"}) EXPECT_TRUE(favourites.Add(added));
-  EXPECT_FALSE(favourites.Add("/new\nline"));
-  Favourites other;  // in another process
+  Favorites favorites;
+  for (const char* added : {"/b", "/a/c", "/b", "/a b"}) EXPECT_TRUE(favorites.Add(added));
+  EXPECT_FALSE(favorites.Add("/new\nline"));
+  Favorites other;  // in another process
   EXPECT_TRUE(other.Remove("/b"));
-  EXPECT_TRUE(favourites.FollowRename("/a", "/z"));
-  EXPECT_FALSE(favourites.FollowRename("/q", "/z"));
-  favourites.Load();
-  EXPECT_EQ(favourites.Folders(), (std::vector<std::string>{"/z/c", "/a b"}));
+  EXPECT_TRUE(favorites.FollowRename("/a", "/z"));
+  EXPECT_FALSE(favorites.FollowRename("/q", "/z"));
+  favorites.Load();
+  EXPECT_EQ(favorites.Folders(), (std::vector<std::string>{"/z/c", "/a b"}));
   SetDataFolder(before);
 }
 

@@ -136,11 +136,11 @@ TEST(ExifValue, DecodesUserComments) {
   }
 }
 
-TEST(ExifValue, NormalisesRawCopies) {
+TEST(ExifValue, NormalizesRawCopies) {
   const struct {
     uint16_t type;
     // big-endian, as in the file; little-endian, as the editor expects
-    const char *bytes, *normalised;
+    const char *bytes, *normalized;
   } rows[] = {
       {S, "0102 0304 0506", "02010000 04030000 06050000"},  // 32-bit slots
       {S, "0102 03", "02010000 00030000"},                  // the block ends within the second
@@ -153,12 +153,12 @@ TEST(ExifValue, NormalisesRawCopies) {
   for (const auto& row : rows) {
     SCOPED_TRACE(row.bytes);
     const auto big = Hex(row.bytes);
-    auto little = Hex(row.normalised);
+    auto little = Hex(row.normalized);
     ExifRawValue copy;
     ASSERT_TRUE(CopyExifValue({0x0100, row.type, 9, ExifBytes(big, true)}, copy));
     EXPECT_TRUE(copy.bigEndian);
     for (int times = 0; times < 2; ++times) {  // the second time is a no-op
-      NormaliseExifValue(copy);
+      NormalizeExifValue(copy);
       little.resize(copy.data.Size());
       EXPECT_TRUE(std::ranges::equal(copy.data.Bytes(), little));
     }

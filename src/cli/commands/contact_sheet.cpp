@@ -12,7 +12,7 @@
 #include "cli/frame/terminal_box.h"
 #include "cli/frame/terminal_prompts.h"
 #include "cli/selection/file_selection.h"
-#include "pages/catalogue_page.h"
+#include "pages/catalog_page.h"
 #include "platform/existence.h"
 #include "platform/files.h"
 #include "settings/settings.h"
@@ -61,7 +61,7 @@ int32_t FirstAbove0(int32_t option, int32_t setting, int32_t usual) {
 }
 
 // Fills `look`. Returns what is wrong with the options, a whole sentence; empty if nothing is.
-std::string ReadLook(const SheetOptions& options, CatalogueLook& look) {
+std::string ReadLook(const SheetOptions& options, CatalogLook& look) {
   look.columns = FirstAbove0(options.columns, settings.CatalogLandscapeWide, kColumns);
   look.rows = FirstAbove0(options.rows, settings.CatalogLandscapeDeep, kRows);
   look.cellWidth = look.cellHeight = options.cell;

@@ -7,9 +7,11 @@ namespace fotomill::cli {
 // Commands "thumbs make", "show", "draw", "list" and "clean": declare names and options in `app`
 // and set context.run.
 void SetUpThumbsMake(CLI::App& app, CommandContext& context);
+// Writes a stored thumbnail as a picture.
 void SetUpThumbsShow(CLI::App& app, CommandContext& context);
+// Scales a picture down; stores nothing.
 void SetUpThumbsDraw(CLI::App& app, CommandContext& context);
-void SetUpThumbsList(CLI::App& app, CommandContext& context);
-void SetUpThumbsClean(CLI::App& app, CommandContext& context);
+void SetUpThumbsList(CLI::App& app, CommandContext& context);   // which pictures have current ones
+void SetUpThumbsClean(CLI::App& app, CommandContext& context);  // deletes those without a picture
 
 }  // namespace fotomill::cli

@@ -7,6 +7,7 @@ namespace fotomill::cli {
 
 // What the completion scripts of all shells offer.
 
+// A word to offer.
 struct Word {
   std::string text;
   std::string help;  // in the user's language, one line
@@ -19,6 +20,7 @@ struct Choice {
   bool goesOn = false;      // a word is not complete yet: "KEY=" is followed by a value
 };
 
+// An option, and what may follow it.
 struct OptionWords {
   std::vector<std::string> names;  // "--to", "-t"
   std::string help;
@@ -26,6 +28,7 @@ struct OptionWords {
   Choice value;
 };
 
+// A command with all that may follow its name.
 struct CommandWords {
   std::string name;  // one word or two
   std::string summary;
@@ -45,8 +48,8 @@ std::vector<OptionWords> GlobalOptionWords();
 
 // The script of a shell.
 std::string BashCompletion();
-std::string ZshCompletion();
-std::string FishCompletion();
-std::string PowerShellCompletion();
+std::string ZshCompletion();         // a function _fotomill for fpath
+std::string FishCompletion();        // "complete" lines
+std::string PowerShellCompletion();  // Register-ArgumentCompleter
 
 }  // namespace fotomill::cli

@@ -12,8 +12,10 @@ namespace fotomill {
 
 // The structure of a FlashPix file. For the layout see fpx_file.cpp.
 
+// What channels mean, by their number.
 enum class FpxColors : uint8_t { Gray = 1, PhotoYcc = 2, Rgb = 3 };
 
+// Where the pixels of a tile are, and how they are stored.
 struct FpxTile {
   uint64_t offset = 0, size = 0;  // of its data in the tile stream
   uint32_t compression = 0;       // 0 none, 1 one color, 2 JPEG
@@ -32,17 +34,20 @@ struct FpxSize {
   std::vector<FpxTile> tiles;
   CompoundStream data;
 
-  int32_t TilesAcross() const { return (width + tileWidth - 1) / tileWidth; }
+  int32_t TilesAcross() const {
+    return (width + tileWidth - 1) / tileWidth;
+  }  // the last may be cut
   int32_t TilesDown() const { return (height + tileHeight - 1) / tileHeight; }
 };
 
+// The picture of a file, stored in up to 32 sizes.
 class FpxFile {
  public:
   // `file` must outlive this object.
   Status Open(std::span<const uint8_t> file);
-  int32_t Sizes() const { return sizes_; }
+  int32_t Sizes() const { return sizes_; }  // at least 1 after Open
   int32_t Width() const { return width_; }  // of the largest resolution
-  int32_t Height() const { return height_; }
+  int32_t Height() const { return height_; }  // pixels
   // Whether a view rotates or changes the picture; not applied.
   bool HasTransform() const { return transform_; }
   // Resolution `index`, smallest first; tiles are read only if `withTiles`.

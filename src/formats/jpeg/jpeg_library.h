@@ -28,7 +28,7 @@ struct JpegErrors {
   int code = 0;
   bool stopped = false;  // canceled by the caller
 
-  void Set();
+  void Set();  // installs these handlers
   // The status for a failed library call; `common` is the object it was called for.
   Status Meaning(j_common_ptr common);
 };
@@ -44,11 +44,12 @@ bool Guarded(JpegErrors& errors, Action action) {
 
 // A libjpeg decompressor with its error handler.
 struct JpegReader {
-  JpegReader();
+  JpegReader();  // makes the decompressor; its errors jump only within Guarded
   ~JpegReader() { jpeg_destroy_decompress(&info); }
   JpegReader(const JpegReader&) = delete;
   JpegReader& operator=(const JpegReader&) = delete;
 
+  // After Guarded was false.
   Status Failure() { return errors.Meaning(static_cast<j_common_ptr>(static_cast<void*>(&info))); }
 
   JpegErrors errors;

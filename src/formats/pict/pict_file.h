@@ -12,6 +12,7 @@ namespace fotomill {
 // The bitmaps of a Macintosh picture, as views
 // into the file. For the layout see pict_file.cpp.
 
+// Pixels that an operation draws.
 struct PictPixels {
   size_t rowBytes = 0;   // unpacked
   Rectangle bounds;      // of the stored rows
@@ -30,9 +31,10 @@ struct PictPixels {
   // `data` is a JPEG file; of the fields above only `target` is used
   bool jpeg = false;
 
-  bool Indexed() const { return !jpeg && bits <= 8; }
+  bool Indexed() const { return !jpeg && bits <= 8; }  // pixels are numbers of colors
 };
 
+// What is read of a file: its frame, and what is drawn into it in that order.
 struct PictFile {
   int32_t version = 1;
   Rectangle frame;

@@ -36,7 +36,7 @@ enum class ExifRule : uint8_t {
   SubjectArea,      // a point, a circle or a rectangle, by the number of values
   SubjectLocation,  // a point
   Lens,             // shortest and longest focal length, F-stop at each
-  Distance,         // of the subject, in whole metres
+  Distance,         // of the subject, in whole meters
   GpsTime,          // three rationals
   Comment,          // text behind an 8-byte character code
 };

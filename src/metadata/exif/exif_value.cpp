@@ -321,7 +321,7 @@ bool CopyExifValue(const ExifValue& value, ExifRawValue& copy) {
   return true;
 }
 
-void NormaliseExifValue(ExifRawValue& copy) {
+void NormalizeExifValue(ExifRawValue& copy) {
   if (!copy.bigEndian) return;
   copy.bigEndian = false;
   const bool isShort = copy.type == kExifShort;

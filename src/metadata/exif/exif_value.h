@@ -55,6 +55,6 @@ struct ExifRawValue {
 // Turns a copy in "MM" order into "II" order in place: a SHORT becomes the upper half of its
 // swapped slot, LONG and SLONG and both halves of rationals are swapped, other types stay. A copy
 // in "II" order is left alone.
-void NormaliseExifValue(ExifRawValue& copy);
+void NormalizeExifValue(ExifRawValue& copy);
 
 }  // namespace fotomill

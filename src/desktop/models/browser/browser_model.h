@@ -24,7 +24,7 @@ class BrowserModel {
   const std::string& Folder() const { return folder_; }
   const BrowserModes& Modes() const { return view_.modes; }  // view mode, thumbnails, sort mode
   bool Descending() const { return view_.descending; }  // of the sort mode
-  const FolderView& View() const { return view_; }
+  const FolderView& View() const { return view_; }      // all modes and the order in one
   void SetView(const FolderView& view);  // sorts anew where the order changes
   void SetSort(int32_t sortMode, bool descending);  // choice::SortMode
 
@@ -45,9 +45,9 @@ class BrowserModel {
   // Items are what the folder holds, lines what the filter lets pass, both from 0. The model keeps
   // what is returned until the next change.
   size_t ItemCount() const { return items_.size(); }
-  const FolderItem& Item(size_t item) const { return items_[item]; }
-  size_t LineCount() const { return lines_.size(); }
-  size_t ItemOfLine(size_t line) const { return lines_[line]; }
+  const FolderItem& Item(size_t item) const { return items_[item]; }  // below ItemCount
+  size_t LineCount() const { return lines_.size(); }                  // at most ItemCount
+  size_t ItemOfLine(size_t line) const { return lines_[line]; }       // below LineCount
   const FolderItem& Line(size_t line) const { return items_[lines_[line]]; }
   std::string PathOfLine(size_t line) const;  // folder and name
   // The line of that name, kNoLine when it is not shown.

@@ -23,10 +23,10 @@ class Selection {
   // How many lines there are and how many are selected; focus and anchor are kNoLine when they are
   // nowhere.
   size_t Count() const { return selected_.size(); }
-  size_t SelectedCount() const { return selectedCount_; }
+  size_t SelectedCount() const { return selectedCount_; }  // at most Count
   // False beyond the last line.
   bool IsSelected(size_t line) const { return line < selected_.size() && selected_[line]; }
-  size_t Focus() const { return focus_; }
+  size_t Focus() const { return focus_; }    // a line, or kNoLine
   size_t Anchor() const { return anchor_; }  // where a range begins that Shift extends
   // Selected lines in list order.
   std::vector<size_t> SelectedLines() const;
@@ -53,6 +53,7 @@ class Selection {
   // The rubber band: `inside` are the lines that it touches now; with `keep` they add to what was
   // selected when it began.
   void BeginBand(bool keep);
+  // Lines that the band has left get back what they were.
   void MoveBand(std::span<const size_t> inside);
 
  private:

@@ -30,7 +30,7 @@ const char* TitleOf(SetupPage page);
 
 // One setting in a Setup page or an option box: its page, the box around it, the key, its label.
 // Rows of one page and group stand together, in the order in which they are shown. A new setting in
-// Setup is one row here, or of a format one in its rows.cpp, and one entry in docs/user/settings.md.
+// Setup is a row here, or of a format one in its rows.cpp, and an entry in docs/user/settings.md.
 struct SetupItem {
   SetupPage page;
   const char* group;

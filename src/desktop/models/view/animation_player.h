@@ -19,7 +19,7 @@ class AnimationPlayer {
   void Play();
   // Stays at the current frame.
   void Pause();
-  bool Playing() const { return playing_; }
+  bool Playing() const { return playing_; }  // between Play and Pause, or the end of the last round
   // Pauses and goes that many frames on, or back; beyond the last one comes the first one.
   void Step(int32_t frames);
   // The size that frames are decoded for, in pixels.

@@ -80,6 +80,7 @@ Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixe
 
 // Makes a decoded picture what the request of `view` asks for. Statuses of PrepareForDisplay.
 Status PrepareView(PicturePointer picture, ViewPicture& view);
+// Decodes and prepares a picture; never null, its status tells a failure. Any thread.
 ViewPicturePointer LoadViewPicture(const ViewRequest& request);
 // A turned copy of a picture that was loaded; null if there is no memory for it.
 ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn);
@@ -120,6 +121,7 @@ class ViewLoader {
 // Scales pictures apart; only the latest request counts.
 class ViewScaler {
  public:
+  // `wake` is called on a thread of the pool when Fetch has something.
   explicit ViewScaler(std::function<void()> wake);
   ~ViewScaler() = default;
   ViewScaler(const ViewScaler&) = delete;
@@ -127,6 +129,7 @@ class ViewScaler {
 
   // Wants the picture scaled to a size in device pixels, in place of an earlier request.
   void Request(ViewPicturePointer picture, int32_t width, int32_t height);
+  // A picture, and its pixels in the size that was wanted.
   struct Scaled {
     ViewPicturePointer picture;
     ViewPixels pixels;

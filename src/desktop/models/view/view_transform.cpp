@@ -28,7 +28,7 @@ void ViewTransform::SetPicture(int32_t width, int32_t height) {
   pictureWidth_ = std::max(width, 1);
   pictureHeight_ = std::max(height, 1);
   ScaleByMode();
-  PutCentre(place.centreX, place.centreY);
+  PutCenter(place.centerX, place.centerY);
 }
 
 void ViewTransform::SetWindow(int32_t width, int32_t height) {
@@ -78,12 +78,12 @@ void ViewTransform::SetPlace(const ViewPlace& place) {
   if (mode_ == ZoomMode::Free)
     scale_ = std::clamp(place.timesFit * FitScale(), kSmallest, kLargest);
   ScaleByMode();
-  PutCentre(place.centreX, place.centreY);
+  PutCenter(place.centerX, place.centerY);
 }
 
 void ViewTransform::StartAfresh(int32_t zoom) {
   if (mode_ == ZoomMode::Free) SetModeFromKey(zoom);
-  PutCentre(0.5, 0.5);
+  PutCenter(0.5, 0.5);
 }
 
 int32_t ViewTransform::ShownWidth() const {
@@ -118,7 +118,7 @@ void ViewTransform::Update() {
   KeepInside();
 }
 
-void ViewTransform::PutCentre(double x, double y) {
+void ViewTransform::PutCenter(double x, double y) {
   x_ = windowWidth_ / 2.0 - x * ShownWidth();
   y_ = windowHeight_ / 2.0 - y * ShownHeight();
   KeepInside();

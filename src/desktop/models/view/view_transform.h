@@ -13,7 +13,7 @@ struct ViewPlace {
   ZoomMode mode = ZoomMode::Fit;
   double timesFit = 1;                  // the scale as a multiple of that which fits the window
   // what is in the middle of the window, in parts of the picture
-  double centreX = 0.5, centreY = 0.5;
+  double centerX = 0.5, centerY = 0.5;
 };
 
 // Where a picture is in a view window and how large: pure arithmetic in device pixels. A scale of 1
@@ -39,6 +39,7 @@ class ViewTransform {
   void Pan(double dx, double dy);  // device pixels; stops at the picture's edges
   // Zoom and position, for SetPlace of a later picture.
   ViewPlace Place() const;
+  // From another picture or canvas; within the limits of the scale.
   void SetPlace(const ViewPlace& place);
   // To the middle; a zoom of its own gives way to what the key stands for, fitting stays.
   void StartAfresh(int32_t zoom);
@@ -48,10 +49,10 @@ class ViewTransform {
   double Scale() const { return scale_; }
   // Size on the screen, at least a pixel.
   int32_t ShownWidth() const;
-  int32_t ShownHeight() const;
+  int32_t ShownHeight() const;  // device pixels
   // Of the picture's top left corner; negative when it is outside.
   int32_t X() const;
-  int32_t Y() const;
+  int32_t Y() const;  // device pixels
   // More of the picture is outside the window.
   bool CanPan() const { return ShownWidth() > windowWidth_ || ShownHeight() > windowHeight_; }
 
@@ -59,7 +60,7 @@ class ViewTransform {
   double FitScale() const;
   void ScaleByMode();
   void Update();
-  void PutCentre(double x, double y);
+  void PutCenter(double x, double y);
   void KeepInside();
 
   int32_t pictureWidth_ = 1, pictureHeight_ = 1;

@@ -54,8 +54,8 @@ class BrowserPage : public wxPanel {
   void Reload();  // reads the folder again; the selection stays with its names
   // Goes back, or ahead, to folders that this browser showed.
   void StepAlongTrail(int steps);
-  void GoBack() { StepAlongTrail(-1); }
-  void GoForward() { StepAlongTrail(1); }
+  void GoBack() { StepAlongTrail(-1); }    // nothing at the beginning of the trail
+  void GoForward() { StepAlongTrail(1); }  // nothing at its end
   void GoUp();  // to the parent folder
 
   // What the browser shows. After changing its selection, call SelectionChanged.
@@ -64,8 +64,8 @@ class BrowserPage : public wxPanel {
   // By choice::ViewMode, choice::ThumbnailMode and choice::SortMode; the folder's view is kept as
   // well.
   void SetViewMode(int32_t mode);
-  void SetThumbnailMode(int32_t mode);
-  void SetSort(int32_t sort, bool descending);
+  void SetThumbnailMode(int32_t mode);          // reads them anew, from there
+  void SetSort(int32_t sort, bool descending);  // the selection stays with its files
   // Next larger or smaller way of showing thumbnails.
   void ChangeSize(int steps);
   // Shows the selection as the model has it now.
@@ -73,9 +73,9 @@ class BrowserPage : public wxPanel {
   // Focus on the line of a name, scrolled into view.
   void FocusName(const std::string& name);
   void EditFocusedName();  // in place, in the list
-  void EditPath();
+  void EditPath();         // the keyboard goes to the path, all of it selected
   void OfferTrail();  // the folders to go back to, as a menu
-  void EditFilter();
+  void EditFilter();  // the keyboard goes to the filter
   // Lets the user choose the columns of the details, which are then shown.
   void ChooseColumns();
   // Takes down how the columns are arranged here.
@@ -84,7 +84,7 @@ class BrowserPage : public wxPanel {
   void Activated();
   void FocusList();  // the keyboard goes to the list
   bool Listing() const { return reader_.Listing(); }  // the folder is still being read
-  size_t MissingThumbnails() const;
+  size_t MissingThumbnails() const;                   // of the pictures shown
   int64_t Scroll() const;  // pixels
   // Scrolled so far once the folder is listed.
   void RestoreScroll(int64_t scroll) { wantedScroll_ = scroll; }

@@ -14,11 +14,11 @@ class DetailsList : public wxDataViewCtrl {
  public:
   // What the user did in it; lines are those of the model.
   struct Events {
-    std::function<void()> selectionChanged;
-    std::function<void(size_t line)> activated;
-    std::function<void(size_t line, const wxPoint&)> contextMenu;
+    std::function<void()> selectionChanged;                        // the model has it already
+    std::function<void(size_t line)> activated;                    // double click or Return
+    std::function<void(size_t line, const wxPoint&)> contextMenu;  // the point is one of the list
     std::function<void(int32_t sortMode)> sort;  // the head of a column was clicked
-    std::function<void()> dragBegins;
+    std::function<void()> dragBegins;            // of the selection
   };
 
   // `columns` are the frame's: all lists show the same.

@@ -19,7 +19,9 @@ class FolderReader {
  public:
   // Called on the window's thread, never after the reader has gone.
   struct Events {
+    // Names alone first where that was asked for: `complete` is false then.
     std::function<void(FolderListing listing, bool complete)> listed;
+    // `last`: nothing more comes.
     std::function<void(const PlacedItems& found, bool last)> factsFound;
   };
   explicit FolderReader(Events events) : events_(std::move(events)) {}

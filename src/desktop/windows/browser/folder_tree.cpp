@@ -19,7 +19,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-enum Image { kFolderImage, kHomeImage, kFavouriteImage, kVolumeImage };
+enum Image { kFolderImage, kHomeImage, kFavoriteImage, kVolumeImage };
 
 struct FolderData : wxTreeItemData {
   explicit FolderData(std::string path) : folder(std::move(path)) {}
@@ -36,12 +36,12 @@ struct FolderTree::Place {
   std::string folder;
 };
 
-FolderTree::FolderTree(wxWindow* parent, const Favourites& favourites, Events events)
+FolderTree::FolderTree(wxWindow* parent, const Favorites& favorites, Events events)
     : wxTreeCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
                  wxTR_HAS_BUTTONS | wxTR_HIDE_ROOT | wxTR_LINES_AT_ROOT | wxTR_NO_LINES |
                      wxTR_FULL_ROW_HIGHLIGHT | wxBORDER_NONE,
                  wxDefaultValidator, Label("Folders")),
-      favourites_(favourites),
+      favorites_(favorites),
       events_(std::move(events)) {
   LoadImages();
   Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
@@ -70,7 +70,7 @@ FolderTree::FolderTree(wxWindow* parent, const Favourites& favourites, Events ev
 // In the color of texts.
 void FolderTree::LoadImages() {
   wxVector<wxBitmapBundle> images;
-  for (const char* symbol : {"folder", "home", "favourite", "volume"})
+  for (const char* symbol : {"folder", "home", "favorite", "volume"})
     images.push_back(Symbol(symbol));
   SetImages(images);
 }
@@ -79,9 +79,9 @@ void FolderTree::LoadImages() {
 
 std::vector<FolderTree::Place> FolderTree::Places() const {
   std::vector<Place> places;
-  for (const std::string& folder : favourites_.Folders()) {
+  for (const std::string& folder : favorites_.Folders()) {
     const std::string_view name = platform::FileNameOf(folder);
-    places.push_back({kFavouriteImage, Shown(name.empty() ? folder : name), folder});
+    places.push_back({kFavoriteImage, Shown(name.empty() ? folder : name), folder});
   }
   const std::string home = platform::SpecialFolderPath(platform::SpecialFolder::Home);
   const std::string pictures = platform::SpecialFolderPath(platform::SpecialFolder::Pictures);
@@ -264,8 +264,8 @@ void FolderTree::ShowMenu(const wxTreeItemId& item, const wxPoint& point) {
   wxMenuItem* const rename = menu.Append(wxID_ANY, Label("&Rename..."));
   rename->Enable(named);
   menu.AppendSeparator();
-  const int toggle = menu.Append(wxID_ANY, favourites_.Has(folder) ? Label("Remove from &favorites")
-                                                                   : Label("Add to &favorites"))
+  const int toggle = menu.Append(wxID_ANY, favorites_.Has(folder) ? Label("Remove from &favorites")
+                                                                  : Label("Add to &favorites"))
                          ->GetId();
   LogEvent("tree-menu", folder);
   const int chosen = GetPopupMenuSelectionFromUser(menu, point);
@@ -273,7 +273,7 @@ void FolderTree::ShowMenu(const wxTreeItemId& item, const wxPoint& point) {
   if (chosen == openInTab) events_.openInTab(folder);
   if (chosen == newFolder) events_.newFolder(folder);
   if (chosen == rename->GetId()) AskForName(folder);
-  if (chosen == toggle) events_.toggleFavourite(folder);
+  if (chosen == toggle) events_.toggleFavorite(folder);
 }
 
 void FolderTree::AskForName(const std::string& folder) {

@@ -9,26 +9,26 @@
 #include <utility>
 #include <vector>
 
-#include "desktop/models/shell/favourites.h"
+#include "desktop/models/shell/favorites.h"
 
 namespace fotomill::desktop {
 
-// The folders at the left of the frame: the user's favourites, home, pictures, mounted volumes and
+// The folders at the left of the frame: the user's favorites, home, pictures, mounted volumes and
 // the root of the file system. Folders are read when they open, on a thread of their own.
 class FolderTree : public wxTreeCtrl {
  public:
   // What the user did in it.
   struct Events {
-    std::function<void(const std::string& folder)> chosen;
-    std::function<void(const std::string& folder)> openInTab;
+    std::function<void(const std::string& folder)> chosen;     // by the user, not by Follow
+    std::function<void(const std::string& folder)> openInTab;  // a new one
     std::function<void(const std::string& folder)> newFolder;  // in that one
-    std::function<void(const std::string& folder, const std::string& name)> rename;
-    std::function<void(const std::string& folder)> toggleFavourite;
+    std::function<void(const std::string& folder, const std::string& name)> rename;  // to that name
+    std::function<void(const std::string& folder)> toggleFavorite;
   };
-  // The favourites are the frame's; they outlive the tree.
-  FolderTree(wxWindow* parent, const Favourites& favourites, Events events);
+  // The favorites are the frame's; they outlive the tree.
+  FolderTree(wxWindow* parent, const Favorites& favorites, Events events);
 
-  // Shows the favourites and the volumes as they are now.
+  // Shows the favorites and the volumes as they are now.
   void UpdatePlaces();
   // Reads the folders that are open again.
   void Reread();
@@ -58,7 +58,7 @@ class FolderTree : public wxTreeCtrl {
   void ShowMenu(const wxTreeItemId& item, const wxPoint& point);
   void AskForName(const std::string& folder);
 
-  const Favourites& favourites_;
+  const Favorites& favorites_;
   const Events events_;
   std::string followed_;
   // folders that open once they have been read

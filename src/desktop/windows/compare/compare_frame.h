@@ -22,6 +22,7 @@ class CompareFrame : public wxFrame {
   // Whether that number of files can be compared.
   static constexpr bool CanShow(size_t files) { return files >= 2 && files <= 4; }
 
+  // A pane for each file, for which CanShow holds; destroys itself when it is closed.
   CompareFrame(Shell& shell, const std::vector<std::string>& files);
   ~CompareFrame() override;
 
@@ -29,12 +30,12 @@ class CompareFrame : public wxFrame {
   void FilesChanged();
   // Commands, by keys and menu.
   ViewCanvas& Canvas() { return *panes_[focus_].canvas; }
-  bool Joined() const { return joined_; }
-  void ToggleJoined();
-  void StepPane(int panes);
+  bool Joined() const { return joined_; }  // zoom and place are those of all panes
+  void ToggleJoined();                     // joined, all take those of the pane with the focus
+  void StepPane(int panes);                // moves the focus, around the ends
   void ToggleFullScreen();
-  void SettingSwitched();
-  void ShowInfoWindow();
+  void SettingSwitched();  // one that says how pictures look: all are loaded again
+  void ShowInfoWindow();   // of the pane with the focus
   void DeleteFile();  // to the trash, and its pane goes
   void Leave();       // full screen first, then the window
 

@@ -18,7 +18,7 @@ class Shell;
 // kept so that it can be taken back.
 class FileActions : public wxEvtHandler {
  public:
-  explicit FileActions(Shell& shell);
+  explicit FileActions(Shell& shell);  // the shell outlives it
   ~FileActions() override = default;
 
   // False when there is no trash and the user, being asked, declined.
@@ -28,14 +28,17 @@ class FileActions : public wxEvtHandler {
   bool TrashFromView(wxWindow* view, const std::string& path);
   // Asks first. False when the answer was no.
   bool Delete(const std::vector<std::string>& paths);
+  // Copies files and folders; a name that is taken gets a number.
   void CopyTo(const std::vector<std::string>& paths, const std::string& folder);
+  // Moves them; where a name is taken, that one stays and is told of.
   void MoveTo(const std::vector<std::string>& paths, const std::string& folder);
   // Files were dropped on a folder.
   void Drop(const std::vector<std::string>& paths, const std::string& folder, bool move);
+  // `name` without a folder; reports when it is taken.
   void Rename(const std::string& path, const std::string& name);
   // Several files at once, as the caller has planned it.
   void RenameAll(std::vector<FileStep> steps);
-  void NewFolder(const std::string& parent);
+  void NewFolder(const std::string& parent);  // asks for its name
   // Turns the picture in a file; `then` is told whether that was done, with a remark. False when
   // something else is being done.
   using Turned = std::function<void(bool done, const std::string& note)>;
@@ -43,16 +46,16 @@ class FileActions : public wxEvtHandler {
 
   // Takes back what was done last, or does it again; nothing while something is being done.
   void Undo();
-  void Redo();
+  void Redo();  // what Undo took back last
   // Somebody else did it; it can be taken back like the rest.
   void NoteDone(FileOperation operation) { undo_.Add(std::move(operation)); }
-  const UndoList& Undoable() const { return undo_; }
-  bool Busy() const { return busy_; }
+  const UndoList& Undoable() const { return undo_; }  // for the state and names of Undo and Redo
+  bool Busy() const { return busy_; }  // something is being done; nothing else can begin
   void Stop() { task_.Stop(); }
 
   // The clipboard holds the files for other programs too; `cut` asks whoever pastes to move them.
   void ToClipboard(const std::vector<std::string>& paths, bool cut);
-  void PathsToClipboard(const std::vector<std::string>& paths);
+  void PathsToClipboard(const std::vector<std::string>& paths);  // as text, a path a line
   // Files, or else a picture, which becomes a file.
   void Paste(const std::string& folder);
 
@@ -75,8 +78,8 @@ class FileActions : public wxEvtHandler {
 
 // Functions of the frame's menu.
 void TrashSelection(Shell& shell);
-void DeleteSelection(Shell& shell);
-void CopySelectionTo(Shell& shell);
-void MoveSelectionTo(Shell& shell);
+void DeleteSelection(Shell& shell);  // for good, after asking
+void CopySelectionTo(Shell& shell);  // asks for the folder
+void MoveSelectionTo(Shell& shell);  // asks for the folder
 
 }  // namespace fotomill::desktop

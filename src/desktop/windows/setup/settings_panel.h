@@ -13,7 +13,7 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// A page of settings: a box for each group, in it a labelled control for each key, and a mark
+// A page of settings: a box for each group, in it a labeled control for each key, and a mark
 // before those that do not show their default. It fills nothing: whoever made it binds its
 // controls.
 class SettingsPanel : public wxScrolledWindow {

@@ -4,7 +4,7 @@
 #include <wx/frame.h>
 
 #include "desktop/models/shell/event_log.h"
-#include "desktop/models/shell/favourites.h"
+#include "desktop/models/shell/favorites.h"
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/shell/frame_menus.h"
 #include "desktop/windows/shell/picture_windows.h"

@@ -99,10 +99,10 @@ void ChooseToolbar(Shell& shell) { shell.Toolbar().Choose(); }
 void Quit(Shell& shell) { shell.Window().Close(); }
 void ToggleFolders(Shell& shell) { shell.Folders().Show(!shell.Folders().Shown()); }
 void ReadFoldersAgain(Shell& shell) { shell.FilesChanged(); }
-void ToggleFavourite(Shell& shell) {
-  shell.Folders().ToggleFavourite(shell.Tabs().CurrentFolder());
+void ToggleFavorite(Shell& shell) {
+  shell.Folders().ToggleFavorite(shell.Tabs().CurrentFolder());
 }
-bool IsFavourite(Shell& shell) { return shell.Folders().IsFavourite(shell.Tabs().CurrentFolder()); }
+bool IsFavorite(Shell& shell) { return shell.Folders().IsFavorite(shell.Tabs().CurrentFolder()); }
 void Larger(Shell& shell) {
   if (BrowserPage* browser = shell.Tabs().Front()) browser->ChangeSize(1);
 }
@@ -181,7 +181,7 @@ constexpr Command kCommands[] = {
     {kGo, TrLater("Visited f&olders..."), "Alt+Down",  TrLater("Lists the folders that this tab has shown."), Needs::Nothing, OfBrowser<&BrowserPage::OfferTrail>},
     {kGo, TrLater("&Parent folder"),        "Alt+Up",       TrLater("Goes to the parent folder."), Needs::Nothing, OfBrowser<&BrowserPage::GoUp>},
     {kGo, TrLater("&Enter a folder"),       "Ctrl+L",       TrLater("Lets you type the path of a folder."), Needs::Nothing, OfBrowser<&BrowserPage::EditPath>},
-    {kGo, TrLater("F&avorite"),            "Ctrl+D",       TrLater("Adds this folder to the favorites at the top of the folder tree, or removes it."), Needs::Nothing, ToggleFavourite, nullptr, false, IsFavourite},
+    {kGo, TrLater("F&avorite"),            "Ctrl+D",       TrLater("Adds this folder to the favorites at the top of the folder tree, or removes it."), Needs::Nothing, ToggleFavorite, nullptr, false, IsFavorite},
     {kGo, nullptr},
     {kGo, TrLater("&Next tab"),             "Ctrl+PageDown", TrLater("Switches to the next tab."), Needs::Nothing, NextTab, nullptr, false, nullptr, "Ctrl+Tab"},
     {kGo, TrLater("Pre&vious tab"),         "Ctrl+PageUp",  TrLater("Switches to the previous tab."), Needs::Nothing, PreviousTab, nullptr, false, nullptr, "Ctrl+Shift+Tab"},

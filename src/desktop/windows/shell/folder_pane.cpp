@@ -23,7 +23,7 @@ constexpr int kUsualWidth = 230, kLeastShown = 160, kLeastWidth = 120;  // devic
 }  // namespace
 
 FolderPane::FolderPane(Shell& shell) : shell_(shell) {
-  favourites_.Load();
+  favorites_.Load();
   splitter_ = new wxSplitterWindow(&shell.Window(), wxID_ANY, wxDefaultPosition, wxDefaultSize,
                                    wxSP_LIVE_UPDATE | wxSP_NOBORDER);
   splitter_->SetMinimumPaneSize(splitter_->FromDIP(kLeastWidth));
@@ -36,8 +36,8 @@ FolderPane::FolderPane(Shell& shell) : shell_(shell) {
   events.rename = [this](const std::string& folder, const std::string& name) {
     shell_.Files().Rename(folder, name);
   };
-  events.toggleFavourite = [this](const std::string& folder) { ToggleFavourite(folder); };
-  tree_ = new FolderTree(splitter_, favourites_, events);
+  events.toggleFavorite = [this](const std::string& folder) { ToggleFavorite(folder); };
+  tree_ = new FolderTree(splitter_, favorites_, events);
   tree_->SetDropTarget(
       new FolderDrop([this](const wxPoint& place) { return tree_->FolderAt(place); },
                      [this](const std::vector<std::string>& files, const std::string& folder,
@@ -82,15 +82,14 @@ void FolderPane::Reread() {
 }
 
 void FolderPane::FollowRename(const std::string& from, const std::string& to) {
-  if (favourites_.FollowRename(from, to)) tree_->UpdatePlaces();
+  if (favorites_.FollowRename(from, to)) tree_->UpdatePlaces();
 }
 
-void FolderPane::ToggleFavourite(const std::string& folder) {
-  const bool written =
-      favourites_.Has(folder) ? favourites_.Remove(folder) : favourites_.Add(folder);
+void FolderPane::ToggleFavorite(const std::string& folder) {
+  const bool written = favorites_.Has(folder) ? favorites_.Remove(folder) : favorites_.Add(folder);
   if (!written) shell_.Report(Tr("The list of favorites could not be saved."));
   tree_->UpdatePlaces();
-  LogEvent("favourites", std::to_string(favourites_.Folders().size()));
+  LogEvent("favorites", std::to_string(favorites_.Folders().size()));
 }
 
 }  // namespace fotomill::desktop

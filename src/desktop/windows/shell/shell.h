@@ -27,7 +27,7 @@ class Shell {
   virtual wxFrame& Window() = 0;
 
   virtual BrowserTabs& Tabs() = 0;         // the browsers, and what is selected in the one in front
-  virtual FolderPane& Folders() = 0;       // the folder tree at the left, and the favourites in it
+  virtual FolderPane& Folders() = 0;       // the folder tree at the left, and the favorites in it
   virtual PictureWindows& Pictures() = 0;  // view windows and those that compare
   virtual FileActions& Files() = 0;        // renames, copies, moves, deletes; undo
   virtual BatchRunner& Batches() = 0;      // functions over many files

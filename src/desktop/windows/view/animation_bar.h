@@ -16,7 +16,7 @@ class AnimationBar : public wxPanel {
   // What its buttons do.
   struct Events {
     std::function<void()> toggle;  // play or pause
-    std::function<void(int frames)> step;
+    std::function<void(int frames)> step;  // back below 0
   };
 
   AnimationBar(wxWindow* parent, Events events);
@@ -24,7 +24,7 @@ class AnimationBar : public wxPanel {
   // Shows what the settings want of it, if anything.
   void Open();
   void Close() { Show(false); }
-  void Report(bool playing, size_t frame, size_t count);
+  void Report(bool playing, size_t frame, size_t count);  // `frame` from 0, of `count` known so far
 
  private:
   wxBitmapButton* AddButton(wxSizer& row, const char* symbol, const wxString& name,

@@ -26,6 +26,7 @@ class ViewAnimation {
     std::function<ViewPicturePointer(const ViewPicturePointer&)> dressed;
   };
 
+  // Canvas and bar must outlive it.
   ViewAnimation(ViewCanvas& canvas, AnimationBar& bar, Events events);
   ~ViewAnimation();
   ViewAnimation(const ViewAnimation&) = delete;
@@ -37,12 +38,12 @@ class ViewAnimation {
   // Another picture is awaited.
   void End();
   bool Active() const { return player_ != nullptr; }  // there is an animation on the canvas
-  bool Playing() const;
+  bool Playing() const;                               // false where there is none, or it is paused
   // In full screen there is the picture alone.
   void HideBar(bool hide);
   void Toggle();  // plays or pauses
   void Step(int frames);  // pauses, and moves by that number of frames
-  void Resized();
+  void Resized();         // frames are to fit another size
   // Frames are to be shown in another way.
   void ShowAgain();
   // "frame 3 of 12" with what else there is to tell; empty where no animation is.

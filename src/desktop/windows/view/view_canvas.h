@@ -26,6 +26,7 @@ class ViewCanvas : public wxWindow {
     std::function<void()> placed = nullptr;  // zoomed or moved by the user
   };
 
+  // The events are called on the window's thread, as long as the canvas is there.
   ViewCanvas(wxWindow* parent, Events events);
   ~ViewCanvas() override;
 
@@ -38,7 +39,7 @@ class ViewCanvas : public wxWindow {
   void Sharpen() { TransformChanged(); }
   // An image that stands in for a picture of `width` by `height` until that comes.
   void ShowStandIn(PackedImage image, int32_t width, int32_t height);
-  const ViewPicturePointer& Picture() const { return picture_; }
+  const ViewPicturePointer& Picture() const { return picture_; }  // null before the first
   // The next picture is another one: it is shown as pictures open, unless ViewModeKeepZoom keeps
   // zoom and place.
   void StartAfresh();
@@ -49,10 +50,10 @@ class ViewCanvas : public wxWindow {
   void ZoomIn() { ZoomBy(ViewTransform::kStep); }
   void ZoomOut() { ZoomBy(1 / ViewTransform::kStep); }
   void ZoomActual();  // one pixel of the screen a pixel
-  void SetZoom(ZoomMode mode);
+  void SetZoom(ZoomMode mode);  // also sets how it follows the window
   // Pixels of the screen a pixel of the picture, and whether more of it is outside the window.
   double Zoom() const { return transform_.Scale(); }
-  bool CanPan() const { return transform_.CanPan(); }
+  bool CanPan() const { return transform_.CanPan(); }  // more of it is outside
   // By eighths of the window.
   void PanBy(int stepsAcross, int stepsDown);
   // Arrows move a picture that is larger than the window. False for other keys, and where all of it
@@ -60,7 +61,7 @@ class ViewCanvas : public wxWindow {
   bool PanByKey(int key);
   // Zoom and place, to be taken from one canvas to others.
   ViewPlace Place() const { return transform_.Place(); }
-  void SetPlace(const ViewPlace& place);
+  void SetPlace(const ViewPlace& place);  // does not call `placed`
 
   // Pixels of the screen.
   wxSize DeviceSize() const { return GetClientSize() * GetContentScaleFactor(); }

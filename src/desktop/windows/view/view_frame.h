@@ -18,7 +18,7 @@ class AnimationBar;
 class Shell;
 class ViewAnimation;
 
-// A view window: one picture at a time, with its neighbours of the list that it was opened from
+// A view window: one picture at a time, with its neighbors of the list that it was opened from
 // decoded ahead.
 class ViewFrame : public wxFrame {
  public:
@@ -33,14 +33,14 @@ class ViewFrame : public wxFrame {
   void StepFrame(int frames);  // pauses the animation; without one nothing happens
   void PlayOrNext();  // plays or pauses an animation; without one, the next picture
   void ToggleFullScreen();
-  void ToggleSlideshow();
-  void ChooseSlideshow();
-  void ToggleOverlay();
+  void ToggleSlideshow();  // begins as chosen last, with the picture shown
+  void ChooseSlideshow();  // asks for seconds and order first
+  void ToggleOverlay();    // file and camera facts on the picture
   void SettingSwitched();  // one that says how pictures look or stay
   void Leave();            // full screen first, then the window
   void CopyPicture();  // to the clipboard; alpha on the background of view windows
   void DeleteFile();  // to the trash; the next one is shown
-  void ShowInfoWindow();
+  void ShowInfoWindow();        // of the file shown
   void Turn(Orientation turn);  // the view; nothing is written
   void SaveTurned();            // the file, as it is seen
   void Undo();                  // the view's turn, else what was done to files
@@ -49,11 +49,11 @@ class ViewFrame : public wxFrame {
   void FilesChanged();
   // Calls once when the first picture is there, or the window goes without.
   void WhenShown(std::function<void()> shown);
-  // The files that neighbour the picture from here on. False when it is not among them; they are as
+  // The files that neighbor the picture from here on. False when it is not among them; they are as
   // before then.
   bool UseList(const std::vector<std::string>& list);
-  size_t LastPlace() const { return list_.size() - 1; }
-  ViewCanvas& Canvas() { return *canvas_; }
+  size_t LastPlace() const { return list_.size() - 1; }  // in the list, from 0
+  ViewCanvas& Canvas() { return *canvas_; }              // for zoom and movement
 
  private:
   void ShowPlace();

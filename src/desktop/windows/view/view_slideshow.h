@@ -24,8 +24,10 @@ class ViewSlideshow {
   // Begins at `place` of a list of `count`, as was chosen last. ShownAt is to follow when that
   // picture is on the screen.
   void Start(size_t place, size_t count);
-  void Stop();
-  bool Running() const { return order_.has_value(); }
+  void Stop();  // the picture shown stays
+  bool Running() const {
+    return order_.has_value();
+  }  // between Start and Stop, or the last picture
   // This place is on the screen, from now on for its seconds.
   void ShownAt(size_t place, size_t count);
   // The position to decode ahead in addition to the neighbors.

@@ -23,7 +23,7 @@ constexpr SymbolShape kSymbols[] = {
     {"below", "<path d='M3.5 6 L8 10.5 L12.5 6'/>"},
     {"folder", "<path d='M1.5 4 V13 H14.5 V5.5 H8 L6.5 3.5 H2 Z'/>"},
     {"home", "<path d='M2 8 L8 2.5 L14 8 M3.5 7 V13.5 H12.5 V7 M6.5 13.5 V9.5 H9.5 V13.5'/>"},
-    {"favourite", "<path d='M8 1.8 L9.9 5.9 L14.3 6.4 L11 9.4 L11.9 13.8 L8 11.6 L4.1 13.8 L5 9.4 L1.7 6.4 L6.1 5.9 Z'/>"},
+    {"favorite", "<path d='M8 1.8 L9.9 5.9 L14.3 6.4 L11 9.4 L11.9 13.8 L8 11.6 L4.1 13.8 L5 9.4 L1.7 6.4 L6.1 5.9 Z'/>"},
     {"volume", "<path d='M2 9.5 L3.8 3.5 H12.2 L14 9.5 V13 H2 Z M2 9.5 H14 M11 11.3 H12'/>"},
     {"view", "<path d='M1 8 C3 4 6 3 8 3 C10 3 13 4 15 8 C13 12 10 13 8 13 C6 13 3 12 1 8 Z'/><circle cx='8' cy='8' r='2.2'/>"},
     {"slideshow",

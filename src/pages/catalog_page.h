@@ -6,19 +6,19 @@
 
 #include "batch/job.h"
 #include "batch/run.h"
-#include "pages/catalogue_drawing.h"
+#include "pages/catalog_drawing.h"
 
 namespace fotomill {
 
 // No page gets this number; the page that would have to fails.
-inline constexpr uint32_t kLastCataloguePage = 10000000;
+inline constexpr uint32_t kLastCatalogPage = 10000000;
 
 // "Catalog_00001.jpg": the prefix, the number with at least five digits, the extension in lower
 // case.
-std::string CataloguePageName(std::string_view prefix, uint32_t number, std::string_view extension);
+std::string CatalogPageName(std::string_view prefix, uint32_t number, std::string_view extension);
 
 // How a page is written.
-struct CataloguePageOptions {
+struct CatalogPageOptions {
   bool reduce = false;  // the page's colors are reduced where the format takes fewer
   bool dryRun = false;
 };
@@ -27,18 +27,18 @@ struct CataloguePageOptions {
 // ErrorWritingFile when no number is left, FunctionCancelled when the user skipped the name,
 // UnsupportedFunction when the format cannot be written, else the writer's own status. A page that
 // was written sets the job's files-changed flag and goes to job.uses.
-Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job,
-                          std::string& path);
+Status WriteCatalogPage(PictureRecord& page, const CatalogPageOptions& options, BatchJob& job,
+                        std::string& path);
 
 // How a selection is drawn.
 struct ContactSheetOptions {
-  CatalogueLook look;
-  CataloguePageOptions page;
+  CatalogLook look;
+  CatalogPageOptions page;
   std::string fontName = "Arial";  // of the names
   bool upright = true;             // pictures are turned as their EXIF says
   bool onFaces = false;            // cells show the faces of their pictures
-  std::string reduceHint = {};  // goes behind "Too many colors."
-  uint32_t jobs = 0;            // pictures in progress at a time; 0: one per core
+  std::string reduceHint = {};     // goes behind "Too many colors."
+  uint32_t jobs = 0;               // pictures in progress at a time; 0: one per core
 };
 
 // Draws a selection on catalogue pages: opens the job's progress box, decodes and scales on several

@@ -1,4 +1,4 @@
-#include "desktop/models/shell/favourites.h"
+#include "desktop/models/shell/favorites.h"
 
 #include <algorithm>
 #include <functional>
@@ -36,18 +36,18 @@ bool EditList(std::vector<std::string>& folders,
 
 }  // namespace
 
-void Favourites::Load() {
+void Favorites::Load() {
   std::string text;
   const std::string path = DataFile(kFile);
   if (!path.empty()) (void)platform::ReadWholeFile(path, limits.listFileBytes, text);
   folders_ = ParseHistoryList(text, kMostFolders);
 }
 
-bool Favourites::Has(const std::string& folder) const {
+bool Favorites::Has(const std::string& folder) const {
   return std::ranges::find(folders_, folder) != folders_.end();
 }
 
-bool Favourites::Add(const std::string& folder) {
+bool Favorites::Add(const std::string& folder) {
   if (ParseHistoryList(folder, 1) != std::vector{folder}) return false;  // it cannot be on a line
   const bool written = EditList(folders_, [&](std::vector<std::string>& folders) {
     if (std::ranges::find(folders, folder) == folders.end() && folders.size() < kMostFolders)
@@ -56,12 +56,12 @@ bool Favourites::Add(const std::string& folder) {
   return written && Has(folder);
 }
 
-bool Favourites::Remove(const std::string& folder) {
+bool Favorites::Remove(const std::string& folder) {
   return EditList(folders_,
                   [&](std::vector<std::string>& folders) { std::erase(folders, folder); });
 }
 
-bool Favourites::FollowRename(const std::string& from, const std::string& to) {
+bool Favorites::FollowRename(const std::string& from, const std::string& to) {
   if (std::ranges::none_of(folders_,
                            [&](const std::string& folder) { return LiesIn(folder, from); }))
     return false;

@@ -1,4 +1,4 @@
-#include "pages/catalogue_drawing.h"
+#include "pages/catalog_drawing.h"
 
 #include <algorithm>
 #include <cstring>
@@ -11,7 +11,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kPictureInset = 2;                     // from a cell's corner
+constexpr int32_t kPictureInset = 2;  // from a cell's corner
 // the far lines lie this far behind the room's size
 constexpr int32_t kFrameReach = 3;
 constexpr int32_t kCaptionTop = 3, kCaptionBottom = 18;  // below the room
@@ -32,7 +32,7 @@ void FillPixels(PackedImage& page, Rectangle area, Color color) {
   }
 }
 
-void DrawFrame(const CatalogueLook& look, const Rectangle& cell, PackedImage& page) {
+void DrawFrame(const CatalogLook& look, const Rectangle& cell, PackedImage& page) {
   if (look.frame == CellFrame::None) return;
   const bool raised = look.frame == CellFrame::Raised;
   const Color flat = look.blackText ? kBlack : kGray;
@@ -64,7 +64,7 @@ int32_t Scaled(int32_t edge, int32_t room, int32_t other) {
 
 }  // namespace
 
-Rectangle PageSize(const CatalogueLook& look) {
+Rectangle PageSize(const CatalogLook& look) {
   const int32_t width =
       look.columns * (look.cellWidth + kCellExtraWidth) - kCellExtraWidth + 2 * kPageMargin;
   const int32_t height = look.rows * (look.cellHeight + kCellExtraHeight) + 2 * kPageMargin;
@@ -72,7 +72,7 @@ Rectangle PageSize(const CatalogueLook& look) {
           look.pageHeight > 0 ? look.pageHeight : height};
 }
 
-Rectangle CellPlace(const CatalogueLook& look, int32_t index) {
+Rectangle CellPlace(const CatalogLook& look, int32_t index) {
   const Rectangle page = PageSize(look);
   const int32_t width = look.cellWidth + kCellExtraWidth,
                 height = look.cellHeight + kCellExtraHeight;
@@ -82,7 +82,7 @@ Rectangle CellPlace(const CatalogueLook& look, int32_t index) {
           look.cellHeight};
 }
 
-Rectangle PicturePlace(const CatalogueLook& look, const Rectangle& cell, int32_t width,
+Rectangle PicturePlace(const CatalogLook& look, const Rectangle& cell, int32_t width,
                        int32_t height) {
   const bool wide = int64_t{width} * look.cellHeight >= int64_t{height} * look.cellWidth;
   Rectangle place{0, 0, look.cellWidth, look.cellHeight};
@@ -96,7 +96,7 @@ Rectangle PicturePlace(const CatalogueLook& look, const Rectangle& cell, int32_t
   return place;
 }
 
-Status MakeCellImage(PictureRecord& picture, const CatalogueLook& look, PackedImage& image) {
+Status MakeCellImage(PictureRecord& picture, const CatalogLook& look, PackedImage& image) {
   if (picture.image.Empty()) return Status::EmptyImage;
   const Rectangle place = PicturePlace(look, {}, picture.width, picture.height);
   RETURN_IF_BAD(ScalePicture(picture, {place.width, place.height}, ScaleFilter::Lanczos));
@@ -108,14 +108,14 @@ Status MakeCellImage(PictureRecord& picture, const CatalogueLook& look, PackedIm
   return Status::Ok;
 }
 
-Status NewCataloguePage(const CatalogueLook& look, PackedImage& page) {
+Status NewCatalogPage(const CatalogLook& look, PackedImage& page) {
   const Rectangle size = PageSize(look);
   RETURN_IF_BAD(NewPackedImage(size.width, size.height, nullptr, 24, page));
   FillPixels(page, size, look.background);
   return Status::Ok;
 }
 
-Status DrawCell(const CatalogueLook& look, int32_t index, const PackedImage& image,
+Status DrawCell(const CatalogLook& look, int32_t index, const PackedImage& image,
                 std::string_view name, TextFont* font, PackedImage& page) {
   const Rectangle cell = CellPlace(look, index);
   DrawFrame(look, cell, page);

@@ -1,4 +1,4 @@
-#include "pages/catalogue_page.h"
+#include "pages/catalog_page.h"
 
 #include <algorithm>
 #include <atomic>
@@ -38,17 +38,17 @@ constexpr uint64_t kBytesAhead = uint64_t{64} << 20;
 Status NextPageName(BatchJob& job, std::string& path) {
   platform::Existence existence;
   do {
-    if (++job.cataloguePage >= kLastCataloguePage) return Status::ErrorWritingFile;
+    if (++job.catalogPage >= kLastCatalogPage) return Status::ErrorWritingFile;
     path = platform::JoinFolder(job.destinationFolder,
-                                CataloguePageName(job.naming.PrefixOf(FileFunction::Catalog),
-                                                  job.cataloguePage, ExtensionOfFormat(job)));
+                                CatalogPageName(job.naming.PrefixOf(FileFunction::Catalog),
+                                                job.catalogPage, ExtensionOfFormat(job)));
     existence = platform::ExistenceOf(path);
     if (existence == platform::Existence::Unknown) return Status::ErrorCreatingFile;
   } while (existence == platform::Existence::Yes);
   return Status::Ok;
 }
 
-Status WritePage(PictureRecord& page, const CataloguePageOptions& options,
+Status WritePage(PictureRecord& page, const CatalogPageOptions& options,
                  const Destination& destination, BatchJob& job) {
   if (options.dryRun) return Status::Ok;
   if (!job.destinationFolder.empty() && !platform::MakeFolders(job.destinationFolder))
@@ -153,7 +153,7 @@ class ContactSheet {
   Status NewPage() {
     PicturePointer page = NewPictureRecord(job_.read.alphaBackground);
     if (page == nullptr) return Status::MemoryAllocationError;
-    if (!options_.page.dryRun) RETURN_IF_BAD(NewCataloguePage(options_.look, page->image));
+    if (!options_.page.dryRun) RETURN_IF_BAD(NewCatalogPage(options_.look, page->image));
     const Rectangle size = PageSize(options_.look);
     page->width = size.width;
     page->height = size.height;
@@ -167,7 +167,7 @@ class ContactSheet {
     Status status = Status::Ok;
     std::string path;
     const uint32_t writeAborts = job_.writeAborts;
-    if (page_ != nullptr) status = WriteCataloguePage(*page_, options_.page, job_, path);
+    if (page_ != nullptr) status = WriteCatalogPage(*page_, options_.page, job_, path);
     const bool noName = job_.writeAborts != writeAborts;
     for (FileOutcome& outcome : waiting_) {
       if (outcome.status == Status::Ok) {
@@ -219,7 +219,7 @@ class ContactSheet {
 };
 
 // Writes the page under the next free number. `lostRace`: another program took that meanwhile.
-Status WriteNextPage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job,
+Status WriteNextPage(PictureRecord& page, const CatalogPageOptions& options, BatchJob& job,
                      std::string& path, bool& lostRace) {
   lostRace = false;
   const TakenTest taken = platform::ExistenceOf;
@@ -250,23 +250,22 @@ Status WriteNextPage(PictureRecord& page, const CataloguePageOptions& options, B
   lostRace = !destination.replace && LostRace(status, path);
   if (status == Status::Ok && !options.dryRun) {
     job.filesChanged = true;
-    job.uses.push_back(
-        {platform::AbsolutePath(path), FileFunction::Catalog, kOwnTime, static_cast<int32_t>(platform::Now()), false});
+    job.uses.push_back({platform::AbsolutePath(path), FileFunction::Catalog, kOwnTime,
+                        static_cast<int32_t>(platform::Now()), false});
   }
   return status;
 }
 
 }  // namespace
 
-std::string CataloguePageName(std::string_view prefix, uint32_t number,
-                              std::string_view extension) {
+std::string CatalogPageName(std::string_view prefix, uint32_t number, std::string_view extension) {
   std::string digits = std::to_string(number);
   if (digits.size() < kPageDigits) digits.insert(0, kPageDigits - digits.size(), '0');
   return std::string(prefix) + digits + "." + LowerCase(extension);
 }
 
-Status WriteCataloguePage(PictureRecord& page, const CataloguePageOptions& options, BatchJob& job,
-                          std::string& path) {
+Status WriteCatalogPage(PictureRecord& page, const CatalogPageOptions& options, BatchJob& job,
+                        std::string& path) {
   Status status = Status::ErrorCreatingFile;
   (void)RetryLostRaces([&] {
     bool lostRace = false;

@@ -4,7 +4,7 @@
 #include <filesystem>
 
 #include "batch/new_job.h"
-#include "pages/catalogue_page.h"
+#include "pages/catalog_page.h"
 #include "registry/registry.h"
 #include "settings/settings.h"
 #include "support/bitmaps.h"
@@ -15,13 +15,13 @@
 namespace fotomill::test {
 namespace {
 
-TEST(CatalogueDrawing, Places) {
-  CatalogueLook look{.columns = 2,
-                     .rows = 3,
-                     .cellWidth = 96,
-                     .cellHeight = 80,
-                     .pageWidth = 301,
-                     .pageHeight = 400};
+TEST(CatalogDrawing, Places) {
+  CatalogLook look{.columns = 2,
+                   .rows = 3,
+                   .cellWidth = 96,
+                   .cellHeight = 80,
+                   .pageWidth = 301,
+                   .pageHeight = 400};
   // (301 - 2 x 108 + 12) / 2 and (400 - 3 x 101) / 2
   EXPECT_EQ(CellPlace(look, 0), (Rectangle{48, 48, 96, 80}));
   EXPECT_EQ(CellPlace(look, 3), (Rectangle{156, 149, 96, 80}));
@@ -40,19 +40,19 @@ TEST(CatalogueDrawing, Places) {
   EXPECT_EQ(CellPlace(look, 0), (Rectangle{12, 12, 96, 80}));
 }
 
-TEST(CatalogueDrawing, FrameAndPicture) {
+TEST(CatalogDrawing, FrameAndPicture) {
   const PicturePointer picture = MakePicture(96, 80, 24);
   for (const bool raised : {true, false}) {
     for (const bool black : {false, true}) {
-      const CatalogueLook look{.columns = 1,
-                               .rows = 1,
-                               .cellHeight = 80,
-                               .frame = raised ? CellFrame::Raised : CellFrame::Flat,
-                               .blackText = black,
-                               .names = false,
-                               .background = 0x302010};
+      const CatalogLook look{.columns = 1,
+                             .rows = 1,
+                             .cellHeight = 80,
+                             .frame = raised ? CellFrame::Raised : CellFrame::Flat,
+                             .blackText = black,
+                             .names = false,
+                             .background = 0x302010};
       PackedImage page;
-      ASSERT_EQ(NewCataloguePage(look, page), Status::Ok);
+      ASSERT_EQ(NewCatalogPage(look, page), Status::Ok);
       ASSERT_EQ(DrawCell(look, 0, picture->image, {}, nullptr, page), Status::Ok);
       const int32_t flat = black ? 0 : 0xA0A0A0, light = raised ? 0xFFFFFF : flat,
                     dark = raised ? 0x404040 : flat;
@@ -68,7 +68,7 @@ TEST(CatalogueDrawing, FrameAndPicture) {
   }
 }
 
-TEST(CatalogueDrawing, NamesStayInTheirArea) {
+TEST(CatalogDrawing, NamesStayInTheirArea) {
   TextFont font;
   ASSERT_EQ(font.OpenForLine("No Such Family", kCaptionHeight), Status::Ok);
   const std::string name = "a & b.jpg", lengthy(100, 'w'), odd = "\xff\xc0\xaf\x01\xe2\x82";
@@ -79,10 +79,10 @@ TEST(CatalogueDrawing, NamesStayInTheirArea) {
   EXPECT_GT(font.WidthOf(odd), 0);
   EXPECT_GT(font.WidthOf("&&"), font.WidthOf("&"));
 
-  const CatalogueLook look{.columns = 1, .rows = 1, .frame = CellFrame::None, .background = 0};
+  const CatalogLook look{.columns = 1, .rows = 1, .frame = CellFrame::None, .background = 0};
   for (const std::string& text : {name, lengthy, odd}) {
     PackedImage page;
-    ASSERT_EQ(NewCataloguePage(look, page), Status::Ok);
+    ASSERT_EQ(NewCatalogPage(look, page), Status::Ok);
     ASSERT_EQ(DrawCell(look, 0, {}, text, &font, page), Status::Ok);
     int32_t left = 1000, right = 0, top = 1000, bottom = 0, gray = 0;
     for (int32_t y = 0; y < page.Height(); ++y) {
@@ -101,9 +101,9 @@ TEST(CatalogueDrawing, NamesStayInTheirArea) {
   }
 }
 
-TEST(CataloguePage, FirstFreeNames) {
-  EXPECT_EQ(CataloguePageName("Catalog_", 1, "JPG"), "Catalog_00001.jpg");
-  EXPECT_EQ(CataloguePageName("", 123456, "png"), "123456.png");
+TEST(CatalogPage, FirstFreeNames) {
+  EXPECT_EQ(CatalogPageName("Catalog_", 1, "JPG"), "Catalog_00001.jpg");
+  EXPECT_EQ(CatalogPageName("", 123456, "png"), "123456.png");
   const TemporaryFolder folder;
   WriteText(folder.Path("Catalog_00002.bmp"), "mine");
   BatchJob job = NewBatchJob();
@@ -115,19 +115,19 @@ TEST(CataloguePage, FirstFreeNames) {
   const PicturePointer page = MakePicture(4, 4, 24);
   std::string path;
   for (const char* name : {"Catalog_00001.bmp", "Catalog_00003.bmp"}) {
-    EXPECT_EQ(WriteCataloguePage(*page, {}, job, path), Status::Ok);
+    EXPECT_EQ(WriteCatalogPage(*page, {}, job, path), Status::Ok);
     EXPECT_EQ(path, folder.Path(name));
   }
-  job.cataloguePage = kLastCataloguePage - 2;
-  EXPECT_EQ(WriteCataloguePage(*page, {}, job, path), Status::Ok);
-  EXPECT_EQ(WriteCataloguePage(*page, {}, job, path), Status::ErrorWritingFile);
-  job.cataloguePage = 0;
+  job.catalogPage = kLastCatalogPage - 2;
+  EXPECT_EQ(WriteCatalogPage(*page, {}, job, path), Status::Ok);
+  EXPECT_EQ(WriteCatalogPage(*page, {}, job, path), Status::ErrorWritingFile);
+  job.catalogPage = 0;
   job.formatIndex = FindFormatByName("x.kdc");
-  EXPECT_EQ(WriteCataloguePage(*page, {}, job, path), Status::UnsupportedFunction);
+  EXPECT_EQ(WriteCatalogPage(*page, {}, job, path), Status::UnsupportedFunction);
   EXPECT_EQ(folder.Names().size(), 4u);
 }
 
-TEST(CataloguePage, IsTheSameWithAnyNumberOfJobs) {
+TEST(CatalogPage, IsTheSameWithAnyNumberOfJobs) {
   const TemporaryFolder folder;
   std::vector<BatchFile> files;
   for (int i = 0; i < 9; ++i) {
@@ -172,7 +172,7 @@ class AbortingBox : public ProgressBox {
   const std::string last_;
 };
 
-TEST(CataloguePage, WritesNoPartialPageAfterAbort) {
+TEST(CatalogPage, WritesNoPartialPageAfterAbort) {
   const TemporaryFolder folder;
   std::vector<BatchFile> files;
   for (int i = 0; i < 5; ++i) {

@@ -8,7 +8,7 @@ namespace fotomill::desktop {
 // The folders that the user wants at hand, in the order in which they were added. Kept in the data
 // folder in the file "FMWFavourites.txt", a folder a line; changes are merged with those of other
 // processes and written at once.
-class Favourites {
+class Favorites {
  public:
   // Takes up the folders that the file holds now.
   void Load();
