@@ -5,7 +5,7 @@
 # none. The dependencies of static libraries differ between releases; pkg-config knows them. If an archive is missing, or
 # static linking fails, shared libraries are used.
 find_package(PkgConfig REQUIRED)
-pkg_check_modules(IMAGES REQUIRED libtiff-4 libwebp libjpeg libpng lcms2 freetype2 fribidi libdeflate zlib)
+pkg_check_modules(IMAGES REQUIRED libtiff-4 libwebp libjpeg libpng lcms2 freetype2 fribidi libdeflate zlib pugixml)
 # Headers only: both are loaded when text is first drawn.
 pkg_check_modules(TEXTS REQUIRED harfbuzz fontconfig)
 set(image_include_folders ${IMAGES_INCLUDE_DIRS} ${TEXTS_INCLUDE_DIRS})

@@ -50,6 +50,15 @@ bool ParseGpsLocation(std::string_view text, GpsLocation& location) {
   return true;
 }
 
+bool ParseGpsDegrees(std::string_view text, double& latitude, double& longitude) {
+  double first = 0, second = 0;
+  const bool parsed = TakeNumber(text, first) && TakeComma(text) && TakeNumber(text, second);
+  if (!parsed || !text.empty() || !(std::abs(first) <= 90) || !(std::abs(second) <= 360)) return false;
+  latitude = first;
+  longitude = second;
+  return true;
+}
+
 double GpsDegrees(const GpsAngle& angle) {
   const char letter = UpperCase(angle.hemisphere);
   const double sign = letter == 'W' || letter == 'S' ? -1 : 1;

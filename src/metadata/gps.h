@@ -22,6 +22,10 @@ struct GpsLocation {
 // subject to the user's decimal sign.
 [[nodiscard]] bool ParseGpsLocation(std::string_view text, GpsLocation& location);
 
+// Reads "LAT,LON" in decimal degrees: at most 90 and 360. False, with both unchanged, for any other
+// text.
+[[nodiscard]] bool ParseGpsDegrees(std::string_view text, double& latitude, double& longitude);
+
 // Decimal degrees, negative for the hemispheres "W" and "S" in either case.
 double GpsDegrees(const GpsAngle& angle);
 

@@ -83,6 +83,7 @@ constexpr Row kRows[] = {
     {"libjxr", nullptr, "BSD-2-Clause", "Microsoft Corp.", nullptr},
     {"LibRaw", nullptr, "LGPL-2.1-only OR CDDL-1.0", "2008-2024 LibRaw LLC", nullptr},
     {"lcms2", "lcms2", "MIT", "1998-2023 Marti Maria Saguer", TrLater("color profiles")},
+    {"pugixml", "pugixml", "MIT", "2006-2023 Arseny Kapoulkine", TrLater("GPX tracks")},
     {"FreeType", "freetype", "FTL OR GPL-2.0-only", "1996-2024 David Turner, Robert Wilhelm and Werner Lemberg", TrLater("outlines of letters"), nullptr, kFreeTypeVersion},
     {"Brotli", "brotlidec brotlicommon", "MIT", "2009-2015 the Brotli Authors", TrLater("compressed fonts")},
     {"FriBidi", "fribidi", "LGPL-2.1-or-later", "2001-2015 Behdad Esfahbod and others", TrLater("texts from right to left")},

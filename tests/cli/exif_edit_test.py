@@ -244,12 +244,52 @@ def move_between():
               f"owner: {err}")
 
 
+TRACK = """<?xml version="1.0"?><gpx version="1.1" xmlns="http://www.topografix.com/GPX/1/1"><trk><trkseg>
+<trkpt lat="48.0" lon="11.0"><ele>500</ele><time>2024-05-31T12:00:00Z</time></trkpt>
+<trkpt lat="48.2" lon="11.4"><ele>520</ele><time>2024-05-31T12:06:00Z</time></trkpt></trkseg></trk></gpx>"""
+
+
+def go_places():
+    """gps: from a track, a list, by hand; the link."""
+    with Place() as place:
+        told(place)
+        place.files("walk.gpx", contents=TRACK.encode())
+        place.files("data/Locations.gps", contents=b"# places\nHome = 45.5,-79.25\n")
+        link = "https://www.openstreetmap.org/?mlat=%s&mlon=%s#map=15/%s/%s"
+        for arguments, where in [(["--gpx", "walk.gpx", "--offset=-2:00"], ("48.10000", "11.20000")),
+                                 (["--at", "-33.5,151.25"], ("-33.50000", "151.25000")),
+                                 (["--place", "home"], ("45.50000", "-79.25000"))]:
+            for name in ("t.jpg", "t.png", "t.webp", "t.tif"):
+                status, _, err = place.run("exif", "gps", name, "--out", "new-" + name, "--overwrite", "replace", *arguments)
+                check(status, 0, f"gps {arguments} {name}: {err}")
+                facts = json.loads(place.run("info", "new-" + name, "--json")[1])[0]
+                check(facts["location"]["link"], link % (where * 2), f"gps {arguments} {name}")
+                if shutil.which("exiftool"):
+                    seen = tags(place.path / ("new-" + name))["new-" + name]
+                    check((f"{seen['GPS:GPSLatitude']:.5f}", seen["GPS:GPSLatitudeRef"]),
+                          (where[0].lstrip("-"), "S" if where[0][0] == "-" else "N"), f"gps {arguments} {name}: exiftool")
+        check("Location" in place.run("info", "new-t.jpg")[1], True, "info tells the place")
+        for arguments, message in [([], "Choose one of --gpx, --at and --place."),
+                                   (["--at", "1,2", "--place", "x"], "Choose one of"),
+                                   (["--at", "91,0"], "is not LAT,LON"),
+                                   (["--at", "1,2", "--offset", "+1:00"], "--offset needs --gpx."),
+                                   (["--gpx", "walk.gpx", "--offset", "1"], "is not an offset"),
+                                   (["--gpx", "t.jpg"], "is not a GPX track."),
+                                   (["--gpx", "none.gpx"], "cannot be read."),
+                                   (["--place", "sea"], 'There is no place "sea"')]:
+            status, out, err = place.run("exif", "gps", "t.jpg", "--in-place", *arguments)
+            check((status, out, message in err), (2, "", True), f"gps {arguments}: {err}")
+        status, _, err = place.run("exif", "gps", "t.jpg", "--in-place", "--gpx", "walk.gpx")
+        check((status, "The track has no point within 30 minutes of its time." in err), (1, True), "gps: too early")
+
+
 def main():
     if not shutil.which("exiftool"):
         print("exiftool is not installed: nobody judges the changed files")
     hold_arguments()
     remove_for_good()
     move_between()
+    go_places()
     change_everything()
     return finish()
 

@@ -10,6 +10,7 @@
 #include "core/shown_text.h"
 #include "core/text.h"
 #include "core/utf8.h"
+#include "metadata/edit/gps_place.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "texts/texts.h"
@@ -61,6 +62,11 @@ Json FactsAsJson(const PictureRecord& picture) {
   AddFrames(picture, facts);
   if (picture.metadata.dpiX > 0) facts["dpiX"] = picture.metadata.dpiX;
   if (picture.metadata.dpiY > 0) facts["dpiY"] = picture.metadata.dpiY;
+  if (const auto place = PlaceOf(ParseExifBlock(picture.metadata.exif))) {
+    facts["location"] = {{"latitude", place->latitude},
+                         {"longitude", place->longitude},
+                         {"link", MapLink(*place)}};
+  }
   return facts;
 }
 
@@ -89,6 +95,11 @@ std::string FactsAsText(const PictureRecord& picture) {
     AddFact(text, Tr("Resolution"),
             Tr("%1 x %2 pixels per inch", Resolution(picture.metadata.dpiX),
                Resolution(picture.metadata.dpiY)));
+  }
+  if (const auto place = PlaceOf(ParseExifBlock(picture.metadata.exif))) {
+    char degrees[48];
+    std::snprintf(degrees, sizeof degrees, "%.5f, %.5f  ", place->latitude, place->longitude);
+    AddFact(text, Tr("Location"), degrees + MapLink(*place));
   }
   AddFact(text, Tr("File size"), TrCount("%1 byte", "%1 bytes", picture.fileSize));
   AddFact(text, Tr("Image data"), TrCount("%1 byte", "%1 bytes", picture.imageBytes));

@@ -4,8 +4,9 @@
 #include "cli/commands/contact_sheet.h"
 #include "cli/commands/convert.h"
 #include "cli/commands/doctor.h"
-#include "cli/commands/exif.h"
-#include "cli/commands/exif_edit.h"
+#include "cli/commands/exif/exif.h"
+#include "cli/commands/exif/exif_edit.h"
+#include "cli/commands/exif/exif_gps.h"
 #include "cli/commands/faces.h"
 #include "cli/commands/formats.h"
 #include "cli/commands/history.h"
@@ -48,6 +49,7 @@ constexpr Command kCommands[] = {
     {"exif copy",   TrLater("copy EXIF from one picture to others"),                    Needs::Formats,  SetUpExifCopy},
     {"exif shift",  TrLater("move the dates and times in EXIF"),                        Needs::Formats,  SetUpExifShift},
     {"exif owner",  TrLater("set owner, copyright and equipment from the configuration"), Needs::Formats, SetUpExifOwner},
+    {"exif gps",    TrLater("set where pictures were taken, from a track, a list or by hand"), Needs::Formats, SetUpExifGps},
     {"exif strip",  TrLater("remove metadata for good, pixels unchanged"),              Needs::Formats,  SetUpExifStrip},
     {"faces",   TrLater("find faces in pictures"),                                      Needs::Formats,  SetUpFaces},
     {"plugins", TrLater("list the plug-in formats"),                                    Needs::Settings, SetUpPlugins},

@@ -1,4 +1,4 @@
-#include "cli/commands/exif_edit.h"
+#include "cli/commands/exif/exif_edit.h"
 
 #include <algorithm>
 #include <memory>
@@ -36,14 +36,6 @@ int RunExifRewrite(RewriteOptions& options, decltype(RewriteFunction::rewrite) r
   return RunRewriteJob(options, *selection, context, [&](BatchJob& job) {
     (void)RunRewrite(selection->files, function, job);  // this box always opens
   });
-}
-
-int RunExifEdit(RewriteOptions& options, const ExifChanger& changer, const CommandContext& context) {
-  return RunExifRewrite(
-      options,
-      [&](const std::string& source, const std::string& destination, const RewriteRequest& request,
-          const WriteOptions& write) { return EditExifFile(source, destination, changer, request, write); },
-      context);
 }
 
 ExifChanger Always(const ExifChanges& changes) {
@@ -213,6 +205,14 @@ int RunStrip(StripOptions& options, const CommandContext& context) {
 }
 
 }  // namespace
+
+int RunExifEdit(RewriteOptions& options, const ExifChanger& changer, const CommandContext& context) {
+  return RunExifRewrite(
+      options,
+      [&](const std::string& source, const std::string& destination, const RewriteRequest& request,
+          const WriteOptions& write) { return EditExifFile(source, destination, changer, request, write); },
+      context);
+}
 
 void SetUpExifSet(CLI::App& app, CommandContext& context) {
   auto options = SetUp(app, context, "FILE... TAG=VALUE...",

@@ -1,7 +1,5 @@
-#include "cli/commands/exif.h"
+#include "cli/commands/exif/exif.h"
 
-#include <charconv>
-#include <cmath>
 #include <memory>
 #include <string>
 #include <vector>
@@ -187,19 +185,6 @@ class ExifRun {
   std::string text_;
 };
 
-bool ReadNumber(std::string_view text, double most, double& number) {
-  if (text.starts_with('+')) text.remove_prefix(1);
-  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), number);
-  return error == std::errc{} && end == text.data() + text.size() && std::abs(number) <= most;
-}
-
-// Reads "LAT,LON" into two numbers.
-bool ReadPlace(std::string_view text, double* degrees) {
-  const size_t comma = text.find(',');
-  return comma != std::string_view::npos && ReadNumber(text.substr(0, comma), 90, degrees[0]) &&
-         ReadNumber(text.substr(comma + 1), 360, degrees[1]);
-}
-
 bool IsSameFile(const std::string& one, const std::string& other) {
   const platform::FileFacts a = platform::FactsOf(one), b = platform::FactsOf(other);
   return a.kind == platform::FileKind::Regular && b.kind == a.kind && a.device == b.device &&
@@ -210,7 +195,7 @@ int RunExif(const ExifOptions& options, const CommandContext& context) {
   double degrees[4] = {};
   const bool measures = !options.distance.empty();
   for (size_t i = 0; i < options.distance.size(); ++i) {
-    if (!ReadPlace(options.distance[i], degrees + 2 * i)) {
+    if (!ParseGpsDegrees(options.distance[i], degrees[2 * i], degrees[2 * i + 1])) {
       return UsageError(context,
                         Tr("\"%1\" is not LAT,LON in decimal degrees.", options.distance[i]));
     }

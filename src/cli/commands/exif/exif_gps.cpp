@@ -1,0 +1,115 @@
+#include "cli/commands/exif/exif_gps.h"
+
+#include <memory>
+#include <string>
+
+#include "cli/commands/exif/exif_edit.h"
+#include "cli/frame/options.h"
+#include "core/data_folder.h"
+#include "core/limits.h"
+#include "metadata/edit/exif_dates.h"
+#include "metadata/edit/gps_place.h"
+#include "metadata/gps.h"
+#include "platform/file_view.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "settings/settings.h"
+#include "texts/system_reason.h"
+#include "texts/texts.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct GpsOptions {
+  RewriteOptions rewrite;
+  std::string gpx, offset, at, place;
+};
+
+// The path of ExifLocationsFile: a plain name is in the data folder.
+std::string LocationsPath() {
+  const std::string name(settings.ExifLocationsFile.view());
+  return platform::SplitPath(name).folder.empty() ? DataFile(name) : name;
+}
+
+// Reads the place of a name; what is wrong as a sentence, empty if nothing is.
+std::string ReadListedPlace(const std::string& name, GpsPlace& place) {
+  const std::string path = LocationsPath();
+  platform::FileView file;
+  if (path.empty() || !file.Open(path) || file.FileSize() > limits.listFileBytes)
+    return WithReason(Tr("\"%1\" cannot be read.", path));
+  const auto bytes = file.Bytes();
+  const std::string list(bytes.begin(), bytes.end());
+  size_t badLine = 0;
+  const auto found = FindListedPlace(list, name, badLine);
+  if (found) {
+    place = *found;
+    return {};
+  }
+  if (badLine != 0) return Tr("Line %1 of \"%2\" is not a place: NAME = LAT,LON.", badLine, path);
+  return Tr("There is no place \"%1\" in \"%2\".", name, path);
+}
+
+std::string ReadTrack(const std::string& path, GpsTrack& track) {
+  platform::FileView file;
+  if (!file.Open(path)) return WithReason(Tr("\"%1\" cannot be read.", path));
+  if (track.Parse(file.Bytes()) != Status::Ok) return Tr("\"%1\" is not a GPX track.", path);
+  return track.Empty() ? Tr("\"%1\" has no points with a time.", path) : std::string();
+}
+
+// The change that the options ask for; what is wrong with them, empty if nothing is.
+std::string MakeChanger(const GpsOptions& options, ExifChanger& changer) {
+  const int ways = (options.gpx.empty() ? 0 : 1) + (options.at.empty() ? 0 : 1) + (options.place.empty() ? 0 : 1);
+  if (ways != 1) return Tr("Choose one of --gpx, --at and --place.");
+  if (!options.offset.empty() && options.gpx.empty()) return Tr("--offset needs --gpx.");
+  const auto offset = ParseTimeShift(options.offset);
+  if (!options.offset.empty() && !offset)
+    return Tr("\"%1\" is not an offset such as +1:30:00.", options.offset);
+  if (!options.gpx.empty()) {
+    const auto track = std::make_shared<GpsTrack>();
+    changer = [track, offset](const ExifDirectories& old, std::string& reason) -> ExifChanges {
+      const auto time = TakenUtc(old, offset);
+      const auto place = time ? track->At(*time) : std::nullopt;
+      if (!time) reason = Tr("It does not tell when it was taken.");
+      if (time && !place)
+        reason = Tr("The track has no point within %1 minutes of its time.", GpsTrack::kMostGap / 60);
+      return place ? PlaceEntries(*place) : ExifChanges();
+    };
+    return ReadTrack(options.gpx, *track);
+  }
+  GpsPlace place;
+  std::string wrong;
+  if (!options.place.empty()) {
+    wrong = ReadListedPlace(options.place, place);
+  } else if (!ParseGpsDegrees(options.at, place.latitude, place.longitude)) {
+    wrong = Tr("\"%1\" is not LAT,LON in decimal degrees.", options.at);
+  }
+  changer = [place](const ExifDirectories&, std::string&) { return PlaceEntries(place); };
+  return wrong;
+}
+
+}  // namespace
+
+void SetUpExifGps(CLI::App& app, CommandContext& context) {
+  auto options = std::make_shared<GpsOptions>();
+  AddSelection(app, options->rewrite.selection, context);
+  AddName(app, "--gpx", options->gpx, "TRACK",
+          "Take the places from a GPX track, by the time each picture was taken");
+  AddName(app, "--offset", options->offset, "SHIFT",
+          "What is added to the camera's time to get that of the track, UTC: +1:30:00 (default: the EXIF offset, else 0)");
+  AddName(app, "--at", options->at, "LAT,LON", "The place in decimal degrees, north and east positive");
+  AddName(app, "--place", options->place, "NAME", "A place of the list ExifLocationsFile");
+  AddRewriteOptions(app, options->rewrite);
+  SetFooter(app,
+            "A track gives latitude, longitude, altitude and time; between two points they are interpolated. A line of ExifLocationsFile, in the\n"
+            "data folder unless it has a path, is NAME = LAT,LON in decimal degrees, or as in ExifDefaultLocation.",
+            "fotomill exif gps holiday --in-place --gpx walk.gpx --offset=-2:00");
+  context.run = [options, &context] {
+    ExifChanger changer;
+    if (const std::string wrong = MakeChanger(*options, changer); !wrong.empty())
+      return UsageError(context, wrong);
+    return RunExifEdit(options->rewrite, changer, context);
+  };
+}
+
+}  // namespace fotomill::cli
