@@ -15,14 +15,14 @@ namespace fotomill {
 // file. DamagedFile (2) or FileReadError (3) if the file's structure is invalid; nothing is
 // decoded, so damaged pixels go unnoticed.
 
-// What is kept, and what is put in.
+// What to keep, and what to add.
 struct BareOptions {
   bool profile = true;      // the color profile
   bool orientation = true;  // of directories, where it is part of the picture's own
-  bool texts = false;       // JPEG comments, PNG texts except XMP
+  bool texts = false;       // JPEG comments, PNG texts other than XMP
   bool iptc = false;        // in JPEG and TIFF
-  bool xmp = false;         // of directories; other files get it anew
-  // JPEG: new blocks, from the byte order on; empty: none
+  bool xmp = false;         // in TIFF directories; added anew in other formats
+  // JPEG: new blocks, starting at the byte order; empty: none
   std::span<const uint8_t> newExif = {}, newXmp = {};
 };
 
@@ -35,7 +35,7 @@ Status MakeBareWebp(std::span<const uint8_t> file, std::vector<uint8_t>& bare);
 // own directory. Also for HD Photo.
 Status MakeBareTiff(std::span<const uint8_t> file, std::vector<uint8_t>& bare);
 
-// The same as the options say; a JPEG file as parts of the old one, which must stay.
+// As above, with options; a JPEG file as parts of the old one, which must outlive them.
 Status MakeBareJpeg(std::span<const uint8_t> file, const BareOptions& options, FilePieces& bare);
 Status MakeBarePng(std::span<const uint8_t> file, const BareOptions& options,
                    std::vector<uint8_t>& bare);

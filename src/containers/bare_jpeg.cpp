@@ -56,8 +56,8 @@ void AppendBlock(std::string_view head, std::span<const uint8_t> block, FilePiec
   bare.Add(std::move(bytes));
 }
 
-// Photoshop's segment with the resource of IPTC alone: "8BIM", a number, a name with its length in
-// front, of even size, and data with a length of 4 bytes.
+// A Photoshop segment with only the IPTC resource: "8BIM", a number, a length-prefixed name of even
+// size, and data with a 4-byte length.
 // Source: Adobe, "Photoshop File Formats Specification" (2019), "Image Resource Blocks".
 void AppendIptc(const JpegSegment& segment, FilePieces& bare) {
   constexpr uint16_t kIptc = 0x0404;
@@ -135,7 +135,7 @@ Status MakeBareJpeg(std::span<const uint8_t> file, const BareOptions& options, F
   if (options.newExif.size() > kMostExif || options.newXmp.size() > kMostXmp)
     return Status::UnsuitableImage;
   bare.Keep(file.first(2));
-  bool added = false;  // the new blocks: behind JFIF's own segment, in front of everything else
+  bool added = false;  // the new blocks, after JFIF and before everything else
   const auto addBlocks = [&] {
     if (added) return;
     AppendBlock(kExifHead, options.newExif, bare);

@@ -22,7 +22,7 @@ bool Belongs(const PngPlace& chunk, std::span<const uint8_t> file, const BareOpt
   if (std::ranges::find(kPicture, chunk.type) != std::end(kPicture)) return true;
   if (!options.texts || std::ranges::find(kTexts, chunk.type) == std::end(kTexts)) return false;
   ByteReader text(file.subspan(chunk.data, chunk.size));
-  return !text.Match(kXmp) && !text.Match(kRawProfile);  // those are blocks in disguise
+  return !text.Match(kXmp) && !text.Match(kRawProfile);  // metadata blocks stored as texts
 }
 
 }  // namespace

@@ -23,7 +23,7 @@ constexpr TagRange kPicture[] = {
     {290, 293},     {296, 297},     {301, 301},     {317, 332},     {334, 334},
     {336, 347},     {512, 521},     {529, 532},     {559, 559},     {32995, 32998},
     {34675, 34675}, {34908, 34910}, {37439, 37439}, {50674, 50674},
-    {0xBC01, 0xBCFF},  // those of HD Photo
+    {0xBC01, 0xBCFF},  // HD Photo
 };
 constexpr uint32_t kOrientation = 274, kProfile = 34675, kXmp = 700, kIptc = 33723;
 constexpr uint32_t kHdpOrientation = 0xBC02, kHdpOffset = 0xBCC0, kHdpSize = 0xBCC1;

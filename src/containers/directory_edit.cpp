@@ -16,13 +16,13 @@ constexpr uint16_t kExifPointer = 0x8769, kGpsPointer = 0x8825, kInteroperabilit
 constexpr uint16_t kSubDirectories = 0x014A;
 constexpr uint16_t kFirstHdpData = 0xBCC0;
 constexpr uint16_t kLong = 4, kLong8 = 16;
-constexpr int32_t kDeepest = 4;            // directories within directories
+constexpr int32_t kDeepest = 4;            // nesting depth of directories
 constexpr uint64_t kMostPieces = 1 << 23;  // strips and tiles of all pages
-// Bytes of a value, and of the numbers in it, by type.
+// Size of a value, and of the numbers in it, by type.
 constexpr uint8_t kTypeBytes[] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8, 4, 8, 4, 0, 0, 8, 8, 8};
 constexpr uint8_t kNumberBytes[] = {0, 1, 1, 2, 4, 4, 1, 1, 2, 4, 4, 4, 8, 4, 0, 0, 8, 8, 8};
 
-// Entries that say where data is, and those that say how long it is; 0: unknown, to the end.
+// Pairs of entries with offsets and sizes of data; 0: unknown size, to the end of the file.
 constexpr struct {
   uint16_t offsets, sizes;
 } kDataTags[] = {{0x0111, 0x0117}, {0x0144, 0x0145}, {0x0201, 0x0202}, {0x0207, 0},
@@ -36,15 +36,15 @@ struct Entry {
   uint16_t tag = 0, type = 0;
   uint64_t count = 0;
   std::vector<uint8_t> field = {};  // as stored: the values, or their offset
-  uint64_t value = 0, size = 0;  // where the values are; size 0: unknown type
-  bool outside = false;          // of the entry
+  uint64_t value = 0, size = 0;  // offset and size of the values; size 0: unknown type
+  bool outside = false;          // outside the entry
 };
 
 struct Directory {
   uint64_t at = 0;
   std::vector<Entry> entries;
   uint64_t next = 0;
-  uint64_t oldEnd = 0;  // behind it in the file
+  uint64_t oldEnd = 0;  // offset after it in the file
   size_t oldCount = 0;
   bool dirty = false;
 };
@@ -126,13 +126,13 @@ class Editor {
   static uint64_t BytesOf(uint64_t type) {
     return type < std::size(kTypeBytes) ? kTypeBytes[type] : 0;
   }
-  // Number `i` of an entry's values, 0 when the file does not hold it.
+  // Element `i` of an entry's values, 0 if it is beyond the end of the file.
   uint64_t NumberOf(const Entry& entry, uint64_t i) const {
     const uint64_t each = BytesOf(entry.type);
     return each == 0 ? 0 : Number(entry.value + i * each, each);
   }
 
-  // False when the file does not hold it as a whole.
+  // False if it is not entirely within the file.
   bool ReadDirectory(uint64_t at, Directory& directory) {
     if (at < 8 || !Holds(at, CountBytes())) return false;
     const uint64_t count = Number(at, CountBytes()), entries = at + CountBytes();
@@ -141,7 +141,7 @@ class Editor {
     directory.oldCount = count;
     for (uint64_t i = 0; i < count; ++i) directory.entries.push_back(ReadEntry(entries + i * EntryBytes()));
     directory.oldEnd = entries + count * EntryBytes();
-    if (!Holds(directory.oldEnd, Word())) return true;  // blocks that end here have no next one
+    if (!Holds(directory.oldEnd, Word())) return true;  // blocks may end without a next one
     directory.next = Number(directory.oldEnd, Word());
     directory.oldEnd += Word();
     return true;
@@ -156,15 +156,15 @@ class Editor {
     const auto field = file_.subspan(entry.value, Word());
     entry.field.assign(field.begin(), field.end());
     const uint64_t each = BytesOf(entry.type);
-    // a count that no file can hold
+    // impossible count
     entry.size = each == 0 || entry.count > UINT64_MAX / 16 ? 0 : each * entry.count;
     entry.outside = entry.size > Word();
     if (entry.outside) entry.value = Number(entry.value, Word());
     return entry;
   }
 
-  // Notes what a directory and all below it use of the file. False when it was seen before, or is
-  // not in the file as a whole.
+  // Records the ranges of the file used by a directory and its subdirectories. False if it was
+  // already visited, or is not entirely within the file.
   bool Map(uint64_t at, int32_t depth) {
     Directory directory;
     if (visited_.size() >= limits.filePages || mappedEntries_ > limits.exifEntries) return false;
@@ -186,7 +186,7 @@ class Editor {
     if (!leads || depth >= kDeepest || entry.size == 0 || !Holds(entry.value, entry.size)) return;
     for (uint64_t i = 0; i < entry.count; ++i) {
       uint64_t at = NumberOf(entry, i);
-      // pages below a page may be chained; the others are not
+      // subdirectories of a page may be chained; others are not
       while (at != 0 && Map(at, depth + 1)) at = entry.tag == kSubDirectories ? mappedNext_ : 0;
     }
   }
@@ -203,7 +203,7 @@ class Editor {
       const bool sized = sizes != nullptr && i < sizes->count;
       const uint64_t rest = file_.size() - std::min<uint64_t>(at, file_.size());
       uint64_t size = sized ? NumberOf(*sizes, i) : rest;
-      // writers of HD Photo count an alpha codestream from the start of the file
+      // HD Photo writers count an alpha codestream from the start of the file
       if (offsetsTag >= kFirstHdpData) size = std::min(size, rest);
       if (at != 0) Use(at, size);
     }
@@ -214,7 +214,7 @@ class Editor {
     if (at < file_.size()) used_.push_back({at, at + std::min<uint64_t>(size, file_.size() - at)});
   }
 
-  // Whether nothing but its owner uses a range.
+  // Whether a range has only one user.
   bool Exclusive(const Range& range) const {
     const auto overlaps = [&](const Range& other) {
       return other.begin < range.end && range.begin < other.end;
@@ -235,7 +235,7 @@ class Editor {
       Erase({entry.value, entry.value + entry.size});
   }
 
-  // Puts bytes behind the end, at an even offset, which is returned.
+  // Appends bytes at an even offset, which is returned.
   uint64_t Append(const std::vector<uint8_t>& bytes) {
     if ((file_.size() + edit_.tail.size()) % 2 != 0) edit_.tail.push_back(0);
     const uint64_t at = file_.size() + edit_.tail.size();
@@ -286,10 +286,10 @@ class Editor {
     }
     target.type = entry.type;
     target.count = entry.count;
-    target.outside = false;  // its old value is done with
+    target.outside = false;  // its old value is no longer used
   }
 
-  // The directory's bytes.
+  // The directory as stored in the file.
   std::vector<uint8_t> Laid(const Directory& directory) const {
     std::vector<uint8_t> bytes = Bytes(directory.entries.size(), CountBytes());
     const auto add = [&](const std::vector<uint8_t>& more) {
@@ -305,8 +305,8 @@ class Editor {
     return bytes;
   }
 
-  // Writes a changed directory where it was, or behind the end; returns where. An empty one is 0,
-  // unless it is `needed`.
+  // Writes a changed directory in place, or at the end of the file; returns its offset. An empty
+  // one is omitted (0) unless it is `needed`.
   uint64_t Place(const Directory& directory, bool needed) {
     const Range old{directory.at, directory.oldEnd};
     if (directory.entries.empty() && !needed) {
@@ -323,7 +323,7 @@ class Editor {
     return Append(bytes);
   }
 
-  // Applies what concerns the directory that an entry of the first one leads to.
+  // Applies the changes for the directory an entry of the first one points to.
   Status EditSub(uint16_t pointerTag, ExifPlace place, std::span<const DirectoryChange> changes,
                  Directory& first) {
     const auto concerns = [&](const DirectoryChange& change) { return change.place == place; };
@@ -366,11 +366,11 @@ class Editor {
   DirectoryEdit& edit_;
   std::string& reason_;
   bool bigEndian_ = false, wide_ = false;
-  uint64_t firstAt_ = 4;  // where the offset of the first directory is
+  uint64_t firstAt_ = 4;  // position of the first directory's offset
   std::unordered_set<uint64_t> visited_;
   std::vector<Range> used_;
   uint64_t mappedNext_ = 0, mappedEntries_ = 0, pieces_ = 0;
-  bool pointsBeyond_ = false;  // something is said to be behind the end
+  bool pointsBeyond_ = false;  // something refers to data past the end
 };
 
 }  // namespace

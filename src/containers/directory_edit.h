@@ -12,54 +12,54 @@
 
 namespace fotomill {
 
-// Changes to the directories of a TIFF structure: an EXIF block, or a TIFF, BigTIFF or HD Photo
-// file. Nothing moves but what is changed: maker notes, pixels and all other directories stay at
-// their offsets. What does not fit where it was goes behind the end, with a directory that grows.
-// The old bytes of a value that is removed or replaced become zeros, unless something else is there
-// too.
+// Edits the directories of a TIFF structure: an EXIF block, or a TIFF,
+// BigTIFF or HD Photo file. Only changed parts move: maker notes, pixels and
+// all other directories keep their offsets. Whatever no longer fits in place
+// is appended at the end, as are directories that grow. Old bytes of removed
+// or replaced values are zeroed, unless they are shared with something else.
 
-// The directories that a camera's entries are in; the first is the picture's own.
+// The directories with a camera's entries; the first is the picture's own.
 enum class ExifPlace : uint8_t { First, Exif, Gps };
 
-// One entry that is put in place of those with its tag, is added, or is removed. Its values are
-// little-endian, whatever the structure is.
+// An entry that replaces those with its tag, is added, or is removed. Its values are little-endian,
+// whatever the structure's byte order.
 struct DirectoryChange {
   ExifPlace place = ExifPlace::First;
   uint16_t tag = 0;
-  std::optional<ExifEntry> entry = {};  // none: it is removed
-  bool all = false;                     // the whole directory is removed, whatever its tags
+  std::optional<ExifEntry> entry = {};  // none: remove the tag
+  bool all = false;                     // remove the whole directory, ignoring the tag
 };
 
-// What becomes of the bytes.
+// The resulting changes to the file.
 struct DirectoryEdit {
   struct Patch {
     uint64_t at = 0;
     std::vector<uint8_t> bytes;
   };
-  std::vector<Patch> patches;  // ascending; they do not overlap
-  std::vector<uint8_t> tail;   // behind the end, padding included
+  std::vector<Patch> patches;  // ascending, without overlaps
+  std::vector<uint8_t> tail;   // appended to the file, padding included
   bool Empty() const { return patches.empty() && tail.empty(); }
 };
 
-// Works out an edit, which is empty where the entries are so already. A directory whose last entry
-// goes is left out with its pointer. DamagedFile (2) for what is no such structure, UnsuitableImage
-// (13) where it cannot grow, each with a reason, a whole sentence.
+// Computes an edit, which is empty if nothing changes. A directory that becomes empty is removed
+// with its pointer. DamagedFile (2) if it is not such a structure, UnsuitableImage (13) if it
+// cannot grow, each with a reason, a whole sentence.
 Status EditDirectories(std::span<const uint8_t> file, std::span<const DirectoryChange> changes,
                        DirectoryEdit& edit, std::string& reason);
 
-// The edited bytes as parts of a new file, or as a block of their own.
+// The edited bytes as parts of a new file, or as a separate block.
 void AddEdited(std::span<const uint8_t> file, DirectoryEdit edit, FilePieces& pieces);
 std::vector<uint8_t> EditedBlock(std::span<const uint8_t> block, DirectoryEdit edit);
 
-// The values of an entry of a structure's first directory, as they are in the file; no bytes if it
-// has none, or does not hold them.
+// The values of an entry in a structure's first directory, as stored; empty if it does not exist or
+// is beyond the end of the file.
 struct DirectoryValue {
   uint16_t type = 0;
   std::span<const uint8_t> bytes = {};
 };
 DirectoryValue FindDirectoryValue(std::span<const uint8_t> file, uint16_t tag);
 
-// Reverses the bytes of each number in values of a type: from one byte order to the other.
+// Swaps the byte order of the numbers in values of a type.
 void SwapExifNumbers(uint16_t type, std::span<uint8_t> values);
 
 }  // namespace fotomill

@@ -11,25 +11,25 @@
 
 namespace fotomill {
 
-// Files with other blocks of metadata: everything else is the same bytes in the same order, what is
-// behind the end of the picture included.
+// Replaces metadata blocks of a file; everything else is copied byte for byte and in order,
+// including data after the end of the picture.
 
-// What becomes of each block: none: it stays; empty: it goes; else it takes the place of the one
-// that is there, or is added.
+// The change to each block: none: kept; empty: removed; else it replaces the existing one,
+// or is added.
 struct MetadataBlocks {
-  std::optional<std::vector<uint8_t>> exif = {};  // from its byte order on
+  std::optional<std::vector<uint8_t>> exif = {};  // starting at the byte order
   std::optional<std::vector<uint8_t>> xmp = {};   // the packet
 };
 
-// The blocks of a file; empty without one. Views into the file.
+// The blocks of a file; empty if missing. Views into the file.
 struct MetadataViews {
   std::span<const uint8_t> exif, xmp;
 };
 
-// Each finds a file's blocks, and makes the new file from parts of the old one, which must stay.
-// DamagedFile (2) or FileReadError (3) for a file that is not laid out as its format says,
-// UnsuitableImage (13) where it cannot hold the blocks or would lose something, with a reason, a
-// whole sentence.
+// Each finds a file's blocks, and makes the new file from parts of the old
+// one, which must outlive it. DamagedFile (2) or FileReadError (3) if the
+// file's structure is invalid, UnsuitableImage (13) if it cannot store the
+// blocks or something would be lost, with a reason, a whole sentence.
 Status FindJpegMetadata(std::span<const uint8_t> file, MetadataViews& views);
 Status RewriteJpeg(std::span<const uint8_t> file, const MetadataBlocks& blocks, FilePieces& made,
                    std::string& reason);

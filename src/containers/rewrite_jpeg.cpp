@@ -14,7 +14,7 @@ namespace {
 constexpr uint8_t kApp0 = 0xE0, kApp1 = 0xE1, kApp2 = 0xE2;
 constexpr std::string_view kMpf("MPF\0", 4), kExifName("Exif", 4);
 
-// As readers take it: whatever the two bytes behind the name are.
+// As lenient as readers: the two bytes after the name are ignored.
 bool IsExif(const JpegSegment& segment) {
   return segment.marker == kApp1 && segment.data.size() >= kExifHead.size() && segment.Starts(kExifName);
 }
@@ -37,7 +37,7 @@ std::span<const uint8_t> BytesOf(std::string_view text) {
   return {static_cast<const uint8_t*>(static_cast<const void*>(text.data())), text.size()};
 }
 
-// One kind of block, on its way into the new file.
+// One kind of block to be written.
 struct Wanted {
   const std::optional<std::vector<uint8_t>>& block;
   std::string_view head;
@@ -81,7 +81,7 @@ class JpegRewrite {
   }
 
   Status Add(const JpegSegment& segment) {
-    // new ones come behind JFIF's own, in front of everything else
+    // new ones follow JFIF and precede everything else
     if (segment.marker != kApp0) AddNew();
     const bool mpf = segment.marker == kApp2 && segment.Starts(kMpf);
     mpfSeen_ = mpfSeen_ || mpf;
@@ -102,14 +102,14 @@ class JpegRewrite {
     if (mpfSeen_ && !sameSize && (goes || !wanted.done))
       return Refuse(Tr("The file has an index of further pictures in front of its metadata."));
     if (goes) return Status::Ok;
-    // Further segments may hold what has no room in the first; they stay.
+    // Later segments, which may hold what does not fit into the first, are kept.
     if (wanted.done) {
       made_.Keep(segment.whole);
       return Status::Ok;
     }
     wanted.done = true;
     const size_t prefix = static_cast<size_t>(segment.data.data() - segment.whole.data());
-    if (sameSize) {  // fill bytes in front of the marker stay as well
+    if (sameSize) {  // also keep fill bytes before the marker
       made_.Keep(segment.whole.first(prefix + headSize));
       made_.Add(*wanted.block);
     } else {
@@ -132,7 +132,7 @@ class JpegRewrite {
   std::string& reason_;
   Wanted wanted_[2];
   bool splitExif_ = false;
-  bool mpfSeen_ = false;  // an index that counts from its own place on
+  bool mpfSeen_ = false;  // an index with offsets relative to itself
 };
 
 }  // namespace

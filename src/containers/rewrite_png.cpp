@@ -1,5 +1,5 @@
-// EXIF is in the chunk eXIf, XMP in an iTXt with the keyword "XML:com.adobe.xmp", no compression,
-// language or translated keyword.
+// EXIF is stored in an eXIf chunk, XMP in an iTXt chunk with the keyword "XML:com.adobe.xmp",
+// without compression, language or translated keyword.
 // Source: W3C, "Portable Network Graphics (PNG) Specification (Third Edition)", 2025, sections
 // 11.3.2.6 and 11.3.3.4; XMP specification part 3, section 1.1.5.
 #include <zlib.h>
@@ -34,7 +34,7 @@ std::vector<uint8_t> Chunk(std::string_view type, std::string_view head,
   return bytes;
 }
 
-// One kind of block, on its way into the new file.
+// One kind of block to be written.
 struct Wanted {
   const std::optional<std::vector<uint8_t>>& block;
   std::string_view type, head;

@@ -1,5 +1,5 @@
-// A file of a single chunk gets a VP8X chunk, which metadata need: flags (4 bytes), width and height
-// less one (3 bytes each).
+// Metadata requires a VP8X chunk, which is added to files with a single chunk: flags (4 bytes),
+// width and height minus one (3 bytes each).
 // Source: RFC 9649, sections 2.5 to 2.7; RFC 6386, section 9.1.
 #include <algorithm>
 
@@ -30,7 +30,7 @@ std::vector<uint8_t> Chunk(std::string_view name, std::span<const uint8_t> head,
   return bytes;
 }
 
-// The VP8X chunk that the only chunk of a file calls for; empty if it makes no sense.
+// The VP8X chunk for a file with a single chunk; empty if that is invalid.
 std::vector<uint8_t> Extended(const RiffPlace& chunk, std::span<const uint8_t> data) {
   ByteReader bytes(data);
   uint32_t width = 0, height = 0;
@@ -54,7 +54,7 @@ std::vector<uint8_t> Extended(const RiffPlace& chunk, std::span<const uint8_t> d
   return Chunk("VP8X", {}, made);
 }
 
-// A chunk as it is in the file.
+// A chunk of the file.
 struct Part {
   std::string_view name;
   std::span<const uint8_t> whole, data;
@@ -69,7 +69,7 @@ Status Split(std::span<const uint8_t> file, std::vector<Part>& parts, uint64_t& 
   RiffWalk walk(file.first(size));
   for (RiffPlace chunk; walk.Next(chunk);) {
     ByteReader length(file.subspan(chunk.data - 4));
-    if (length.Le32() != chunk.size) return Status::FileReadError;  // it ends within the chunk
+    if (length.Le32() != chunk.size) return Status::FileReadError;  // the file is truncated
     end = std::min(chunk.data + chunk.size + chunk.size % 2, size);
     parts.push_back({chunk.name, file.subspan(chunk.data - 8, end - chunk.data + 8),
                      file.subspan(chunk.data, chunk.size)});
@@ -137,7 +137,7 @@ class WebpRewrite {
     size_ += bytes.size();
     body_.Keep(bytes);
   }
-  // Puts a block where it belongs, once.
+  // Writes a block at its position, once.
   void Put(Wanted& wanted, std::span<const uint8_t> head) {
     if (wanted.done || !wanted.block || wanted.block->empty()) return;
     Push(Chunk(wanted.name, head, *wanted.block));
@@ -157,8 +157,8 @@ class WebpRewrite {
       return Put(wanted, headed ? part.data.first(kExifHead.size()) : part.data.first(0));
     }
     Keep(part.whole);
-    if (part.whole.size() % 2 != 0) Push({0});  // the last chunk of a file may lack its padding
-    // new blocks come behind the pixels, EXIF in front of XMP
+    if (part.whole.size() % 2 != 0) Push({0});  // the last chunk of a file may lack padding
+    // new blocks follow the pixels, EXIF before XMP
     const bool last = IsPixels(part.name) && (i + 1 == parts_.size() || !IsPixels(parts_[i + 1].name));
     for (Wanted& wanted : wanted_) {
       if (last && !wanted.there) Put(wanted, {});

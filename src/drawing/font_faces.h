@@ -32,8 +32,8 @@ class FontFaces {
   double Em() const { return em_; }             // pixels, of all faces
   double Ascent() const { return ascent_; }     // pixels above the baseline, of the family's font
   double Descent() const { return descent_; }   // pixels below it
-  FT_Library Library() const { return library_; }  // owned here, as what follows; null until opened
-  // `face` as FaceFor returns it.
+  FT_Library Library() const { return library_; }  // owned, like the following; null until opened
+  // `face` as returned by FaceFor.
   FT_Face Outlines(size_t face) const { return faces_[face].outlines; }
   hb_font_t* Shaper(size_t face) const { return faces_[face].shaper; }  // of the same face and size
 

@@ -22,14 +22,14 @@ class FontFiles {
   // fontconfig. Cached; thread-safe.
   static std::shared_ptr<const FontFiles> Of(std::string_view family);
 
-  // Asks fontconfig, which takes a while; Of caches.
+  // Queries fontconfig, which is slow; Of caches the result.
   explicit FontFiles(std::string_view family);
   ~FontFiles();
   FontFiles(const FontFiles&) = delete;
   FontFiles& operator=(const FontFiles&) = delete;
 
-  size_t Count() const;                    // 0 without any font
-  const FontFile& At(size_t index) const;  // below Count, the best first
+  size_t Count() const;                    // 0 if there are no fonts
+  const FontFile& At(size_t index) const;  // index < Count; best match first
   // Whether a font has a glyph for a character.
   bool Has(size_t index, char32_t character) const;
 

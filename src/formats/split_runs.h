@@ -8,9 +8,9 @@
 
 namespace fotomill {
 
-// Splits a row for a run-length code: `putRun(count, value)` gets each run of `shortest` to `most`
-// equal bytes, `putPlain(bytes)` the literals between them, which may be empty or more than `most`.
-// Longer stretches of equal bytes come as several runs.
+// Splits a row for run-length coding: `putRun(count, value)` receives each run of `shortest` to
+// `most` equal bytes, `putPlain(bytes)` the literals in between, which may be empty or longer than
+// `most`. Longer runs are split.
 template <typename PutPlain, typename PutRun>
 void SplitRuns(std::span<const uint8_t> row, size_t shortest, size_t most, PutPlain putPlain,
                PutRun putRun) {
@@ -29,7 +29,7 @@ void SplitRuns(std::span<const uint8_t> row, size_t shortest, size_t most, PutPl
   putPlain(row.subspan(plain));
 }
 
-// Appends bytes as tokens, each a count of at most `most` and that many literal bytes.
+// Appends literal tokens, each a count of at most `most` followed by that many bytes.
 inline void AppendCounted(std::span<const uint8_t> bytes, size_t most, std::vector<uint8_t>& code) {
   while (!bytes.empty()) {
     const auto part = bytes.first(std::min(bytes.size(), most));

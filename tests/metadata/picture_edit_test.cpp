@@ -22,7 +22,7 @@ std::vector<std::string> LinesOf(const Bytes& block) {
   return sink.lines;
 }
 
-// A change as a user types it; without a value the tag is removed.
+// A change in user syntax; without a value the tag is removed.
 DirectoryChange Typed(std::string_view name, const char* text) {
   DirectoryChange change;
   change.tag = FindExifTagByName(name).value_or(0xffff);
@@ -50,7 +50,7 @@ Bytes Edited(const Bytes& file, const ExifChanges& changes) {
   return made;
 }
 
-// The lines of a block without those that begin so.
+// The lines of a block without those that start with a name.
 std::vector<std::string> Without(std::vector<std::string> lines, std::string_view name) {
   std::erase_if(lines, [&](const std::string& line) { return line.starts_with(name); });
   return lines;
@@ -58,11 +58,11 @@ std::vector<std::string> Without(std::vector<std::string> lines, std::string_vie
 
 TEST(PictureEdit, ChangesWhatIsAskedFor) {
   const struct {
-    const char *tag, *text, *line;  // the line that the block then has; null: none
+    const char *tag, *text, *line;  // the resulting line of the block; null: none
   } rows[] = {
-      {"Make", "Acm", "Image input equipment manufacturer=Acm"},      // fits where it was
-      {"Make", "Acm5", "Image input equipment manufacturer=Acm5"},    // just so
-      {"Make", "A", "Image input equipment manufacturer=A"},          // fits into its entry
+      {"Make", "Acm", "Image input equipment manufacturer=Acm"},      // fits in place
+      {"Make", "Acm5", "Image input equipment manufacturer=Acm5"},    // fits exactly
+      {"Make", "A", "Image input equipment manufacturer=A"},          // fits in the entry
       {"Make", "Acme Cameras", "Image input equipment manufacturer=Acme Cameras"},
       {"Make", nullptr, nullptr},
       {"Orientation", "Top Left", "Orientation of image=Top Left"},
@@ -89,12 +89,12 @@ TEST(PictureEdit, ChangesWhatIsAskedFor) {
         EXPECT_THAT(lines, Contains(row.line));
       }
       const std::string name(ExifTagName(*FindExifTagByName(row.tag)));
-      // pointers to directories that moved are lines as well
+      // pointers to moved directories are lines, too
       const auto rest = [&](const Bytes& of) {
         return Without(Without(Without(LinesOf(of), name + "="), "Exif tag="), "GPS tag=");
       };
       EXPECT_EQ(rest(made), rest(block));
-      // the thumbnail and its directory stay where they are
+      // the thumbnail and its directory are not moved
       EXPECT_TRUE(std::equal(block.begin() + 0x50, block.begin() + 0x7E, made.begin() + 0x50));
       EXPECT_EQ(Edited(made, {Typed(row.tag, row.text)}), made);
     }
@@ -107,7 +107,7 @@ TEST(PictureEdit, OldValuesAreNoLongerThere) {
     const Bytes made = Edited(LittleEndianBlock(), {Typed("Make", text)});
     EXPECT_EQ(std::search(made.begin(), made.end(), acme.begin(), acme.end()), made.end());
   }
-  // A value that another entry uses as well stays.
+  // A value shared with another entry is kept.
   BlockBuilder blocks;
   const uint32_t shared = 8 + 2 + 2 * 12 + 4;
   blocks.Directory({{0x010e, 2, 6, shared}, {0x013b, 2, 6, shared}});
@@ -162,7 +162,7 @@ TEST(PictureEdit, RefusesWhatCannotBeKept) {
     EXPECT_EQ(made, row.block);
   }
   EXPECT_THAT(LinesOf(Edited(pointer.block, {Typed("Artist", "Ann")})),
-              Contains("Person who created the image=Ann"));  // that concerns another directory
+              Contains("Person who created the image=Ann"));  // in another directory
 }
 
 Bytes Jpeg(const Bytes& block, std::string_view others = "FFE0 0010 4A46494600 010100 0001 0001 0000") {
@@ -182,8 +182,8 @@ Bytes Jpeg(const Bytes& block, std::string_view others = "FFE0 0010 4A46494600 0
 TEST(PictureEdit, JpegKeepsItsSegments) {
   const Bytes added = Edited(Jpeg({}), {Typed("Artist", "A")});
   EXPECT_THAT(added, ElementsAreArray(Jpeg(Hex("49492A00 08000000 0100 3B01 0200 02000000 41000000 00000000"))));
-  EXPECT_EQ(Edited(added, {Typed("Artist", nullptr)}), Jpeg({}));  // nothing is left of EXIF
-  // An index of further pictures counts from its own place, so nothing in front of them may grow.
+  EXPECT_EQ(Edited(added, {Typed("Artist", nullptr)}), Jpeg({}));  // EXIF is removed completely
+  // An index of further pictures has offsets relative to itself, so nothing before them may grow.
   const char* const index = "FFE2 0008 4D504600 0000";
   Bytes made;
   std::string reason;
@@ -200,7 +200,7 @@ TEST(PictureEdit, JpegKeepsItsSegments) {
 TEST(PictureEdit, ReadsWhatPeopleType) {
   const struct {
     const char *tag, *text;
-    const char* value;  // little-endian; null: refused
+    const char* value;  // little-endian; null: rejected
   } rows[] = {
       {"Orientation", "6", "0600"},
       {"Orientation", "right TOP", "0600"},

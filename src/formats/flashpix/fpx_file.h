@@ -12,10 +12,10 @@ namespace fotomill {
 
 // The structure of a FlashPix file. For the layout see fpx_file.cpp.
 
-// What channels mean, by their number.
+// Color spaces by number.
 enum class FpxColors : uint8_t { Gray = 1, PhotoYcc = 2, Rgb = 3 };
 
-// Where the pixels of a tile are, and how they are stored.
+// Position and encoding of a tile's pixels.
 struct FpxTile {
   uint64_t offset = 0, size = 0;  // of its data in the tile stream
   uint32_t compression = 0;       // 0 none, 1 one color, 2 JPEG
@@ -40,7 +40,7 @@ struct FpxSize {
   int32_t TilesDown() const { return (height + tileHeight - 1) / tileHeight; }
 };
 
-// The picture of a file, stored in up to 32 sizes.
+// The picture of a file, stored in up to 32 resolutions.
 class FpxFile {
  public:
   // `file` must outlive this object.

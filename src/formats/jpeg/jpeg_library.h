@@ -44,12 +44,12 @@ bool Guarded(JpegErrors& errors, Action action) {
 
 // A libjpeg decompressor with its error handler.
 struct JpegReader {
-  JpegReader();  // makes the decompressor; its errors jump only within Guarded
+  JpegReader();  // creates the decompressor; library errors may occur only within Guarded
   ~JpegReader() { jpeg_destroy_decompress(&info); }
   JpegReader(const JpegReader&) = delete;
   JpegReader& operator=(const JpegReader&) = delete;
 
-  // After Guarded was false.
+  // To be called after Guarded returned false.
   Status Failure() { return errors.Meaning(static_cast<j_common_ptr>(static_cast<void*>(&info))); }
 
   JpegErrors errors;

@@ -12,10 +12,10 @@ namespace fotomill {
 
 // The contents of a Paint Shop Pro image, as views into the file. For the layout see psp_file.cpp.
 
-// Of all channels of the file.
+// Common to all channels of the file.
 enum class PspCompression : uint16_t { None = 0, RunLengths = 1, Lz77 = 2, Jpeg = 3 };
-enum class PspBitmap : uint16_t { Image = 0, Transparency = 1 };  // what a channel is of
-// Which color a channel has, Composite for all.
+enum class PspBitmap : uint16_t { Image = 0, Transparency = 1 };  // what a channel contains
+// Color of a channel, Composite for all.
 enum class PspColor : uint16_t { Composite = 0, Red = 1, Green = 2, Blue = 3 };
 
 // The samples of one channel of a layer.
@@ -42,7 +42,7 @@ struct PspLayer {
   bool HasPixels() const;
 };
 
-// What is read of a file.
+// The parsed file.
 struct PspFile {
   uint16_t version = 0;  // 3 is Paint Shop Pro 5
   int32_t width = 0, height = 0;

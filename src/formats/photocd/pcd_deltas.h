@@ -14,7 +14,7 @@ namespace fotomill {
 // The prefix code for one plane's deltas.
 class PcdCode {
  public:
-  // A word of the code, and what it adds to a sample.
+  // A code and the delta it represents.
   struct Word {
     uint8_t length = 0;  // bits; 0: not a valid code
     int8_t delta = 0;
@@ -41,7 +41,7 @@ class PcdCode {
   std::vector<LongWord> long_;
 };
 
-// The codes of luma and, where there are three, of both chromas.
+// The code tables for luma and, if there are three, both chroma planes.
 struct PcdCodes {
   std::array<PcdCode, 3> planes;
   // The tables of `count` planes, in sequence.

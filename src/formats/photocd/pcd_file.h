@@ -16,15 +16,15 @@ inline constexpr uint64_t kPcdDeltas = 384 * kPcdSector;  // everything after th
 
 // The resolutions of a picture, each twice the previous one along both edges.
 inline constexpr int32_t kPcdPlainSizes = 3, kPcdSizes = 5;
-// Pixels of size 0, 1, ..., before turning.
+// Pixels of size 0, 1, ..., before rotation.
 constexpr int32_t PcdWidth(int32_t size) { return 192 << size; }
 constexpr int32_t PcdHeight(int32_t size) { return 128 << size; }  // pixels
-// Bytes of a plain size: luma, and two chromas of a quarter of its samples.
+// Bytes of a directly stored size: luma, and two chroma planes with a quarter of its samples.
 constexpr uint64_t PcdPlainBytes(int32_t size) {
   return static_cast<uint64_t>(PcdWidth(size)) * static_cast<uint64_t>(PcdHeight(size)) * 3 / 2;
 }
 
-// What the headers of a file say.
+// The parsed headers of a file.
 struct PcdFile {
   bool overview = false;
   int32_t pictures = 1;   // of an overview

@@ -12,13 +12,13 @@ struct PcdPlane {
   int32_t width = 0, height = 0;
   std::vector<uint8_t> samples;
 
-  // Sizes the plane, in samples.
+  // Allocates the plane, in samples.
   void Make(int32_t planeWidth, int32_t planeHeight) {
     width = planeWidth;
     height = planeHeight;
     samples.resize(static_cast<size_t>(width) * static_cast<size_t>(height));
   }
-  // `width` samples of row y from the top.
+  // Row y from the top, `width` samples.
   uint8_t* Row(int32_t y) {
     return samples.data() + static_cast<size_t>(y) * static_cast<size_t>(width);
   }

@@ -12,7 +12,7 @@ namespace fotomill {
 // The bitmaps of a Macintosh picture, as views
 // into the file. For the layout see pict_file.cpp.
 
-// Pixels that an operation draws.
+// A bitmap drawn by an opcode.
 struct PictPixels {
   size_t rowBytes = 0;   // unpacked
   Rectangle bounds;      // of the stored rows
@@ -31,10 +31,10 @@ struct PictPixels {
   // `data` is a JPEG file; of the fields above only `target` is used
   bool jpeg = false;
 
-  bool Indexed() const { return !jpeg && bits <= 8; }  // pixels are numbers of colors
+  bool Indexed() const { return !jpeg && bits <= 8; }  // pixels are palette indices
 };
 
-// What is read of a file: its frame, and what is drawn into it in that order.
+// The parsed file: its frame, and the bitmaps in drawing order.
 struct PictFile {
   int32_t version = 1;
   Rectangle frame;

@@ -12,7 +12,7 @@ namespace fotomill {
 // Decodes the rows of a bitmap, top first. Not for JPEG.
 class PictRowDecoder {
  public:
-  explicit PictRowDecoder(const PictPixels& pixels);  // must outlive it
+  explicit PictRowDecoder(const PictPixels& pixels);  // `pixels` must outlive it
 
   // Unpacks the next row. FileReadError if the packed row is incomplete.
   Status Next();
@@ -20,7 +20,7 @@ class PictRowDecoder {
   std::span<const uint8_t> Indices() const { return raw_; }
   std::span<const uint8_t> Colors();
 
-  const Palette& Colormap() const { return palette_; }  // of Indices
+  const Palette& Colormap() const { return palette_; }  // for Indices
 
  private:
   Status NextPacked();

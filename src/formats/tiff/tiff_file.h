@@ -67,7 +67,7 @@ class TiffOutput {
   TIFF* Handle() const { return tiff_; }
   // The current size; and appends bytes that are not written by the library.
   uint64_t End() const { return out_.Position(); }
-  // Outside what the library writes.
+  // Bypasses the library.
   void Append(std::span<const uint8_t> bytes) { out_.Bytes(bytes); }
   // Offset of the last directory, and the position of the next one's offset in it.
   uint32_t Directory() const { return directory_; }

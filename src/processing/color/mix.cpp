@@ -101,13 +101,13 @@ constexpr Sector kSectors[6] = {{2, 1, 0, true}, {1, 2, 0, false}, {1, 0, 2, tru
                                 {0, 1, 2, false}, {0, 2, 1, true}, {2, 0, 1, false}};
 
 uint32_t SectorOf(const uint8_t* bgr) {
-  // by whether red >= green, green >= blue, blue > red; the first and the last cannot be
+  // indexed by the bits red >= green, green >= blue, blue > red; 0 and 7 are impossible
   constexpr uint8_t kSectorOf[] = {0, 3, 1, 2, 5, 4, 0, 0};
   const uint8_t b = bgr[0], g = bgr[1], r = bgr[2];
   return kSectorOf[(r >= g) << 2 | (g >= b) << 1 | static_cast<int>(b > r)];
 }
 
-// What a turn of all hues by 0 to 6 sectors makes of a position within a sector. Positions are in
+// The effect of rotating all hues by 0 to 6 sectors on a position within a sector. Positions are in
 // units of the pixel's own chroma, which avoids division.
 class HueTurn {
  public:
@@ -135,8 +135,8 @@ class HueTurn {
 
  private:
   struct NewPlace {
-    uint8_t level;    // of the channel between, above the least
-    uint8_t further;  // 1: in the sector after that of the turn
+    uint8_t level;    // of the middle channel, above the minimum
+    uint8_t further;  // 1: one sector beyond the rotation's
   };
 
   NewPlace& At(bool rising, int32_t chroma, int32_t place) {

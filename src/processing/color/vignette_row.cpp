@@ -23,7 +23,7 @@ void Shade(const VignetteRow& row, uint8_t* bgr, size_t pixels) {
 
 #if VECTOR_HAS_AVX2
 VECTOR_AVX2_BEGIN
-// Four levels with their shares of the color.
+// Blends four levels with the color.
 __m128i Blended(uint32_t levels, __m256d color, __m256d shares) {
   const __m256d old =
       _mm256_cvtepi32_pd(_mm_cvtepu8_epi32(_mm_cvtsi32_si128(static_cast<int>(levels))));
@@ -32,7 +32,7 @@ __m128i Blended(uint32_t levels, __m256d color, __m256d shares) {
   return _mm256_cvttpd_epi32(_mm256_add_pd(blended, _mm256_set1_pd(0.5)));
 }
 
-// Four pixels at once: the same operations in the same order.
+// Four pixels at a time, with the same operations in the same order.
 void ShadeAvx2(const VignetteRow& row, uint8_t* bgr, size_t pixels) {
   const __m256d down = _mm256_set1_pd(row.down), size = _mm256_set1_pd(row.size),
                 room = _mm256_set1_pd(1 - row.size), amount = _mm256_set1_pd(row.amount),

@@ -10,7 +10,7 @@ namespace fotomill {
 // with zero weights to a multiple of kTapGroup.
 inline constexpr int32_t kTapGroup = 4;
 inline constexpr int32_t kFraction = 6;        // fractional bits of a sample
-// fractional bits of the factor of `sharpen`, which is at most 2^14
+// fractional bits of `factor` in `sharpen`, which is at most 2^14
 inline constexpr int32_t kSharpenBits = 10;
 // samples; every source row has at least this many
 inline constexpr int32_t kWeighedAtOnce = 64;
@@ -42,8 +42,8 @@ struct ResampleKernels {
   void (*multiply)(const uint8_t* bgr, const uint8_t* alpha, size_t pixels, int16_t* samples);
   // Samples to levels, rounded.
   void (*narrow)(const int16_t* samples, size_t count, uint8_t* levels);
-  // Sharpens levels by their blurred samples, which it replaces: the difference times
-  // `factor` / 2^kSharpenBits is added unless it is below `least`, and the sum clamped to levels.
+  // Sharpens levels with their blurred samples, which it replaces: adds the difference times
+  // `factor` / 2^kSharpenBits unless it is below `least`, and clamps the sum.
   void (*sharpen)(const uint8_t* levels, size_t count, int32_t factor, int32_t least,
                   int16_t* samples);
   // Adds samples to sums.
