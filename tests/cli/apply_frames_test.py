@@ -1,5 +1,6 @@
 #!/usr/bin/python3
-"""apply on animations: every frame goes through the operations, as Pillow computes them; delays and rounds stay."""
+"""apply on animations: every frame goes through the operations, as Pillow computes them; delays
+and rounds stay."""
 import os
 import subprocess
 import sys
@@ -41,7 +42,8 @@ def padded(picture):
 
 def inverted(picture):
     red, green, blue, alpha = picture.split()
-    return Image.merge("RGBA", (*(ImageOps.invert(channel) for channel in (red, green, blue)), alpha))
+    colors = (ImageOps.invert(channel) for channel in (red, green, blue))
+    return Image.merge("RGBA", (*colors, alpha))
 
 
 def grayed(picture):
@@ -49,9 +51,10 @@ def grayed(picture):
     return Image.merge("RGBA", (gray, gray, gray, picture.getchannel("A")))
 
 
-# The operations, what Pillow makes of a frame, and how far a level may be off. None: see `kept`.
+# The operations, what Pillow makes of a frame, and how far a level may be off.
 ROWS = (
-    ("resize 200% filter=nearest", lambda picture: picture.resize((120, 80), Image.Resampling.NEAREST), 0),
+    ("resize 200% filter=nearest",
+     lambda picture: picture.resize((120, 80), Image.Resampling.NEAREST), 0),
     ("resize 30x30 pad filter=nearest background=white", padded, 0),
     ("crop 20x10+5+15", lambda picture: picture.crop((5, 15, 25, 25)), 0),
     ("canvas 80x50 background=#00ff00", canvas, 0),
@@ -60,9 +63,11 @@ ROWS = (
     ("offset 7 9", lambda picture: ImageChops.offset(picture, 7, 9), 0),
     ("invert", inverted, 0),
     ("gray", grayed, 1),
-    ("flip; invert; crop 30x30+0+0", lambda picture: inverted(ImageOps.mirror(picture)).crop((0, 0, 30, 30)), 0),
+    ("flip; invert; crop 30x30+0+0",
+     lambda picture: inverted(ImageOps.mirror(picture)).crop((0, 0, 30, 30)), 0),
 )
-# Operations that leave the picture as it is within a larger one, and where its corner is then: (left, top) of the room.
+# Operations that leave the picture as it is within a larger one, and where its corner is then:
+# (left, top) as shares of the room.
 AROUND = (
     ("caption 'x %W' size=10px", (0, 0)),
     ("caption 'x %W' size=10px background=#00ff00 position=above", (0, 1)),
@@ -78,7 +83,8 @@ WITHIN = (
 def apply(source, steps, folder):
     target = folder / "out" / source.name
     target.unlink(missing_ok=True)
-    run = subprocess.run([FOTOMILL, "--set", "WebPLossless=1", "apply", source, "--do", steps, "--dest", folder / "out", "--prefix", ""],
+    run = subprocess.run([FOTOMILL, "--set", "WebPLossless=1", "apply", source, "--do", steps,
+                          "--dest", folder / "out", "--prefix", ""],
                          capture_output=True, text=True, check=False)
     if run.returncode != 0:
         faults.append(f"{source.name}: {steps}: {run.stderr}")
@@ -97,7 +103,8 @@ def frames_of(picture):
 def apart(one, other):
     """The largest difference of a level where it can be seen."""
     black = Image.new("RGBA", one.size, (0, 0, 0, 255))
-    difference = ImageChops.difference(*(Image.alpha_composite(black, picture).convert("RGB") for picture in (one, other)))
+    seen = (Image.alpha_composite(black, picture).convert("RGB") for picture in (one, other))
+    difference = ImageChops.difference(*seen)
     return max(high for _, high in difference.getextrema())
 
 
@@ -107,7 +114,8 @@ def check_frames(source, steps, folder, frame_check):
         return
     frames = frames_of(made)
     if [delay for delay, _ in frames] != DELAYS or made.info.get("loop") != ROUNDS:
-        faults.append(f"{source.name}: {steps}: {[delay for delay, _ in frames]}, {made.info.get('loop')} rounds")
+        delays = [delay for delay, _ in frames]
+        faults.append(f"{source.name}: {steps}: {delays}, {made.info.get('loop')} rounds")
         return
     for number, (_, frame) in enumerate(frames):
         wrong = frame_check(frame, number)
@@ -121,7 +129,8 @@ def check_source(source, originals, folder):
             expected = judge(originals[number])
             if frame.size != expected.size:
                 return f"{frame.size}, not {expected.size}"
-            return f"{apart(frame, expected)} levels apart" if apart(frame, expected) > most else ""
+            levels = apart(frame, expected)
+            return f"{levels} levels apart" if levels > most else ""
         check_frames(source, steps, folder, compared)
     for steps, share in AROUND:
         def unchanged(frame, number, share=share):
@@ -154,7 +163,8 @@ with tempfile.TemporaryDirectory() as name:
     work = Path(name)
     for clear in (False, True):
         pictures = [drawn(i, clear) for i in range(4)]
-        options = {"save_all": True, "append_images": pictures[1:], "duration": DELAYS, "loop": ROUNDS}
+        options = {"save_all": True, "append_images": pictures[1:], "duration": DELAYS,
+                   "loop": ROUNDS}
         pictures[0].save(work / "a.gif", disposal=2, **options)
         pictures[0].save(work / "a.webp", lossless=True, **options)
         pictures[0].save(work / "a.png", **options)

@@ -1,6 +1,7 @@
 #!/usr/bin/env python3
 """Batches of the real program: converting, collisions, errors that keep the box open, abort."""
 import os
+import struct
 
 from driven_desktop import Desktop, Failure, make_pictures, run
 
@@ -141,4 +142,25 @@ def errors_stay_and_abort_stops(folder):
         assert len(desktop.xdotool("search", "--onlyvisible", "--name", "^Progress$")) == 2
 
 
-run(convert_and_collide, destination_step, errors_stay_and_abort_stops)
+def resize_to_a_named_size(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["one.bmp", "two.bmp"])
+    with Desktop(folder, pictures, settings=["DefaultFileExtension=bmp", "DestForceSourceDir=1",
+                                             "WarnDestinationWrite=0", "Transform640=16,16",
+                                             "PrefixTransform=Small_"]) as desktop:
+        desktop.wait(r"lines=2 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "ctrl+shift+e")
+        desktop.wait(r"destination First: .*/pictures/Small_one.bmp ")
+        desktop.focus("^Resize$")
+        desktop.screenshot("resize")
+        desktop.key("alt+s", "Down", "alt+2")
+        desktop.wait(r"batch-line .*one.bmp -> .*/Small_one.bmp")
+        desktop.wait(r"batch-line .*two.bmp -> .*/Small_two.bmp")
+        desktop.wait(r"batch ended status=0")
+        for name in ("Small_one.bmp", "Small_two.bmp"):
+            sizes = struct.unpack_from("<ii", (pictures / name).read_bytes(), 18)
+            assert max(sizes) == 16, sizes
+
+
+run(convert_and_collide, destination_step, resize_to_a_named_size, errors_stay_and_abort_stops)

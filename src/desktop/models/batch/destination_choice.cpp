@@ -1,9 +1,11 @@
 #include "desktop/models/batch/destination_choice.h"
 
 #include <algorithm>
+#include <memory>
 
 #include "batch/destination_name.h"
 #include "batch/new_job.h"
+#include "batch/recipe_function.h"
 #include "core/text.h"
 #include "platform/existence.h"
 #include "platform/files.h"
@@ -12,6 +14,8 @@
 #include "platform/volumes.h"
 #include "registry/registry.h"
 #include "settings/history_list.h"
+#include "settings/key_texts.h"
+#include "settings/settings.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -80,9 +84,10 @@ std::string WholeFolder(const std::string& typed, const std::string& shown) {
 DestinationOutlook OutlookOf(const DestinationChoice& choice,
                              const std::vector<std::string>& files) {
   const BatchJob job = JobFor(choice);
+  const std::string_view prefix = job.naming.PrefixOf(FunctionFor(choice, job).history);
   DestinationOutlook outlook;
   for (size_t i = 0; i < std::min(files.size(), kMostLookedUp); ++i) {
-    const std::string path = PlannedDestination(files[i], {}, {}, job);
+    const std::string path = PlannedDestination(files[i], {}, prefix, job);
     if (i == 0) outlook.first = path;
     outlook.existing += platform::ExistenceOf(path) == platform::Existence::Yes;
   }
@@ -97,6 +102,22 @@ BatchJob JobFor(const DestinationChoice& choice) {
   job.destinationFolder = choice.folder;
   job.naming.beside = choice.folder.empty();
   return job;
+}
+
+BatchFunction FunctionFor(const DestinationChoice& choice, const BatchJob& job) {
+  BatchFunction function;
+  function.reduce = choice.reduce;
+  function.autoOrient = choice.autoOrient;
+  function.keepMetadata = choice.keepMetadata;
+  auto recipe = std::make_shared<Recipe>();
+  if (choice.step.empty() || !ReadRecipe(choice.step, KeyTextInForce, *recipe).empty())
+    return function;
+  function.history = FunctionOfFamily(recipe->First()->family);
+  const FormatLookup none = [](const std::string&, int32_t&, std::string&) {
+    return std::string();  // the step names no format
+  };
+  (void)SetRecipe(recipe, std::string(settings.ExifCopyrightHolder.view()), job, none, function);
+  return function;
 }
 
 }  // namespace fotomill::desktop

@@ -5,6 +5,7 @@
 #include <vector>
 
 #include "batch/job.h"
+#include "batch/run.h"
 
 namespace fotomill::desktop {
 
@@ -24,6 +25,7 @@ struct DestinationChoice {
   bool reduce = true;  // colors of pictures that are too deep for the format
   bool autoOrient = true;
   bool keepMetadata = true;
+  std::string step = {};  // of a recipe: applied to every picture; empty: none
 };
 
 // The folders to offer, the last used first; empty texts for "beside the source" are left out.
@@ -49,5 +51,8 @@ DestinationOutlook OutlookOf(const DestinationChoice& choice,
 
 // A job that writes to the choice, whatever DestForceSourceDir says. The choice has no problem.
 BatchJob JobFor(const DestinationChoice& choice);
+
+// What that job does to every picture of the choice.
+BatchFunction FunctionFor(const DestinationChoice& choice, const BatchJob& job);
 
 }  // namespace fotomill::desktop

@@ -205,20 +205,35 @@ void TurnSelection(Shell& shell, Orientation turn) {
       previous);
 }
 
-void ConvertSelection(Shell& shell) {
+namespace {
+
+// Asks for the destination and runs the batch over the frame's selection.
+void RunWithDestination(Shell& shell, const wxString& verb, const std::vector<NamedSize>& sizes) {
   const std::vector<std::string> files = shell.Tabs().SelectedFiles();
   if (files.empty()) return;
-  DestinationDialog dialog(&shell.Window(), Label("Convert"), files);
+  DestinationDialog dialog(&shell.Window(), verb, files, sizes);
   LogEvent("prompt", "destination");
   if (dialog.ShowModal() != wxID_OK) return;
   const DestinationChoice choice = dialog.Choice();
   std::vector<BatchFile> batch;
   for (const std::string& file : files) batch.push_back({.name = file, .below = {}, .hint = {}});
-  BatchFunction function;
-  function.reduce = choice.reduce;
-  function.autoOrient = choice.autoOrient;
-  function.keepMetadata = choice.keepMetadata;
-  shell.Batches().Run(std::move(batch), std::move(function), JobFor(choice));
+  BatchJob job = JobFor(choice);
+  BatchFunction function = FunctionFor(choice, job);
+  shell.Batches().Run(std::move(batch), std::move(function), std::move(job));
+}
+
+}  // namespace
+
+void ConvertSelection(Shell& shell) { RunWithDestination(shell, Label("Convert"), {}); }
+
+void ResizeSelection(Shell& shell) {
+  const std::vector<NamedSize> sizes = NamedSizes();
+  if (sizes.empty()) {
+    wxMessageBox(Label("Setup has no size as WIDTH,HEIGHT."), Label("Resize"),
+                 wxOK | wxICON_INFORMATION, &shell.Window());
+    return;
+  }
+  RunWithDestination(shell, Label("Resize"), sizes);
 }
 
 }  // namespace fotomill::desktop

@@ -74,5 +74,7 @@ void TurnSelection(Shell& shell, Orientation turn);
 
 // The function Convert: asks for the destination and runs the batch over the frame's selection.
 void ConvertSelection(Shell& shell);
+// The function Resize: the same, to one of the sizes of the settings.
+void ResizeSelection(Shell& shell);
 
 }  // namespace fotomill::desktop

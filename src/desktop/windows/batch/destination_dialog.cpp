@@ -27,15 +27,18 @@
 namespace fotomill::desktop {
 
 DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
-                                     const std::vector<std::string>& files)
+                                     const std::vector<std::string>& files,
+                                     std::vector<NamedSize> sizes)
     : wxDialog(parent, wxID_ANY, verb, wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "DestinationBox"),
       files_(files),
-      shownFolder_(platform::FolderOf(files_.front())) {
+      shownFolder_(platform::FolderOf(files_.front())),
+      sizes_(std::move(sizes)) {
   const int gap = FromDIP(8);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   const auto below = wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap * 3 / 2);
 
+  if (!sizes_.empty()) sizer->Add(NewSizeRow(), below);
   auto* formatRow = new wxBoxSizer(wxHORIZONTAL);
   formatRow->Add(new wxStaticText(this, wxID_ANY, Label("&Format:")),
                  wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
@@ -107,6 +110,19 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
   ok_->SetFocus();
 }
 
+wxSizer* DestinationDialog::NewSizeRow() {
+  auto* row = new wxBoxSizer(wxHORIZONTAL);
+  row->Add(new wxStaticText(this, wxID_ANY, Label("&Size:")),
+           wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(8)));
+  size_ = new wxChoice(this, wxID_ANY);
+  size_->SetName(Label("Size"));
+  for (const NamedSize& size : sizes_) size_->Append(Shown(size.text));
+  size_->SetSelection(0);
+  size_->Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { UpdateControls(); });
+  row->Add(size_, wxSizerFlags(1));
+  return row;
+}
+
 DestinationChoice DestinationDialog::Choice() const {
   DestinationChoice choice;
   choice.extension = formats_[static_cast<size_t>(format_->GetSelection())].extension;
@@ -114,6 +130,7 @@ DestinationChoice DestinationDialog::Choice() const {
   choice.reduce = reduce_->GetValue();
   choice.autoOrient = orient_->GetValue();
   choice.keepMetadata = metadata_->GetValue();
+  if (size_ != nullptr) choice.step = sizes_[static_cast<size_t>(size_->GetSelection())].step;
   return choice;
 }
 

@@ -189,6 +189,7 @@ constexpr Command kCommands[] = {
     {kFunctions, TrLater("&View"),          "Ctrl+Return",  TrLater("Shows the focused picture in a view window."), Needs::Files, View, "view", true},
     {kFunctions, TrLater("Com&pare"),       "Ctrl+Shift+Return", TrLater("Shows two to four selected pictures side by side."), Needs::Few, CompareSelection, nullptr, true},
     {kFunctions, TrLater("&Convert..."),    "Ctrl+E",       TrLater("Converts the selected pictures to another format."), Needs::Files, ConvertSelection, "convert", true},
+    {kFunctions, TrLater("Re&size..."),     "Ctrl+Shift+E", TrLater("Resizes the selected pictures to one of the sizes in Setup."), Needs::Files, ResizeSelection, nullptr, true},
     {kFunctions, TrLater("Rotate &left"),   "Ctrl+Alt+L",   TrLater("Rotates the selected files; JPEG losslessly."), Needs::Files, Turn<Orientation::QuarterLeft>, nullptr, true},
     {kFunctions, TrLater("Rotate r&ight"),  "Ctrl+Alt+R",   TrLater("Rotates the selected files; JPEG losslessly."), Needs::Files, Turn<Orientation::QuarterRight>, nullptr, true},
     {kFunctions, TrLater("&Get info..."),   "Alt+Return",   TrLater("Shows information about the selected files."), Needs::Files, ShowInfo, "info", true},
