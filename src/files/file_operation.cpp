@@ -21,9 +21,9 @@ constexpr const char* kTaken = TrLater("A file of that name already exists.");
 constexpr const char* kGone = TrLater("It no longer exists.");
 constexpr const char* kNotWritten = TrLater("The copy could not be written; the disk may be full.");
 constexpr const char* kTooDeep = TrLater("The folders are nested too deeply.");
-constexpr int kDeepest = 64;  // levels of folders
+constexpr int kDeepest = 64;  // of nested folders
 
-// The reason of a failure, empty for success.
+// The reason for a failure; empty on success.
 using Outcome = std::string;
 
 Outcome CopyFile(const std::string& from, const std::string& to, platform::Existing existing) {
@@ -87,7 +87,7 @@ Outcome MoveOne(const std::string& from, const std::string& to) {
   if (existence == platform::Existence::Unknown) return WithReason(Tr("It could not be renamed."));
   if (existence == platform::Existence::Yes && from != to) {
     const platform::FileFacts a = platform::FactsOf(from), b = platform::FactsOf(to);
-    // a name that differs in case only
+    // a name that differs only in case
     const bool same = a.identity == b.identity && a.device == b.device;
     if (!same) return kTaken;
   }
@@ -97,8 +97,7 @@ Outcome MoveOne(const std::string& from, const std::string& to) {
   if (result == platform::CommitResult::Done) return {};
   if (result == platform::CommitResult::Taken) return kTaken;
   if (SameVolume(from, to)) return WithReason(Tr("It could not be renamed."));
-  // On another volume a move is a copy and a deletion; what was copied goes again if the rest of it
-  // fails.
+  // Across volumes a move is copy and delete; a partial copy is deleted if copying fails.
   Outcome outcome = CopyTree(from, to, 0);
   if (!outcome.empty()) {
     if (outcome != kTaken) (void)DeleteTree(to, 0);
@@ -120,7 +119,7 @@ Outcome Restore(const std::string& path) {
                                           : Outcome(Tr("It is no longer in the trash."));
 }
 
-// The file becomes what it was before, and what it was until now is kept in its place.
+// Restores the previous contents and keeps the current ones in their place.
 Outcome Exchange(const FileStep& step, const FileOperationOptions& options) {
   if (!platform::FileExists(step.from)) return kGone;
   if (step.previous->HasChanged(step.from))
@@ -147,7 +146,7 @@ Outcome DoStep(FileOperationKind kind, const FileStep& step, const FileOperation
   return TrashOne(step.from);
 }
 
-// A copy that was edited since is kept.
+// Trashes a copy, unless it was edited since.
 Outcome RemoveCopy(const FileStep& step) {
   const platform::FileFacts copy = platform::FactsOf(step.to),
                             original = platform::FactsOf(step.from);

@@ -9,7 +9,7 @@
 
 namespace fotomill {
 
-// Things done to files that can be undone.
+// File operations that can be undone.
 enum class FileOperationKind {
   Rename,
   Move,
@@ -21,91 +21,91 @@ enum class FileOperationKind {
 
 class PreviousFile;
 
-// One file of an operation, by absolute paths.
+// One file of an operation; absolute paths.
 struct FileStep {
   std::string from;
   std::string to;                               // empty for Trash and Turn
-  // Turn: what the file was before; after Revert, what it was before that
+  // Turn: the previous contents; after Revert, those before the undo
   std::shared_ptr<PreviousFile> previous = {};
 };
 
-// What was done in one go, in order.
+// The steps of one operation, in order.
 struct FileOperation {
   FileOperationKind kind = FileOperationKind::Rename;
   std::vector<FileStep> steps;
 };
 
-// Why a step was not done.
+// Why a step failed.
 struct FileOperationFailure {
   std::string path;
-  std::string reason;  // a whole sentence
+  std::string reason;  // a complete sentence
 };
 
-// What came of an operation: the steps that were done, and why others were not.
+// The result of an operation: the completed steps, and why others failed.
 struct FileOperationResult {
   FileOperation done;
   std::vector<FileOperationFailure> failures;
-  std::string note = {};  // a remark on what was done, as a sentence
+  std::string note = {};  // a remark about the completed steps, a sentence
 };
 
-// What an operation needs to know of the program's settings and of what else keeps records of
+// Settings for an operation, and a hook for other code that tracks
 // files.
 struct FileOperationOptions {
-  // numbers of copies whose name is taken
+  // range for numbered names of copies
   int64_t firstVariant = 1, lastVariant = INT32_MAX;
-  // before a file gets other contents: thumbnails of it go
+  // called before a file's contents are replaced, to discard its thumbnails
   std::function<void(const std::string& path)> replacing = {};
 };
 
-// Told before each step; false ends the operation there.
+// Called before each step; return false to stop.
 using FileOperationProgress = std::function<bool(size_t index, size_t count)>;
 
-// The steps of an operation on files and folders: into `folder` under their own names, or into the
-// trash. Files that are there already are left out of a move, and a copy gets a number, as it does
-// where the name is taken.
+// The steps of an operation on files and folders: into `folder` under the same names, or into the
+// trash. A move skips files already in `folder`; a copy gets a number if its name is taken, or if
+// it is made in the same folder.
 FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::string>& paths,
                                 const std::string& folder,
                                 const FileOperationOptions& options = {});
 
-// Does the steps of an operation. Nothing is ever replaced: where a name is taken meanwhile the
-// step fails. Files keep their times. May take long; any thread.
+// Performs the steps of an operation. Never replaces a file: a step fails if its destination exists
+// by then. Keeps file times. May take long; any thread.
 FileOperationResult CarryOut(const FileOperation& operation,
                              const FileOperationOptions& options = {},
                              const FileOperationProgress& progress = {});
-// Undoes an operation, last step first: files go back to where they were, copies that no one has
-// changed and outputs go to the trash.
+// Undoes an operation, last step first: files are moved back, outputs and unmodified copies go to
+// the trash.
 FileOperationResult Revert(const FileOperation& operation, const FileOperationOptions& options = {},
                            const FileOperationProgress& progress = {});
 
-// Deletes files permanently, and folders with what is in them.
+// Permanently deletes files, and folders with their contents.
 FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
                                   const FileOperationProgress& progress = {});
 
 // "rename of 12 files", "move of beach.jpg"
 std::string FileOperationName(const FileOperation& operation);
 
-// What can be undone and redone, up to a number of operations.
+// Undo and redo history, limited in length.
 class UndoList {
  public:
-  explicit UndoList(size_t most) : most_(most) {}  // keeps that many
-  // A new operation; what had been undone can no longer be redone. Operations without steps are not
-  // kept.
+  explicit UndoList(size_t most) : most_(most) {}  // keeps at most that many operations
+  // Adds an operation and clears the redo list. Operations without steps are
+  // ignored.
   void Add(FileOperation operation);
-  bool CanUndo() const { return !done_.empty(); }    // there is something to take back
-  bool CanRedo() const { return !undone_.empty(); }  // something taken back can be done again
-  // What Undo would take back, as FileOperationName says it; empty for nothing.
+  bool CanUndo() const { return !done_.empty(); }    // there is an operation to undo
+  bool CanRedo() const { return !undone_.empty(); }  // there is an operation to redo
+  // The next operation to undo, as FileOperationName; empty if none.
   std::string UndoName() const {
     return CanUndo() ? FileOperationName(done_.back()) : std::string();
   }
-  // What Redo would do again; empty for nothing.
+  // The next operation to redo; empty if none.
   std::string RedoName() const {
     return CanRedo() ? FileOperationName(undone_.back()) : std::string();
   }
-  // Hands out the step to undo or redo; the result comes back by Undone or Redone.
+  // Takes the next operation to undo or redo; return its result with Undone or Redone.
   FileOperation PopUndo();
   FileOperation PopRedo();               // as PopUndo; the list must not be empty
-  void Undone(FileOperation operation);  // the steps that were taken back; they can be redone
-  void Redone(FileOperation operation);  // the steps that were done again
+  void Undone(FileOperation operation);  // the steps that were undone; they can be redone
+  void Redone(FileOperation operation);  // the steps that were redone
 
  private:
   void Keep(std::vector<FileOperation>& list, FileOperation operation);

@@ -10,31 +10,31 @@
 
 namespace fotomill {
 
-// Whether a path is taken, so that a new file cannot have it.
+// Whether a path exists, so that a new file cannot use it.
 using TakenTest = std::function<platform::Existence(const std::string& path)>;
 
 // The result of the search for a numbered variant.
 enum class VariantSearch {
   Found,
-  AllTaken,  // every number of the range, or the range is empty
-  GivenUp,   // kMostVariants are taken
-  Unknown,   // the system cannot tell; it keeps the reason
+  AllTaken,  // all numbers of the range, or the range is empty
+  GivenUp,   // after kMostVariants attempts
+  Unknown,   // existence cannot be determined; the system error is kept
   Stopped,
 };
-// So many numbers are tried.
+// Most numbers tried.
 inline constexpr int64_t kMostVariants = 100'000;
 
-// Replaces `path` by the first of "NAME [first].EXT" to "NAME [last].EXT" that is not taken. `path`
-// is unchanged unless Found. `stop` is checked before each try.
+// Replaces `path` with the first free one of "NAME [first].EXT" to "NAME [last].EXT". `path` is
+// unchanged unless Found. `stop` is polled before each attempt.
 VariantSearch MakeNumberedVariant(std::string& path, int64_t first, int64_t last,
                                   const TakenTest& taken, const StopToken& stop = {});
 
-// Whether a new file could not be written because another program took its name after it was found
-// free. `status` is the writer's.
+// Whether a new file could not be written because another program created it after the name was
+// found free. `status` is the writer's.
 bool LostRace(Status status, const std::string& path);
 
-// Calls `attempt`, which chooses a free name and writes a new file, again as long as it returns
-// false: it lost the race for the name. False when it has lost a hundred times.
+// Calls `attempt`, which chooses a free name and writes a new file, until it returns true; false
+// means it lost the race for the name. Gives up after a hundred times with false.
 bool RetryLostRaces(const std::function<bool()>& attempt);
 
 }  // namespace fotomill

@@ -13,8 +13,8 @@ namespace fotomill {
 
 namespace {
 
-// A folder a day, by its number, so that what a killed program left there can be told from what one
-// that runs needs.
+// One folder per day, named by its number, to tell leftovers of killed programs from files still in
+// use.
 constexpr int64_t kSecondsOfDay = 86400, kDaysKept = 30;
 int64_t Today() { return platform::Now() / kSecondsOfDay; }
 std::string UndoFolder() { return platform::JoinFolder(DataFolder(), "undo"); }
@@ -67,7 +67,7 @@ void DeleteOldPreviousFiles() {
       if (*number + kDaysKept < Today())
         (void)platform::DeleteFile(platform::JoinFolder(folder, file.name));
     }
-    (void)platform::DeleteFolder(folder);  // unless there is still something in it
+    (void)platform::DeleteFolder(folder);  // not deleted if it still has files
   }
 }
 

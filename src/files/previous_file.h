@@ -13,15 +13,15 @@
 
 namespace fotomill {
 
-// What a file was before a function replaced it, kept in the data folder until no one can undo that
-// any more.
+// The contents of a file before a function replaced it, kept in the data folder as long as that can
+// be undone.
 class PreviousFile {
  public:
-  // Keeps the file as it is now. False if there is no room for it.
+  // Saves the current contents. False if there is not enough disk space.
   [[nodiscard]] bool Keep(const std::string& path);
-  // The file was replaced; what it is now is remembered.
+  // To be called after replacing the file; remembers its new state.
   void Replaced(const std::string& path) { replaced_ = platform::StampOf(path); }
-  // Whether another program has changed the file since it was replaced.
+  // Whether the file was modified since it was replaced.
   bool HasChanged(const std::string& path) const;
   void Swap(PreviousFile& other) { kept_.Swap(other.kept_); }
   const std::string& Path() const { return kept_.Path(); }
@@ -31,18 +31,18 @@ class PreviousFile {
   platform::FileStamp replaced_;
 };
 
-// The previous files of one batch; from any thread.
+// The previous files of one batch. Thread-safe.
 class PreviousFiles {
  public:
-  // `replacing` is told of each file before it is replaced, on the thread that replaces it.
+  // `replacing` is called with each file before it is replaced, on the replacing thread.
   explicit PreviousFiles(std::function<void(const std::string& path)> replacing = {})
       : replacing_(std::move(replacing)) {}
-  // To be called before a file is replaced. False: it should not be.
+  // Call before replacing a file. If false, do not replace it.
   [[nodiscard]] bool Keep(const std::string& path);
-  // To be called at once when a file that was kept has been replaced; what it becomes later is
-  // another program's work.
+  // Call right after replacing a file passed to Keep; later changes are attributed to other
+  // programs.
   void Replaced(const std::string& path);
-  // The operation of those that were replaced, in the order of their paths; they are handed over.
+  // An operation with all replaced files, ordered by path; ownership moves to the caller.
   FileOperation Operation();
 
  private:
@@ -51,7 +51,7 @@ class PreviousFiles {
   std::map<std::string, std::shared_ptr<PreviousFile>> kept_, replaced_;
 };
 
-// Deletes what a program that was killed a month ago or longer left in the data folder.
+// Deletes what killed programs left in the data folder more than a month ago.
 void DeleteOldPreviousFiles();
 
 }  // namespace fotomill

@@ -14,7 +14,7 @@ namespace {
 
 constexpr const char* kLogName = "FMWRenameUndo.dat";
 constexpr uint64_t kLongestLog = uint64_t{256} << 20;
-constexpr int kMostTries = 1000;  // for a log that others replace
+constexpr int kMostTries = 1000;  // to open a log that others keep replacing
 
 std::string RecordOf(const RenamedFile& file) {
   std::string record = file.from;
@@ -22,7 +22,7 @@ std::string RecordOf(const RenamedFile& file) {
   return record;
 }
 
-// Splits off the text up to the next zero byte; false if there is no zero byte.
+// Splits off the text before the next NUL; false if there is none.
 bool TakeText(std::string_view& contents, std::string& text) {
   const size_t end = contents.find('\0');
   if (end == std::string_view::npos) return false;
@@ -52,7 +52,7 @@ std::string ContentsOf(const RenameHistory& history) {
 
 }  // namespace
 
-// Who waited may find that the log was replaced meanwhile.
+// While waiting for the lock, the log may be replaced; then retry.
 bool RenameLog::LockFile(bool create) {
   using platform::StoreFile;
   const std::string path = DataFile(kLogName);
@@ -71,13 +71,13 @@ bool RenameLog::LockFile(bool create) {
 
 bool RenameLog::LockForUndo() { return DataFile(kLogName).empty() || LockFile(false); }
 
-// A log that takes the place of one that was shortened meanwhile goes on with what is left of that.
+// If the log was replaced by a shortened one meanwhile (`fresh` is false), appends to that.
 bool RenameLog::Begin(bool fresh) {
   const std::string path = DataFile(kLogName);
   if (path.empty() || !platform::MakeFolders(platform::FolderOf(path)) || !LockFile(true))
     return false;
   if (fresh && !file_.InUseByOthers() && !file_.Resize(0)) return false;
-  (void)file_.MarkInUse();  // without it two runs at once cannot both be taken back
+  (void)file_.MarkInUse();  // if it fails, concurrent runs cannot be undone together
   return !number_ || Append({{}, std::to_string(*number_)});
 }
 
@@ -94,7 +94,7 @@ bool RenameLog::Intend(const RenamedFile& file) {
   } else {
     locked_ = file_.Lock();
     failed_ = !locked_;
-    // what it held was taken back
+    // undone by another process meanwhile
     if (locked_ && !file_.IsStill(DataFile(kLogName))) failed_ = !Begin(false);
   }
   failed_ = failed_ || !Append(file);

@@ -10,35 +10,35 @@
 
 namespace fotomill {
 
-// One file that was renamed; absolute paths.
+// A renamed file; absolute paths.
 struct RenamedFile {
   std::string from, to;
 };
 
-// What the log holds. `number` is the one with which the run began to count, where it is remembered
-// for later runs.
+// The contents of the log. `number` is the first sequence number of the run, if sequence numbers
+// are kept between runs.
 struct RenameHistory {
   std::vector<RenamedFile> files;
   std::optional<uint32_t> number;
 };
 
-// The last run's renames, so that they can be taken back: "FMWRenameUndo.dat" in the data folder,
-// for each file its old path, a zero byte, its new path, a zero byte. A record without an old path
-// holds a number in place of the new one. A tail that is not whole does not count. A rename is
-// noted before it is done, so that none can be lost; who reads the log finds out which files have
-// their new names. Runs that go on at the same time write into one log, each rename under the log's
-// lock.
+// Log of the last run's renames, for undo: "FMWRenameUndo.dat" in the data folder. For
+// each file the old path, a NUL, the new path, a NUL; a record with an empty old path
+// has a number instead of the new path. An incomplete record at the end is ignored.
+// Renames are logged before they are done, so that none is lost; readers check which
+// files really have the new name. Concurrent runs share one log, which is locked during
+// each rename.
 class RenameLog {
  public:
   explicit RenameLog(std::optional<uint32_t> number = {}) : number_(number) {}
 
-  // Notes what is going to be renamed and keeps the log locked until Settle; the first time begins
-  // a new log, unless other runs are writing to it. False when it cannot be kept.
+  // Logs an upcoming rename and keeps the log locked until Settle. The first call starts a new log,
+  // unless other runs are writing to it. False if it cannot be written.
   bool Intend(const RenamedFile& file);
-  // Says whether the file was renamed.
+  // Records whether the file was renamed.
   void Settle(bool renamed);
-  // Locks a log that is there, so that nobody adds to it until this object goes. False when the
-  // lock cannot be had.
+  // Locks the log, if there is one, for the lifetime of this object. False if locking
+  // fails.
   bool LockForUndo();
 
  private:
@@ -48,13 +48,13 @@ class RenameLog {
 
   std::optional<uint32_t> number_;
   platform::StoreFile file_;
-  uint64_t before_ = 0;  // the size without what is intended
+  uint64_t before_ = 0;  // size without the pending record
   bool failed_ = false, locked_ = false;
 };
 
-// nullopt when there is a log that cannot be read.
+// nullopt if the log exists but cannot be read.
 std::optional<RenameHistory> ReadRenameLog();
-// Replaces the log; one without files goes.
+// Replaces the log; deletes it if there are no files.
 [[nodiscard]] bool WriteRenameLog(const RenameHistory& history);
 
 }  // namespace fotomill

@@ -12,7 +12,7 @@ namespace fotomill {
 
 namespace {
 
-// A thumbnail may be encoded anew where its pixels cannot be turned as they are.
+// Re-encodes the thumbnail if its pixels cannot be turned losslessly.
 Status TurnThumbnail(std::span<const uint8_t> bytes, Orientation orientation,
                      const EncodeOptions& encode, std::vector<uint8_t>& made) {
   TurnedJpeg turned;
@@ -24,12 +24,12 @@ Status TurnThumbnail(std::span<const uint8_t> bytes, Orientation orientation,
   }
   PicturePointer picture;
   RETURN_IF_BAD(DecodeExifThumbnail(bytes, picture));
-  picture->metadata = {};  // an orientation of its own would be another one
+  picture->metadata = {};  // its orientation must not apply as well
   RETURN_IF_BAD(OrientPicture(*picture, orientation));
   return EncodeExifThumbnail(*picture, encode, made);
 }
 
-// Makes a block tell of the turned picture.
+// Updates EXIF size, orientation and thumbnail.
 void TurnExif(std::vector<uint8_t>& exif, Orientation orientation, const TurnedJpeg& turned,
               const EncodeOptions& encode) {
   if (exif.empty()) return;
@@ -42,7 +42,7 @@ void TurnExif(std::vector<uint8_t>& exif, Orientation orientation, const TurnedJ
   SetExifPictureFacts(exif, {.width = turned.width, .height = turned.height, .orientation = 1});
 }
 
-// A JPEG file in the making.
+// Builds the turned file.
 class TurnedFile {
  public:
   TurnedFile(std::span<const uint8_t> file, const JpegTurnRequest& request)

@@ -13,35 +13,35 @@
 
 namespace fotomill {
 
-// How to turn the picture.
+// Options for turning a picture.
 struct JpegTurnRequest {
-  Orientation turn = Orientation::Upright;  // of the picture as it is seen
-  // it is seen as its EXIF orientation says; otherwise as its pixels are stored
+  Orientation turn = Orientation::Upright;  // as displayed
+  // the picture is displayed by EXIF orientation; false: as stored
   bool seenByExif = true;
-  bool trim = false;                        // cut off edges that cannot be turned without loss
-  StopToken stop = {};                      // ends the work with FunctionCancelled (4)
-  // of the thumbnail inside, where that cannot be turned without loss
+  bool trim = false;                        // crop edges that cannot be turned losslessly
+  StopToken stop = {};                      // cancels with FunctionCancelled (4)
+  // for the embedded thumbnail, if it cannot be turned losslessly
   EncodeOptions encode = {};
 };
 
 // How a JPEG file was turned.
 enum class JpegTurnMethod {
-  Pixels,   // turned without loss; the orientation became 1
-  Trimmed,  // the same, but for an edge that was cut off
-  Tag,      // the orientation of EXIF and XMP alone; everything else is as it was
-  Nothing,  // the file says already what it should
+  Pixels,   // turned losslessly; orientation is now 1
+  Trimmed,  // as Pixels, but with an edge cropped
+  Tag,      // only the EXIF and XMP orientation was changed
+  Nothing,  // already in this orientation
 };
-// What came of turning a JPEG file.
+// The result of turning a JPEG file.
 struct JpegTurnResult {
   JpegTurnMethod method = JpegTurnMethod::Nothing;
-  RecordedText obstacle;  // why the pixels were not turned, as a sentence
+  RecordedText obstacle;  // why the pixels were not turned, a sentence
 };
 
-// Makes the file of a turned JPEG picture; no pixel gets another value. Where the pixels cannot be
-// turned, the orientation is set instead, so that nothing is lost. EXIF, XMP and all other segments
-// stay, as do bytes behind the picture; sizes and thumbnail in the EXIF block are turned with the
-// pixels. `made` is empty for Nothing. Statuses: those of reading; UnsuitableImage (13) where
-// neither pixels nor orientation can be changed, with the obstacle.
+// Losslessly turns a JPEG picture. If the pixels cannot be turned, the orientation is set
+// instead. EXIF, XMP, all other segments and data after the picture are kept; sizes and
+// thumbnail in EXIF are turned with the pixels. `made` is empty for Nothing. Statuses of
+// reading; UnsuitableImage (13), with the obstacle, if neither pixels nor orientation can be
+// changed.
 Status MakeTurnedJpeg(std::span<const uint8_t> file, const JpegTurnRequest& request,
                       std::vector<uint8_t>& made, JpegTurnResult& result);
 

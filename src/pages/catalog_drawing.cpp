@@ -11,11 +11,11 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kPictureInset = 2;  // from a cell's corner
-// the far lines lie this far behind the room's size
+constexpr int32_t kPictureInset = 2;  // offset from the cell's top left corner
+// offset of the right and bottom frame lines from the picture area
 constexpr int32_t kFrameReach = 3;
-constexpr int32_t kCaptionTop = 3, kCaptionBottom = 18;  // below the room
-// around the grid of a page without a size of its own
+constexpr int32_t kCaptionTop = 3, kCaptionBottom = 18;  // from the bottom of the picture area
+// around the grid, for pages without a fixed size
 constexpr int32_t kPageMargin = 12;
 constexpr Color kWhite = 0xFFFFFF, kBlack = 0, kDarkGray = 0x404040, kGray = 0xA0A0A0;
 
@@ -56,7 +56,7 @@ void PutImage(const PackedImage& image, int32_t left, int32_t top, PackedImage& 
   }
 }
 
-// `edge` scaled by room / other, to the nearest pixel.
+// edge * room / other, rounded to nearest.
 int32_t Scaled(int32_t edge, int32_t room, int32_t other) {
   const int64_t scaled = (2 * int64_t{edge} * room + other) / (2 * int64_t{other});
   return static_cast<int32_t>(std::max<int64_t>(scaled, 1));

@@ -29,12 +29,12 @@ namespace fotomill {
 namespace {
 
 constexpr int32_t kPageDigits = 5;
-// Cells that may wait for those before them: so many, and fewer when they are large.
+// Most cells that may wait for earlier ones, and the most memory for them.
 constexpr size_t kCellsAhead = 64;
 constexpr uint64_t kBytesAhead = uint64_t{64} << 20;
 
-// The path of the next page that no one has. ErrorWritingFile if the numbers are used up,
-// ErrorCreatingFile if the system cannot tell.
+// The path of the next unused page number. ErrorWritingFile if there is no number left,
+// ErrorCreatingFile if existence cannot be determined.
 Status NextPageName(BatchJob& job, std::string& path) {
   platform::Existence existence;
   do {
@@ -90,7 +90,7 @@ class ContactSheet {
   }
 
  private:
-  // A picture on its way to its cell.
+  // A picture scaled for its cell.
   struct Cell {
     FileOutcome outcome;
     PackedImage image;
@@ -162,7 +162,7 @@ class ContactSheet {
     return Status::Ok;
   }
 
-  // Writes the page, if there is one, and reports the files that waited for it.
+  // Writes the current page, if any, and reports the files waiting for it.
   void EndPage() {
     Status status = Status::Ok;
     std::string path;
@@ -191,8 +191,8 @@ class ContactSheet {
     drawn_ = 0;
   }
 
-  // Of the files that waited for a page that is not written, those that failed are reported all the
-  // same.
+  // The current page will not be written: drops the files waiting for it, except failed ones, which
+  // are still reported.
   void GiveUpPage() {
     std::erase_if(waiting_,
                   [](const FileOutcome& outcome) { return outcome.status == Status::Ok; });
@@ -209,16 +209,16 @@ class ContactSheet {
   const ContactSheetOptions& options_;
   BatchJob& job_;
   const StopToken stop_;
-  std::vector<std::unique_ptr<Cell>> cells_;  // done and not yet on a page
+  std::vector<std::unique_ptr<Cell>> cells_;  // finished, not yet on a page
   TextFont font_;
-  PicturePointer page_;               // the one that is being filled
-  int32_t drawn_ = 0;                 // its cells
-  std::vector<FileOutcome> waiting_;  // files whose page is not written yet
+  PicturePointer page_;               // the page being filled
+  int32_t drawn_ = 0;                 // cells on it
+  std::vector<FileOutcome> waiting_;  // files on a page not yet written
   uint32_t reported_ = 0;
   std::atomic<bool> ended_{false};
 };
 
-// Writes the page under the next free number. `lostRace`: another program took that meanwhile.
+// Writes the page under the next free number. `lostRace`: another program took the name meanwhile.
 Status WriteNextPage(PictureRecord& page, const CatalogPageOptions& options, BatchJob& job,
                      std::string& path, bool& lostRace) {
   lostRace = false;
