@@ -12,7 +12,7 @@ namespace fotomill {
 
 namespace {
 
-// Takes a number off the front of `text`, with blanks and a plus sign before it.
+// Parses and removes a number, with leading spaces and a plus sign.
 template <typename Number>
 bool TakeNumber(std::string_view& text, Number& number) {
   text.remove_prefix(std::min(text.find_first_not_of(" \t"), text.size()));
@@ -74,7 +74,7 @@ double GpsDistance(double latitude1, double longitude1, double latitude2, double
   const double a = alongLatitude * alongLatitude + std::cos(latitude1 * kRadians) *
                                                        std::cos(latitude2 * kRadians) *
                                                        alongLongitude * alongLongitude;
-  // rounding may leave the range where the places are opposite
+  // rounding may exceed the range for opposite points
   const double part = std::clamp(a, 0.0, 1.0);
   return radius * 2 * std::atan2(std::sqrt(part), std::sqrt(1 - part));
 }

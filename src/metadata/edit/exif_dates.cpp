@@ -10,7 +10,7 @@ namespace {
 
 bool IsDigit(char c) { return c >= '0' && c <= '9'; }
 
-// `count` digits; false if there is anything else.
+// Parses exactly `count` digits.
 bool TakeDigits(std::string_view& text, size_t count, int& number) {
   number = 0;
   if (text.size() < count) return false;
@@ -58,7 +58,7 @@ std::string ExifTimeText(int64_t seconds) {
 }
 
 std::optional<int64_t> ParseTimeShift(std::string_view text) {
-  constexpr int64_t kMostHours = 9999 * int64_t{8784};  // as many years as a date can have
+  constexpr int64_t kMostHours = 9999 * int64_t{8784};  // the largest difference between two dates
   if (text.empty() || (text[0] != '+' && text[0] != '-')) return {};
   const int64_t sign = text[0] == '-' ? -1 : 1;
   text.remove_prefix(1);

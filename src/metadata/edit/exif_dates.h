@@ -7,16 +7,16 @@
 
 namespace fotomill {
 
-// Dates and times as EXIF has them, without a time zone: seconds since 1970-01-01 on the camera's
+// EXIF dates and times have no time zone: seconds since 1970-01-01 by the camera's
 // clock.
 
-// "2024:05:31 14:03:00", also with hyphens between the numbers of the date and a T in front of the
-// time. None for what is no such text or no day of the calendar.
+// "2024:05:31 14:03:00"; the date may also have hyphens, and a T before the time. None if malformed
+// or not a calendar day.
 std::optional<int64_t> ParseExifTime(std::string_view text);
-// The text with colons; years 0 to 9999.
+// Formats a time with colons; years 0 to 9999.
 std::string ExifTimeText(int64_t seconds);
 
-// A distance of times: "+1:30:00", "-0:05", hours of any number. In seconds; none for other texts.
+// Parses a time difference: "+1:30:00", "-0:05", any number of hours. In seconds; none if invalid.
 std::optional<int64_t> ParseTimeShift(std::string_view text);
 
 }  // namespace fotomill

@@ -19,7 +19,7 @@ namespace fotomill {
 
 namespace {
 
-// Beyond what the type and the rule of a tag say.
+// Tags with special handling.
 constexpr uint16_t kOrientation = 0x0112, kGpsTime = 0x0007, kGpsDate = 0x001d,
                    kDistanceReference = 0x0019, kUserComment = 0x9286;
 constexpr uint16_t kLatitudes[] = {0x0002, 0x0014}, kLongitudes[] = {0x0004, 0x0016};
@@ -33,7 +33,7 @@ void Put(std::vector<uint8_t>& bytes, uint64_t number, size_t size) {
   for (size_t i = 0; i < size; ++i) bytes.push_back(static_cast<uint8_t>(number >> 8 * i));
 }
 
-// Behind a byte order mark, little-endian.
+// Little-endian, with a byte order mark.
 void PutUtf16(std::string_view text, std::vector<uint8_t>& bytes) {
   Put(bytes, 0xFEFF, 2);
   while (!text.empty()) {
@@ -49,13 +49,13 @@ void PutUtf16(std::string_view text, std::vector<uint8_t>& bytes) {
 
 bool IsDigit(char c) { return c >= '0' && c <= '9'; }
 
-// A number as it was typed, without rounding.
+// A number as entered, unrounded.
 struct Fraction {
   int64_t numerator = 0, denominator = 1;
   double Value() const { return static_cast<double>(numerator) / static_cast<double>(denominator); }
 };
 
-// Digits and a point, or two whole numbers with a slash; `text` moves behind them.
+// Parses a decimal number or two integers with a slash, and removes it from `text`.
 std::optional<Fraction> TakeFraction(std::string_view& text) {
   constexpr int64_t kMost = int64_t{1} << 53;
   const bool negative = text.starts_with('-');
@@ -71,7 +71,7 @@ std::optional<Fraction> TakeFraction(std::string_view& text) {
     digits = true;
     if (fraction.numerator > kMost / 10 || fraction.denominator > kMost / 10) {
       if (!point) return {};
-      continue;  // digits that change nothing
+      continue;  // beyond the precision
     }
     fraction.numerator = fraction.numerator * 10 + (text[0] - '0');
     if (point) fraction.denominator *= 10;
@@ -88,8 +88,8 @@ std::optional<Fraction> TakeFraction(std::string_view& text) {
   return fraction;
 }
 
-// The numbers of a text, with what may be between them, and labels such as "X:" left out. Empty if
-// there is anything else.
+// All numbers in a text, skipping separators and, with `labels`, labels such as "X:". Empty for any
+// other text.
 std::vector<Fraction> Numbers(std::string_view text, bool labels) {
   std::vector<Fraction> numbers;
   while (!text.empty()) {
@@ -109,7 +109,7 @@ std::vector<Fraction> Numbers(std::string_view text, bool labels) {
   return numbers;
 }
 
-// Brings a number into the range of a RATIONAL or SRATIONAL; false where it does not fit.
+// Rounds a number to fit a RATIONAL or SRATIONAL; false if out of range.
 bool FitRational(Fraction& fraction, bool isSigned) {
   const int64_t least = isSigned ? INT32_MIN : 0, most = isSigned ? INT32_MAX : UINT32_MAX;
   const auto fits = [&] {
@@ -196,7 +196,7 @@ class Input {
     return true;
   }
 
-  // ASCII as it is, everything else as UTF-16.
+  // ASCII if possible, else UTF-16.
   bool Comment() {
     if (!Characters()) return false;
     const bool ascii = std::ranges::all_of(text_, [](char c) { return static_cast<signed char>(c) > 0; });
@@ -245,7 +245,7 @@ class Input {
     return NotAllowed(Tr("0 to 127, or a text such as \"%1\".", "Fire: Y Return: X Mode: A Function: P Redeye: N"));
   }
 
-  // An item of the tag's list, or the number or letter that it stands for.
+  // An item of the tag's word list, or its number or letter.
   bool Word() {
     const ExifWordList& list = *row_.words;
     const bool letters = list.key == ExifWordKey::Letter;
@@ -262,7 +262,7 @@ class Input {
       const std::string number = letters ? std::string(1, static_cast<char>(code)) : std::to_string(code);
       if (EqualIgnoringCase(text_, word) || EqualIgnoringCase(text_, number)) return Code(code);
     }
-    // its list is that of directions, but the standard has units here
+    // the word list has directions here, but the standard has units
     if (row_.tag == kDistanceReference) {
       const char unit = UpperCase(text_[0]);
       if (text_.size() == 1 && (unit == 'K' || unit == 'M' || unit == 'N')) return Code(unit);
@@ -314,7 +314,7 @@ class Input {
   bool InRange(const std::vector<Fraction>& numbers) const {
     const double most = row_.tag == kGpsTime ? 23 : IsAnyOf(row_.tag, kLatitudes) ? 90 : 180;
     const double first = numbers[0].Value(), second = numbers[1].Value(), third = numbers[2].Value();
-    // degrees and minutes may have a fraction where nothing follows
+    // degrees and minutes may have a fraction if they come last
     return first >= 0 && first <= most && second >= 0 && second < 60 && third >= 0 && third < 60 &&
            (row_.tag == kGpsTime || first + second / 60 + third / 3600 <= most);
   }

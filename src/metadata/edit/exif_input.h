@@ -7,18 +7,18 @@
 
 namespace fotomill {
 
-// Reads what people type for a tag: the text in which its value is shown, or the plain value. Words
-// of its list in any case or their numbers; rationals as "1/250" or "2.8"; several numbers with
-// blanks, commas or colons between them; latitudes and longitudes also in decimal degrees; dates as
-// "2024:05:31 14:03:00", with hyphens or a T too. The entry's values are little-endian. False, with
-// the reason as a whole sentence, for tags that are not to be edited, and for values that the
-// dictionary does not allow.
+// Parses user input for a tag: the displayed text of a value, or the plain value. Words of the
+// tag's list (case-insensitive) or their numbers; rationals as "1/250" or "2.8"; several
+// numbers separated by spaces, commas or colons; latitudes and longitudes also in decimal
+// degrees; dates as "2024:05:31 14:03:00", also with hyphens or a T. The entry's values are
+// little-endian. False, with the reason as a sentence, for tags that cannot be edited and for
+// invalid values.
 bool ParseExifInput(uint16_t tag, std::string_view text, ExifEntry& entry, std::string& reason);
 
-// The directory in which the standard keeps a tag.
+// The directory that the standard assigns to a tag.
 ExifPlace PlaceOfExifTag(uint16_t tag);
 
-// The entry of a text, with its closing zero, and of unsigned rationals from pairs of numbers.
+// A text entry with a terminating NUL; an entry of unsigned rationals.
 ExifEntry ExifTextEntry(uint16_t tag, std::string_view text);
 struct ExifFraction {
   uint32_t numerator = 0, denominator = 1;

@@ -29,7 +29,7 @@ ExifChanges ShiftedTimes(const ExifDirectories& old, int64_t seconds, std::strin
 }
 
 ExifChanges CopiedEntries(const ExifDirectories& from) {
-  // orientation, resolutions; maker notes, sound file; color space, sizes
+  // orientation, resolution; maker notes, sound file; color space, size
   constexpr uint16_t kOwn[] = {0x0112, 0x011a, 0x011b, 0x0128, 0x927c,
                                0xa001, 0xa002, 0xa003, 0xa004, 0xa420};
   ExifChanges changes;

@@ -7,15 +7,15 @@
 
 namespace fotomill {
 
-// Changes that depend on what a file says; for EditPictureExif.
+// Changes computed from a file's entries; for EditPictureExif.
 
-// Moves all dates and times of the camera's clock by so many seconds. A reason when the file has
-// none, or when one would leave the calendar.
+// Shifts all dates and times of the camera's clock. Sets a reason if there are none, or if a result
+// is not a valid date.
 ExifChanges ShiftedTimes(const ExifDirectories& old, int64_t seconds, std::string& reason);
 
-// What one picture tells another: who took it, when, where and how. Not what is true of its pixels
-// alone (orientation, sizes, resolution, color space), and not its maker notes, which do not survive
-// a move.
+// The entries to copy from one picture to another: who took it, when, where and how. Excludes
+// entries about its own pixels (orientation, size, resolution, color space), and the maker notes,
+// which do not survive a move.
 ExifChanges CopiedEntries(const ExifDirectories& from);
 
 }  // namespace fotomill

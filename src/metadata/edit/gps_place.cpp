@@ -19,7 +19,7 @@ constexpr uint16_t kLatitudeRef = 0x0001, kLatitude = 0x0002, kLongitudeRef = 0x
                    kLongitude = 0x0004, kAltitudeRef = 0x0005, kAltitude = 0x0006, kTime = 0x0007,
                    kDatum = 0x0012, kDate = 0x001d;
 
-// Degrees, minutes, and seconds in ten thousandths: three millimeters.
+// Degrees, minutes and seconds to four decimals (three millimeters).
 ExifEntry Angle(uint16_t tag, double degrees) {
   constexpr int64_t kParts = 10000;
   const int64_t all = std::llround(std::abs(degrees) * 3600 * kParts);
@@ -33,7 +33,7 @@ double Wrapped(double longitude) {
   return longitude > 180 ? longitude - 360 : longitude < -180 ? longitude + 360 : longitude;
 }
 
-// Value `i` of an entry of rationals; none where it is not there.
+// Value `i` of a RATIONAL entry, if present.
 std::optional<double> RationalOf(const ExifEntry* entry, size_t i, bool bigEndian) {
   if (entry == nullptr || entry->type != kExifRational || entry->value.size() < 8 * (i + 1)) return {};
   const auto number = [&](size_t at) {

@@ -11,31 +11,31 @@
 
 namespace fotomill {
 
-// Where, and if known, how high and when. Degrees, north and east positive; meters above the sea;
-// seconds since 1970 UTC.
+// A position, with altitude and time if known. Degrees, positive for north and east; meters above
+// sea level; seconds since 1970 UTC.
 struct GpsPlace {
   double latitude = 0, longitude = 0;
   std::optional<double> altitude = {};
   std::optional<int64_t> time = {};
 };
 
-// The entries that tell a place; what else a GPS directory says stays.
+// The entries for a place; other GPS entries are kept.
 ExifChanges PlaceEntries(const GpsPlace& place);
-// The place that a GPS directory tells; none without latitude and longitude. Values in the set's
-// byte order.
+// The place in a GPS directory; none without latitude and longitude. Values are in the byte order
+// of `directories`.
 std::optional<GpsPlace> PlaceOf(const ExifDirectories& directories);
-// A page of OpenStreetMap with a mark at the place.
+// An OpenStreetMap link with a marker at the place.
 std::string MapLink(const GpsPlace& place);
 
 // A recorded track.
 class GpsTrack {
  public:
-  // Reads a GPX file: the points of its tracks that have a time. DamagedFile (2) for what is no GPX,
+  // Reads a GPX file: all track points with a time. DamagedFile (2) if it is not GPX,
   // MemoryAllocationError (6) beyond the limit. Source: Topografix, "GPX 1.1 Schema Documentation".
   Status Parse(std::span<const uint8_t> file);
   bool Empty() const { return points_.empty(); }
-  // Where the track was at a time: between two points, or at one that is at most kMostGap away; none
-  // further away from all of them.
+  // The position at a given time, interpolated between two points, or the nearest point within
+  // kMostGap; none if there is no point that close.
   std::optional<GpsPlace> At(int64_t time) const;
   static constexpr int64_t kMostGap = 1800;  // seconds
 
@@ -44,17 +44,17 @@ class GpsTrack {
     double time = 0;  // seconds since 1970 UTC
     GpsPlace place;
   };
-  std::vector<Point> points_;  // by time
+  std::vector<Point> points_;  // sorted by time
 };
 
-// When a picture was taken, UTC: the camera's time and `offset`; without one, the offset that EXIF
-// tells, else none. None for pictures without a time.
+// When a picture was taken, UTC, computed from the camera's time and `offset`, or without that the
+// EXIF offset, if any. None for pictures without a time.
 std::optional<int64_t> TakenUtc(const ExifDirectories& directories, std::optional<int64_t> offset);
 
-// Finds a place in a list: a line each of NAME = LAT,LON, in decimal degrees or as in
-// "45,19,48.000,N,79,13,12.000,W"; empty lines and lines that begin with # or ; do not count. Case
-// of names does not matter. `badLine` is the first line before it, from 1, that is none of these; 0
-// if all are.
+// Looks up a place in a list with lines of the form NAME = LAT,LON, in decimal degrees or as
+// "45,19,48.000,N,79,13,12.000,W". Empty lines and lines starting with # or ; are ignored. Names
+// are case-insensitive. `badLine` is the number of the first invalid line before the match, counted
+// from 1; 0 if there is none.
 std::optional<GpsPlace> FindListedPlace(std::string_view list, std::string_view name,
                                         size_t& badLine);
 

@@ -10,10 +10,10 @@ namespace fotomill {
 
 namespace {
 
-// The parsed file takes up to sixteen times the memory of its text.
+// Parsing takes up to sixteen times this much memory.
 constexpr size_t kMostBytes = size_t{32} << 20;
 
-// An element's name without its prefix.
+// An element's name without its namespace prefix.
 std::string_view NameOf(const pugi::xml_node& node) {
   const std::string_view name = node.name();
   return name.substr(name.rfind(':') + 1);
@@ -31,9 +31,9 @@ std::optional<double> NumberOf(const char* given) {
   return number;
 }
 
-// "2024-05-31T12:03:00.5Z", or with an offset such as +02:00; without either it is UTC as well.
+// "2024-05-31T12:03:00.5Z", or an offset such as +02:00 instead of Z; UTC if neither is given.
 std::optional<double> TimeOf(const char* given) {
-  constexpr size_t kSeconds = 19;  // characters up to the seconds
+  constexpr size_t kSeconds = 19;  // up to and including the seconds
   std::string_view text = given;
   text.remove_prefix(std::min(text.find_first_not_of(" \t\r\n"), text.size()));
   const auto whole = ParseExifTime(text.substr(0, kSeconds));
@@ -105,7 +105,7 @@ std::optional<GpsPlace> GpsTrack::At(int64_t moment) const {
     const double gap = after->time - before->time;
     const double part = gap > 0 ? (time - before->time) / gap : 1;
     const GpsPlace &a = before->place, &b = after->place;
-    double east = b.longitude - a.longitude;  // the short way around the earth
+    double east = b.longitude - a.longitude;  // in degrees; may cross the date line
     east = east > 180 ? east - 360 : east < -180 ? east + 360 : east;
     place.latitude = Between(a.latitude, b.latitude, part);
     place.longitude = std::remainder(a.longitude + east * part, 360);

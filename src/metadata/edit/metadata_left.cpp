@@ -40,7 +40,7 @@ class Found {
     if (!exif.gps.empty()) Add(kGpsName);
     if (FindExifEntry(exif.exif, kMakerNote) != nullptr) Add(kMakerNoteName);
   }
-  // Of a block of its own.
+  // For an EXIF block.
   void AddBlock(std::span<const uint8_t> block) {
     ExifFindings findings;
     if (WalkExif(block, nullptr, &findings) && findings.thumbnailOffset != 0) Add(kThumbnailName);
@@ -51,7 +51,7 @@ class Found {
   std::vector<const char*> names_;
 };
 
-// Where the picture ends: behind the first EOI that is not in a segment.
+// The end of the picture: after the first EOI outside of segments.
 uint64_t EndOfJpeg(std::span<const uint8_t> file, uint64_t at) {
   for (;;) {
     const void* found = at < file.size() ? std::memchr(&file[at], 0xFF, file.size() - at) : nullptr;
@@ -90,7 +90,7 @@ void LookIntoJpeg(std::span<const uint8_t> file, Found& found) {
 }
 
 void LookIntoPng(std::span<const uint8_t> file, Found& found) {
-  // chunks of the picture begin with a capital; these belong to it too
+  // chunks starting with an uppercase letter belong to the picture; so do these
   constexpr std::string_view kPicture[] = {"tRNS", "cHRM", "gAMA", "sBIT", "sRGB", "cICP", "mDCv",
                                            "mDCV", "cLLi", "cLLI", "bKGD", "hIST", "pHYs", "sPLT",
                                            "oFFs", "acTL", "fcTL", "fdAT"};

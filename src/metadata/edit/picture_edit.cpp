@@ -23,7 +23,7 @@ struct FormOperations {
                     std::string& reason);
 };
 
-// Of forms that hold EXIF as a block.
+// For formats with an EXIF block.
 FormOperations OperationsOf(MetadataForm form) {
   switch (form) {
     case MetadataForm::Jpeg: return {FindJpegMetadata, RewriteJpeg};
@@ -37,7 +37,7 @@ bool Starts(std::span<const uint8_t> file, std::string_view text) {
   return ByteReader(file).Match(text);
 }
 
-// A new directory says which version of the standard it is of.
+// A new directory needs the version of the standard.
 void AddVersions(const ExifDirectories& old, ExifChanges& changes) {
   const auto adds = [&](ExifPlace place, uint16_t version) {
     return std::ranges::any_of(changes, [&](const DirectoryChange& change) {
@@ -57,7 +57,7 @@ void AddVersions(const ExifDirectories& old, ExifChanges& changes) {
   }
 }
 
-// HD Photo has an entry of its own for the orientation.
+// HD Photo has a separate tag for the orientation.
 void UseHdpOrientation(ExifChanges& changes) {
   for (DirectoryChange& change : changes) {
     if (change.place != ExifPlace::First || change.tag != kOrientation) continue;
@@ -68,7 +68,7 @@ void UseHdpOrientation(ExifChanges& changes) {
   }
 }
 
-// A block of nothing but what is added.
+// A block with only the added entries.
 std::vector<uint8_t> FreshBlock(const ExifChanges& changes) {
   ExifDirectories directories;
   for (const DirectoryChange& change : changes) {
@@ -81,7 +81,7 @@ std::vector<uint8_t> FreshBlock(const ExifChanges& changes) {
   return MakeExifBlock(directories);
 }
 
-// Whether a block says nothing: its only directory has no entry.
+// Whether the only directory of a block is empty.
 bool IsEmptyBlock(std::span<const uint8_t> block) {
   const bool big = Starts(block, "MM");
   ByteReader bytes(block);

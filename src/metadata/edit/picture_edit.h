@@ -12,36 +12,36 @@
 
 namespace fotomill {
 
-// How a file holds its metadata, by its contents.
+// How a file stores metadata, determined from its contents.
 enum class MetadataForm : uint8_t {
-  None,  // not at all that we know of
+  None,  // unknown format
   Jpeg,
   Png,
   Webp,
-  Tiff,  // BigTIFF and bare EXIF blocks too: entries are among the file's own
+  Tiff,  // also BigTIFF and bare EXIF blocks: entries are in the file's own directories
   HdPhoto,
 };
 MetadataForm MetadataFormOf(std::span<const uint8_t> file);
 
-// The camera's entries of a file, values in the set's byte order; empty if it has none that can be
+// The EXIF entries of a file, values in its byte order; empty if there are none that can be
 // read.
 ExifDirectories GatherPictureExif(std::span<const uint8_t> file);
 
-// The first value of an entry as text, without blanks and zeros at its end; empty for other types.
+// The first value of an entry as text, without trailing spaces and NULs; empty for other types.
 std::string ExifEntryText(const ExifEntry& entry);
-// An entry of a directory, or null.
+// Null if not found.
 const ExifEntry* FindExifEntry(const ExifDirectory& directory, uint16_t tag);
 
-// What is changed, worked out from what the file holds. A reason is a failure, as a whole sentence.
+// Computes changes from the current entries. To fail, set `reason` (a sentence).
 using ExifChanges = std::vector<DirectoryChange>;
 using ExifChanger =
     std::function<ExifChanges(const ExifDirectories& old, std::string& reason)>;
 
-// Makes a file with changed EXIF from parts of the old one, which must stay. All that is not
-// changed stays byte for byte; `changed` is false, and nothing made, where it is so already.
-// UnsupportedFormat (8) for other kinds of files, DamagedFile (2), FileReadError (3) and
-// UnsuitableImage (13) where the file cannot be changed without losing something, InformationError
-// (7) where the changer failed, each with a reason, a whole sentence, if there is more to say.
+// Makes a file with changed EXIF from pieces of the old one, which must stay valid. Everything else
+// is kept byte for byte. If nothing would change, `changed` is false and `made` is empty.
+// UnsupportedFormat (8) for other file types, DamagedFile (2), FileReadError (3); UnsuitableImage
+// (13) if the file cannot be changed without loss, InformationError (7) if the changer failed.
+// `reason` has details as a sentence, if any.
 Status EditPictureExif(std::span<const uint8_t> file, const ExifChanger& changer, FilePieces& made,
                        bool& changed, std::string& reason);
 

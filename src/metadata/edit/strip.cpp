@@ -33,13 +33,13 @@ bool IsKept(const ExifEntry& entry, ExifPlace place, uint32_t kept) {
   return (kept & kKeepExif) != 0 || (owner && (kept & kKeepCopyright) != 0);
 }
 
-// The entries of a file that are put into the new one.
+// The entries to keep in the new file.
 ExifChanges KeptEntries(std::span<const uint8_t> file, MetadataForm form, uint32_t kept) {
   const ExifDirectories old = GatherPictureExif(file);
   ExifChanges changes;
   const auto take = [&](const ExifDirectory& directory, ExifPlace place) {
     for (const ExifEntry& entry : directory) {
-      // files made of directories keep their orientation themselves
+      // in TIFF and HD Photo, MakeBareTiff keeps the orientation
       const bool own = entry.tag == kOrientation && form != MetadataForm::Jpeg &&
                        form != MetadataForm::Png && form != MetadataForm::Webp;
       if (own || !IsKept(entry, place, kept)) continue;
@@ -63,7 +63,7 @@ std::vector<uint8_t> XmpOf(std::span<const uint8_t> file, MetadataForm form) {
   return {views.xmp.begin(), views.xmp.end()};
 }
 
-// The entries of a set, as a block.
+// An EXIF block with these entries.
 std::vector<uint8_t> BlockOf(const ExifChanges& changes) {
   ExifDirectories directories;
   for (const DirectoryChange& change : changes) {
@@ -93,7 +93,8 @@ void BlankPlaces(std::span<const uint8_t> file, std::span<const uint8_t> packet,
     patches.push_back({static_cast<uint64_t>(packet.data() - file.data()), std::move(blanked)});
 }
 
-// GPS directories, and places in XMP, of the JPEG files in a part of a file; patches are offsets in the whole.
+// Finds GPS directories and XMP positions in all JPEG streams from `from` on. Patch offsets are
+// relative to `file`.
 Status ErasePlacesBehind(std::span<const uint8_t> file, uint64_t from,
                          std::vector<DirectoryEdit::Patch>& patches, std::string& reason) {
   const DirectoryChange change{.place = ExifPlace::Gps, .all = true};
@@ -110,7 +111,7 @@ Status ErasePlacesBehind(std::span<const uint8_t> file, uint64_t from,
     if (!bytes.Match(kExifHead)) continue;
     const auto block = bytes.Peek(length - 8u);
     DirectoryEdit edit;
-    // what only looks like a block is none of ours
+    // not an EXIF block after all
     if (EditDirectories(block, {&change, 1}, edit, reason) != Status::Ok) continue;
     if (!edit.tail.empty()) {
       reason = Tr("The place shares its bytes with other values.");
@@ -161,7 +162,7 @@ Status StripFilePlaces(std::span<const uint8_t> file, FilePieces& made, std::str
   return Status::Ok;
 }
 
-// Whether a PNG file has EXIF or XMP in a text, compressed or in hexadecimal digits.
+// Whether a PNG file has EXIF or XMP in a compressed or hexadecimal text chunk.
 bool HasRawProfile(std::span<const uint8_t> file) {
   PngChunks chunks(file);
   for (PngChunk chunk; chunks.Next(chunk);) {
@@ -227,7 +228,7 @@ Status StripPicture(std::span<const uint8_t> file, uint32_t kept, FilePieces& ma
   const auto view = pieces.Own(std::move(bare));
   const MetadataBlocks blocks{exif, xmp};
   RETURN_IF_BAD(png ? RewritePng(view, blocks, made, reason) : RewriteWebp(view, blocks, made, reason));
-  made.Append(std::move(pieces));  // what its parts are parts of
+  made.Append(std::move(pieces));  // `made` refers to them
   return Status::Ok;
 }
 

@@ -9,21 +9,21 @@
 
 namespace fotomill {
 
-// Numbers of an EXIF block in its byte order. Bytes at or beyond the end read as 0: a block that
-// points out of itself is cut short there, it does not fail. Does not own the bytes.
+// Reads numbers from an EXIF block in its byte order. Bytes beyond the end read as 0, so a bad
+// offset yields truncated data, not an error. Does not own the bytes.
 class ExifBytes {
  public:
   ExifBytes() = default;
   ExifBytes(std::span<const uint8_t> bytes, bool bigEndian)
       : bytes_(bytes), bigEndian_(bigEndian) {}
 
-  // The block, and numbers at offsets from its start in its own byte order.
+  // Offsets are from the start of the block.
   uint64_t Size() const { return bytes_.size(); }
   bool BigEndian() const { return bigEndian_; }  // "MM"
   uint8_t U8(uint64_t offset) const { return offset < bytes_.size() ? bytes_[offset] : uint8_t{0}; }
   uint16_t U16(uint64_t offset) const { return Number<uint16_t>(offset); }
   uint32_t U32(uint64_t offset) const { return Number<uint32_t>(offset); }
-  // As many of `count` bytes from `offset` on as there are.
+  // Up to `count` bytes from `offset`.
   std::span<const uint8_t> Part(uint64_t offset, uint64_t count) const {
     if (offset >= bytes_.size()) return {};
     const uint64_t left = bytes_.size() - offset;
@@ -48,26 +48,25 @@ class ExifBytes {
   bool bigEndian_ = false;
 };
 
-// Types that TIFF knows and EXIF does not. Sources: TIFF 6.0, section 2; Adobe PageMaker 6.0 TIFF
-// Technical Notes (1995).
+// TIFF types not in EXIF. Sources: TIFF 6.0, section 2; Adobe PageMaker 6.0 TIFF Technical Notes
+// (1995).
 inline constexpr uint16_t kTiffFloat = 11;
 inline constexpr uint16_t kTiffDouble = 12;  // 8 bytes
 inline constexpr uint16_t kTiffIfd = 13;  // 4 bytes: the offset of a directory
 
-// Sizes of a directory: a 2-byte count, the entries, a 4-byte offset of the next directory.
+// A directory has a 2-byte count, the entries, and the 4-byte offset of the next directory.
 //
 //   offset size  field of an entry
 //        0    2  tag
 //        2    2  type
 //        4    4  number of values
-//        8    4  the values, or, when they need more than 4 bytes, their offset from the start of
-//        the block
+//        8    4  the values; if they need more than 4 bytes, their offset in the block
 inline constexpr uint64_t kExifCountSize = 2;
 inline constexpr uint64_t kExifEntrySize = 12;
 inline constexpr uint64_t kExifLinkSize = 4;
 
-// Bytes that one value of a type takes in the block: those of TIFF 6.0, so 2 for SSHORT; 1 for
-// unknown types. FLOAT, DOUBLE and IFD have no text, but an edit must know where their values end.
+// Size of one value in the block, by TIFF 6.0: 2 for SSHORT; 1 for unknown types. FLOAT, DOUBLE and
+// IFD are never displayed, but editing needs their size.
 constexpr uint32_t ExifStoredSize(uint16_t type) {
   switch (type) {
     case kExifShort:
@@ -83,14 +82,14 @@ constexpr uint32_t ExifStoredSize(uint16_t type) {
   }
 }
 
-// One directory entry and where its values lie.
+// A directory entry and the offset of its values.
 struct ExifField {
   uint16_t tag = 0;
   uint16_t type = 0;
   uint32_t count = 0;
-  uint64_t entryOffset = 0;  // of the entry itself
-  uint64_t valueOffset = 0;  // of its first value, which may be beyond the block
-  // Bytes, also of a count that no file can hold.
+  uint64_t entryOffset = 0;  // of the entry
+  uint64_t valueOffset = 0;  // of its first value; may be beyond the block
+  // In bytes. Not limited by the size of the block.
   uint64_t ValueSize() const { return uint64_t{count} * ExifStoredSize(type); }
 };
 
@@ -105,16 +104,16 @@ inline ExifField ReadExifField(const ExifBytes& block, uint64_t offset) {
   return field;
 }
 
-// The header: byte order, magic number, offset of the first directory. Source: TIFF 6.0, section 2.
+// Header: byte order, magic number, offset of the first directory. Source: TIFF 6.0, section 2.
 inline constexpr uint16_t kExifMagic = 42;
 inline constexpr uint64_t kExifHeaderSize = 8;
-// Tags whose values are offsets and sizes in the block. Source: CIPA DC-008-2012, section 4.6.
+// Tags whose values are offsets or sizes. Source: CIPA DC-008-2012, section 4.6.
 inline constexpr uint16_t kExifPointerTag = 0x8769;
 inline constexpr uint16_t kGpsPointerTag = 0x8825;  // offset of the GPS directory
 inline constexpr uint16_t kThumbnailOffsetTag = 0x0201;  // JPEGInterchangeFormat
 inline constexpr uint16_t kThumbnailSizeTag = 0x0202;  // JPEGInterchangeFormatLength
 
-// The block's numbers, "II" read as little-endian, any other mark as big-endian.
+// "II" means little-endian, anything else big-endian.
 inline ExifBytes OpenExifBytes(std::span<const uint8_t> block) {
   const bool little = block.size() >= 2 && block[0] == 'I' && block[1] == 'I';
   return {block, !little};

@@ -15,14 +15,14 @@ constexpr uint16_t kOrientation = 0x0112;
 constexpr uint16_t kStripOffsets = 0x0111, kStripSizes = 0x0117;
 constexpr uint16_t kValidWidth = 0xA002, kValidHeight = 0xA003;
 
-// The directory of a thumbnail that we write: what the standard asks of one, at 72 pixels per inch.
+// The directory for a new thumbnail: the mandatory entries, at 72 pixels per inch.
 struct ThumbnailField {
   uint16_t tag, type;
   uint32_t number;
 };
 constexpr ThumbnailField kThumbnailFields[] = {
-    {0x0103, kExifShort, 6},     // compressed as JPEG
-    {0x011A, kExifRational, 0},  // both resolutions share one value behind the directory
+    {0x0103, kExifShort, 6},     // JPEG compression
+    {0x011A, kExifRational, 0},  // both resolutions share one value after the directory
     {0x011B, kExifRational, 0},
     {0x0128, kExifShort, 2},  // inches
     {kThumbnailOffsetTag, kExifLong, 0},
@@ -30,7 +30,7 @@ constexpr ThumbnailField kThumbnailFields[] = {
 };
 constexpr uint64_t kResolutionSize = 8;
 
-// A block whose first directory is empty.
+// A block with an empty first directory.
 constexpr uint8_t kEmptyBlock[] = {'I', 'I', kExifMagic, 0, kExifHeaderSize, 0, 0, 0, 0, 0,
                                    0,   0,   0,          0};
 
@@ -38,11 +38,11 @@ struct Range {
   uint64_t begin, end;
 };
 
-// One directory: as many of its entries as are in the block.
+// A directory, limited to the entries inside the block.
 struct Directory {
   uint64_t offset = 0;
   uint32_t count = 0;
-  bool linked = false;  // so does the link to the next one
+  bool linked = false;  // the link to the next directory is inside the block as well
   uint64_t EntryOffset(uint32_t index) const {
     return offset + kExifCountSize + index * kExifEntrySize;
   }
@@ -75,7 +75,7 @@ std::optional<ExifField> FindField(const ExifBytes& block, const Directory& dire
   return {};
 }
 
-// A whole number of a field, the first where it has several.
+// The first value of an integer field.
 uint32_t FieldNumber(const ExifBytes& block, const ExifField& field) {
   if (field.type == kExifShort) return block.U16(field.valueOffset);
   return field.type == kExifLong ? block.U32(field.valueOffset) : block.U8(field.valueOffset);
@@ -99,7 +99,7 @@ void Put32(std::span<uint8_t> block, bool bigEndian, uint64_t offset, uint32_t n
   Put16(block, bigEndian, offset + 2, bigEndian ? lower : upper);
 }
 
-// Rewrites an entry behind its tag as one number, kept in the entry.
+// Overwrites an entry, except for its tag, with one inline number.
 void PutField(std::span<uint8_t> block, bool bigEndian, uint64_t entryOffset, uint16_t type,
               uint32_t number) {
   Put16(block, bigEndian, entryOffset + 2, type);
@@ -116,8 +116,7 @@ void SetField(std::span<uint8_t> bytes, const ExifBytes& block, const Directory&
            static_cast<uint32_t>(number));
 }
 
-// Moves the first directory to the end of the block, with an empty SHORT more in the order of the
-// tags.
+// Moves the first directory to the end of the block and inserts an empty SHORT in tag order.
 void AddField(std::vector<uint8_t>& block, const Directory& first, uint16_t tag) {
   const bool bigEndian = OpenExifBytes(block).BigEndian();
   const uint64_t offset = block.size() + block.size() % 2;
@@ -140,7 +139,7 @@ void AddField(std::vector<uint8_t>& block, const Directory& first, uint16_t tag)
   Put32(block, bigEndian, 4, static_cast<uint32_t>(offset));
 }
 
-// Adds the bytes of a directory and of the values that its entries keep elsewhere in the block.
+// Adds the bytes of a directory and of the values stored outside its entries.
 void AddRanges(const ExifBytes& block, const Directory& directory, std::vector<Range>& ranges) {
   ranges.push_back(directory.Whole());
   for (uint32_t i = 0; i < directory.count; ++i) {
@@ -151,8 +150,8 @@ void AddRanges(const ExifBytes& block, const Directory& directory, std::vector<R
   }
 }
 
-// Adds what the entries of a thumbnail's directory point to: a JPEG stream, or the strips of an
-// uncompressed picture.
+// Adds what a thumbnail directory points to: a JPEG stream, or the strips of an uncompressed
+// picture.
 void AddThumbnailRanges(const ExifBytes& block, const Directory& directory,
                         std::vector<Range>& ranges) {
   constexpr uint16_t kPairs[][2] = {{kThumbnailOffsetTag, kThumbnailSizeTag},
@@ -167,7 +166,7 @@ void AddThumbnailRanges(const ExifBytes& block, const Directory& directory,
   }
 }
 
-// Everything that stays when the thumbnail goes: header, first, EXIF, GPS and interoperability
+// All ranges to keep without the thumbnail: header, first, EXIF, GPS and interoperability
 // directories.
 std::vector<Range> KeptRanges(const ExifBytes& block, const Directory& first) {
   constexpr uint16_t kInteroperabilityPointer = 0xA005;
@@ -182,14 +181,14 @@ std::vector<Range> KeptRanges(const ExifBytes& block, const Directory& first) {
   return kept;
 }
 
-// Everything that goes: the directories chained behind the first.
+// All ranges to drop: the directories chained after the first.
 std::vector<Range> DroppedRanges(const ExifBytes& block, const Directory& first) {
   std::vector<Range> dropped;
   uint32_t entries = 0;
   auto directory = DirectoryAt(block, block.U32(first.LinkOffset()));
   while (directory) {
     entries += directory->count;
-    if (entries > limits.exifEntries) break;  // a loop, most likely
+    if (entries > limits.exifEntries) break;  // probably a loop
     AddRanges(block, *directory, dropped);
     AddThumbnailRanges(block, *directory, dropped);
     if (!directory->linked) break;
@@ -198,7 +197,7 @@ std::vector<Range> DroppedRanges(const ExifBytes& block, const Directory& first)
   return dropped;
 }
 
-// Sorts ranges and joins those that touch or overlap.
+// Sorts ranges and merges those that touch or overlap.
 void JoinRanges(std::vector<Range>& ranges) {
   std::ranges::sort(ranges, {}, &Range::begin);
   size_t count = 0;
@@ -212,7 +211,7 @@ void JoinRanges(std::vector<Range>& ranges) {
   ranges.resize(count);
 }
 
-// The parts of `from` that no range of `without` covers; both joined before.
+// The parts of `from` not covered by `without`; both must be joined.
 std::vector<Range> Difference(const std::vector<Range>& from, const std::vector<Range>& without) {
   std::vector<Range> result;
   auto hole = without.begin();
@@ -278,7 +277,7 @@ void DropExifThumbnail(std::vector<uint8_t>& block) {
     std::fill(block.begin() + static_cast<std::ptrdiff_t>(range.begin),
               block.begin() + static_cast<std::ptrdiff_t>(range.end), uint8_t{0});
   }
-  // Zeros that nothing refers to need not be kept: what is read beyond the end is zero anyway.
+  // Trailing zeros can be dropped, since bytes beyond the end read as zero.
   size_t size = block.size();
   while (size > kept.back().end && block[size - 1] == 0) --size;
   block.resize(size);

@@ -11,7 +11,7 @@ namespace fotomill {
 
 namespace {
 
-// Field names of the standard and two older names of the sensitivity. Source: CIPA DC-008-2012,
+// Field names of the standard, and two older ones of the sensitivity. Source: CIPA DC-008-2012,
 // sections 4.6.4 to 4.6.6.
 struct FieldName {
   std::string_view name;
@@ -76,14 +76,14 @@ std::string Plain(std::string_view name) {
   return plain;
 }
 
-// The number in "unknown(50341)".
+// Parses "unknown(50341)".
 std::optional<uint16_t> UnknownTag(std::string_view plain) {
   constexpr std::string_view kStart = "unknown(";
   if (!plain.starts_with(kStart) || !plain.ends_with(')')) return std::nullopt;
   return ParseNumber<uint16_t>(plain.substr(kStart.size(), plain.size() - kStart.size() - 1));
 }
 
-// The number in "0x9003".
+// Parses "0x9003".
 std::optional<uint16_t> NumberedTag(std::string_view plain) {
   if (!plain.starts_with("0x")) return std::nullopt;
   plain.remove_prefix(2);

@@ -15,15 +15,14 @@ namespace fotomill {
 
 namespace {
 
-// holds the directories of most pictures; the rest is read when needed
+// covers the directories of most pictures; the rest is read as needed
 constexpr uint64_t kHeadSize = 16 * 1024;
 
 bool Starts(std::span<const uint8_t> bytes, std::string_view text) {
   return ByteReader(bytes).Match(text);
 }
 
-// A TIFF header. JPEG XR borrows its look with a magic number of its own, but its own directories
-// are not EXIF.
+// A TIFF header. JPEG XR uses it with a different magic number, but its directories are not EXIF.
 bool StartsBareBlock(std::span<const uint8_t> head) {
   if (Starts(head, "II")) return !Starts(head, "II\xBC");
   if (Starts(head, "MM")) return true;

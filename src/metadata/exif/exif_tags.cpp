@@ -11,7 +11,7 @@ namespace {
 using enum ExifRule;
 using enum ExifWordKey;
 
-// Values in the order of the words that they select.
+// Values in the order of the corresponding words.
 constexpr uint16_t kNorth[] = {'N', 'S'};
 constexpr uint16_t kEast[] = {'E', 'W'};
 constexpr uint16_t kActive[] = {'A', 'V'};
@@ -25,9 +25,8 @@ constexpr uint16_t kLightSources[] = {0,  1,  2,  3,  4,  9,  10, 11, 12, 13, 14
                                       15, 17, 18, 19, 20, 21, 22, 23, 24, 255};
 constexpr uint16_t kColorSpaces[] = {0xffff, 1};
 
-// Users know the lists as they stand, though some are not those of the standard: the orientations 3
-// and 4 carry each other's words, a white balance of 0 reads "None", and a sensing method has the
-// words of the next one.
+// Users know these lists, although some deviate from the standard: the words for orientations 3 and
+// 4 are swapped, white balance 0 reads "None", and a sensing method has the words of the next one.
 // clang-format off
 constexpr ExifWordList kAltitudeWords{"Sea level;Sea level reference"};
 constexpr ExifWordList kLatitudeWords{"North;South", Letter, kNorth, 1};
@@ -203,8 +202,8 @@ constexpr ExifTag kTags[] = {
 
 constexpr size_t kTagCount = std::size(kTags);
 
-// Rows by tag number: an open-addressed table of row numbers, built by the compiler, which also
-// refuses a tag that is there twice.
+// Hash table from tag to row: open addressing, built at compile time. A duplicate tag does not
+// compile.
 constexpr size_t kSlotCount = 512;
 constexpr uint8_t kEmptySlot = 0xff;
 static_assert(kTagCount < kEmptySlot && 2 * kTagCount < kSlotCount);

@@ -10,17 +10,17 @@ namespace fotomill {
 
 namespace {
 
-// bytes; the block starts with so many and stays a multiple of them
+// initial size and granularity of the buffer, in bytes
 constexpr uint64_t kGrowth = 4096;
 
-// Whether a text is shown as it is, being printable ASCII. Eight characters at a time: the text
-// of every value comes through here.
+// Whether a text is printable ASCII and needs no escaping. Checks eight characters at a time, as
+// every value passes through here.
 bool IsPlain(std::string_view text) {
   constexpr uint64_t kOnes = 0x0101010101010101, kTops = 0x80 * kOnes;
   const auto plainEight = [](const char* place) {
     uint64_t word;
     std::memcpy(&word, place, sizeof word);
-    // in the top bits of its bytes, as the next one
+    // results are in the top bit of each byte
     const uint64_t belowBlank = (word - 0x20 * kOnes) & ~word;
     const uint64_t notDelete = (word ^ 0x7f * kOnes) + 0x7f * kOnes;
     return ((belowBlank | ~notDelete | word) & kTops) == 0;
@@ -76,7 +76,7 @@ void ExifText::Clear() {
 char* ExifText::Room(uint64_t size) {
   if (!complete_) return nullptr;
   if (size > block_.Size() - used_) {
-    // A long text grows by half of itself, so that each of its bytes is moved a few times only.
+    // Grows by half, so that the cost of copying stays linear.
     const uint64_t room = std::max(size, used_ / 2);
     complete_ = block_.Resize((used_ + room + kGrowth - 1) / kGrowth * kGrowth);
     if (!complete_) return nullptr;

@@ -8,30 +8,30 @@
 
 namespace fotomill {
 
-// How values are written out as text.
+// Options for text output.
 struct ExifTextOptions {
-  bool showTypes = false;  // the type of each value behind its name
+  bool showTypes = false;  // show the type after the name
 };
 
-// The lines of a walk as one text, to be printed or copied: "DIRECTORY EXIF", and for each value
-// four blanks, the name, a tab, the value; with `showTypes` a blank and the type's label behind the
-// name. Every line ends in "\n". Control characters and bytes that are not UTF-8 are escaped, so
-// that a value never makes two lines.
+// Formats a walk as text for printing or copying: "DIRECTORY EXIF", then for each value four
+// spaces, the name, a tab, the value; with `showTypes` a space and the type's label after the name.
+// Lines end with "\n". Control characters and invalid UTF-8 are escaped, so each value is exactly
+// one line.
 class ExifText : public ExifSink {
  public:
   explicit ExifText(const ExifTextOptions& options) : options_(options) {}
   void Directory(int32_t number, std::string_view label) override;
   void Line(const ExifLine& line) override;
 
-  // The lines so far; valid until the next one.
+  // The lines so far; valid until the next line is added.
   std::string_view Text() const;
-  // False when there was no memory for a line; it and those after it are missing.
+  // False if memory ran out; that line and all later ones are missing.
   bool Complete() const { return complete_; }
-  // Starts anew, and keeps the memory.
+  // Starts over; keeps the allocated memory.
   void Clear();
 
  private:
-  // The place of the next `size` characters, all of which the caller writes; null without memory.
+  // Space for the next `size` characters, to be filled by the caller; null if out of memory.
   char* Room(uint64_t size);
 
   const ExifTextOptions options_;

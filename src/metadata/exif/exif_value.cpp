@@ -13,11 +13,11 @@ namespace {
 
 using Text = std::optional<std::string_view>;
 
-constexpr uint32_t kMostNumbers = 16;  // of one value that are shown
-constexpr size_t kCodeSize = 8;        // the character code of a user comment
+constexpr uint32_t kMostNumbers = 16;  // per value that are shown
+constexpr size_t kCodeSize = 8;        // character code of a user comment
 constexpr std::string_view kJisCode("JIS\0\0\0\0\0", kCodeSize);
 
-// --- numbers into `buffer` ---
+// --- numbers, appended to `buffer` ---
 
 void AddNumber(std::string& buffer, int64_t number) {
   char digits[24];
@@ -31,7 +31,7 @@ void AddTwoDigits(std::string& buffer, uint32_t number) {
 }
 
 void AddFixed(std::string& buffer, double number, int decimals) {
-  char digits[32];  // 2^32 at most in front of the point
+  char digits[32];  // at most 2^32 before the point
   const auto end =
       std::to_chars(digits, digits + sizeof digits, number, std::chars_format::fixed, decimals).ptr;
   buffer.append(digits, static_cast<size_t>(end - digits));
@@ -52,7 +52,7 @@ Rational RationalAt(const ExifValue& value, uint64_t index) {
   return {static_cast<int32_t>(numerator), static_cast<int32_t>(denominator)};
 }
 
-// Value `index` of any whole-number type.
+// Value `index` of any integer type.
 int64_t NumberAt(const ExifValue& value, uint64_t index) {
   switch (value.type) {
     case kExifShort: return value.bytes.U16(2 * index);
@@ -64,9 +64,8 @@ int64_t NumberAt(const ExifValue& value, uint64_t index) {
   }
 }
 
-// A rational with three decimals, just as "%.3f" shows the quotient of two doubles. In whole
-// numbers, which is much the quicker way: their exact quotient is too near to a rounding limit for
-// a double only where it is right on it.
+// A rational with three decimals, identical to "%.3f" of the quotient as a double, but in integers,
+// which is much faster. Only exact ties can differ and are left to the slow way.
 void AddThousandths(std::string& buffer, const Rational& rational) {
   const auto numerator = static_cast<uint64_t>(rational.numerator) * 1000;
   const auto denominator = static_cast<uint64_t>(rational.denominator);
@@ -122,7 +121,7 @@ Text PlainText(const ExifValue& value, const ExifTag* row, std::string& buffer) 
   return JoinedNumbers(value, buffer);
 }
 
-// --- texts by rule; none of them when the value's type or count does not fit the rule ---
+// --- texts by rule; none if the value's type or count does not fit the rule ---
 
 int64_t WordIndex(const ExifWordList& list, int64_t number) {
   if (list.codes.empty()) return number;
@@ -176,7 +175,7 @@ Text FlashText(const ExifValue& value, std::string& buffer) {
   return buffer;
 }
 
-// A word, then each value behind its letter: "Circular area X: 10 Y: 20 R: 5".
+// A word, then each value after its letter: "Circular area X: 10 Y: 20 R: 5".
 Text LetteredText(const ExifValue& value, std::string_view word, std::string_view letters,
                   std::string& buffer) {
   buffer += word;
@@ -216,7 +215,7 @@ Text LensText(const ExifValue& value, std::string& buffer) {
   return buffer;
 }
 
-// The quotient is taken in whole numbers, so that the three decimals are always zeros.
+// Integer division, so the three decimals are always zeros.
 Text DistanceText(const ExifValue& value, std::string& buffer) {
   if (!IsRational(value) || value.count == 0) return {};
   const Rational rational = RationalAt(value, 0);
@@ -239,7 +238,7 @@ Text GpsTimeText(const ExifValue& value, std::string& buffer) {
   return buffer;
 }
 
-// A comment of an unknown code has no line.
+// Comments with an unknown code are not listed.
 Text CommentText(const ExifValue& value) {
   std::string_view text;
   if (!DecodeUserComment(value.bytes.Part(0, value.count), value.count, limits.exifValueCharacters,
@@ -330,7 +329,7 @@ void NormalizeExifValue(ExifRawValue& copy) {
   for (uint64_t offset = 0; offset + 4 <= copy.data.Size(); offset += 4) {
     uint8_t* word = copy.data.Data() + offset;
     if (isShort) {
-      std::swap(word[0], word[1]);  // the upper half of the swapped slot, brought down
+      std::swap(word[0], word[1]);  // the upper half of the swapped slot, moved down
       word[2] = word[3] = 0;
     } else {
       std::reverse(word, word + 4);

@@ -11,9 +11,9 @@ namespace fotomill {
 
 namespace {
 
-constexpr size_t kLineExtra = 6;  // four blanks, a tab and the line end
+constexpr size_t kLineExtra = 6;  // four spaces, a tab and the line end
 
-// A short prefix and a number, in place.
+// A short prefix and a number, without allocation.
 class NumberedText {
  public:
   std::string_view Make(std::string_view before, uint32_t number, std::string_view after = {}) {
@@ -51,8 +51,8 @@ class Walk {
   }
 
  private:
-  // The label of the directory at `offset`, which is moved to the EXIF and then the GPS directory
-  // where the chain ends; empty when all have been walked.
+  // The label of the directory at `offset`. At the end of the chain, sets `offset` to the EXIF,
+  // then the GPS directory; empty when done.
   std::string_view NextLabel(int32_t number, uint32_t& offset, const ExifFindings& findings) {
     if (offset != 0) return label_.Make("IFD ", static_cast<uint32_t>(number));
     if (findings.exifOffset != 0 && !exifWalked_) {
@@ -98,8 +98,7 @@ class Walk {
         value.tag != kThumbnailOffsetTag && value.tag != kThumbnailSizeTag) {
       return;
     }
-    // The 4-byte field itself, whatever the entry's type and count, except for a single SHORT,
-    // which is half of it.
+    // The 4-byte field itself, whatever type and count say; for a single SHORT, half of it.
     const bool half = value.type == kExifShort && value.count == 1;
     const uint32_t number = half ? value.bytes.U16(0) : numbers_.U32(entry + 8);
     switch (value.tag) {
@@ -134,12 +133,12 @@ class Walk {
   int32_t only_;
   std::vector<uint32_t> visited_;
   NumberedText label_, unknown_;
-  std::string buffer_;     // of the value being put into words
+  std::string buffer_;     // of the current value
   uint64_t textSize_ = 0;  // of all lines so far
   uint32_t entries_ = 0;   // so far, of all directories
-  bool listing_ = false;   // the directory being walked shows lines
+  bool listing_ = false;   // the current directory is listed
   bool exifWalked_ = false, gpsWalked_ = false;
-  bool ended_ = false;  // a limit was met
+  bool ended_ = false;  // a limit was reached
 };
 
 }  // namespace

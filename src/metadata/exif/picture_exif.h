@@ -6,17 +6,17 @@
 
 namespace fotomill {
 
-// How a picture has to be turned to be upright, as its EXIF block says.
+// How to turn a picture upright, from its EXIF block.
 Orientation OrientationOf(const PictureRecord& picture);
 
-// Turns a picture, and what its EXIF block and XMP packet say of it: the orientation becomes 1, and
-// a thumbnail of the old position is dropped. MemoryAllocationError leaves it unchanged.
+// Turns a picture and updates its EXIF block and XMP packet: the orientation becomes 1, and the old
+// thumbnail is dropped. MemoryAllocationError leaves it unchanged.
 Status TurnPicture(PictureRecord& picture, Orientation turn);
-// The same as its EXIF block asks; one that is upright already, or has no block, stays as it is.
+// Turns a picture by its EXIF orientation; no change if it is upright or has no block.
 Status TurnUpright(PictureRecord& picture);
 
-// Makes the EXIF block tell the truth about the picture as it is now, before it is written: its
-// sizes are the picture's.
+// Updates the EXIF block before the picture is written: sets the picture
+// size.
 void RefreshExif(PictureRecord& picture);
 
 }  // namespace fotomill

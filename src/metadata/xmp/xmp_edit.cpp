@@ -1,4 +1,4 @@
-// The orientation in an XMP packet, in one of its two forms:
+// The orientation in an XMP packet has one of two forms:
 //
 //   <rdf:Description ... tiff:Orientation="6" ...>
 //   <tiff:Orientation>6</tiff:Orientation>
@@ -19,8 +19,8 @@ constexpr std::string_view kName = "tiff:Orientation";
 
 bool IsBlank(uint8_t c) { return c == ' ' || c == '\t' || c == '\r' || c == '\n'; }
 
-// Where the value behind a name begins: beyond "=" and a quotation mark, or beyond ">"; the
-// packet's end when it does not.
+// The position of the value after a name: after "=" and a quotation mark, or after ">"; else the
+// end of the packet.
 size_t ValueBehind(std::span<const uint8_t> packet, size_t at) {
   const auto skipBlanks = [&] {
     while (at < packet.size() && IsBlank(packet[at])) ++at;
