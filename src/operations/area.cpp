@@ -11,7 +11,7 @@ int32_t Whole(double pixels) {
   return static_cast<int32_t>(std::floor(std::clamp(pixels, -1e9, 1e9) + 0.5));
 }
 
-// The largest size of a ratio within a picture.
+// The largest rectangle with this aspect ratio that fits in the picture.
 Size SizeOfRatio(double across, double down, Size picture) {
   const double width = picture.width, height = picture.height;
   const bool fullWidth = width * down <= height * across;

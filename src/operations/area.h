@@ -7,12 +7,12 @@
 
 namespace fotomill {
 
-// The rectangle that a parameter of that kind means within a picture of size `whole`, in whole
-// pixels. One with a place may be outside; a size or a ratio is placed by gravity and stays inside.
+// The rectangle of a rectangle parameter in a picture of size `whole`, in whole pixels. One with a
+// position may be outside; a size or ratio is placed by gravity and stays inside.
 Rectangle AreaOf(const Value& area, Size whole, const PictureMetadata& metadata,
                  Gravity gravity = Gravity::Center);
 
-// The point that a parameter of that kind means, in pixels from the top left corner.
+// The point given by a point parameter, in pixels from the top left corner.
 struct AreaPoint {
   double x, y;
 };

@@ -13,7 +13,7 @@ struct NamedColor {
   uint32_t rgb;
 };
 
-// In order of names. Source: W3C, CSS Color Module Level 4, section 6.1.
+// Sorted by name. Source: W3C, CSS Color Module Level 4, section 6.1.
 constexpr NamedColor kNamedColors[] = {
     {"aliceblue", 0xF0F8FF}, {"antiquewhite", 0xFAEBD7}, {"aqua", 0x00FFFF},
     {"aquamarine", 0x7FFFD4}, {"azure", 0xF0FFFF}, {"beige", 0xF5F5DC}, {"bisque", 0xFFE4C4},
@@ -61,7 +61,7 @@ constexpr NamedColor kNamedColors[] = {
 };
 static_assert(std::ranges::is_sorted(kNamedColors, {}, &NamedColor::name));
 
-// The value of a hexadecimal digit, -1 for anything else.
+// Value of a hexadecimal digit, -1 for other characters.
 constexpr int Digit(char c) {
   if (c >= '0' && c <= '9') return c - '0';
   c = LowerCase(c);

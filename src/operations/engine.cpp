@@ -19,7 +19,7 @@ OperationContext ContextOf(const EngineOptions& options) {
           .faces = options.faces};
 }
 
-// How many point operations stand at the start of the steps.
+// The number of leading point operations.
 size_t PointsAhead(std::span<const Step> steps) {
   const auto end = std::ranges::find_if(
       steps, [](const Step& step) { return step.operation->works != Works::Point; });
@@ -33,8 +33,8 @@ Status ApplyPoints(PictureRecord& picture, std::span<const Step> steps, const Wo
   return ApplyPointEffects(picture, effects, work);
 }
 
-// Runs steps without a look at metadata. `part`: on a part of a picture, of whose place the context
-// tells.
+// Runs steps without updating metadata. `part`: the picture is only part of the whole, at the
+// position in `context`.
 Status Run(PictureRecord& picture, std::span<const Step> steps, OperationContext& context,
            bool part) {
   while (!steps.empty()) {
@@ -109,7 +109,7 @@ Status CopyPicture(const PictureRecord& picture, PictureRecord& copy) {
 Status ApplyStepsToArea(const PictureRecord& picture, std::span<const Step> steps,
                         const Rectangle& area, const EngineOptions& options, PictureRecord& part) {
   if (picture.image.Empty()) return Status::EmptyImage;
-  // The steps at the end that can be computed for a part, and how far they reach together.
+  // The trailing steps that can be computed for part of a picture, and their total reach.
   size_t local = steps.size();
   int64_t reach = 0;
   while (local > 0 && IsLocal(*steps[local - 1].operation)) {

@@ -5,7 +5,7 @@
 
 namespace fotomill {
 
-// Where something is within something larger: choices of a parameter, in the order of kGravities.
+// Alignment within a larger area; values are indices into kGravities.
 enum class Gravity : int32_t {
   Center,
   Top,
@@ -17,13 +17,13 @@ enum class Gravity : int32_t {
   BottomLeft,
   BottomRight
 };
-// Words of a choice, in the order of the enumeration.
+// Words for a choice parameter, in enum order.
 inline constexpr const char* kGravities =
     "center|top|bottom|left|right|top-left|top-right|bottom-left|bottom-right";
 
-// The place of something of size `inner` within `outer`, `margin` pixels away from the edges that
-// it is drawn to. An odd pixel of the middle goes to the right and to the bottom. May be negative
-// where `inner` is larger.
+// Position of a rectangle of size `inner` within `outer`, with `margin` pixels to the edges it is
+// aligned to. When centering, the odd pixel goes to the right and bottom. May be negative if
+// `inner` is larger.
 constexpr Rectangle PlaceWithin(Size outer, Size inner, Gravity gravity, int32_t margin = 0) {
   constexpr int kAcross[] = {0, 0, 0, -1, 1, -1, 1, -1, 1},
                 kDown[] = {0, -1, 1, 0, 0, -1, -1, 1, 1};

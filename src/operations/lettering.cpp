@@ -14,14 +14,14 @@ namespace fotomill {
 namespace {
 
 constexpr uint8_t kShadowAlpha = 160;
-constexpr double kShadowSoftness = 2;  // sigma is the shadow's distance divided by this
-constexpr double kSigmas = 3;          // behind which a blur is not seen
+constexpr double kShadowSoftness = 2;  // sigma = shadow distance / this
+constexpr double kSigmas = 3;          // a blur is invisible beyond this
 
 Size Turned(double width, double height, double degrees) {
   const double radians = degrees * std::numbers::pi / 180;
   const double cosine = std::abs(std::cos(radians)), sine = std::abs(std::sin(radians));
   const auto edge = [](double length) {
-    constexpr double kAlmost = 1e-6;  // of a quarter turn, whose cosine is not quite 0
+    constexpr double kAlmost = 1e-6;  // for multiples of 90 degrees, whose cosine is not exactly 0
     return static_cast<int32_t>(std::clamp(std::ceil(length - kAlmost), 1.0, 1e9));
   };
   return {edge(width * cosine + height * sine), edge(width * sine + height * cosine)};
@@ -76,13 +76,13 @@ int32_t LetteringDrawing::Reach() const {
 Status LetteringDrawing::Draw(double x, double y, const Work& work, PictureRecord& layer) const {
   const Size size{layer.image.Width(), layer.image.Height()}, flat = Flat();
   PackedImage mask;
-  // Paints what `draw` adds to an empty mask.
+  // Paints a color through the mask filled by `draw`.
   const auto paint = [&](const AlphaColor& color, const auto& draw) {
     RETURN_IF_BAD(NewAlphaPlane(size.width, size.height, mask));
     if (const Status drawn = draw(); drawn != Status::Ok) return drawn;
     return PaintThroughMask(layer, mask, 0, 0, BackdropOf(color));
   };
-  // Even sizes have their center between pixels, odd ones on one.
+  // The center of even sizes is between two pixels, of odd ones on a pixel.
   const Shape outer{x, y, static_cast<double>(flat.width), static_cast<double>(flat.height),
                     lettering_.rotation, 0};
   Shape inner = outer;

@@ -10,48 +10,48 @@
 
 namespace fotomill {
 
-// A text with everything around it, as operations draw it. All lengths are in pixels.
+// A text with its decorations. Lengths are in pixels.
 struct Lettering {
   std::string font;
   double em = 24;
   TextLayout layout;
   AlphaColor color;
   double rotation = 0;            // degrees, clockwise
-  double outline = 0;             // a line around letters
+  double outline = 0;             // line around letters
   AlphaColor outlineColor;
-  double shadow = 0;              // how far behind and below the letters their shadow is
-  bool box = false;               // a box behind the text
+  double shadow = 0;              // offset of the shadow, down and to the right
+  bool box = false;               // draw a box behind the text
   AlphaColor boxColor;
   double padding = 0;             // from the text to the edge of the box or the frame
-  double frame = 0;               // a line around the box
+  double frame = 0;               // line around the box
 };
 
-// A lettering that is set and can be drawn.
+// A lettering with its text laid out, ready to draw.
 class LetteringDrawing {
  public:
-  // Sets a text, in which a line feed begins a new line. ResourceError without a font.
+  // Lays out a text; line feeds start new lines. ResourceError if the font is missing.
   Status Open(const Lettering& lettering, const std::string& text);
 
-  // What it covers, box and frame included, turned: whole pixels.
+  // Bounding box after rotation, including box and frame, in whole pixels.
   Size Bounds() const;
-  // How far shadow and outline may be outside of that.
+  // How far shadow and outline may extend beyond that.
   int32_t Reach() const;
-  // Draws it with its center at (x, y) of a layer: a picture of 24 bits with alpha. Statuses as
+  // Draws it centered at (x, y) on a layer: a 24-bit picture with alpha. Statuses of
   // NewPackedImage.
   Status Draw(double x, double y, const Work& work, PictureRecord& layer) const;
 
  private:
-  Size Flat() const;  // before it is turned
+  Size Flat() const;  // before rotation
 
   Lettering lettering_;
   TextFont font_;
   TextBlock block_;
 };
 
-// A layer of that size on which nothing is drawn. Statuses as NewPackedImage.
+// An empty, transparent layer. Statuses of NewPackedImage.
 Status NewLayer(Size size, PictureRecord& layer);
 
-// "\n" in a text as line feeds.
+// Replaces "\n" in a text with line feeds.
 std::string WithLineFeeds(std::string_view text);
 
 }  // namespace fotomill

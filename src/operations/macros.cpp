@@ -39,8 +39,8 @@ const MacroRow* FindMacro(char letter) {
   return found != std::end(kMacros) ? found : nullptr;
 }
 
-// The macro at the start of `text`, which begins with "%": its letter, its tag, and how long it is.
-// nullopt when it is none.
+// A macro at the start of `text`, which begins with "%": letter, tag and length. nullopt if it is
+// not a macro.
 struct Macro {
   char letter;
   std::string_view tag;
@@ -55,7 +55,7 @@ std::optional<Macro> MacroAt(std::string_view text) {
   return Macro{'E', text.substr(3, end - 3), end + 1};
 }
 
-// Calls `other` for each piece of plain text, and `macro` for each macro with the text from it on.
+// Calls `other` for each piece of plain text, and `macro` at each "%" with the rest of the text.
 void Scan(std::string_view text, const std::function<void(std::string_view)>& other,
           const std::function<size_t(std::string_view)>& macro) {
   while (!text.empty()) {
@@ -66,7 +66,7 @@ void Scan(std::string_view text, const std::function<void(std::string_view)>& ot
   }
 }
 
-// The text of the first entry of a tag.
+// Finds the text of the first entry with a given tag.
 class TagFinder : public ExifSink {
  public:
   explicit TagFinder(uint16_t tag) : tag_(tag) {}
@@ -81,7 +81,7 @@ class TagFinder : public ExifSink {
   std::optional<std::string> found_;
 };
 
-// Finds when the picture was taken: DateTimeOriginal, else DateTimeDigitized, else DateTime.
+// Finds the capture time: DateTimeOriginal, else DateTimeDigitized, else DateTime.
 class DateFinder : public ExifSink {
  public:
   void Directory(int32_t, std::string_view) override {}
@@ -166,7 +166,7 @@ std::string Expand(std::string_view text, const MacroFacts& facts, const Picture
   return expanded;
 }
 
-// The bytes of a macro that is none: the sign and the whole character behind it.
+// Bytes of an unknown macro: "%" and the character after it.
 size_t UnknownLength(std::string_view text) {
   if (text.size() < 2) return text.size();
   return 1 + std::max(CharacterLength(text.substr(1)), size_t{1});
@@ -178,7 +178,7 @@ RecordedText UnknownMacro(std::string_view text) {
                     text.substr(0, UnknownLength(text)));
 }
 
-// Empty unless the macro names a tag that does not exist.
+// An error if the macro names an unknown tag.
 RecordedText TagProblem(const Macro& macro) {
   if (macro.letter != 'E' || FindExifTagByName(macro.tag)) return {};
   RecordedText problem = TrRecorded("has an unknown EXIF tag \"%1\".", macro.tag);

@@ -10,37 +10,37 @@
 
 namespace fotomill {
 
-// A macro in texts and output names. Date and time are when the picture was taken, else when its
-// file was changed.
+// A macro in texts and output names. Date and time are those when the picture was taken, or else
+// the modification time of its file.
 struct MacroRow {
   char letter;
-  bool early;           // known before the picture is opened
-  const char* written;  // as people write it
-  const char* help;     // what it becomes, in English
+  bool early;           // known before opening the picture
+  const char* written;  // syntax: "%E{Tag}"
+  const char* help;     // what it expands to, in English
 };
 std::span<const MacroRow> Macros();
 
-// What a run knows beside the picture itself.
+// What macros need besides the picture itself.
 struct MacroFacts {
   std::string fileName;         // of the source, with folder and extension
-  std::string copyrightHolder;  // the key ExifCopyrightHolder; empty: the user's full name
-  int64_t modified = 0;         // of the source: seconds since 1970 UTC
+  std::string copyrightHolder;  // key ExifCopyrightHolder; empty: use the user's full name
+  int64_t modified = 0;         // modification time of the source: seconds since 1970 UTC
 };
 
-// `text` with its macros expanded; unknown ones stay as they are.
+// Expands the macros in `text`; unknown ones are kept.
 std::string ExpandMacros(std::string_view text, const MacroFacts& facts,
                          const PictureRecord& picture);
-// The same for a file name: "/", "\" and ":" of what macros bring in become "-", control characters
-// are left out.
+// The same for file names: "/", "\" and ":" in expansions become "-", control characters are
+// dropped.
 std::string ExpandNameMacros(std::string_view text, const MacroFacts& facts,
                              const PictureRecord& picture);
 
-// What is wrong with the macros of a text, as the end of a sentence: "has an unknown macro %Q".
-// Empty when nothing is.
+// What is wrong with the macros in a text, as the end of a sentence: "has an unknown macro %Q".
+// Empty if all are valid.
 RecordedText MacroProblem(std::string_view text);
 
-// Whether a text can be expanded before the picture is decoded and worked on: it has no macro about
-// the picture.
+// Whether a text can be expanded before the picture is decoded and processed, as it has no macros
+// about the picture.
 bool IsKnownEarly(std::string_view text);
 
 }  // namespace fotomill

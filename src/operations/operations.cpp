@@ -6,7 +6,7 @@ namespace fotomill {
 
 namespace {
 
-// Adding an operation changes its family's file only.
+// To add an operation, only change the file of its family.
 constexpr std::span<const Operation> (*kFamilies[])() = {
     CropOperations,   TransformOperations, EffectOperations,    PaletteOperations, FilterOperations,
     DistortOperations, AnnotateOperations, WatermarkOperations, MattOperations,

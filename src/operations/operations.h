@@ -7,23 +7,23 @@
 
 namespace fotomill {
 
-// All operations, in the order of families and within them as their files have them.
+// All operations, ordered by family, and within a family as in its file.
 std::span<const Operation* const> Operations();
 
-// The operation of that name; null when there is none.
+// Null if not found.
 const Operation* FindOperation(std::string_view name);
 
-// The rows of each family, from its own file in families/.
+// The operations of each family, from families/.
 std::span<const Operation> CropOperations();
-std::span<const Operation> TransformOperations();  // rotate, flip, resize and the like
-std::span<const Operation> EffectOperations();  // change colors point by point
-// of the family effects, the ones that choose new colors
+std::span<const Operation> TransformOperations();  // rotate, flip, resize, etc.
+std::span<const Operation> EffectOperations();  // per-pixel color changes
+// family Effects: operations that choose new colors
 std::span<const Operation> PaletteOperations();
-std::span<const Operation> FilterOperations();  // look at neighboring pixels
-// of the family filter, the ones that bend and scatter
+std::span<const Operation> FilterOperations();  // filters with a neighborhood
+// family Filter: operations that displace pixels
 std::span<const Operation> DistortOperations();
 std::span<const Operation> AnnotateOperations();  // text
-std::span<const Operation> WatermarkOperations();  // a second picture on top
+std::span<const Operation> WatermarkOperations();  // a text or a picture on top
 std::span<const Operation> MattOperations();  // frames and borders
 
 }  // namespace fotomill

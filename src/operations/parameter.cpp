@@ -27,7 +27,7 @@ constexpr UnitName kUnits[] = {{"px", LengthUnit::Pixels},
                                {"in", LengthUnit::Inches},
                                {"pt", LengthUnit::Points}};
 
-// Takes a decimal number off the start of `text`; no exponent, no infinity.
+// Removes a decimal number from the start of `text`; no exponent, no infinity.
 std::optional<double> TakeDecimal(std::string_view& text) {
   std::string_view rest = text;
   if (rest.starts_with('+')) rest.remove_prefix(1);
@@ -65,7 +65,7 @@ bool Take(std::string_view& text, char wanted) {
   return true;
 }
 
-// A number as people write it: no zeros behind the last digit that counts.
+// Formats a number without trailing zeros.
 std::string Decimal(double number) {
   char text[40];
   std::snprintf(text, sizeof text, "%.10g", number);
@@ -96,7 +96,7 @@ RecordedText ReadNumber(const Parameter& row, std::string_view text, Value& valu
   return {};
 }
 
-// Checks the number of a length by the row's limits.
+// Checks a length against the row's limits.
 RecordedText CheckLength(const Parameter& row, const Length& length) {
   return InLimits(row, length.number) ? RecordedText() : OutOfLimits(row);
 }
@@ -142,7 +142,7 @@ RecordedText ReadRectangle(const Parameter& row, std::string_view text, Value& v
     return TrRecorded("must have a width and a height above 0");
   if (!value.ratio && !text.empty()) {
     value.hasPlace = true;
-    // "+10" and "-10": the sign belongs to the number.
+    // In "+10" and "-10", the sign is part of the number.
     if ((text[0] != '+' && text[0] != '-') || !TakeLength(text, value.x) || text.empty() ||
         (text[0] != '+' && text[0] != '-') || !TakeLength(text, value.y)) {
       return TrRecorded(kForms);

@@ -17,7 +17,7 @@ std::string PathOf(const std::string& name) {
   return plain && !platform::FileExists(name) ? DataFile(name) : name;
 }
 
-// The picture that was asked for last, and what its file was then.
+// The last picture loaded, and the state of its file then.
 struct Kept {
   std::string path;
   int64_t modified = 0;

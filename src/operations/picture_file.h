@@ -9,13 +9,13 @@
 
 namespace fotomill {
 
-// The picture that a parameter names: a name without a folder is looked for in the current folder,
-// then in the data folder. Upright as its EXIF says, of 24 bits, with its alpha plane if it has
-// one. The last one is kept, so that a batch decodes its logo once. From any thread. Statuses as
+// Loads the picture named by a parameter: a name without folder is searched in the current
+// folder, then in the data folder. Result: upright by EXIF, 24 bits, with alpha plane if present.
+// The last picture is cached, so a batch decodes its logo once. Thread-safe. Statuses of
 // LoadPicture.
 Status LoadPictureFile(const std::string& name, std::shared_ptr<const PictureRecord>& picture);
 
-// What is wrong with such a name, as the end of a sentence; empty when the file is a picture.
+// What is wrong with such a file, as the end of a sentence; empty if it is a picture.
 RecordedText PictureFileProblem(const std::string& name);
 
 }  // namespace fotomill

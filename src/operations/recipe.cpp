@@ -39,7 +39,7 @@ bool IsName(std::string_view text) {
   });
 }
 
-// A color key's number, 0x00BBGGRR, as recipes write it.
+// Formats the number of a color key, 0x00BBGGRR, in recipe syntax.
 std::string ColorText(std::string_view number) {
   const auto value = ParseNumber<int32_t>(number);
   if (!value) return {};
@@ -50,7 +50,7 @@ std::string ColorText(std::string_view number) {
   return text;
 }
 
-// What a key's value means as the text of a parameter; empty when it cannot.
+// Converts a key's value to the text of a parameter; empty if not possible.
 std::string KeyText(const Parameter& row, const KeyValues& keys) {
   if (*row.key == '\0' || !keys) return {};
   std::string text = keys(row.key);
@@ -64,13 +64,13 @@ std::string KeyText(const Parameter& row, const KeyValues& keys) {
   return ReadValue(row, text, value).empty() ? text : std::string();
 }
 
-// What is wrong with a value beyond its kind.
+// Parses a value and checks it beyond its kind; returns what is wrong.
 RecordedText ReadChecked(const Parameter& row, std::string_view text, Value& value) {
   RecordedText wrong = ReadValue(row, text, value);
   return wrong.empty() && row.kind == kText ? MacroProblem(text) : wrong;
 }
 
-// Gives every parameter without a value its default.
+// Sets all parameters without a value to their defaults.
 void FillDefaults(Arguments& arguments, const KeyValues& keys) {
   for (size_t i = 0; i < arguments.Rows().size(); ++i) {
     Value& value = arguments.At(i);
@@ -200,7 +200,7 @@ class Reader {
     Current().hasSave = true;
   }
 
-  // Fills the arguments from the words behind the first. False after a mistake.
+  // Parses the arguments after the operation's name. False on errors.
   bool ReadArguments(const RecipeLine& line, Arguments& arguments) {
     const size_t before = mistakes_.size();
     size_t next = 0;
@@ -247,7 +247,7 @@ class Reader {
     }
     if (arguments.At(place).given)
       return AddMistake(line.number, operation, rows[place].name, TrRecorded("is given twice"));
-    // An empty value is that of a parameter that is not set.
+    // an empty value leaves an optional parameter unset
     const bool unset =
         value.empty() && rows[place].preset != nullptr && *rows[place].preset == '\0';
     if (unset) return;

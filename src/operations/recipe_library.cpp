@@ -20,7 +20,7 @@ struct ShippedRecipe {
   const char* text;
 };
 
-// In order of names.
+// Sorted by name.
 constexpr ShippedRecipe kShipped[] = {
     {"black-and-white", R"(# Black and white with a little more contrast
 gray

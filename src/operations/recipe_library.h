@@ -6,20 +6,20 @@
 
 namespace fotomill {
 
-// Recipes by name: files "NAME.recipe" in the folder "recipes" of the data folder, and those that
-// come with the program. A file of the same name takes the place of the program's own.
+// Recipes by name: files "NAME.recipe" in the folder "recipes" of the data folder, and those built
+// into the program. Files take precedence over built-in recipes of the same name.
 
-// A recipe of the user's library.
+// A recipe in the library.
 struct NamedRecipe {
   std::string name;
-  std::string path;  // empty: comes with the program
+  std::string path;  // empty: built in
 };
-// All of them in order of names.
+// All recipes, sorted by name.
 std::vector<NamedRecipe> ListRecipes();
 
-// Finds a recipe as people name it. With a separator or the ending ".recipe" it is a file; else a
-// recipe's name; else a file. Empty when done, else what is wrong, as a sentence. `path` is empty
-// for recipes that come with the program.
+// Finds a recipe by name or file: with a path separator or the extension ".recipe" it is a file;
+// else a recipe's name, or else a file. Empty on success, else what is wrong, as a sentence. `path`
+// is empty for built-in recipes.
 std::string FindRecipe(const std::string& nameOrFile, std::string& text, std::string& path);
 
 }  // namespace fotomill

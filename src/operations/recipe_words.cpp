@@ -34,7 +34,7 @@ class Splitter {
     }
   }
 
-  // Takes a quoted part of a word, or one character.
+  // Parses a quoted part of a word, or one character.
   void ReadPart() {
     const char c = text_[at_++];
     if (c == '\'') return ReadQuoted('\'', false);

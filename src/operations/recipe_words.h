@@ -7,24 +7,24 @@
 
 namespace fotomill {
 
-// One word of a recipe, its quotes resolved.
+// A word of a recipe, unquoted.
 struct RecipeWord {
   std::string text;
-  size_t equals = std::string::npos;  // place of the first "=" that is not quoted
-  bool quoted = false;                // any of it was
+  size_t equals = std::string::npos;  // position of the first unquoted "="
+  bool quoted = false;                // part of it was quoted
 };
 
 // The words of one operation.
 struct RecipeLine {
-  int32_t number = 0;  // from 1: where it begins
+  int32_t number = 0;  // from 1: where it starts
   std::vector<RecipeWord> words;
-  bool open = false;  // its last quote does not end
+  bool open = false;  // has an unterminated quote
 };
 
-// Cuts a recipe into lines of words; comments and empty lines are left out.
+// Splits a recipe into lines of words, without comments and empty lines.
 std::vector<RecipeLine> SplitRecipe(std::string_view text);
 
-// A word as a recipe holds it: quoted where it has to be.
+// Quotes a word for a recipe if needed.
 std::string QuotedWord(std::string_view text);
 
 }  // namespace fotomill

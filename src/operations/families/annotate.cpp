@@ -81,7 +81,7 @@ constexpr Parameter kTexts[] = {
 };
 // clang-format on
 
-// What both operations have in common.
+// Properties common to both operations.
 Lettering StyleOf(const PictureRecord& picture, const Arguments& arguments) {
   const double dpi = picture.metadata.dpiY;
   Lettering style;
@@ -125,7 +125,7 @@ Status Caption(PictureRecord& picture, const Arguments& arguments,
   }
   PackedImage mask;
   RETURN_IF_BAD(NewAlphaPlane(whole.width, height, mask));
-  // The block's center, so that its edge is at the padding where it is not in the middle.
+  // Center of the block; puts its edge at the padding if it is not centered.
   const double room = std::max((style.layout.width - block.width) / 2, 0.0);
   const double aside[] = {-room, 0, room};
   const double x = whole.width / 2.0 + aside[arguments.Choice("align")];

@@ -9,14 +9,14 @@
 #include "processing/geometry/canvas.h"
 #include "processing/geometry/cut.h"
 
-// Crop: what is cut off, and what is added around.
+// Crop: removes or adds edges.
 namespace fotomill {
 
 namespace {
 
 using enum ParameterKind;
 
-// The nine places and, as the last choice, the faces.
+// The nine positions, and the faces as the last choice.
 constexpr char kGravitiesAndFaces[] =
     "center|top|bottom|left|right|top-left|top-right|bottom-left|bottom-right|faces";
 constexpr int32_t kToFaces = 9;
@@ -37,7 +37,7 @@ constexpr Parameter kCrop[] = {
      .help = "Which part to keep if the area has no position; faces: around the faces, or the center if there are none."},
 };
 
-// Moves an area so that the middle of the faces comes as close to its middle as the picture allows.
+// Moves an area to center it on the faces, as far as the picture allows.
 Status MoveToFaces(const PictureRecord& picture, const OperationContext& context, Rectangle& area) {
   std::vector<Rectangle> faces;
   RETURN_IF_BAD(FindFaces(picture.image, context.faces, faces, context.work.goesOn));

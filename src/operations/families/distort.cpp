@@ -5,7 +5,7 @@
 #include "processing/filters/scatter.h"
 #include "processing/geometry/distort.h"
 
-// Filters that bend and scatter pixels.
+// Filters that displace pixels.
 namespace fotomill {
 
 namespace {

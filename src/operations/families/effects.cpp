@@ -11,7 +11,7 @@
 #include "processing/color/vignette.h"
 #include "processing/promote.h"
 
-// Effects: colors and brightness, without a look at neighbors.
+// Effects: per-pixel changes of color and brightness.
 namespace fotomill {
 
 namespace {
@@ -177,7 +177,7 @@ void Curves(const Arguments& arguments, PointEffect& effect) {
   effect = CurveEffect(knots, arguments.Choice<CurveChannel>("channel"));
 }
 
-// Effects on colors alone have no use for transparent ones.
+// Effects have no use for transparent colors.
 ArgumentProblem CheckOpaque(const Arguments& arguments) {
   for (size_t i = 0; i < arguments.Rows().size(); ++i) {
     const Parameter& row = arguments.Rows()[i];
@@ -223,7 +223,7 @@ Status Equalize(PictureRecord& picture, const Arguments& arguments,
   return ApplyPointEffects(picture, std::span(&effect, 1), context.work);
 }
 
-// Nine percentages between blanks or commas, as factors.
+// Parses nine percentages, separated by blanks or commas, as factors.
 std::optional<MixMatrix> ReadMix(std::string_view text) {
   MixMatrix matrix{};
   size_t count = 0;
@@ -255,7 +255,7 @@ ArgumentProblem CheckChannels(const Arguments& arguments) {
           TrRecorded("must be nine numbers from -200 to 200, such as \"100 0 0 0 100 0 0 0 100\"")};
 }
 
-// The picture becomes its alpha plane in gray; white without one.
+// Replaces the picture with its alpha plane in gray; white if it has none.
 Status KeepAlpha(PictureRecord& picture) {
   RETURN_IF_BAD(PromotePicture(picture));
   const int32_t width = picture.image.Width();
@@ -286,7 +286,7 @@ Status Channels(PictureRecord& picture, const Arguments& arguments,
   return ApplyPointEffects(picture, std::span(&effect, 1), context.work);
 }
 
-// Looks at no neighbors, but a part of a picture tells its place.
+// Uses no neighbors; but the engine must pass the position of a part.
 int32_t NoReach(const Arguments&) { return 0; }
 
 Status Vignetted(PictureRecord& picture, const Arguments& arguments,

@@ -15,7 +15,7 @@
 #include "processing/filters/rank.h"
 #include "processing/filters/surface_blur.h"
 
-// Filters: what becomes of a pixel depends on its neighbors.
+// Filters: each pixel depends on its neighbors.
 namespace fotomill {
 
 namespace {
@@ -189,7 +189,7 @@ constexpr Parameter kKernel[] = {
      .help = "Added to the result."},
 };
 
-// Numbers with blanks or commas between them; empty when something else is in the text.
+// Parses numbers separated by blanks or commas; empty if invalid.
 std::vector<double> NumbersOf(const std::string& text) {
   std::vector<double> numbers;
   const char *at = text.data(), *end = at + text.size();
@@ -228,8 +228,8 @@ int32_t ReachOfKernel(const Arguments& arguments) {
   return KernelReach(NumbersOf(arguments.Text("weights")).size());
 }
 
-// A rectangle of the whole picture, seen from the part that is computed; without one, all of the
-// picture.
+// Converts a rectangle of the whole picture to coordinates of the computed part; without one, the
+// whole part.
 Rectangle AreaOfPart(const PictureRecord& picture, const Value& area,
                      const OperationContext& context) {
   const Size own{picture.image.Width(), picture.image.Height()},
@@ -267,7 +267,7 @@ Status RedEye(PictureRecord& picture, const Arguments& arguments, const Operatio
   if (!arguments.Flag("faces")) return RemoveRedEye(picture, area, ratio);
   std::vector<Rectangle> faces;
   RETURN_IF_BAD(FindFaces(picture.image, context.faces, faces, context.work.goesOn));
-  constexpr double kBeyondSkin = 0.6;  // pupils around which there is skin are told by more red
+  constexpr double kBeyondSkin = 0.6;  // stronger red needed to tell pupils from skin around them
   for (const Rectangle& face : faces)
     RETURN_IF_BAD(RemoveRedEyesOfFace(picture, face, area, ratio + kBeyondSkin));
   return Status::Ok;
@@ -276,7 +276,7 @@ ArgumentProblem CheckRedEye(const Arguments& arguments) {
   if (arguments.Has("area") || arguments.Flag("faces")) return {};
   return {"area", TrRecorded("must be given, or faces")};
 }
-// Faces are looked for in the whole picture.
+// Faces are detected in the whole picture.
 int32_t ReachOfRedEye(const Arguments& arguments) { return arguments.Flag("faces") ? 1 << 24 : 0; }
 
 constexpr Operation kOperations[] = {

@@ -81,13 +81,13 @@ Size SizeOf(const PictureRecord& picture) {
   return {picture.image.Width(), picture.image.Height()};
 }
 
-// A length in whole pixels, a percentage being of the shorter edge.
+// A length in whole pixels; percentages are of the shorter edge.
 int32_t Pixels(const PictureRecord& picture, const Arguments& arguments, const char* name) {
   const Size size = SizeOf(picture);
   return arguments.Pixels(name, std::min(size.width, size.height), picture.metadata.dpiX);
 }
 
-// Adds a frame of one color; whole pixels, so that palettes stay where they can.
+// Adds a frame of one color; in whole pixels, so that palettes can be kept.
 Status Enlarge(PictureRecord& picture, int32_t left, int32_t top, int32_t right, int32_t bottom,
                const AlphaColor& color) {
   const Size size = SizeOf(picture);
@@ -103,7 +103,7 @@ Status Enlarge(PictureRecord& picture, int32_t all, const AlphaColor& color) {
   return Enlarge(picture, all, all, all, all, color);
 }
 
-// The size of the matte: plain numbers are in `units`.
+// Size of the matte; plain numbers are in `units`.
 int32_t MattSize(const PictureRecord& picture, const Arguments& arguments) {
   constexpr LengthUnit kUnits[] = {LengthUnit::Inches, LengthUnit::Centimeters, LengthUnit::Pixels};
   const Value& value = arguments.Of("size");
@@ -133,7 +133,7 @@ ArgumentProblem CheckMatt(const Arguments& arguments) {
   return problem.empty() ? ArgumentProblem{} : ArgumentProblem{"texture", problem};
 }
 
-// Covers the matte, which surrounds `window`, with a texture.
+// Fills the matte around `window` with a texture.
 Status PaintTexture(PictureRecord& picture, const Rectangle& window, const std::string& name) {
   std::shared_ptr<const PictureRecord> loaded;
   RETURN_IF_BAD(LoadPictureFile(name, loaded));
@@ -156,13 +156,13 @@ Status PaintTexture(PictureRecord& picture, const Rectangle& window, const std::
   return Status::Ok;
 }
 
-// Light and shade along the edge of `window`, mitered at its corners.
+// Light and shade along the edge of `window`, mitered at the corners.
 Status PaintBevel(PictureRecord& picture, const Rectangle& window, int32_t width,
                   const Arguments& arguments) {
   const uint8_t alpha = AlphaOfPercent(arguments.Number("intensity"));
   const bool raised = arguments.Choice<Bevel>("bevel") == Bevel::Raised;
   const Backdrop light{255, 255, 255, alpha}, shade{0, 0, 0, alpha};
-  // The edges of a sunken window that face the light are those on the right and at the bottom.
+  // On a sunken window, the right and bottom edges face the light.
   const Backdrop &upper = raised ? light : shade, &lower = raised ? shade : light;
   for (int32_t i = 1; i <= width; ++i) {
     const int32_t left = window.x - i, top = window.y - i;
@@ -198,7 +198,7 @@ Status Border(PictureRecord& picture, const Arguments& arguments, const Operatio
   return Enlarge(picture, Pixels(picture, arguments, "size"), arguments.Color("color"));
 }
 
-// What a shadow has of its picture: its alpha, or a rectangle; on a plane of `size` at (x, y).
+// The shape of the shadow: the picture's alpha, or a rectangle, at (x, y) on a plane of `size`.
 Status ShadowMask(const PictureRecord& picture, Size size, int32_t x, int32_t y,
                   PackedImage& mask) {
   RETURN_IF_BAD(NewAlphaPlane(size.width, size.height, mask));
@@ -215,7 +215,7 @@ Status ShadowMask(const PictureRecord& picture, Size size, int32_t x, int32_t y,
 }
 
 Status Shadow(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
-  constexpr double kSigmas = 3;  // behind which a blur is not seen
+  constexpr double kSigmas = 3;  // a blur is invisible beyond this
   const int32_t x = Pixels(picture, arguments, "x"), y = Pixels(picture, arguments, "y");
   const double sigma = arguments.Number("blur");
   const auto reach = static_cast<int32_t>(std::ceil(sigma * kSigmas));
@@ -230,8 +230,8 @@ Status Shadow(PictureRecord& picture, const Arguments& arguments, const Operatio
   PackedImage mask;
   RETURN_IF_BAD(ShadowMask(picture, size, left + x, top + y, mask));
   RETURN_IF_BAD(BlurMask(mask, sigma, context.work));
-  // The canvas, the shadow on it, and the picture above: on an own record, as the picture is its
-  // own top layer.
+  // The canvas, with the shadow and then the picture on top. A separate record, as the picture is a
+  // layer on it.
   PictureRecord canvas;
   RETURN_IF_BAD(NewPackedImage(size.width, size.height, nullptr, 24, canvas.image));
   canvas.bitsPerPixel = 24;

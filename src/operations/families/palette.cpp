@@ -60,7 +60,7 @@ constexpr Parameter kMono[] = {
 };
 // clang-format on
 
-// The standard palette with at most `colors` colors.
+// The largest standard palette with at most `colors` colors.
 PaletteChoice FixedPalette(int32_t colors) {
   struct Standard {
     int32_t colors, kind;  // of MakeDefaultPalette
@@ -74,7 +74,7 @@ PaletteChoice FixedPalette(int32_t colors) {
   return choice;
 }
 
-// The color table that the arguments name; empty when they name none.
+// The color table file named by the arguments; empty if none.
 std::string ColorTableFile(const Arguments& arguments) {
   const std::string& palette = arguments.Text("palette");
   for (const char* word : {"optimized", "fixed", "gray"}) {
@@ -85,7 +85,7 @@ std::string ColorTableFile(const Arguments& arguments) {
   return plain && !platform::FileExists(name) ? DataFile(name) : name;
 }
 
-// An error text, empty when the table was read.
+// Returns an error, empty on success.
 RecordedText LoadColorTable(const std::string& path, PaletteChoice& choice) {
   std::string contents;
   if (!platform::IsRegularFile(path) ||

@@ -13,7 +13,7 @@
 #include "processing/geometry/scale.h"
 #include "processing/geometry/skew.h"
 
-// Transform: size and position of whole pictures.
+// Transform: size and orientation of whole pictures.
 namespace fotomill {
 
 namespace {
@@ -71,12 +71,12 @@ int32_t Whole(double pixels) {
   return static_cast<int32_t>(std::floor(std::clamp(pixels, 1.0, 2147483646.0) + 0.5));
 }
 
-// What `resize` aims at: the size of the scaled picture, and that of the result.
+// The result of `resize`: size of the scaled picture, and of the final one.
 struct Target {
   Size scaled, result;
 };
 
-// Both edges of the picture scaled so that it fits into (or covers) a box.
+// Scales both edges proportionally to fit into (or cover) a box.
 Size Proportional(Size picture, double width, double height, bool cover) {
   const double across = width / picture.width, down = height / picture.height;
   const bool byWidth = cover ? across >= down : across <= down;
@@ -110,7 +110,7 @@ Target TargetOf(const Value& wanted, Mode mode, Size picture, const PictureMetad
   return {scaled, mode == Mode::Fit ? scaled : box};
 }
 
-// Whether `only` keeps the picture from being scaled.
+// Whether `only` prevents scaling.
 bool IsKept(const Arguments& arguments, Size picture, Size scaled) {
   if (!arguments.Has("only")) return false;
   const bool grows = scaled.width > picture.width || scaled.height > picture.height;
@@ -118,9 +118,8 @@ bool IsKept(const Arguments& arguments, Size picture, Size scaled) {
   return arguments.Choice<Only>("only") == Only::Shrink ? grows : shrinks;
 }
 
-// A picture that shrinks to half and less may be decoded smaller: smooth filters make the same of
-// it within a few levels. Nearest and box pick whole pixels, and light adds up otherwise than
-// levels.
+// A picture reduced to half or less may be decoded smaller: smooth filters give the same result
+// within a few levels. But nearest and box pick whole pixels, and in linear light sums differ.
 int32_t ResizeSide(const Arguments& arguments, Size whole, const PictureMetadata& metadata) {
   const ScaleFilter filter = kFilters[arguments.Choice("filter")];
   if (arguments.Flag("linear") || filter == ScaleFilter::Nearest || filter == ScaleFilter::Box)

@@ -13,14 +13,14 @@
 #include "processing/geometry/scale.h"
 #include "processing/promote.h"
 
-// Watermarks: a text or a picture over a picture.
+// Watermarks: a text or picture on top of a picture.
 namespace fotomill {
 
 namespace {
 
 using enum ParameterKind;
 
-constexpr double kTrialEm = 100;  // at which a text is measured
+constexpr double kTrialEm = 100;  // font size for measuring a text
 
 // clang-format off
 constexpr Parameter kWatermark[] = {
@@ -48,7 +48,7 @@ constexpr Parameter kWatermark[] = {
 };
 // clang-format on
 
-// A text that was written down comes before a picture of the configuration.
+// An explicit text takes precedence over a picture from the settings.
 bool IsPicture(const Arguments& arguments) {
   const Value& picture = arguments.Of("picture");
   return picture.given && !picture.text.empty() &&
@@ -64,12 +64,12 @@ ArgumentProblem Check(const Arguments& arguments) {
   return problem.empty() ? ArgumentProblem{} : ArgumentProblem{"picture", problem};
 }
 
-// How much larger something of a size becomes when it fills a share of the picture.
+// The factor that scales an object to a share of the picture.
 double Factor(double width, double height, Size whole, double share) {
   return std::min(whole.width / std::max(width, 1.0), whole.height / std::max(height, 1.0)) * share;
 }
 
-// A layer with the text, with the room that shadow and outline need on all sides.
+// A layer with the text, with margins for shadow and outline.
 Status TextLayer(const PictureRecord& picture, const Arguments& arguments,
                  const OperationContext& context, PictureRecord& layer, int32_t& reach) {
   const Size whole{picture.image.Width(), picture.image.Height()};
@@ -97,7 +97,7 @@ Status TextLayer(const PictureRecord& picture, const Arguments& arguments,
   return drawing.Draw(room.width / 2.0, room.height / 2.0, context.work, layer);
 }
 
-// A layer with the picture, scaled and turned.
+// A layer with the scaled and rotated picture.
 Status PictureLayer(const PictureRecord& picture, const Arguments& arguments,
                     const OperationContext& context, PictureRecord& layer) {
   std::shared_ptr<const PictureRecord> mark;
@@ -132,7 +132,7 @@ Status Watermark(PictureRecord& picture, const Arguments& arguments,
                  const OperationContext& context) {
   const Size whole{picture.image.Width(), picture.image.Height()};
   PictureRecord layer;
-  int32_t reach = 0;  // of the layer around what counts for its place
+  int32_t reach = 0;  // margin of the layer that does not count for alignment
   RETURN_IF_BAD(IsPicture(arguments) ? PictureLayer(picture, arguments, context, layer)
                                      : TextLayer(picture, arguments, context, layer, reach));
   const int32_t margin = arguments.Pixels("margin", std::min(whole.width, whole.height),
@@ -145,7 +145,7 @@ Status Watermark(PictureRecord& picture, const Arguments& arguments,
     return PaintPicture(picture, layer, first.x - reach, first.y - reach, opacity);
   const int64_t across = std::max(int64_t{inner.width} + margin, int64_t{1}),
                 down = std::max(int64_t{inner.height} + margin, int64_t{1});
-  // The first tile that is seen, counted from the one that gravity places.
+  // The first visible tile, counted from the one placed by gravity.
   const auto start = [](int64_t place, int64_t length, int64_t step) {
     return place - (place + length + step - 1) / step * step;
   };
