@@ -64,6 +64,19 @@ void ApplyMix(const MixTables& tables, uint8_t* bgr, size_t pixels) {
   }
 }
 
+PointEffect EffectOfTables(std::shared_ptr<const MixTables> tables) {
+  PointEffect effect;
+  effect.colors = [tables](uint8_t* bgr, size_t pixels) { ApplyMix(*tables, bgr, pixels); };
+  effect.after = [tables](const std::array<ChannelTable, 3>& first) {
+    const auto both = std::make_shared<MixTables>();
+    for (size_t c = 0; c < 3; ++c) {
+      for (size_t v = 0; v < 256; ++v) both->parts[c][v] = tables->parts[c][first[c][v]];
+    }
+    return EffectOfTables(both);
+  };
+  return effect;
+}
+
 constexpr MixMatrix kSame = {{{1, 0, 0, 0}, {0, 1, 0, 0}, {0, 0, 1, 0}}};
 constexpr MixMatrix kGray = {
     {{0.299, 0.587, 0.114, 0}, {0.299, 0.587, 0.114, 0}, {0.299, 0.587, 0.114, 0}}};
@@ -174,9 +187,7 @@ PointEffect MixEffect(const MixMatrix& matrix) {
       }
     }
   }
-  PointEffect effect;
-  effect.colors = [tables](uint8_t* bgr, size_t pixels) { ApplyMix(*tables, bgr, pixels); };
-  return effect;
+  return EffectOfTables(tables);
 }
 
 PointEffect GrayEffect() { return MixEffect(kGray); }

@@ -28,7 +28,12 @@ void ApplyTables(const std::array<ChannelTable, 3>& tables, uint8_t* bgr, size_t
 std::vector<PointEffect> Merged(std::span<const PointEffect> effects) {
   std::vector<PointEffect> merged;
   for (const PointEffect& effect : effects) {
-    if (merged.empty() || !merged.back().IsTable() || !effect.IsTable()) {
+    const bool behindTable = !merged.empty() && merged.back().IsTable();
+    if (behindTable && effect.after) {
+      merged.back() = effect.after(merged.back().tables);
+      continue;
+    }
+    if (!behindTable || !effect.IsTable()) {
       merged.push_back(effect);
       continue;
     }

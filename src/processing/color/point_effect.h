@@ -20,6 +20,8 @@ struct PointEffect {
   std::array<ChannelTable, 3> tables{};                         // blue, green, red
   // replaces the tables if set
   std::function<void(uint8_t* bgr, size_t pixels)> colors = {};
+  // of `colors`: an effect equal to these tables followed by this one, if it can absorb them
+  std::function<PointEffect(const std::array<ChannelTable, 3>& first)> after = {};
 
   bool IsTable() const { return !colors; }  // channels are independent
 };
@@ -34,7 +36,7 @@ constexpr uint8_t RoundedLevel(double value) {
 }
 
 // Applies effects in order in a single pass; adjacent tables are merged
-// first. For palette pictures only the palette is changed; 24-bit pictures
+// first, also into an effect that absorbs them. For palette pictures only the palette is changed; 24-bit pictures
 // are changed row by row. The result equals that of separate passes.
 // FunctionCancelled (4) leaves the picture half done; EmptyImage without one.
 Status ApplyPointEffects(PictureRecord& picture, std::span<const PointEffect> effects,
