@@ -75,6 +75,7 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
   orient_->SetValue(settings.ExifAdjustOrientation != 0);
   metadata_->SetValue(settings.PreserveEXIF != 0);
   for (wxCheckBox* box : {reduce_, orient_, metadata_}) sizer->Add(box, below);
+  orient_->Show(sizes_.empty());  // operations always do
 
   preview_ = new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize,
                               wxST_NO_AUTORESIZE | wxST_ELLIPSIZE_MIDDLE);
