@@ -68,21 +68,31 @@ def limits(work):
 
 
 def reduced(work):
-    """Reduced-size decoding differs by at most 3 levels; a no-op as first step prevents it."""
+    """Reduced-size decoding differs by at most 3 levels; a no-op as first step prevents it, and so
+    do filters that select pixels, linear light, CMYK, and small pictures."""
+    def apart(source, line):
+        pictures = []
+        for i, steps in enumerate((line, "offset 0 0; " + line)):
+            target = work / f"{i}.png"
+            apply(work / source, "--do", steps, "--to", "png", "--out", target, "--overwrite",
+                  "replace")
+            pictures.append(Image.open(target).convert("RGB"))
+        if pictures[0].size != pictures[1].size:
+            faults.append(f"{source}: {line}: {pictures[0].size}, not {pictures[1].size}")
+            return 0
+        return max(ImageStat.Stat(ImageChops.difference(*pictures)).mean)
     for source in ("a.jpg", "odd.jpg", "turned.jpg"):
         for line in ("resize 300", "resize 12%", "resize 200x200 fill",
                      "resize 250x80 stretch filter=lanczos3", "resize 100 filter=mitchell"):
-            pictures = []
-            for i, steps in enumerate((line, "offset 0 0; " + line)):
-                target = work / f"{i}.png"
-                apply(work / source, "--do", steps, "--to", "png", "--out", target, "--overwrite",
-                      "replace")
-                pictures.append(Image.open(target).convert("RGB"))
-            if pictures[0].size != pictures[1].size:
-                faults.append(f"{source}: {line}: {pictures[0].size}, not {pictures[1].size}")
-                continue
-            apart = max(ImageStat.Stat(ImageChops.difference(*pictures)).mean)
-            expect(f"{source}: {line}: {apart} levels apart", apart <= 3)
+            levels = apart(source, line)
+            expect(f"{source}: {line}: {levels} levels apart", levels <= 3)
+    expect("nothing was decoded smaller", apart("a.jpg", "resize 300") > 0)
+    for source, line in (("a.jpg", "resize 300 filter=nearest"), ("a.jpg", "resize 150 filter=box"),
+                         ("a.jpg", "resize 300 linear"), ("a.jpg", "resize 900"),
+                         ("a.jpg", "resize 100 only=grow"), ("ink.jpg", "resize 300"),
+                         ("small.jpg", "resize 60")):
+        levels = apart(source, line)
+        expect(f"{source}: {line}: decoded smaller, {levels} levels apart", levels == 0)
 
 
 def hints(work):
@@ -105,6 +115,8 @@ with tempfile.TemporaryDirectory() as name:
     folder = Path(name)
     photo(1600, 1200).save(folder / "a.jpg", quality=90)
     photo(1603, 1201).save(folder / "odd.jpg", quality=90)
+    photo(1600, 1200).convert("CMYK").save(folder / "ink.jpg", quality=90)
+    photo(500, 300).save(folder / "small.jpg", quality=90)
     exif = Image.Exif()
     exif[0x0112] = 6
     photo(1603, 1201).save(folder / "turned.jpg", quality=90, exif=exif)
