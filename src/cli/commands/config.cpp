@@ -18,7 +18,7 @@ namespace fotomill::cli {
 
 namespace {
 
-constexpr size_t kTextWidth = 76;  // of explanations
+constexpr size_t kTextWidth = 76;  // for descriptions
 
 struct ConfigOptions {
   bool json = false;
@@ -27,7 +27,7 @@ struct ConfigOptions {
   bool dryRun = false;
 };
 
-// Configuration texts are bytes. If they are not UTF-8, they are read as Latin-1.
+// Configuration texts are bytes. Invalid UTF-8 is treated as Latin-1.
 std::string JsonText(std::string_view text) {
   if (IsUtf8(text)) return std::string(text);
   std::string wide;
@@ -69,7 +69,7 @@ void PrintProblem(const CommandContext& context, std::string_view message) {
                static_cast<int>(message.size()), message.data());
 }
 
-// The rows of all named keys; false, after a message, if one is unknown.
+// Finds the rows of the given keys; false, after printing a message, for an unknown key.
 bool FindKeys(const CommandContext& context, std::vector<const KeyRow*>& rows) {
   for (const std::string& name : context.names.values) {
     rows.push_back(FindKey(name));
@@ -90,7 +90,7 @@ void NoteUnused(const CommandContext& context, ResultOutput& output, const KeyRo
     output.Note(std::string("fotomill: ") + context.command->name + ": " + UnusedKeyText(row));
 }
 
-// What a key does, in lines below it.
+// Prints the description of a key, indented.
 void Explain(ResultOutput& output, const KeyRow& row) {
   const auto line = [&](const std::string& text) { output.Line("    " + output.Shown(text)); };
   line(Tr("Default: %1", ReadableDefault(row)));
@@ -146,7 +146,7 @@ int RunGet(const ConfigOptions& options, const CommandContext& context) {
   return kExitOk;
 }
 
-// Makes or, in a dry run, only shows one change: "KEY: OLD -> NEW".
+// Makes a change, or only shows it in a dry run: "KEY: OLD -> NEW".
 int Change(const ConfigOptions& options, const CommandContext& context, const KeyRow& row,
            const SettingValue* value) {
   const std::string before = ValueText(row);

@@ -28,7 +28,7 @@ struct SheetOptions {
   std::string to, dest;
   std::string frame = "raised";
   std::string background;
-  int32_t columns = 0, rows = 0;  // 0: as the settings say
+  int32_t columns = 0, rows = 0;  // 0: use settings
   int32_t cell = 96;
   int32_t pageWidth = 0, pageHeight = 0;
   int32_t jobs = 0;
@@ -45,7 +45,7 @@ constexpr const char* kNoFont = TrLater(
     "fonts-dejavu-core).");
 constexpr Color kPaper = 0xFFFFFF;
 
-// A color written as RRGGBB.
+// Parses RRGGBB.
 std::optional<Color> ColorOf(std::string_view text) {
   uint32_t value = 0;
   if (text.starts_with('#')) text.remove_prefix(1);
@@ -60,7 +60,7 @@ int32_t FirstAbove0(int32_t option, int32_t setting, int32_t usual) {
   return setting > 0 && setting <= kMostCells ? setting : usual;
 }
 
-// Fills `look`. Returns what is wrong with the options, a whole sentence; empty if nothing is.
+// Fills `look`. Returns an error message, empty on success.
 std::string ReadLook(const SheetOptions& options, CatalogLook& look) {
   look.columns = FirstAbove0(options.columns, settings.CatalogLandscapeWide, kColumns);
   look.rows = FirstAbove0(options.rows, settings.CatalogLandscapeDeep, kRows);

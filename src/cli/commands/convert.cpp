@@ -36,18 +36,18 @@ namespace fotomill::cli {
 namespace {
 
 struct ConvertOptions {
-  bool apply = false;  // the command is `apply`: operations are needed, a format is not
+  bool apply = false;  // for `apply`: operations are required, a format is not
   SelectionOptions selection;
   std::string to;
   std::string dest;
   std::string out;
-  std::vector<std::string> prefix;  // as often as it is given; the last one counts
+  std::vector<std::string> prefix;  // all occurrences; the last one applies
   std::string steps, recipe;        // --do, --recipe
-  std::string overwrite;  // empty: ask where someone can answer, else keep both
+  std::string overwrite;  // empty: ask if possible, else keep both
   std::string metadata = "keep";
-  std::string profile = "keep";  // "keep", "srgb", or a file
-  std::string quality;           // "keep" or 1 to 100; empty: as configured
-  std::string page;              // "all" or from 1; empty: none chosen
+  std::string profile = "keep";  // "keep", "srgb", or a file name
+  std::string quality;           // "keep" or 1 to 100; empty: use settings
+  std::string page;              // "all" or a number from 1; empty: not given
   int32_t jobs = 0;
   bool reduce = false;
   bool salvage = false;
@@ -61,8 +61,8 @@ struct ConvertOptions {
 constexpr size_t kLongestPrefix = SettingPrefix::Capacity();
 constexpr uint64_t kMostProfileBytes = 8 << 20;
 
-// The option decides if given, else the settings. If the settings say ask and no one can answer,
-// both files are kept.
+// The option overrides the settings. If the settings say ask but prompting is not possible, both
+// files are kept.
 void SetOverwritePolicy(const ConvertOptions& options, const CommandContext& context,
                         BatchJob& job) {
   const std::string& how = options.overwrite;
@@ -96,7 +96,7 @@ BatchFunction FunctionOf(const ConvertOptions& options, const Recipe* recipe) {
   return function;
 }
 
-// Reads --quality and --page. What is wrong with them, or empty.
+// Parses --quality and --page. Returns an error message, empty on success.
 std::string ReadNumbers(const ConvertOptions& options, const Recipe* recipe,
                         BatchFunction& function, BatchJob& job) {
   const std::string& quality = options.quality;
@@ -122,7 +122,7 @@ std::string ReadNumbers(const ConvertOptions& options, const Recipe* recipe,
   return {};
 }
 
-// Reads --profile. What is wrong with it, or empty.
+// Parses --profile. Returns an error message, empty on success.
 std::string ReadProfile(const ConvertOptions& options, const BatchJob& job,
                         ProfileRequest& request) {
   if (options.profile == "keep") return {};
@@ -141,8 +141,8 @@ std::string ReadProfile(const ConvertOptions& options, const BatchJob& job,
   return {};
 }
 
-// Reads the format that is asked for into `job`; none where every file keeps its own. What is
-// wrong, or empty.
+// Sets the output format in `job`; none if files keep their format. Returns an error message, empty
+// on success.
 std::string ReadFormat(const ConvertOptions& options, bool mayKeep, BatchJob& job) {
   if (options.to.empty() && (options.out.empty() || options.out == kStream))
     return mayKeep ? std::string() : Tr("Name the output format with --to.");
@@ -153,8 +153,7 @@ std::string ReadFormat(const ConvertOptions& options, bool mayKeep, BatchJob& jo
   return fromName ? Tr("\"%1\" selects no format; name one with --to.", options.out) : wrong;
 }
 
-// What is wrong with the options, as a sentence; empty when nothing is. Takes the format into
-// `job`.
+// Returns an error message, empty if the options are valid. Sets the format in `job`.
 std::string CheckOptions(const ConvertOptions& options, const CommandContext& context,
                          const Recipe* recipe, BatchJob& job) {
   const bool saves =
@@ -182,7 +181,7 @@ std::string CheckOptions(const ConvertOptions& options, const CommandContext& co
   return {};
 }
 
-// Hands the recipe to the function. What is wrong, or empty.
+// Passes the recipe to the function. Returns an error message, empty on success.
 std::string TakeRecipe(const ConvertOptions& options, const std::shared_ptr<const Recipe>& recipe,
                        const BatchJob& job, BatchFunction& function) {
   if (recipe == nullptr) return {};
@@ -203,7 +202,7 @@ std::string TakeRecipe(const ConvertOptions& options, const std::shared_ptr<cons
       !wrong.empty()) {
     return wrong;
   }
-  if (!options.quality.empty()) {  // an option of the command line wins over the recipe
+  if (!options.quality.empty()) {  // the command line overrides the recipe
     for (BatchOutput& output : function.outputs) {
       output.quality = 0;
       output.mostBytes = 0;
@@ -212,8 +211,7 @@ std::string TakeRecipe(const ConvertOptions& options, const std::shared_ptr<cons
   return {};
 }
 
-// Where the picture comes from and goes to, as far as they are standard streams. What is wrong, or
-// empty.
+// Handles standard input and output. Returns an error message, empty on success.
 std::string TakeStreams(ConvertOptions& options, const CommandContext& context) {
   TakeFolder(options.out, options.dest);
   if (NamesInput(context)) {
@@ -225,7 +223,7 @@ std::string TakeStreams(ConvertOptions& options, const CommandContext& context) 
              : std::string();
 }
 
-// Runs the batch, whose output goes to standard output if `stream` has a file.
+// Runs the batch; copies the output to standard output if `stream` has a file.
 int RunInto(const StreamedOutput& stream, const Selection& selection, const BatchFunction& function,
             BatchJob& job, ResultOutput& output, const CommandContext& context) {
   const Status status = RunBatch(selection.files, function, job);
@@ -233,7 +231,7 @@ int RunInto(const StreamedOutput& stream, const Selection& selection, const Batc
     output.Message(output.ShownMessage(job.destinationFolder) + ": " + StatusText(status));
     return kExitFailed;
   }
-  if (selection.input) job.uses.clear();  // a file that is gone
+  if (selection.input) job.uses.clear();  // the temporary file is deleted
   const bool written = !job.errors && job.writeAborts == 0 && platform::PendingExit() == 0;
   if (!stream.Path().empty() && written && !function.dryRun && !stream.Deliver(context)) {
     output.Message(std::string(kStream) + ": " + StatusText(Status::FileReadError));

@@ -7,7 +7,7 @@ namespace fotomill::cli {
 // Command "convert": declares its options in `app` and sets context.run, which converts the named
 // files as one batch.
 void SetUpConvert(CLI::App& app, CommandContext& context);
-// The same with operations in between: they must be given, and the format need not.
+// Command "apply": the same with operations, which are required; the format is optional.
 void SetUpApply(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

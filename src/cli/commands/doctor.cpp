@@ -26,7 +26,7 @@ namespace fotomill::cli {
 
 namespace {
 
-// One fact; the label in English.
+// Prints one fact; the label is in English.
 void Report(ResultOutput& output, const std::string& label, std::string_view fact) {
   constexpr size_t kColumn = 16;
   if (output.IsJson()) {
@@ -77,7 +77,7 @@ bool IsRegistered(const std::string& path) {
   return false;
 }
 
-// The formats of each module, and the modules without one.
+// Lists the formats of each module, and modules without formats.
 void ReportPlugins(ResultOutput& output, bool enabled) {
   for (const std::string& folder : PluginFolders()) {
     Report(output, TrLater("Plug-in folder"),

@@ -4,8 +4,8 @@
 
 namespace fotomill::cli {
 
-// Command "doctor": sets context.run, which tells where things are, what is missing and why. It
-// changes nothing.
+// Command "doctor": sets context.run, which shows paths and libraries, and what is disabled or
+// missing. Changes nothing.
 void SetUpDoctor(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

@@ -24,7 +24,7 @@ struct FacesOptions {
   bool json = false;
 };
 
-// The faces of a picture as it is seen: turned upright.
+// Finds the faces in a picture after turning it upright.
 Status FacesOf(const std::string& name, PicturePointer& picture, std::vector<Rectangle>& faces,
                const ResultOutput& output) {
   RETURN_IF_BAD(LoadPicture({.fileName = name, .options = ReadOptionsFromSettings()}, picture));

@@ -4,7 +4,7 @@
 
 namespace fotomill::cli {
 
-// Command "faces": sets context.run, which prints where faces are in pictures.
+// Command "faces": sets context.run, which prints the positions of faces in pictures.
 void SetUpFaces(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

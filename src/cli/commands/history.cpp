@@ -77,7 +77,7 @@ int RunList(const HistoryOptions& options, const CommandContext& context) {
   return broken ? Complain(context, kNotRead) : kExitOk;
 }
 
-// The function with this name or number; kNoFileFunction if there is none.
+// Finds a function by name or number; kNoFileFunction if there is none.
 int32_t FunctionOf(const std::string& text) {
   const auto number = ParseNumber<int32_t>(text);
   if (!number) return FileFunctionOfName(text);

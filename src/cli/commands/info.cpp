@@ -30,7 +30,7 @@ std::string Resolution(double pixelsPerInch) {
   return text;
 }
 
-// Frame durations and the number of rounds, 0 for endless.
+// Adds frame durations and the loop count, 0 for endless.
 void AddFrames(const PictureRecord& picture, Json& facts) {
   AnimationPointer animation;
   if (picture.pageCount < 2 ||
@@ -77,7 +77,7 @@ void AddFact(std::string& text, std::string_view label, std::string_view value) 
   text.append(EscapeControls(value)).append(1, '\n');
 }
 
-// The lines of one file as one text, for a single write.
+// All lines of one file as one text.
 std::string FactsAsText(const PictureRecord& picture) {
   const FormatEntry& row = FormatRow(picture.formatIndex);
   std::string text;

@@ -4,8 +4,8 @@
 
 namespace fotomill::cli {
 
-// Command "info": declares its options in `app` and sets context.run, which tells what files hold
-// without decoding them.
+// Command "info": declares its options in `app` and sets context.run, which describes files without
+// decoding them.
 void SetUpInfo(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

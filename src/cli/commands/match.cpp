@@ -33,14 +33,14 @@ Json NameMatch(const std::string& name, int32_t index) {
   return element;
 }
 
-// What a file's contents say, beside its name.
+// The format detected from a file's contents.
 struct ContentsMatch {
   Status status = Status::Ok;
-  int32_t index = kNoFormat;   // the row that opens the file
-  std::string_view looksLike;  // what it is if its name lies, or cannot be opened
+  int32_t index = kNoFormat;   // the format that opens the file
+  std::string_view looksLike;  // actual type if the name is wrong or the file cannot be opened
 };
 
-// Opens a file as if no setting kept it from being identified.
+// Identifies a file, ignoring settings that restrict identification.
 ContentsMatch MatchContents(const std::string& name, int32_t named) {
   ContentsMatch match;
   ReadRequest request{.fileName = name, .options = ReadOptionsFromSettings()};
@@ -53,7 +53,7 @@ ContentsMatch MatchContents(const std::string& name, int32_t named) {
   return match;
 }
 
-// "EXT, DESCRIPTION, by its extension": the rule explains why .pict does not select PCT.
+// "EXT, DESCRIPTION, by its extension": naming the rule explains why .pict does not select PCT.
 std::string MatchText(const std::string& name, const FormatEntry& row) {
   const std::string description = EscapeControls(row.description);
   const bool whole = EqualIgnoringCase(platform::ExtensionOf(name), row.extension);
@@ -73,7 +73,7 @@ std::string ContentsText(const std::string& name, const ContentsMatch& match, in
             FormatRow(named).extension.view());
 }
 
-// Prints the row that opens a file, or why none does.
+// Prints the format that opens a file, or why none does.
 void ReportContents(const std::string& name, ResultOutput& output) {
   const int32_t named = FindFormatByName(name);
   const ContentsMatch match = MatchContents(name, named);

@@ -4,8 +4,8 @@
 
 namespace fotomill::cli {
 
-// Command "match": sets context.run, which tells the format that a name selects. The file need not
-// be there.
+// Command "match": sets context.run, which prints the format selected by a file name. The file need
+// not exist.
 void SetUpMatch(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

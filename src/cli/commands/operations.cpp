@@ -16,7 +16,7 @@ namespace fotomill::cli {
 
 namespace {
 
-// The words of a list separated by "|".
+// Splits a list separated by "|".
 Json WordsOf(std::string_view list) {
   Json words = Json::array();
   for (int32_t i = 0; !WordOf(list, i).empty(); ++i) words.push_back(WordOf(list, i));
@@ -68,11 +68,11 @@ std::string Padded(std::string_view text, size_t width) {
 
 std::string Number(double number) {
   char text[40];
-  std::snprintf(text, sizeof text, "%.10g", number);  // no exponents, which values cannot have
+  std::snprintf(text, sizeof text, "%.10g", number);  // no exponent, as values cannot have one
   return text;
 }
 
-// What a parameter takes, in short.
+// A short description of a parameter's values.
 std::string Takes(const Parameter& row) {
   if (*row.choices != '\0') {
     std::string words(row.choices);

@@ -4,7 +4,7 @@
 
 namespace fotomill::cli {
 
-// The table of operations, or one of them with its parameters.
+// Command "operations": lists all operations, or describes one with its parameters.
 void SetUpOperations(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

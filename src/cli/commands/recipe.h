@@ -4,9 +4,9 @@
 
 namespace fotomill::cli {
 
-// The commands about recipes.
+// Commands for recipes.
 void SetUpRecipeList(CLI::App& app, CommandContext& context);
-void SetUpRecipeShow(CLI::App& app, CommandContext& context);   // prints one as it is stored
-void SetUpRecipeCheck(CLI::App& app, CommandContext& context);  // names mistakes; applies nothing
+void SetUpRecipeShow(CLI::App& app, CommandContext& context);   // prints a recipe as stored
+void SetUpRecipeCheck(CLI::App& app, CommandContext& context);  // reports mistakes; applies nothing
 
 }  // namespace fotomill::cli

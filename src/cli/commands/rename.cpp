@@ -24,11 +24,11 @@ namespace {
 
 struct RenameCommandOptions {
   SelectionOptions selection;
-  std::string base;       // empty: as configured
-  int32_t start = -1;     // -1: the default
-  int32_t digits = 0;     // 0: the default
-  int32_t increment = 0;  // 0: as configured
-  int32_t seed = -1;   // -1: a new one each time
+  std::string base;       // empty: use settings
+  int32_t start = -1;     // -1: use the default
+  int32_t digits = 0;     // 0: use the default
+  int32_t increment = 0;  // 0: use settings
+  int32_t seed = -1;   // -1: a random one
   bool undo = false;
   bool dryRun = false;
   bool json = false;
@@ -45,13 +45,13 @@ int RunUndo(const RenameCommandOptions& options, const std::vector<SelectedFile>
   return kExitFailed;
 }
 
-// The rules of the settings with the options on top. A series that the command line names counts
-// for itself: it begins at its own number and leaves the configured one alone.
+// The rules from the settings, overridden by the options. A series given on the command line has
+// its own numbers and does not change the configured one.
 SequentialRenameRules RulesOf(const RenameCommandOptions& options) {
   SequentialRenameRules rules = SequentialRenameRulesFromSettings();
   if (!options.base.empty()) {
     rules.baseName = options.base;
-    rules.numberFirst = false;  // that has no base name
+    rules.numberFirst = false;  // without base name
   }
   if (!options.base.empty() || options.start >= 0) {
     rules.update = false;

@@ -31,7 +31,7 @@ namespace fotomill::cli {
 namespace {
 
 constexpr int32_t kMostDistance = 32;
-// A decoder may deliver pictures this small: four times what is compared.
+// Pictures may be decoded as small as this, four times the size compared.
 constexpr int32_t kSideForHash = 64;
 constexpr size_t kSavedEvery = 500;  // pictures
 
@@ -43,13 +43,13 @@ struct SimilarOptions {
   bool json = false;
 };
 
-// A file on its way to its group.
+// A file to be grouped.
 struct Candidate {
   std::string name;
   HashRecord record;
   Status status = Status::Ok;
   std::string hint;
-  bool known = false;  // the store has what is needed
+  bool known = false;  // the store has all that is needed
 };
 
 class Search {
@@ -62,7 +62,7 @@ class Search {
 
   int Run(const Selection& selection) {
     output_.CloseWith(selection.leftOut);
-    std::set<std::string> seen;  // a file that is named twice is not its own double
+    std::set<std::string> seen;  // ignores repeated names
     for (const SelectedFile& file : selection.files) {
       if (!seen.insert(platform::AbsolutePath(file.name)).second) continue;
       Candidate& candidate = candidates_.emplace_back();
@@ -83,7 +83,7 @@ class Search {
   }
 
  private:
-  // Works on all candidates, several at a time.
+  // Runs `work` for all candidates in parallel.
   void ForEach(const std::function<void(Candidate&)>& work) {
     size_t sinceSaved = 0;
     OrderedRun run({.work =
@@ -118,7 +118,7 @@ class Search {
         Tr("Results cannot be stored in \"%1\".", output_.ShownMessage(DataFile(kHashStoreName))));
   }
 
-  // What the store knows. It belongs to the calling thread, so this is done before work begins.
+  // Loads what the store knows. Must run on the calling thread, before the parallel work.
   void Recall(Candidate& candidate) const {
     const platform::FileFacts facts = platform::FactsOf(candidate.name);
     const HashRecord* const known =
@@ -129,7 +129,7 @@ class Search {
     candidate.record.modified = facts.modified;
   }
 
-  // Finds out size and, unless only equal pixels count, hashes.
+  // Determines size and, unless only identical pictures count, hashes.
   void Look(Candidate& candidate) const {
     if (candidate.known) return;
     PicturePointer picture;
@@ -147,11 +147,11 @@ class Search {
     candidate.record.height = picture->height;
   }
 
-  // Pictures whose size no one else has are equal to none.
+  // Pictures of unique size have no identical ones.
   void FindLonely() {
     std::map<std::pair<int32_t, int32_t>, size_t> sizes;
     const auto sizeOf = [](const Candidate& candidate) {
-      // Turned upright, one may be as the other is.
+      // ignores orientation, which may swap width and height
       return std::minmax({candidate.record.width, candidate.record.height});
     };
     for (const Candidate& candidate : candidates_)
@@ -171,7 +171,7 @@ class Search {
     if (status != Status::Ok) return Fail(candidate, status);
     candidate.record.width = picture->width;  // upright
     candidate.record.height = picture->height;
-    candidate.known = false;  // there is something new to keep
+    candidate.known = false;  // to be saved
   }
 
   static void Fail(Candidate& candidate, Status status) {
@@ -180,7 +180,7 @@ class Search {
   }
 
   void Report() {
-    std::vector<size_t> places;  // of those that could be read
+    std::vector<size_t> places;  // of the readable files
     std::vector<PictureHashes> hashes;
     std::vector<std::string> digests;
     for (size_t i = 0; i < candidates_.size(); ++i) {
@@ -247,7 +247,7 @@ int RunSimilar(SimilarOptions options, const CommandContext& context) {
 
 void SetUpSimilar(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<SimilarOptions>();
-  options->distance = -1;  // as the configuration says
+  options->distance = -1;  // use settings
   AddSelection(app, options->selection, context);
   AddNumber(app, "--distance", options->distance, "N", 0, kMostDistance,
             "How many of 64 bits may differ (default: the key FindSimlarDistance)");

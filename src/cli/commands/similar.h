@@ -8,7 +8,7 @@ namespace fotomill::cli {
 
 struct CommandContext;
 
-// "similar": groups of pictures that look alike, or are equal pixel by pixel.
+// Command "similar": finds groups of pictures that look alike or have identical pixels.
 void SetUpSimilar(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

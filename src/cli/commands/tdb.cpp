@@ -41,7 +41,7 @@ constexpr const char* kNotFound = TrLater("The database has no thumbnail of this
 constexpr const char* kExists = TrLater("The file exists; use --overwrite replace to replace it.");
 constexpr size_t kAddedAtOnce = 64;  // pictures, about 2 MB
 
-// Opens a database; false after a message.
+// Opens a database; false after printing a message.
 bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool create,
                   ResultOutput& output) {
   switch (database.OpenThumbnailDatabase(path, create, ThumbnailOptionsFromSettings().hidden)) {
@@ -61,7 +61,7 @@ bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool cre
   return false;
 }
 
-// A picture's record, made on any thread.
+// A record for a picture, made on any thread.
 struct Adding {
   Status status = Status::Ok;
   std::string hint;
@@ -83,7 +83,7 @@ Adding MakeRecord(const SelectedFile& file, const ThumbnailOptions& options) {
   return adding;
 }
 
-// Appends records in blocks, since each append waits for the disk.
+// Appends records in blocks, as each append waits for the disk.
 class Appending {
  public:
   Appending(ThumbnailDatabase& database, ResultOutput& output, bool history)
@@ -247,7 +247,7 @@ int RunList(const TdbOptions& options, CommandContext& context) {
   return kExitOk;
 }
 
-// The number of records that pass a test.
+// Counts the records that satisfy a test.
 template <typename Test>
 int64_t CountRecords(const ThumbnailDatabase& database, Test test) {
   DatabaseHeader header;

@@ -8,9 +8,9 @@ namespace fotomill::cli {
 // and set context.run.
 void SetUpTdbAdd(CLI::App& app, CommandContext& context);
 void SetUpTdbFind(CLI::App& app, CommandContext& context);  // writes one thumbnail as a picture
-// The records, those marked as deleted too.
+// Includes records marked as deleted.
 void SetUpTdbList(CLI::App& app, CommandContext& context);
-void SetUpTdbDelete(CLI::App& app, CommandContext& context);  // marks; frees no space
-void SetUpTdbCompact(CLI::App& app, CommandContext& context);  // drops what is marked
+void SetUpTdbDelete(CLI::App& app, CommandContext& context);  // marks records; frees no space
+void SetUpTdbCompact(CLI::App& app, CommandContext& context);  // removes marked records
 
 }  // namespace fotomill::cli

@@ -46,7 +46,7 @@ struct ThumbsOptions {
   bool json = false;
 };
 
-// The state of a picture's thumbnail file; the names are part of the output of "thumbs list".
+// State of a thumbnail file; the names are part of the output of "thumbs list".
 enum class ThumbnailState { Current, Stale, Missing, Broken };
 
 ThumbnailState StateOf(const std::string& picture) {
@@ -69,7 +69,7 @@ const char* NameOf(ThumbnailState state) {
   return "broken";
 }
 
-// A dry run does all but write; a thumbnail file that is write-protected would be replaced.
+// A dry run does everything but write. Write-protected thumbnail files can be replaced.
 Status MakeThumbnail(const std::string& name, const ThumbnailOptions& options, bool dryRun,
                      Status& shortfall) {
   ThumbnailRecord record;
@@ -80,13 +80,13 @@ Status MakeThumbnail(const std::string& name, const ThumbnailOptions& options, b
   return made ? Status::Ok : Status::ErrorCreatingFile;
 }
 
-// A selected file and its result.
+// A selected file with its result.
 struct Making {
   Status status = Status::Ok;
-  Status shortfall = Status::Ok;  // why the thumbnail shows only a part of its picture
-  std::string hint = {};         // after the message of a failure
-  bool wanted = false;           // it has no current thumbnail
-  // for the first file that uses a thumbnail file: all wanted files that use it, in order
+  Status shortfall = Status::Ok;  // why the thumbnail is incomplete
+  std::string hint = {};         // printed after the error message
+  bool wanted = false;           // has no current thumbnail
+  // for the first file using a thumbnail file: all wanted files using it, in order
   std::vector<size_t> together;
 };
 
@@ -105,7 +105,7 @@ std::vector<Making> PlanMaking(const std::vector<SelectedFile>& files, bool forc
   return makings;
 }
 
-// Says that a picture is only there in part.
+// Prints that a picture is incomplete.
 void NotePart(const std::string& name, Status shortfall, ResultOutput& output) {
   if (shortfall == Status::Ok) return;
   output.Note(output.ShownMessage(name) + ": " +
@@ -136,7 +136,7 @@ void ReportMaking(const SelectedFile& file, const Making& making, ResultOutput& 
   }
 }
 
-// Runs on several threads, with the same output and the same thumbnail files as on one.
+// Uses several threads; output and thumbnail files do not depend on their number.
 int RunMake(const ThumbsOptions& options, const CommandContext& context) {
   const auto selection = SelectFiles(options.selection, context);
   if (!selection) return kExitUsage;
@@ -179,7 +179,7 @@ int RunMake(const ThumbsOptions& options, const CommandContext& context) {
   return output.Finish();
 }
 
-// Writes a picture; an existing file is kept unless --overwrite replace is given.
+// Writes a picture; replaces an existing file only with --overwrite replace.
 int WriteDrawing(PictureRecord& picture, const std::string& name, const ThumbsOptions& options,
                  ResultOutput& output) {
   WriteOptions write{.encode = EncodeOptionsFromSettings()};
@@ -222,7 +222,7 @@ int RunShow(const ThumbsOptions& options, const CommandContext& context) {
   return WriteDrawing(*picture, name, options, output);
 }
 
-// A picture upright and in a square; smaller ones keep their size.
+// Scales a picture down to fit a square, upright; small ones are not enlarged.
 Status DrawPicture(const std::string& name, int32_t side, PicturePointer& picture) {
   const ReadRequest request{.fileName = name,
                             .thumbnailSide = side,
@@ -248,7 +248,7 @@ int RunDraw(const ThumbsOptions& options, const CommandContext& context) {
   return WriteDrawing(*picture, name, options, output);
 }
 
-// The pictures of a folder; nullopt if it cannot be read.
+// Lists the pictures in a folder; nullopt if it cannot be read.
 std::optional<std::vector<std::string>> PicturesIn(const std::string& folder) {
   const auto entries = platform::ListFolder(folder);
   if (!entries) return std::nullopt;
@@ -300,7 +300,7 @@ int RunClean(const ThumbsOptions& options, const CommandContext& context) {
   for (const std::string& orphan : *orphans) {
     if (!output.GoesOn()) break;
     if (!options.dryRun && (optical || !platform::DeleteFile(orphan))) {
-      // another run was faster
+      // deleted by another process meanwhile
       if (platform::ExistenceOf(orphan) == platform::Existence::No) continue;
       output.FileFailed(orphan, Status::ErrorWritingFile,
                         WithReason(Tr("It could not be deleted.")));

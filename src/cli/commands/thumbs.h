@@ -9,9 +9,9 @@ namespace fotomill::cli {
 void SetUpThumbsMake(CLI::App& app, CommandContext& context);
 // Writes a stored thumbnail as a picture.
 void SetUpThumbsShow(CLI::App& app, CommandContext& context);
-// Scales a picture down; stores nothing.
+// Creates a thumbnail; stores nothing.
 void SetUpThumbsDraw(CLI::App& app, CommandContext& context);
-void SetUpThumbsList(CLI::App& app, CommandContext& context);   // which pictures have current ones
-void SetUpThumbsClean(CLI::App& app, CommandContext& context);  // deletes those without a picture
+void SetUpThumbsList(CLI::App& app, CommandContext& context);   // which thumbnails are current
+void SetUpThumbsClean(CLI::App& app, CommandContext& context);  // deletes orphaned thumbnails
 
 }  // namespace fotomill::cli

@@ -54,7 +54,7 @@ int RunTurnCommand(TurnOptions options, const CommandContext& context) {
       .keepTree = rewrite.keepTree,
       .jobs = rewrite.jobs};
   return RunRewriteJob(options.rewrite, *selection, context, [&](BatchJob& job) {
-    (void)RunTurn(selection->files, function, job);  // this box always opens
+    (void)RunTurn(selection->files, function, job);  // TerminalBox always opens
   });
 }
 

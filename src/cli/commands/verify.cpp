@@ -30,14 +30,14 @@ Status VerifyFrames(const std::string& name) {
   return status == Status::NoImages ? Status::Ok : status;
 }
 
-// Decodes every page of a file. What a decoder finds odd in one that is whole becomes the note.
+// Decodes every page of a file. A decoder's remark about an intact file becomes `note`.
 Status VerifyFile(const std::string& name, std::string& hint, std::string& note) {
   PicturePointer picture;
   ReadRequest request{.fileName = name, .options = ReadOptionsFromSettings()};
   RETURN_IF_BAD(LoadPictureInfo(request, picture));
   for (; request.page < picture->pageCount; ++request.page) {
     RETURN_IF_BAD(ReadPicture(request, *picture));
-    if (!picture->warning.empty()) {  // it can be shown, but data is missing
+    if (!picture->warning.empty()) {  // displayable, but incomplete
       hint = Tr(picture->warning.view());
       return Status::DamagedFile;
     }
@@ -45,7 +45,7 @@ Status VerifyFile(const std::string& name, std::string& hint, std::string& note)
     if (picture->pageCount == 1) break;
     const FormatEntry& row = FormatRow(picture->formatIndex);
     if (row.animate != nullptr) return VerifyFrames(name);
-    // no way to frames: each request gets the same picture
+    // frames cannot be selected: each page is the same picture
     if ((row.flags & FMT_ANIMATED) != 0) break;
   }
   return Status::Ok;

@@ -4,8 +4,8 @@
 
 namespace fotomill::cli {
 
-// Command "verify": declares its options in `app` and sets context.run, which decodes files in
-// full, every page of them.
+// Command "verify": declares its options in `app` and sets context.run, which fully decodes files,
+// including all pages.
 void SetUpVerify(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

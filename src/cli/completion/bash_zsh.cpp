@@ -1,5 +1,5 @@
-// The scripts for bash and zsh share their lists: functions that print words with their
-// descriptions, one a line, parted by a tab. In place of words "*files", "*folders" or "*anything".
+// The bash and zsh scripts share lists: functions that print words with their descriptions, one per
+// line, separated by a tab; or one of "*files", "*folders" and "*anything".
 
 #include "cli/completion/words.h"
 
@@ -19,7 +19,7 @@ std::string PrintWords(const std::vector<Word>& words) {
   return line;
 }
 
-// Long lists are functions of their own, which their places call.
+// Long lists become functions, shared by all their uses.
 class Lists {
  public:
   std::string Print(const Choice& choice) {
@@ -100,7 +100,7 @@ std::string SharedLists() {
 }
 
 // clang-format off
-// Finds the command, and the lines that fit the place; $current and $previous are set by the shell's own part.
+// Finds the command and the completions; $current and $previous are set by the shell's part.
 constexpr const char* kFindLines = R"sh(
 _fotomill_lines() {
   lines=$(_fotomill_values "$command $previous")

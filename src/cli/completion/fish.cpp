@@ -13,7 +13,7 @@ std::string Quoted(const std::string& text) {
   return quoted + "'";
 }
 
-// Functions that print lists of words; the same list is one function.
+// Functions that print lists of words; identical lists share a function.
 class Lists {
  public:
   std::string Call(const std::vector<Word>& words) {

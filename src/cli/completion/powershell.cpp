@@ -34,7 +34,7 @@ std::string ListOf(const Choice& choice) {
   return "'*anything'";
 }
 
-// The lists of one command: its options, their values, its arguments.
+// The lists for one command: options, their values, arguments.
 std::string EntriesOf(const std::string& command, const std::vector<OptionWords>& options) {
   std::vector<Word> names;
   std::string values;

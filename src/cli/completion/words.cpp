@@ -60,7 +60,7 @@ std::vector<Word> SplitWords(const std::string& list) {
   return words;
 }
 
-// What comes behind an option or in place of a name, by its placeholder.
+// Completions for the value of an option, or for a name, by placeholder.
 Choice ChoiceOf(const std::string& placeholder) {
   if (placeholder == "KEY=VALUE") return {Choice::Words, KeyWords("="), true};
   if (placeholder.starts_with("KEY")) return {Choice::Words, KeyWords("")};

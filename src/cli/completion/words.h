@@ -5,22 +5,22 @@
 
 namespace fotomill::cli {
 
-// What the completion scripts of all shells offer.
+// The completions shared by the scripts of all shells.
 
-// A word to offer.
+// A completion.
 struct Word {
   std::string text;
   std::string help;  // in the user's language, one line
 };
 
-// What may stand in one place of the command line.
+// What can complete one position of the command line.
 struct Choice {
   enum Kind { Words, Files, Folders, Anything } kind = Anything;
-  std::vector<Word> words;  // of the kind Words
-  bool goesOn = false;      // a word is not complete yet: "KEY=" is followed by a value
+  std::vector<Word> words;  // for Words
+  bool goesOn = false;      // words are incomplete: "KEY=" needs a value
 };
 
-// An option, and what may follow it.
+// An option and its value.
 struct OptionWords {
   std::vector<std::string> names;  // "--to", "-t"
   std::string help;
@@ -28,25 +28,25 @@ struct OptionWords {
   Choice value;
 };
 
-// A command with all that may follow its name.
+// A command and what may follow its name.
 struct CommandWords {
-  std::string name;  // one word or two
+  std::string name;  // one or two words
   std::string summary;
-  std::vector<OptionWords> options;  // the global ones too
+  std::vector<OptionWords> options;  // including global ones
   Choice arguments;
 };
 
-// All commands, and the words that begin a command line, "help" among them.
+// All commands, and the words that can start a command line, including "help".
 std::vector<CommandWords> AllCommandWords();
 std::vector<Word> FirstWords(const std::vector<CommandWords>& commands);
-// The words that "help" explains: the same but itself, and the topics.
+// The words after "help": the same without itself, plus the topics.
 std::vector<Word> HelpWords(const std::vector<CommandWords>& commands);
-// The second words of a group such as "config"; none for a command of one word.
+// The second words of a group such as "config"; none for single-word commands.
 std::vector<Word> SecondWords(const std::vector<CommandWords>& commands, const std::string& first);
-// The options before any command.
+// Options allowed before any command.
 std::vector<OptionWords> GlobalOptionWords();
 
-// The script of a shell.
+// The completion script for a shell.
 std::string BashCompletion();
 std::string ZshCompletion();         // a function _fotomill for fpath
 std::string FishCompletion();        // "complete" lines

@@ -17,20 +17,20 @@ namespace fotomill::cli {
 
 // Exit statuses that scripts rely on.
 inline constexpr int kExitOk = 0;
-inline constexpr int kExitFailed = 1;  // a file failed, or a lookup found nothing
-inline constexpr int kExitUsage = 2;   // nothing was touched
+inline constexpr int kExitFailed = 1;  // a file failed, or nothing was found
+inline constexpr int kExitUsage = 2;   // nothing was changed
 
-// The arguments of a command line that are not options: names of files, keys and the like.
+// Arguments that are not options: file names, keys, etc.
 struct NameArguments {
-  // as the usage line shows them: "FILE...", "DB FILE..."; empty: the command takes none
+  // as in the usage line: "FILE...", "DB FILE..."; empty: none allowed
   const char* placeholder = "";
   const char* help = "";  // in English
   size_t least = 0;
   size_t most = 0;
-  std::vector<std::string> values;  // any bytes, in order
+  std::vector<std::string> values;  // arbitrary bytes, in order
 
-  // Says what a command takes: `shownAs` and `helpText` go into the help, fewer or more names than
-  // the bounds are a usage error.
+  // Declares what a command accepts. `shownAs` and `helpText` are for the help; a number of names
+  // outside the limits is a usage error.
   void Declare(const char* shownAs, const char* helpText, size_t fewest,
                size_t greatest = SIZE_MAX) {
     placeholder = shownAs;
@@ -40,24 +40,24 @@ struct NameArguments {
   }
 };
 
-// The options that every command takes.
+// Options accepted by every command.
 struct GlobalOptions {
-  std::string dataFolder;             // empty: the default one
+  std::string dataFolder;             // empty: default
   std::vector<std::string> settings;  // KEY=VALUE, in order
   bool quiet = false;
-  bool verbose = false;  // more notes, and how long it took
+  bool verbose = false;  // more messages, and elapsed time
   bool noInput = false;
   bool noPlugins = false;
   bool noHistory = false;
   std::string progress = "auto";  // auto, never
   std::string color = "auto";     // auto, always, never
-  std::string language;           // as in StartTexts; it counts before anything is parsed
+  std::string language;           // as for StartTexts; applied before parsing
 };
 
 struct Command;
 
-// What a command works with. `setUp` declares names and options and sets `run`; the frame parses,
-// prepares and runs.
+// The context of a command. `setUp` declares names and options and sets `run`; the framework parses
+// the command line and calls `run`.
 struct CommandContext {
   Io io;
   GlobalOptions global;
@@ -65,7 +65,7 @@ struct CommandContext {
   NameArguments names;
   std::function<int()> run;  // after parsing; returns the exit status
 
-  // Whether the user can be asked.
+  // Whether questions can be asked.
   bool MayAsk() const { return io.Interactive() && !global.noInput; }
   // Whether to draw a progress bar.
   bool ProgressOn() const { return io.errTerminal && !global.quiet && global.progress != "never"; }
@@ -73,30 +73,30 @@ struct CommandContext {
   bool ColorOn(bool terminal) const;
 };
 
-// What a command needs before it runs.
+// What to initialize before a command runs.
 enum class Needs : uint8_t {
   Nothing,
-  Settings,  // the configuration, with --set on top
-  Formats,   // the same, and the format registry ready, plug-ins included
+  Settings,  // configuration and --set
+  Formats,   // Settings, and the format registry with plug-ins
 };
 
-// One command: a line of the table in commands.cpp, which help, dispatch, completion and
-// nearest-name hints read. The name may be two words ("tdb add").
+// A command: a row of the table in commands.cpp, used for help, dispatch, completion and
+// suggestions. The name may be two words ("tdb add").
 struct Command {
   const char* name;
-  const char* summary;  // in English; begins with a verb, no period
+  const char* summary;  // in English; starts with a verb, no period
   Needs needs;
-  // Declares options and help on the command's parser, its names in `context.names`, and sets
-  // `context.run`. Both arguments outlive the run. Names never go through the parser's positional
-  // options, which read brackets, braces and empty names as list syntax.
+  // Declares options and help on the command's parser and names in `context.names`, and sets
+  // `context.run`. Both arguments outlive the run. Names are not positional options of the parser,
+  // as it treats brackets, braces and empty names as list syntax.
   void (*setUp)(CLI::App& app, CommandContext& context);
 };
 
-// Parses and runs one command line; the exit status of the program. Never throws.
+// Parses and runs a command line; returns the exit status. Never throws.
 int RunCommandLine(int count, const char* const* arguments, const Io& io);
 
-// Prints "fotomill COMMAND: MESSAGE" and where to find help; returns kExitUsage. For mistakes that
-// only the command itself can detect, before it touches anything.
+// Prints "fotomill COMMAND: MESSAGE" and where to find help; returns kExitUsage. For errors that
+// only the command can detect, before it changes anything.
 int UsageError(const CommandContext& context, std::string_view message);
 
 }  // namespace fotomill::cli

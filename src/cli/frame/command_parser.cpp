@@ -15,7 +15,7 @@ namespace {
 
 constexpr size_t kFirstColumn = 26;
 
-// The option's placeholder instead of types, and the names as their command describes them.
+// Shows placeholders instead of types, and names as described by the command.
 class HelpFormatter : public CLI::Formatter {
  public:
   explicit HelpFormatter(const NameArguments& names) : names_(names) { column_width(kFirstColumn); }
@@ -66,7 +66,7 @@ void AddGlobalOptions(CLI::App& app, GlobalOptions& global) {
   app.set_help_flag("-h,--help", Tr("Show this help"));
 }
 
-// The parser would read "--name=" as an option whose value follows.
+// CLI11 would take the next argument as the value of "--name=".
 void SplitEmptyValues(std::vector<std::string>& arguments) {
   for (size_t i = 0; i < arguments.size() && arguments[i] != "--"; ++i) {
     std::string& argument = arguments[i];
@@ -114,7 +114,7 @@ void CommandParser::ParseArguments(std::vector<std::string> arguments) {
   TakeNames();
 }
 
-// A flag is given or not: "--json=no" would be a riddle.
+// Flags take no value: "--json=no" would be misleading.
 void CommandParser::RefuseFlagValues(const std::vector<std::string>& arguments) const {
   for (const std::string& argument : arguments) {
     if (argument == "--") return;
@@ -127,8 +127,7 @@ void CommandParser::RefuseFlagValues(const std::vector<std::string>& arguments) 
   }
 }
 
-// Throws the parser's own complaints in our words, and in the user's language; returns for all
-// others.
+// Rethrows errors of CLI11 with our own translated text; returns for all other errors.
 void CommandParser::Reword(const CLI::ParseError& error) {
   const std::string text = error.what(), kind = error.get_name();
   const std::string option = text.substr(0, text.find_first_of(": "));
@@ -152,7 +151,7 @@ std::string CommandParser::HelpPage() const {
   return CLI::detail::find_and_replace(help(), "\n\n\n", "\n\n");
 }
 
-// What the parser did not recognize is a name or an unknown option.
+// Arguments unknown to CLI11 are names or unknown options.
 void CommandParser::TakeNames() {
   NameArguments& names = context_.names;
   bool namesOnly = false;

@@ -8,17 +8,17 @@
 
 namespace fotomill::cli {
 
-// The parser of one command: CLI11 reads its options and the global ones; names are read here, byte
-// for byte as typed.
+// The parser of a command: CLI11 parses its options and the global ones; names are handled here,
+// byte for byte.
 class CommandParser : public CLI::App {
  public:
-  // `command` may be null: then there are the global options only. `context` outlives the parser.
+  // `command` may be null for global options only. `context` must outlive the parser.
   CommandParser(const Command* command, CommandContext& context);
 
-  // Fills the options and context.names. Throws CLI::ParseError, CLI::CallForHelp for -h among
-  // them.
+  // Sets the options and context.names. Throws CLI::ParseError; for -h, its subclass
+  // CLI::CallForHelp.
   void ParseArguments(std::vector<std::string> arguments);
-  std::string HelpPage() const;  // what --help prints, in the user's language
+  std::string HelpPage() const;  // output of --help, translated
 
  private:
   void RefuseFlagValues(const std::vector<std::string>& arguments) const;
@@ -29,7 +29,7 @@ class CommandParser : public CLI::App {
   CommandContext& context_;
 };
 
-// Whether an option before the command takes the next argument as its value.
+// Whether a global option takes the next argument as its value.
 bool GlobalOptionTakesValue(std::string_view option);
 
 }  // namespace fotomill::cli

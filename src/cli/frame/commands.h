@@ -7,10 +7,10 @@
 
 namespace fotomill::cli {
 
-// All commands in the order of the help page.
+// All commands, in the order of the help page.
 std::span<const Command> Commands();
 
-// The command of that name, one word or two; null if there is none.
+// Finds a command by name, one word or two; null if not found.
 const Command* FindCommand(std::string_view name);
 
 }  // namespace fotomill::cli

@@ -13,8 +13,8 @@ namespace fotomill::cli {
 
 namespace {
 
-// The row with exactly this extension; the looser rules for reading would make an AVI of "x.avif".
-// Common other spellings are accepted.
+// The row with exactly this extension; FindFormatByName would select AVI for "x.avif". Common
+// alternative spellings are accepted.
 int32_t RowOfExtension(std::string_view extension) {
   constexpr std::pair<std::string_view, std::string_view> kSpellings[] = {
       {"tiff", "TIF"}, {"fits", "FIT"}, {"targa", "TGA"}, {"pict", "PCT"}};

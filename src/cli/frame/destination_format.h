@@ -6,12 +6,12 @@
 
 namespace fotomill::cli {
 
-// Puts the format with this extension, or a common other spelling of it, into the job. Returns what
-// is wrong, a whole sentence: the format is unknown or cannot be written. Empty if nothing is.
+// Sets the job's format from an extension or a common alternative spelling. Returns an error
+// message, a sentence: the format is unknown or cannot be written. Empty on success.
 std::string ReadDestinationFormat(const std::string& extension, BatchJob& job);
 
-// Finds the extension of the format that --from names, in lower case. Returns what is wrong, a
-// whole sentence: the format is unknown or cannot be read. Empty if nothing is.
+// Finds the lowercase extension of the format given by --from. Returns an error message, a
+// sentence: the format is unknown or cannot be read. Empty on success.
 std::string ReadSourceFormat(const std::string& name, std::string& extension);
 
 }  // namespace fotomill::cli

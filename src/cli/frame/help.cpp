@@ -18,8 +18,7 @@ std::string Line(std::string_view left, std::string_view right, size_t width) {
   return line.append(left).append(width + 2 - left.size(), ' ').append(right).append("\n");
 }
 
-// Names and summaries of the commands named `first`, or whose first word it is; of all if it is
-// empty.
+// Names and summaries of commands whose name or first word is `first`; of all if it is empty.
 std::string ListCommands(std::string_view first) {
   size_t width = std::string_view("help").size();
   for (const Command& command : Commands())
@@ -36,7 +35,7 @@ std::string ListCommands(std::string_view first) {
   return list;
 }
 
-// The text in lines that fit the page, all but the first one indented.
+// Wraps a text to the page width, indenting all but the first line.
 std::string Wrapped(std::string_view text, size_t indent) {
   std::string lines;
   for (const std::string& line : WrappedLines(text, kPageWidth - indent))
@@ -44,7 +43,7 @@ std::string Wrapped(std::string_view text, size_t indent) {
   return lines;
 }
 
-// A topic's parts as a page of the terminal.
+// Formats a topic for the terminal.
 std::string TopicPage(const Topic& topic) {
   const std::vector<TopicPart> parts = topic.parts();
   size_t width = 0;

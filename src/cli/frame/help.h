@@ -5,11 +5,11 @@
 
 namespace fotomill::cli {
 
-// The page of the whole program: usage, commands, global options, an example.
+// The main help page: usage, commands, global options, an example.
 std::string MainHelp();
 
-// The page of a topic, of one command, or of all commands whose first word it is ("tdb"). Empty if
-// there is none.
+// The help page of a topic, a command, or all commands with this first word ("tdb"). Empty if not
+// found.
 std::string HelpOf(std::string_view name);
 
 }  // namespace fotomill::cli

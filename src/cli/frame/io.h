@@ -4,7 +4,7 @@
 
 namespace fotomill::cli {
 
-// The streams of a command and what is known about the terminal; tests pass files of their own.
+// Streams and terminal properties; tests use their own files.
 struct Io {
   std::FILE* in = stdin;
   std::FILE* out = stdout;  // results only
@@ -12,7 +12,7 @@ struct Io {
   bool inTerminal = false;
   bool outTerminal = false;
   bool errTerminal = false;
-  bool outStored = false;  // results go to a file and may be buffered for a moment
+  bool outStored = false;  // results go to a file; may be buffered briefly
 
   // Whether questions may be asked.
   bool Interactive() const { return inTerminal && errTerminal; }

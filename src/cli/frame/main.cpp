@@ -20,7 +20,7 @@ int main(int count, char** arguments) {
   io.inTerminal = platform::IsTerminal(0);
   io.outTerminal = platform::IsTerminal(1);
   io.outStored = platform::IsStored(1);
-  static char buffer[64 * 1024];  // lives as long as the stream
+  static char buffer[64 * 1024];  // must live as long as the stream
   if (io.outStored) std::setvbuf(io.out, buffer, _IOFBF, sizeof buffer);
   io.errTerminal = platform::IsTerminal(2);
   platform::onLongLockWait = [](const std::string& path, const std::string& holder) {

@@ -20,7 +20,7 @@ namespace {
 
 std::string Section(std::string_view title) { return ".SH \"" + std::string(title) + "\"\n"; }
 
-// Text for roff: backslashes and hyphens stand for themselves, and no line is taken for a request.
+// Escapes text for roff: backslashes, hyphens, and control characters at line starts.
 std::string Roff(std::string_view text) {
   std::string out;
   bool lineBegins = true;
@@ -54,7 +54,7 @@ std::string Title(std::string_view command, std::string_view summary) {
          Section(Tr("NAME")) + Roff(name) + " \\- " + Roff(summary) + "\n";
 }
 
-// ".TP" entry: what is bold, what stands for its value, and the text.
+// A ".TP" entry: bold text, placeholder, description.
 std::string Entry(const std::string& bold, const std::string& value, std::string_view text) {
   return ".TP\n\\fB" + Roff(bold) + "\\fR" + (value.empty() ? "" : " \\fI" + Roff(value) + "\\fR") +
          "\n" + Roff(text) + "\n";
@@ -71,7 +71,7 @@ std::string OptionEntry(const CLI::Option& option) {
   return Entry(names, value, option.get_description());
 }
 
-// The options of a parser, a section for each of its groups.
+// The options of a parser, one section per group.
 std::string OptionSections(const CLI::App& parser) {
   std::string text;
   for (const std::string& group : parser.get_groups()) {
@@ -90,7 +90,7 @@ std::string ExitStatusSection() {
   return text;
 }
 
-// A section for each topic of the help.
+// One section per help topic.
 std::string TopicSections() {
   std::string text;
   for (const Topic& topic : Topics()) {

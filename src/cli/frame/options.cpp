@@ -37,7 +37,7 @@ CLI::Option* AddChoice(CLI::App& app, const char* names, std::string& value, con
   std::string list;
   for (const std::string& word : words) list += (list.empty() ? "" : "|") + word;
   CLI::Option* const option = AddText(app, names, value, shownAs, help)->check(isWord);
-  option->type_name(list);  // what completion offers
+  option->type_name(list);  // used for completion
   const bool named = std::ranges::all_of(words, [&](const std::string& word) {
     return std::string_view(help).find(word) != std::string_view::npos;
   });

@@ -11,42 +11,42 @@ class App;
 class Option;
 }  // namespace CLI
 
-// How a command declares its options. Commands use these and not the parser's own header, which
-// takes seconds to compile in every file that includes it.
+// Functions to declare a command's options. Avoids including the parser's header, which takes
+// seconds to compile, in every command.
 //
-// `names` are an option's forms ("-r,--recursive"), `shownAs` stands for its value in the help,
-// `help` is its line there in English, which these functions translate. The variable keeps its
-// value when the option is not given, and outlives the parser.
+// `names` are the forms of the option ("-r,--recursive"), `shownAs` is the placeholder for its
+// value in the help, `help` is its description in English, translated by these functions. The
+// variable must outlive the parser; it keeps its value if the option is not given.
 namespace fotomill::cli {
 
-// Given or not.
+// A flag.
 CLI::Option* AddFlag(CLI::App& app, const char* names, bool& value, const char* help);
 // Any text.
 CLI::Option* AddText(CLI::App& app, const char* names, std::string& value, const char* shownAs,
                      const char* help);
-// A name of something. An empty one is refused: most often it comes from a script whose variable is
-// not set.
+// A name; must not be empty, which is most often caused by an unset variable in a
+// script.
 CLI::Option* AddName(CLI::App& app, const char* names, std::string& value, const char* shownAs,
                      const char* help);
 // One of several words.
 CLI::Option* AddChoice(CLI::App& app, const char* names, std::string& value, const char* shownAs,
                        const char* help, std::initializer_list<const char*> choices);
-// A number from `least` to `most`.
+// An integer from `least` to `most`.
 CLI::Option* AddNumber(CLI::App& app, const char* names, int32_t& value, const char* shownAs,
                        int32_t least, int32_t most, const char* help);
-// `count` texts behind the option.
+// `count` texts after the option.
 CLI::Option* AddTexts(CLI::App& app, const char* names, std::vector<std::string>& values, int count,
                       const char* shownAs, const char* help);
-// A text each time the option is given.
+// One text per occurrence of the option.
 CLI::Option* AddRepeatedText(CLI::App& app, const char* names, std::vector<std::string>& values,
                              const char* shownAs, const char* help);
 
-// Refuses a command line that leaves the option out.
+// Makes an option mandatory.
 void Require(CLI::Option* option);
-// Refuses a command line that gives both.
+// Makes two options mutually exclusive.
 void Exclude(CLI::Option* option, CLI::Option* other);
-// The text below the options in the help: notes in English (may be null), translated here, and one
-// example, a command line.
+// The help text after the options: notes in English (may be null), translated here, and an example
+// command line.
 void SetFooter(CLI::App& app, const char* notes, const char* example);
 
 }  // namespace fotomill::cli

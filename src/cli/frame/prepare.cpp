@@ -16,7 +16,7 @@ namespace fotomill::cli {
 std::string PrepareFor(const Command& command, const GlobalOptions& global) {
   if (command.needs == Needs::Nothing) return {};
   SetDataFolder(global.dataFolder);
-  (void)LoadConfiguration();  // a file that is missing or cannot be read leaves the defaults
+  (void)LoadConfiguration();  // on failure the defaults apply
   for (const std::string_view setting : global.settings) {
     const size_t equals = setting.find('=');
     if (equals == std::string_view::npos) return Tr("--set takes KEY=VALUE, not \"%1\".", setting);

@@ -7,13 +7,13 @@
 
 namespace fotomill::cli {
 
-// Prepares what a command needs: the data folder of --data, the configuration, the values of --set,
-// the formats' startup. Returns what is wrong with the command line, a whole sentence; empty if
-// nothing is.
+// Initializes what a command needs: the data folder from --data, the configuration,
+// --set, the format registry. Returns an error message for an invalid command line, else
+// empty.
 std::string PrepareFor(const Command& command, const GlobalOptions& global);
-// What to tell about keys of --set that this build does not use, a sentence each.
+// Warnings about --set keys that this build does not use, a sentence each.
 std::vector<std::string> UnusedSettings(const GlobalOptions& global);
-// The formats' shutdown, after the command.
+// Shuts down the format registry, after the command.
 void FinishAfter(const Command& command);
 
 }  // namespace fotomill::cli

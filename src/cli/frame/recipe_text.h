@@ -9,15 +9,15 @@
 
 namespace fotomill::cli {
 
-// The options that name operations.
+// Options that specify operations.
 struct RecipeOptions {
   const std::string& steps;   // --do
   const std::string& recipe;  // --recipe
-  bool needed;                // one of them must be given
+  bool needed;                // one of them is required
 };
 
-// Reads the recipe of a command line; null where none is given and none is needed. False after a
-// message: a usage error.
+// Reads the recipe from the options; null if there is none and none is needed. False, after
+// printing a message, for a usage error.
 bool ReadRecipeOptions(const RecipeOptions& options, const CommandContext& context,
                        std::shared_ptr<const Recipe>& recipe);
 

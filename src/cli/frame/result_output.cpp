@@ -20,8 +20,7 @@ void Write(std::FILE* stream, std::string_view text) {
   std::fwrite(text.data(), 1, text.size(), stream);
 }
 
-// JSON text that also escapes the control characters beyond ASCII, which JSON permits: it may go to
-// a terminal.
+// JSON that also escapes DEL and C1 control characters, as it may be printed on a terminal.
 std::string SafeJson(const Json& value) {
   const std::string text = value.dump(-1, ' ', false, Json::error_handler_t::replace);
   if (text.find('\x7F') == std::string::npos && text.find('\xC2') == std::string::npos) return text;
@@ -183,7 +182,7 @@ void ResultOutput::EndArray() {
   if (!closing_.empty()) Note(std::exchange(closing_, {}));
 }
 
-// Earlier results are flushed first, so that both streams keep their order on one terminal.
+// Flushes earlier results first, so that both streams stay in order on a terminal.
 void ResultOutput::Message(std::string_view text) {
   MakeWay();
   std::string line(text);
@@ -192,13 +191,13 @@ void ResultOutput::Message(std::string_view text) {
   std::fflush(context_.io.err);
 }
 
-// On a terminal, the progress line is cleared before a result.
+// Clears the progress line before a result on a terminal.
 void ResultOutput::ClearForResult() {
   if (context_.io.outTerminal) progress_.Clear();
 }
 
-// Flushes results. If they go to a file, at most ten times a second: thousands of small writes cost
-// more than some commands.
+// Flushes results, to files at most ten times a second: thousands of small writes cost more than
+// some commands.
 void ResultOutput::Deliver(bool now) {
   constexpr std::chrono::milliseconds kLongestWait{100};
   if (context_.io.outStored && !now) {

@@ -35,7 +35,7 @@ int Complain(const Io& io, const std::string& message, const std::string& topic 
   return kExitUsage;
 }
 
-// The place of the first argument from `from` on that is a word, options and their values left out.
+// Index of the first argument from `from` that is not an option or its value.
 std::optional<size_t> FindWord(const Arguments& arguments, size_t from) {
   for (size_t i = from; i < arguments.size(); ++i) {
     if (arguments[i] == "--") return i + 1 < arguments.size() ? std::optional(i + 1) : std::nullopt;
@@ -49,8 +49,7 @@ bool IsAnyOf(const std::string& argument, std::string_view shortForm, std::strin
   return argument == shortForm || argument == longForm;
 }
 
-// What the named command is called, with its second word where it has one, and the places of those
-// words.
+// The name of a command, one word or two, and the indices of those words.
 struct CommandName {
   std::string name;
   std::vector<size_t> places;
@@ -63,8 +62,8 @@ bool BeginsCommandGroup(const std::string& word) {
   return false;
 }
 
-// A command that begins a group as well, such as "exif", takes the second word only where it comes
-// right behind it: elsewhere it may be the value of an option, or a file.
+// If a command also starts a group, such as "exif", its second word must follow immediately:
+// elsewhere it may be the value of an option, or a file.
 CommandName NameOfCommand(const Arguments& arguments, size_t place) {
   CommandName result{arguments[place], {place}};
   if (!BeginsCommandGroup(result.name)) return result;
@@ -127,8 +126,8 @@ int ParseAndRun(const Command* command, const Arguments& arguments, const Io& io
   return status;
 }
 
-// The value of --lang, wherever it is: texts are needed before the command line is parsed. Empty
-// without one.
+// The value of --lang anywhere in the arguments, as texts are needed before parsing. Empty if not
+// given.
 std::string WantedLanguage(const Arguments& arguments) {
   constexpr std::string_view kOption = "--lang";
   std::string language;
@@ -148,7 +147,7 @@ int RefuseLanguage(const std::string& code, const Io& io) {
   return Complain(io, Tr("There is no translation \"%1\"; there are: %2.", code, list));
 }
 
-// The page of --version; its own options may stand before and behind it.
+// Prints the version; its options may come before or after --version.
 int PrintVersion(Arguments arguments, const Io& io) {
   VersionOptions options;
   std::erase_if(arguments, [&](const std::string& argument) {

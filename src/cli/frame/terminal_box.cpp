@@ -6,7 +6,7 @@
 namespace fotomill::cli {
 
 void TerminalBox::ShowLine(const ProgressLine& line, const FileOutcome* outcome) {
-  if (outcome == nullptr) {  // a closing line
+  if (outcome == nullptr) {  // summary line
     output_.EndArray();
     if (output_.Failures() > 0 && !toldFailures_)
       output_.Note(TrCount("One file failed.", "%1 files failed.", output_.Failures()));
@@ -43,7 +43,7 @@ void TerminalBox::ShowElement(const FileOutcome& outcome) {
 }
 
 int FinishBatch(const BatchJob& job, const CommandContext& context) {
-  // a history that cannot be written is no failure
+  // errors writing the history are ignored
   if (!job.uses.empty() && !context.global.noHistory)
     (void)UpdateFileHistory(HistoryOptionsFromSettings(), job.uses);
   return job.errors || job.writeAborts > 0 ? kExitFailed : kExitOk;

@@ -5,11 +5,11 @@
 
 namespace fotomill::cli {
 
-// The progress box of the command line: results and messages as every command prints them.
+// Progress box of the command line: prints results and messages via ResultOutput.
 class TerminalBox : public ProgressBox {
  public:
-  // `verbose` also prints notes that are not failures, `tellReplaced` also which files were
-  // replaced.
+  // `verbose` also prints notes, `tellReplaced` also the names of replaced
+  // files.
   TerminalBox(ResultOutput& output, bool verbose, bool tellReplaced)
       : output_(output), verbose_(verbose), tellReplaced_(tellReplaced) {
     output_.KeepGoing();
@@ -33,8 +33,8 @@ class TerminalBox : public ProgressBox {
   const bool tellReplaced_;
 };
 
-// Records a batch in the file history, unless --no-history is given. Returns the exit status of its
-// command: kExitFailed if a file failed or got no name.
+// Records a batch in the file history, unless --no-history is given. Returns the exit status:
+// kExitFailed if a file failed or could not be named.
 int FinishBatch(const BatchJob& job, const CommandContext& context);
 
 }  // namespace fotomill::cli

@@ -19,12 +19,12 @@ std::string Trimmed(std::string_view line) {
   return std::string(line);
 }
 
-// What a letter means for a file whose name is taken.
+// Answers if the output file exists.
 struct Choice {
-  char letter;  // as a capital: the same answer for the rest
+  char letter;  // uppercase: same answer for the rest
   bool ok;      // false: skip the file
   bool keepBoth;
-  bool recycle;  // the existing file
+  bool recycle;  // move the existing file to the trash
 };
 constexpr Choice kChoices[] = {
     {'r', true, false, false},
@@ -52,7 +52,7 @@ std::optional<OverwriteAnswer> Understand(const std::string& line, const Overwri
   return std::nullopt;
 }
 
-// Switches off the echo of typed text for its lifetime.
+// Disables terminal echo while it exists.
 class HiddenTyping {
  public:
   HiddenTyping() : hidden_(platform::ShowTyping(false)) {}
@@ -72,7 +72,7 @@ std::optional<std::string> TerminalPrompts::Ask(const std::string& question) {
   output_.MakeWay();
   std::fputs((question + " ").c_str(), context_.io.err);
   std::fflush(context_.io.err);
-  std::clearerr(context_.io.in);  // Ctrl-D ends an answer, not the terminal
+  std::clearerr(context_.io.in);  // after Ctrl-D, continue reading
   std::string line;
   int c = context_.io.in != stdin || platform::WaitForInput() ? std::fgetc(context_.io.in) : EOF;
   const bool ended = c == EOF;

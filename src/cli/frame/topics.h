@@ -8,26 +8,26 @@
 
 namespace fotomill::cli {
 
-// A piece of a page about what commands have in common, in the user's language.
+// Part of a help page that applies to several commands, translated.
 struct TopicPart {
   enum class Kind : uint8_t {
     Paragraph,
-    Entry,    // `left` and what it is, one of a list
-    Example,  // lines as they are typed
+    Entry,    // list entry: `left` and its description
+    Example,  // command lines
   };
   Kind kind;
   std::string text;
-  std::string left = {};  // of an entry only
+  std::string left = {};  // for Entry only
 };
 
-// A page of "fotomill help NAME", and a section of the man page of the program.
+// A page of "fotomill help NAME", also a section of the program's man page.
 struct Topic {
   const char* name;
   const char* summary;  // in English; no period
   std::vector<TopicPart> (*parts)();
 };
 
-// All topics in the order of the help page; null from FindTopic if there is none of that name.
+// All topics in the order of the help page. FindTopic: null if not found.
 std::span<const Topic> Topics();
 const Topic* FindTopic(std::string_view name);
 

@@ -13,7 +13,7 @@ void UsedFiles::Add(const std::string& name) {
   if (!on_ || !recorded) return;
   const std::string_view fileName = platform::FileNameOf(name);
   const std::string folder = name.substr(0, name.size() - fileName.size());
-  if (uses_.empty() || folder != folder_) {  // a batch has many files of one folder
+  if (uses_.empty() || folder != folder_) {  // batches have many files per folder
     folder_ = folder;
     absoluteFolder_ = platform::AbsolutePath(folder.empty() ? "." : folder);
   }

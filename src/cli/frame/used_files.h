@@ -9,11 +9,11 @@
 
 namespace fotomill::cli {
 
-// The files a command used, collected while it runs and recorded in the file history at its end.
-// Failing to write the history is not a failure of the command.
+// Collects the files used by a command and records them in the file history at the end. An error
+// writing the history does not fail the command.
 class UsedFiles {
  public:
-  // Nothing is recorded unless `on`: dry runs, --no-history.
+  // `on` false: record nothing (dry runs, --no-history).
   UsedFiles(FileFunction function, bool on) : on_(on), function_(function) {}
   UsedFiles(const UsedFiles&) = delete;
   UsedFiles& operator=(const UsedFiles&) = delete;
@@ -21,14 +21,14 @@ class UsedFiles {
     if (!uses_.empty()) (void)UpdateFileHistory(HistoryOptionsFromSettings(), uses_);
   }
 
-  // Adds a file that the command has just processed.
+  // Adds a processed file.
   void Add(const std::string& name);
 
  private:
   const bool on_;
   const FileFunction function_;
   std::vector<FileUse> uses_;
-  std::string folder_, absoluteFolder_;  // of the last file
+  std::string folder_, absoluteFolder_;  // of the last file, as a cache
 };
 
 }  // namespace fotomill::cli

@@ -8,7 +8,7 @@ namespace fotomill::cli {
 
 namespace {
 
-// How a library is used: as JSON and as people read it, in English.
+// How a library is linked: word for JSON, text in English.
 struct LinkingRow {
   const char* word;
   const char* text;

@@ -4,13 +4,13 @@
 
 namespace fotomill::cli {
 
-// How --version prints what the program is and what it is made of.
+// Options of --version.
 struct VersionOptions {
-  bool json = false;      // one JSON object with everything
-  bool licenses = false;  // with licenses and whose the libraries are
+  bool json = false;      // print everything as a JSON object
+  bool licenses = false;  // add licenses and copyright holders
 };
 
-// Name and version of the program, then of each library, one per line or as the options say.
+// Name and version of the program and of each library, one per line or as the options say.
 std::string VersionPage(const VersionOptions& options);
 
 }  // namespace fotomill::cli

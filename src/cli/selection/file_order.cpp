@@ -23,7 +23,7 @@ Key TimeKey(const std::string& path) {
   return time ? Key(time->seconds, time->nanoseconds) : Key();
 }
 
-// The date as one number, as TakenDate tells it.
+// The capture date as a number, from TakenDate.
 Key TakenKey(const std::string& path) {
   if (const int64_t taken = TakenDate(path); taken > 0) return {taken, 0};
   const auto [seconds, nanoseconds] = TimeKey(path);

@@ -7,9 +7,9 @@
 
 namespace fotomill::cli {
 
-// Sorts a selection by "name" (natural order of whole paths), "time" of modification, "taken" (the
-// EXIF date, without one the time of modification) or "size"; other words leave it as it is. Equal
-// files are in the order of their names.
+// Sorts a selection by "name" (natural order of whole paths), "time" (modification time), "taken"
+// (EXIF date, else modification time) or "size"; no change for any other value. Ties are sorted by
+// name.
 void SortFiles(const std::string& by, std::vector<BatchFile>& files);
 
 }  // namespace fotomill::cli

@@ -25,7 +25,7 @@ namespace {
 
 constexpr int kDeepestFolder = 64;
 
-// Reads a list from standard input; false if it is too long or cannot be read.
+// Reads a list from standard input; false if it is too long or reading fails.
 bool ReadInputList(const Io& io, std::string& contents) {
   uint8_t buffer[16384];
   for (;;) {
@@ -49,7 +49,8 @@ std::vector<std::string> SplitList(std::string_view list, char end) {
   return names;
 }
 
-// The path of a folder from the current one on; of others from the root on. Nothing leads up.
+// The path of a folder relative to the current one, or to the root if it is elsewhere. Never
+// contains "..".
 std::string FolderFromHere(const std::string& folder) {
   const std::string path = platform::AbsolutePath(folder.empty() ? "." : folder);
   std::string_view rest = path;
@@ -72,7 +73,7 @@ class Selector {
       AddNamed(name, {});
     }
   }
-  // From a list: outputs that keep the tree have the folders from the current one on.
+  // For names from a list: with --keep-tree, output folders are relative to the current one.
   void AddListed(const std::string& name) {
     if (platform::IsFolder(name)) {
       AddTree(name, FolderFromHere(name));
@@ -145,7 +146,7 @@ class Selector {
            (entry.link && platform::IsRegularFile(path));
   }
 
-  // Skips a folder that is its own ancestor, which mounts can cause.
+  // Skips a folder that is its own ancestor, as can happen with mounts.
   void Descend(const std::string& folder, const std::string& below, int depth) {
     if (depth > kDeepestFolder) {
       files_.push_back(
@@ -160,13 +161,13 @@ class Selector {
   }
 
   const SelectionOptions& options_;
-  std::set<std::pair<uint64_t, uint64_t>> trail_;  // the folder that is being read and its parents
+  std::set<std::pair<uint64_t, uint64_t>> trail_;  // the current folder and its parents
   std::vector<SelectedFile> files_;
   LeftOutFiles leftOut_;
   std::shared_ptr<StandardInput> input_;
 };
 
-// What is wrong with the use of standard input, a sentence; empty if nothing is.
+// Checks the use of standard input. Returns an error message, empty if valid.
 std::string CheckInput(SelectionOptions& options, const CommandContext& context) {
   const auto named =
       options.takesInput ? std::ranges::count(context.names.values, std::string(kStream)) : 0;
@@ -177,7 +178,7 @@ std::string CheckInput(SelectionOptions& options, const CommandContext& context)
   return options.from.empty() ? std::string() : ReadSourceFormat(options.from, options.from);
 }
 
-// Reads the list of --files-from. What is wrong, or empty.
+// Reads the list for --files-from. Returns an error message, empty on success.
 std::string ReadList(const SelectionOptions& options, const CommandContext& context,
                      std::string& list) {
   if (options.filesFrom.empty()) return {};

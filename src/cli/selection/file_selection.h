@@ -11,42 +11,42 @@
 
 namespace fotomill::cli {
 
-// A file that a command line asks for. Its name is as given, or folder and name joined; `below` is
-// the folder beneath the folder that was named.
+// A file from the command line. Its name is as given, or joined from folder and name; `below` is
+// the subfolder relative to the given folder.
 using SelectedFile = BatchFile;
 
-// How the named files and folders become a selection.
+// Options for selecting files.
 struct SelectionOptions {
   bool recursive = false;
   bool hidden = false;
   std::string filesFrom;
   bool zeroTerminated = false;
-  std::string sort;  // empty: named files as named, folders in natural order
+  std::string sort;  // empty: files as given, folders in natural order
   bool reverse = false;
   bool takesInput = false;  // "-" is standard input
-  std::string from;         // its format
+  std::string from;         // its format; empty: detect
 };
 
-// What a command line asks for.
+// The selected files.
 struct Selection {
   std::vector<SelectedFile> files;
-  std::string leftOut;  // what was left out of folders, a sentence; empty if nothing was
-  // standard input, if it is one of the files
+  std::string leftOut;  // summary of ignored files in folders, a sentence or empty
+  // standard input, if selected
   std::shared_ptr<StandardInput> input = {};
 };
 
-// Whether a command line names standard input as a picture.
+// Whether "-" is among the names.
 bool NamesInput(const CommandContext& context);
 
-// Declares the FILE... names of a command and the options that choose files. `options.takesInput`
-// counts before.
+// Declares the FILE... names and the options that select files. Set `options.takesInput`
+// first.
 void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& context);
 
-// The files of a command line: files as named; for a folder, its files that this build can read, in
-// natural order (with `recursive` also those of subfolders, except behind links), hidden ones only
-// if asked for; then the names read from a list. `sort` and `reverse` are applied to all of them
-// together. A missing file is in the result with its status. nullopt, after a message, if nothing
-// was named or the list cannot be read: a usage error.
+// Selects the files of a command line: given files in their order; for a folder, its readable files
+// in natural order (with `recursive` also in subfolders, but not through links), hidden ones only
+// on request; then the names from a list. `sort` and `reverse` apply to all of them together.
+// Missing files are included with their status. nullopt, after printing a message, for a usage
+// error: no names, or the list cannot be read.
 std::optional<Selection> SelectFiles(const SelectionOptions& options,
                                      const CommandContext& context);
 

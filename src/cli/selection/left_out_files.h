@@ -7,18 +7,18 @@
 
 namespace fotomill::cli {
 
-// Counts the files of folders that a command leaves out, by extension.
+// Counts the files in folders that a command ignores, by extension.
 class LeftOutFiles {
  public:
-  // A file that no format of this build reads. Those that the program itself keeps beside pictures
-  // do not count.
+  // Counts a file of unknown format, except for files that the program itself stores beside
+  // pictures.
   void Add(std::string_view name);
   void AddHidden() { ++hidden_; }
-  // "8 other files were left out: 3 .mov, 1 .heic, ..."; empty if there were none.
+  // "8 other files were left out: 3 .mov, 1 .heic, ..."; empty if there are none.
   std::string Line() const;
 
  private:
-  std::map<std::string, uint64_t, std::less<>> kinds_;  // by extension with its dot, in lower case
+  std::map<std::string, uint64_t, std::less<>> kinds_;  // by extension with dot, lowercase
   uint64_t hidden_ = 0;
 };
 

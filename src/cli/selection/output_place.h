@@ -7,18 +7,18 @@
 
 namespace fotomill::cli {
 
-// Makes --out FOLDER/ the same as --dest FOLDER.
+// Treats --out FOLDER/ as --dest FOLDER.
 void TakeFolder(std::string& out, std::string& dest);
 
-// A command whose output is standard output: the picture goes to a temporary file first and is
-// copied there at the end. Results go to standard error.
+// For a command that writes a picture to standard output: the picture goes to a temporary file
+// first, which is copied at the end. Results go to standard error.
 class StreamedOutput {
  public:
-  // Makes place for a file with that extension; false with the system's reason.
+  // Creates the temporary file with this extension; false with the system error.
   [[nodiscard]] bool Create(const std::string& extension);
-  // Where the output is to be written; empty without Create.
+  // Where to write the output; empty without Create.
   const std::string& Path() const { return path_; }
-  // Copies the file to standard output. False if it cannot be read; a failed write shows in the
+  // Copies the file to standard output. False if it cannot be read; write errors show in the
   // stream.
   [[nodiscard]] bool Deliver(const CommandContext& context) const;
 
@@ -27,7 +27,7 @@ class StreamedOutput {
   std::string path_;
 };
 
-// The same command with its results on standard error.
+// The same context with results on standard error.
 CommandContext WithResultsOnError(const CommandContext& context);
 
 }  // namespace fotomill::cli

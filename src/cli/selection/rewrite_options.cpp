@@ -14,7 +14,7 @@ namespace fotomill::cli {
 
 namespace {
 
-// What is wrong with the options, a whole sentence; empty if nothing is.
+// Returns an error message, empty if the options are valid.
 std::string CheckOptions(const RewriteOptions& options) {
   if (!options.inPlace && options.dest.empty() && options.out.empty())
     return Tr("Choose --dest DIR, --out FILE or --in-place.");
@@ -26,7 +26,7 @@ std::string CheckOptions(const RewriteOptions& options) {
   return {};
 }
 
-// What is wrong with --out for these files; empty if nothing is.
+// Checks --out for these files. Returns an error message, empty if valid.
 std::string CheckOut(const std::string& out, const std::vector<SelectedFile>& files,
                      const char* command) {
   if (out.empty()) return {};

@@ -10,7 +10,7 @@
 
 namespace fotomill::cli {
 
-// Where files go that a command rewrites in their own format, and what is shown.
+// Destination and output options of commands that rewrite files in their own format.
 struct RewriteOptions {
   SelectionOptions selection;
   std::string dest, out;
@@ -23,18 +23,18 @@ struct RewriteOptions {
   bool json = false;
 };
 
-// Declares the options: one of --in-place, --dest and --out, and what goes with them.
+// Declares the options: --in-place, --dest or --out, and related ones.
 void AddRewriteOptions(CLI::App& app, RewriteOptions& options);
 
-// The function that the options ask for; its `rewrite` and texts are the command's.
+// The function for these options; the command sets `rewrite` and the texts.
 RewriteFunction RewriteFunctionOf(const RewriteOptions& options);
 
-// The files of the command line, after a check of the options. nullopt, after a message, for a
-// usage error.
+// Checks the options and selects files. nullopt, after printing a message, for a usage
+// error.
 std::optional<Selection> SelectForRewrite(RewriteOptions& options, const CommandContext& context);
 
-// Runs `start`, which begins a batch over the selection, with a job that goes where the options say;
-// the command's exit status.
+// Runs `start`, which starts a batch for the selection, with a job set up from the options; returns
+// the exit status.
 int RunRewriteJob(const RewriteOptions& options, const Selection& selection,
                   const CommandContext& context, const std::function<void(BatchJob& job)>& start);
 

@@ -16,13 +16,13 @@ namespace fotomill::cli {
 namespace {
 
 constexpr size_t kPiece = 256 * 1024;
-constexpr uint64_t kMostBytes = uint64_t{2} << 30;  // it may be stored in memory
+constexpr uint64_t kMostBytes = uint64_t{2} << 30;  // temporary files may be in memory
 
 BatchFile Failed(Status status, std::string hint) {
   return {.name = kStream, .below = {}, .status = status, .hint = std::move(hint)};
 }
 
-// Fills the buffer unless the input ends before; nullopt if it cannot be read.
+// Fills the buffer up to the end of input; nullopt if reading fails.
 std::optional<size_t> ReadPiece(const Io& io, std::span<uint8_t> buffer) {
   size_t done = 0;
   while (done < buffer.size()) {
@@ -34,7 +34,7 @@ std::optional<size_t> ReadPiece(const Io& io, std::span<uint8_t> buffer) {
   return done;
 }
 
-// The extension of the likeliest format that this build reads; empty if nothing fits.
+// The extension of the most likely format that can be read; empty if none.
 std::string ExtensionOfContents(std::span<const uint8_t> head) {
   for (const std::string_view extension : IdentifySignature(head).extensions) {
     const int32_t row = FindFormatByName("x." + std::string(extension));

@@ -12,20 +12,20 @@
 
 namespace fotomill::cli {
 
-// The name that stands for standard input, and for standard output as an output.
+// Name for standard input, or standard output as the destination.
 inline constexpr const char* kStream = "-";
 
-// Reads what standard input has, at most the size of the buffer; waits if there is nothing yet. 0
-// at its end; nullopt if it cannot be read, or the program was asked to end.
+// Reads available input up to the size of the buffer; blocks if there is none. 0 at the end;
+// nullopt if reading fails or the program should exit.
 std::optional<size_t> ReadInput(const Io& io, std::span<uint8_t> buffer);
 
-// A picture that comes through standard input: a temporary file that goes with this object.
+// A picture from standard input, in a temporary file that is deleted with this object.
 class StandardInput {
  public:
-  // Reads the picture. The extension of the file tells its format: `from` or, where that is empty,
-  // what the first bytes say. The result is the file, or kStream with the reason why it failed.
+  // Reads the picture. The file's extension is its format: `from`, or detected from the contents if
+  // empty. Returns the file, or kStream with the reason for the failure.
   BatchFile Take(const Io& io, const std::string& from);
-  const std::string& Path() const { return path_; }  // empty before Take and when it failed
+  const std::string& Path() const { return path_; }  // empty before Take or if it failed
 
  private:
   bool Create(const std::string& extension);

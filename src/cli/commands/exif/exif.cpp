@@ -25,12 +25,12 @@ namespace {
 struct ExifOptions {
   SelectionOptions selection;
   bool json = false;
-  std::string thumbnail;              // file for the embedded thumbnail; empty: not extracted
-  std::string overwrite = "refuse";   // or "replace", for that file
+  std::string thumbnail;              // output file for the thumbnail; empty: do not extract
+  std::string overwrite = "refuse";   // or "replace", for the thumbnail file
   std::vector<std::string> distance;  // two places, or none
 };
 
-// The walk's lines as JSON directories.
+// Collects the walk as JSON directories.
 class JsonLines : public ExifSink {
  public:
   void Directory(int32_t, std::string_view label) override {
@@ -52,10 +52,10 @@ class JsonLines : public ExifSink {
 // The result for one file.
 struct Outcome {
   Status status = Status::Ok;
-  std::string hint;  // follows the message
-  std::string name;  // the file that the message is about; empty: the picture
+  std::string hint;  // printed after the message
+  std::string name;  // the file the message is about; empty: the picture
   bool hasExif = false;
-  bool cutShort = false;  // it has more entries than are shown
+  bool cutShort = false;  // not all entries are shown
 };
 
 Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& options,
@@ -63,7 +63,7 @@ Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& option
   const std::string& path = options.thumbnail;
   if (bytes.empty()) return {Status::NoImages, Tr("This file has no embedded thumbnail."), {}};
   if (path == kStream) {
-    std::fwrite(bytes.data(), 1, bytes.size(), stream);  // a failure shows in the stream
+    std::fwrite(bytes.data(), 1, bytes.size(), stream);  // write errors show in the stream
     return {};
   }
   const bool replace = options.overwrite == "replace";
@@ -82,8 +82,8 @@ Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& option
   return {Status::ErrorWritingFile, ReasonSentence(), path};
 }
 
-// Walks the EXIF of one file into `sink` and writes its thumbnail if asked to; `stream` is standard
-// output.
+// Walks the EXIF of a file into `sink` and extracts its thumbnail if requested; `stream` is
+// standard output.
 Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink& sink,
                  std::FILE* stream) {
   if (file.status != Status::Ok) return {file.status, file.hint, {}};
@@ -162,7 +162,7 @@ class ExifRun {
     return outcome;
   }
 
-  // The lines of one file, in a single write; with several files, the name comes first.
+  // Writes the lines of one file at once; with several files, preceded by the name.
   Outcome ReportLines(const SelectedFile& file, bool named) {
     lines_.Clear();
     Outcome outcome = WalkFile(file, options_, lines_, stream_);
@@ -172,14 +172,14 @@ class ExifRun {
     text_.clear();
     if (named) text_.append(output_.Shown(file.name)).append("\n");
     text_ += lines_.Text();
-    text_.pop_back();  // Line ends it
+    text_.pop_back();  // added by Line
     output_.Line(text_);
     return outcome;
   }
 
   const ExifOptions& options_;
   std::FILE* const stream_;
-  const CommandContext context_;  // results are not mixed with a thumbnail
+  const CommandContext context_;  // keeps results apart from a thumbnail
   ResultOutput output_;
   ExifText lines_{ExifTextOptionsFromSettings()};
   std::string text_;

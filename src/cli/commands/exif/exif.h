@@ -4,8 +4,8 @@
 
 namespace fotomill::cli {
 
-// Command "exif": declares its options in `app` and sets context.run, which lists EXIF or extracts
-// its thumbnail.
+// Command "exif": declares its options in `app` and sets context.run, which lists EXIF entries or
+// extracts the thumbnail.
 void SetUpExif(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli

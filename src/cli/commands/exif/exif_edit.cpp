@@ -24,7 +24,7 @@ namespace fotomill::cli {
 
 namespace {
 
-// Runs a command over its files.
+// Runs a rewriting command over its files.
 int RunExifRewrite(RewriteOptions& options, decltype(RewriteFunction::rewrite) rewrite,
                    const CommandContext& context) {
   const auto selection = SelectForRewrite(options, context);
@@ -34,7 +34,7 @@ int RunExifRewrite(RewriteOptions& options, decltype(RewriteFunction::rewrite) r
   function.listedTwice = TrLater("listed twice; already changed.");
   function.rewrite = std::move(rewrite);
   return RunRewriteJob(options, *selection, context, [&](BatchJob& job) {
-    (void)RunRewrite(selection->files, function, job);  // this box always opens
+    (void)RunRewrite(selection->files, function, job);  // TerminalBox always opens
   });
 }
 
@@ -51,12 +51,12 @@ bool IsFile(const std::string& name) {
   return platform::ExistenceOf(name) == platform::Existence::Yes;
 }
 
-// A command line of files and TAG=VALUE, or TAG.
+// Splits a command line into files and TAG=VALUE, or TAG.
 class TagArguments {
  public:
   explicit TagArguments(CommandContext& context) : context_(context) {}
 
-  // Takes what is no file off the names. False after a message.
+  // Removes everything but files from the names. False after printing a message.
   bool Take(bool withValues) {
     std::vector<std::string> files;
     for (std::string& word : context_.names.values) {
@@ -86,7 +86,7 @@ class TagArguments {
     (void)UsageError(context_, message);
     return false;
   }
-  // Neither a file nor a tag, but nearly one.
+  // Whether a name is neither a file nor a tag, but similar to a tag.
   static bool IsMistyped(const std::string& name) {
     const std::vector<std::string_view> names = ExifTagNames();
     return !NearestNameHint(name, names).empty();
@@ -101,7 +101,7 @@ class TagArguments {
   bool Unset(uint16_t tag) {
     const ExifTag* row = FindExifTag(tag);
     const bool ordinary = row != nullptr && row->editClass == kExifOrdinary;
-    // of tags that are not known, those of the camera are none that the picture depends on
+    // unknown tags in the Exif directory never affect how the picture is decoded
     if (ordinary || (row == nullptr && PlaceOfExifTag(tag) == ExifPlace::Exif))
       return Add({PlaceOfExifTag(tag), tag, {}});
     return Refuse(Tr("\"%1\" describes the structure of the file and cannot be changed.",
@@ -132,7 +132,7 @@ std::shared_ptr<RewriteOptions> SetUp(CLI::App& app, CommandContext& context, co
   return options;
 }
 
-// Takes the first argument that is a distance of times off the names.
+// Removes the first argument that is a time difference from the names.
 std::optional<int64_t> TakeShift(std::vector<std::string>& names) {
   const auto found =
       std::ranges::find_if(names, [](const std::string& name) { return ParseTimeShift(name).has_value(); });
@@ -142,8 +142,8 @@ std::optional<int64_t> TakeShift(std::vector<std::string>& names) {
   return shift;
 }
 
-// The Exif keys that are set, as changes. An empty key leaves its tag alone. False with a reason for
-// a value that the tag does not take.
+// Changes for all Exif keys that are set; tags of empty keys are not changed. False, with a reason,
+// for a value that the tag does not allow.
 bool OwnerChanges(ExifChanges& changes, std::string& reason) {
   const struct {
     uint16_t tag;
@@ -163,7 +163,7 @@ bool OwnerChanges(ExifChanges& changes, std::string& reason) {
   return reason.empty();
 }
 
-// The bits of a list of names; none for an unknown one, which is told.
+// Parses a list of names to flags; none, after printing a message, for an unknown name.
 std::optional<uint32_t> ParseKept(const std::string& list, const CommandContext& context) {
   if (list == "none") return 0;
   std::vector<std::string_view> names;

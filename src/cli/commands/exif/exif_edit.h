@@ -6,7 +6,7 @@
 
 namespace fotomill::cli {
 
-// Commands that change EXIF in files.
+// Commands that edit EXIF.
 void SetUpExifSet(CLI::App& app, CommandContext& context);
 void SetUpExifUnset(CLI::App& app, CommandContext& context);
 void SetUpExifCopy(CLI::App& app, CommandContext& context);
@@ -14,7 +14,7 @@ void SetUpExifShift(CLI::App& app, CommandContext& context);
 void SetUpExifOwner(CLI::App& app, CommandContext& context);
 void SetUpExifStrip(CLI::App& app, CommandContext& context);
 
-// Makes the same kind of change to every file of the command line; the exit status.
+// Applies `changer` to every file of the command line; returns the exit status.
 int RunExifEdit(RewriteOptions& options, const ExifChanger& changer, const CommandContext& context);
 
 }  // namespace fotomill::cli

@@ -26,13 +26,13 @@ struct GpsOptions {
   std::string gpx, offset, at, place;
 };
 
-// The path of ExifLocationsFile: a plain name is in the data folder.
+// The path from ExifLocationsFile: a plain name is in the data folder.
 std::string LocationsPath() {
   const std::string name(settings.ExifLocationsFile.view());
   return platform::SplitPath(name).folder.empty() ? DataFile(name) : name;
 }
 
-// Reads the place of a name; what is wrong as a sentence, empty if nothing is.
+// Looks up a place by name. Returns an error message, empty on success.
 std::string ReadListedPlace(const std::string& name, GpsPlace& place) {
   const std::string path = LocationsPath();
   platform::FileView file;
@@ -57,7 +57,7 @@ std::string ReadTrack(const std::string& path, GpsTrack& track) {
   return track.Empty() ? Tr("\"%1\" has no points with a time.", path) : std::string();
 }
 
-// The change that the options ask for; what is wrong with them, empty if nothing is.
+// Creates the changer for the options. Returns an error message, empty on success.
 std::string MakeChanger(const GpsOptions& options, ExifChanger& changer) {
   const int ways = (options.gpx.empty() ? 0 : 1) + (options.at.empty() ? 0 : 1) + (options.place.empty() ? 0 : 1);
   if (ways != 1) return Tr("Choose one of --gpx, --at and --place.");

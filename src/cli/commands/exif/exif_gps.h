@@ -4,7 +4,7 @@
 
 namespace fotomill::cli {
 
-// Command "exif gps": sets where pictures were taken.
+// Command "exif gps": sets the position of pictures.
 void SetUpExifGps(CLI::App& app, CommandContext& context);
 
 }  // namespace fotomill::cli
