@@ -88,11 +88,8 @@ TEST_F(FileHistory, SortsByTimeThenBackwardsByNameThenPath) {
   EXPECT_TRUE(Record(File("late"), 0, 4));
   EXPECT_TRUE(Record(File("early"), 0, 6));
   EXPECT_TRUE(Record(folder_.Path("a"), 0, 3));
-  EXPECT_THAT(List(), ElementsAre("a 0 -3", "late 0 -4", "x/c.bmp 0 -5", "b.jpg 0 -5", "y/b.bmp 0 -5", "x/b.bmp 0 -5",
-                                  "b.bmp 0 -5", "early 0 -6"));
-  EXPECT_TRUE(RemoveFromFileHistory(folder_.Path("b.jpg")));
-  EXPECT_FALSE(RemoveFromFileHistory(folder_.Path("b.jpg")));
-  EXPECT_EQ(List().size(), 7u);
+  EXPECT_THAT(List(), ElementsAre("a 0 -3", "late 0 -4", "x/c.bmp 0 -5", "b.jpg 0 -5",
+                                  "y/b.bmp 0 -5", "x/b.bmp 0 -5", "b.bmp 0 -5", "early 0 -6"));
 }
 
 TEST_F(FileHistory, IsLimitedByCountOrByDays) {
@@ -227,6 +224,54 @@ TEST_F(FileHistory, LeavesUnreadableFilesAlone) {
   EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}), HistoryUpdate::Failed);
 }
 
+// An entry stays with its file, whatever the file is called.
+TEST_F(FileHistory, EntriesFollowTheirFiles) {
+  const auto path = [&](const std::string& name) { return folder_.Path(name); };
+  const auto move = [&](const std::string& from, const std::string& to) {
+    std::filesystem::create_directories(std::filesystem::path(path(to)).parent_path());
+    std::filesystem::rename(path(from), path(to));
+    return FileUse{.path = path(to),
+                   .function = FileFunction::MoveAndCopy,
+                   .accessed = static_cast<int32_t>(kNow),
+                   .from = path(from)};
+  };
+  const auto update = [&](const std::vector<FileUse>& uses) {
+    size_t recorded = 99;
+    EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), uses, &recorded),
+              HistoryUpdate::Done);
+    return recorded;
+  };
+  const auto viewed = [&](const std::string& name, int64_t before) {
+    return FileUse{.path = File(name), .accessed = static_cast<int32_t>(kNow - before)};
+  };
+  EXPECT_EQ(update({viewed("a", 10), viewed("b", 20), viewed("d/e", 30), viewed("d/f/g", 40)}), 4u);
+  // Where moves are not recorded, entries keep their function and time.
+  settings.FileHistoryFunctions = ~(1 << 11) & 0xfffff;
+  EXPECT_EQ(update({move("b", "c")}), 0u);
+  EXPECT_THAT(Stored(), ElementsAre("a 0 -10", "c 0 -20", "d/e 0 -30", "d/f/g 0 -40"));
+  // Two that change places.
+  EXPECT_EQ(update({move("a", "t"), move("c", "a"), move("t", "c")}), 0u);
+  EXPECT_THAT(Stored(), ElementsAre("c 0 -10", "a 0 -20", "d/e 0 -30", "d/f/g 0 -40"));
+  // A folder takes along what is in it; itself it is no file.
+  settings.FileHistoryFunctions = 0xfffff;
+  EXPECT_EQ(update({move("d", "h"), viewed("d/e", 5)}), 1u);
+  EXPECT_THAT(Stored(), ElementsAre("d/e 0 -5", "c 0 -10", "a 0 -20", "h/e 0 -30", "h/f/g 0 -40"));
+  // Used, then renamed twice, all before it is written.
+  EXPECT_EQ(update({viewed("a", 3), move("a", "x"), move("x", "y")}), 3u);
+  EXPECT_THAT(Stored(),
+              ElementsAre("y 11 0", "d/e 0 -5", "c 0 -10", "h/e 0 -30", "h/f/g 0 -40"));
+  // A file that has vanished counts as removed, whoever asks; so does all that was in a folder.
+  std::filesystem::remove(path("c"));
+  std::filesystem::remove_all(path("h"));
+  EXPECT_EQ(update({{.path = path("c"), .removed = true}, {.path = path("h"), .removed = true}}),
+            0u);
+  EXPECT_EQ(ReadText(Store()).find(path("c") + "\t"), std::string::npos);
+  EXPECT_EQ(ReadText(Store()).find(path("h/")), std::string::npos);
+  EXPECT_THAT(Stored(), ElementsAre("y 11 0", "d/e 0 -5"));
+  EXPECT_EQ(update({{.path = path("y"), .removed = true}}), 0u) << "it is there, but not wanted";
+  EXPECT_THAT(Stored(), ElementsAre("d/e 0 -5"));
+}
+
 TEST_F(FileHistory, IsDeletedWhenSwitchedOff) {
   const FileUse use{File("a"), FileFunction::View};
   EXPECT_EQ(UpdateFileHistory(HistoryOptionsFromSettings(), {&use, 1}), HistoryUpdate::Done);
@@ -281,8 +326,10 @@ TEST_F(FileHistory, SlotsMatchTheirFiles) {
   EXPECT_EQ(shown(2), -1);
   put("f2", 12);
   EXPECT_EQ(shown(2), 12);
-  EXPECT_TRUE(RemoveFromFileHistory(folder_.Path("f2.bmp")));
-  EXPECT_TRUE(Record(File("g.bmp"), 0, 0));  // in the free slot
+  settings.FileHistoryWindowType = choice::kLimitCount;
+  settings.FileHistoryWindowCount = 2;
+  EXPECT_TRUE(Record(folder_.Path("f0.bmp"), 0, 0));  // the others are cut off, f2 the last
+  EXPECT_TRUE(Record(File("g.bmp"), 0, 0));           // in the free slot
   EXPECT_EQ(FileHistoryAt(0).path, folder_.Path("g.bmp"));
   EXPECT_EQ(shown(0), -1);
 }

@@ -3,9 +3,11 @@
 #include <algorithm>
 #include <cstring>
 #include <iterator>
+#include <optional>
 #include <unordered_map>
 #include <vector>
 
+#include "catalog/history/file_moves.h"
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "core/choice_lists.h"
 #include "core/data_folder.h"
@@ -112,15 +114,6 @@ class HistoryList {
     return true;
   }
 
-  bool Remove(std::string_view path) {
-    const auto found = slotOf_.find(std::string(path));
-    if (found == slotOf_.end()) return false;
-    order_.erase(Place(found->second));
-    free_.push_back(found->second);
-    slotOf_.erase(found);
-    return true;
-  }
-
   // The thumbnail in an entry's slot, which is filled when it is first asked for.
   const ThumbnailRecord* Thumbnail(size_t index) {
     const uint32_t number = order_[index];
@@ -224,9 +217,11 @@ std::string_view TakeLine(std::string_view& text) {
   return line.substr(0, line.find_first_of(std::string_view("\n\r\0", 3)));
 }
 
-// Records the entries of a history file's text. False when it holds bytes, but no line of a
-// history.
-bool ReadEntries(const HistoryOptions& options, std::string_view text) {
+// Records the entries of a history file's text, under the paths that their files have now. False
+// when it holds bytes, but no line of a history. `followed` turns true when an entry was concerned
+// by a move or removal.
+bool ReadEntries(const HistoryOptions& options, std::string_view text, const FileMoves& moves,
+                 bool& followed) {
   bool any = text.empty();
   while (!text.empty()) {
     const std::string_view line = TakeLine(text);
@@ -238,7 +233,10 @@ bool ReadEntries(const HistoryOptions& options, std::string_view text) {
     if (number < 0 || number >= kFileFunctionCount) continue;
     const int32_t time =
         FindField(line, kAccessedTag, accessed) ? Clamped(LeadingInteger(accessed)) : kOwnTime;
-    (void)RecordFileHistory(options, path, static_cast<FileFunction>(number), kOwnTime, time);
+    const std::optional<std::string> now = moves.PathNow(path);
+    followed = followed || now;
+    (void)RecordFileHistory(options, now ? *now : path, static_cast<FileFunction>(number), kOwnTime,
+                            time);
   }
   return any;
 }
@@ -270,14 +268,27 @@ HistoryUpdate UpdateOf(EditResult result) {
   return HistoryUpdate::Failed;
 }
 
-size_t RecordUses(const HistoryOptions& options, std::span<const FileUse> uses) {
+size_t RecordUses(const HistoryOptions& options, std::span<const FileUse> uses,
+                  std::span<const std::string> paths) {
   size_t recorded = 0;
-  for (const FileUse& use : uses) {
-    recorded += use.removed
-                    ? RemoveFromFileHistory(use.path)
-                    : RecordFileHistory(options, use.path, use.function, use.created, use.accessed);
+  for (size_t i = 0; i < uses.size(); ++i) {
+    const FileUse& use = uses[i];
+    if (use.removed) continue;  // its entry was left out
+    recorded += RecordFileHistory(options, paths[i], use.function, use.created, use.accessed);
   }
   return recorded;
+}
+
+// Takes up the moves and removals of uses, the last first; the path that the file of each has now.
+std::vector<std::string> FollowUses(std::span<const FileUse> uses, FileMoves& moves) {
+  std::vector<std::string> paths(uses.size());
+  for (size_t i = uses.size(); i > 0; --i) {
+    const FileUse& use = uses[i - 1];
+    paths[i - 1] = moves.PathNow(use.path).value_or(use.path);
+    if (use.removed) moves.RemovedBefore(use.path);
+    if (!use.from.empty()) moves.MovedBefore(use.from, use.path);
+  }
+  return paths;
 }
 
 }  // namespace
@@ -314,8 +325,6 @@ bool RecordFileHistory(const HistoryOptions& options, std::string_view path, Fil
   return true;
 }
 
-bool RemoveFromFileHistory(std::string_view path) { return list.Remove(path); }
-
 bool LoadFileHistory(const HistoryOptions& options) {
   if (!options.on) return false;
   const std::string path = FileHistoryPath(options);
@@ -323,7 +332,8 @@ bool LoadFileHistory(const HistoryOptions& options) {
   if (path.empty()) return false;
   const platform::ReadResult result = platform::ReadWholeFile(path, limits.listFileBytes, text);
   loaded = result == platform::ReadResult::Missing || result == platform::ReadResult::Done;
-  return result == platform::ReadResult::Done && ReadEntries(options, text);
+  bool followed = false;
+  return result == platform::ReadResult::Done && ReadEntries(options, text, {}, followed);
 }
 
 bool SaveFileHistory(const HistoryOptions& options) {
@@ -370,11 +380,14 @@ HistoryUpdate UpdateFileHistory(const HistoryOptions& options, std::span<const F
   const std::string path = FileHistoryPath(options);
   if (path.empty()) return HistoryUpdate::Failed;
   bool foreign = false;
+  FileMoves moves;
+  const std::vector<std::string> paths = FollowUses(uses, moves);
   const EditResult result = EditTextFile(path, limits.listFileBytes, [&](std::string& text) {
-    foreign = !ReadEntries(options, text);
-    const size_t count = foreign ? 0 : RecordUses(options, uses);
+    bool followed = false;
+    foreign = !ReadEntries(options, text, moves, followed);
+    const size_t count = foreign ? 0 : RecordUses(options, uses, paths);
     if (recorded != nullptr) *recorded = count;
-    if (!foreign && !outOfMemory && count > 0) text = TextOfList();
+    if (!foreign && !outOfMemory && (count > 0 || followed)) text = TextOfList();
   });
   const bool incomplete = outOfMemory;
   ClearFileHistory();

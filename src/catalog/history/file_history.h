@@ -74,8 +74,6 @@ bool FitsFileHistory(std::string_view path);
 // function is switched off, the path is no regular file or does not fit, or there is no memory.
 bool RecordFileHistory(const HistoryOptions& options, std::string_view path, FileFunction function,
                        int32_t created = kOwnTime, int32_t accessed = kOwnTime);
-// Takes the entry of a path out of the list. False if there is none.
-bool RemoveFromFileHistory(std::string_view path);
 
 // Reads the history file into the list. False when the history is switched off or the file cannot
 // be read.
@@ -111,6 +109,9 @@ struct FileUse {
   int32_t created = kOwnTime;
   int32_t accessed = kOwnTime;
   bool removed = false;  // the path is gone: its entry is taken out instead
+  // The file or folder had this path before: its entry, or those of the files in it, continue under
+  // `path`, to which the use is then recorded.
+  std::string from = {};
 };
 
 // What became of the uses that a command recorded.
@@ -122,8 +123,9 @@ enum class HistoryUpdate {
 };
 // Records uses, in order, permanently: locks the history file, reads it afresh, so that what other
 // processes recorded stays, records, and replaces the file in one step. `recorded` counts the uses
-// that were. With the history switched off permanently the history file is deleted; switched off
-// for this run only, it stays. The list is free afterwards.
+// that were, not the entries that merely follow their files. A file that was there when it was used
+// and has vanished since counts as removed. With the history switched off permanently the history
+// file is deleted; switched off for this run only, it stays. The list is free afterwards.
 HistoryUpdate UpdateFileHistory(const HistoryOptions& options, std::span<const FileUse> uses,
                                 size_t* recorded = nullptr);
 

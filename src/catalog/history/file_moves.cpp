@@ -1,0 +1,27 @@
+#include "catalog/history/file_moves.h"
+
+#include "platform/paths.h"
+
+namespace fotomill {
+
+void FileMoves::MovedBefore(const std::string& from, const std::string& to) {
+  std::string last = PathNow(to).value_or(to);
+  now_.erase(to);  // what was there before, if anything, is not what came
+  now_[from] = std::move(last);
+}
+
+void FileMoves::RemovedBefore(const std::string& path) { now_[path].clear(); }
+
+// By the path itself, or the folder next above it of which something is known.
+std::optional<std::string> FileMoves::PathNow(std::string_view path) const {
+  if (now_.empty()) return std::nullopt;
+  for (size_t end = path.size(); end != std::string_view::npos && end > 0;
+       end = path.substr(0, end).rfind(platform::kSeparator)) {
+    const auto found = now_.find(std::string(path.substr(0, end)));
+    if (found == now_.end()) continue;
+    return found->second.empty() ? std::string() : found->second + std::string(path.substr(end));
+  }
+  return std::nullopt;
+}
+
+}  // namespace fotomill
