@@ -2,7 +2,9 @@
 
 #include <gmock/gmock.h>
 
+#include "catalog/thumbnails/orphan_times.h"
 #include "catalog/thumbnails/thumbnail_record.h"
+#include "core/data_folder.h"
 #include "platform/clock.h"
 #include "platform/volumes.h"
 #include "support/bitmaps.h"
@@ -52,6 +54,7 @@ class ThumbnailUpdate : public testing::Test {
       return platform::Volume{true, "v", 1, kind};
     });
     platform::FixNow(kNow);
+    SetDataFolder(data_.Path());
     for (const char* name : {"a.bmp", "b.bmp", ".c.bmp"})
       WriteBytes(folder_.Path(name), BitmapFile(3, 3, 24));
     for (const char* name : {"a.THN", "gone.THN", "B.thn.txt"}) WriteText(folder_.Path(name), "");
@@ -61,12 +64,14 @@ class ThumbnailUpdate : public testing::Test {
   }
   ~ThumbnailUpdate() override {
     platform::FixNow(-1);
+    SetDataFolder({});
     platform::ReplaceVolumeFunction(nullptr);
   }
+  std::string Times() const { return data_.Path("FMWThumbnailCleanUp.txt"); }
   bool HasOrphan() const { return std::filesystem::exists(folder_.Path("gone.THN")); }
 
   static inline DriveKind kind;
-  TemporaryFolder folder_;
+  TemporaryFolder folder_, data_;
   ThumbnailBrowser browser_;
   Face face_;
 };
@@ -93,6 +98,7 @@ TEST_F(ThumbnailUpdate, IsOfferedIfUseful) {
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
     WriteText(folder_.Path("gone.THN"), "");
+    std::filesystem::remove(Times());
     ThumbnailBrowser browser = browser_;
     browser.mode = row.mode;
     browser.view = row.view;
@@ -103,7 +109,7 @@ TEST_F(ThumbnailUpdate, IsOfferedIfUseful) {
     EXPECT_EQ(OfferThumbnailUpdate(browser, face), row.offered);
     EXPECT_EQ(face.count, row.offered ? 2 : -1);
     EXPECT_EQ(HasOrphan(), !row.compacted);
-    EXPECT_EQ(browser.lastCompaction, row.compacted ? kNow : 0);
+    EXPECT_EQ(LastOrphanRemoval(browser.folder), row.compacted ? kNow : 0);
     EXPECT_EQ(face.attached, row.mode == choice::kVirtual ? std::vector<std::string>{"b.bmp"} : std::vector<std::string>());
   }
 }
@@ -141,9 +147,10 @@ TEST_F(ThumbnailUpdate, StoresTheAnswer) {
 }
 
 TEST_F(ThumbnailUpdate, RemovesOrphansPeriodically) {
-  browser_.lastCompaction = kNow - 30 * kDay;
+  EXPECT_TRUE(IsCompactionDue(browser_)) << "never yet";
+  ASSERT_TRUE(KeepOrphanRemoval(browser_.folder, kNow - 30 * kDay));
   EXPECT_FALSE(IsCompactionDue(browser_));
-  --browser_.lastCompaction;
+  ASSERT_TRUE(KeepOrphanRemoval(browser_.folder, kNow - 30 * kDay - 1));
   EXPECT_TRUE(IsCompactionDue(browser_));
   browser_.compacts = false;
   EXPECT_FALSE(IsCompactionDue(browser_));
@@ -157,6 +164,38 @@ TEST_F(ThumbnailUpdate, RemovesOrphansPeriodically) {
   WriteText(folder_.Path("B.THN"), "");
   EXPECT_TRUE(RemoveOrphanThumbnails(browser_));
   EXPECT_THAT(folder_.Names(), ElementsAre(".c.bmp", "B.THN", "B.thn.txt", "a.THN", "a.bmp", "b.bmp"));
+  // The time is the folder's, not the browser's.
+  ThumbnailBrowser another = browser_;
+  another.compacts = true;
+  EXPECT_FALSE(IsCompactionDue(another));
+  another.folder += "/sub";
+  EXPECT_TRUE(IsCompactionDue(another));
+}
+
+TEST_F(ThumbnailUpdate, CleansFoldersWithoutPictures) {
+  browser_.files.clear();
+  EXPECT_FALSE(OfferThumbnailUpdate(browser_, face_));
+  EXPECT_FALSE(HasOrphan());
+  EXPECT_EQ(LastOrphanRemoval(browser_.folder), kNow);
+}
+
+TEST_F(ThumbnailUpdate, KeepsTheTimesOfFolders) {
+  for (const char* folder : {"/a", "/b,c", "/a"}) EXPECT_TRUE(KeepOrphanRemoval(folder, 7));
+  EXPECT_TRUE(KeepOrphanRemoval("/\xff", -5));
+  EXPECT_FALSE(KeepOrphanRemoval("/a\nb", 7));
+  EXPECT_FALSE(KeepOrphanRemoval("", 7));
+  EXPECT_EQ(ReadText(Times()), "-5,/\xff\n7,/a\n7,/b,c\n");
+  WriteText(Times(), "7\nx,/a\n,/a\n7.5,/a\n8,/b,c\r\n9,/a");
+  EXPECT_EQ(LastOrphanRemoval("/a"), 9);
+  EXPECT_EQ(LastOrphanRemoval("/b,c"), 8);
+  EXPECT_EQ(LastOrphanRemoval("/d"), 0);
+  std::string many;
+  for (int i = 0; i < 6000; ++i) many += "1,/" + std::to_string(i) + "\n";
+  WriteText(Times(), many);
+  EXPECT_TRUE(KeepOrphanRemoval("/5", 2));
+  EXPECT_EQ(LastOrphanRemoval("/5"), 2);
+  EXPECT_EQ(LastOrphanRemoval("/4999"), 1);
+  EXPECT_EQ(LastOrphanRemoval("/5000"), 0);
 }
 
 }  // namespace

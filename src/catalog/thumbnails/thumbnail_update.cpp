@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <iterator>
 
+#include "catalog/thumbnails/orphan_times.h"
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "platform/clock.h"
 #include "platform/files.h"
@@ -120,15 +121,16 @@ bool OfferThumbnailUpdate(ThumbnailBrowser& browser, ThumbnailUpdateFace& face) 
 
 bool IsCompactionDue(const ThumbnailBrowser& browser) {
   const int64_t interval = int64_t{std::max(browser.options.compactionDays, 0)} * 86400;
-  return browser.compacts && browser.lastCompaction < platform::Now() - interval;
+  return browser.compacts && browser.options.compacts &&
+         LastOrphanRemoval(browser.folder) + interval < platform::Now();
 }
 
-bool RemoveOrphanThumbnails(ThumbnailBrowser& browser) {
+bool RemoveOrphanThumbnails(const ThumbnailBrowser& browser) {
   if (!browser.options.compacts || !IsOn(browser.folder, kCompactedOn)) return false;
   const auto orphans = OrphanThumbnails(browser.folder, browser.files);
   if (!orphans) return false;
   for (const std::string& orphan : *orphans) (void)platform::DeleteFile(orphan);
-  browser.lastCompaction = platform::Now();
+  (void)KeepOrphanRemoval(browser.folder, platform::Now());
   return true;
 }
 

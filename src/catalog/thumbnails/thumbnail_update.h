@@ -34,7 +34,6 @@ struct ThumbnailBrowser {
   choice::ViewMode view = choice::kViewNormal;
   bool asks = true;            // false once its user wants no more offers here
   bool compacts = true;        // removes orphans
-  int64_t lastCompaction = 0;  // seconds since 1970 UTC
   ThumbnailUpdateOptions options = {};
 };
 
@@ -79,11 +78,12 @@ class ThumbnailUpdateFace {
 // what was chosen is then in the browser and its options.
 bool OfferThumbnailUpdate(ThumbnailBrowser& browser, ThumbnailUpdateFace& face);
 
-// Whether so much time has passed since the browser's last compaction that the next one is due.
+// Whether so much time has passed since the folder's last compaction that the next one is due; in
+// this run or an earlier one, by whatever browser.
 bool IsCompactionDue(const ThumbnailBrowser& browser);
 // Deletes thumbnail files to which no file of the browser's list belongs. False, and nothing
 // happens, unless the options compact, on optical drives and drives of a kind unknown, or when the
-// folder cannot be read. The time of a successful run is kept in the browser.
-bool RemoveOrphanThumbnails(ThumbnailBrowser& browser);
+// folder cannot be read. The time of a successful run is kept for the folder.
+bool RemoveOrphanThumbnails(const ThumbnailBrowser& browser);
 
 }  // namespace fotomill

@@ -38,6 +38,7 @@ void ReadTabValue(SessionTab& tab, std::string_view key, std::string_view value)
   if (key == "Descending") tab.view.descending = Number(value) != 0;
   if (key == "Scroll") tab.scroll = std::max<int64_t>(LeadingInteger(value), 0);
   if (key == "Focus") tab.focus = value;
+  if (key == "AskForThumbnails") tab.asksForThumbnails = Number(value) != 0;
 }
 
 std::string Line(const char* key, std::string_view value) {
@@ -84,6 +85,7 @@ std::string SessionText(const Session& session) {
             Line("ViewMode", tab.view.modes.view) + Line("SortMode", tab.view.modes.sort) +
             Line("Descending", tab.view.descending ? 1 : 0) + Line("Scroll", tab.scroll);
     if (FitsLine(tab.focus)) text += Line("Focus", tab.focus);
+    if (!tab.asksForThumbnails) text += Line("AskForThumbnails", 0);
   }
   return text;
 }

@@ -16,7 +16,7 @@ namespace fotomill::desktop {
 //   details), Tab (the
 //                      one in front, from 0)
 //   [Tab]              Folder, ThumbnailMode, ViewMode, SortMode, Descending, Scroll (pixels),
-//   Focus (a name)
+//   Focus (a name), AskForThumbnails (0: the tab does not offer to make missing ones)
 //
 // a line "KEY=VALUE" each; lines that are not understood are passed over.
 struct SessionTab {
@@ -24,6 +24,7 @@ struct SessionTab {
   FolderView view;
   int64_t scroll = 0;
   std::string focus;
+  bool asksForThumbnails = true;
 
   bool operator==(const SessionTab&) const = default;
 };

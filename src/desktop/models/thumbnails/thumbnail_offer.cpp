@@ -6,6 +6,7 @@
 #include "core/workers/guarded.h"
 #include "core/workers/share_out.h"
 #include "desktop/models/thumbnails/thumbnail.h"
+#include "platform/clock.h"
 #include "platform/paths.h"
 
 namespace fotomill::desktop {
@@ -16,9 +17,21 @@ class ThumbnailOffer::Face : public ThumbnailUpdateFace {
       : offer_(offer), folder_(browser.folder), options_(browser.options.making) {}
   bool changed = false;
 
-  bool ShowProgress(const std::string&, size_t, size_t) override { return !offer_.stop_; }
+  bool ShowProgress(const std::string& text, size_t done, size_t total) override {
+    const double now = platform::MonotonicSeconds();
+    if (now - begin_ >= offer_.silentSeconds_ && now - told_ >= kEverySeconds) {
+      told_ = now;
+      offer_.events_.scanning(text, done, total);
+    }
+    const std::lock_guard lock(offer_.mutex_);
+    return !offer_.stop_ && offer_.answer_ < 0;
+  }
   void AttachRecord(const std::string&, const ThumbnailRecord&) override {}
   int32_t AskForUpdate(int32_t count, int32_t selected) override {
+    {
+      const std::lock_guard lock(offer_.mutex_);
+      if (offer_.answer_ >= 0) return offer_.answer_;  // the bar was closed while it was searched
+    }
     offer_.events_.ask(count, selected);
     std::unique_lock lock(offer_.mutex_);
     offer_.answered_.wait(lock, [this] { return offer_.answer_ >= 0 || offer_.stop_; });
@@ -42,17 +55,23 @@ class ThumbnailOffer::Face : public ThumbnailUpdateFace {
   void KeepChoice(const ThumbnailUpdateOptions& options) override { offer_.events_.keep(options); }
 
  private:
+  static constexpr double kEverySeconds = 0.1;  // between two reports
+
   ThumbnailOffer& offer_;
+  const double begin_ = platform::MonotonicSeconds();
+  double told_ = 0;
   const std::string folder_;
   const ThumbnailOptions options_;
 };
 
-std::shared_ptr<ThumbnailOffer> ThumbnailOffer::Start(ThumbnailBrowser browser, Events events) {
+std::shared_ptr<ThumbnailOffer> ThumbnailOffer::Start(ThumbnailBrowser browser, Events events,
+                                                      double silentSeconds) {
   auto offer = std::make_shared<ThumbnailOffer>();
+  offer->silentSeconds_ = silentSeconds;
   offer->events_ = std::move(events);
   (void)RunLoose([offer, browser = std::move(browser)] {
     if (Guarded([&] { offer->Run(browser); }) != Status::Ok && !offer->stop_)
-      offer->events_.ended(true, browser);
+      offer->events_.ended(true);
   });
   return offer;
 }
@@ -62,7 +81,7 @@ void ThumbnailOffer::Run(ThumbnailBrowser browser) {
   // Records of the list itself are not needed: the browser loads what it shows.
   if (browser.mode == choice::kVirtual) browser.mode = choice::kDiskBased;
   (void)OfferThumbnailUpdate(browser, face);
-  if (!stop_) events_.ended(face.changed, browser);
+  if (!stop_) events_.ended(face.changed);
 }
 
 void ThumbnailOffer::Answer(int32_t choice) {

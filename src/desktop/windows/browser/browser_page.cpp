@@ -148,6 +148,7 @@ void BrowserPage::Reload() { reader_.List(model_.Folder(), model_.ItemCount() ==
 
 void BrowserPage::ShowListing(FolderListing listing, bool complete) {
   const size_t count = listing.items.size();
+  const bool readable = listing.readable;
   model_.SetItems(std::move(listing.items));
   LogEvent(complete ? "listed" : "names", std::to_string(count) + " " + model_.Folder());
   if (!wantedFocus_.empty()) {
@@ -164,7 +165,7 @@ void BrowserPage::ShowListing(FolderListing listing, bool complete) {
   if (complete) {
     watch_.Watch(model_.Folder());
     StartFacts();
-    OfferThumbnails();
+    if (readable) OfferThumbnails();
     wantedFocus_.clear();
     wantedScroll_ = -1;
   }
@@ -172,7 +173,6 @@ void BrowserPage::ShowListing(FolderListing listing, bool complete) {
 }
 
 void BrowserPage::OfferThumbnails() {
-  if (model_.ItemCount() == 0) return;
   std::vector<std::string> files;
   for (size_t i = 0; i < model_.ItemCount(); ++i) {
     if (!model_.Item(i).folder) files.push_back(model_.Item(i).name);

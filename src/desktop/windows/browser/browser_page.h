@@ -88,6 +88,9 @@ class BrowserPage : public wxPanel {
   int64_t Scroll() const;  // pixels
   // Scrolled so far once the folder is listed.
   void RestoreScroll(int64_t scroll) { wantedScroll_ = scroll; }
+  // Whether this browser offers to make missing thumbnails.
+  bool AsksForThumbnails() const { return offer_.Asks(); }
+  void SetAsksForThumbnails(bool asks) { offer_.SetAsks(asks); }
 
  private:
   void BuildFilter();

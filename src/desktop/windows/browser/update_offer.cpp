@@ -12,6 +12,7 @@ namespace fotomill::desktop {
 UpdateOffer::UpdateOffer(wxWindow* parent, Events events) : events_(std::move(events)) {
   bar_ = new UpdateBar(parent, [this](int32_t choice) {
     if (offer_ != nullptr) offer_->Answer(choice);
+    if (choice == kUpdateNotHere) asks_ = false;
     ShowBar(false);
     events_.answered();
   });
@@ -25,14 +26,13 @@ UpdateOffer::~UpdateOffer() {
 void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> files,
                         const BrowserModes& modes) {
   if (offered_) return;
-  offered_ = true;
+  offered_ = !files.empty();
   ThumbnailBrowser browser;
   browser.folder = folder;
   browser.files = std::move(files);
   browser.mode = static_cast<choice::ThumbnailMode>(modes.thumbnails);
   browser.view = static_cast<choice::ViewMode>(modes.view);
   browser.asks = asks_;
-  browser.lastCompaction = lastCompaction_;
   browser.options = ThumbnailUpdateOptionsFromSettings();
   // What the offer tells of a folder that was left meanwhile is dropped.
   const auto weak = std::make_shared<std::weak_ptr<ThumbnailOffer>>();
@@ -49,6 +49,13 @@ void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> file
       LogEvent("offer", std::to_string(count));
     });
   };
+  events.scanning = [this, post](const std::string& text, size_t done, size_t total) {
+    post([this, text, done, total] {
+      bar_->Report(Label("%1: %2 of %3", Shown(text), done, total));
+      ShowBar(true);
+      LogEvent("scanning", text);
+    });
+  };
   events.keep = [](const ThumbnailUpdateOptions& options) {  // wherever the frame has gone since
     wxTheApp->CallAfter([options] { StoreThumbnailUpdate(options); });
   };
@@ -58,10 +65,8 @@ void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> file
       ShowBar(done < total);
     });
   };
-  events.ended = [this, post](bool changed, const ThumbnailBrowser& after) {
-    post([this, changed, asks = after.asks, compaction = after.lastCompaction] {
-      asks_ = asks;
-      lastCompaction_ = compaction;
+  events.ended = [this, post](bool changed) {
+    post([this, changed] {
       ShowBar(false);
       if (changed) events_.made();
       LogEvent("offer-ended", changed ? "changed" : "unchanged");

@@ -28,10 +28,13 @@ class UpdateOffer {
 
   // The bar, hidden while there is nothing to ask or tell; its parent lays it out.
   UpdateBar* Bar() const { return bar_; }
-  // Offers once for a folder with these files.
+  // Offers once for a folder with these files; one without any is only cleaned up.
   void Offer(const std::string& folder, std::vector<std::string> files, const BrowserModes& modes);
   // The browser goes to another folder.
   void Forget();
+  // Whether this browser asks; kept with its tab.
+  bool Asks() const { return asks_; }
+  void SetAsks(bool asks) { asks_ = asks; }
 
  private:
   void ShowBar(bool show);
@@ -41,7 +44,6 @@ class UpdateOffer {
   std::shared_ptr<ThumbnailOffer> offer_;  // of this folder
   bool offered_ = false;
   bool asks_ = true;  // until the user wants no more offers here
-  int64_t lastCompaction_ = 0;
 };
 
 }  // namespace fotomill::desktop

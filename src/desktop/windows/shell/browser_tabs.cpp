@@ -166,6 +166,7 @@ void BrowserTabs::Restore(const Session& session) {
     auto* page = new BrowserPage(book_, *this, shell_.Thumbnails(), tab.view);
     book_->AddPage(page, FolderLabel(tab.folder));
     book_->SetPageToolTip(book_->GetPageCount() - 1, Shown(tab.folder));
+    page->SetAsksForThumbnails(tab.asksForThumbnails);
     page->Open(tab.folder, tab.focus);
     page->RestoreScroll(tab.scroll);
   }
@@ -192,8 +193,9 @@ void BrowserTabs::Keep(Session& session) {
   for (size_t tab = 0; tab < book_->GetPageCount(); ++tab) {
     const BrowserModel& model = PageAt(tab)->Model();
     const size_t focus = model.Selected().Focus();
-    session.tabs.push_back(
-        {model.Folder(), model.View(), PageAt(tab)->Scroll(), focus == kNoLine ? std::string() : model.Line(focus).name});
+    session.tabs.push_back({model.Folder(), model.View(), PageAt(tab)->Scroll(),
+                            focus == kNoLine ? std::string() : model.Line(focus).name,
+                            PageAt(tab)->AsksForThumbnails()});
   }
   (void)views_.Save();
 }
