@@ -9,6 +9,7 @@
 
 #include "batch/progress_box.h"
 #include "catalog/history/file_history.h"
+#include "catalog/thumbnails/picture_changes.h"
 #include "core/fixed_text.h"
 #include "core/status.h"
 #include "core/workers/stop_token.h"
@@ -112,6 +113,8 @@ struct BatchJob {
   uint32_t writeAborts = 0;   // files left out because no numbered variant was free
   // for the file history, which belongs to the main thread: UpdateFileHistory(job.uses)
   std::vector<FileUse> uses;
+  // files that were written, renamed or replaced; their database records are marked at the end
+  std::vector<PictureChange> changes;
 };
 
 // What became of one file.

@@ -21,6 +21,11 @@ ReportedRun::ReportedRun(std::span<const BatchFile> files, BatchJob& job, Task t
             .goesOn = [this] { return !ended_ && !stop_.Asked(); },
             .tick = [this] { Tick(); }}) {}
 
+void ReportedRun::Run(uint32_t jobs) {
+  run_.Run(files_.size(), jobs == 0 ? CoreJobs() : jobs);
+  MarkChangedRecords(std::exchange(job_.changes, {}));
+}
+
 uint32_t ReportedRun::CoreJobs() { return platform::CoreCount(); }
 
 Status ReportedRun::Work(size_t file) {
@@ -41,13 +46,17 @@ void ReportedRun::Deliver(size_t file, Status status) {
   if (outcomes.empty()) return;
   job_.source.AssignCut(outcomes[0].source);
   const auto isWritten = [&](const FileOutcome& outcome) {
-    return !outcome.destination.empty() && !outcome.skipped && !task_.dryRun;
+    return outcome.status == Status::Ok && !outcome.destination.empty() && !outcome.skipped &&
+           !task_.dryRun;
   };
   if (std::ranges::any_of(outcomes, isWritten)) {
     NoteUse(outcomes[0].source);
     job_.filesChanged = true;
   }
-  for (const FileOutcome& outcome : outcomes) Report(file, outcome);
+  for (const FileOutcome& outcome : outcomes) {
+    if (isWritten(outcome)) NoteChange(outcome);
+    Report(file, outcome);
+  }
 }
 
 void ReportedRun::Report(size_t file, const FileOutcome& outcome) {
@@ -60,6 +69,13 @@ void ReportedRun::Tick() {
   if (job_.box == nullptr) return;
   job_.box->Tick();
   if (!job_.box->GoesOn()) ended_ = true;
+}
+
+// The thumbnail file of an output may be another picture's unless a file was replaced.
+void ReportedRun::NoteChange(const FileOutcome& outcome) {
+  const std::string path = platform::AbsolutePath(outcome.destination);
+  job_.changes.push_back({path});
+  if (outcome.replaced) DeleteThumbnailFile(path);
 }
 
 void ReportedRun::NoteUse(const std::string& source) {

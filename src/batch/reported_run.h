@@ -17,7 +17,7 @@ namespace fotomill {
 
 // How every batch over files runs: each is worked on, on some thread, into an outcome; outcomes are
 // reported on the calling thread in the order of the selection, to the job's box, and what was
-// written goes into the file history.
+// written goes into the file history; thumbnails of what was there before go.
 class ReportedRun {
  public:
   // What is done with each file, and how it is recorded.
@@ -33,7 +33,7 @@ class ReportedRun {
   ReportedRun(std::span<const BatchFile> files, BatchJob& job, Task task);
 
   // At most `jobs` files at a time; 0: one per core.
-  void Run(uint32_t jobs) { run_.Run(files_.size(), jobs == 0 ? CoreJobs() : jobs); }
+  void Run(uint32_t jobs);
   // As OrderedRun::InTurn.
   bool InTurn(size_t file, const std::function<void()>& step) { return run_.InTurn(file, step); }
 
@@ -44,6 +44,7 @@ class ReportedRun {
   void Report(size_t file, const FileOutcome& outcome);
   void Tick();
   void NoteUse(const std::string& source);
+  void NoteChange(const FileOutcome& outcome);
 
   const std::span<const BatchFile> files_;
   BatchJob& job_;

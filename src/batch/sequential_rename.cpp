@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <numeric>
 #include <random>
+#include <utility>
 
 #include "core/plain_name.h"
 #include "platform/clock.h"
@@ -71,9 +72,17 @@ bool HasHappened(const RenamedFile& file) {
   return platform::FileExists(file.to) || !platform::FileExists(file.from);
 }
 
-FileUse Use(const std::string& path, bool removed) {
-  return {platform::AbsolutePath(path), FileFunction::MoveAndCopy, kOwnTime,
-          static_cast<int32_t>(platform::Now()), removed};
+// Takes down a rename that was done, and lets the thumbnail file follow.
+void NoteRename(const std::string& from, const std::string& to, bool dryRun, BatchJob& job) {
+  job.filesChanged = true;
+  if (dryRun) return;
+  const std::string old = platform::AbsolutePath(from), now = platform::AbsolutePath(to);
+  job.uses.push_back({.path = now,
+                      .function = FileFunction::MoveAndCopy,
+                      .accessed = static_cast<int32_t>(platform::Now()),
+                      .from = old});
+  job.changes.push_back({old, now});
+  FollowThumbnailFile(old, now);
 }
 
 FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules,
@@ -143,9 +152,7 @@ Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRena
       return Status::RenameError;
     job.rename.number += rules.increment;
     if (result == platform::CommitResult::Done) {
-      job.uses.push_back(Use(old, true));
-      job.uses.push_back(Use(path, false));
-      job.filesChanged = true;
+      NoteRename(old, path, files.IsDryRun(), job);
       return Status::Ok;
     }
     if (rules.skipColliding) {
@@ -190,7 +197,7 @@ void RunRename(std::span<const BatchFile> files, const RenameOptions& options, B
     if (job.rename.number != before) next.Set(job.rename.number);
     ReportOutcome(job, outcome, done++, static_cast<uint32_t>(files.size()));
   }
-  if (options.dryRun) job.uses.clear();
+  MarkChangedRecords(std::exchange(job.changes, {}));
   FinishProgress(job);
 }
 
@@ -221,9 +228,7 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
       outcome.status = Status::RenameError;
       outcome.hint = files.Exists(file.from) ? Tr("\"%1\" exists.", file.from) : ReasonSentence();
     } else {
-      job.uses.push_back(Use(file.to, true));
-      job.uses.push_back(Use(file.from, false));
-      job.filesChanged = true;
+      NoteRename(file.to, file.from, dryRun, job);
     }
     if (outcome.status != Status::Ok) failed.push_back(file);
     ReportOutcome(job, outcome, done++, count);
@@ -231,9 +236,8 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
   left.insert(left.end(), wanted.begin(), wanted.end());
   // the last one first again, when it is tried again
   left.insert(left.end(), failed.rbegin(), failed.rend());
-  if (dryRun) {
-    job.uses.clear();
-  } else if (!log->files.empty() && !WriteRenameLog(remaining)) {
+  MarkChangedRecords(std::exchange(job.changes, {}));
+  if (!dryRun && !log->files.empty() && !WriteRenameLog(remaining)) {
     job.errors = true;
   }
   if (!dryRun && left.empty() && log->number && job.remember) {

@@ -38,6 +38,7 @@ class RenamedFiles {
   bool Exists(const std::string& path) const;
   // Renames without replacing anything: Taken when the new name is. A dry run only remembers it.
   platform::CommitResult Rename(const std::string& from, const std::string& to);
+  bool IsDryRun() const { return dryRun_; }
   // Whether the last rename was noted.
   bool IsNoted() const { return noted_; }
 
@@ -54,7 +55,7 @@ std::string NumberText(uint32_t number, int32_t digits);
 // Gives `path` the next free number and stores the new path in it. Ok when the file was renamed or,
 // the new name being taken, left unchanged; RenameError when no number was free within the
 // attempts, or when the system does not rename it. A rename sets the job's files-changed flag and
-// goes to job.uses.
+// goes to job.uses and job.changes, unless it is a dry run's; the thumbnail file follows.
 Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRenameRules& rules,
                           RenamedFiles& files);
 

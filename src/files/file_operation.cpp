@@ -3,8 +3,10 @@
 #include <algorithm>
 #include <set>
 
+#include "catalog/thumbnails/picture_changes.h"
 #include "files/numbered_name.h"
 #include "files/previous_file.h"
+#include "platform/clock.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -120,13 +122,13 @@ Outcome Restore(const std::string& path) {
 }
 
 // Restores the previous contents and keeps the current ones in their place.
-Outcome Exchange(const FileStep& step, const FileOperationOptions& options) {
+Outcome Exchange(const FileStep& step) {
   if (!platform::FileExists(step.from)) return kGone;
   if (step.previous->HasChanged(step.from))
     return Tr("It was changed since, so it was left alone.");
   PreviousFile now;
   if (!now.Keep(step.from)) return Tr("There is not enough disk space to keep the current file.");
-  if (options.replacing) options.replacing(step.from);
+  DeleteThumbnailFile(step.from);  // it may be younger than what comes back
   Outcome outcome = CopyFile(step.previous->Path(), step.from, platform::Existing::Replace);
   if (!outcome.empty()) return outcome;
   step.previous->Swap(now);
@@ -134,13 +136,13 @@ Outcome Exchange(const FileStep& step, const FileOperationOptions& options) {
   return {};
 }
 
-Outcome DoStep(FileOperationKind kind, const FileStep& step, const FileOperationOptions& options) {
+Outcome DoStep(FileOperationKind kind, const FileStep& step) {
   switch (kind) {
     case FileOperationKind::Rename:
     case FileOperationKind::Move: return MoveOne(step.from, step.to);
     case FileOperationKind::Copy: return CopyTree(step.from, step.to, 0);
     case FileOperationKind::Create: return Restore(step.to);
-    case FileOperationKind::Turn: return Exchange(step, options);
+    case FileOperationKind::Turn: return Exchange(step);
     case FileOperationKind::Trash: break;
   }
   return TrashOne(step.from);
@@ -158,17 +160,40 @@ Outcome RemoveCopy(const FileStep& step) {
   return TrashOne(step.to);
 }
 
-Outcome UndoStep(FileOperationKind kind, const FileStep& step,
-                 const FileOperationOptions& options) {
+Outcome UndoStep(FileOperationKind kind, const FileStep& step) {
   switch (kind) {
     case FileOperationKind::Rename:
     case FileOperationKind::Move: return MoveOne(step.to, step.from);
     case FileOperationKind::Copy: return RemoveCopy(step);
     case FileOperationKind::Create: return TrashOne(step.to);
-    case FileOperationKind::Turn: return Exchange(step, options);
+    case FileOperationKind::Turn: return Exchange(step);
     case FileOperationKind::Trash: break;
   }
   return Restore(step.from);
+}
+
+// What a step that was done, or undone with `back`, means for the thumbnails.
+PictureChange ChangeBy(FileOperationKind kind, const FileStep& step, bool back) {
+  switch (kind) {
+    case FileOperationKind::Rename:
+    case FileOperationKind::Move:
+      return back ? PictureChange{step.to, step.from} : PictureChange{step.from, step.to};
+    case FileOperationKind::Copy:
+    case FileOperationKind::Create: return {step.to};
+    case FileOperationKind::Turn:
+    case FileOperationKind::Trash: break;
+  }
+  return {step.from};
+}
+
+// Thumbnail files at once, since a file that has come may be older than what is there under its
+// name; the databases at the end.
+void SettleThumbnailFile(FileOperationKind kind, const PictureChange& change) {
+  if (!change.to.empty()) return FollowThumbnailFile(change.path, change.to);
+  if (kind == FileOperationKind::Turn) return;  // it was deleted before
+  if (platform::ExistenceOf(change.path) == platform::Existence::No)
+    return DeleteThumbnailFile(change.path);
+  DeleteMisleadingThumbnailFile(change.path);
 }
 
 }  // namespace
@@ -197,46 +222,95 @@ FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::s
   return operation;
 }
 
-FileOperationResult CarryOut(const FileOperation& operation, const FileOperationOptions& options,
-                           const FileOperationProgress& progress) {
+FileOperationResult CarryOut(const FileOperation& operation,
+                             const FileOperationProgress& progress) {
   FileOperationResult result{{operation.kind, {}}, {}};
+  std::vector<PictureChange> changes;
   for (size_t i = 0; i < operation.steps.size(); ++i) {
     if (progress && !progress(i, operation.steps.size())) break;
-    const Outcome outcome = DoStep(operation.kind, operation.steps[i], options);
+    const Outcome outcome = DoStep(operation.kind, operation.steps[i]);
     if (outcome.empty()) {
       result.done.steps.push_back(operation.steps[i]);
+      changes.push_back(ChangeBy(operation.kind, operation.steps[i], false));
+      SettleThumbnailFile(operation.kind, changes.back());
     } else {
       result.failures.push_back({operation.steps[i].from, outcome});
     }
   }
+  MarkChangedRecords(changes);
   return result;
 }
 
-FileOperationResult Revert(const FileOperation& operation, const FileOperationOptions& options,
-                           const FileOperationProgress& progress) {
+FileOperationResult Revert(const FileOperation& operation, const FileOperationProgress& progress) {
   FileOperationResult result{{operation.kind, {}}, {}};
+  std::vector<PictureChange> changes;
   for (size_t i = operation.steps.size(); i > 0; --i) {
     if (progress && !progress(operation.steps.size() - i, operation.steps.size())) break;
     const FileStep& step = operation.steps[i - 1];
-    const Outcome outcome = UndoStep(operation.kind, step, options);
+    const Outcome outcome = UndoStep(operation.kind, step);
     if (outcome.empty()) {
       result.done.steps.insert(result.done.steps.begin(), step);
+      changes.push_back(ChangeBy(operation.kind, step, true));
+      SettleThumbnailFile(operation.kind, changes.back());
     } else {
       result.failures.push_back({step.to.empty() ? step.from : step.to, outcome});
     }
   }
+  MarkChangedRecords(changes);
   return result;
 }
 
 FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
                                   const FileOperationProgress& progress) {
   FileOperationResult result{{FileOperationKind::Trash, {}}, {}};
+  std::vector<PictureChange> changes;
   for (size_t i = 0; i < paths.size(); ++i) {
     if (progress && !progress(i, paths.size())) break;
     const Outcome outcome = DeleteTree(paths[i], 0);
-    if (!outcome.empty()) result.failures.push_back({paths[i], outcome});
+    if (!outcome.empty()) {
+      result.failures.push_back({paths[i], outcome});
+      continue;
+    }
+    result.done.steps.push_back({paths[i], {}});
+    changes.push_back({paths[i]});
+    DeleteThumbnailFile(paths[i]);
   }
+  MarkChangedRecords(changes);
   return result;
+}
+
+std::vector<FileUse> UsesOf(const FileOperation& operation, bool back) {
+  const auto now = static_cast<int32_t>(platform::Now());
+  std::vector<FileUse> uses;
+  const auto use = [&](const std::string& path, FileFunction function,
+                       const std::string& from = {}) {
+    uses.push_back({.path = path, .function = function, .accessed = now, .from = from});
+  };
+  const auto gone = [&](const std::string& path) {
+    uses.push_back({.path = path, .accessed = now, .removed = true});
+  };
+  for (const FileStep& step : operation.steps) {
+    switch (operation.kind) {
+      case FileOperationKind::Rename:
+      case FileOperationKind::Move:
+        use(back ? step.from : step.to, FileFunction::MoveAndCopy, back ? step.to : step.from);
+        break;
+      case FileOperationKind::Copy:
+        if (back) gone(step.to);
+        if (!back) use(step.from, FileFunction::MoveAndCopy);
+        break;
+      case FileOperationKind::Create:
+        if (back) gone(step.to);
+        break;
+      case FileOperationKind::Turn:
+        if (!back) use(step.from, FileFunction::Transform);
+        break;
+      case FileOperationKind::Trash:
+        if (!back) gone(step.from);
+        break;
+    }
+  }
+  return uses;
 }
 
 std::string FileOperationName(const FileOperation& operation) {

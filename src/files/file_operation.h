@@ -7,6 +7,8 @@
 #include <string_view>
 #include <vector>
 
+#include "catalog/history/file_history.h"
+
 namespace fotomill {
 
 // File operations that can be undone.
@@ -48,13 +50,9 @@ struct FileOperationResult {
   std::string note = {};  // a remark about the completed steps, a sentence
 };
 
-// Settings for an operation, and a hook for other code that tracks
-// files.
+// Settings for an operation: the range for numbered names of copies.
 struct FileOperationOptions {
-  // range for numbered names of copies
   int64_t firstVariant = 1, lastVariant = INT32_MAX;
-  // called before a file's contents are replaced, to discard its thumbnails
-  std::function<void(const std::string& path)> replacing = {};
 };
 
 // Called before each step; return false to stop.
@@ -68,18 +66,24 @@ FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::s
                                 const FileOperationOptions& options = {});
 
 // Performs the steps of an operation. Never replaces a file: a step fails if its destination exists
-// by then. Keeps file times. May take long; any thread.
+// by then. Keeps file times. Thumbnail files follow their pictures or are deleted with them, and
+// database records of pictures that are no longer there are marked as deleted. May take long; any
+// thread.
 FileOperationResult CarryOut(const FileOperation& operation,
-                             const FileOperationOptions& options = {},
                              const FileOperationProgress& progress = {});
 // Undoes an operation, last step first: files are moved back, outputs and unmodified copies go to
 // the trash.
-FileOperationResult Revert(const FileOperation& operation, const FileOperationOptions& options = {},
+FileOperationResult Revert(const FileOperation& operation,
                            const FileOperationProgress& progress = {});
 
-// Permanently deletes files, and folders with their contents.
+// Permanently deletes files, and folders with their contents, and their thumbnails. The completed
+// steps cannot be undone.
 FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
                                   const FileOperationProgress& progress = {});
+
+// What the file history is to know of an operation that was done, or undone with `back`: what a
+// file was renamed or moved to, copied and turned files, and what is gone.
+std::vector<FileUse> UsesOf(const FileOperation& operation, bool back = false);
 
 // "rename of 12 files", "move of beach.jpg"
 std::string FileOperationName(const FileOperation& operation);

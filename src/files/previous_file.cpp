@@ -35,7 +35,6 @@ bool PreviousFile::HasChanged(const std::string& path) const {
 bool PreviousFiles::Keep(const std::string& path) {
   auto file = std::make_shared<PreviousFile>();
   if (!file->Keep(path)) return false;
-  if (replacing_) replacing_(platform::AbsolutePath(path));
   const std::lock_guard lock(mutex_);
   return kept_.emplace(platform::AbsolutePath(path), std::move(file)).second;
 }

@@ -1,11 +1,9 @@
 #pragma once
 
-#include <functional>
 #include <map>
 #include <memory>
 #include <mutex>
 #include <string>
-#include <utility>
 
 #include "files/file_operation.h"
 #include "platform/held_file.h"
@@ -34,9 +32,6 @@ class PreviousFile {
 // The previous files of one batch. Thread-safe.
 class PreviousFiles {
  public:
-  // `replacing` is called with each file before it is replaced, on the replacing thread.
-  explicit PreviousFiles(std::function<void(const std::string& path)> replacing = {})
-      : replacing_(std::move(replacing)) {}
   // Call before replacing a file. If false, do not replace it.
   [[nodiscard]] bool Keep(const std::string& path);
   // Call right after replacing a file passed to Keep; later changes are attributed to other
@@ -46,7 +41,6 @@ class PreviousFiles {
   FileOperation Operation();
 
  private:
-  const std::function<void(const std::string& path)> replacing_;
   std::mutex mutex_;
   std::map<std::string, std::shared_ptr<PreviousFile>> kept_, replaced_;
 };

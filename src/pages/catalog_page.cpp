@@ -250,6 +250,8 @@ Status WriteNextPage(PictureRecord& page, const CatalogPageOptions& options, Bat
   lostRace = !destination.replace && LostRace(status, path);
   if (status == Status::Ok && !options.dryRun) {
     job.filesChanged = true;
+    MarkChangedRecords({{PictureChange{platform::AbsolutePath(path)}}});
+    if (destination.replace) DeleteThumbnailFile(path);
     job.uses.push_back({platform::AbsolutePath(path), FileFunction::Catalog, kOwnTime,
                         static_cast<int32_t>(platform::Now()), false});
   }

@@ -10,6 +10,8 @@
 #include <thread>
 
 #include "batch/new_job.h"
+#include "catalog/thumbnails/thumbnail_file.h"
+#include "catalog/thumbnails/thumbnail_store.h"
 #include "registry/registry.h"
 #include "support/bitmaps.h"
 #include "support/faults.h"
@@ -101,6 +103,42 @@ TEST_F(Run, ParallelResultsEqualSequentialOnes) {
       EXPECT_EQ(Outputs(), outputs) << jobs;
     }
     EXPECT_EQ(lines.back(), "21 files were processed.");
+  }
+}
+
+// What was kept of a file that is replaced, or was there before a new one, is not shown for it.
+TEST_F(Run, OutputsLoseTheThumbnailsOfWhatWasThere) {
+  fs::create_directory(In("out"));
+  std::vector<BatchFile> files;
+  for (const char* name : {"a", "b"}) {
+    WriteBytes(In(std::string(name) + ".bmp"), BitmapFile(8, 8, 24));
+    files.push_back({In(std::string(name) + ".bmp"), {}, Status::Ok, {}});
+  }
+  WriteText(In("out/a.pcx"), "old");
+  const std::string database = In("out/Fotomill.tdb");
+  DatabaseRecord record;
+  record.thumbnail.Sign();
+  for (const char* name : {"out/a.pcx", "out/b.pcx", "out/c.pcx"}) {
+    record.path = In(name);
+    SharedThumbnailStore().Add(database, record, true);
+  }
+  for (const char* name : {"out/a.THN", "out/b.THN"})
+    ASSERT_TRUE(WriteThumbnailFile(record.thumbnail, In(name), true));
+  SharedThumbnailStore().Close();
+  for (const bool dryRun : {true, false}) {
+    BatchJob job = NewJob();
+    job.overwrite = {.prompt = false};
+    ASSERT_EQ(RunBatch(files, {.dryRun = dryRun}, job), Status::Ok);
+    EXPECT_EQ(fs::exists(In("out/a.THN")), dryRun);
+    EXPECT_TRUE(fs::exists(In("out/b.THN"))) << "it may be that of another picture";
+    SharedThumbnailStore().Close();
+    ThumbnailDatabase open;
+    DatabaseKey key;
+    ASSERT_EQ(open.OpenToRead(database), ThumbnailDatabase::Opened::Done);
+    for (int64_t i = 0; i < 3; ++i) {
+      ASSERT_TRUE(open.ReadKey(i, key));
+      EXPECT_EQ(key.deleted, !dryRun && i < 2) << i;
+    }
   }
 }
 

@@ -6,6 +6,8 @@
 #include <filesystem>
 
 #include "batch/new_job.h"
+#include "catalog/thumbnails/thumbnail_file.h"
+#include "catalog/thumbnails/thumbnail_store.h"
 #include "core/data_folder.h"
 #include "files/rename_log.h"
 #include "settings/settings.h"
@@ -165,9 +167,10 @@ TEST_F(Rename, KeepsTheRulesItWasStartedWith) {
 TEST_F(Rename, Undo) {
   Make({"a.jpg", "b.jpg", "c.jpg"});
   const BatchJob job = RunAsSet({"a.jpg", "b.jpg", "c.jpg"});
-  ASSERT_EQ(job.uses.size(), 6u);
-  EXPECT_EQ(job.uses[0].path, folder_.Path("p/a.jpg"));
-  EXPECT_TRUE(job.uses[0].removed && !job.uses[1].removed && job.uses[1].function == FileFunction::MoveAndCopy);
+  ASSERT_EQ(job.uses.size(), 3u);
+  EXPECT_EQ(job.uses[0].from, folder_.Path("p/a.jpg"));
+  EXPECT_EQ(job.uses[0].path, folder_.Path("p/PICTURE0001.jpg"));
+  EXPECT_EQ(job.uses[0].function, FileFunction::MoveAndCopy);
   WriteText(folder_.Path("p/b.jpg"), "new");
   BatchJob undo;
   ASSERT_TRUE(UndoRename({folder_.Path("p/PICTURE0003.jpg")}, false, undo));
@@ -180,6 +183,46 @@ TEST_F(Rename, Undo) {
   EXPECT_FALSE(undo.errors);
   EXPECT_THAT(There(), ElementsAre("a.jpg=a.jpg", "b.jpg=b.jpg", "c.jpg=c.jpg"));
   EXPECT_TRUE(ReadRenameLog()->files.empty());
+}
+
+// The thumbnail file has the new name too, and the record of the old one is marked.
+TEST_F(Rename, ThumbnailsFollow) {
+  std::filesystem::create_directories(folder_.Path("data"));
+  Make({"a.jpg"});
+  const std::string database = ThumbnailDatabasePath({});
+  DatabaseRecord kept;
+  kept.thumbnail.Sign();
+  kept.path = folder_.Path("p/a.jpg");
+  SharedThumbnailStore().Add(database, kept, true);
+  ASSERT_TRUE(WriteThumbnailFile(kept.thumbnail, folder_.Path("p/a.THN"), true));
+  const auto hasRecord = [&] {
+    ThumbnailRecord found;
+    ThumbnailDatabase open;
+    SharedThumbnailStore().Close();
+    return open.OpenToRead(database) == ThumbnailDatabase::Opened::Done &&
+           open.Find(kept.path, "", found);
+  };
+  const auto thumbnails = [&] {
+    std::string names;
+    for (const auto& entry : std::filesystem::directory_iterator(folder_.Path("p"))) {
+      if (entry.path().extension() == ".THN") names += entry.path().filename();
+    }
+    return names;
+  };
+  const BatchJob dry = RunAsSet({"a.jpg"}, true);
+  EXPECT_TRUE(dry.uses.empty());
+  EXPECT_EQ(thumbnails(), "a.THN");
+  EXPECT_TRUE(hasRecord());
+  RunAsSet({"a.jpg"});
+  EXPECT_EQ(thumbnails(), "PICTURE0001.THN");
+  EXPECT_FALSE(hasRecord());
+  BatchJob undo;
+  ASSERT_TRUE(UndoRename({}, true, undo));
+  EXPECT_EQ(thumbnails(), "PICTURE0001.THN");
+  ASSERT_TRUE(UndoRename({}, false, undo));
+  EXPECT_EQ(thumbnails(), "a.THN");
+  ASSERT_EQ(undo.uses.size(), 1u);
+  EXPECT_EQ(undo.uses[0].from, folder_.Path("p/PICTURE0001.jpg"));
 }
 
 // Renames are logged first: a run that is killed in between has either lost nothing or not started.

@@ -10,6 +10,7 @@
 #include <thread>
 
 #include "platform/clock.h"
+#include "platform/files.h"
 #include "platform/volumes.h"
 #include "support/bitmaps.h"
 #include "support/child.h"
@@ -100,6 +101,91 @@ TEST_F(Database, HasTheDocumentedLayout) {
   EXPECT_EQ(database.CompactThumbnailDatabase(false), Compacted::Done);
   EXPECT_EQ(Size(), 60u);
   EXPECT_THAT(folder_.Names(), ElementsAre("Fotomill.tdb"));
+}
+
+TEST_F(Database, RecordsGoForThePicturesTheyWereMadeOf) {
+  ThumbnailDatabase database;
+  ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
+  DatabaseRecord record = Record("/a", "v", 1);
+  record.stamp = PictureStampOf(0x165432107, 0xabcd123456);
+  ASSERT_TRUE(database.AppendDatabaseRecord(record));
+  const std::vector<uint8_t> bytes = ReadBytes(Path());
+  EXPECT_THAT(std::vector(bytes.end() - 8, bytes.end()),
+              ElementsAre(0, 0x07, 0x21, 0x43, 0x65, 0x56, 0x34, 0x12));
+  ASSERT_TRUE(Append(database, "/old", "v", 2));  // of a program that keeps no time and size
+  const struct {
+    const char* name;
+    const char* path;
+    PictureStamp stamp;
+    bool found;
+  } rows[] = {
+      {"the same", "/a", PictureStampOf(0x65432107, 0x123456), true},
+      {"later", "/a", PictureStampOf(0x65432108, 0x123456), false},
+      {"earlier", "/a", PictureStampOf(0x65432106, 0x123456), false},
+      {"longer", "/a", PictureStampOf(0x65432107, 0x123457), false},
+      {"only a size", "/a", PictureStampOf(0, 0x123456), false},
+      {"nothing known of the picture", "/a", {}, true},
+      {"nothing known of the record", "/old", PictureStampOf(1, 2), true},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    ThumbnailRecord found;
+    EXPECT_EQ(database.Find(row.path, "v", found, row.stamp), row.found);
+  }
+  // An older record of the same path is not in the way of the current one.
+  record.stamp = PictureStampOf(0x65432108, 5);
+  record.thumbnail.bytes[300] = 3;
+  ASSERT_TRUE(database.AppendDatabaseRecord(record));
+  ThumbnailRecord found;
+  ASSERT_TRUE(database.Find("/a", "v", found, record.stamp));
+  EXPECT_EQ(found.bytes[300], 3);
+  DatabaseRecord read;
+  ASSERT_TRUE(database.ReadDatabaseRecord(2, read));
+  EXPECT_EQ(read.stamp, record.stamp);
+  EXPECT_EQ(database.Delete("/a"), 2);  // time and size stay as they are
+  ASSERT_TRUE(database.ReadDatabaseRecord(2, read));
+  EXPECT_TRUE(read.deleted && read.stamp == record.stamp);
+}
+
+TEST_F(Database, DeletesManyPathsAndWholeFolders) {
+  ThumbnailDatabase database;
+  ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
+  for (const char* path : {"/p/a", "/p/b", "/p/b", "/pq/a", "/p/s/a", "/q/a", "/r/s/a"})
+    ASSERT_TRUE(Append(database, path, "v", 1));
+  const std::vector<std::string> paths = {"/p/b", "/none", "/q/a"};
+  EXPECT_EQ(database.Delete(paths), 3);
+  EXPECT_EQ(database.Delete(paths), 0);
+  const std::vector<std::string> folders = {"/p", "/r/"};
+  EXPECT_EQ(database.DeleteBelow(folders), 3);
+  EXPECT_THAT(Records(), ElementsAre("/p/a v 1 x", "/p/b v 1 x", "/p/b v 1 x", "/pq/a v 1",
+                                     "/p/s/a v 1 x", "/q/a v 1 x", "/r/s/a v 1 x"));
+  ThumbnailRecord found;
+  EXPECT_FALSE(database.Find("/r/s/a", "v", found));
+  EXPECT_TRUE(database.Find("/pq/a", "v", found));
+}
+
+// Where it may not be written to, a database is still read; nothing is changed, nor replaced.
+TEST_F(Database, OneThatMayOnlyBeReadIsRead) {
+  {
+    ThumbnailDatabase database;
+    ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
+    ASSERT_TRUE(Append(database, "/a", "v", 1));
+  }
+  std::filesystem::permissions(folder_.Path(), std::filesystem::perms(0777));
+  std::filesystem::permissions(Path(), std::filesystem::perms(0444));
+  const std::vector<uint8_t> before = ReadBytes(Path());
+  const int status = InChild([&] {
+    if (geteuid() == 0 && setresuid(65534, 65534, 65534) != 0) _exit(9);
+    ThumbnailDatabase database;
+    ThumbnailRecord found;
+    if (database.OpenThumbnailDatabase(Path(), true) != Opened::NotRead) _exit(1);
+    if (database.OpenToRead(Path()) != Opened::Done || database.IsOpenForChanges()) _exit(2);
+    if (!database.Find("/a", "v", found) || found.bytes[300] != 1) _exit(3);
+    if (Append(database, "/b", "v", 1) || database.Delete("/a") != -1) _exit(4);
+    if (database.CompactThumbnailDatabase(false) != Compacted::NotRead) _exit(5);
+  });
+  EXPECT_EQ(status, 0);
+  EXPECT_EQ(ReadBytes(Path()), before);
 }
 
 TEST_F(Database, NamesVolumes) {
@@ -488,6 +574,42 @@ TEST_F(Database, AKilledWriterLosesNoReportedRecord) {
   }
 }
 
+// Whenever a process that marks records is killed, each is as before or deleted, and nothing else
+// has changed.
+TEST_F(Database, AKilledMarkerChangesFlagsOnly) {
+  constexpr int kRecords = 300;
+  std::vector<DatabaseRecord> records;
+  std::vector<std::string> paths;
+  for (int i = 0; i < kRecords; ++i) {
+    records.push_back(Record("/p/" + std::to_string(i), "v", 1));
+    paths.push_back(records.back().path);
+  }
+  {
+    ThumbnailDatabase database;
+    ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
+    ASSERT_TRUE(database.AppendDatabaseRecords(records, false));
+  }
+  const std::vector<uint8_t> before = ReadBytes(Path());
+  for (int round = 0; round < 8; ++round) {
+    WriteBytes(Path(), before);
+    const pid_t child = fork();
+    if (child == 0) {
+      ThumbnailDatabase database;
+      if (database.OpenThumbnailDatabase(Path(), false) != Opened::Done) _exit(1);
+      for (const std::string& path : paths) (void)database.Delete(path);
+      _exit(0);
+    }
+    std::this_thread::sleep_for(std::chrono::microseconds(300 * (1 << round)));
+    kill(child, SIGKILL);
+    int status = 0;
+    waitpid(child, &status, 0);
+    std::vector<uint8_t> after = ReadBytes(Path());
+    ASSERT_EQ(after.size(), before.size());
+    for (size_t i = 0; i < kRecords; ++i) after[60 + i * 28442 + 28434] &= 0xfe;
+    EXPECT_TRUE(after == before);
+  }
+}
+
 TEST_F(Database, AFullDiskFailsAndCountsNothing) {
   ThumbnailDatabase database;
   ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
@@ -523,9 +645,14 @@ TEST_F(Database, Commands) {
   EXPECT_EQ(list["records"][0]["path"], in("a.bmp"));
   EXPECT_EQ(list["records"][0]["deleted"], true);
   EXPECT_EQ(list["records"][2]["deleted"], false);
+  EXPECT_EQ(list["records"][2]["modified"],
+            platform::ModificationTime(in("a.bmp")).value_or(platform::ExactTime()).seconds);
   EXPECT_EQ(RunCommand({"tdb", "find", Path(), in("a.bmp"), "--out", in("a.THN")}).status, 0);
   EXPECT_EQ(ReadText(in("a.THN")), ReadText(Path()).substr(60 + 2 * 28442, 27912));
   EXPECT_EQ(RunCommand({"tdb", "find", Path(), in("a.bmp"), "--out", in("a.THN")}).status, 1);
+  WriteBytes(in("a.bmp"), BitmapFile(6, 3, 24));
+  EXPECT_THAT(RunCommand({"tdb", "find", Path(), in("a.bmp"), "--out", in("c.THN")}).err,
+              testing::HasSubstr("The database has no thumbnail of this picture as it is now."));
   EXPECT_EQ(RunCommand({"tdb", "delete", Path(), in("b.bmp"), in("c.bmp")}).status, 1);
   EXPECT_EQ(RunCommand({"tdb", "find", Path(), in("b.bmp"), "--out", in("b.THN")}).status, 1);
   EXPECT_EQ(RunCommand({"tdb", "compact", Path(), "-n"}).out, "3 -> 1 records\n");

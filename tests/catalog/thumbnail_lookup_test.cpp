@@ -6,11 +6,15 @@
 
 #include <memory>
 
+#include "catalog/thumbnails/listed_thumbnails.h"
 #include "catalog/thumbnails/system_thumbnail.h"
 #include "catalog/thumbnails/thumbnail_database.h"
 #include "catalog/thumbnails/thumbnail_file.h"
+#include "catalog/thumbnails/thumbnail_store.h"
+#include "core/data_folder.h"
 #include "core/md5.h"
 #include "formats/png/png.h"
+#include "platform/files.h"
 #include "support/bitmaps.h"
 #include "support/codecs.h"
 #include "support/files.h"
@@ -201,13 +205,19 @@ TEST_F(Lookup, UsesTheSystemsThumbnailWhileValid) {
 }
 
 TEST_F(Lookup, SearchesAccordingToMode) {
-  ThumbnailDatabase database;
-  ASSERT_EQ(database.OpenThumbnailDatabase(folder_.Path("Fotomill.tdb"), true), ThumbnailDatabase::Opened::Done);
-  const DatabaseRecord stored{Flat(3), picture_, VolumeKeyFor(picture_), false};
-  ASSERT_TRUE(database.AppendDatabaseRecords({&stored, 1}, false));
-  const ThumbnailRecord listed = Flat(2);
+  SetDataFolder(folder_.Path("data"));
+  std::filesystem::create_directory(folder_.Path("data"));
+  ThumbnailStore databases;
+  ListedThumbnails listed;
+  listed.Attach(picture_, {}, Flat(2));
+  for (const auto mode : {choice::kGlobalDatabase, choice::kLocalDatabase}) {
+    databases.Add(DatabaseForMode(mode, picture_),
+                  {Flat(mode == choice::kLocalDatabase ? 3 : 5), picture_, VolumeKeyFor(picture_)},
+                  true);
+  }
+  databases.Flush();
   PutSystemThumbnail(0, FileUri(picture_));
-  constexpr int kNone = 0, kFile = 1, kList = 2, kDatabase = 3, kSystem = 4;
+  constexpr int kNone = 0, kFile = 1, kList = 2, kLocal = 3, kSystem = 4, kGlobal = 5;
   const struct {
     const char* name;
     choice::ThumbnailMode mode;
@@ -223,8 +233,8 @@ TEST_F(Lookup, SearchesAccordingToMode) {
       {"virtual, list only", choice::kVirtual, true, false, 0, 1, kList},
       {"virtual, no file", choice::kVirtual, false, false, 1, 1, kList},
       {"database, file first", choice::kLocalDatabase, true, false, 1, 1, kFile},
-      {"database, no file", choice::kGlobalDatabase, false, true, 1, 1, kDatabase},
-      {"database only", choice::kGlobalDatabase, true, false, 0, 1, kDatabase},
+      {"database, no file", choice::kGlobalDatabase, false, true, 1, 1, kGlobal},
+      {"database only", choice::kLocalDatabase, true, false, 0, 1, kLocal},
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
@@ -233,19 +243,85 @@ TEST_F(Lookup, SearchesAccordingToMode) {
     ASSERT_TRUE(!row.hasFile || WriteThumbnailFile(file, ThumbnailPathFor(picture_), true));
     const ThumbnailOptions options{.fromFiles = row.alwaysFile != 0,
                                    .fromSystem = row.useCache != 0};
-    ThumbnailSources sources{
-        row.mode, true,
-        [&](std::string_view name) { return name == "a b.bmp" ? &listed : nullptr; }, &database,
-        options};
+    ThumbnailSources sources{row.mode, true, &listed, &databases, options};
     const auto record = std::make_unique<AnyThumbnailRecord>();
-    ASSERT_EQ(LookUpThumbnail(picture_, row.large, sources, *record), row.found != kNone);
+    const ThumbnailQuery query{.path = picture_, .large = row.large};
+    ASSERT_EQ(LookUpThumbnail(query, sources, *record), row.found != kNone);
     const bool large = std::holds_alternative<LargeThumbnailRecord>(*record);
     EXPECT_EQ(large, row.found == kSystem);
     EXPECT_TRUE(large || row.found == kNone || std::get<ThumbnailRecord>(*record).bytes[300] == row.found);
-    sources = {row.mode, false, {}, nullptr, options};
-    EXPECT_EQ(LookUpThumbnail(picture_, row.large, sources, *record),
+    sources = {row.mode, false, nullptr, nullptr, options};
+    EXPECT_EQ(LookUpThumbnail(query, sources, *record),
               row.hasFile && (row.mode == choice::kDiskBased || row.alwaysFile != 0));
   }
+  SetDataFolder({});
+}
+
+// A thumbnail of what the file was before is none, wherever it is.
+TEST_F(Lookup, PassesOverWhatIsNotCurrent) {
+  ThumbnailStore databases;
+  ListedThumbnails listed;
+  const PictureStamp stamp = PictureStampOf(1000, 10);
+  listed.Attach(picture_, stamp, Flat(2));
+  databases.Add(DatabaseForMode(choice::kLocalDatabase, picture_),
+                {Flat(3), picture_, VolumeKeyFor(picture_), false, stamp}, true);
+  databases.Flush();
+  ThumbnailRecord file = Flat(1);
+  ASSERT_TRUE(WriteThumbnailFile(file, ThumbnailPathFor(picture_), true));
+  ASSERT_TRUE(platform::SetModificationTime(ThumbnailPathFor(picture_), {1000, 0}));
+  const struct {
+    const char* name;
+    choice::ThumbnailMode mode;
+    int64_t modified;
+    uint64_t size;
+    bool found;
+  } rows[] = {
+      {"file, as old", choice::kDiskBased, 1000, 99, true},
+      {"file, older", choice::kDiskBased, 1001, 10, false},
+      {"list", choice::kVirtual, 1000, 10, true},
+      {"list, another time", choice::kVirtual, 999, 10, false},
+      {"database", choice::kLocalDatabase, 1000, 10, true},
+      {"database, another time", choice::kLocalDatabase, 1001, 10, false},
+      {"database, another size", choice::kLocalDatabase, 1000, 11, false},
+      {"database, nothing known", choice::kLocalDatabase, 0, 0, true},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    const ThumbnailSources sources{row.mode, true, &listed, &databases, {.fromFiles = false}};
+    const auto record = std::make_unique<AnyThumbnailRecord>();
+    EXPECT_EQ(LookUpThumbnail({picture_, row.modified, row.size}, sources, *record), row.found);
+  }
+}
+
+// What is found is shown without the matte around it, at the size of the view.
+TEST(DrawThumbnail, LeavesOutTheMatte) {
+  ThumbnailRecord record = Flat(9);
+  record.Fill(0x112233);
+  // a picture of 94 x 48 whose upper half has the matte's color at the right
+  for (int32_t row = 24; row < 72; ++row) {
+    for (int32_t x = 1; x < 95; ++x) record.StoredRow(row)[static_cast<size_t>(x) * 3] = 0x99;
+  }
+  const struct {
+    const char* name;
+    uint32_t flags;
+    int32_t width, height;
+  } rows[] = {{"own size", 0, 94, 48},
+              {"half size", kDrawHalfSize, 46, 24},
+              {"large view", kDrawLargeView, 172, 88}};
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    PackedImage picture;
+    const ThumbnailOptions options{.matte = 0x112233, .zoomFilter = choice::kNearest};
+    ASSERT_EQ(DrawThumbnailPicture(record, row.flags, options, picture), Status::Ok);
+    EXPECT_EQ(picture.Width(), row.width);
+    EXPECT_EQ(picture.Height(), row.height);
+    EXPECT_EQ(picture.PixelAt(0, 0), 0x332299u);
+    EXPECT_EQ(picture.PixelAt(row.width - 1, row.height - 1), 0x332299u);
+  }
+  record.Fill(0x112233);  // nothing else in it
+  PackedImage picture;
+  ASSERT_EQ(DrawThumbnailPicture(record, kDrawHalfSize, {.matte = 0x112233}, picture), Status::Ok);
+  EXPECT_GT(picture.Width(), 0);
 }
 
 }  // namespace

@@ -2,6 +2,9 @@
 
 #include <gmock/gmock.h>
 
+#include <atomic>
+#include <future>
+
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "core/data_folder.h"
 #include "desktop/models/files/operation_options.h"
@@ -10,6 +13,7 @@
 #include "desktop/models/shell/session.h"
 #include "desktop/models/shell/tab_sets.h"
 #include "desktop/models/thumbnails/thumbnail.h"
+#include "desktop/models/thumbnails/thumbnail_offer.h"
 #include "files/previous_file.h"
 #include "platform/files.h"
 #include "registry/registry.h"
@@ -47,21 +51,22 @@ TEST_F(DesktopFilesTest, RotationsAreUndoneAndTheirThumbnailsRemoved) {
   test::WriteBytes(path, test::BitmapFile(9, 5, 24));
   const std::string old = ReadText(path);
   ASSERT_EQ(WriteThumbnail(path, {}), Status::Ok);
-  const FileOperationOptions options = FileOperationOptionsFromSettings();
   FileOperationResult result = TurnOneFile(path, Orientation::QuarterRight);
   ASSERT_THAT(result.failures, IsEmpty());
   EXPECT_EQ(FileOperationName(result.done), "rotation of turned.bmp");
   EXPECT_FALSE(platform::FileExists(ThumbnailPathFor(path)));
   const std::string turned = ReadText(path);
   EXPECT_NE(turned, old);
+  ASSERT_EQ(WriteThumbnail(path, {}), Status::Ok);  // younger than what comes back
   for (int round = 0; round < 2; ++round) {
-    ASSERT_THAT(Revert(result.done, options).failures, IsEmpty());
+    ASSERT_THAT(Revert(result.done).failures, IsEmpty());
     EXPECT_EQ(ReadText(path), old);
-    ASSERT_THAT(CarryOut(result.done, options).failures, IsEmpty());
+    EXPECT_FALSE(platform::FileExists(ThumbnailPathFor(path)));
+    ASSERT_THAT(CarryOut(result.done).failures, IsEmpty());
     EXPECT_EQ(ReadText(path), turned);
   }
   WriteText(path, "somebody's work");
-  EXPECT_EQ(Revert(result.done, options).failures.size(), 1u);
+  EXPECT_EQ(Revert(result.done).failures.size(), 1u);
   EXPECT_EQ(ReadText(path), "somebody's work");
   EXPECT_EQ(TurnOneFile(From("a.png"), Orientation::HalfTurn).failures.size(), 1u);  // no picture
   std::filesystem::create_symlink("turned.bmp", From("link.bmp"));
@@ -139,10 +144,44 @@ TEST(FolderViews, AreKeptPerFolderTheLatestFirst) {
   EXPECT_EQ(views.Find("/a,b", otherwise), (FolderView{{2, 4, 2}, true}));
 }
 
+// What an offer tells is called apart; the test waits for its end.
+TEST(ThumbnailOffer, TellsHowFarItIsAndTakesAnEarlyAnswer) {
+  const test::TemporaryFolder folder;
+  ThumbnailBrowser browser;
+  browser.folder = folder.Path();
+  for (const char* name : {"a.bmp", "b.bmp"}) {
+    test::WriteBytes(folder.Path(name), test::BitmapFile(3, 3, 24));
+    browser.files.emplace_back(name);
+  }
+  for (const bool early : {false, true}) {
+    SCOPED_TRACE(early);
+    std::atomic<int> scanned = 0, asked = 0;
+    std::promise<bool> ended;
+    std::promise<std::shared_ptr<ThumbnailOffer>> started;
+    const auto offer = started.get_future().share();
+    ThumbnailOffer::Events events;
+    events.scanning = [&](const std::string& text, size_t done, size_t total) {
+      scanned += text == "Scanning " + browser.folder && done <= total && total == 2;
+      if (early) offer.get()->Answer(0);
+    };
+    events.ask = [&](int32_t count, int32_t) {
+      asked += count;
+      offer.get()->Answer(kUpdateLater);
+    };
+    events.keep = [](const ThumbnailUpdateOptions&) {};
+    events.building = [](size_t, size_t) {};
+    events.ended = [&](bool changed) { ended.set_value(changed); };
+    started.set_value(ThumbnailOffer::Start(browser, events, 0));
+    EXPECT_FALSE(ended.get_future().get());
+    EXPECT_GE(scanned, 1);
+    EXPECT_EQ(asked, early ? 0 : 2);
+  }
+}
+
 TEST(Session, RoundTripsAndIgnoresInvalidLines) {
-  Session session{900,  600,
-                  true, "Size:9",
-                  1,    {{"/a=b [Tab]", {{1, 4, 3}, true}, 1234, "x.png"}, {"/c", {}, 0, ""}}};
+  Session session{
+      900,      600, true,
+      "Size:9", 1,   {{"/a=b [Tab]", {{1, 4, 3}, true}, 1234, "x.png", false}, {"/c", {}, 0, ""}}};
   EXPECT_EQ(ParseSession(SessionText(session)), session);
   session.tabs[1].folder = "/new\nline";
   EXPECT_EQ(ParseSession(SessionText(session)).tabs.size(), 1u);

@@ -1,11 +1,15 @@
 #include <gtest/gtest.h>
 #include <lcms2.h>
 
+#include <algorithm>
 #include <atomic>
 #include <condition_variable>
 #include <cstring>
 
+#include "catalog/thumbnails/thumbnail_database.h"
+#include "catalog/thumbnails/thumbnail_file.h"
 #include "core/choice_lists.h"
+#include "desktop/models/thumbnails/placeholder.h"
 #include "desktop/models/thumbnails/thumbnail_loader.h"
 #include "desktop/models/view/photo_facts.h"
 #include "desktop/models/view/view_drawing.h"
@@ -194,17 +198,6 @@ TEST(PhotoFacts, SummarizeExposure) {
             (std::vector<std::string>{"ACME 5D", "24-70mm", "2.5 s   f/2.8   ISO 400", "2001-05-19 18:36:41"}));
 }
 
-TEST(Thumbnail, MatteIsCutOff) {
-  RgbImage square = FilledImage(6, 6, 0x112233);
-  // a picture of 4 x 2 whose right half has the matte's color
-  for (int32_t y = 2; y < 4; ++y) square.Row(y)[3] = 9;
-  const RgbImage cut = WithoutMatte(square, 0x112233);
-  EXPECT_EQ(cut.width, 4);
-  EXPECT_EQ(cut.height, 2);
-  EXPECT_EQ(cut.Row(0)[0], 9);
-  EXPECT_GT(WithoutMatte(FilledImage(6, 6, 0x112233), 0x112233).width, 0);
-}
-
 TEST(Thumbnail, DatabaseModesStoreThumbnails) {
   const test::TemporaryFolder folder;
   const std::string picture = folder.Path("a.bmp");
@@ -214,7 +207,7 @@ TEST(Thumbnail, DatabaseModesStoreThumbnails) {
     const ThumbnailPointer thumbnail = LoadThumbnail(request);
     ASSERT_EQ(thumbnail->status, Status::Ok);
     EXPECT_EQ(thumbnail->pixels.width, 96);
-    EXPECT_EQ(thumbnail->width, time == 0 ? 150 : 0);
+    EXPECT_EQ(thumbnail->width, 150) << "what is known of the picture is always the same";
     KeepThumbnailRecords();
     EXPECT_EQ(std::filesystem::file_size(folder.Path("Fotomill.tdb")), 60u + 28442u);
   }
@@ -226,8 +219,73 @@ TEST(Thumbnail, DatabaseModesStoreThumbnails) {
     EXPECT_TRUE(thumbnail->animated && thumbnail->alpha);
     KeepThumbnailRecords();
   }
+  // In a large view the record is enlarged as the settings say, and is not the picture itself.
+  request = {picture, 1, 1, 176, choice::kLocalDatabase};
+  const RgbImage enlarged = LoadThumbnail(request)->pixels;
+  EXPECT_EQ(enlarged.width, 176);
+  request.options.zoomFilter = choice::kNearest;
+  EXPECT_NE(LoadThumbnail(request)->pixels.bytes, enlarged.bytes);
+  request.options.fastZoom = true;
+  EXPECT_NE(LoadThumbnail(request)->pixels.bytes, enlarged.bytes);
+  // Of a picture that has changed since, nothing that was kept is shown.
+  const PicturePointer gray = test::PatternPicture(60, 30, 24);
+  ASSERT_EQ(WritePicture(*gray, picture, {}), Status::Ok);
+  request = {picture, 2, 1, 96, choice::kLocalDatabase};
+  EXPECT_EQ(LoadThumbnail(request)->pixels.width, 60);
+  KeepThumbnailRecords();
+  EXPECT_EQ(std::filesystem::file_size(folder.Path("Fotomill.tdb")), 60u + 3 * 28442u);
   request = {folder.Path("none.bmp"), 1, 1, 96, choice::kLocalDatabase};
   EXPECT_EQ(LoadThumbnail(request)->status, Status::FileOpenError);
+}
+
+// Badges are the same wherever the pixels came from.
+TEST(Thumbnail, FactsDoNotDependOnTheSource) {
+  const test::TemporaryFolder folder;
+  const std::string picture = folder.Path("a.png");
+  const PicturePointer made = test::PatternPicture(120, 60, 24);
+  ASSERT_EQ(NewAlphaPlane(120, 60, made->alpha), Status::Ok);
+  std::ranges::fill(made->alpha.Rows(), uint8_t{200});
+  made->alphaFlags |= kHasAlpha;
+  ASSERT_EQ(WritePicture(*made, picture, {}), Status::Ok);
+  ThumbnailRequest request{picture, 1, 1, 96, choice::kVirtual};
+  for (const char* source : {"the picture", "the record in memory", "the thumbnail file"}) {
+    SCOPED_TRACE(source);
+    const ThumbnailPointer thumbnail = LoadThumbnail(request);
+    EXPECT_TRUE(thumbnail->alpha && thumbnail->width == 120 && thumbnail->pages == 1);
+    if (source == std::string("the record in memory")) {
+      ASSERT_EQ(WriteThumbnail(picture, {}), Status::Ok);
+    }
+  }
+  request.options.fromFiles = false;
+  std::filesystem::remove(picture);
+  EXPECT_EQ(LoadThumbnail(request)->pixels.width, 96) << "it comes from memory";
+  request.size = 2;
+  EXPECT_EQ(LoadThumbnail(request)->status, Status::FileOpenError);
+}
+
+// A small view does not leave a blurred record behind.
+TEST(Thumbnail, RecordsAreMadeOfEnoughPixels) {
+  const test::TemporaryFolder folder;
+  const std::string picture = folder.Path("a.jpg");
+  ASSERT_EQ(WritePicture(*test::PatternPicture(1600, 1200, 24), picture, {}), Status::Ok);
+  ThumbnailRecord wanted, kept;
+  ASSERT_EQ(MakeThumbnailOfFile(picture, {}, wanted), Status::Ok);
+  const ThumbnailRequest request{picture, 1, 1, 48, choice::kLocalDatabase};
+  ASSERT_EQ(LoadThumbnail(request)->pixels.width, 48);
+  KeepThumbnailRecords();
+  ASSERT_TRUE(FindDatabaseThumbnail(kept, picture, folder.Path("Fotomill.tdb")));
+  EXPECT_EQ(kept.bytes, wanted.bytes);
+}
+
+TEST(Placeholder, HasTwoKindsInAnySizeOnAnyBackground) {
+  for (const int32_t side : {16, 48, 96, 176, 300}) {
+    const RgbImage made = PlaceholderPixels(false, side, 0x332211),
+                   none = PlaceholderPixels(true, side, 0x332211);
+    ASSERT_TRUE(made.width == side && made.height == side && none.width == side);
+    EXPECT_NE(made.bytes, none.bytes);
+    EXPECT_EQ(std::vector(made.bytes.begin(), made.bytes.begin() + 3),
+              (std::vector<uint8_t>{0x11, 0x22, 0x33}));
+  }
 }
 
 // A placeholder is the file's embedded thumbnail, upright like the picture; if there is none,

@@ -2,6 +2,9 @@
 
 #include <gmock/gmock.h>
 
+#include "catalog/thumbnails/thumbnail_file.h"
+#include "catalog/thumbnails/thumbnail_store.h"
+#include "core/data_folder.h"
 #include "platform/files.h"
 #include "support/files.h"
 #include "support/scoped_environment.h"
@@ -53,6 +56,96 @@ TEST_F(FileOperationTest, EveryOperationCanBeUndoneAndRedone) {
     const FileOperationResult again = CarryOut(undone.done);
     EXPECT_THAT(again.failures, IsEmpty());
     EXPECT_THAT(Revert(again.done).failures, IsEmpty());
+  }
+}
+
+// Thumbnail files go where their pictures go, and records of what is no longer there are marked.
+TEST_F(FileOperationTest, ThumbnailsFollowOrGo) {
+  const std::string dataBefore = DataFolder();
+  std::filesystem::create_directories(folder_.Path("data"));
+  SetDataFolder(folder_.Path("data"));
+  const auto live = [] {  // records of the global database that are not deleted
+    ThumbnailDatabase database;
+    DatabaseHeader header;
+    DatabaseKey key;
+    int64_t count = 0;
+    if (database.OpenThumbnailDatabase(ThumbnailDatabasePath({}), false) !=
+            ThumbnailDatabase::Opened::Done ||
+        !database.ReadDatabaseHeader(header))
+      return int64_t{-1};
+    for (int64_t i = 0; i < header.count; ++i) count += database.ReadKey(i, key) && !key.deleted;
+    return count;
+  };
+  const struct {
+    const char* name;
+    FileOperationKind kind;
+    const char* path;
+    int64_t live, liveAfterUndo;  // of records of a.png and b.png in "from" and a.png in "to"
+    const char* thumbnail;        // where a.THN is afterwards, or nowhere
+  } rows[] = {
+      {"move", FileOperationKind::Move, "a.png", 1, 1, "to/a.THN"},
+      {"copy", FileOperationKind::Copy, "a.png", 2, 2, "from/a.THN"},
+      {"trash", FileOperationKind::Trash, "a.png", 2, 2, ""},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    std::filesystem::remove(ThumbnailDatabasePath({}));
+    for (const std::string& path : {From("a.png"), From("b.png"), To("a.png")}) {
+      DatabaseRecord record;
+      record.thumbnail.Sign();
+      record.path = path;
+      SharedThumbnailStore().Add(ThumbnailDatabasePath({}), record, true);
+    }
+    SharedThumbnailStore().Close();
+    ThumbnailRecord record;
+    ASSERT_TRUE(WriteThumbnailFile(record, From("a.THN"), true));
+    const FileOperationResult done =
+        CarryOut(PlanFileOperation(row.kind, {From(row.path)}, folder_.Path("to")));
+    ASSERT_THAT(done.failures, IsEmpty());
+    EXPECT_EQ(live(), row.live);
+    for (const char* place : {"from/a.THN", "to/a.THN"})
+      EXPECT_EQ(platform::FileExists(folder_.Path(place)), place == std::string(row.thumbnail));
+    ASSERT_THAT(Revert(done.done).failures, IsEmpty());
+    EXPECT_EQ(live(), row.liveAfterUndo);
+    EXPECT_FALSE(platform::FileExists(To("a.THN")));
+  }
+  ThumbnailRecord record;
+  ASSERT_TRUE(WriteThumbnailFile(record, From("b.THN"), true));
+  EXPECT_EQ(DeleteForGood({From("b.png")}).done.steps.size(), 1u);
+  EXPECT_FALSE(platform::FileExists(From("b.THN")));
+  EXPECT_EQ(live(), 1);
+  SharedThumbnailStore().Close();
+  SetDataFolder(dataBefore);
+}
+
+TEST_F(FileOperationTest, TellsTheHistoryWhatWasUsed) {
+  const struct {
+    const char* name;
+    FileOperationKind kind;
+    bool back;
+    const char* use;  // "PATH FUNCTION FROM", "-PATH" for one that is gone, or nothing
+  } rows[] = {
+      {"rename", FileOperationKind::Rename, false, "/to 11 /from"},
+      {"rename undone", FileOperationKind::Rename, true, "/from 11 /to"},
+      {"move", FileOperationKind::Move, false, "/to 11 /from"},
+      {"copy", FileOperationKind::Copy, false, "/from 11 "},
+      {"copy undone", FileOperationKind::Copy, true, "-/to"},
+      {"output", FileOperationKind::Create, false, ""},
+      {"output undone", FileOperationKind::Create, true, "-/to"},
+      {"turn", FileOperationKind::Turn, false, "/from 6 "},
+      {"turn undone", FileOperationKind::Turn, true, ""},
+      {"trash", FileOperationKind::Trash, false, "-/from"},
+      {"trash undone", FileOperationKind::Trash, true, ""},
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    std::string told;
+    for (const FileUse& use : UsesOf({row.kind, {{"/from", "/to"}}}, row.back)) {
+      told += use.removed ? "-" + use.path
+                          : use.path + " " + std::to_string(static_cast<int>(use.function)) + " " +
+                                use.from;
+    }
+    EXPECT_EQ(told, row.use);
   }
 }
 

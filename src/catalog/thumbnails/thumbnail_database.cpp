@@ -19,8 +19,10 @@ namespace fotomill {
 namespace {
 
 constexpr size_t kPathOffset = 27912, kVolumeOffset = 28173, kFlagsOffset = 28434, kTextSize = 261;
+constexpr size_t kTimeOffset = 28435, kSizeOffset = 28439, kSizeBytes = 3;
 static_assert(kPathOffset == sizeof(ThumbnailRecord) && kVolumeOffset == kPathOffset + kTextSize &&
-              kFlagsOffset == kVolumeOffset + kTextSize && kFlagsOffset + 8 == kDatabaseRecordSize);
+              kFlagsOffset == kVolumeOffset + kTextSize && kTimeOffset == kFlagsOffset + 1 &&
+              kSizeOffset == kTimeOffset + 4 && kSizeOffset + kSizeBytes == kDatabaseRecordSize);
 constexpr uint8_t kDeletedFlag = 1;
 constexpr size_t kKeySize = kDatabaseRecordSize - kPathOffset;
 // records; the index of fewer is made faster than it is worth a file
@@ -32,8 +34,14 @@ uint64_t OffsetOf(int64_t index) {
   return kDatabaseHeaderSize + static_cast<uint64_t>(index) * kDatabaseRecordSize;
 }
 
-void PutLe32(uint8_t* bytes, uint32_t value) {
-  for (int i = 0; i < 4; ++i) bytes[i] = static_cast<uint8_t>(value >> (8 * i));
+void PutLe(uint8_t* bytes, uint32_t value, size_t count) {
+  for (size_t i = 0; i < count; ++i) bytes[i] = static_cast<uint8_t>(value >> (8 * i));
+}
+void PutLe32(uint8_t* bytes, uint32_t value) { PutLe(bytes, value, 4); }
+uint32_t Le(const uint8_t* bytes, size_t count) {
+  uint32_t value = 0;
+  for (size_t i = 0; i < count; ++i) value |= uint32_t{bytes[i]} << (8 * i);
+  return value;
 }
 
 std::array<uint8_t, kDatabaseHeaderSize> BytesOf(const DatabaseHeader& header) {
@@ -55,6 +63,8 @@ bool BytesOf(const DatabaseRecord& record, KeyBytes& bytes) {
   std::ranges::copy(record.path, bytes.begin());
   std::ranges::copy(record.volume, bytes.begin() + kVolumeOffset - kPathOffset);
   bytes[kFlagsOffset - kPathOffset] = record.deleted ? kDeletedFlag : 0;
+  PutLe32(&bytes[kTimeOffset - kPathOffset], record.stamp.modified);
+  PutLe(&bytes[kSizeOffset - kPathOffset], record.stamp.size, kSizeBytes);
   return true;
 }
 
@@ -82,6 +92,8 @@ void TakeKey(std::span<const uint8_t> bytes, Target& target) {
   target.path = TextViewIn(bytes);
   target.volume = TextViewIn(bytes.subspan(kVolumeOffset - kPathOffset));
   target.deleted = (bytes[kFlagsOffset - kPathOffset] & kDeletedFlag) != 0;
+  target.stamp = {Le(&bytes[kTimeOffset - kPathOffset], 4),
+                  Le(&bytes[kSizeOffset - kPathOffset], kSizeBytes)};
 }
 
 bool ReadHeaderOf(const platform::StoreFile& file, DatabaseHeader& header) {
@@ -143,6 +155,16 @@ bool MakeEmptyDatabase(const std::string& path, bool hidden, bool& taken) {
 
 }  // namespace
 
+PictureStamp PictureStampOf(int64_t modified, uint64_t size) {
+  return {static_cast<uint32_t>(modified), static_cast<uint32_t>(size & 0xffffff)};
+}
+
+PictureStamp PictureStampOf(const std::string& path) {
+  const platform::FileFacts facts = platform::FactsOf(path);
+  return facts.kind == platform::FileKind::Regular ? PictureStampOf(facts.modified, facts.size)
+                                                   : PictureStamp();
+}
+
 std::string VolumeKeyFor(const std::string& path) {
   const platform::Volume volume = platform::VolumeOf(path);
   if (!volume.available) return "Unknown";
@@ -175,17 +197,32 @@ std::string ThumbnailDatabasePath(const std::string& folder) {
 
 ThumbnailDatabase::Opened ThumbnailDatabase::OpenThumbnailDatabase(const std::string& path,
                                                                    bool create, bool hidden) {
+  hidden_ = hidden;
+  return OpenFile(path, create, false);
+}
+
+ThumbnailDatabase::Opened ThumbnailDatabase::OpenToRead(const std::string& path, bool hidden) {
+  hidden_ = hidden;
+  return OpenFile(path, false, true);
+}
+
+ThumbnailDatabase::Opened ThumbnailDatabase::OpenFile(const std::string& path, bool create,
+                                                      bool readOnlyToo) {
   using platform::StoreFile;
   CloseThumbnailDatabase();
   path_ = path;
-  hidden_ = hidden;
+  readOnlyToo_ = readOnlyToo;
   StoreFile::OpenResult result = file_.Open(path, StoreFile::Mode::ReadWrite);
   if (result == StoreFile::OpenResult::Missing) {
     bool taken = false;
     if (!create) return Opened::Missing;
-    if (!MakeEmptyDatabase(path, hidden, taken)) return Opened::Failed;
+    if (!MakeEmptyDatabase(path, hidden_, taken)) return Opened::Failed;
     result = file_.Open(path, StoreFile::Mode::ReadWrite);
   }
+  readOnly_ = result == StoreFile::OpenResult::Failed && readOnlyToo &&
+              platform::FactsOf(path).kind == platform::FileKind::Regular &&
+              !platform::FactsOf(path).link;
+  if (readOnly_) result = file_.Open(path, StoreFile::Mode::Read);
   DatabaseHeader header;
   if (result == StoreFile::OpenResult::Done && ReadDatabaseHeader(header)) return Opened::Done;
   file_.Close();
@@ -194,7 +231,8 @@ ThumbnailDatabase::Opened ThumbnailDatabase::OpenThumbnailDatabase(const std::st
 
 void ThumbnailDatabase::CloseThumbnailDatabase() {
   // Only of a file that is still as the index knows it.
-  const bool worthSaving = file_.IsOpen() && indexed_.count >= kLargeIndex && indexed_ != saved_;
+  const bool worthSaving =
+      file_.IsOpen() && !readOnly_ && indexed_.count >= kLargeIndex && indexed_ != saved_;
   if (worthSaving && indexed_.size == file_.Size() && indexed_.modified == file_.Modified() &&
       file_.IsStill(path_)) {
     index_.Save(IndexPath(path_), indexed_);
@@ -242,14 +280,14 @@ ThumbnailDatabase::KeyRead ThumbnailDatabase::TryKey(int64_t index, DatabaseKey&
 // Takes the lock; where another process has put a new file in the old one's place meanwhile, that
 // of the new one.
 bool ThumbnailDatabase::LockAndCheck(DatabaseHeader& header) {
-  while (file_.Lock()) {
+  while (!readOnly_ && file_.Lock()) {
     if (file_.IsStill(path_)) {
       if (ReadDatabaseHeader(header)) return true;
       file_.Unlock();
       return false;
     }
     file_.Unlock();
-    if (OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done) return false;
+    if (OpenFile(path_, false, readOnlyToo_) != Opened::Done) return false;
   }
   return false;
 }
@@ -374,12 +412,18 @@ bool ThumbnailDatabase::WriteDatabaseRecord(int64_t index, const DatabaseRecord&
   return true;
 }
 
+// What a lookup asks for.
+struct ThumbnailDatabase::Wanted {
+  std::string_view path, volume;
+  PictureStamp stamp;
+};
+
 bool ThumbnailDatabase::Find(const std::string& path, const std::string& volume,
-                             ThumbnailRecord& thumbnail) {
+                             ThumbnailRecord& thumbnail, const PictureStamp& stamp) {
   ThumbnailIndex::State state;
   DatabaseHeader header;
   if (!file_.IsStill(path_, state.size, state.modified)) {  // it was compacted meanwhile
-    if (OpenThumbnailDatabase(path_, false, hidden_) != Opened::Done ||
+    if (OpenFile(path_, false, readOnlyToo_) != Opened::Done ||
         !file_.IsStill(path_, state.size, state.modified))
       return false;
   }
@@ -387,7 +431,7 @@ bool ThumbnailDatabase::Find(const std::string& path, const std::string& volume,
   state.count = RecordsIn(header, state.size);
   const uint32_t hash = ThumbnailIndex::HashOf(path);
   const auto isIt = [&](size_t index) {
-    return TakeThumbnail(static_cast<int64_t>(index), path, volume, thumbnail);
+    return TakeThumbnail(static_cast<int64_t>(index), {path, volume, stamp}, thumbnail);
   };
   // The first lookup after opening asks the saved index for this one; only the next is worth
   // loading it.
@@ -400,8 +444,8 @@ bool ThumbnailDatabase::Find(const std::string& path, const std::string& volume,
   return index_.Find(hash, isIt);
 }
 
-// The thumbnail of a record when that is not deleted and of that path and volume.
-bool ThumbnailDatabase::TakeThumbnail(int64_t index, std::string_view path, std::string_view volume,
+// The thumbnail of a record when it is the one that is wanted.
+bool ThumbnailDatabase::TakeThumbnail(int64_t index, const Wanted& wanted,
                                       ThumbnailRecord& thumbnail) const {
   KeyBytes bytes;
   DatabaseKey key;
@@ -409,30 +453,61 @@ bool ThumbnailDatabase::TakeThumbnail(int64_t index, std::string_view path, std:
       !thumbnail.HasMagic(kSmallThumbnailMagic))
     return false;
   TakeKey(bytes, key);
-  return !key.deleted && key.volume == volume && ComparisonKey(key.path) == ComparisonKey(path);
+  return !key.deleted && key.volume == wanted.volume && key.stamp.Suits(wanted.stamp) &&
+         ComparisonKey(key.path) == ComparisonKey(wanted.path);
 }
 
-int64_t ThumbnailDatabase::Delete(const std::string& path) {
+int64_t ThumbnailDatabase::Delete(std::span<const std::string> paths) {
   DatabaseHeader header;
   if (!LockAndCheck(header)) return -1;
   const Unlocker unlocker(file_);
   if (!UpdateIndex(StateOf(header))) return -1;
-  indexed_ = {};
   std::vector<size_t> deleted;
   DatabaseKey key;
-  const bool failed = index_.Find(ThumbnailIndex::HashOf(path), [&](size_t index) {
-    const KeyRead read = TryKey(static_cast<int64_t>(index), key);
-    if (read == KeyRead::Done && !key.deleted && key.path == path) deleted.push_back(index);
-    return read == KeyRead::Failed;
-  });
-  if (failed) return -1;
-  for (const size_t index : deleted) {
+  for (const std::string& path : paths) {
+    const bool failed = index_.Find(ThumbnailIndex::HashOf(path), [&](size_t index) {
+      const KeyRead read = TryKey(static_cast<int64_t>(index), key);
+      if (read == KeyRead::Done && !key.deleted && key.path == path) deleted.push_back(index);
+      return read == KeyRead::Failed;
+    });
+    if (failed) return -1;
+  }
+  return MarkAllDeleted(deleted, header);
+}
+
+int64_t ThumbnailDatabase::DeleteBelow(std::span<const std::string> folders) {
+  DatabaseHeader header;
+  if (!LockAndCheck(header)) return -1;
+  const Unlocker unlocker(file_);
+  if (!UpdateIndex(StateOf(header))) return -1;
+  std::vector<std::string> beginnings;
+  for (const std::string& folder : folders)
+    beginnings.push_back(platform::JoinFolder(folder, std::string_view()));
+  std::vector<size_t> deleted;
+  DatabaseKey key;
+  for (int64_t i = 0; i < RecordCount(header); ++i) {
+    const KeyRead read = TryKey(i, key);
+    if (read == KeyRead::Failed) return -1;
+    const auto isBelow = [&](const std::string& beginning) {
+      return key.path.starts_with(beginning);
+    };
+    if (read == KeyRead::Done && !key.deleted && std::ranges::any_of(beginnings, isBelow))
+      deleted.push_back(static_cast<size_t>(i));
+  }
+  return MarkAllDeleted(deleted, header);
+}
+
+// With the lock held and the index up to date.
+int64_t ThumbnailDatabase::MarkAllDeleted(const std::vector<size_t>& records,
+                                          const DatabaseHeader& header) {
+  indexed_ = {};  // until all is done
+  for (const size_t index : records) {
     if (!MarkDeleted(static_cast<int64_t>(index))) return -1;
     index_.Change(index, 0);
   }
-  if (!deleted.empty() && !file_.Sync()) return -1;
+  if (!records.empty() && !file_.Sync()) return -1;
   indexed_ = StateOf(header);
-  return static_cast<int64_t>(deleted.size());
+  return static_cast<int64_t>(records.size());
 }
 
 ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreFile& to,

@@ -30,7 +30,12 @@ namespace fotomill {
 //            27912  261  path of the picture, zero-terminated
 //            28173  261  key of its volume, zero-terminated
 //            28434    1  flags: bit 0 set, the record is deleted
-//            28435    7  0
+//            28435    4  modification time of the picture, seconds since 1970 UTC, modulo 2^32
+//            28439    3  size of the picture, bytes, modulo 2^24
+//
+// Time and size tell whether the picture is still the one that the record was made of. All seven
+// bytes 0: not known, so that the record goes for whatever has its path, as records of programs do
+// that leave these bytes alone.
 //
 // The global database is in the data folder, a local one in the folder of its pictures. A record is
 // written and on disk before the header counts it; what is behind the counted ones means nothing.
@@ -47,18 +52,36 @@ struct DatabaseHeader {
   uint32_t created = 0, appended = 0;  // seconds since 1970 UTC
 };
 
+// Time and size of a picture, as far as a record keeps them.
+struct PictureStamp {
+  uint32_t modified = 0;  // seconds since 1970 UTC, modulo 2^32
+  uint32_t size = 0;      // bytes, modulo 2^24
+  bool operator==(const PictureStamp&) const = default;
+  bool Known() const { return modified != 0 || size != 0; }
+  // Whether both may belong to the same contents: they are equal, or one is not known.
+  bool Suits(const PictureStamp& other) const {
+    return !Known() || !other.Known() || *this == other;
+  }
+};
+// `modified`: seconds since 1970 UTC; `size`: bytes.
+PictureStamp PictureStampOf(int64_t modified, uint64_t size);
+// Of the file of that path as it is now; not known if it is no regular file.
+PictureStamp PictureStampOf(const std::string& path);
+
 // A record as it is read or appended.
 struct DatabaseRecord {
   ThumbnailRecord thumbnail;
   std::string path;    // at most 260 bytes
   std::string volume;  // likewise
   bool deleted = false;
+  PictureStamp stamp = {};  // of the picture when the thumbnail was made
 };
 
 // What a record is found by, without its thumbnail.
 struct DatabaseKey {
   std::string path, volume;
   bool deleted = false;
+  PictureStamp stamp = {};
 };
 
 // Key of the volume that holds a path: its label and serial number as "LABEL:12345", the label
@@ -98,6 +121,11 @@ class ThumbnailDatabase {
   // Opens the database of that path; with `create`, one that is missing is made with an empty
   // header. With `hidden` what is made, now or later, is hidden.
   Opened OpenThumbnailDatabase(const std::string& path, bool create, bool hidden = true);
+  // The same for lookups only: one that may not be written to will do as well, and takes no changes
+  // then.
+  Opened OpenToRead(const std::string& path, bool hidden = true);
+  // Whether one is open, and takes changes.
+  bool IsOpenForChanges() const { return file_.IsOpen() && !readOnly_; }
   void CloseThumbnailDatabase();  // does nothing when none is open
 
   // False when the file is shorter than a header or not a database.
@@ -118,12 +146,17 @@ class ThumbnailDatabase {
   }
   // Puts a record in the place of one that is counted, and has it on disk.
   bool WriteDatabaseRecord(int64_t index, const DatabaseRecord& record);
-  // The thumbnail of the first record that is not deleted, of that path and volume. False if there
-  // is none; `thumbnail` may then hold anything.
-  bool Find(const std::string& path, const std::string& volume, ThumbnailRecord& thumbnail);
-  // Marks every record of a path deleted, whatever its volume; how many there were, -1 when it
-  // could not be done.
-  int64_t Delete(const std::string& path);
+  // The thumbnail of the first record that is not deleted, of that path and volume, and whose stamp
+  // suits the picture's. False if there is none; `thumbnail` may then hold anything.
+  bool Find(const std::string& path, const std::string& volume, ThumbnailRecord& thumbnail,
+            const PictureStamp& stamp = {});
+  // Marks every record of these paths deleted, whatever its volume; how many there were, -1 when it
+  // could not be done. Each mark is one byte: whenever the work ends early, every record is either
+  // as before or deleted.
+  int64_t Delete(std::span<const std::string> paths);
+  int64_t Delete(const std::string& path) { return Delete({&path, 1}); }
+  // The same of all paths below these folders; reads the keys of all records.
+  int64_t DeleteBelow(std::span<const std::string> folders);
 
   // What became of a compaction.
   enum class Compacted {
@@ -140,11 +173,13 @@ class ThumbnailDatabase {
  private:
   enum class KeyRead { Done, NoThumbnail, Failed };
   KeyRead TryKey(int64_t index, DatabaseKey& key) const;
+  Opened OpenFile(const std::string& path, bool create, bool readOnlyToo);
   bool LockAndCheck(DatabaseHeader& header);
   ThumbnailIndex::State StateOf(const DatabaseHeader& header) const;
   bool UpdateIndex(const ThumbnailIndex::State& state);
-  bool TakeThumbnail(int64_t index, std::string_view path, std::string_view volume,
-                     ThumbnailRecord& thumbnail) const;
+  struct Wanted;
+  bool TakeThumbnail(int64_t index, const Wanted& wanted, ThumbnailRecord& thumbnail) const;
+  int64_t MarkAllDeleted(const std::vector<size_t>& records, const DatabaseHeader& header);
   bool BuildIndex(int64_t count);
   bool FindRecordsToReplace(std::span<const DatabaseRecord> records, int64_t first,
                             std::vector<int64_t>& replaced) const;
@@ -157,6 +192,8 @@ class ThumbnailDatabase {
 
   std::string path_;
   bool hidden_ = false;
+  bool readOnlyToo_ = false;  // as it was asked for when it was opened
+  bool readOnly_ = false;     // as it is open
   platform::StoreFile file_;
   ThumbnailIndex index_;
   // the file as the index knows it: in another state, someone else has changed it

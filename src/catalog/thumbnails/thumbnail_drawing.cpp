@@ -90,6 +90,29 @@ void CopyClipped(const PackedImage& from, PackedImage& to, int32_t x, int32_t y)
   }
 }
 
+bool IsMatte(const PackedImage& bitmap, int32_t x, int32_t y, Color matte) {
+  const uint8_t* const pixel = bitmap.Row(y).data() + 3 * static_cast<size_t>(x);
+  return pixel[0] == static_cast<uint8_t>(matte >> 16) &&
+         pixel[1] == static_cast<uint8_t>(matte >> 8) && pixel[2] == static_cast<uint8_t>(matte);
+}
+
+// Rows above and below, or columns at both sides, that are all matte. The two sides of a margin
+// differ by one pixel at most, since the picture is in the middle.
+template <typename IsMatteAt>
+int32_t EvenMargin(int32_t side, IsMatteAt isMatteAt) {
+  for (int32_t margin = 0; 2 * (margin + 1) < side; ++margin) {
+    for (int32_t i = 0; i < side; ++i) {
+      if (!isMatteAt(margin, i) || !isMatteAt(side - 1 - margin, i)) return margin;
+    }
+  }
+  return (side - 1) / 2;
+}
+
+// Of the square as it is drawn. What an enlarged or reduced pixel has of the matte goes too.
+int32_t DrawnMargin(int32_t margin, int32_t side, int32_t drawn) {
+  return std::min((margin * drawn + side - 1) / side, (drawn - 1) / 2);
+}
+
 }  // namespace
 
 int32_t DrawnThumbnailSide(const AnyThumbnailRecord& record, uint32_t flags) {
@@ -106,6 +129,23 @@ bool DrawThumbnailRecord(PackedImage& bitmap, const AnyThumbnailRecord& record, 
     return false;
   CopyClipped(drawn, bitmap, x, y);
   return true;
+}
+
+Status DrawThumbnailPicture(const AnyThumbnailRecord& record, uint32_t flags,
+                            const ThumbnailOptions& options, PackedImage& picture) {
+  PackedImage bitmap;
+  RETURN_IF_BAD(
+      std::visit([&](const auto& held) { return ThumbnailRecordToBitmap(held, bitmap); }, record));
+  const int32_t side = bitmap.Width(), drawn = DrawnThumbnailSide(record, flags);
+  const int32_t top = EvenMargin(
+      side, [&](int32_t line, int32_t i) { return IsMatte(bitmap, i, line, options.matte); });
+  const int32_t left = EvenMargin(
+      side, [&](int32_t line, int32_t i) { return IsMatte(bitmap, line, i, options.matte); });
+  const int32_t x = DrawnMargin(left, side, drawn), y = DrawnMargin(top, side, drawn);
+  RETURN_IF_BAD(NewPackedImage(drawn - 2 * x, drawn - 2 * y, nullptr, 24, picture));
+  return DrawThumbnailRecord(picture, record, -x, -y, flags, options)
+             ? Status::Ok
+             : Status::MemoryAllocationError;
 }
 
 }  // namespace fotomill

@@ -28,6 +28,11 @@ int32_t DrawnThumbnailSide(const AnyThumbnailRecord& record, uint32_t flags);
 bool DrawThumbnailRecord(PackedImage& bitmap, const AnyThumbnailRecord& record, int32_t x,
                          int32_t y, uint32_t flags, const ThumbnailOptions& options);
 
+// The same square without the margins of the matte around the picture, as far as they are even:
+// what a browser shows, on a background of its own. Statuses as NewPackedImage.
+Status DrawThumbnailPicture(const AnyThumbnailRecord& record, uint32_t flags,
+                            const ThumbnailOptions& options, PackedImage& picture);
+
 // Fills a record with one of the two pictures that stand for a thumbnail that is not there: 9501,
 // one can still be made; 9502, none can. False for another number.
 inline constexpr int32_t kPlaceholderNotMade = 9501;

@@ -1,8 +1,11 @@
 #include "catalog/thumbnails/thumbnail_lookup.h"
 
+#include "catalog/thumbnails/listed_thumbnails.h"
 #include "catalog/thumbnails/system_thumbnail.h"
 #include "catalog/thumbnails/thumbnail_database.h"
 #include "catalog/thumbnails/thumbnail_file.h"
+#include "catalog/thumbnails/thumbnail_store.h"
+#include "platform/files.h"
 #include "platform/paths.h"
 
 namespace fotomill {
@@ -16,37 +19,46 @@ bool ReadFromSystem(const std::string& picturePath, Color matte, AnyThumbnailRec
   return true;
 }
 
-bool ReadListed(const std::string& picturePath, const ThumbnailSources& sources,
-                ThumbnailRecord& record) {
-  const ThumbnailRecord* const listed =
-      sources.listed ? sources.listed(platform::FileNameOf(picturePath)) : nullptr;
-  if (listed != nullptr) record = *listed;
-  return listed != nullptr;
+bool ReadCurrentFile(const ThumbnailQuery& picture, ThumbnailRecord& record) {
+  const std::string path = ThumbnailPathFor(picture.path);
+  const platform::FileFacts facts = platform::FactsOf(path);
+  return facts.kind == platform::FileKind::Regular && facts.modified >= picture.modified &&
+         ReadThumbnailFile(record, path);
 }
 
-bool ReadSmall(const std::string& picturePath, const ThumbnailSources& sources,
+bool ReadSmall(const ThumbnailQuery& picture, const ThumbnailSources& sources,
                ThumbnailRecord& record) {
   const bool usesFile = sources.mode == choice::kDiskBased || sources.options.fromFiles;
-  if (usesFile && ReadThumbnailFile(record, ThumbnailPathFor(picturePath))) return true;
+  if (usesFile && ReadCurrentFile(picture, record)) return true;
+  const PictureStamp stamp = PictureStampOf(picture.modified, picture.size);
   switch (sources.mode) {
-    case choice::kDiskBased: return false;
-    case choice::kVirtual: return ReadListed(picturePath, sources, record);
+    case choice::kDiskBased: break;
+    case choice::kVirtual:
+      return sources.listed != nullptr && sources.listed->Find(picture.path, stamp, record);
     case choice::kGlobalDatabase:
-    case choice::kLocalDatabase: break;
+    case choice::kLocalDatabase:
+      return sources.databases != nullptr &&
+             sources.databases->Find(DatabaseForMode(sources.mode, picture.path), picture.path,
+                                     stamp, record);
   }
-  return sources.database != nullptr &&
-         sources.database->Find(picturePath, VolumeKeyFor(picturePath), record);
+  return false;
 }
 
 }  // namespace
 
-bool LookUpThumbnail(const std::string& picturePath, bool large, const ThumbnailSources& sources,
+std::string DatabaseForMode(choice::ThumbnailMode mode, const std::string& picturePath) {
+  if (mode == choice::kGlobalDatabase) return ThumbnailDatabasePath({});
+  return mode == choice::kLocalDatabase ? ThumbnailDatabasePath(platform::FolderOf(picturePath))
+                                        : std::string();
+}
+
+bool LookUpThumbnail(const ThumbnailQuery& picture, const ThumbnailSources& sources,
                      AnyThumbnailRecord& record) {
-  const bool fromSystem = large && sources.mode == choice::kDiskBased && sources.systemCache &&
-                          sources.options.fromSystem;
-  if (fromSystem && ReadFromSystem(picturePath, sources.options.matte, record)) return true;
+  const bool fromSystem = picture.large && sources.mode == choice::kDiskBased &&
+                          sources.systemCache && sources.options.fromSystem;
+  if (fromSystem && ReadFromSystem(picture.path, sources.options.matte, record)) return true;
   ThumbnailRecord small;
-  if (!ReadSmall(picturePath, sources, small)) return false;
+  if (!ReadSmall(picture, sources, small)) return false;
   record = small;
   return true;
 }

@@ -38,13 +38,20 @@ struct TdbOptions {
 constexpr const char* kNoDatabase = TrLater("Not a readable thumbnail database; left unchanged.");
 constexpr const char* kNotAdded = TrLater("The thumbnail could not be added to the database.");
 constexpr const char* kNotFound = TrLater("The database has no thumbnail of this picture.");
+constexpr const char* kNoCurrent =
+    TrLater("The database has no thumbnail of this picture as it is now.");
 constexpr const char* kExists = TrLater("The file exists; use --overwrite replace to replace it.");
 constexpr size_t kAddedAtOnce = 64;  // pictures, about 2 MB
 
+enum class Access { Read, Change, Create };
+
 // Opens a database; false after printing a message.
-bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, bool create,
+bool OpenDatabase(ThumbnailDatabase& database, const std::string& path, Access access,
                   ResultOutput& output) {
-  switch (database.OpenThumbnailDatabase(path, create, ThumbnailOptionsFromSettings().hidden)) {
+  const bool hidden = ThumbnailOptionsFromSettings().hidden;
+  switch (access == Access::Read
+              ? database.OpenToRead(path, hidden)
+              : database.OpenThumbnailDatabase(path, access == Access::Create, hidden)) {
     case ThumbnailDatabase::Opened::Done: return true;
     case ThumbnailDatabase::Opened::Missing: output.FileFailed(path, Status::FileOpenError); break;
     case ThumbnailDatabase::Opened::NotRead:
@@ -77,6 +84,7 @@ Adding MakeRecord(const SelectedFile& file, const ThumbnailOptions& options) {
     adding.hint = Tr("The path is longer than 260 characters.");
     return adding;
   }
+  adding.record->stamp = PictureStampOf(adding.record->path);  // before it is read
   adding.status = MakeThumbnailOfFile(file.name, options, adding.record->thumbnail);
   if (adding.status != Status::Ok) adding.hint = OpenHint(file.name, adding.status);
   adding.record->volume = VolumeKeyFor(adding.record->path);
@@ -170,7 +178,7 @@ int RunAdd(const TdbOptions& options, CommandContext& context) {
     return output.Finish();
   }
   ThumbnailDatabase database;
-  if (!OpenDatabase(database, path, true, output)) return output.Finish();
+  if (!OpenDatabase(database, path, Access::Create, output)) return output.Finish();
   const uint32_t jobs =
       options.jobs == 0 ? platform::CoreCount() : static_cast<uint32_t>(options.jobs);
   return AddFiles(selection->files, jobs, database, output, !context.global.noHistory);
@@ -180,11 +188,12 @@ int RunFind(const TdbOptions& options, CommandContext& context) {
   const std::string &path = context.names.values[0], &name = context.names.values[1];
   ResultOutput output(context, options.json);
   ThumbnailDatabase database;
-  if (!OpenDatabase(database, path, false, output)) return output.Finish();
+  if (!OpenDatabase(database, path, Access::Read, output)) return output.Finish();
   const std::string picture = platform::AbsolutePath(name);
   ThumbnailRecord record;
-  if (!database.Find(picture, VolumeKeyFor(picture), record)) {
-    output.FileFailed(name, Status::NoImages, Tr(kNotFound));
+  if (!database.Find(picture, VolumeKeyFor(picture), record, PictureStampOf(picture))) {
+    const bool changed = database.Find(picture, VolumeKeyFor(picture), record);
+    output.FileFailed(name, Status::NoImages, Tr(changed ? kNoCurrent : kNotFound));
     return output.Finish();
   }
   if (options.overwrite != "replace" && platform::FileExists(options.out)) {
@@ -213,6 +222,7 @@ void PrintJson(const CommandContext& context, const ThumbnailDatabase& database,
     PutName(record, "path", key.path);
     PutName(record, "volume", key.volume);
     record["deleted"] = key.deleted;
+    record["modified"] = key.stamp.Known() ? Json(key.stamp.modified) : Json();
     object["records"].push_back(std::move(record));
   }
   const std::string text = object.dump(-1, ' ', true, Json::error_handler_t::replace) + "\n";
@@ -224,7 +234,7 @@ int RunList(const TdbOptions& options, CommandContext& context) {
   ResultOutput output(context, false);
   ThumbnailDatabase database;
   DatabaseHeader header;
-  if (!OpenDatabase(database, path, false, output)) return output.Finish();
+  if (!OpenDatabase(database, path, Access::Read, output)) return output.Finish();
   if (!database.ReadDatabaseHeader(header)) {
     output.Failure(path, Status::DamagedFile, Tr(kNoDatabase));
     return output.Finish();
@@ -262,7 +272,8 @@ int RunDelete(const TdbOptions& options, CommandContext& context) {
   const std::string& path = context.names.values[0];
   ResultOutput output(context, options.json);
   ThumbnailDatabase database;
-  if (!OpenDatabase(database, path, false, output)) return output.Finish();
+  if (!OpenDatabase(database, path, options.dryRun ? Access::Read : Access::Change, output))
+    return output.Finish();
   for (size_t i = 1; i < context.names.values.size() && output.GoesOn(); ++i) {
     const std::string& name = context.names.values[i];
     const std::string picture = platform::AbsolutePath(name);
@@ -308,7 +319,8 @@ int RunCompact(const TdbOptions& options, CommandContext& context) {
   ResultOutput output(context, options.json);
   ThumbnailDatabase database;
   DatabaseHeader before, after;
-  if (!OpenDatabase(database, path, false, output)) return output.Finish();
+  if (!OpenDatabase(database, path, options.dryRun ? Access::Read : Access::Change, output))
+    return output.Finish();
   const bool read = database.ReadDatabaseHeader(before);
   if (options.dryRun) {
     const int64_t kept = CountRecords(database, [&](const DatabaseKey& key) {
@@ -376,7 +388,8 @@ void SetUpTdbList(CLI::App& app, CommandContext& context) {
       SetUp(app, context, RunList, nullptr, "fotomill tdb list Fotomill.tdb --json");
   context.names.Declare("DB", "The database", 1, 1);
   AddFlag(app, "--json", options->json,
-          "Print a JSON object {version, count, created, appended, records: [{index, path, volume, deleted}]}");
+          "Print a JSON object {version, count, created, appended, records: [{index, path, volume, "
+          "deleted, modified}]}");
 }
 
 void SetUpTdbDelete(CLI::App& app, CommandContext& context) {

@@ -28,21 +28,6 @@ bool Reserve(RgbImage& image, int32_t width, int32_t height) {
   return true;
 }
 
-bool RowIs(const RgbImage& image, int32_t y, const uint8_t* color) {
-  const uint8_t* pixel = image.Row(y);
-  for (int32_t x = 0; x < image.width; ++x, pixel += 3) {
-    if (std::memcmp(pixel, color, 3) != 0) return false;
-  }
-  return true;
-}
-
-bool ColumnIs(const RgbImage& image, int32_t x, const uint8_t* color) {
-  for (int32_t y = 0; y < image.height; ++y) {
-    if (std::memcmp(image.Row(y) + 3 * x, color, 3) != 0) return false;
-  }
-  return true;
-}
-
 }  // namespace
 
 RgbImage FilledImage(int32_t width, int32_t height, Color color) {
@@ -97,25 +82,6 @@ Status PrepareWithAlpha(PictureRecord& picture) {
   if (settings.ExifAdjustOrientation != 0) RETURN_IF_BAD(TurnUpright(picture));
   if (!picture.alpha.Empty() && IsOpaque(picture.alpha)) picture.alpha.Free();
   return PromotePicture(picture);
-}
-
-RgbImage WithoutMatte(const RgbImage& image, Color matte) {
-  const uint8_t color[3] = {static_cast<uint8_t>(matte), static_cast<uint8_t>(matte >> 8),
-                            static_cast<uint8_t>(matte >> 16)};
-  int32_t top = 0, left = 0;
-  // The two sides of a margin differ by one pixel at most, since the picture is in the middle.
-  while (2 * (top + 1) < image.height && RowIs(image, top, color) &&
-         RowIs(image, image.height - 1 - top, color))
-    ++top;
-  while (2 * (left + 1) < image.width && ColumnIs(image, left, color) &&
-         ColumnIs(image, image.width - 1 - left, color))
-    ++left;
-  RgbImage cut;
-  if (!Reserve(cut, image.width - 2 * left, image.height - 2 * top)) return cut;
-  for (int32_t y = 0; y < cut.height; ++y) {
-    std::memcpy(cut.Row(y), image.Row(y + top) + 3 * left, static_cast<size_t>(cut.width) * 3);
-  }
-  return cut;
 }
 
 }  // namespace fotomill::desktop

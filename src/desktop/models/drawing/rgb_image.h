@@ -50,8 +50,4 @@ Status PrepareForDisplay(PictureRecord& picture, Color background);
 // The same without a background: the alpha plane stays, unless the picture is opaque after all.
 Status PrepareWithAlpha(PictureRecord& picture);
 
-// The picture of a thumbnail without the even margins of a color around it, and at least a pixel of
-// it.
-RgbImage WithoutMatte(const RgbImage& image, Color matte);
-
 }  // namespace fotomill::desktop

@@ -1,7 +1,7 @@
 #include "desktop/models/files/turn_one_file.h"
 
 #include "batch/rewrite/turn_file.h"
-#include "desktop/models/thumbnails/thumbnail.h"
+#include "catalog/thumbnails/picture_changes.h"
 #include "files/previous_file.h"
 #include "platform/files.h"
 #include "settings/job_options.h"
@@ -15,14 +15,18 @@ FileOperationResult TurnOneFile(const std::string& path, Orientation turn) {
   if (platform::FactsOf(path).link)
     return {{FileOperationKind::Turn, {}},
             {{path, Tr("This is a link; rotate the file it points to.")}}};
-  PreviousFiles previous(DropThumbnails);
+  PreviousFiles previous;
   WriteOptions options{.encode = EncodeOptionsFromSettings()};
   bool kept = true;
   options.makeWay = [&] { return kept = previous.Keep(path); };
   const TurnRequest request{.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0};
   const RewrittenFile turned =
       TurnPictureFile(path, path, request, ReadOptionsFromSettings(), options);
-  if (turned.changed) previous.Replaced(path);
+  if (turned.changed) {
+    previous.Replaced(path);
+    DeleteThumbnailFile(path);
+    MarkChangedRecords({{PictureChange{path}}});
+  }
   FileOperationResult result{previous.Operation(), {}, turned.note.shown};
   if (turned.status != Status::Ok) {
     const std::string hint =

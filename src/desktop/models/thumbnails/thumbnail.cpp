@@ -1,104 +1,32 @@
 #include "desktop/models/thumbnails/thumbnail.h"
 
 #include <algorithm>
-#include <mutex>
-#include <utility>
-#include <vector>
 
 #include "catalog/thumbnails/exif_thumbnail.h"
+#include "catalog/thumbnails/listed_thumbnails.h"
 #include "catalog/thumbnails/system_thumbnail.h"
 #include "catalog/thumbnails/thumbnail_database.h"
 #include "catalog/thumbnails/thumbnail_file.h"
+#include "catalog/thumbnails/thumbnail_lookup.h"
+#include "catalog/thumbnails/thumbnail_store.h"
 #include "core/choice_lists.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_walk.h"
-#include "platform/files.h"
-#include "platform/paths.h"
-#include "processing/geometry/scale.h"
 #include "processing/faces/face_finder.h"
+#include "processing/geometry/scale.h"
 #include "registry/registry.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-bool ReadCurrentFile(const ThumbnailRequest& request, ThumbnailRecord& record) {
-  const std::string path = ThumbnailPathFor(request.path);
-  const platform::FileFacts facts = platform::FactsOf(path);
-  return facts.kind == platform::FileKind::Regular && facts.modified >= request.modified &&
-         ReadThumbnailFile(record, path);
-}
-
 bool InDatabase(const ThumbnailRequest& request) {
   return request.mode == choice::kGlobalDatabase || request.mode == choice::kLocalDatabase;
 }
 
-std::string DatabaseFor(const ThumbnailRequest& request) {
-  return ThumbnailDatabasePath(
-      request.mode == choice::kGlobalDatabase ? std::string() : platform::FolderOf(request.path));
-}
-
-// The database that was asked last stays open: its index is what makes a search quick. New records
-// are gathered, since every append waits for the disk.
-class OpenDatabase {
- public:
-  bool Find(const ThumbnailRequest& request, ThumbnailRecord& record) {
-    const std::lock_guard lock(mutex_);
-    hidden_ = request.options.hidden;
-    return Open(DatabaseFor(request), false) &&
-           database_.Find(request.path, VolumeKeyFor(request.path), record);
-  }
-  void Add(const ThumbnailRequest& request, const ThumbnailRecord& record) {
-    const std::lock_guard lock(mutex_);
-    const std::string path = DatabaseFor(request);
-    if (path != newPath_ || new_.size() >= kGathered) Write();
-    newPath_ = path;
-    hidden_ = request.options.hidden;
-    new_.push_back({record, request.path, VolumeKeyFor(request.path), false});
-  }
-  void Flush() {
-    const std::lock_guard lock(mutex_);
-    Write();
-  }
-  void Drop(const std::string& path, const std::string& database) {
-    const std::lock_guard lock(mutex_);
-    Write();
-    if (platform::IsRegularFile(database) && Open(database, false)) (void)database_.Delete(path);
-  }
-
- private:
-  static constexpr size_t kGathered = 64;
-
-  bool Open(const std::string& path, bool create) {
-    if (path == openPath_) return true;
-    openPath_.clear();
-    database_.CloseThumbnailDatabase();
-    if (database_.OpenThumbnailDatabase(path, create, hidden_) != ThumbnailDatabase::Opened::Done)
-      return false;
-    openPath_ = path;
-    return true;
-  }
-  // A database that cannot be written to costs the thumbnails no more than being made again.
-  void Write() {
-    const std::vector<DatabaseRecord> records = std::exchange(new_, {});
-    if (!records.empty() && Open(newPath_, true))
-      (void)database_.AppendDatabaseRecords(records, true);
-  }
-
-  std::mutex mutex_;
-  std::string openPath_, newPath_;
-  bool hidden_ = true;
-  ThumbnailDatabase database_;
-  std::vector<DatabaseRecord> new_;
-};
-OpenDatabase openDatabase;
-
-bool FindRecord(const ThumbnailRequest& request, ThumbnailRecord& record) {
-  if (request.side > kSmallThumbnailSide) return false;  // a record would have to be enlarged
-  if (request.mode == choice::kDiskBased || request.options.fromFiles) {
-    if (ReadCurrentFile(request, record)) return true;
-  }
-  return InDatabase(request) && openDatabase.Find(request, record);
+ListedThumbnails& Listed() {
+  static ListedThumbnails listed;
+  return listed;
 }
 
 Status ScaleDown(const PackedImage& image, int32_t side, RgbImage& pixels) {
@@ -109,15 +37,15 @@ Status ScaleDown(const PackedImage& image, int32_t side, RgbImage& pixels) {
   return ToRgb(scaled, pixels);
 }
 
-Status PixelsOfRecord(const ThumbnailRecord& record, const ThumbnailRequest& request,
+// Records are drawn at the sides of the three views; what is smaller than that is scaled down.
+Status PixelsOfRecord(const AnyThumbnailRecord& record, const ThumbnailRequest& request,
                       RgbImage& pixels) {
-  PackedImage bitmap;
-  RETURN_IF_BAD(ThumbnailRecordToBitmap(record, bitmap));
-  RETURN_IF_BAD(ToRgb(bitmap, pixels));
-  pixels = WithoutMatte(pixels, request.options.matte);
-  if (std::max(pixels.width, pixels.height) <= request.side) return Status::Ok;
-  RETURN_IF_BAD(ToPacked(pixels, bitmap));
-  return ScaleDown(bitmap, request.side, pixels);
+  const uint32_t flags = request.side > kSmallThumbnailSide        ? kDrawLargeView
+                         : request.side <= kSmallThumbnailSide / 2 ? kDrawHalfSize
+                                                                   : 0;
+  PackedImage drawn;
+  RETURN_IF_BAD(DrawThumbnailPicture(record, flags, request.options, drawn));
+  return ScaleDown(drawn, request.side, pixels);
 }
 
 Status PixelsOfPicture(PictureRecord& picture, const ThumbnailRequest& request, RgbImage& pixels) {
@@ -125,14 +53,21 @@ Status PixelsOfPicture(PictureRecord& picture, const ThumbnailRequest& request, 
   return ScaleDown(picture.image, request.side, pixels);
 }
 
-// A thumbnail that was made earlier.
+// A thumbnail that was made earlier. For dense screens records are too small; pictures of the
+// system may do.
 bool ReadReady(const ThumbnailRequest& request, Thumbnail& thumbnail) {
-  ThumbnailRecord record;
-  if (FindRecord(request, record) &&
-      PixelsOfRecord(record, request, thumbnail.pixels) == Status::Ok)
-    return true;
-  const bool fromSystem = request.mode == choice::kDiskBased && request.options.fromSystem &&
-                          request.side > kSmallThumbnailSide;
+  const bool large = request.side == kLargeThumbnailSide;
+  if (request.side <= kSmallThumbnailSide || large) {
+    const auto record = std::make_unique<AnyThumbnailRecord>();
+    const ThumbnailSources sources{.mode = static_cast<choice::ThumbnailMode>(request.mode),
+                                   .listed = &Listed(),
+                                   .databases = &SharedThumbnailStore(),
+                                   .options = request.options};
+    return LookUpThumbnail({request.path, request.modified, request.size, large}, sources,
+                           *record) &&
+           PixelsOfRecord(*record, request, thumbnail.pixels) == Status::Ok;
+  }
+  const bool fromSystem = request.mode == choice::kDiskBased && request.options.fromSystem;
   const PicturePointer picture =
       fromSystem ? ReadSystemPicture(request.path, request.side) : nullptr;
   return picture != nullptr && PixelsOfPicture(*picture, request, thumbnail.pixels) == Status::Ok;
@@ -163,15 +98,35 @@ void CopyFacts(const PictureRecord& picture, Thumbnail& thumbnail) {
       picture.pageCount > 1 && (FormatRow(picture.formatIndex).flags & FMT_ANIMATED) != 0;
 }
 
-// What a record does not know of files that may have several pages: it is quickly told by their
-// heads.
-void ReadPages(const std::string& path, const ReadOptions& options, Thumbnail& thumbnail) {
-  const int32_t format = FindFormatByName(path);
+// What a record does not know of its picture; the head of the file tells it quickly.
+void ReadFacts(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   PicturePointer picture;
-  if (format == kNoFormat || format == kSpareRow || (FormatRow(format).flags & FMT_MULTI) == 0)
-    return;
-  if (LoadPictureInfo({.fileName = path, .options = options}, picture) == Status::Ok)
+  if (LoadPictureInfo({.fileName = request.path, .options = request.options.read}, picture) ==
+      Status::Ok)
     CopyFacts(*picture, thumbnail);
+}
+
+// Whether the mode has a place for the record of a picture that is read.
+bool Keeps(const ThumbnailRequest& request) {
+  return request.mode == choice::kVirtual || (InDatabase(request) && request.options.keep);
+}
+
+// How large a picture has to be decoded, 0 for all of it: enough for its record as well, however
+// small the view. The quick scaler's result depends on the size that it starts from.
+int32_t DecodedSide(const ThumbnailRequest& request, bool onFaces) {
+  if (Keeps(request) && request.options.quick) return 0;
+  return std::max({request.side, onFaces ? kFramingSide : 0,
+                   Keeps(request) ? kSmallThumbnailSide : 0});
+}
+
+void KeepRecord(const ThumbnailRequest& request, const PictureRecord& picture) {
+  ThumbnailRecord record;
+  if (!Keeps(request) || !MakeThumbnailRecord(record, picture, request.options)) return;
+  const PictureStamp stamp = PictureStampOf(request.modified, request.size);
+  if (request.mode == choice::kVirtual) return Listed().Attach(request.path, stamp, record);
+  SharedThumbnailStore().Add(
+      DatabaseForMode(static_cast<choice::ThumbnailMode>(request.mode), request.path),
+      {record, request.path, VolumeKeyFor(request.path), false, stamp}, request.options.hidden);
 }
 
 Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
@@ -180,21 +135,17 @@ Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
       InDatabase(request) ? request.options.onFaces : request.options.onFacesUnkept;
   const ReadRequest read{
       .fileName = request.path,
-      .thumbnailSide = onFaces ? std::max(request.side, kFramingSide) : request.side,
+      .thumbnailSide = DecodedSide(request, onFaces),
       .partial = true,
       .options = request.options.read};
   RETURN_IF_BAD(LoadPictureInfo(read, picture));
   CopyFacts(*picture, thumbnail);
   RETURN_IF_BAD(ReadPicture(read, *picture));
   thumbnail.partial = picture->shortfall != Status::Ok;
-  thumbnail.alpha = !picture->alpha.Empty();
   if (onFaces)
     RETURN_IF_BAD(FrameOnFaces(*picture, request.options.faces, request.options.onAllFaces));
   RETURN_IF_BAD(PrepareForDisplay(*picture, request.options.matte));
-  ThumbnailRecord record;
-  if (!thumbnail.partial && InDatabase(request) && request.options.keep &&
-      MakeThumbnailRecord(record, *picture, request.options))
-    openDatabase.Add(request, record);
+  if (!thumbnail.partial) KeepRecord(request, *picture);
   return ScaleDown(picture->image, request.side, thumbnail.pixels);
 }
 
@@ -203,7 +154,7 @@ Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
 ThumbnailPointer LoadThumbnail(const ThumbnailRequest& request) {
   auto thumbnail = std::make_shared<Thumbnail>();
   if (ReadReady(request, *thumbnail)) {
-    ReadPages(request.path, request.options.read, *thumbnail);
+    ReadFacts(request, *thumbnail);
     return thumbnail;
   }
   if (request.standIn) return ReadEmbedded(request, *thumbnail) ? thumbnail : nullptr;
@@ -216,16 +167,7 @@ bool MayHoldThumbnail(int32_t format) {
   return format != kNoFormat && FormatRow(format).keepsMetadata != 0;
 }
 
-void KeepThumbnailRecords() { openDatabase.Flush(); }
-
-void DropThumbnails(const std::string& path) {
-  const std::string file = ThumbnailPathFor(path);
-  ThumbnailRecord record;
-  if (!platform::FactsOf(file).link && ReadThumbnailFile(record, file))
-    (void)platform::DeleteFile(file);
-  openDatabase.Drop(path, ThumbnailDatabasePath({}));
-  openDatabase.Drop(path, ThumbnailDatabasePath(platform::FolderOf(path)));
-}
+void KeepThumbnailRecords() { SharedThumbnailStore().Flush(); }
 
 Status WriteThumbnail(const std::string& path, const ThumbnailOptions& options) {
   ThumbnailRecord record;

@@ -40,9 +40,9 @@ struct Thumbnail {
 // Shared by cache and windows; never changes.
 using ThumbnailPointer = std::shared_ptr<const Thumbnail>;
 
-// Gets a picture's thumbnail: a record from its thumbnail file or the database of the browser's
-// mode when that is as new as the picture and large enough, the system's own where large ones may
-// come from there, else from the picture itself. Takes as long as it takes; called by workers. A
+// Gets a picture's thumbnail: what LookUpThumbnail finds, drawn at the size of the view, on dense
+// screens the system's own where large ones may come from there, else from the picture itself. What
+// is known of the picture is the same either way. Takes as long as it takes; called by workers. A
 // request for a stand-in decodes no picture: it gets the proper thumbnail when there is one ready,
 // else the one that the file holds, and null when it holds none.
 ThumbnailPointer LoadThumbnail(const ThumbnailRequest& request);
@@ -53,10 +53,6 @@ bool MayHoldThumbnail(int32_t format);
 // Writes the records that were made for databases since the last call; LoadThumbnail does it as
 // well, now and then.
 void KeepThumbnailRecords();
-
-// Deletes a picture's thumbnail file and its records in the global and the folder's database: the
-// picture is about to be replaced by a file that may be older.
-void DropThumbnails(const std::string& path);
 
 // Makes a picture's thumbnail record and writes its thumbnail file.
 Status WriteThumbnail(const std::string& path, const ThumbnailOptions& options);

@@ -6,8 +6,6 @@
 #include "batch/new_job.h"
 #include "batch/rewrite/turn_run.h"
 #include "desktop/models/batch/destination_choice.h"
-#include "desktop/models/thumbnails/thumbnail.h"
-#include "files/previous_file.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/batch/destination_dialog.h"
 #include "desktop/windows/batch/notification.h"
@@ -19,6 +17,7 @@
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
+#include "files/previous_file.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "settings/configuration.h"
@@ -194,7 +193,7 @@ void TurnSelection(Shell& shell, Orientation turn) {
   for (const std::string& file : shell.Tabs().SelectedFiles())
     files.push_back({.name = file, .below = {}, .hint = {}});
   if (files.empty()) return;
-  auto previous = std::make_shared<PreviousFiles>(DropThumbnails);
+  auto previous = std::make_shared<PreviousFiles>();
   TurnFunction function{
       .request = {.turn = turn, .seenByExif = settings.ExifAdjustOrientation != 0},
       .inPlace = true};

@@ -3,6 +3,7 @@
 #include <wx/timer.h>
 #include <wx/window.h>
 
+#include <deque>
 #include <functional>
 #include <optional>
 #include <string>
@@ -70,8 +71,9 @@ class ThumbnailCanvas : public wxWindow {
   void MeasureCells();
   void DrawCell(wxDC& dc, size_t line, const Looks& looks);
   void DrawPicture(wxDC& dc, size_t line, const wxRect& square, const Looks& looks);
-  void DrawPlaceholder(wxDC& dc, const FolderItem& item, const wxRect& square, const wxString& mark,
+  void DrawPlaceholder(wxDC& dc, size_t line, const wxRect& square, bool unreadable,
                        const Looks& looks);
+  const wxBitmap& PlaceholderBitmap(bool unreadable, int side, const wxColour& background);
   wxString CutName(wxDC& dc, const std::string& name, int width);
   const wxBitmap& BitmapOfThumbnail(const ThumbnailPointer& thumbnail);
   ThumbnailRequest RequestOf(size_t line) const;
@@ -100,6 +102,13 @@ class ThumbnailCanvas : public wxWindow {
     wxBitmap bitmap;
   };
   std::unordered_map<const Thumbnail*, Drawn> bitmaps_;
+  struct DrawnPlaceholder {
+    bool unreadable;
+    int side;
+    wxColour background;
+    wxBitmap bitmap;
+  };
+  std::deque<DrawnPlaceholder> placeholders_;
   std::unordered_map<std::string, wxString> cutNames_;
   int cutWidth_ = 0;
 

@@ -7,6 +7,7 @@
 
 #include "core/text.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/models/thumbnails/placeholder.h"
 #include "desktop/windows/browser/thumbnail_badges.h"
 #include "desktop/windows/browser/thumbnail_canvas.h"
 #include "desktop/windows/widgets/bitmaps.h"
@@ -21,6 +22,7 @@ namespace {
 
 constexpr double kBitmapBytes = 96e6;  // kept for drawing, beside the thumbnails themselves
 constexpr size_t kMostCutNames = 5000;
+constexpr unsigned long kInkOnPaper = 0x3D3D90;  // of an extension on the sheet, 0xBBGGRR
 
 }  // namespace
 
@@ -30,8 +32,7 @@ struct ThumbnailCanvas::Looks {
   wxColour background = ToWx(palette.background), text = ToWx(palette.text);
   wxColour selected = ToWx(palette.selected), selectedText = ToWx(palette.selectedText);
   wxColour resting = ToWx(palette.resting), restingText = ToWx(palette.restingText);
-  wxColour frame = ToWx(palette.frame), faint = ToWx(palette.faint);
-  wxColour note = ToWx(palette.note), fault = ToWx(palette.fault);
+  wxColour frame = ToWx(palette.frame), note = ToWx(palette.note);
 };
 
 // Painting tells the log when the first one, and the first one with files, was done, and which ones
@@ -98,7 +99,7 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
   if (square_ == 0) {
     const wxRect icon(cell.x + padding, cell.y + (cell.height - FromDIP(16)) / 2, FromDIP(16),
                       FromDIP(16));
-    DrawPlaceholder(dc, item, icon, {}, looks);
+    DrawPlaceholder(dc, line, icon, false, looks);
     const int left = icon.GetRight() + padding;
     dc.SetTextForeground(text);
     dc.DrawText(CutName(dc, item.name, cell.GetRight() - left - padding), left,
@@ -116,17 +117,15 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
 
 void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, const Looks& looks) {
   const FolderItem& item = model_.Line(line);
-  if (item.folder) return DrawPlaceholder(dc, item, square, {}, looks);
+  if (item.folder) return DrawPlaceholder(dc, line, square, false, looks);
   const ThumbnailRequest request = RequestOf(line);
   ThumbnailPointer thumbnail = thumbnails_.Find(request);
   const bool right = thumbnail != nullptr;
   if (!right) thumbnail = thumbnails_.FindAny(request.path);
-  if (thumbnail == nullptr || thumbnail->status != Status::Ok) {
-    return DrawPlaceholder(dc, item, square, thumbnail == nullptr ? wxString() : wxString("!"),
-                           looks);
-  }
+  if (thumbnail == nullptr || thumbnail->status != Status::Ok)
+    return DrawPlaceholder(dc, line, square, thumbnail != nullptr, looks);
   const wxBitmap& bitmap = BitmapOfThumbnail(thumbnail);
-  if (!bitmap.IsOk()) return DrawPlaceholder(dc, item, square, "!", looks);
+  if (!bitmap.IsOk()) return DrawPlaceholder(dc, line, square, true, looks);
   // One of another size, or the file's own, stands in until the right one comes.
   double scale = 1;
   const wxSize size = wxSize(static_cast<int>(std::lround(bitmap.GetLogicalWidth())),
@@ -150,9 +149,11 @@ void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, c
   DrawBadges(dc, *this, wxRect(corner, shown), *thumbnail, looks.selected, looks.selectedText);
 }
 
-// A folder, or a sheet with the file's extension: what there is before, or instead of, a thumbnail.
-void ThumbnailCanvas::DrawPlaceholder(wxDC& dc, const FolderItem& item, const wxRect& square,
-                                      const wxString& mark, const Looks& looks) {
+// A folder, or the picture of the record that stands for a thumbnail, with the file's extension:
+// what there is before, or instead of, a thumbnail.
+void ThumbnailCanvas::DrawPlaceholder(wxDC& dc, size_t line, const wxRect& square, bool unreadable,
+                                      const Looks& looks) {
+  const FolderItem& item = model_.Line(line);
   if (item.folder) {
     const int side = square.width;
     const wxRect body(square.x + side / 10, square.y + side * 3 / 10, side * 8 / 10,
@@ -166,23 +167,40 @@ void ThumbnailCanvas::DrawPlaceholder(wxDC& dc, const FolderItem& item, const wx
     dc.DrawRoundedRectangle(body, std::max(side / 24.0, 1.0));
     return;
   }
-  const int height = square.height * 3 / 4, width = height * 3 / 4;
-  const wxRect sheet(square.x + (square.width - width) / 2, square.y + (square.height - height) / 2,
-                     width, height);
-  dc.SetPen(wxPen(looks.frame));
-  dc.SetBrush(wxBrush(looks.faint));
-  dc.DrawRoundedRectangle(sheet, std::max(square.width / 32.0, 1.0));
+  const bool selected = model_.Selected().IsSelected(line);
+  const wxColour& background = !selected    ? looks.background
+                               : HasFocus() ? looks.selected
+                                            : looks.resting;
+  const wxBitmap& bitmap = PlaceholderBitmap(unreadable, square.width, background);
+  if (bitmap.IsOk()) dc.DrawBitmap(bitmap, square.GetTopLeft());
   if (square.width < FromDIP(40)) return;
-  dc.SetTextForeground(mark.empty() ? looks.note : looks.fault);
-  wxRect text(sheet);
-  if (!mark.empty()) {
-    const wxFont font = dc.GetFont();
-    dc.SetFont(font.Scaled(1.8f).Bold());
-    dc.DrawLabel(mark, wxRect(sheet.x, sheet.y, sheet.width, sheet.height * 3 / 5), wxALIGN_CENTER);
-    dc.SetFont(font);
-    text = wxRect(sheet.x, sheet.y + sheet.height / 2, sheet.width, sheet.height / 2);
+  // On the sheet, or below the photograph.
+  const int top = square.height * (unreadable ? 70 : 80) / 100;
+  dc.SetTextForeground(unreadable   ? wxColour(kInkOnPaper)
+                       : !selected  ? looks.note
+                       : HasFocus() ? looks.selectedText
+                                    : looks.restingText);
+  dc.DrawLabel(Shown(UpperCase(platform::ExtensionOf(item.name))),
+               wxRect(square.x, square.y + top, square.width, square.height * 20 / 100),
+               wxALIGN_CENTER);
+}
+
+// Few are in use at a time: two kinds on three backgrounds.
+const wxBitmap& ThumbnailCanvas::PlaceholderBitmap(bool unreadable, int side,
+                                                   const wxColour& background) {
+  constexpr size_t kMost = 12;
+  for (const DrawnPlaceholder& drawn : placeholders_) {
+    if (drawn.unreadable == unreadable && drawn.side == side && drawn.background == background)
+      return drawn.bitmap;
   }
-  dc.DrawLabel(Shown(UpperCase(platform::ExtensionOf(item.name))), text, wxALIGN_CENTER);
+  if (placeholders_.size() >= kMost) placeholders_.pop_front();
+  const double scale = GetContentScaleFactor();
+  const RgbImage pixels =
+      PlaceholderPixels(unreadable, static_cast<int32_t>(std::lround(side * scale)),
+                        static_cast<Color>(background.GetRGB()));
+  placeholders_.push_back(
+      {unreadable, side, background, pixels.Empty() ? wxBitmap() : BitmapOf(pixels, scale)});
+  return placeholders_.back().bitmap;
 }
 
 wxString ThumbnailCanvas::CutName(wxDC& dc, const std::string& name, int width) {

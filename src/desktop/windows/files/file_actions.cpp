@@ -110,10 +110,10 @@ void FileActions::Do(FileOperationKind kind, const std::vector<std::string>& pat
       what,
       [kind, paths, folder,
        options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
-        return CarryOut(PlanFileOperation(kind, paths, folder, options), options, progress);
+        return CarryOut(PlanFileOperation(kind, paths, folder, options), progress);
       },
       [this](FileOperationResult result) {
-        Follow(result.done, false);
+        Took(result.done, false);
         undo_.Add(std::move(result.done));
       });
 }
@@ -123,6 +123,11 @@ void FileActions::Follow(const FileOperation& operation, bool back) {
     return;
   for (const FileStep& step : operation.steps)
     shell_.FollowRename(back ? step.to : step.from, back ? step.from : step.to);
+}
+
+void FileActions::Took(const FileOperation& operation, bool back) {
+  Follow(operation, back);
+  shell_.Uses().Note(UsesOf(operation, back));
 }
 
 bool FileActions::Trash(const std::vector<std::string>& paths) {
@@ -161,7 +166,7 @@ bool FileActions::Delete(const std::vector<std::string>& paths) {
   Run(
       Tr("Permanent deletion"),
       [paths](const FileOperationProgress& progress) { return DeleteForGood(paths, progress); },
-      [](FileOperationResult) {});
+      [this](FileOperationResult result) { Took(result.done, false); });
   return true;
 }
 
@@ -194,15 +199,10 @@ void FileActions::RenameAll(std::vector<FileStep> steps) {
   const bool one = operation.steps.size() == 1;
   Run(
       Tr("Rename"),
-      [operation, options = FileOperationOptionsFromSettings()](
-          const FileOperationProgress& progress) { return CarryOut(operation, options, progress); },
+      [operation](const FileOperationProgress& progress) { return CarryOut(operation, progress); },
       [this, one, shown](FileOperationResult result) {
         const bool done = !result.done.steps.empty();
-        for (const FileStep& step : result.done.steps) {
-          shell_.Uses().Note(
-              {FileUse{step.from, FileFunction::MoveAndCopy, kOwnTime, kOwnTime, true}});
-        }
-        Follow(result.done, false);
+        Took(result.done, false);
         undo_.Add(std::move(result.done));
         if (BrowserPage* browser = shell_.Tabs().Front(); one && done && browser != nullptr)
           browser->Open(browser->Model().Folder(), shown);
@@ -234,6 +234,7 @@ bool FileActions::SaveTurned(const std::string& path, Orientation turn, Turned t
       [this, then = std::move(then)](FileOperationResult result) {
         const bool done = !result.done.steps.empty();
         const std::string note = result.note;
+        Took(result.done, false);
         undo_.Add(std::move(result.done));
         then(done, note);
       });
@@ -247,10 +248,9 @@ void FileActions::Undo() {
   const FileOperation operation = undo_.PopUndo();
   Run(
       Tr("Undo %1", FileOperationName(operation)),
-      [operation, options = FileOperationOptionsFromSettings()](
-          const FileOperationProgress& progress) { return Revert(operation, options, progress); },
+      [operation](const FileOperationProgress& progress) { return Revert(operation, progress); },
       [this](FileOperationResult result) {
-        Follow(result.done, true);
+        Took(result.done, true);
         undo_.Undone(std::move(result.done));
       });
 }
@@ -260,10 +260,9 @@ void FileActions::Redo() {
   const FileOperation operation = undo_.PopRedo();
   Run(
       Tr("Redo %1", FileOperationName(operation)),
-      [operation, options = FileOperationOptionsFromSettings()](
-          const FileOperationProgress& progress) { return CarryOut(operation, options, progress); },
+      [operation](const FileOperationProgress& progress) { return CarryOut(operation, progress); },
       [this](FileOperationResult result) {
-        Follow(result.done, false);
+        Took(result.done, false);
         undo_.Redone(std::move(result.done));
       });
 }
@@ -282,6 +281,7 @@ void FileActions::ToClipboard(const std::vector<std::string>& paths, bool cut) {
   both->Add(marked);
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(both)) return wxBell();
+  if (!cut) shell_.Uses().NoteAll(paths, FileFunction::CopyToClipboard);
   shell_.Report(cut ? TrGroupedCount("%1 file cut.", "%1 files cut.", paths.size())
                     : TrGroupedCount("%1 file copied.", "%1 files copied.", paths.size()));
 }

@@ -68,6 +68,8 @@ class FileActions : public wxEvtHandler {
   void PastePicture(const std::string& folder);
   // Windows that show a renamed or moved folder go with it.
   void Follow(const FileOperation& operation, bool back);
+  // Such windows, and the file history.
+  void Took(const FileOperation& operation, bool back);
   void ReportFailures(const std::vector<FileOperationFailure>& failures);
 
   Shell& shell_;

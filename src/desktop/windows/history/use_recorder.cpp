@@ -2,7 +2,9 @@
 
 #include <utility>
 
+#include "platform/clock.h"
 #include "settings/job_options.h"
+#include "settings/settings.h"
 
 namespace fotomill::desktop {
 
@@ -17,13 +19,30 @@ UseRecorder::UseRecorder() {
 }
 
 void UseRecorder::Note(const std::vector<FileUse>& uses) {
+  if (settings.FileHistoryEnable == 0) return;
   uses_.insert(uses_.end(), uses.begin(), uses.end());
   if (!uses.empty()) timer_.StartOnce(kWriteMs);
 }
 
+void UseRecorder::NoteAll(const std::vector<std::string>& paths, FileFunction function) {
+  std::vector<FileUse> uses;
+  for (const std::string& path : paths) {
+    uses.push_back(
+        {.path = path, .function = function, .accessed = static_cast<int32_t>(platform::Now())});
+  }
+  Note(uses);
+}
+
+// What was taken down waits while the history is off, since the user may change his mind before the
+// program ends.
 void UseRecorder::Flush() {
-  if (!uses_.empty())
+  if (!uses_.empty() && settings.FileHistoryEnable != 0)
     (void)UpdateFileHistory(HistoryOptionsFromSettings(), std::exchange(uses_, {}));
+}
+
+void UseRecorder::End() {
+  Flush();
+  if (settings.FileHistoryEnable == 0) (void)UpdateFileHistory(HistoryOptionsFromSettings(), {});
 }
 
 }  // namespace fotomill::desktop

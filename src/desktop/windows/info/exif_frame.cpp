@@ -11,7 +11,9 @@
 
 #include "core/text.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/info/text_actions.h"
+#include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/bitmaps.h"
 #include "desktop/windows/widgets/button_row.h"
 #include "desktop/windows/widgets/looks.h"
@@ -19,15 +21,16 @@
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "settings/job_options.h"
-#include "texts/status_text.h"
 #include "texts/grouped_count.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
 
-ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
+ExifFrame::ExifFrame(Shell& shell, wxWindow* parent, const std::string& path)
     : wxFrame(parent, wxID_ANY, "EXIF: " + Shown(platform::FileNameOf(path)), wxDefaultPosition,
               wxDefaultSize, wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT, "ExifBox"),
+      shell_(shell),
       path_(path) {
   const int gap = FromDIP(10);
   auto* panel = new wxPanel(this);
@@ -83,6 +86,7 @@ ExifFrame::ExifFrame(wxWindow* parent, const std::string& path)
 }
 
 void ExifFrame::Finished() {
+  if (!report_.rows.empty()) shell_.Uses().NoteAll({path_}, FileFunction::GetInfo);
   problem_->SetLabel(Shown(report_.problem));
   problem_->Show(!report_.problem.empty());
   for (const ExifRow& row : report_.rows) {

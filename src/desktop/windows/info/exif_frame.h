@@ -13,16 +13,19 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
+class Shell;
+
 // The EXIF viewer: the lines of the walk as a list, and the thumbnail that the block holds.
 class ExifFrame : public wxFrame {
  public:
-  ExifFrame(wxWindow* parent, const std::string& path);
+  ExifFrame(Shell& shell, wxWindow* parent, const std::string& path);
 
  private:
   void Finished();
   void SaveThumbnail();
   wxString SelectedValue() const;
 
+  Shell& shell_;
   const std::string path_;
   ExifReport report_;
   wxStaticText* problem_ = nullptr;

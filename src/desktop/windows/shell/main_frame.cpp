@@ -117,7 +117,7 @@ void MainFrame::OnClose(wxCloseEvent& event) {
   folders_->KeepWidth();
   (void)session_->Keep(settings.RememberOpenWindows != 0);
   (void)SaveConfiguration();
-  uses_->Flush();
+  uses_->End();
   event.Skip();
 }
 

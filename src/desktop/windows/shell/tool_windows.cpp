@@ -27,7 +27,7 @@ void ShowInfo(Shell& shell) {
 
 void ShowExif(Shell& shell) {
   const std::vector<std::string> files = shell.Tabs().SelectedFiles();
-  if (!files.empty()) (new ExifFrame(&shell.Window(), files.front()))->Show();
+  if (!files.empty()) (new ExifFrame(shell, &shell.Window(), files.front()))->Show();
 }
 
 void ShowFileHistory(Shell& shell) {

@@ -438,6 +438,7 @@ void ViewFrame::CopyPicture() {
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(new wxBitmapDataObject(BitmapOf(pixels))))
     return wxBell();
+  shell_.Uses().NoteAll({shown->request.path}, FileFunction::CopyToClipboard);
   SetStatusText(Label("The picture was copied to the clipboard."));
 }
 

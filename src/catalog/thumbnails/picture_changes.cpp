@@ -1,0 +1,87 @@
+#include "catalog/thumbnails/picture_changes.h"
+
+#include <map>
+#include <vector>
+
+#include "catalog/thumbnails/thumbnail_database.h"
+#include "catalog/thumbnails/thumbnail_file.h"
+#include "catalog/thumbnails/thumbnail_store.h"
+#include "core/data_folder.h"
+#include "platform/files.h"
+#include "platform/paths.h"
+#include "registry/registry.h"
+
+namespace fotomill {
+
+namespace {
+
+// What is to be marked in one database.
+struct Marks {
+  std::vector<std::string> paths, folders;
+};
+
+// Whether what had a path may have been a folder. One that is gone cannot be asked; pictures have
+// names of pictures.
+bool MayHaveBeenFolder(const PictureChange& change) {
+  if (!change.to.empty()) return platform::IsFolder(change.to);
+  return platform::FactsOf(change.path).kind == platform::FileKind::Missing &&
+         FindFormatByName(change.path) == kNoFormat;
+}
+
+// Whether a path is that of a thumbnail file rather than of something that merely has its name.
+bool IsThumbnailFile(const std::string& path) {
+  ThumbnailRecord record;
+  return !platform::FactsOf(path).link && ReadThumbnailFile(record, path);
+}
+
+void DeleteIfThumbnailFile(const std::string& path) {
+  if (IsThumbnailFile(path)) (void)platform::DeleteFile(path);
+}
+
+}  // namespace
+
+void MarkChangedRecords(std::span<const PictureChange> changes) {
+  std::map<std::string, Marks> marks;
+  const std::string global = ThumbnailDatabasePath({});
+  const auto markFile = [&](const std::string& path) {
+    marks[global].paths.push_back(path);
+    marks[ThumbnailDatabasePath(std::string(platform::FolderOf(path)))].paths.push_back(path);
+  };
+  for (const PictureChange& change : changes) {
+    const bool folder = MayHaveBeenFolder(change);
+    if (folder) marks[global].folders.push_back(change.path);
+    if (folder && !change.to.empty()) {  // its own database went with it
+      marks[ThumbnailDatabasePath(change.to)].folders.push_back(change.path);
+      continue;
+    }
+    markFile(change.path);
+    if (!change.to.empty()) markFile(change.to);
+  }
+  marks.erase(std::string());  // there is no data folder
+  for (const auto& [database, marked] : marks)
+    (void)SharedThumbnailStore().Delete(database, marked.paths, marked.folders);
+}
+
+void FollowThumbnailFile(const std::string& from, const std::string& to) {
+  const std::string old = ThumbnailPathFor(from), wanted = ThumbnailPathFor(to);
+  if (old == wanted || platform::IsFolder(to)) return;
+  const bool follows = IsThumbnailFile(old);
+  if (!follows) return DeleteMisleadingThumbnailFile(to);
+  if (platform::RenameFile(old, wanted, platform::Existing::Refuse) == platform::CommitResult::Done)
+    return;
+  // Of two that could be meant, neither is known to be the right one.
+  (void)platform::DeleteFile(old);
+  DeleteMisleadingThumbnailFile(to);
+}
+
+void DeleteThumbnailFile(const std::string& path) { DeleteIfThumbnailFile(ThumbnailPathFor(path)); }
+
+void DeleteMisleadingThumbnailFile(const std::string& path) {
+  const std::string file = ThumbnailPathFor(path);
+  const platform::FileFacts facts = platform::FactsOf(file), picture = platform::FactsOf(path);
+  if (facts.kind == platform::FileKind::Regular && picture.kind == platform::FileKind::Regular &&
+      facts.modified >= picture.modified)
+    DeleteIfThumbnailFile(file);
+}
+
+}  // namespace fotomill
