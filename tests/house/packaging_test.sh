@@ -43,6 +43,7 @@ Expect "build/ is left out" "no" \
 find "$work/two/t" -exec touch -h -d 2001-01-01 {} +
 for name in one two; do ArchiveTree "$work/$name" t "$work/$name.tar.xz"; done
 Expect "the same bytes" "same" "$(cmp "$work/one.tar.xz" "$work/two.tar.xz" && echo same)"
+Expect "in order" "" "$(tar -tf "$work/one.tar.xz" | LC_ALL=C sort -c 2>&1)"
 Expect "its date" "*2023-11-14 *t/CMakeLists.txt*" "$(TZ=UTC tar -tvf "$work/one.tar.xz")"
 
 # Every obstacle is reported, and nothing is created.
