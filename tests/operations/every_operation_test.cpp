@@ -196,8 +196,9 @@ TEST(EveryOperation, ComputesTilesLikeTheWhole) {
 TEST(Engine, FusesPointOperationsExactly) {
   const PicturePointer fused = TestPicture(64, 40, 24, false),
                        apart = TestPicture(64, 40, 24, false);
-  const Recipe recipe = Read("brightness 12; gamma 1.7; temperature 40; saturation 150; tint red; gray; "
-                             "contrast -20; invert; channels swap=red-blue; solarize 90; sepia");
+  const Recipe recipe =
+      Read("brightness 12; gamma 1.7; temperature 40; saturation 150; tint red; gray; "
+           "contrast -20; invert; channels swap=red-blue; solarize 90; sepia");
   ASSERT_EQ(ApplySteps(*fused, recipe.common, kSerial), Status::Ok);
   for (const Step& step : recipe.common)
     ASSERT_EQ(ApplySteps(*apart, std::span(&step, 1), kSerial), Status::Ok);

@@ -389,6 +389,15 @@ TEST(Scale, IsTheSameOnEveryProcessor) {
   }
 }
 
+TEST(Scale, SharpensFromTheThresholdOn) {
+  constexpr int16_t kLevel = 100 << kFraction, kWhite = 255 << kFraction;
+  const uint8_t levels[] = {100, 100, 100, 100, 255, 0};
+  std::vector<int16_t> samples{kLevel - 90, kLevel - 89, kLevel + 90,
+                               kLevel + 89, kWhite - 95, 95};
+  ResampleKernelsHere().sharpen(levels, 6, 2 << kSharpenBits, 90, samples.data());
+  EXPECT_EQ(samples, (std::vector<int16_t>{kLevel + 180, kLevel, kLevel - 180, kLevel, kWhite, 0}));
+}
+
 TEST(Scale, LackOfMemoryLeavesThePictureValid) {
   for (const bool alpha : {false, true}) {
     for (const ScaleFilter filter : kFilters) {

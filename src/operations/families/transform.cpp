@@ -118,8 +118,9 @@ bool IsKept(const Arguments& arguments, Size picture, Size scaled) {
   return arguments.Choice<Only>("only") == Only::Shrink ? grows : shrinks;
 }
 
-// A picture reduced to half or less may be decoded smaller: smooth filters give the same result
-// within a few levels. But nearest and box pick whole pixels, and in linear light sums differ.
+// A picture may be decoded at a reduced size that is still twice the result's: smooth filters give
+// nearly the same result. Nearest and box select whole pixels, and light adds up differently than
+// levels.
 int32_t ResizeSide(const Arguments& arguments, Size whole, const PictureMetadata& metadata) {
   const ScaleFilter filter = kFilters[arguments.Choice("filter")];
   if (arguments.Flag("linear") || filter == ScaleFilter::Nearest || filter == ScaleFilter::Box)
@@ -129,7 +130,7 @@ int32_t ResizeSide(const Arguments& arguments, Size whole, const PictureMetadata
   if (IsKept(arguments, whole, scaled)) return 0;
   const double factor = std::max(static_cast<double>(scaled.width) / whole.width,
                                  static_cast<double>(scaled.height) / whole.height);
-  return factor > 0.5 ? 0 : Whole(std::ceil(factor * std::max(whole.width, whole.height)));
+  return Whole(std::ceil(factor * std::max(whole.width, whole.height)));
 }
 
 Status Resize(PictureRecord& picture, const Arguments& arguments, const OperationContext& context) {
