@@ -1,9 +1,11 @@
 #!/usr/bin/env python3
 """What the real program keeps of files beside the files: database records, thumbnail files, the
 file history, the answers to its offers."""
+import os
 import struct
+import subprocess
 
-from driven_desktop import Desktop, make_pictures, run
+from driven_desktop import PROJECT, Desktop, make_pictures, run
 
 RECORD, HEADER = 28442, 60
 GLOBAL = "DefaultThumbnailMode=2"
@@ -92,6 +94,25 @@ def records_and_history_follow_files(folder):
         assert history(desktop) == {"b.bmp": 12, "c.bmp": 11, "z.bmp": 11}, history(desktop)
 
 
+def exif_window_is_recorded(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.jpg"])
+    program = os.environ.get("FOTOMILL", str(PROJECT / "build/release/fotomill"))
+    subprocess.run([program, "exif", "set", "--in-place", "--no-history", str(pictures / "b.jpg"),
+                    "Artist=me"], check=True, stdout=subprocess.DEVNULL)
+    with Desktop(folder, pictures, settings=["UpdateThumbnailsFlag=0"]) as desktop:
+        desktop.wait(r"lines=2 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "Right")
+        desktop.wait(r"focus=b.jpg")
+        desktop.key("alt+shift+Return")
+        desktop.wait(r"exif rows=")
+        desktop.focus("^EXIF: b.jpg$")
+        desktop.key("Escape")
+        quit_program(desktop)
+        assert history(desktop) == {"b.jpg": 10}, history(desktop)
+
+
 def history_switched_off(folder):
     pictures = folder / "pictures"
     make_pictures(pictures, ["a.bmp"])
@@ -174,5 +195,5 @@ def folders_without_pictures(folder):
         assert (pictures / "new.THN").exists(), "30 days are not over"
 
 
-run(records_and_history_follow_files, history_switched_off, thumbnail_files_follow,
-    answer_for_this_tab, folders_without_pictures)
+run(records_and_history_follow_files, exif_window_is_recorded, history_switched_off,
+    thumbnail_files_follow, answer_for_this_tab, folders_without_pictures)
