@@ -231,8 +231,7 @@ ThumbnailDatabase::Opened ThumbnailDatabase::OpenFile(const std::string& path, b
 
 void ThumbnailDatabase::CloseThumbnailDatabase() {
   // Only of a file that is still as the index knows it.
-  const bool worthSaving =
-      file_.IsOpen() && !readOnly_ && indexed_.count >= kLargeIndex && indexed_ != saved_;
+  const bool worthSaving = file_.IsOpen() && indexed_.count >= kLargeIndex && indexed_ != saved_;
   if (worthSaving && indexed_.size == file_.Size() && indexed_.modified == file_.Modified() &&
       file_.IsStill(path_)) {
     index_.Save(IndexPath(path_), indexed_);
