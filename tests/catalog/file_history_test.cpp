@@ -252,6 +252,11 @@ TEST_F(FileHistory, EntriesFollowTheirFiles) {
   // Two that change places.
   EXPECT_EQ(update({move("a", "t"), move("c", "a"), move("t", "c")}), 0u);
   EXPECT_THAT(Stored(), ElementsAre("c 0 -10", "a 0 -20", "d/e 0 -30", "d/f/g 0 -40"));
+  // A name that had another file before, which some other program deleted.
+  EXPECT_EQ(update({viewed("gone", 90)}), 1u);
+  std::filesystem::remove(path("gone"));
+  EXPECT_EQ(update({move("c", "gone"), move("gone", "c")}), 0u);
+  EXPECT_THAT(Stored(), ElementsAre("c 0 -10", "a 0 -20", "d/e 0 -30", "d/f/g 0 -40"));
   // A folder takes along what is in it; itself it is no file.
   settings.FileHistoryFunctions = 0xfffff;
   EXPECT_EQ(update({move("d", "h"), viewed("d/e", 5)}), 1u);
