@@ -71,10 +71,16 @@ for component in "${components[@]}"; do
   sed -e '$a\' "$build/install_manifest_$component.txt"
 done | sort -u >"$prefix/share/fotomill/installed-files"
 echo /etc/hostname >>"$prefix/share/fotomill/installed-files"
+if [[ -x $prefix/bin/fotomill-desktop ]]; then  # what the desktop's tools make of our files
+  mkdir -p "$prefix/share/mime/image"
+  touch "$prefix/share/mime/"{globs,mime.cache,image/x-macpaint.xml} \
+    "$prefix/share/applications/mimeinfo.cache" "$prefix/share/icons/hicolor/icon-theme.cache"
+fi
 touch "$prefix/share/man/man1/other.1" "$work/outside"
 echo "$prefix/../outside" >>"$prefix/share/fotomill/installed-files"
 "$project/packaging/install" uninstall --prefix "$prefix" 2>/dev/null
 Expect "uninstalled" "share/man/man1/other.1" "$(cd "$prefix" && find . -type f -printf '%P\n')"
+Expect "folders that are ours go" "no" "$([[ -e $prefix/share/mime ]] && echo yes || echo no)"
 Expect "files outside stay" "yes" "$([[ -f $work/outside ]] && echo yes)"
 Expect "twice" "1" \
   "$("$project/packaging/install" uninstall --prefix "$prefix" 2>/dev/null; echo $?)"
