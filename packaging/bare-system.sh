@@ -1,8 +1,8 @@
-# A bare Debian in a folder, for try-release and deb/try: made once by debootstrap in build/releases/RELEASE/bare, copied to
-# `used` for each run, and entered by chroot. Sourced by root's bash with `root` and `release` set, after prepare.sh.
+# A bare Debian in a chroot, for try-release and deb/try: created once by debootstrap in build/releases/RELEASE/bare, and
+# copied to `used` for each run. Source it in bash as root with `root` and `release` set, after prepare.sh.
 #
-# MIRROR names another place to get the system from than the one in this system's apt sources. Packages that a run fetches
-# are kept for the next. With `cache` set, what is compiled inside is kept in that folder (ccache).
+# MIRROR overrides the Debian mirror from this system's apt sources. Downloaded packages are kept for the next run. `cache`
+# is a ccache folder for compiling in the chroot, optional.
 
 ((EUID == 0)) || Fail "a system in a folder is made and entered by root only"
 folder=$root/build/releases/$release
@@ -25,7 +25,7 @@ MakeBare() {
   mv "$bare.new" "$bare"
 }
 
-# A new copy of the bare system, which is made first if needed. One run at a time.
+# Makes a fresh copy of the bare system, creating that first if needed. One run at a time.
 FreshCopy() {
   EnsurePackages release
   mkdir -p "$packages"
@@ -37,14 +37,14 @@ FreshCopy() {
   cp "$(readlink -f /etc/resolv.conf)" "$used/etc/resolv.conf"
 }
 
-# The same with this tree in /tree: what git knows, with the changes that are not committed.
+# The same with this tree in /tree: files tracked by git, including uncommitted changes.
 FreshCopyWithTree() {
   FreshCopy
   mkdir "$used/tree"
   CopyTree "$root" "$used/tree"
 }
 
-# Inside COMMAND: runs it in the tree, or in / without one; the mounts go when it ends.
+# Inside COMMAND: runs it in the chroot, in /tree if it exists, else in /; unmounts everything afterwards.
 Inside() {
   # shellcheck disable=SC2016
   unshare --mount --pid --fork --kill-child bash -c '
@@ -55,7 +55,7 @@ Inside() {
       bash -c "[ ! -d /tree ] || cd /tree; $3"' inside "$used" "$packages" "$1" "$cache"
 }
 
-# Timed WANTED COMMAND: says how long it took; fails when it does not end with the status WANTED.
+# Timed WANTED COMMAND: prints the elapsed time; fails if the exit status is not WANTED.
 Timed() {
   local begin=$SECONDS status
   Inside "$2"

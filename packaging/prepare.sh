@@ -1,5 +1,5 @@
-# Installs the packages of packages.txt and builds presets, for ./fotomill, ./check and fuzz/run. Sourced by bash with
-# `root` set to the project's folder. Everything said goes to standard error; logs lie in build/.
+# Installs the packages of packages.txt and builds presets, for ./fotomill, ./check and fuzz/run. Source it in bash with
+# `root` set to the project folder. Messages go to standard error, logs to build/.
 
 Say() { printf '%s: %s\n' "${0##*/}" "$*" >&2; }
 Fail() {
@@ -7,10 +7,10 @@ Fail() {
   exit 1
 }
 
-# As CMake knows it.
+# The version from CMakeLists.txt.
 ProjectVersion() { sed -nE 's/^project\(fotomill VERSION ([0-9.]+).*/\1/p' "$root/CMakeLists.txt"; }
 
-# CopyTree FROM TO: the files that git knows, with the changes that are not committed; without git, all but build/.
+# CopyTree FROM TO: copies files tracked by git, including uncommitted changes; without git, everything but build/.
 CopyTree() {
   if git -C "$1" rev-parse --is-inside-work-tree >/dev/null 2>&1; then
     git -C "$1" ls-files -z --cached --others --exclude-standard |
@@ -20,13 +20,13 @@ CopyTree() {
   fi | tar -C "$1" --null -T - -cf - | tar -C "$2" --no-same-owner -xf -
 }
 
-# ArchiveTree FOLDER NAME FILE: FOLDER/NAME as an archive whose bytes depend on the files alone, dated SOURCE_DATE_EPOCH.
+# ArchiveTree FOLDER NAME FILE: packs FOLDER/NAME into a reproducible archive, dated SOURCE_DATE_EPOCH.
 ArchiveTree() {
   tar -C "$1" --sort=name --mtime="@$SOURCE_DATE_EPOCH" --owner=0 --group=0 --numeric-owner --mode=u+rw,go=u-w \
     --format=gnu -cf - "$2" | xz -6 -T1 >"$3"
 }
 
-# The packages of the given groups, one a line; alternatives as a|b.
+# Prints the packages of the given groups, one per line; alternatives as a|b.
 PackagesOf() {
   local line group='' wanted=" $* "
   while read -r line || [[ -n $line ]]; do
@@ -40,7 +40,7 @@ PackagesOf() {
   done <"$root/packages.txt"
 }
 
-# Of alternatives, one is enough.
+# Prints missing packages of the given groups; of alternatives, one is enough.
 MissingPackages() {
   local line installed
   local -a lines names
@@ -52,7 +52,7 @@ MissingPackages() {
   done
 }
 
-# Installs what is missing of the given groups. With nothing missing it only asks dpkg.
+# Installs the missing packages of the given groups. If there are none, it only calls dpkg-query.
 EnsurePackages() {
   local -a missing apt
   local wanted
@@ -65,7 +65,7 @@ EnsurePackages() {
   printf -v wanted '%s, ' "${missing[@]//|/ | }"
   wanted=${wanted%, }
 
-  # dpkg wants the folders of the system's own programs, which a plain `su` leaves out of the path.
+  # dpkg needs the sbin folders, which a plain `su` leaves out of PATH.
   apt=(env "PATH=$PATH:/usr/local/sbin:/usr/sbin:/sbin" DEBIAN_FRONTEND=noninteractive
        apt-get -qq -y -o DPkg::Lock::Timeout=300 -o Dpkg::Use-Pty=0)
   if ((EUID != 0)); then
@@ -75,7 +75,7 @@ EnsurePackages() {
   fi
   Say "installing ${missing[*]}"
   mkdir -p "$root/build"
-  # The lists that are there usually do; only when they do not are they fetched anew.
+  # Try the existing package lists first; update them only if that fails.
   if ! "${apt[@]}" satisfy --no-install-recommends "$wanted" >"$root/build/packages.log" 2>&1; then
     "${apt[@]}" update >>"$root/build/packages.log" 2>&1 &&
       "${apt[@]}" satisfy --no-install-recommends "$wanted" >>"$root/build/packages.log" 2>&1 || {
@@ -87,7 +87,7 @@ EnsurePackages() {
   packagesChanged=1
 }
 
-# One build at a time in this tree, held until the script ends or ReleaseBuildLock.
+# Allows only one build at a time in this tree, until the script ends or ReleaseBuildLock is called.
 TakeBuildLock() {
   mkdir -p "$root/build" 2>/dev/null && exec 9>"$root/build/.lock" || Fail "cannot write to $root/build"
   flock -n 9 || {
@@ -97,8 +97,8 @@ TakeBuildLock() {
 }
 ReleaseBuildLock() { exec 9>&-; }
 
-# Configure PRESET TARGET: only when it has never been done, packages came in, or the build does not know the target. A tree
-# that was moved or copied is configured afresh.
+# Configure PRESET TARGET: skipped if the build already has the target and no packages were installed. A moved or copied
+# tree is configured from scratch.
 Configure() {
   local folder=$root/build/$1 cache=$root/build/$1/CMakeCache.txt
   local -a fresh=()
@@ -114,14 +114,14 @@ Configure() {
   }
 }
 
-# What is compiled is kept in ccache's own folder or CCACHE_DIR; in build/ where that folder cannot be written.
+# Uses ccache's default folder or CCACHE_DIR; if that is not writable, build/ccache.
 ChooseCache() {
   local folder
   [[ -z ${CCACHE_DIR:-} ]] && folder=$(ccache --get-config cache_dir 2>/dev/null) || return 0
   mkdir -p "$folder" 2>/dev/null && [[ -w $folder ]] || export CCACHE_DIR=$root/build/ccache
 }
 
-# Build PRESET [TARGET...]: the errors are shown, the rest is in the preset's build.log; a terminal sees how far it is.
+# Build PRESET [TARGET...]: shows errors; the full output is in the preset's build.log. Shows progress on a terminal.
 Build() {
   local folder=$root/build/$1 line
   ChooseCache
