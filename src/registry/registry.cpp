@@ -127,7 +127,7 @@ std::string DescribeFileType(std::string_view fileName) {
 }
 
 std::vector<FilterPair> OpenFileFilter() {
-  std::vector<FilterPair> pairs(1, {"All pictures", ""});
+  std::vector<FilterPair> pairs(1, {TrLater("All pictures"), ""});
   for (const FormatEntry& row : Table()) {
     if ((row.flags & (FMT_WALLPAPER | FMT_CLIPBOARD | FMT_NO_OPEN | FMT_SPARE)) != 0) continue;
     const std::string pattern = "*." + std::string(row.extension.view());
@@ -154,8 +154,10 @@ std::vector<int32_t> DestinationRows() {
 
 std::vector<std::string> DestinationExtensions() {
   std::vector<std::string> extensions;
-  for (const int32_t index : DestinationRows())
-    extensions.push_back(LowerCase(FormatRow(index).extension.view()));
+  for (const int32_t index : DestinationRows()) {
+    if (CanWrite(FormatRow(index)))
+      extensions.push_back(LowerCase(FormatRow(index).extension.view()));
+  }
   for (const PluginFormatFacts& format : PluginFormats()) {
     if (format.canWrite) extensions.push_back(LowerCase(format.extension));
   }

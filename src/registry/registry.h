@@ -109,10 +109,10 @@ struct FilterPair {
 // All pictures first, then one pair per readable
 // row, in row order, then the plug-in formats.
 std::vector<FilterPair> OpenFileFilter();
-// Indices of the rows offered for saving, in row order.
+// Indices of the rows of the destination list, in row order. Some builds cannot write all of them.
 std::vector<int32_t> DestinationRows();
-// As DestinationRows, as lowercase extensions,
-// followed by those of writable plug-in formats.
+// Those of them that this build writes, as lowercase extensions, followed by those of writable
+// plug-in formats.
 std::vector<std::string> DestinationExtensions();
 // Indices of the rows in the format list, where the user switches formats on and off.
 std::vector<int32_t> FormatListRows();

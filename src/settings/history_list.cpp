@@ -26,9 +26,10 @@ struct ListFile {
 
 // In the order of HistoryList.
 constexpr ListFile kLists[] = {
-    {"FMWMoveCopyHistory.txt", &Settings::CopyHistoryMax},   {"FMWDestinationHistory.txt", &Settings::DestHistoryMax},
-    {"FMWArchiveHistory.txt", &Settings::ArchiveHistoryMax}, {"FMWPicturesearchHistory.txt", &Settings::PictureSearchHistoryMax},
-    {"FMWTabHistory.txt", &Settings::TabHistoryMax},         {"FMWRenameHistory.txt", &Settings::EditListMaximum},
+    {"FMWMoveCopyHistory.txt", &Settings::CopyHistoryMax},
+    {"FMWDestinationHistory.txt", &Settings::DestHistoryMax},
+    {"FMWTabHistory.txt", &Settings::TabHistoryMax},
+    {"FMWRenameHistory.txt", &Settings::EditListMaximum},
 };
 constexpr ListFile kRecentFiles{"FileMenuHistory.txt", &Settings::RecentFilesMaximum};
 
@@ -50,16 +51,32 @@ std::string_view TakeLine(std::string_view& text) {
   return line;
 }
 
+bool IsReserved(std::string_view entry) { return entry == kDefaultEntry; }
+bool IsReserved(const RecentFile& file) { return IsReserved(file.path); }
+
+// Drops the last entries beyond `most`; the reserved one is not counted and stays.
+template <typename Entry>
+void Limit(std::vector<Entry>& entries, size_t most) {
+  std::vector<Entry> kept;
+  size_t counted = 0;
+  for (Entry& entry : entries) {
+    if (IsReserved(entry) || ++counted <= most) kept.push_back(std::move(entry));
+  }
+  entries = std::move(kept);
+}
+
 // Collects the parsed lines without duplicates; the first one wins.
 template <typename Entry, typename Parse, typename Same>
 std::vector<Entry> ParseLines(std::string_view text, size_t most, Parse parse, Same same) {
   std::vector<Entry> entries;
-  while (!text.empty() && entries.size() < most) {
+  size_t counted = 0;
+  while (!text.empty()) {
     const std::optional<Entry> entry = parse(TakeLine(text));
-    if (!entry ||
+    if (!entry || (counted >= most && !IsReserved(*entry)) ||
         std::ranges::any_of(entries, [&](const Entry& other) { return same(other, *entry); }))
       continue;
     entries.push_back(*entry);
+    counted += !IsReserved(*entry);
   }
   return entries;
 }
@@ -106,7 +123,7 @@ template <typename Entry, typename Same>
 void PutFirst(std::vector<Entry>& entries, const Entry& entry, size_t most, Same same) {
   std::erase_if(entries, [&](const Entry& other) { return same(other, entry); });
   entries.insert(entries.begin(), entry);
-  entries.resize(std::min(entries.size(), most));
+  Limit(entries, most);
 }
 
 }  // namespace
@@ -131,6 +148,20 @@ bool AddToHistoryList(HistoryList list, std::string_view entry) {
     PutFirst(entries, std::string(entry), most, std::equal_to<std::string>());
     text = TextOf(entries);
   });
+}
+
+std::vector<std::string> OfferedEntries(HistoryList list, std::string_view builtIn) {
+  std::vector<std::string> entries = LoadHistoryList(list);
+  if (std::ranges::find(entries, kDefaultEntry) == entries.end())
+    entries.emplace_back(kDefaultEntry);
+  std::erase(entries, builtIn);  // it is offered once, where the reserved entry is
+  std::ranges::replace(entries, std::string(kDefaultEntry), std::string(builtIn));
+  std::erase(entries, "");
+  return entries;
+}
+
+bool AddChoice(HistoryList list, std::string_view entry, std::string_view builtIn) {
+  return AddToHistoryList(list, entry == builtIn ? kDefaultEntry : entry);
 }
 
 bool RemoveFromHistoryList(HistoryList list, std::string_view entry) {

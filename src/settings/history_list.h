@@ -11,26 +11,29 @@ namespace fotomill {
 // line. A key limits the length of each. Changes are merged with those of other processes and
 // written atomically.
 
-// The entry, also used as the value of several text keys, for the built-in choice.
+// The entry, also used as the value of several text keys, for the built-in choice. It does not
+// count toward the length of a list and is never pushed out.
 inline constexpr std::string_view kDefaultEntry = "~~~DEFAULT~~~";
 
 // Each list with its file, the key for its length, and its contents.
 enum class HistoryList {
   // "FMWMoveCopyHistory.txt", CopyHistoryMax: destinations of moved or copied files
   MoveCopy,
-  Destination,    // "FMWDestinationHistory.txt", DestHistoryMax: output folders
-  // "FMWArchiveHistory.txt", ArchiveHistoryMax: folders that archives were extracted to
-  Archive,
-  PictureSearch,  // "FMWPicturesearchHistory.txt", PictureSearchHistoryMax: search terms
-  Tabs,           // "FMWTabHistory.txt", TabHistoryMax: folders of closed tabs
-  RenameBases,    // "FMWRenameHistory.txt", EditListMaximum: base names of sequential renaming
+  Destination,  // "FMWDestinationHistory.txt", DestHistoryMax: output folders
+  Tabs,         // "FMWTabHistory.txt", TabHistoryMax: folders of closed tabs
+  RenameBases,  // "FMWRenameHistory.txt", EditListMaximum: base names of sequential renaming
 };
 
 // The valid entries. Empty if the list is missing or cannot be read.
 std::vector<std::string> LoadHistoryList(HistoryList list);
+// The entries to offer, with `builtIn` in place of kDefaultEntry, or last if the list does not have
+// it. An empty `builtIn` is not offered.
+std::vector<std::string> OfferedEntries(HistoryList list, std::string_view builtIn);
 // Moves or adds an entry to the top. False if it cannot be stored in a line (it is empty, over 260
 // bytes or contains a line break or NUL) or the list cannot be written; the list is then unchanged.
 [[nodiscard]] bool AddToHistoryList(HistoryList list, std::string_view entry);
+// The same for a choice from OfferedEntries: `builtIn` is stored as kDefaultEntry.
+[[nodiscard]] bool AddChoice(HistoryList list, std::string_view entry, std::string_view builtIn);
 // Removes an entry; also true if it was not listed.
 [[nodiscard]] bool RemoveFromHistoryList(HistoryList list, std::string_view entry);
 [[nodiscard]] bool ClearHistoryList(HistoryList list);  // false if the list cannot be written

@@ -2,12 +2,14 @@
 
 #include <algorithm>
 
+#include "core/data_folder.h"
 #include "core/text.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/output_file.h"
 #include "platform/paths.h"
 #include "settings/configuration.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -80,6 +82,23 @@ CarryOver CarryOverDataFolder(const std::string& previous, const std::string& cu
           result);
   }
   return result;
+}
+
+std::optional<CarryOver> CarryOverAtFirstStart() {
+  const std::string current = ConfigurationPath();
+  if (current.empty() || platform::FileExists(current) ||
+      !platform::IsRegularFile(platform::JoinFolder(DataFolder(), kPreviousConfigurationFile)))
+    return std::nullopt;
+  return CarryOverDataFolder(DataFolder(), DataFolder());
+}
+
+std::string CarryOverText(const CarryOver& carried) {
+  if (std::ranges::find(carried.failed, kPreviousConfigurationFile) != carried.failed.end()) {
+    return Tr("The settings could not be copied from \"%1\", so the defaults apply.",
+              kPreviousConfigurationFile);
+  }
+  return Tr("First start of this version: the settings were copied from \"%1\".",
+            kPreviousConfigurationFile);
 }
 
 }  // namespace fotomill

@@ -133,6 +133,19 @@ def test_many_at_once(folder):
     check("folder", os.listdir(folder), [NAME])
 
 
+def test_previous_version(folder):
+    old = folder / "Fotomill Professional 10.ini"
+    old.write_bytes(b"[Fotomill]\r\nJpegCompression=33\r\n")
+    note = ('fotomill: First start of this version: the settings were copied from '
+            '"Fotomill Professional 10.ini".\n')
+    check("first start", run(folder, "config", "get", "JpegCompression"), (0, b"33\n", note))
+    check("copy", (folder / NAME).read_bytes(), old.read_bytes())
+    old.write_bytes(b"[Fotomill]\r\nJpegCompression=44\r\n")
+    check("second start", run(folder, "config", "get", "JpegCompression"), (0, b"33\n", ""))
+    os.remove(folder / NAME)
+    check("quiet", run(folder, "--quiet", "config", "get", "JpegCompression"), (0, b"44\n", ""))
+
+
 def test_unreadable(folder):
     os.mkdir(folder / NAME)
     status, out, error = run(folder, "config", "set", "JpegCompression", "80")

@@ -288,8 +288,10 @@ TEST(FormatsCommand, ListsTheRegistry) {
     EXPECT_EQ(row["read"].get<bool>() && row["write"].get<bool>(), !row.contains("reason")) << row;
   }
   const std::string destinations = RunCommand({"formats", "--destinations"}).out;
-  EXPECT_THAT(destinations, testing::StartsWith("bga\nbmp\ncdr\n"));
-  EXPECT_EQ(std::count(destinations.begin(), destinations.end(), '\n'), 35);
+  for (const char* written : {"bmp\n", "jpg\n", "png\n", "tif\n"})
+    EXPECT_THAT(destinations, HasSubstr(written));
+  for (const char* read : {"cdr\n", "pcd\n", "gif\n"})
+    EXPECT_THAT(destinations, testing::Not(HasSubstr(read)));
   EXPECT_THAT(RunCommand({"formats", "--filter"}).out, HasSubstr("\n(BMP) Windows bitmap\t*.BMP\n"));
 }
 

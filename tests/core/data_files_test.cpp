@@ -67,21 +67,41 @@ TEST_F(DataFilesTest, HistoryListsTheLatestFirst) {
   for (const char* entry : {"/a", "/b", "~~~DEFAULT~~~", "/b", "/c"}) {
     EXPECT_TRUE(AddToHistoryList(HistoryList::MoveCopy, entry));
   }
-  EXPECT_EQ(LoadHistoryList(HistoryList::MoveCopy), (Texts{"/c", "/b", std::string(kDefaultEntry)}));
-  EXPECT_EQ(Text("FMWMoveCopyHistory.txt"), "/c\n/b\n~~~DEFAULT~~~\n");
-  EXPECT_EQ(LoadHistoryList(HistoryList::Archive), Texts{}) << "each list has its own file";
+  EXPECT_EQ(LoadHistoryList(HistoryList::MoveCopy), (Texts{"/c", "/b", std::string(kDefaultEntry), "/a"}));
+  EXPECT_EQ(Text("FMWMoveCopyHistory.txt"), "/c\n/b\n~~~DEFAULT~~~\n/a\n");
+  EXPECT_EQ(LoadHistoryList(HistoryList::Tabs), Texts{}) << "each list has its own file";
   for (const std::string& entry : {""s, "a\nb"s, "a\r"s, "a\0b"s, std::string(261, 'x')}) {
     EXPECT_FALSE(AddToHistoryList(HistoryList::MoveCopy, entry));
   }
   EXPECT_TRUE(RemoveFromHistoryList(HistoryList::MoveCopy, "/b"));
   EXPECT_TRUE(RemoveFromHistoryList(HistoryList::MoveCopy, "/b"));
   settings.CopyHistoryMax = 1;
-  EXPECT_EQ(LoadHistoryList(HistoryList::MoveCopy), Texts{"/c"});
-  EXPECT_EQ(Text("FMWMoveCopyHistory.txt"), "/c\n~~~DEFAULT~~~\n");
+  EXPECT_EQ(LoadHistoryList(HistoryList::MoveCopy), (Texts{"/c", std::string(kDefaultEntry)}));
+  EXPECT_EQ(Text("FMWMoveCopyHistory.txt"), "/c\n~~~DEFAULT~~~\n/a\n");
   settings.CopyHistoryMax = -5;
   EXPECT_TRUE(AddToHistoryList(HistoryList::MoveCopy, "/d"));
-  EXPECT_EQ(Text("FMWMoveCopyHistory.txt"), "");
-  EXPECT_TRUE(ClearHistoryList(HistoryList::PictureSearch));
+  EXPECT_EQ(Text("FMWMoveCopyHistory.txt"), "~~~DEFAULT~~~\n");
+  EXPECT_TRUE(ClearHistoryList(HistoryList::Tabs));
+}
+
+TEST_F(DataFilesTest, DefaultEntryIsNeverPushedOutAndOfferedAsTheBuiltInChoice) {
+  settings.EditListMaximum = 2;
+  for (const char* entry : {"one", "~~~DEFAULT~~~", "two", "three", "four"})
+    EXPECT_TRUE(AddToHistoryList(HistoryList::RenameBases, entry));
+  EXPECT_EQ(Text("FMWRenameHistory.txt"), "four\nthree\n~~~DEFAULT~~~\n");
+  EXPECT_EQ(ParseHistoryList("1\n2\n3\n~~~DEFAULT~~~\n~~~DEFAULT~~~\n4\n", 2),
+            (Texts{"1", "2", std::string(kDefaultEntry)}));
+  EXPECT_EQ(ParseRecentFiles("~~~DEFAULT~~~,0\n/a,1\n/b,2\n", 1),
+            (std::vector<RecentFile>{{std::string(kDefaultEntry), 0}, {"/a", 1}}));
+
+  EXPECT_EQ(OfferedEntries(HistoryList::RenameBases, "PICTURE"),
+            (Texts{"four", "three", "PICTURE"}));
+  EXPECT_EQ(OfferedEntries(HistoryList::RenameBases, "three"), (Texts{"four", "three"}));
+  EXPECT_EQ(OfferedEntries(HistoryList::RenameBases, ""), (Texts{"four", "three"}));
+  EXPECT_EQ(OfferedEntries(HistoryList::Destination, "/here"), Texts{"/here"}) << "without a list";
+  EXPECT_TRUE(AddChoice(HistoryList::RenameBases, "PICTURE", "PICTURE"));
+  EXPECT_TRUE(AddChoice(HistoryList::RenameBases, "three", "PICTURE"));
+  EXPECT_EQ(Text("FMWRenameHistory.txt"), "three\n~~~DEFAULT~~~\nfour\n");
 }
 
 TEST_F(DataFilesTest, ReadsDamagedHistories) {
@@ -147,6 +167,29 @@ TEST_F(DataFilesTest, CarriesOverThePreviousVersionOnce) {
   EXPECT_TRUE(CarryOverDataFolder(previous, folder_.Path()).failed.empty());
   EXPECT_TRUE(CarryOverDataFolder(folder_.Path("nowhere"), folder_.Path("never")).copied.empty());
   EXPECT_FALSE(platform::FileExists(folder_.Path("never")));
+}
+
+TEST_F(DataFilesTest, FirstStartTakesThePreviousVersionsSettingsOnce) {
+  EXPECT_FALSE(CarryOverAtFirstStart()) << "no data folder";
+  ASSERT_TRUE(platform::MakeFolders(DataFolder()));
+  test::WriteText(DataFile("Fotomill.tdb"), "store");
+  EXPECT_FALSE(CarryOverAtFirstStart()) << "no older version";
+  test::WriteText(DataFile("Fotomill Professional 10.ini"), "[Fotomill]\nJpegCompression=33\n");
+  const auto carried = CarryOverAtFirstStart();
+  ASSERT_TRUE(carried);
+  EXPECT_EQ(carried->copied, Texts{"Fotomill Professional 10.ini"});
+  EXPECT_EQ(CarryOverText(*carried),
+            "First start of this version: the settings were copied from \"Fotomill Professional "
+            "10.ini\".");
+  EXPECT_EQ(Text("Fotomill Professional 11.ini"), "[Fotomill]\nJpegCompression=33\n");
+  EXPECT_EQ(Text("Fotomill.tdb"), "store");
+  test::WriteText(DataFile("Fotomill Professional 10.ini"), "[Fotomill]\nJpegCompression=44\n");
+  EXPECT_FALSE(CarryOverAtFirstStart()) << "once";
+  EXPECT_EQ(Text("Fotomill Professional 11.ini"), "[Fotomill]\nJpegCompression=33\n");
+
+  CarryOver failed;
+  failed.failed = {"Fotomill Professional 10.ini"};
+  EXPECT_NE(CarryOverText(failed).find("could not be copied"), std::string::npos);
 }
 
 TEST_F(DataFilesTest, CarryOverIsAtomic) {

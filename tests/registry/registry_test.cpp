@@ -7,6 +7,7 @@
 #include <ranges>
 #include <set>
 
+#include "core/text.h"
 #include "settings/key_table.h"
 #include "support/files.h"
 #include "support/pictures.h"
@@ -119,6 +120,15 @@ TEST(FormatLists, FollowTheFlags) {
   }
   EXPECT_EQ(FormatListLine(2), "\xc3\x97\t(BMP) Windows bitmap");
   EXPECT_EQ(FormatListLine(7), " \t(EXE) Self-displaying image");
+}
+
+TEST(FormatLists, DestinationsAreOnlyThoseThatCanBeWritten) {
+  const std::vector<std::string> extensions = DestinationExtensions();
+  EXPECT_FALSE(extensions.empty());
+  for (const int32_t row : DestinationRows()) {
+    const std::string extension = LowerCase(FormatRow(row).extension.view());
+    EXPECT_EQ(std::ranges::count(extensions, extension), CanWrite(FormatRow(row))) << extension;
+  }
 }
 
 TEST(DescribeFileType, MatchesWholeExtensionsOfEnabledRows) {

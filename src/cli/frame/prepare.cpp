@@ -9,13 +9,29 @@
 #include "settings/format_switches.h"
 #include "settings/key_help.h"
 #include "settings/plugin_settings.h"
+#include "settings/previous_version.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
 
-std::string PrepareFor(const Command& command, const GlobalOptions& global) {
+namespace {
+
+// Warnings about --set keys that this build does not use, a sentence each.
+void NoteUnusedSettings(const GlobalOptions& global, std::vector<std::string>& notes) {
+  for (const std::string_view setting : global.settings) {
+    const KeyRow* const row = FindKey(setting.substr(0, setting.find('=')));
+    if (row != nullptr && !IsKeyUsed(*row)) notes.push_back("--set: " + UnusedKeyText(*row));
+  }
+}
+
+}  // namespace
+
+std::string PrepareFor(const Command& command, const GlobalOptions& global,
+                       std::vector<std::string>& notes) {
+  NoteUnusedSettings(global, notes);
   if (command.needs == Needs::Nothing) return {};
   SetDataFolder(global.dataFolder);
+  if (const auto carried = CarryOverAtFirstStart()) notes.push_back(CarryOverText(*carried));
   (void)LoadConfiguration();  // on failure the defaults apply
   for (const std::string_view setting : global.settings) {
     const size_t equals = setting.find('=');
@@ -30,15 +46,6 @@ std::string PrepareFor(const Command& command, const GlobalOptions& global) {
     EnablePlugins();
   }
   return {};
-}
-
-std::vector<std::string> UnusedSettings(const GlobalOptions& global) {
-  std::vector<std::string> notes;
-  for (const std::string_view setting : global.settings) {
-    const KeyRow* const row = FindKey(setting.substr(0, setting.find('=')));
-    if (row != nullptr && !IsKeyUsed(*row)) notes.push_back(UnusedKeyText(*row));
-  }
-  return notes;
 }
 
 void FinishAfter(const Command& command) {

@@ -9,10 +9,10 @@ namespace fotomill::cli {
 
 // Initializes what a command needs: the data folder from --data, the configuration,
 // --set, the format registry. Returns an error message for an invalid command line, else
-// empty.
-std::string PrepareFor(const Command& command, const GlobalOptions& global);
-// Warnings about --set keys that this build does not use, a sentence each.
-std::vector<std::string> UnusedSettings(const GlobalOptions& global);
+// empty. Adds what the user should know to `notes`, a sentence each: settings of a previous
+// version that were copied, --set keys that this build does not use.
+std::string PrepareFor(const Command& command, const GlobalOptions& global,
+                       std::vector<std::string>& notes);
 // Shuts down the format registry, after the command.
 void FinishAfter(const Command& command);
 

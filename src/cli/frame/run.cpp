@@ -109,11 +109,12 @@ int ParseAndRun(const Command* command, const Arguments& arguments, const Io& io
                     command == nullptr ? "" : command->name);
   }
   if (command == nullptr) return Complain(io, Tr("No command given."));
-  const std::string problem = PrepareFor(*command, context.global);
+  std::vector<std::string> notes;
+  const std::string problem = PrepareFor(*command, context.global, notes);
   if (!problem.empty())
     return Complain(io, std::string(command->name) + ": " + problem, command->name);
-  for (const std::string& note : UnusedSettings(context.global))
-    if (!context.global.quiet) Print(io.err, "fotomill: --set: " + note + "\n");
+  for (const std::string& note : notes)
+    if (!context.global.quiet) Print(io.err, "fotomill: " + note + "\n");
   const auto begun = std::chrono::steady_clock::now();
   const int status = context.run();
   FinishAfter(*command);
