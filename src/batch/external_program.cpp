@@ -1,15 +1,20 @@
 #include "batch/external_program.h"
 
 #include "platform/process.h"
+#include "registry/registry.h"
 
 namespace fotomill {
 
+std::vector<std::string> ExternalProgramHost::CommandFor(const std::string& file) {
+  return platform::ProgramFor(file);
+}
+
 Status OpenWithExternalProgram(ExternalProgramHost& host, const std::string& file, uint32_t flags) {
-  const std::vector<std::string> program = platform::ProgramFor(file);
+  const std::vector<std::string> command = host.CommandFor(file);
   bool started = false;
-  if (!program.empty()) {
+  if (!command.empty()) {
     host.LeaveClipboardChain();
-    started = platform::RunProgram(program, (flags & kDoNotWait) == 0);
+    started = platform::RunProgram(command, (flags & kDoNotWait) == 0);
     host.JoinClipboardChain();
   }
   if (!started) {
@@ -18,6 +23,13 @@ Status OpenWithExternalProgram(ExternalProgramHost& host, const std::string& fil
   }
   host.TakeFocus();
   return Status::Ok;
+}
+
+bool NeedsExternalProgram(std::string_view fileName) {
+  const int32_t index = FindFormatByName(fileName);
+  if (index == kNoFormat) return false;
+  const FormatEntry& row = FormatRow(index);
+  return (row.flags & (FMT_MEDIA | FMT_TIMED)) != 0 && !CanRead(row);
 }
 
 }  // namespace fotomill

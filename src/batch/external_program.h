@@ -3,6 +3,7 @@
 #include <cstdint>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "core/status.h"
 #include "texts/texts.h"
@@ -14,11 +15,13 @@ namespace fotomill {
 class ExternalProgramHost {
  public:
   virtual ~ExternalProgramHost() = default;
-  // Shows a message box and returns when the user has closed it.
+  // The command that opens a file, as an argument vector; empty if no program is registered for it.
+  virtual std::vector<std::string> CommandFor(const std::string& file);
+  // Shows a message box.
   virtual void ShowMessage(std::string_view text) = 0;
   virtual void LeaveClipboardChain() {}  // the window stops watching the clipboard
-  virtual void JoinClipboardChain() {}  // and watches it again
-  virtual void TakeFocus() {}  // redraws itself and takes the focus back
+  virtual void JoinClipboardChain() {}   // and watches it again
+  virtual void TakeFocus() {}            // redraws itself and takes the focus back
 };
 
 // Flag: does not wait for the program to end.
@@ -30,9 +33,13 @@ inline constexpr std::string_view kNoExternalProgram = TrLater(
     "Fotomill Formats document "
     "for more information about the format in question.");
 
-// Opens a file with the program that the system has registered for it, and waits until that has
-// ended unless kDoNotWait is set. UnsupportedFunction, after a message, if there is none or it
-// cannot be started.
+// Opens a file with the host's program for it, by default the one that the system has registered,
+// and waits until that has ended unless kDoNotWait is set. UnsupportedFunction, after a message, if
+// there is none or it cannot be started.
 Status OpenWithExternalProgram(ExternalProgramHost& host, const std::string& file, uint32_t flags);
+
+// Whether a file is opened with an external program: by its name it is a sound, a video or another
+// medium that plays in time, and this build does not read it.
+bool NeedsExternalProgram(std::string_view fileName);
 
 }  // namespace fotomill

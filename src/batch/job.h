@@ -33,6 +33,22 @@ struct OverwritePolicy {
   bool skip = false;     // leave out the file, without a question
 };
 
+// The functions that put something in front of the names of their outputs: the Prefix keys.
+enum class PrefixedFunction {
+  Annotate,
+  Catalog,
+  Crop,
+  Duplicate,
+  Effects,
+  Filter,
+  Matt,
+  SocialMedia,
+  Transform,
+  Watermark,
+  Supercompressor,
+};
+inline constexpr size_t kPrefixedFunctionCount = 11;
+
 // How outputs get their names.
 struct NamingOptions {
   int32_t extensionCase = 0;  // ExtensionCaseStyle
@@ -42,14 +58,15 @@ struct NamingOptions {
   // WarnDestinationWrite: the format is asked about before anything is written
   bool confirmFormat = true;
   int32_t firstVariant = 1, lastVariant = INT32_MAX;
-  // What functions put in front of the names of their outputs; blanks belong to it. By number of
-  // the function; empty for those that put nothing there.
-  std::array<FixedText<32>, kFileFunctionCount> prefixes = {};
+  // What they put there, by number of the function; blanks belong to it.
+  std::array<FixedText<32>, kPrefixedFunctionCount> prefixes = {};
 
-  // Empty for functions that put nothing there.
-  std::string_view PrefixOf(FileFunction function) const {
+  std::string_view PrefixOf(PrefixedFunction function) const {
     return prefixes[static_cast<size_t>(function)].view();
   }
+  // The same by the number under which files go into the history; empty for functions that put
+  // nothing there.
+  std::string_view PrefixOf(FileFunction function) const;
 };
 
 // What holds for later jobs as well once the user has changed it during one: the check boxes of the

@@ -11,15 +11,35 @@ namespace fotomill {
 
 namespace {
 
+// In the order of PrefixedFunction.
+constexpr SettingPrefix Settings::*kPrefixes[] = {
+    &Settings::PrefixAnnotate,
+    &Settings::PrefixCatalog,
+    &Settings::PrefixCrop,
+    &Settings::PrefixDuplicate,
+    &Settings::PrefixEffects,
+    &Settings::PrefixFilter,
+    &Settings::PrefixMatt,
+    &Settings::PrefixSocialMedia,
+    &Settings::PrefixTransform,
+    &Settings::PrefixWatermark,
+    &Settings::SupercompressorSaveFilePrefix,
+};
+static_assert(std::size(kPrefixes) == kPrefixedFunctionCount);
+
 struct FunctionPrefix {
   FileFunction function;
-  SettingPrefix Settings::*key;
+  PrefixedFunction prefix;
 };
-constexpr FunctionPrefix kPrefixes[] = {
-    {FileFunction::Annotate, &Settings::PrefixAnnotate},   {FileFunction::Catalog, &Settings::PrefixCatalog},
-    {FileFunction::Crop, &Settings::PrefixCrop},           {FileFunction::Effects, &Settings::PrefixEffects},
-    {FileFunction::Filter, &Settings::PrefixFilter},       {FileFunction::Matt, &Settings::PrefixMatt},
-    {FileFunction::Transform, &Settings::PrefixTransform}, {FileFunction::Watermark, &Settings::PrefixWatermark},
+constexpr FunctionPrefix kFunctionPrefixes[] = {
+    {FileFunction::Annotate, PrefixedFunction::Annotate},
+    {FileFunction::Catalog, PrefixedFunction::Catalog},
+    {FileFunction::Crop, PrefixedFunction::Crop},
+    {FileFunction::Effects, PrefixedFunction::Effects},
+    {FileFunction::Filter, PrefixedFunction::Filter},
+    {FileFunction::Matt, PrefixedFunction::Matt},
+    {FileFunction::Transform, PrefixedFunction::Transform},
+    {FileFunction::Watermark, PrefixedFunction::Watermark},
 };
 
 OverwritePolicy OverwritePolicyFromSettings() {
@@ -27,6 +47,16 @@ OverwritePolicy OverwritePolicyFromSettings() {
           .keepBoth = settings.OverwriteKeepBoth != 0,
           .recycle = settings.OverwritePromptRecycle != 0,
           .previews = settings.OverwritePromptPreviews != 0};
+}
+
+// A prefix as FilenameUnderbars wants it: without underbars, one blank is where they were.
+std::string WithUnderbars(std::string_view prefix) {
+  std::string text(prefix);
+  if (settings.FilenameUnderbars != 0 || text.find('_') == std::string::npos) return text;
+  std::ranges::replace(text, '_', ' ');
+  const auto both = [](char a, char b) { return a == ' ' && b == ' '; };
+  text.erase(std::ranges::unique(text, both).begin(), text.end());
+  return text;
 }
 
 NamingOptions NamingOptionsFromSettings() {
@@ -37,8 +67,8 @@ NamingOptions NamingOptionsFromSettings() {
                        .confirmFormat = settings.WarnDestinationWrite != 0,
                        .firstVariant = settings.NumberedVariantMin,
                        .lastVariant = settings.NumberedVariantMax};
-  for (const auto& [function, key] : kPrefixes)
-    naming.prefixes[static_cast<size_t>(function)] = settings.*key;
+  for (size_t i = 0; i < kPrefixedFunctionCount; ++i)
+    naming.prefixes[i].AssignCut(WithUnderbars(settings.*kPrefixes[i]));
   return naming;
 }
 
@@ -54,6 +84,12 @@ KeyNumber NumberOf(Remembered what) {
 }
 
 }  // namespace
+
+std::string_view NamingOptions::PrefixOf(FileFunction function) const {
+  const auto* const found =
+      std::ranges::find(kFunctionPrefixes, function, &FunctionPrefix::function);
+  return found == std::end(kFunctionPrefixes) ? std::string_view() : PrefixOf(found->prefix);
+}
 
 BatchJob NewBatchJob() {
   BatchJob job;

@@ -207,8 +207,11 @@ FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::s
       operation.steps.push_back({path, {}});
       continue;
     }
-    std::string target = platform::JoinFolder(folder, platform::FileNameOf(path));
+    const std::string_view name = platform::FileNameOf(path);
+    std::string target = platform::JoinFolder(folder, name);
     if (kind == FileOperationKind::Move && target == path) continue;
+    if (target == path)
+      target = platform::JoinFolder(folder, options.duplicatePrefix + std::string(name));
     const TakenTest taken = [&](const std::string& candidate) {
       return planned.contains(candidate) ? platform::Existence::Yes
                                          : platform::ExistenceOf(candidate);
@@ -343,7 +346,17 @@ std::string FileOperationName(const FileOperation& operation) {
 void UndoList::Keep(std::vector<FileOperation>& list, FileOperation operation) {
   if (operation.steps.empty()) return;
   list.push_back(std::move(operation));
-  if (list.size() > most_) list.erase(list.begin());
+  Shorten(list);
+}
+
+void UndoList::Shorten(std::vector<FileOperation>& list) const {
+  if (list.size() > most_) list.erase(list.begin(), list.end() - static_cast<ptrdiff_t>(most_));
+}
+
+void UndoList::SetLimit(size_t most) {
+  most_ = most;
+  Shorten(done_);
+  Shorten(undone_);
 }
 
 void UndoList::Add(FileOperation operation) {

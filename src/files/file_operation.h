@@ -50,17 +50,20 @@ struct FileOperationResult {
   std::string note = {};  // a remark about the completed steps, a sentence
 };
 
-// Settings for an operation: the range for numbered names of copies.
+// Settings for an operation: the range for numbered names of copies, and the
+// prefix of duplicates.
 struct FileOperationOptions {
   int64_t firstVariant = 1, lastVariant = INT32_MAX;
+  // of a copy in the same folder; if empty, a number is added instead
+  std::string duplicatePrefix = {};
 };
 
 // Called before each step; return false to stop.
 using FileOperationProgress = std::function<bool(size_t index, size_t count)>;
 
 // The steps of an operation on files and folders: into `folder` under the same names, or into the
-// trash. A move skips files already in `folder`; a copy gets a number if its name is taken, or if
-// it is made in the same folder.
+// trash. A move skips files already in `folder`; a copy in the same folder gets the prefix for
+// duplicates. A name that is taken gets a number.
 FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::string>& paths,
                                 const std::string& folder,
                                 const FileOperationOptions& options = {});
@@ -92,6 +95,8 @@ std::string FileOperationName(const FileOperation& operation);
 class UndoList {
  public:
   explicit UndoList(size_t most) : most_(most) {}  // keeps at most that many operations
+  // Changes that number; the oldest operations beyond it are dropped.
+  void SetLimit(size_t most);
   // Adds an operation and clears the redo list. Operations without steps are
   // ignored.
   void Add(FileOperation operation);
@@ -113,8 +118,9 @@ class UndoList {
 
  private:
   void Keep(std::vector<FileOperation>& list, FileOperation operation);
+  void Shorten(std::vector<FileOperation>& list) const;
 
-  const size_t most_;
+  size_t most_;
   std::vector<FileOperation> done_, undone_;
 };
 

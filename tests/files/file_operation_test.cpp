@@ -188,6 +188,26 @@ TEST_F(FileOperationTest, FoldersCannotBeMovedIntoThemselves) {
   EXPECT_EQ(ReadText(To("kept")), "kept");
 }
 
+TEST_F(FileOperationTest, CopiesInTheSameFolderAreCalledDuplicates) {
+  const FileOperationOptions options{.duplicatePrefix = "Duplicate of "};
+  const auto copy = [&](const std::string& folder) {
+    const auto plan = PlanFileOperation(FileOperationKind::Copy, {From("a.png"), From("sub")},
+                                        folder_.Path(folder), options);
+    EXPECT_THAT(CarryOut(plan, options).failures, IsEmpty());
+  };
+  copy("to");
+  EXPECT_THAT(Names("to"), ElementsAre("a.png", "sub"));
+  copy("from");
+  copy("from");
+  EXPECT_THAT(Names("from"),
+              ElementsAre("Duplicate of a [1].png", "Duplicate of a.png", "Duplicate of sub",
+                          "Duplicate of sub [1]", "a.png", "b.png", "sub"));
+  EXPECT_EQ(ReadText(From("Duplicate of a.png")), "a.png");
+  const auto plan =
+      PlanFileOperation(FileOperationKind::Copy, {From("b.png")}, folder_.Path("from"));
+  EXPECT_EQ(plan.steps.at(0).to, From("b [1].png")) << "without a prefix";
+}
+
 TEST(UndoList, KeepsALimitedNumber) {
   UndoList list(2);
   const auto operation = [](const char* name) {
@@ -204,6 +224,18 @@ TEST(UndoList, KeepsALimitedNumber) {
   EXPECT_FALSE(list.CanUndo());
   list.Add(operation("d"));
   EXPECT_FALSE(list.CanRedo());
+  // The limit applies at once, to what is there as well.
+  list.SetLimit(3);
+  list.Add(operation("e"));
+  list.Add(operation("f"));
+  list.SetLimit(1);
+  EXPECT_EQ(list.UndoName(), "rename of f");
+  list.Undone(list.PopUndo());
+  EXPECT_FALSE(list.CanUndo());
+  list.SetLimit(0);
+  EXPECT_FALSE(list.CanRedo());
+  list.Add(operation("g"));
+  EXPECT_FALSE(list.CanUndo());
 }
 
 }  // namespace
