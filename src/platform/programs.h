@@ -17,8 +17,9 @@ struct Program {
 // The programs registered for a file by its name, the user's default first; without those that need
 // a terminal.
 std::vector<Program> ProgramsFor(const std::string& file);
-// Opens files, given by absolute paths, with a program: one call for all if it takes several files,
-// else one for each. False if it could not be started.
-[[nodiscard]] bool OpenWith(const Program& program, const std::vector<std::string>& files);
+// The commands that open files, given by absolute paths, with a program, as argument vectors: one
+// for all files when it takes several, else one each. Empty when the program is gone.
+std::vector<std::vector<std::string>> CommandsFor(const Program& program,
+                                                  const std::vector<std::string>& files);
 
 }  // namespace fotomill::platform

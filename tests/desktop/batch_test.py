@@ -102,6 +102,37 @@ def destination_step(folder):
         desktop.wait(r"batch closes")
 
 
+def destination_in_parts(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["one.bmp"])
+    given = ["DefaultFileExtension=jpg", "DestForceSourceDir=1", "WarnDestinationWrite=0",
+             "PromptBeforeOverwrite=0", "PromptForFileComments=1"]
+    for more, parts in ((["DestinationWindowCombined=0"], ["format", "folder"]),
+                        (["PromptForDestination=0"], ["format"])):
+        with Desktop(folder, pictures, settings=given + more) as desktop:
+            desktop.wait(r"browser .*missing=0 listing=0")
+            desktop.focus("Fotomill Professional")
+            desktop.key("Home", "ctrl+e")
+            desktop.wait(r"destination-part format")
+            desktop.focus("^Convert$")
+            desktop.key("alt+m")
+            desktop.type(f"with {parts[-1]}")
+            desktop.screenshot("destination-" + parts[-1])
+            desktop.key("Return")
+            if len(parts) > 1:
+                desktop.wait(r"destination-part folder")
+                desktop.screenshot("destination-folder-part")
+                desktop.key("Return")
+            desktop.wait(r"batch-line .*one.bmp -> .*one.jpg")
+            desktop.wait(r"batch closes")
+            desktop.focus("Fotomill Professional")
+            desktop.key("ctrl+q")
+            desktop.wait_end()
+        assert f"with {parts[-1]}".encode() in (pictures / "one.jpg").read_bytes()
+        text = (desktop.data / "Fotomill Professional 11.ini").read_text()
+        assert "DefaultFileExtension=jpg\n" in text and "LastFormatSelected=15\n" in text, text
+
+
 def errors_stay_and_abort_stops(folder):
     pictures = folder / "pictures"
     make_pictures(pictures, ["p.bmp"])
@@ -163,4 +194,5 @@ def resize_to_a_named_size(folder):
             assert max(sizes) == 16, sizes
 
 
-run(convert_and_collide, destination_step, resize_to_a_named_size, errors_stay_and_abort_stops)
+run(convert_and_collide, destination_step, destination_in_parts, resize_to_a_named_size,
+    errors_stay_and_abort_stops)

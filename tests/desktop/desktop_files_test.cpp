@@ -2,11 +2,13 @@
 
 #include <gmock/gmock.h>
 
+#include <algorithm>
 #include <atomic>
 #include <future>
 
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "core/data_folder.h"
+#include "desktop/models/files/open_wildcard.h"
 #include "desktop/models/files/operation_options.h"
 #include "desktop/models/files/pasted_picture.h"
 #include "desktop/models/shell/favorites.h"
@@ -191,6 +193,14 @@ TEST(Session, RoundTripsAndIgnoresInvalidLines) {
   EXPECT_EQ(odd.tabs[0].folder, "/x");
   EXPECT_EQ(odd.tabs[0].scroll, 0);
   EXPECT_EQ(odd.tab, 0u);
+}
+
+TEST(OpenWildcard, HasAllPicturesFirstAndExtensionsInBothCases) {
+  const std::string wildcard = OpenWildcard();
+  EXPECT_TRUE(wildcard.starts_with("All pictures|*.AVI;*.BGA;*.BMP;")) << wildcard;
+  EXPECT_NE(wildcard.find("|(BMP) Windows bitmap|*.BMP;*.bmp|"), std::string::npos);
+  EXPECT_EQ(std::ranges::count(wildcard, '|'),
+            static_cast<ptrdiff_t>(2 * OpenFileFilter().size() - 1));
 }
 
 }  // namespace

@@ -3,9 +3,11 @@
 #include <filesystem>
 
 #include "batch/destination_name.h"
+#include "core/data_folder.h"
 #include "desktop/models/batch/destination_choice.h"
 #include "desktop/models/batch/named_sizes.h"
 #include "platform/folders.h"
+#include "registry/registry.h"
 #include "settings/settings.h"
 #include "support/files.h"
 #include "support/scoped_settings.h"
@@ -41,6 +43,77 @@ TEST(Destination, PreviewsTheOutputFolder) {
     const DestinationChoice made{.extension = "png", .folder = folder.Path("not/yet/there")};
     EXPECT_GT(OutlookOf(made, files).freeSpace, 0u);
   }
+}
+
+TEST(Destination, FormatsAreThoseOfTheDefaultFormat) {
+  std::vector<std::string> extensions;
+  for (const DestinationFormat& format : DestinationFormats())
+    extensions.push_back(format.extension);
+  EXPECT_EQ(extensions, DestinationExtensions());
+}
+
+TEST(Destination, TheStepBeginsWithTheLastFormatAndTheDefaultStays) {
+  const test::ScopedSettings keep;
+  const test::TemporaryFolder folder;
+  SetDataFolder(folder.Path());
+  const std::vector<DestinationFormat> formats = DestinationFormats();
+  const auto first = [&] { return formats[FirstFormat(formats)].extension; };
+  EXPECT_EQ(first(), "png");
+  KeepChoice({.extension = "tif", .folder = {}}, "/shown");
+  EXPECT_EQ(first(), "tif");
+  EXPECT_EQ(settings.DefaultFileExtension.view(), "png");
+  EXPECT_EQ(settings.DestForceSourceDir, 1);
+  settings.UseDefaultDestFormat = 1;
+  EXPECT_EQ(first(), "png");
+  settings.UseDefaultDestFormat = 0;
+  settings.LastFormatSelected = 10'000;
+  EXPECT_EQ(first(), "png");
+
+  // The browser's folder is offered as the built-in choice, and kept as such.
+  EXPECT_EQ(RecentDestinations("/shown"), std::vector<std::string>{"/shown"});
+  KeepChoice({.extension = "tif", .folder = "/out"}, "/shown");
+  KeepChoice({.extension = "tif", .folder = "/shown"}, "/shown");
+  EXPECT_EQ(settings.DestForceSourceDir, 0);
+  EXPECT_EQ(RecentDestinations("/elsewhere"), (std::vector<std::string>{"/elsewhere", "/out"}));
+  SetDataFolder({});
+}
+
+TEST(Destination, AsksForWhatTheSettingsSay) {
+  const test::ScopedSettings keep;
+  using Parts = std::vector<DestinationPart>;
+  const struct {
+    int32_t prompt, combined;
+    Parts parts;
+  } rows[] = {{1, 1, {DestinationPart::Both}},
+              {1, 0, {DestinationPart::Format, DestinationPart::Folder}},
+              {0, 1, {DestinationPart::Format}},
+              {0, 0, {DestinationPart::Format}}};
+  for (const auto& row : rows) {
+    settings.PromptForDestination = row.prompt;
+    settings.DestinationWindowCombined = row.combined;
+    EXPECT_EQ(DestinationParts(), row.parts);
+  }
+}
+
+TEST(Destination, ACommentGoesIntoTheOutputs) {
+  const test::TemporaryFolder folder;
+  test::WriteBytes(folder.Path("a.bmp"),
+                   test::ReadBytes(test::SourcePath("samples/bmp-true-color.bmp")));
+  const std::vector<BatchFile> files{{.name = folder.Path("a.bmp"), .below = {}, .hint = {}}};
+  const auto commentOf = [&](const char* comment) {
+    const DestinationChoice choice{.extension = "jpg", .folder = folder.Path(), .comment = comment};
+    BatchJob job = JobFor(choice);
+    job.naming.confirmFormat = false;
+    job.overwrite.prompt = false;
+    EXPECT_EQ(RunBatch(files, FunctionFor(choice, job), job), Status::Ok);
+    EXPECT_EQ(job.writeComments, *comment != '\0' || settings.WriteFileComments != 0);
+    PicturePointer picture;
+    EXPECT_EQ(LoadPicture({.fileName = folder.Path("a.jpg")}, picture), Status::Ok);
+    std::filesystem::remove(folder.Path("a.jpg"));
+    return picture == nullptr ? "" : std::string(picture->comment.begin(), picture->comment.end());
+  };
+  EXPECT_EQ(commentOf("Zürich, 1998"), "Zürich, 1998");
+  EXPECT_EQ(commentOf(""), "");
 }
 
 TEST(Destination, TypedFoldersAreRelativeToTheCurrentFolder) {

@@ -33,10 +33,11 @@ def rename_delete_undo_paste(folder):
         desktop.wait(r"files Undo rename of a.bmp done=1")
         desktop.wait(r"listed 2")
         assert names(pictures) == ["a.bmp", "b.bmp"], names(pictures)
-        # Copy and paste between folders; pasting into the same folder appends a number.
+        # Copy and paste between folders; pasting into the same folder adds the prefix for duplicates.
         desktop.key("ctrl+a", "ctrl+c", "ctrl+v")
         desktop.wait(r"files Copy of 2 files done=2 failed=0")
-        assert names(pictures) == ["a [1].bmp", "a.bmp", "b [1].bmp", "b.bmp"], names(pictures)
+        assert names(pictures) == ["Duplicate of a.bmp", "Duplicate of b.bmp", "a.bmp",
+                                   "b.bmp"], names(pictures)
         desktop.key("ctrl+l")
         desktop.type(str(other) + "\n")
         desktop.wait(r"lines=0 .*listing=0 .*folder=.*other$")
@@ -48,7 +49,7 @@ def rename_delete_undo_paste(folder):
         desktop.wait(r"lines=4 .*listing=0 .*folder=.*pictures$")
         # A clipboard picture is pasted as a file, and undone.
         desktop.key("Home", "Return")
-        desktop.wait(r"view place=1/4 .*status=0 .*a \[1\].bmp")
+        desktop.wait(r"view place=1/4 .*status=0 .*/a.bmp")
         desktop.focus("View$")
         desktop.key("ctrl+c", "Escape")
         desktop.focus("Fotomill Professional")
@@ -60,12 +61,13 @@ def rename_delete_undo_paste(folder):
         desktop.wait(r"lines=4 .*listing=0")
         # Deleting a file in the view window shows the next one.
         desktop.key("Home", "Return")
-        desktop.wait(r"view place=1/4 .*status=0 .*a \[1\].bmp")
+        desktop.wait(r"view place=1/4 .*status=0 .*/a.bmp")
         desktop.focus("View$")
         desktop.key("Delete")
-        desktop.wait(r"view place=1/3 .*status=0 .*a.bmp")
-        desktop.wait(r"files Deletion of a \[1\].bmp done=1")
-        assert names(pictures) == ["a.bmp", "b [1].bmp", "b.bmp"], names(pictures)
+        desktop.wait(r"view place=1/3 .*status=0 .*/b.bmp")
+        desktop.wait(r"files Deletion of a.bmp done=1")
+        assert names(pictures) == ["Duplicate of a.bmp", "Duplicate of b.bmp",
+                                   "b.bmp"], names(pictures)
 
 
 def names_that_are_not_utf8(folder):

@@ -12,6 +12,7 @@
 #include "registry/registry.h"
 #include "settings/settings.h"
 #include "support/files.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 namespace {
@@ -105,6 +106,25 @@ TEST(SetupHelp, EntriesArePlainTextAndSeparate) {
   EXPECT_THAT(manual.text, testing::HasSubstr("\nF5, F9   reload the folder, show or hide the folder tree\n"));
   EXPECT_THAT(manual.text, testing::Not(testing::ContainsRegex("[|`(]desktop-|png|--- ")))
       << "marks, addresses and pictures are left out";
+}
+
+TEST(SetupHelp, TheFormatListHasAPageOfItsOwn) {
+  const HelpText help = HelpOn(kFormatsTopic);
+  EXPECT_EQ(help.title, "Formats");
+  EXPECT_THAT(help.text, testing::HasSubstr("\n\nThe format list\n\nSetup lists all formats"));
+}
+
+TEST(SetupHelp, TipsAreInTheLanguageOfTheWindows) {
+  const KeyRow& row = KeyOf(KeyNumber::JpegStoreDPI);
+  EXPECT_EQ(ControlTip(row),
+            "The picture's resolution is written into JPEG files.\n\nJpegStoreDPI");
+  if (StartTexts("de")) {
+    EXPECT_EQ(ControlTip(row), "JpegStoreDPI");
+  }
+  (void)StartTexts("en");
+  EXPECT_EQ(LimitsText(KeyOf(KeyNumber::PngCompression)), "0 to 9");
+  EXPECT_EQ(LimitsText(KeyOf(KeyNumber::DitherContrast)), "-100 to 100");
+  EXPECT_EQ(LimitsText(KeyOf(KeyNumber::LogoDelay)), "");
 }
 
 TEST(OverrideOptions, BelongToFormatsThatAreWritten) {

@@ -27,7 +27,7 @@ def setup_round_trip(folder):
         desktop.wait(r"help closed")
         desktop.focus("Setup")
         desktop.key("ctrl+a")
-        desktop.type("55")
+        desktop.type("a5b5-")  # only digits are taken
         desktop.key("Tab", "alt+a")
         desktop.wait(r"setup applied changed=1")
         text = ini.read_text()
@@ -54,6 +54,12 @@ def setup_round_trip(folder):
         desktop.wait(r"setup page=Formats")
         desktop.key("Tab", "Down", "space")
         desktop.wait(r"formats .BGA. .* off")
+        desktop.key("F1")
+        desktop.wait(r"help Formats$")
+        desktop.focus("Help: Formats")
+        desktop.key("Escape")
+        desktop.wait(r"help closed")
+        desktop.focus("Setup")
         assert "[Formats]\nBGA=0\n" in ini.read_text(), ini.read_text()
         desktop.key("Escape")
         desktop.wait(r"setup closed")
@@ -112,4 +118,18 @@ def info_exif_history(folder):
         desktop.wait_end()
 
 
-run(setup_round_trip, info_exif_history)
+def previous_version(folder):
+    data = folder / "data"
+    data.mkdir()
+    old = data / "Fotomill Professional 10.ini"
+    old.write_bytes(b"[Fotomill]\r\nJpegCompression=33\r\n")
+    with Desktop(folder, folder) as desktop:
+        desktop.wait(r"carried-over First start of this version: the settings were copied")
+        desktop.wait(r"browser .*listing=0")
+        assert (data / "Fotomill Professional 11.ini").read_bytes() == old.read_bytes()
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+
+
+run(setup_round_trip, info_exif_history, previous_version)

@@ -18,6 +18,56 @@ struct Releaser {
 template <typename T>
 using Owned = std::unique_ptr<T, Releaser>;
 
+// The words of an entry's Exec line, with their field codes.
+std::vector<std::string> ExecWords(GDesktopAppInfo* info) {
+  const char* const line = g_app_info_get_commandline(G_APP_INFO(info));
+  int count = 0;
+  char** parsed = nullptr;
+  if (line == nullptr || g_shell_parse_argv(line, &count, &parsed, nullptr) == 0) return {};
+  std::vector<std::string> words(parsed, parsed + count);
+  g_strfreev(parsed);
+  return words;
+}
+
+// A word with its field codes replaced, as the Desktop Entry Specification says. URLs are given as
+// paths, which programs that take URLs accept as well.
+std::string ExpandWord(const std::string& word, const Program& program, const std::string& file) {
+  std::string expanded;
+  for (size_t i = 0; i < word.size(); ++i) {
+    if (word[i] != '%' || i + 1 == word.size()) {
+      expanded += word[i];
+      continue;
+    }
+    switch (word[++i]) {
+      case '%': expanded += '%'; break;
+      case 'f':
+      case 'u': expanded += file; break;
+      case 'c': expanded += program.name; break;
+      default: break;  // icon, entry file and codes no longer in use
+    }
+  }
+  return expanded;
+}
+
+std::vector<std::string> Expand(const std::vector<std::string>& words, const Program& program,
+                                const std::vector<std::string>& files) {
+  std::vector<std::string> command;
+  bool named = false;
+  for (const std::string& word : words) {
+    const bool list = word == "%F" || word == "%U";
+    named = named || list || word.find("%f") != std::string::npos ||
+            word.find("%u") != std::string::npos;
+    if (list) {
+      command.insert(command.end(), files.begin(), files.end());
+      continue;
+    }
+    std::string expanded = ExpandWord(word, program, files.front());
+    if (!expanded.empty() || word.empty()) command.push_back(std::move(expanded));
+  }
+  if (!named) command.push_back(files.front());
+  return command;
+}
+
 void Add(GAppInfo* info, std::vector<Program>& programs) {
   const char* const id = g_app_info_get_id(info);
   if (id == nullptr || g_desktop_app_info_get_boolean(G_DESKTOP_APP_INFO(info), "Terminal") != 0)
@@ -41,14 +91,21 @@ std::vector<Program> ProgramsFor(const std::string& file) {
   return programs;
 }
 
-bool OpenWith(const Program& program, const std::vector<std::string>& files) {
+std::vector<std::vector<std::string>> CommandsFor(const Program& program,
+                                                  const std::vector<std::string>& files) {
   const Owned<GDesktopAppInfo> info(g_desktop_app_info_new(program.id.c_str()));
-  if (info == nullptr) return false;
-  GList* list = nullptr;
-  for (auto file = files.rbegin(); file != files.rend(); ++file)
-    list = g_list_prepend(list, g_file_new_for_path(file->c_str()));
-  const Owned<GList> owner(list);
-  return g_app_info_launch(G_APP_INFO(info.get()), list, nullptr, nullptr) != 0;
+  if (info == nullptr) return {};
+  const std::vector<std::string> words = ExecWords(info.get());
+  if (words.empty()) return {};
+  const bool several = std::ranges::any_of(
+      words, [](const std::string& word) { return word == "%F" || word == "%U"; });
+  std::vector<std::vector<std::string>> commands;
+  if (several) {
+    commands.push_back(Expand(words, program, files));
+  } else {
+    for (const std::string& file : files) commands.push_back(Expand(words, program, {file}));
+  }
+  return commands;
 }
 
 }  // namespace fotomill::platform

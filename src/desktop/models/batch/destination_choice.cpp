@@ -38,6 +38,22 @@ std::string ExistingFolder(std::string folder) {
   return folder;
 }
 
+// The number of a format in LastFormatSelected: its row, or one behind all rows for plug-in
+// formats.
+int32_t NumberOf(const std::vector<DestinationFormat>& formats, size_t place) {
+  if (formats[place].row != kSpareRow) return formats[place].row;
+  return formatCount + static_cast<int32_t>(place);
+}
+
+// The outputs of a function get a comment, whatever else happens to the pictures.
+void AddComment(const std::string& comment, BatchFunction& function) {
+  if (comment.empty()) return;
+  function.transform = [comment, change = function.transform](PictureRecord& picture) {
+    picture.comment.assign(comment.begin(), comment.end());
+    return change ? change(picture) : Status::Ok;
+  };
+}
+
 }  // namespace
 
 std::vector<DestinationFormat> DestinationFormats() {
@@ -54,12 +70,37 @@ std::vector<DestinationFormat> DestinationFormats() {
   return formats;
 }
 
-std::vector<std::string> RecentDestinations() {
-  std::vector<std::string> folders;
-  for (const std::string& entry : LoadHistoryList(HistoryList::Destination)) {
-    if (entry != kDefaultEntry) folders.push_back(entry);
+size_t FirstFormat(const std::vector<DestinationFormat>& formats) {
+  size_t first = 0;
+  for (size_t i = 0; i < formats.size(); ++i) {
+    if (EqualIgnoringCase(formats[i].extension, settings.DefaultFileExtension)) first = i;
   }
-  return folders;
+  if (settings.UseDefaultDestFormat != 0) return first;
+  for (size_t i = 0; i < formats.size(); ++i) {
+    if (NumberOf(formats, i) == settings.LastFormatSelected) return i;
+  }
+  return first;
+}
+
+std::vector<std::string> RecentDestinations(const std::string& shown) {
+  return OfferedEntries(HistoryList::Destination, shown);
+}
+
+void KeepChoice(const DestinationChoice& choice, const std::string& shown) {
+  const std::vector<DestinationFormat> formats = DestinationFormats();
+  for (size_t i = 0; i < formats.size(); ++i) {
+    if (formats[i].extension == choice.extension)
+      settings.LastFormatSelected = NumberOf(formats, i);
+  }
+  settings.DestForceSourceDir = choice.folder.empty() ? 1 : 0;
+  if (!choice.folder.empty())
+    (void)AddChoice(HistoryList::Destination, platform::AbsolutePath(choice.folder), shown);
+}
+
+std::vector<DestinationPart> DestinationParts() {
+  if (settings.PromptForDestination == 0) return {DestinationPart::Format};
+  if (settings.DestinationWindowCombined != 0) return {DestinationPart::Both};
+  return {DestinationPart::Format, DestinationPart::Folder};
 }
 
 std::string DestinationProblem(const DestinationChoice& choice) {
@@ -101,6 +142,7 @@ BatchJob JobFor(const DestinationChoice& choice) {
   job.extension = UpperCase(choice.extension);
   job.destinationFolder = choice.folder;
   job.naming.beside = choice.folder.empty();
+  if (!choice.comment.empty()) job.writeComments = true;
   return job;
 }
 
@@ -110,13 +152,14 @@ BatchFunction FunctionFor(const DestinationChoice& choice, const BatchJob& job) 
   function.autoOrient = choice.autoOrient;
   function.keepMetadata = choice.keepMetadata;
   auto recipe = std::make_shared<Recipe>();
-  if (choice.step.empty() || !ReadRecipe(choice.step, KeyTextInForce, *recipe).empty())
-    return function;
-  function.history = FunctionOfFamily(recipe->First()->family);
-  const FormatLookup none = [](const std::string&, int32_t&, std::string&) {
-    return std::string();  // the step names no format
-  };
-  (void)SetRecipe(recipe, std::string(settings.ExifCopyrightHolder.view()), job, none, function);
+  if (!choice.step.empty() && ReadRecipe(choice.step, KeyTextInForce, *recipe).empty()) {
+    function.history = FunctionOfFamily(recipe->First()->family);
+    const FormatLookup none = [](const std::string&, int32_t&, std::string&) {
+      return std::string();  // the step names no format
+    };
+    (void)SetRecipe(recipe, std::string(settings.ExifCopyrightHolder.view()), job, none, function);
+  }
+  AddComment(choice.comment, function);
   return function;
 }
 

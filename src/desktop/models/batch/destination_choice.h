@@ -17,6 +17,9 @@ struct DestinationFormat {
 };
 // What can be written, in the order of the registry, plug-in formats last.
 std::vector<DestinationFormat> DestinationFormats();
+// Which of these formats, at least one, the step begins with: the last one used
+// (LastFormatSelected), or DefaultFileExtension if UseDefaultDestFormat is on or none was used yet.
+size_t FirstFormat(const std::vector<DestinationFormat>& formats);
 
 // What the destination step asks for.
 struct DestinationChoice {
@@ -25,11 +28,21 @@ struct DestinationChoice {
   bool reduce = true;  // colors of pictures that are too deep for the format
   bool autoOrient = true;
   bool keepMetadata = true;
-  std::string step = {};  // of a recipe: applied to every picture; empty: none
+  std::string comment = {};  // of all outputs; empty: each has that of its source
+  std::string step = {};     // of a recipe: applied to every picture; empty: none
 };
 
-// The folders to offer, the last used first; empty texts for "beside the source" are left out.
-std::vector<std::string> RecentDestinations();
+// The folders to offer, the last used first; `shown`, the folder of the browser, is the built-in
+// choice.
+std::vector<std::string> RecentDestinations(const std::string& shown);
+// Keeps a choice for the next time: format, folder or none. DefaultFileExtension stays as it is.
+void KeepChoice(const DestinationChoice& choice, const std::string& shown);
+
+// What the destination step asks for at a time.
+enum class DestinationPart { Format, Folder, Both };
+// The parts to ask for, one after the other: both at once with DestinationWindowCombined; without
+// PromptForDestination no folder.
+std::vector<DestinationPart> DestinationParts();
 
 // What is wrong with a choice, a whole sentence; empty when nothing is.
 std::string DestinationProblem(const DestinationChoice& choice);

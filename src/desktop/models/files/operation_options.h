@@ -4,8 +4,9 @@
 
 namespace fotomill::desktop {
 
-// NumberedVariantMin and NumberedVariantMax, as they are now; thumbnails of files that are replaced
-// go.
+// NumberedVariantMin, NumberedVariantMax and PrefixDuplicate, as they are now.
 FileOperationOptions FileOperationOptionsFromSettings();
+// How many operations can be undone: UndoLevels.
+size_t UndoLimitFromSettings();
 
 }  // namespace fotomill::desktop

@@ -2,6 +2,8 @@
 
 #include "settings/key_help.h"
 #include "settings/setup_dialog.h"
+#include "settings/spin_range.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -95,6 +97,20 @@ HelpText WholePage(std::string_view page) {
 
 }  // namespace
 
+std::string LimitsText(const KeyRow& row) {
+  const auto limits = LimitsOf(row);
+  return limits ? Tr("%1 to %2", limits->minimum, limits->maximum) : std::string();
+}
+
+std::string ControlTip(const KeyRow& row) {
+  std::string text;
+  if (TextLanguage() == "en" && HasHelpEntry(row.name)) {
+    const std::string help = HelpOn(row.name).text;
+    text = help.substr(0, help.find("\n\n")) + "\n\n";
+  }
+  return text + row.name;
+}
+
 bool HasHelpEntry(std::string_view key) { return !EntryOf(kSettingsPage, key).empty(); }
 
 HelpText HelpOn(std::string_view topic) {
@@ -103,6 +119,7 @@ HelpText HelpOn(std::string_view topic) {
       return {std::string(row.heading), PlainText(EntryOf(kDesktopPage, row.heading))};
   }
   if (HasHelpEntry(topic)) return {std::string(topic), PlainText(EntryOf(kSettingsPage, topic))};
+  if (topic == kFormatsTopic) return WholePage(kFormatsPage);
   return WholePage(topic == kManual ? kDesktopPage : kConfigurationPage);
 }
 

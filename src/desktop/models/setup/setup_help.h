@@ -3,12 +3,15 @@
 #include <string>
 #include <string_view>
 
+#include "settings/key_table.h"
+
 namespace fotomill::desktop {
 
 // Pages of the documentation that are part of the program; docs/user/settings.md is in
 // settings/key_help.h.
 extern const std::string_view kConfigurationPage;  // docs/user/configuration.md
 extern const std::string_view kDesktopPage;        // docs/user/desktop.md, the manual
+extern const std::string_view kFormatsPage;        // docs/user/formats.md
 
 // A text of the documentation, ready to be shown.
 struct HelpText {
@@ -17,10 +20,18 @@ struct HelpText {
 };
 // The topic that stands for the whole manual.
 inline constexpr std::string_view kManual = "desktop";
-// The entry of a key, the part of the manual for a topic that a Help button names, or the manual;
-// for anything else the page about the configuration as a whole.
+// The topic of the page about formats, with the format list of Setup.
+inline constexpr std::string_view kFormatsTopic = "formats";
+// The entry of a key, the part of the manual for a topic that a Help button names, or one of the
+// pages above; for anything else the page about the configuration as a whole.
 HelpText HelpOn(std::string_view topic);
 // Whether a key has an entry of its own.
 bool HasHelpEntry(std::string_view key);
+
+// The numbers that a key takes, "0 to 100"; empty if it takes any.
+std::string LimitsText(const KeyRow& row);
+// The tip of a key's control: the first paragraph of its help, which is in English and left out in
+// other languages, and its name.
+std::string ControlTip(const KeyRow& row);
 
 }  // namespace fotomill::desktop

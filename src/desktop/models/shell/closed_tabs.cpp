@@ -8,7 +8,7 @@
 namespace fotomill::desktop {
 
 void ClosedTabs::Load() {
-  folders_ = LoadHistoryList(HistoryList::Tabs);
+  folders_ = OfferedEntries(HistoryList::Tabs, {});
   std::ranges::reverse(folders_);
 }
 

@@ -46,11 +46,33 @@ const ColorTransform& TransformOf(const std::vector<uint8_t>& profile) {
   return *transform;
 }
 
-Status LoadInto(const ViewRequest& request, ViewPicture& view) {
+// Hands on how far a file is, not too often.
+class ProgressReports : public ProgressSink {
+ public:
+  ProgressReports(const ViewLoader::Progress& report, const std::string& path)
+      : report_(report), path_(path) {}
+
+  void Step(int32_t done, int32_t total) override {
+    const double now = platform::MonotonicSeconds();
+    if (total <= 0 || now < next_) return;
+    next_ = now + kSeconds;
+    report_(path_, static_cast<int>(100 * static_cast<int64_t>(done) / total));
+  }
+
+ private:
+  static constexpr double kSeconds = 0.1;  // between two reports, and before the first
+
+  const ViewLoader::Progress& report_;
+  const std::string& path_;
+  double next_ = platform::MonotonicSeconds() + kSeconds;
+};
+
+Status LoadInto(const ViewRequest& request, ViewPicture& view, ProgressSink* progress) {
   PicturePointer picture;
   ReadRequest read{.fileName = request.path, .partial = true, .options = request.read};
   RETURN_IF_BAD(LoadPictureInfo(read, picture));
   read.page = request.page;
+  read.progress = progress;
   RETURN_IF_BAD(ReadPicture(read, *picture));
   return PrepareView(std::move(picture), view);
 }
@@ -115,14 +137,14 @@ Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixe
   return ToRgb(image, pixels);
 }
 
-ViewPicturePointer LoadViewPicture(const ViewRequest& request) {
+ViewPicturePointer LoadViewPicture(const ViewRequest& request, ProgressSink* progress) {
   const double start = platform::MonotonicSeconds();
   auto view = std::make_shared<ViewPicture>();
   view->request = request;
   view->status = Guarded([&] {
     const FolderScope folder(request.path);
     view->facts = platform::FactsOf(request.path);
-    return LoadInto(request, *view);
+    return LoadInto(request, *view, progress);
   });
   view->seconds = platform::MonotonicSeconds() - start;
   return view;
@@ -154,9 +176,10 @@ ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
   return turned;
 }
 
-ViewLoader::ViewLoader(uint64_t capacity, std::function<void()> wake)
+ViewLoader::ViewLoader(uint64_t capacity, std::function<void()> wake, Progress progress)
     : capacity_(capacity),
       wake_(std::move(wake)),
+      progress_(std::move(progress)),
       work_(Lane::Urgent, 1, [this] { return Next(); }) {}
 
 void ViewLoader::Want(std::vector<ViewRequest> requests) {
@@ -224,7 +247,8 @@ LatestWork::Piece ViewLoader::Next() {
 }
 
 void ViewLoader::Decode(const ViewRequest& request) {
-  ViewPicturePointer picture = LoadViewPicture(request);
+  ProgressReports reports(progress_, request.path);
+  ViewPicturePointer picture = LoadViewPicture(request, progress_ ? &reports : nullptr);
   {
     const std::lock_guard lock(mutex_);
     pictures_.push_back(std::move(picture));

@@ -81,15 +81,18 @@ Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixe
 // Makes a decoded picture what the request of `view` asks for. Statuses of PrepareForDisplay.
 Status PrepareView(PicturePointer picture, ViewPicture& view);
 // Decodes and prepares a picture; never null, its status tells a failure. Any thread.
-ViewPicturePointer LoadViewPicture(const ViewRequest& request);
+ViewPicturePointer LoadViewPicture(const ViewRequest& request, ProgressSink* progress = nullptr);
 // A turned copy of a picture that was loaded; null if there is no memory for it.
 ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn);
 
 // Decodes pictures ahead, apart, and keeps those that are wanted up to a number of bytes.
 class ViewLoader {
  public:
-  // `wake` is called on a thread of the pool whenever a wanted picture is there.
-  ViewLoader(uint64_t capacity, std::function<void()> wake);
+  // How far a file is decoded, in percent, a few times a second at most.
+  using Progress = std::function<void(const std::string& path, int percent)>;
+  // `wake` is called on a thread of the pool whenever a wanted picture is there, `progress` on the
+  // way to it.
+  ViewLoader(uint64_t capacity, std::function<void()> wake, Progress progress = {});
   ~ViewLoader() = default;  // waits for the picture that is decoded
   ViewLoader(const ViewLoader&) = delete;
   ViewLoader& operator=(const ViewLoader&) = delete;
@@ -111,6 +114,7 @@ class ViewLoader {
 
   const uint64_t capacity_;
   const std::function<void()> wake_;
+  const Progress progress_;
   mutable std::mutex mutex_;
   std::vector<ViewRequest> requests_;
   std::vector<ViewPicturePointer> pictures_;

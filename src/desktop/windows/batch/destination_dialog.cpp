@@ -5,13 +5,12 @@
 #include <wx/choice.h>
 #include <wx/combobox.h>
 #include <wx/dirdlg.h>
-#include <wx/msgdlg.h>
 #include <wx/radiobut.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
+#include <wx/textctrl.h>
 
 #include "core/choice_lists.h"
-#include "core/text.h"
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/setup/override_box.h"
@@ -19,8 +18,6 @@
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
-#include "registry/registry.h"
-#include "settings/history_list.h"
 #include "settings/settings.h"
 #include "texts/grouped_count.h"
 
@@ -34,81 +31,42 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
       files_(files),
       shownFolder_(platform::FolderOf(files_.front())),
       sizes_(std::move(sizes)) {
-  const int gap = FromDIP(8);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
-  const auto below = wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap * 3 / 2);
+  BuildFormat();
+  BuildOptions();
+  BuildFolder();
+  sizer->Add(formatSizer_, wxSizerFlags().Expand());
+  sizer->Add(folderSizer_, wxSizerFlags().Expand());
+  preview_ = new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize,
+                              wxST_NO_AUTORESIZE | wxST_ELLIPSIZE_MIDDLE);
+  sizer->Add(preview_, Below());
+  SetSizer(sizer);
+  BuildButtons(verb);
+  BindControls();
+  sizer->SetSizeHints(this);
+  ShowPart(0);
+  CentreOnParent();
+}
 
-  if (!sizes_.empty()) sizer->Add(NewSizeRow(), below);
-  auto* formatRow = new wxBoxSizer(wxHORIZONTAL);
-  formatRow->Add(new wxStaticText(this, wxID_ANY, Label("&Format:")),
-                 wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
+wxSizerFlags DestinationDialog::Below() const {
+  return wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, FromDIP(12));
+}
+
+void DestinationDialog::BuildFormat() {
+  const int gap = FromDIP(8);
+  auto* row = new wxBoxSizer(wxHORIZONTAL);
+  row->Add(new wxStaticText(this, wxID_ANY, Label("&Format:")),
+           wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
   format_ = new wxChoice(this, wxID_ANY);
   format_->SetName(Label("Format"));
   for (const DestinationFormat& format : formats_) format_->Append(Shown(format.description));
-  formatRow->Add(format_, wxSizerFlags(1));
+  format_->SetSelection(static_cast<int>(FirstFormat(formats_)));
+  row->Add(format_, wxSizerFlags(1));
   options_ = new wxButton(this, wxID_ANY, Label("&Options..."));
-  formatRow->Add(options_, wxSizerFlags().Border(wxLEFT, gap));
-  sizer->Add(formatRow, below);
-
-  beside_ = new wxRadioButton(this, wxID_ANY, Label("&Beside each picture"), wxDefaultPosition,
-                              wxDefaultSize, wxRB_GROUP);
-  into_ = new wxRadioButton(this, wxID_ANY, Label("&Into the folder"));
-  sizer->Add(beside_, below);
-  auto* folderRow = new wxBoxSizer(wxHORIZONTAL);
-  folder_ = new wxComboBox(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(420, -1)), 0,
-                           nullptr, 0, wxDefaultValidator, Label("Folder"));
-  for (const std::string& folder : RecentDestinations())
-    folder_->Append(wxString::FromUTF8(folder));
-  folder_->SetValue(folder_->GetCount() > 0 ? folder_->GetString(0)
-                                            : wxString::FromUTF8(shownFolder_));
-  folder_->AutoCompleteDirectories();
-  browse_ = new wxButton(this, wxID_ANY, Label("B&rowse..."));
-  folderRow->Add(into_, wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
-  folderRow->Add(folder_, wxSizerFlags(1));
-  folderRow->Add(browse_, wxSizerFlags().Border(wxLEFT, gap));
-  sizer->Add(folderRow, below);
-
-  reduce_ = new wxCheckBox(this, wxID_ANY, Label("Reduce &colors if the format supports fewer"));
-  orient_ = new wxCheckBox(this, wxID_ANY, Label("Rotate pictures &upright by EXIF orientation"));
-  metadata_ = new wxCheckBox(this, wxID_ANY, Label("&Keep EXIF, XMP and comments"));
-  reduce_->SetValue(true);
-  orient_->SetValue(settings.ExifAdjustOrientation != 0);
-  metadata_->SetValue(settings.PreserveEXIF != 0);
-  for (wxCheckBox* box : {reduce_, orient_, metadata_}) sizer->Add(box, below);
-  orient_->Show(sizes_.empty());  // operations always do
-
-  preview_ = new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize,
-                              wxST_NO_AUTORESIZE | wxST_ELLIPSIZE_MIDDLE);
-  sizer->Add(preview_, below);
-
-  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
-  // Translators: %2 is what the button does, "Convert".
-  ok_ = new wxButton(this, wxID_OK, LabelCount("%2 &%1 file", "%2 &%1 files", files_.size(), verb));
-  buttons->AddStretchSpacer();
-  buttons->Add(new wxButton(this, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
-  buttons->Add(ok_);
-  sizer->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap * 3 / 2));
-  ok_->SetDefault();
-
-  for (size_t i = 0; i < formats_.size(); ++i) {
-    if (EqualIgnoringCase(formats_[i].extension, settings.DefaultFileExtension))
-      format_->SetSelection(static_cast<int>(i));
-  }
-  if (format_->GetSelection() == wxNOT_FOUND) format_->SetSelection(0);
-  (settings.DestForceSourceDir != 0 ? beside_ : into_)->SetValue(true);
-  format_->Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { UpdateControls(); });
-  beside_->Bind(wxEVT_RADIOBUTTON, [this](wxCommandEvent&) { UpdateControls(); });
-  into_->Bind(wxEVT_RADIOBUTTON, [this](wxCommandEvent&) { UpdateControls(); });
-  folder_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateControls(); });
-  browse_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { Browse(); });
-  options_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { (void)ShowFormatOptions(); });
-  ok_->Bind(wxEVT_BUTTON,
-            [this](wxCommandEvent& event) { event.Skip(Accept(wxGetKeyState(WXK_SHIFT))); });
-  Bind(wxEVT_CHAR_HOOK, &DestinationDialog::OnKey, this);
-  SetSizerAndFit(sizer);
-  CentreOnParent();
-  UpdateControls();
-  ok_->SetFocus();
+  row->Add(options_, wxSizerFlags().Border(wxLEFT, gap));
+  formatSizer_ = new wxBoxSizer(wxVERTICAL);
+  if (!sizes_.empty()) formatSizer_->Add(NewSizeRow(), Below());
+  formatSizer_->Add(row, Below());
 }
 
 wxSizer* DestinationDialog::NewSizeRow() {
@@ -124,6 +82,88 @@ wxSizer* DestinationDialog::NewSizeRow() {
   return row;
 }
 
+void DestinationDialog::BuildFolder() {
+  const int gap = FromDIP(8);
+  folderSizer_ = new wxBoxSizer(wxVERTICAL);
+  beside_ = new wxRadioButton(this, wxID_ANY, Label("&Beside each picture"), wxDefaultPosition,
+                              wxDefaultSize, wxRB_GROUP);
+  into_ = new wxRadioButton(this, wxID_ANY, Label("&Into the folder"));
+  (settings.DestForceSourceDir != 0 ? beside_ : into_)->SetValue(true);
+  folderSizer_->Add(beside_, Below());
+  auto* row = new wxBoxSizer(wxHORIZONTAL);
+  folder_ = new wxComboBox(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(420, -1)), 0,
+                           nullptr, 0, wxDefaultValidator, Label("Folder"));
+  for (const std::string& folder : RecentDestinations(shownFolder_))
+    folder_->Append(wxString::FromUTF8(folder));
+  folder_->SetSelection(0);
+  folder_->AutoCompleteDirectories();
+  browse_ = new wxButton(this, wxID_ANY, Label("B&rowse..."));
+  row->Add(into_, wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
+  row->Add(folder_, wxSizerFlags(1));
+  row->Add(browse_, wxSizerFlags().Border(wxLEFT, gap));
+  folderSizer_->Add(row, Below());
+}
+
+// Behind the format, with which they are shown.
+void DestinationDialog::BuildOptions() {
+  reduce_ = new wxCheckBox(this, wxID_ANY, Label("Reduce &colors if the format supports fewer"));
+  orient_ = new wxCheckBox(this, wxID_ANY, Label("Rotate pictures &upright by EXIF orientation"));
+  metadata_ = new wxCheckBox(this, wxID_ANY, Label("&Keep EXIF, XMP and comments"));
+  reduce_->SetValue(true);
+  orient_->SetValue(settings.ExifAdjustOrientation != 0);
+  metadata_->SetValue(settings.PreserveEXIF != 0);
+  for (wxCheckBox* box : {reduce_, orient_, metadata_}) formatSizer_->Add(box, Below());
+  if (settings.PromptForFileComments == 0) return;
+  auto* row = new wxBoxSizer(wxHORIZONTAL);
+  row->Add(new wxStaticText(this, wxID_ANY, Label("Co&mment:")),
+           wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(8)));
+  comment_ = new wxTextCtrl(this, wxID_ANY);
+  comment_->SetName(Label("Comment"));
+  comment_->SetHint(Label("Empty: each picture keeps its own"));
+  row->Add(comment_, wxSizerFlags(1));
+  formatSizer_->Add(row, Below());
+}
+
+void DestinationDialog::BuildButtons(const wxString& verb) {
+  const int gap = FromDIP(8);
+  auto* buttons = new wxBoxSizer(wxHORIZONTAL);
+  // Translators: %2 is what the button does, "Convert".
+  okText_ = LabelCount("%2 &%1 file", "%2 &%1 files", files_.size(), verb);
+  ok_ = new wxButton(this, wxID_OK, okText_);
+  buttons->AddStretchSpacer();
+  buttons->Add(new wxButton(this, wxID_CANCEL), wxSizerFlags().Border(wxRIGHT, gap));
+  buttons->Add(ok_);
+  GetSizer()->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap * 3 / 2));
+  ok_->SetDefault();
+}
+
+void DestinationDialog::BindControls() {
+  format_->Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { UpdateControls(); });
+  beside_->Bind(wxEVT_RADIOBUTTON, [this](wxCommandEvent&) { UpdateControls(); });
+  into_->Bind(wxEVT_RADIOBUTTON, [this](wxCommandEvent&) { UpdateControls(); });
+  folder_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateControls(); });
+  metadata_->Bind(wxEVT_CHECKBOX, [this](wxCommandEvent&) { UpdateControls(); });
+  browse_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { Browse(); });
+  options_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { (void)ShowFormatOptions(); });
+  ok_->Bind(wxEVT_BUTTON,
+            [this](wxCommandEvent& event) { event.Skip(Accept(wxGetKeyState(WXK_SHIFT))); });
+  Bind(wxEVT_CHAR_HOOK, &DestinationDialog::OnKey, this);
+}
+
+void DestinationDialog::ShowPart(size_t part) {
+  part_ = part;
+  const bool format = parts_[part] != DestinationPart::Folder;
+  GetSizer()->Show(formatSizer_, format, true);
+  orient_->Show(format && sizes_.empty());  // operations always do
+  GetSizer()->Show(folderSizer_, parts_[part] != DestinationPart::Format, true);
+  ok_->SetLabel(part + 1 < parts_.size() ? Label("Nex&t") : okText_);
+  UpdateControls();
+  Fit();
+  ok_->SetFocus();
+  static constexpr const char* kNames[] = {"format", "folder", "both"};
+  LogEvent("destination-part", kNames[static_cast<size_t>(parts_[part])]);
+}
+
 DestinationChoice DestinationDialog::Choice() const {
   DestinationChoice choice;
   choice.extension = formats_[static_cast<size_t>(format_->GetSelection())].extension;
@@ -132,6 +172,7 @@ DestinationChoice DestinationDialog::Choice() const {
   choice.autoOrient = orient_->GetValue();
   choice.keepMetadata = metadata_->GetValue();
   if (size_ != nullptr) choice.step = sizes_[static_cast<size_t>(size_->GetSelection())].step;
+  if (comment_ != nullptr && choice.keepMetadata) choice.comment = Utf8(comment_->GetValue());
   return choice;
 }
 
@@ -139,7 +180,8 @@ void DestinationDialog::UpdateControls() {
   const DestinationChoice choice = Choice();
   folder_->Enable(into_->GetValue());
   browse_->Enable(into_->GetValue());
-  options_->Show(HasOverrideBox(choice.extension));
+  if (comment_ != nullptr) comment_->Enable(choice.keepMetadata);
+  options_->Show(parts_[part_] != DestinationPart::Folder && HasOverrideBox(choice.extension));
   const std::string problem = DestinationProblem(choice);
   ok_->Enable(problem.empty() && (!into_->GetValue() || !choice.folder.empty()));
   const std::string outlook = problem.empty() ? OutlookText(choice) : problem;
@@ -179,16 +221,17 @@ void DestinationDialog::OnKey(wxKeyEvent& event) {
   if (ok_->IsEnabled() && Accept(true)) EndModal(wxID_OK);
 }
 
-// Takes the choice. Shift brings up the format's own options on the way; Cancel in them goes back
-// to this step.
+// Takes the choice, or goes on to the next part. Shift brings up the format's own options on the
+// way; Cancel in them goes back to this step.
 bool DestinationDialog::Accept(bool shift) {
-  const bool options = shift && ShiftOpensOverrideBox() && HasOverrideBox(Choice().extension);
+  const bool options = shift && ShiftOpensOverrideBox() && HasOverrideBox(Choice().extension) &&
+                       parts_[part_] != DestinationPart::Folder;
   if (options && !ShowFormatOptions()) return false;
-  const DestinationChoice choice = Choice();
-  if (!choice.folder.empty())
-    (void)AddToHistoryList(HistoryList::Destination, platform::AbsolutePath(choice.folder));
-  settings.DefaultFileExtension.AssignCut(choice.extension);
-  settings.DestForceSourceDir = choice.folder.empty() ? 1 : 0;
+  if (part_ + 1 < parts_.size()) {
+    ShowPart(part_ + 1);
+    return false;
+  }
+  KeepChoice(Choice(), shownFolder_);
   return true;
 }
 

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <wx/dialog.h>
+#include <wx/sizer.h>
 
 #include <string>
 #include <vector>
@@ -14,10 +15,12 @@ class wxChoice;
 class wxComboBox;
 class wxRadioButton;
 class wxStaticText;
+class wxTextCtrl;
 
 namespace fotomill::desktop {
 
-// The destination step of a function: format, folder, and what becomes of colors and metadata.
+// The destination step of a function: format, folder, and what becomes of colors and metadata. The
+// folder comes in the same window at once, behind the format, or not at all (DestinationParts).
 class DestinationDialog : public wxDialog {
  public:
   // `verb` is what OK does: "Convert". With `sizes`, pictures are also resized to one of them.
@@ -26,7 +29,14 @@ class DestinationDialog : public wxDialog {
   DestinationChoice Choice() const;
 
  private:
+  void BuildFormat();
   wxSizer* NewSizeRow();
+  void BuildFolder();
+  void BuildOptions();
+  void BuildButtons(const wxString& verb);
+  void BindControls();
+  wxSizerFlags Below() const;  // of a row under the one before
+  void ShowPart(size_t part);
   void UpdateControls();
   bool ShowFormatOptions();  // false: canceled
   std::string OutlookText(const DestinationChoice& choice) const;
@@ -37,6 +47,11 @@ class DestinationDialog : public wxDialog {
   const std::vector<std::string> files_;
   const std::string shownFolder_;  // in which relative folders are
   const std::vector<DestinationFormat> formats_ = DestinationFormats();
+  const std::vector<DestinationPart> parts_ = DestinationParts();
+  size_t part_ = 0;  // that is shown
+  wxString okText_;
+  wxSizer* formatSizer_ = nullptr;  // of the controls for each part
+  wxSizer* folderSizer_ = nullptr;
   const std::vector<NamedSize> sizes_;
   wxChoice* size_ = nullptr;  // without sizes, none
   wxChoice* format_ = nullptr;
@@ -48,6 +63,7 @@ class DestinationDialog : public wxDialog {
   wxCheckBox* reduce_ = nullptr;
   wxCheckBox* orient_ = nullptr;
   wxCheckBox* metadata_ = nullptr;
+  wxTextCtrl* comment_ = nullptr;  // null unless PromptForFileComments is on
   wxStaticText* preview_ = nullptr;
   wxButton* ok_ = nullptr;
 };

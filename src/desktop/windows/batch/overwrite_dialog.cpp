@@ -10,6 +10,7 @@
 #include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/widgets/bitmaps.h"
 #include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/text_sizes.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
@@ -64,7 +65,7 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
   previews_ = check(kPreviewsText, question.checks.previews);
   notify_ = check(kNotifyText, question.checks.notify);
   auto* note = new wxStaticText(this, wxID_ANY, Label(kNotifyNote.data()));
-  note->SetFont(note->GetFont().Smaller());
+  note->SetFont(FontOf(*note, TextSize::Small));
   sizer->Add(note, wxSizerFlags().Border(wxLEFT | wxRIGHT, gap * 3));
 
   auto* buttons = new wxBoxSizer(wxHORIZONTAL);

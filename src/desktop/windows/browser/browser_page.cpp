@@ -28,6 +28,8 @@ namespace {
 // pages of the book, the second made when it is first shown
 enum View { kThumbnailView, kDetailsView };
 
+constexpr BrowserModes kNoModes{-1, -1, -1};
+
 }  // namespace
 
 BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails,
@@ -137,6 +139,7 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
 // How the folder was last asked to be shown, else as all folders are here; what the folder itself
 // says wins, and continues.
 void BrowserPage::UseViewOf(const std::string& folder) {
+  override_ = ModesForFolder(folder, kNoModes);
   const FolderView kept = host_.Views().Find(folder, base_);
   FolderView view = kept;
   view.modes = ModesForFolder(folder, kept.modes);
@@ -144,7 +147,17 @@ void BrowserPage::UseViewOf(const std::string& folder) {
   model_.SetView(view);
 }
 
-void BrowserPage::Reload() { reader_.List(model_.Folder(), model_.ItemCount() == 0); }
+void BrowserPage::Reload() {
+  TakeChangedOverride();
+  reader_.List(model_.Folder(), model_.ItemCount() == 0);
+}
+
+// What the user chose since the folder was opened stays until the folder says something else.
+void BrowserPage::TakeChangedOverride() {
+  if (ModesForFolder(model_.Folder(), kNoModes) == override_) return;
+  UseViewOf(model_.Folder());
+  ShowView();
+}
 
 void BrowserPage::ShowListing(FolderListing listing, bool complete) {
   const size_t count = listing.items.size();

@@ -105,6 +105,7 @@ class BrowserPage : public wxPanel {
   void ShowView();
   void ShowLines();
   void UseViewOf(const std::string& folder);
+  void TakeChangedOverride();
   void ShowAs(const FolderView& view);
   void ChooseView(const FolderView& view);
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
@@ -117,6 +118,7 @@ class BrowserPage : public wxPanel {
   ThumbnailService& thumbnails_;
   BrowserModel model_;
   FolderView base_;  // of folders of which nothing is kept
+  BrowserModes override_;  // what the folder's own file says; -1: nothing
   FolderTrail trail_;
   std::string wantedFocus_;
   int64_t wantedScroll_ = -1;

@@ -5,6 +5,7 @@
 #include <algorithm>
 
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/widgets/text_sizes.h"
 #include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
@@ -34,6 +35,7 @@ DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& c
       events_(std::move(events)),
       lines_(new Lines(model)) {
   AssociateModel(lines_.get());
+  SetFont(FontOf(*this, TextSize::Normal));
   ShowColumns();
   Bind(wxEVT_DATAVIEW_SELECTION_CHANGED, [this](wxDataViewEvent&) { ReadSelection(); });
   Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [this](wxDataViewEvent& event) {

@@ -11,6 +11,7 @@
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/screen_reader.h"
+#include "desktop/windows/widgets/text_sizes.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
@@ -81,6 +82,7 @@ bool ThumbnailCanvas::ListsNames() const { return model_.Modes().view == choice:
 
 void ThumbnailCanvas::MeasureCells() {
   SetFont(wxSystemSettings::GetFont(wxSYS_DEFAULT_GUI_FONT));
+  SetFont(FontOf(*this, TextSize::ThumbnailName));
   textHeight_ = GetCharHeight();
   const int padding = FromDIP(kPadding);
   if (ListsNames()) {

@@ -24,9 +24,9 @@ std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title,
   auto* folder =
       new wxComboBox(&dialog, wxID_ANY, "", wxDefaultPosition, dialog.FromDIP(wxSize(460, -1)), 0,
                      nullptr, wxTE_PROCESS_ENTER, wxDefaultValidator, Label("Folder"));
-  for (const std::string& entry : LoadHistoryList(history)) {
-    if (entry != kDefaultEntry) folder->Append(wxString::FromUTF8(entry));
-  }
+  const std::string builtIn = platform::SpecialFolderPath(platform::SpecialFolder::Pictures);
+  for (const std::string& entry : OfferedEntries(history, builtIn))
+    folder->Append(wxString::FromUTF8(entry));
   if (folder->GetCount() > 0) folder->SetSelection(0);
   folder->AutoCompleteDirectories();
   auto* browse = new wxButton(&dialog, wxID_ANY, Label("B&rowse..."));
@@ -56,7 +56,7 @@ std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title,
   LogEvent("prompt", "folder");
   if (dialog.ShowModal() != wxID_OK) return std::nullopt;
   const std::string answer = platform::AbsolutePath(Utf8(folder->GetValue()));
-  (void)AddToHistoryList(history, answer);
+  (void)AddChoice(history, answer, builtIn);
   return answer;
 }
 

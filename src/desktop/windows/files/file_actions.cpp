@@ -54,8 +54,9 @@ std::string Count(size_t files) { return TrGroupedCount("%1 file", "%1 files", f
 
 }  // namespace
 
-FileActions::FileActions(Shell& shell)
-    : shell_(shell), undo_(static_cast<size_t>(std::clamp(settings.UndoLevels, 1, 1000))) {}
+FileActions::FileActions(Shell& shell) : shell_(shell), undo_(UndoLimitFromSettings()) {}
+
+void FileActions::SettingsChanged() { undo_.SetLimit(UndoLimitFromSettings()); }
 
 void FileActions::Run(const std::string& what, Work work, Then then) {
   if (busy_) return shell_.Report(Tr("Please wait for the previous file operation."));

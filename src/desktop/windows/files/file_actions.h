@@ -50,6 +50,7 @@ class FileActions : public wxEvtHandler {
   // Somebody else did it; it can be taken back like the rest.
   void NoteDone(FileOperation operation) { undo_.Add(std::move(operation)); }
   const UndoList& Undoable() const { return undo_; }  // for the state and names of Undo and Redo
+  void SettingsChanged();              // applies UndoLevels
   bool Busy() const { return busy_; }  // something is being done; nothing else can begin
   void Stop() { task_.Stop(); }
 

@@ -1,26 +1,90 @@
 #include "desktop/windows/files/open_with.h"
 
+#include <wx/app.h>
 #include <wx/control.h>
+#include <wx/frame.h>
 #include <wx/menu.h>
+#include <wx/msgdlg.h>
 
+#include <functional>
+#include <memory>
+#include <utility>
+
+#include "batch/external_program.h"
+#include "core/workers/background_task.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
-#include "platform/programs.h"
+#include "platform/clock.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-void Open(Shell& shell, const platform::Program& program, const std::vector<std::string>& files) {
-  const bool started = platform::OpenWith(program, files);
-  LogEvent("open-with", program.name + (started ? "" : " failed"));
-  shell.Report(started ? Tr("%1 was started.", program.name)
-                       : Tr("%1 could not be started.", program.name));
-}
+constexpr double kHandOverSeconds = 2;  // a program that ends earlier has handed over to another
+
+// The command that was chosen, or else the registered program's. Talks to the window's thread as
+// long as the window is there.
+class Host : public ExternalProgramHost {
+ public:
+  Host(Shell& shell, StopToken stop, std::vector<std::string> command)
+      : shell_(shell), stop_(std::move(stop)), command_(std::move(command)) {}
+
+  std::vector<std::string> CommandFor(const std::string&) override { return command_; }
+  void ShowMessage(std::string_view text) override {
+    OnWindow([&shell = shell_, text] {
+      LogEvent("prompt", std::string(text));
+      wxMessageBox(Label(text.data()), "Fotomill Professional", wxOK | wxICON_WARNING,
+                   &shell.Window());
+    });
+  }
+  // The program may have changed the file.
+  void TakeFocus() override {
+    const bool raise = platform::MonotonicSeconds() - started_ >= kHandOverSeconds;
+    OnWindow([&shell = shell_, raise] {
+      shell.FilesChanged();
+      if (raise) shell.Window().Raise();
+      LogEvent("external-program", raise ? "ended, raised" : "ended");
+    });
+  }
+
+ private:
+  void OnWindow(std::function<void()> action) const {
+    if (stop_.Asked()) return;
+    wxTheApp->CallAfter([stop = stop_, action = std::move(action)] {
+      if (!stop.Asked()) action();
+    });
+  }
+
+  Shell& shell_;
+  const StopToken stop_;
+  const std::vector<std::string> command_;
+  const double started_ = platform::MonotonicSeconds();
+};
 
 }  // namespace
+
+void ExternalPrograms::Start(const std::string& file, std::vector<std::string> command) {
+  LogEvent("external-program", "starts for " + file);
+  const auto host = std::make_shared<Host>(shell_, stop_.Token(), std::move(command));
+  const auto run = [host, file] { (void)OpenWithExternalProgram(*host, file, 0); };
+  if (!RunLoose(run)) host->ShowMessage(kNoExternalProgram);
+}
+
+void ExternalPrograms::Open(const std::string& file) {
+  const std::vector<platform::Program> programs = platform::ProgramsFor(file);
+  if (programs.empty()) return Start(file, {});
+  OpenWith(programs.front(), {file});
+}
+
+void ExternalPrograms::OpenWith(const platform::Program& program,
+                                const std::vector<std::string>& files) {
+  LogEvent("open-with", program.name);
+  std::vector<std::vector<std::string>> commands = platform::CommandsFor(program, files);
+  if (commands.empty()) return Start(files.front(), {});
+  for (size_t i = 0; i < commands.size(); ++i) Start(files[i], std::move(commands[i]));
+}
 
 wxMenu* NewOpenWithMenu(Shell& shell, const std::vector<std::string>& files) {
   if (files.empty()) return nullptr;
@@ -33,7 +97,9 @@ wxMenu* NewOpenWithMenu(Shell& shell, const std::vector<std::string>& files) {
   for (const platform::Program& program : programs) {
     const int id = menu->Append(wxID_ANY, wxControl::EscapeMnemonics(Shown(program.name)))->GetId();
     menu->Bind(
-        wxEVT_MENU, [&shell, program, files](wxCommandEvent&) { Open(shell, program, files); }, id);
+        wxEVT_MENU,
+        [&shell, program, files](wxCommandEvent&) { shell.Programs().OpenWith(program, files); },
+        id);
   }
   return menu;
 }

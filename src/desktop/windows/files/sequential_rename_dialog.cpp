@@ -38,6 +38,8 @@ namespace {
 constexpr size_t kMostPreviewed = 200;
 constexpr int kMostNumber = 32760, kMostIncrement = 1000;
 
+std::string_view BuiltInBase() { return DefaultText(KeyOf(KeyNumber::SequentialRenameBaseName)); }
+
 // Keeps what a run would do instead of showing it.
 class PreviewBox : public ProgressBox {
  public:
@@ -110,9 +112,8 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent,
       new wxComboBox(this, wxID_ANY, wxString::FromUTF8(settings.SequentialRenameBaseName.c_str()),
                      wxDefaultPosition, FromDIP(wxSize(300, -1)), 0, nullptr, 0, wxDefaultValidator,
                      Label("Base name"));
-  for (const std::string& entry : LoadHistoryList(HistoryList::RenameBases)) {
-    if (entry != kDefaultEntry) base_->Append(wxString::FromUTF8(entry));
-  }
+  for (const std::string& entry : OfferedEntries(HistoryList::RenameBases, BuiltInBase()))
+    base_->Append(wxString::FromUTF8(entry));
   grid->Add(base_, wxSizerFlags(1).Expand());
   const auto spin = [&](const wxString& name, int least, int most, int value) {
     auto* control = new wxSpinCtrl(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize,
@@ -184,7 +185,7 @@ void SequentialRenameDialog::StoreControls() const {
   settings.SequentialRenameIncrement = increment_->GetValue();
   for (size_t i = 0; i < std::size(kFlags); ++i)
     StoreNumber(KeyOf(kFlags[i].key), flags_[i]->GetValue() ? 1 : 0);
-  (void)AddToHistoryList(HistoryList::RenameBases, settings.SequentialRenameBaseName);
+  (void)AddChoice(HistoryList::RenameBases, settings.SequentialRenameBaseName, BuiltInBase());
   (void)SaveConfiguration();
 }
 

@@ -1,6 +1,9 @@
 #include "desktop/windows/info/report_tree.h"
 
+#include <wx/dataview.h>
+
 #include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/text_sizes.h"
 #include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
@@ -8,6 +11,7 @@ namespace fotomill::desktop {
 ReportTree::ReportTree(wxWindow* parent)
     : wxTreeListCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxTL_SINGLE) {
   SetName(Label("Facts"));
+  GetDataView()->SetFont(FontOf(*this, TextSize::Normal));
   AppendColumn(Label("Name"), TextWidth(*this, 260), wxALIGN_LEFT, wxCOL_RESIZABLE);
   AppendColumn(Label("Value"), TextWidth(*this, 360), wxALIGN_LEFT, wxCOL_RESIZABLE);
 }

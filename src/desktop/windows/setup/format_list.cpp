@@ -2,7 +2,9 @@
 
 #include <wx/msgdlg.h>
 
+#include "desktop/models/setup/setup_help.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "registry/registry.h"
@@ -52,6 +54,7 @@ FormatList::FormatList(wxWindow* parent)
        [toggle](wxDataViewEvent& event) { toggle(event.GetItem()); });
   Bind(wxEVT_CHAR_HOOK, [this, toggle](wxKeyEvent& event) {
     if (event.GetKeyCode() == WXK_SPACE) return toggle(GetSelection());
+    if (event.GetKeyCode() == WXK_F1) return ShowHelp(*this, kFormatsTopic);
     event.Skip();
   });
   if (GetItemCount() > 0) SetCurrentItem(RowToItem(0));

@@ -17,6 +17,7 @@
 #include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/setup/color_button.h"
 #include "desktop/windows/setup/mask_list.h"
+#include "desktop/windows/widgets/text_sizes.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "texts/texts.h"
 
@@ -24,11 +25,12 @@ namespace fotomill::desktop {
 
 namespace {
 
-// device-independent pixels, so that controls of all groups stand in one line
-constexpr int kLabelWidth = 330;
+// Device-independent pixels. Labels of all groups are as wide as the widest, so that the controls
+// are aligned.
+constexpr int kLeastLabelWidth = 330;
 const wxString kMark = wxString::FromUTF8("\xE2\x97\x8F");
 
-enum Column { kMarkColumn, kLabelColumn, kControlColumn };
+enum Column { kMarkColumn, kLabelColumn, kControlColumn, kLimitsColumn };
 
 wxArrayString FunctionNames() {
   wxArrayString names;
@@ -37,11 +39,13 @@ wxArrayString FunctionNames() {
   return names;
 }
 
-// What a control's tip says: the first sentence or so of its help.
-wxString TipOf(const KeyRow& row) {
-  const HelpText help = HasHelpEntry(row.name) ? HelpOn(row.name) : HelpText{};
-  const wxString text = Shown(help.text.substr(0, help.text.find("\n\n")));
-  return text.empty() ? wxString(row.name) : text + "\n\n" + row.name;
+// The toolkit's field takes anything and makes a number of it when it is left.
+void RefuseLetters(wxKeyEvent& event, bool negative) {
+  const int key = event.GetKeyCode();
+  const bool control = key < WXK_SPACE || key == WXK_DELETE || key >= WXK_START ||
+                       event.ControlDown() || event.AltDown();
+  if (control || (key >= '0' && key <= '9') || (negative && key == '-')) return event.Skip();
+  wxBell();
 }
 
 wxWindow* MakeSpin(wxWindow* box, const KeyRow& row, wxWindowID id) {
@@ -52,6 +56,10 @@ wxWindow* MakeSpin(wxWindow* box, const KeyRow& row, wxWindowID id) {
   const SpinRange limits = SpinRangeOf(row);
   auto* spin = new wxSpinCtrl(box, id, wxEmptyString, wxDefaultPosition, wxDefaultSize,
                               wxSP_ARROW_KEYS, limits.minimum, limits.maximum);
+  const auto refuse = [negative = limits.minimum < 0](wxKeyEvent& event) {
+    RefuseLetters(event, negative);
+  };
+  spin->Bind(wxEVT_CHAR, refuse);
   return spin;
 }
 
@@ -78,6 +86,12 @@ SettingsPanel::SettingsPanel(wxWindow* parent, std::vector<SetupItem> items,
                        wxVSCROLL | wxTAB_TRAVERSAL),
       items_(std::move(items)) {
   const int gap = FromDIP(8);
+  labelWidth_ = FromDIP(kLeastLabelWidth);
+  for (const SetupItem& item : items_) {
+    const bool beside = (KeyOf(item.key).type & KEY_FLAG) == 0;
+    if (beside)
+      labelWidth_ = std::max(labelWidth_, GetTextExtent(Label(item.label)).x + FromDIP(4));
+  }
   auto* column = new wxBoxSizer(wxVERTICAL);
   if (above) {
     wxWindow* const window = above(this);
@@ -128,18 +142,24 @@ void SettingsPanel::AddItem(wxWindow* box, wxSizer* sizer, const SetupItem& item
   wxStaticText* label = flag ? nullptr : new wxStaticText(box, wxID_ANY, text);
   wxWindow* control = MakeControl(box, item);
   control->SetName(text);
-  control->SetToolTip(TipOf(row));
+  control->SetToolTip(wxString::FromUTF8(ControlTip(row)));
   grid->Add(mark, {line, kMarkColumn}, {1, 1},
             wxALIGN_CENTER_VERTICAL | wxRESERVE_SPACE_EVEN_IF_HIDDEN);
   if (flag) {
     grid->Add(control, {line, kLabelColumn}, {1, 2}, wxALIGN_CENTER_VERTICAL);
     return;
   }
-  label->SetMinSize(wxSize(std::max(label->GetBestSize().x, FromDIP(kLabelWidth)), -1));
+  label->SetMinSize(wxSize(labelWidth_, -1));
   const int middle = IsFunctionMask(item.key) ? wxALIGN_TOP : wxALIGN_CENTER_VERTICAL;
   grid->Add(label, {line, kLabelColumn}, {1, 1}, middle);
   control->SetMinSize(FromDIP(wxSize(IsWide(row) ? 240 : -1, IsFunctionMask(item.key) ? 170 : -1)));
-  grid->Add(control, {line, kControlColumn}, {1, 1}, middle);
+  const bool limited = (row.type & KEY_SPIN) != 0;
+  grid->Add(control, {line, kControlColumn}, {1, limited ? 1 : 2}, middle);
+  if (limited) {
+    auto* limits = new wxStaticText(box, wxID_ANY, wxString::FromUTF8(LimitsText(row)));
+    limits->SetFont(FontOf(*limits, TextSize::Small));
+    grid->Add(limits, {line, kLimitsColumn}, {1, 1}, middle);
+  }
 }
 
 size_t SettingsPanel::UpdateMarks(const BoundControls& controls) {

@@ -34,6 +34,7 @@ class SettingsPanel : public wxScrolledWindow {
   void AddItem(wxWindow* box, wxSizer* grid, const SetupItem& item);
 
   const std::vector<SetupItem> items_;
+  int labelWidth_ = 0;
   std::vector<wxStaticText*> marks_;
 };
 

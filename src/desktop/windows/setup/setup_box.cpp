@@ -16,6 +16,7 @@
 
 #include "core/data_folder.h"
 #include "desktop/models/setup/configuration_transfer.h"
+#include "desktop/models/setup/setup_help.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/dialogs/help.h"
@@ -235,7 +236,11 @@ wxSizer* SetupBox::BuildButtons() {
   Bind(
       wxEVT_BUTTON, [this](wxCommandEvent&) { (void)Apply(); }, wxID_APPLY);
   Bind(
-      wxEVT_BUTTON, [this](wxCommandEvent&) { ShowHelp(*this, kGeneralHelpPage); }, wxID_HELP);
+      wxEVT_BUTTON,
+      [this](wxCommandEvent&) {
+        ShowHelp(*this, page_ == SetupPage::Formats ? kFormatsTopic : kGeneralHelpPage);
+      },
+      wxID_HELP);
   return row;
 }
 

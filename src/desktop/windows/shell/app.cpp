@@ -1,12 +1,14 @@
 #include <wx/app.h>
 #include <wx/cmdline.h>
 #include <wx/image.h>
+#include <wx/msgdlg.h>
 #include <wx/translation.h>
 #include <wx/weakref.h>
 
 #include <cstdlib>
 #include <functional>
 #include <memory>
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -18,8 +20,10 @@
 #include "desktop/windows/setup/override_box.h"
 #include "desktop/windows/shell/frame_session.h"
 #include "desktop/windows/shell/main_frame.h"
+#include "desktop/windows/shell/startup_window.h"
 #include "desktop/windows/view/screen_profile.h"
 #include "desktop/windows/widgets/control_names.h"
+#include "desktop/windows/widgets/text_sizes.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "files/previous_file.h"
 #include "platform/first_start.h"
@@ -32,6 +36,7 @@
 #include "settings/configuration.h"
 #include "settings/format_switches.h"
 #include "settings/plugin_settings.h"
+#include "settings/previous_version.h"
 
 namespace fotomill::desktop {
 
@@ -57,6 +62,7 @@ class App : public wxApp {
   // The language comes first: the toolkits choose theirs when they start.
   bool Initialize(int& count, wxChar** arguments) override {
     SetDataFolder({});
+    carried_ = CarryOverAtFirstStart();
     (void)LoadConfiguration();
     (void)StartTexts(StoredLanguage());
     return wxApp::Initialize(count, arguments);
@@ -98,10 +104,14 @@ class App : public wxApp {
     std::vector<uint8_t> screen = ReadScreenProfile();
     LogEvent("screen-profile", std::to_string(screen.size()));
     SetScreenProfile(std::move(screen));
+    const EarlySettings early = ReadEarlySettings();
+    SetTextSizes(early);
+    ShowStartupWindow(early);
     frame_ = new MainFrame;
     frame_->Session().RestorePlace();
     frame_->Show();
     LogEvent("frame");
+    ReportCarryOver();
     frame_->OpenStart(argument_, true);
     firstStart_.Listen([this](std::shared_ptr<platform::LaterStart> start) {
       CallAfter([this, start = std::move(start)] { TakeOver(*start); });
@@ -139,6 +149,17 @@ class App : public wxApp {
     translations->AddStdCatalog();
   }
 
+  // In the status bar; a failure must not be missed.
+  void ReportCarryOver() {
+    if (!carried_) return;
+    const std::string text = CarryOverText(*carried_);
+    LogEvent("carried-over", text);
+    frame_->Report(text);
+    if (carried_->failed.empty()) return;
+    CallAfter(
+        [text] { wxMessageBox(Shown(text), "Fotomill Professional", wxOK | wxICON_WARNING); });
+  }
+
   bool HandOver() {
     const auto standing = firstStart_.Begin(NameOfInstance(), argument_, kHandOverSeconds);
     if (standing == platform::FirstStart::Standing::HandedOver) LogEvent("handed-over", argument_);
@@ -154,6 +175,7 @@ class App : public wxApp {
   }
 
   std::string argument_;  // an absolute path, or empty
+  std::optional<CarryOver> carried_;
   bool newInstance_ = false;
   bool formatsStarted_ = false;
   wxWeakRef<MainFrame> frame_;

@@ -6,6 +6,7 @@
 #include "desktop/windows/dialogs/command_finder.h"
 #include "desktop/windows/dialogs/select_dialog.h"
 #include "desktop/windows/files/file_actions.h"
+#include "desktop/windows/files/open_dialog.h"
 #include "desktop/windows/files/sequential_rename_dialog.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/folder_pane.h"
@@ -124,6 +125,8 @@ constexpr const char* kHelp = TrLater("&Help");
 
 // clang-format off
 constexpr Command kCommands[] = {
+    {kFile, TrLater("&Open..."),            "Ctrl+O",       TrLater("Opens a picture in a view window."), Needs::Nothing, AskAndOpenFile},
+    {kFile, nullptr},
     {kFile, TrLater("New &tab"),            "Ctrl+T",       TrLater("Opens this folder in a new tab."), Needs::Nothing, NewTab},
     {kFile, TrLater("&Close tab"),          "Ctrl+W",       TrLater("Closes this tab."), Needs::Nothing, CloseTab},
     {kFile, TrLater("&Reopen closed tab"),  "Ctrl+Shift+T", TrLater("Reopens the last closed tab."), Needs::ClosedTab, ReopenTab},

@@ -1,5 +1,6 @@
 #include "desktop/windows/shell/frame_menus.h"
 
+#include <wx/control.h>
 #include <wx/frame.h>
 #include <wx/menu.h>
 
@@ -7,16 +8,22 @@
 #include <string>
 #include <vector>
 
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/files/open_with.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/commands.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
+#include "settings/history_list.h"
 
 namespace fotomill::desktop {
 
 namespace {
+
+constexpr size_t kFileMenu = 0, kRecentPlace = 1;  // in the menu bar, in its menu
+constexpr int kMostRecent = 1000;
+constexpr int kRecentId = kFirstCommandId + 1000;  // of the menu; its items follow
 
 // With its key, as menus show it and take it.
 wxString MenuText(const Command& command) {
@@ -29,6 +36,7 @@ wxString MenuText(const Command& command) {
 
 FrameMenus::FrameMenus(Shell& shell) : shell_(shell) {
   BuildBar();
+  AddRecentFiles();
   BindSecondKeys();
   BindCommands();
 }
@@ -47,6 +55,36 @@ void FrameMenus::BuildBar() {
                  command.checked != nullptr ? wxITEM_CHECK : wxITEM_NORMAL);
   }
   shell_.Window().SetMenuBar(bar);
+}
+
+void FrameMenus::AddRecentFiles() {
+  recent_ = new wxMenu;
+  wxMenu* const file = shell_.Window().GetMenuBar()->GetMenu(kFileMenu);
+  file->Insert(kRecentPlace, kRecentId, Label("R&ecent files"), recent_,
+               Label("Opens a picture again that was opened before."));
+  shell_.Window().Bind(
+      wxEVT_MENU,
+      [this](wxCommandEvent& event) {
+        const auto place = static_cast<size_t>(event.GetId() - kRecentId - 1);
+        if (place < recentFiles_.size()) shell_.OpenPath(std::string(recentFiles_[place]));
+      },
+      kRecentId + 1, kRecentId + kMostRecent);
+  UpdateRecentFiles();
+}
+
+void FrameMenus::UpdateRecentFiles() {
+  while (recent_->GetMenuItemCount() > 0) recent_->Destroy(recent_->FindItemByPosition(0));
+  recentFiles_.clear();
+  for (const RecentFile& file : LoadRecentFiles()) {
+    if (file.path == kDefaultEntry || recentFiles_.size() == kMostRecent) continue;
+    recentFiles_.push_back(file.path);
+    const size_t number = recentFiles_.size();
+    const wxString key = number < 10 ? wxString::Format("&%zu ", number) : wxString();
+    recent_->Append(kRecentId + static_cast<int>(number),
+                    key + wxControl::EscapeMnemonics(Shown(file.path)));
+  }
+  shell_.Window().GetMenuBar()->Enable(kRecentId, !recentFiles_.empty());
+  LogEvent("recent-files", std::to_string(recentFiles_.size()));
 }
 
 void FrameMenus::BindSecondKeys() {

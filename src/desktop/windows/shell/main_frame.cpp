@@ -2,8 +2,13 @@
 
 #include <wx/msgdlg.h>
 
+#include <algorithm>
+#include <vector>
+
+#include "batch/external_program.h"
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/files/file_actions.h"
+#include "desktop/windows/files/open_with.h"
 #include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/folder_pane.h"
@@ -17,7 +22,9 @@
 #include "platform/paths.h"
 #include "settings/configuration.h"
 #include "settings/format_switches.h"
+#include "settings/history_list.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -33,6 +40,7 @@ MainFrame::MainFrame()
               "FotomillProfessional") {
   SetSize(FromDIP(wxSize(1180, 760)));
   uses_ = std::make_unique<UseRecorder>();
+  programs_ = std::make_unique<ExternalPrograms>(*this);
   menus_ = std::make_unique<FrameMenus>(*this);
   toolbar_ = std::make_unique<FunctionToolbar>(*this);
   folders_ = std::make_unique<FolderPane>(*this);
@@ -73,9 +81,25 @@ void MainFrame::ShowStartFolder(std::string folder, bool restore) {
 
 void MainFrame::OpenStart(const std::string& path, bool restore) {
   if (path.empty() || platform::IsFolder(path)) return ShowStartFolder(path, restore);
-  pictures_->ViewBeforeFolder(path, [this, restore, folder = platform::AbsolutePath(path + "/..")] {
+  NoteRecentFile(path);
+  const std::string folder = platform::AbsolutePath(path + "/..");
+  if (NeedsExternalProgram(path)) {
     ShowStartFolder(folder, restore);
-  });
+    return programs_->Open(path);
+  }
+  pictures_->ViewBeforeFolder(path, [this, restore, folder] { ShowStartFolder(folder, restore); });
+}
+
+void MainFrame::OpenPath(const std::string& path) {
+  if (!platform::FileExists(path)) return Report(Tr("%1 no longer exists.", path));
+  OpenStart(path, false);
+}
+
+// Into the menu of recent files; the number that another version gave the entry stays.
+void MainFrame::NoteRecentFile(const std::string& path) {
+  const std::vector<RecentFile> files = LoadRecentFiles();
+  const auto known = std::ranges::find(files, path, &RecentFile::path);
+  if (AddRecentFile({path, known == files.end() ? 0 : known->number})) menus_->UpdateRecentFiles();
 }
 
 void MainFrame::BrowserChanged() {
@@ -101,6 +125,8 @@ void MainFrame::FollowRename(const std::string& from, const std::string& to) {
 
 void MainFrame::SettingsChanged() {
   TakePluginOverride();
+  files_->SettingsChanged();
+  menus_->UpdateRecentFiles();
   thumbnails_.Clear();
   FilesChanged();
 }

@@ -32,8 +32,10 @@ class MainFrame : public wxFrame, public Shell {
   BatchRunner& Batches() override { return *batches_; }
   ThumbnailService& Thumbnails() override { return thumbnails_; }
   UseRecorder& Uses() override { return *uses_; }
+  ExternalPrograms& Programs() override { return *programs_; }
   FrameSession& Session() override { return *session_; }
   FunctionToolbar& Toolbar() override { return *toolbar_; }
+  void OpenPath(const std::string& path) override;
   void FilesChanged() override;
   void FollowRename(const std::string& from, const std::string& to) override;
   void SettingsChanged() override;
@@ -42,6 +44,7 @@ class MainFrame : public wxFrame, public Shell {
  private:
   void BrowserChanged();
   void ShowStartFolder(std::string folder, bool restore);
+  void NoteRecentFile(const std::string& path);
   void OnClose(wxCloseEvent& event);
 
   ThumbnailService thumbnails_;
@@ -52,6 +55,7 @@ class MainFrame : public wxFrame, public Shell {
   std::unique_ptr<BrowserTabs> tabs_;
   std::unique_ptr<FrameSession> session_;
   std::unique_ptr<PictureWindows> pictures_;
+  std::unique_ptr<ExternalPrograms> programs_;
   std::unique_ptr<FileActions> files_;
   std::unique_ptr<BatchRunner> batches_;
 };

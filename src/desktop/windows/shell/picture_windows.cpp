@@ -1,6 +1,8 @@
 #include "desktop/windows/shell/picture_windows.h"
 
+#include "batch/external_program.h"
 #include "desktop/windows/compare/compare_frame.h"
+#include "desktop/windows/files/open_with.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 
@@ -15,6 +17,7 @@ ViewFrame& PictureWindows::View(const std::vector<std::string>& list, const std:
 void PictureWindows::ViewFromBrowser(const std::string& path) {
   const BrowserPage* browser = shell_.Tabs().Front();
   if (browser == nullptr) return;
+  if (NeedsExternalProgram(path)) return shell_.Programs().Open(path);
   const std::vector<std::string> selected = browser->Model().FilesForFunction();
   View(selected.size() > 1 ? selected : browser->Model().ShownFiles(), path);
 }

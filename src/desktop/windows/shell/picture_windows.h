@@ -22,7 +22,7 @@ class PictureWindows {
   // when it is closed.
   ViewFrame& View(const std::vector<std::string>& list, const std::string& file);
   // Opens one on a file of the browser in front: among the selected files if there are several,
-  // else among all shown.
+  // else among all shown. A sound or video is opened with its own program instead.
   void ViewFromBrowser(const std::string& path);
   // Opens one on a file whose folder is not listed yet. `showFolder` is called once the picture is
   // on the screen; the keyboard stays with the picture, whose neighbors come with the list of that

@@ -8,6 +8,7 @@ namespace fotomill::desktop {
 
 class BatchRunner;
 class BrowserTabs;
+class ExternalPrograms;
 class FileActions;
 class FolderPane;
 class FrameSession;
@@ -33,9 +34,12 @@ class Shell {
   virtual BatchRunner& Batches() = 0;      // functions over many files
   virtual ThumbnailService& Thumbnails() = 0;
   virtual UseRecorder& Uses() = 0;      // for the file history
+  virtual ExternalPrograms& Programs() = 0;
   virtual FrameSession& Session() = 0;  // tabs that are kept, under their own names too
   virtual FunctionToolbar& Toolbar() = 0;
 
+  // Opens a folder in a tab, a picture in a view window, a sound or video with its own program.
+  virtual void OpenPath(const std::string& path) = 0;
   // Files were written, renamed or deleted: every window looks again.
   virtual void FilesChanged() = 0;
   // A file or folder may have got another name: what shows it, or is in it, continues under that

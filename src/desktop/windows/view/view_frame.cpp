@@ -53,8 +53,11 @@ ViewFrame::ViewFrame(Shell& shell, const std::vector<std::string>& list, const s
     place_ = 0;
   }
   SetSize(shell.Window().GetSize());
-  loader_ =
-      std::make_unique<ViewLoader>(kAheadBytes, [this] { CallAfter([this] { PictureCame(); }); });
+  loader_ = std::make_unique<ViewLoader>(
+      kAheadBytes, [this] { CallAfter([this] { PictureCame(); }); },
+      [this](const std::string& path, int percent) {
+        CallAfter([this, path, percent] { ShowProgress(path, percent); });
+      });
   canvas_ = new ViewCanvas(this, {.resized = [this] { Resized(); },
                                   .changed = [this] { ViewChanged(); },
                                   .painted = [this] { LogPaint(); }});
@@ -153,6 +156,7 @@ void ViewFrame::ShowPlace() {
 // Whether the picture was there already, and is shown.
 bool ViewFrame::AskForPicture() {
   animation_->End();
+  loadedPercent_ = 0;
   keyTime_ = platform::MonotonicSeconds();
   WantPictures();
   ViewPicturePointer ready = loader_->Find(RequestOf(place_));
@@ -204,6 +208,13 @@ void ViewFrame::WantPictures() {
 void ViewFrame::PictureCame() {
   if (IsCurrent(loaded_)) return;
   if (const ViewPicturePointer ready = loader_->Find(RequestOf(place_))) ShowPicture(ready);
+}
+
+void ViewFrame::ShowProgress(const std::string& path, int percent) {
+  if (settings.ShowProgressWhenViewing == 0 || path != list_[place_] || IsCurrent(loaded_)) return;
+  loadedPercent_ = percent;
+  LogEvent("view-progress", std::to_string(percent) + " " + path);
+  ViewChanged();
 }
 
 void ViewFrame::ShowPicture(ViewPicturePointer picture) {
@@ -277,7 +288,9 @@ void ViewFrame::LogPaint() {
 std::string ViewFrame::StatusLine() const {
   std::string line = Tr("%1 of %2", place_ + 1, ThousandsText(list_.size()));
   const ViewPicturePointer& shown = canvas_->Picture();
-  if (!IsCurrent(shown)) return line + ", " + Tr("loading...");
+  if (!IsCurrent(shown))
+    return line + ", " +
+           (loadedPercent_ > 0 ? Tr("loading, %1%...", loadedPercent_) : Tr("loading..."));
   if (shown->picture == nullptr) return line + ", " + StatusText(shown->status);
   const PictureRecord& picture = *shown->picture;
   line += ", " + SizeAndZoom(picture, canvas_->Zoom());

@@ -62,6 +62,7 @@ class ViewFrame : public wxFrame {
   void WantPictures();
   void Resized();
   void PictureCame();
+  void ShowProgress(const std::string& path, int percent);
   void ShowPicture(ViewPicturePointer picture);
   void ViewChanged();
   ViewRequest RequestOf(size_t place) const;
@@ -94,6 +95,7 @@ class ViewFrame : public wxFrame {
   std::unique_ptr<ViewAnimation> animation_;
   ViewSlideshow slideshow_;
   std::unique_ptr<ViewLoader> loader_;
+  int loadedPercent_ = 0;  // of the picture that is being loaded, if that is shown
 };
 
 }  // namespace fotomill::desktop

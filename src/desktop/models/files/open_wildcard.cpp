@@ -1,0 +1,22 @@
+#include "desktop/models/files/open_wildcard.h"
+
+#include <algorithm>
+
+#include "core/text.h"
+#include "registry/registry.h"
+#include "texts/texts.h"
+
+namespace fotomill::desktop {
+
+std::string OpenWildcard() {
+  std::string wildcard;
+  for (const FilterPair& pair : OpenFileFilter()) {
+    std::string description = Tr(pair.description);
+    std::ranges::replace(description, '|', ' ');  // a plug-in may have any text
+    wildcard += (wildcard.empty() ? "" : "|") + description + "|" + pair.patterns + ";" +
+                LowerCase(pair.patterns);
+  }
+  return wildcard;
+}
+
+}  // namespace fotomill::desktop
