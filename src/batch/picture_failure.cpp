@@ -4,6 +4,7 @@
 #include "platform/reason.h"
 #include "registry/registry.h"
 #include "registry/signature.h"
+#include "texts/status_text.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
 
@@ -46,6 +47,11 @@ std::string OpenHint(const std::string& fileName, Status status) {
   if (!CanRead(FormatRow(index))) return Tr(WhyNot(FormatRow(index)));
   return status == Status::UnsupportedFormat ? Tr("This variant of the format cannot be read.")
                                              : std::string();
+}
+
+std::string FailureText(const std::string& fileName, Status status) {
+  const std::string hint = OpenHint(fileName, status);
+  return hint.empty() ? StatusText(status) : StatusText(status).append(" ").append(hint);
 }
 
 std::string WorkHint(Status status) {

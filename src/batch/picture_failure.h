@@ -22,6 +22,9 @@ std::string MisnamedRemark(const PictureRecord& picture);
 // to add.
 std::string OpenHint(const std::string& fileName, Status status);
 
+// That message with what follows it, for people.
+std::string FailureText(const std::string& fileName, Status status);
+
 // What follows the message of a picture that operations failed on: what this system lacks. May be
 // empty.
 std::string WorkHint(Status status);

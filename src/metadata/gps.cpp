@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <charconv>
 #include <cmath>
+#include <cstdint>
+#include <cstdio>
 #include <numbers>
 
 #include "core/text.h"
@@ -39,6 +41,14 @@ bool TakeAngle(std::string_view& text, GpsAngle& angle) {
   return std::isfinite(angle.seconds);
 }
 
+// With a point in every language.
+std::string PlainDecimal(double number) {
+  char text[32];
+  const auto [end, error] =
+      std::to_chars(text, text + sizeof text, number, std::chars_format::fixed, 5);
+  return error == std::errc{} ? std::string(text, end) : std::string();
+}
+
 }  // namespace
 
 bool ParseGpsLocation(std::string_view text, GpsLocation& location) {
@@ -63,6 +73,19 @@ double GpsDegrees(const GpsAngle& angle) {
   const char letter = UpperCase(angle.hemisphere);
   const double sign = letter == 'W' || letter == 'S' ? -1 : 1;
   return sign * (angle.degrees + angle.minutes / 60.0 + angle.seconds / 3600.0);
+}
+
+std::string GpsPlaceText(double latitude, double longitude) {
+  const auto angle = [](double degrees, const char* hemispheres) {
+    const int64_t hundredths = std::llround(std::abs(degrees) * 360000);  // of seconds
+    char text[48];
+    std::snprintf(text, sizeof text, "%d° %02d' %02d.%02d\" %c", int(hundredths / 360000),
+                  int(hundredths / 6000 % 60), int(hundredths / 100 % 60), int(hundredths % 100),
+                  hemispheres[degrees < 0 ? 1 : 0]);
+    return std::string(text);
+  };
+  return angle(latitude, "NS") + ", " + angle(longitude, "EW") + " (" + PlainDecimal(latitude) +
+         ", " + PlainDecimal(longitude) + ")";
 }
 
 double GpsDistance(double latitude1, double longitude1, double latitude2, double longitude2,

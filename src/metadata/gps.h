@@ -1,5 +1,6 @@
 #pragma once
 
+#include <string>
 #include <string_view>
 
 #include "core/choice_lists.h"
@@ -28,6 +29,10 @@ struct GpsLocation {
 
 // Decimal degrees, negative for "W" and "S" in either case.
 double GpsDegrees(const GpsAngle& angle);
+
+// A place in decimal degrees as text that maps accept, too:
+// "45° 19' 48.00\" N, 79° 13' 12.00\" W (45.33000, -79.22000)".
+std::string GpsPlaceText(double latitude, double longitude);
 
 // Great-circle distance between two positions in decimal degrees, in miles (radius 3956) or
 // kilometers (6367). Source: R. W. Sinnott, "Virtues of the Haversine", Sky and Telescope 68/2

@@ -79,7 +79,7 @@ TEST_F(Reports, ExifRowsMatchTheText) {
   const std::string path = folder_.Path("a.tif");
   test::WriteBytes(path, test::BigEndianBlock());
   for (const int32_t types : {0, 1}) {
-    const ExifReport report = ReadExifReport(path, {.showTypes = types == 1});
+    const ExifReport report = ReadExifReport(path, {.text = {.showTypes = types == 1}});
     EXPECT_EQ(report.status, Status::Ok);
     std::string text;
     for (const ExifRow& row : report.rows)
@@ -92,6 +92,48 @@ TEST_F(Reports, ExifRowsMatchTheText) {
   EXPECT_THAT(ReadExifReport(folder_.Path("b.tif"), {}).problem, HasSubstr("no valid header"));
   EXPECT_THAT(ReadExifReport(Sample("c.bmp"), {}).problem, HasSubstr("no EXIF"));
   EXPECT_EQ(ReadExifReport(folder_.Path("none.jpg"), {}).status, Status::FileOpenError);
+}
+
+// A block with a place of 0 degrees in both directions, which all zero bytes mean.
+std::vector<uint8_t> BlockWithPlace() {
+  test::BlockBuilder builder;
+  const uint32_t first = builder.Directory({{0x8825, 4, 1, 0}});
+  const uint32_t angle = builder.Bytes({0, 0, 0, 0, 1, 0, 0, 0, 0, 0, 0, 0, 1, 0, 0, 0, 0, 0, 0, 0, 1, 0, 0, 0});
+  const uint32_t gps = builder.Directory({{1, 2, 2, 'N'}, {2, 5, 3, angle}, {3, 2, 2, 'E'}, {4, 5, 3, angle}});
+  builder.Patch32(first + 2 + 8, gps);
+  return builder.block;
+}
+
+TEST_F(Reports, PlacesAreReadableAndMeasured) {
+  const std::string path = folder_.Path("a.tif");
+  test::WriteBytes(path, BlockWithPlace());
+  settings.ExifDefaultLocation = std::string_view("1,0,0,N,0,0,0,E");
+  settings.ExifDistinceUnits = 1;
+  const ExifReport report = ReadExifReport(path, ExifReportOptionsFromSettings());
+  EXPECT_THAT(report.text, testing::EndsWith("Places\n"
+                                             "    Place of the picture\t0° 00' 00.00\" N, 0° 00' 00.00\" E (0.00000, 0.00000)\n"
+                                             "    Distance to the default location\t111.1 kilometers\n"));
+  settings.ExifDefaultLocation = std::string_view("nowhere");
+  EXPECT_THAT(ReadExifReport(path, ExifReportOptionsFromSettings()).text, testing::Not(HasSubstr("Distance")));
+}
+
+TEST_F(Reports, CardsStayWhole) {
+  const std::string path = folder_.Path("a.fits");
+  std::string header;
+  for (const char* card : {"SIMPLE  =                    T", "BITPIX  =                    8", "NAXIS   =                    2",
+                           "NAXIS1  =                    2", "NAXIS2  =                    1", "OBJECT  = 'NGC: 4565'", "END"})
+    header += std::string(card).append(80 - std::string_view(card).size(), ' ');
+  header.resize(2880, ' ');
+  test::WriteText(path, header + std::string(2880, '\0'));
+  const FileInfo info = ReadFileInfo(path, InfoOptionsFromSettings());
+  ASSERT_EQ(info.status, Status::Ok);
+  std::vector<std::string> labels, values;
+  for (const InfoLine& line : info.sections.at(1).lines) {
+    labels.push_back(line.label);
+    values.push_back(line.value);
+  }
+  EXPECT_THAT(labels, testing::Each(""));
+  EXPECT_THAT(values, testing::Contains(HasSubstr("NGC: 4565")));
 }
 
 std::string ValueOf(const std::vector<InfoSection>& sections, const std::string& title,

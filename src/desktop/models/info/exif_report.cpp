@@ -4,6 +4,8 @@
 #include "core/shown_text.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_tags.h"
+#include "metadata/gps.h"
+#include "settings/job_options.h"
 #include "texts/status_text.h"
 #include "texts/texts.h"
 
@@ -45,9 +47,47 @@ void ReadThumbnail(std::span<const uint8_t> bytes, ExifReport& report) {
   if (ToRgb(picture->image, report.thumbnail) != Status::Ok) report.thumbnail = {};
 }
 
+void AddRow(const char* name, const std::string& text, ExifReport& report) {
+  report.rows.push_back({false, 0, Tr(name), text});
+  report.text.append("    ").append(Tr(name)).append("\t").append(text).append("\n");
+}
+
+void AddPlaces(const ExifPlaces& places, const ExifReportOptions& options, ExifReport& report) {
+  if (!places.taken && !places.destination) return;
+  report.rows.push_back({true, 0, Tr("Places"), {}});
+  report.text.append(Tr("Places")).append("\n");
+  const auto distance = [&](const ExifPlace& from, const ExifPlace& to) {
+    return DecimalText(GpsDistance(from.latitude, from.longitude, to.latitude, to.longitude,
+                                   options.unit),
+                       1) +
+           " " + Tr(DistanceUnitName(options.unit));
+  };
+  if (places.taken) {
+    AddRow(TrLater("Place of the picture"), GpsPlaceText(places.taken->latitude, places.taken->longitude), report);
+    if (options.home)
+      AddRow(TrLater("Distance to the default location"), distance(*options.home, *places.taken),
+             report);
+  }
+  if (places.destination)
+    AddRow(TrLater("Place of destination"),
+           GpsPlaceText(places.destination->latitude, places.destination->longitude), report);
+  if (places.taken && places.destination)
+    AddRow(TrLater("Distance to destination"), distance(*places.taken, *places.destination),
+           report);
+}
+
 }  // namespace
 
-ExifReport ReadExifReport(const std::string& path, const ExifTextOptions& options) {
+ExifReportOptions ExifReportOptionsFromSettings() {
+  ExifReportOptions options{.text = ExifTextOptionsFromSettings(),
+                            .unit = DistanceUnitFromSettings()};
+  GpsLocation home;
+  if (GpsLocationFromSettings(home))
+    options.home = ExifPlace{GpsDegrees(home.latitude), GpsDegrees(home.longitude)};
+  return options;
+}
+
+ExifReport ReadExifReport(const std::string& path, const ExifReportOptions& options) {
   ExifReport report;
   ExifSource source;
   report.status = source.Open(path.c_str());
@@ -59,7 +99,7 @@ ExifReport ReadExifReport(const std::string& path, const ExifTextOptions& option
     report.problem = Tr("This file has no EXIF.");
     return report;
   }
-  Gather gather(report, options);
+  Gather gather(report, options.text);
   ExifFindings findings;
   if (!WalkExif(source.Block(), &gather, &findings)) {
     report.status = Status::DamagedFile;
@@ -67,6 +107,7 @@ ExifReport ReadExifReport(const std::string& path, const ExifTextOptions& option
     return report;
   }
   gather.Finish();
+  AddPlaces(FindExifPlaces(source.Block()), options, report);
   ReadThumbnail(ExifThumbnail(source.Block(), findings), report);
   if (!source.Intact()) {
     report.status = Status::FileReadError;

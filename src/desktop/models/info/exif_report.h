@@ -1,11 +1,14 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <string>
 #include <vector>
 
+#include "core/choice_lists.h"
 #include "core/status.h"
 #include "desktop/models/drawing/rgb_image.h"
+#include "metadata/exif/exif_places.h"
 #include "metadata/exif/exif_text.h"
 
 namespace fotomill::desktop {
@@ -18,11 +21,21 @@ struct ExifRow {
   std::string text;
 };
 
+// How a report is written.
+struct ExifReportOptions {
+  ExifTextOptions text = {};
+  std::optional<ExifPlace> home = {};  // distances are from here; none: they are not told
+  choice::DistanceUnit unit = choice::kMiles;
+};
+// The keys ExifShowTypes, ExifDefaultLocation and ExifDistinceUnits. For the main thread.
+ExifReportOptions ExifReportOptionsFromSettings();
+
 // The EXIF of one picture file as the viewer shows it.
 struct ExifReport {
   Status status = Status::Ok;
   // a sentence for people if there is nothing to show, or not all; empty otherwise
   std::string problem;
+  // those of the block, then what its GPS directory means: places, and how far they are
   std::vector<ExifRow> rows;
   // the same lines as one text, to be copied, saved or printed
   std::string text;
@@ -31,6 +44,6 @@ struct ExifReport {
 };
 
 // Reads and walks a file's EXIF block. Takes as long as the disk takes; any thread may call it.
-ExifReport ReadExifReport(const std::string& path, const ExifTextOptions& options);
+ExifReport ReadExifReport(const std::string& path, const ExifReportOptions& options);
 
 }  // namespace fotomill::desktop

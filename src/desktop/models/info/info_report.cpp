@@ -10,13 +10,11 @@
 #include "core/shown_text.h"
 #include "core/text.h"
 #include "desktop/models/history/history_dates.h"
-#include "desktop/models/info/exif_report.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "settings/settings.h"
-#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -99,12 +97,21 @@ void AddPictureFacts(const PictureRecord& picture, const InfoOptions& options, F
   general.lines.push_back({Tr("Image data"), BytesText(picture.imageBytes)});
 }
 
-// The lines that the codec tells. Those of the form "name: value" are divided.
+// Where a detail line of the form "Name: value" has its colon; npos in others, such as the cards of
+// an astronomical picture, whose values may hold colons.
+size_t ColonBehindLabel(std::string_view line) {
+  const size_t colon = line.find(": ");
+  if (colon == std::string_view::npos || colon == 0) return std::string_view::npos;
+  const std::string_view name = line.substr(0, colon);
+  return name.find_first_of("=\"'") == std::string_view::npos ? colon : std::string_view::npos;
+}
+
+// The lines that the codec tells. Those of the form "Name: value" are divided.
 InfoSection DetailsOf(const PictureRecord& picture) {
   InfoSection section{Tr(kDetailsTitle), {}};
   for (size_t i = 0; i < picture.detailLines.Count(); ++i) {
     const std::string_view line = picture.detailLines.Line(i);
-    const size_t colon = line.find(": ");
+    const size_t colon = ColonBehindLabel(line);
     if (colon == std::string_view::npos) {
       section.lines.push_back({{}, std::string(line)});
     } else {
@@ -126,11 +133,6 @@ void AddExif(const std::string& path, const InfoOptions& options, FileInfo& info
       info.sections.back().lines.push_back({std::move(row.name), std::move(row.text)});
     }
   }
-}
-
-std::string ProblemOf(const std::string& path, Status status) {
-  const std::string hint = OpenHint(path, status);
-  return hint.empty() ? StatusText(status) : StatusText(status).append(" ").append(hint);
 }
 
 // How a value differs: every different one with the number of files that have it, the most frequent
@@ -180,7 +182,7 @@ InfoOptions InfoOptionsFromSettings() {
   return {.resolution = settings.InfoResolution,
           .units = settings.InfoUnits,
           .dateMode = settings.FileHistoryDateMode,
-          .exif = ExifTextOptionsFromSettings()};
+          .exif = ExifReportOptionsFromSettings()};
 }
 
 FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options) {
@@ -195,7 +197,7 @@ FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options) {
     const FormatEntry& row = FormatRow(picture->formatIndex);
     if (row.details != nullptr) info.status = row.details(*picture);
   }
-  if (info.status != Status::Ok) info.problem = ProblemOf(path, info.status);
+  if (info.status != Status::Ok) info.problem = FailureText(path, info.status);
   info.sections.push_back(std::move(general));
   if (picture != nullptr && picture->detailLines.Count() > 0)
     info.sections.push_back(DetailsOf(*picture));

@@ -6,7 +6,7 @@
 #include <vector>
 
 #include "core/status.h"
-#include "metadata/exif/exif_text.h"
+#include "desktop/models/info/exif_report.h"
 
 namespace fotomill::desktop {
 
@@ -27,7 +27,7 @@ struct InfoOptions {
   int32_t resolution = 96;  // dots per inch of pictures whose file names none
   int32_t units = 0;        // choice::LengthUnit of the print size
   int32_t dateMode = 0;     // choice::DateMode
-  ExifTextOptions exif;
+  ExifReportOptions exif;
 };
 InfoOptions InfoOptionsFromSettings();
 

@@ -20,7 +20,6 @@
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/paths.h"
-#include "settings/job_options.h"
 #include "texts/grouped_count.h"
 #include "texts/status_text.h"
 #include "texts/texts.h"
@@ -76,7 +75,7 @@ ExifFrame::ExifFrame(Shell& shell, wxWindow* parent, const std::string& path)
   list_->SetFocus();
   work_.Start(
       *this,
-      [this, options = ExifTextOptionsFromSettings()](const StopToken&) {
+      [this, options = ExifReportOptionsFromSettings()](const StopToken&) {
         report_ = ReadExifReport(path_, options);
       },
       [this](Status status) {
