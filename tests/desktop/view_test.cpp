@@ -138,6 +138,14 @@ TEST(DrawView, CheckerboardShowsThroughAndStaysInPlace) {
   EXPECT_EQ(Greens(canvas, 0), (std::vector<int>(6, 10)));
 }
 
+TEST(ViewPicture, SaysWhatIsWrongWithItsFile) {
+  const test::TemporaryFolder folder;
+  test::WriteText(folder.Path("a.png"), "%PDF-1.4 and no more");
+  const ViewPicturePointer view = LoadViewPicture({.path = folder.Path("a.png")});
+  EXPECT_NE(view->status, Status::Ok);
+  EXPECT_NE(view->problem.find(" It looks like "), std::string::npos) << view->problem;
+}
+
 TEST(ViewPicture, AppliesItsProfileAndKeepsItsAlpha) {
   const test::TemporaryFolder folder;
   const std::string path = folder.Path("a.png");

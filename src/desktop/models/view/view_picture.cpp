@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <cmath>
 
+#include "batch/picture_failure.h"
 #include "core/choice_lists.h"
 #include "core/workers/folder_scope.h"
 #include "core/workers/guarded.h"
@@ -146,6 +147,7 @@ ViewPicturePointer LoadViewPicture(const ViewRequest& request, ProgressSink* pro
     view->facts = platform::FactsOf(request.path);
     return LoadInto(request, *view, progress);
   });
+  if (view->status != Status::Ok) view->problem = FailureText(request.path, view->status);
   view->seconds = platform::MonotonicSeconds() - start;
   return view;
 }

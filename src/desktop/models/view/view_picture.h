@@ -57,6 +57,7 @@ struct ViewPicture {
   ViewRequest request;
   platform::FileFacts facts;  // of the file, as it was read
   Status status = Status::Ok;
+  std::string problem;             // why there is no picture, for people; empty if Ok
   PicturePointer picture;          // null unless Ok
   // as large as the fit of the request's window; empty where that is the picture's own size or more
   ViewPixels fitted;

@@ -23,7 +23,6 @@
 #include "platform/paths.h"
 #include "settings/configuration.h"
 #include "settings/settings.h"
-#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -216,7 +215,7 @@ void CompareFrame::ShowFacts(const ViewCanvas* canvas) {
   const ViewPicturePointer& shown = canvas->Picture();
   const std::string facts = shown == nullptr ? std::string(Tr("loading..."))
                             : shown->picture == nullptr
-                                ? StatusText(shown->status)
+                                ? shown->problem
                                 : SizeAndZoom(*shown->picture, canvas->Zoom());
   const wxString name = Shown(platform::FileNameOf(pane.path));
   pane.caption->SetLabel(name + "   " + Shown(facts));

@@ -15,7 +15,6 @@
 #include "platform/paths.h"
 #include "processing/geometry/scale.h"
 #include "settings/settings.h"
-#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -225,7 +224,7 @@ void ViewCanvas::PaintMessage(wxDC& dc) const {
   const Shade text = Readable({0, 0, 0}, {around.Red(), around.Green(), around.Blue()});
   dc.SetTextForeground(wxColour(text.red, text.green, text.blue));
   const std::string name(platform::FileNameOf(picture_->request.path));
-  dc.DrawLabel(Shown(name) + "\n" + Shown(StatusText(picture_->status)), wxRect(GetClientSize()),
+  dc.DrawLabel(Shown(name) + "\n" + Shown(picture_->problem), wxRect(GetClientSize()),
                wxALIGN_CENTER);
 }
 

@@ -27,7 +27,6 @@
 #include "platform/paths.h"
 #include "settings/configuration.h"
 #include "settings/settings.h"
-#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -291,7 +290,7 @@ std::string ViewFrame::StatusLine() const {
   if (!IsCurrent(shown))
     return line + ", " +
            (loadedPercent_ > 0 ? Tr("loading, %1%...", loadedPercent_) : Tr("loading..."));
-  if (shown->picture == nullptr) return line + ", " + StatusText(shown->status);
+  if (shown->picture == nullptr) return line + ", " + shown->problem;
   const PictureRecord& picture = *shown->picture;
   line += ", " + SizeAndZoom(picture, canvas_->Zoom());
   if (turn_ != Orientation::Upright) line += std::string(", ") + Tr("rotated, not saved");
