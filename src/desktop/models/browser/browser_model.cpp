@@ -70,7 +70,6 @@ void BrowserModel::SetFolder(const std::string& folder) {
   items_.clear();
   order_.clear();
   lines_.clear();
-  hiddenSelected_.clear();
   selection_.Reset(0);
 }
 
@@ -138,8 +137,7 @@ void BrowserModel::SortItems() {
 }
 
 std::vector<bool> BrowserModel::SelectedItems() const {
-  std::vector<bool> selected = hiddenSelected_;
-  selected.resize(items_.size());
+  std::vector<bool> selected(items_.size());
   for (size_t line = 0; line < lines_.size(); ++line)
     selected[lines_[line]] = selection_.IsSelected(line);
   return selected;
@@ -148,7 +146,6 @@ std::vector<bool> BrowserModel::SelectedItems() const {
 void BrowserModel::BuildLines(const std::vector<bool>& selectedItems, size_t focusItem,
                               size_t anchorItem) {
   lines_.clear();
-  hiddenSelected_ = selectedItems;
   std::vector<bool> selected;
   size_t focus = kNoLine, anchor = kNoLine;
   for (const uint32_t item : order_) {
@@ -156,7 +153,6 @@ void BrowserModel::BuildLines(const std::vector<bool>& selectedItems, size_t foc
     if (item == focusItem) focus = lines_.size();
     if (item == anchorItem) anchor = lines_.size();
     selected.push_back(selectedItems[item]);
-    hiddenSelected_[item] = false;
     lines_.push_back(item);
   }
   selection_.Assign(std::move(selected), focus, anchor);

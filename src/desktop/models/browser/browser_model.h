@@ -38,7 +38,7 @@ class BrowserModel {
   void SetFacts(size_t item, const FolderItem& facts) { items_[item] = facts; }
   void UpdateOrder();  // sorts by the facts as they are now; the selection stays with its items
 
-  // Only lines whose name matches are shown; selection of others comes back with them.
+  // Only lines whose name matches are shown; others are no longer selected.
   void SetFilter(const std::string& filter);
   const std::string& Filter() const { return filter_; }  // empty: everything is shown
 
@@ -92,7 +92,6 @@ class BrowserModel {
   std::vector<FolderItem> items_;     // as listed
   std::vector<uint32_t> order_;       // all items in sorted order
   std::vector<uint32_t> lines_;       // those that pass the filter
-  std::vector<bool> hiddenSelected_;  // items that are selected though the filter hides them
   Selection selection_;               // over the lines
 };
 
