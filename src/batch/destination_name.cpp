@@ -52,9 +52,10 @@ bool AskName(Destination& destination, const std::string& source, std::string_vi
   const platform::PathParts planned = platform::SplitPath(destination.path);
   const std::string folder = std::string(planned.drive).append(planned.folder);
   for (;;) {
-    const std::optional<std::string> typed = job.prompts->AskDestinationName(question);
-    if (!typed) return false;
-    const platform::PathParts parts = platform::SplitPath(*typed);
+    const NameAnswer answer = job.prompts->AskDestinationName(question);
+    job.naming.skipNames = job.naming.skipNames || answer.skipRest;
+    if (!answer.ok) return false;
+    const platform::PathParts parts = platform::SplitPath(answer.name);
     const std::string dotted = "." + extension;
     const auto whole = CompletedDestination(
         platform::JoinPath({parts.drive, parts.folder, parts.base, dotted}), folder);
@@ -109,8 +110,8 @@ DestinationAnswer Replace(Destination& destination, const OverwritePolicy& polic
   return DestinationAnswer::Write;
 }
 
-// Shows the overwrite prompt until a name is settled. A typed name that is taken as well is asked
-// about again.
+// Shows the overwrite prompt until a name is settled. A typed name that is taken as well is
+// numbered if both files are to be kept, and asked about again otherwise.
 DestinationAnswer AskAboutCollision(Destination& destination, const std::string& source,
                                     BatchJob& job, const TakenTest& taken,
                                     const VariantMaker& variant, const PictureRecord* picture) {
@@ -129,21 +130,22 @@ DestinationAnswer AskAboutCollision(Destination& destination, const std::string&
       job.overwrite.skip = job.overwrite.skip || answer.skipRest;
       return DestinationAnswer::Skip;
     }
-    const bool renamed = !answer.checks.keepBoth && answer.name != base;
+    const bool renamed = answer.name != base;
     std::string path = renamed ? WithBase(destination.path, answer.name) : destination.path;
     if (renamed && (!IsFileName(answer.name) || !FitsPath(path))) {
       question.problem = Tr(IsFileName(answer.name) ? kTooLong : kNotPlain);
       continue;
     }
     StoreChecks(question.checks, answer.checks, job);
-    if (answer.checks.keepBoth) return KeepBoth(destination, variant);
     destination.path = std::move(path);
+    if (!renamed && answer.checks.keepBoth) return KeepBoth(destination, variant);
     if (!renamed) {
       destination.asked = true;
       return Replace(destination, job.overwrite);
     }
     if (!IsTaken(destination, taken)) return DestinationAnswer::Write;
     if (destination.search != VariantSearch::Found) return DestinationAnswer::Skip;
+    if (answer.checks.keepBoth) return KeepBoth(destination, variant);
     if (!AsksAboutCollisions(job))
       return SettleUnasked(destination, job.overwrite, job.applyToRest, variant);
     question.problem.clear();
@@ -235,6 +237,10 @@ void SayNoName(const Destination& destination, FileOutcome& outcome) {
                     destination.path);
 }
 
+RecordedText SharedNameNote(const std::string& path) {
+  return TrRecorded("Numbered, as another file of this run is \"%1\".", platform::FileNameOf(path));
+}
+
 void NoteLostAttributes(FileOutcome& outcome) {
   const std::string lost = platform::TakeLostAttributes();
   if (outcome.replaced && !lost.empty())
@@ -265,6 +271,7 @@ DestinationAnswer MakeDestinationName(Destination& destination, const std::strin
     return DestinationAnswer::Write;
   }
   const bool asked = job.naming.askName && job.prompts != nullptr;
+  if (asked && job.naming.skipNames) return DestinationAnswer::Skip;
   if (asked && !AskName(destination, source, title, job)) return DestinationAnswer::Skip;
   DestinationAnswer answer = DestinationAnswer::Write;
   destination.taken = IsTaken(destination, taken);

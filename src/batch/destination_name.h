@@ -60,6 +60,7 @@ struct Destination {
   std::string password = {};  // empty: none
   bool elsewhere = false;  // the user chose another folder, which is not created
   bool taken = false;      // the name was not free
+  std::string shared = {};  // the path before it was numbered, where another file of the run has it
   VariantSearch search = VariantSearch::Found;  // anything else: skipped because no name was found
   int32_t formatIndex = kNoFormat;  // of the output; none: the job's
   std::string extension = {};       // of the output, as the format has it; empty: the job's
@@ -88,6 +89,9 @@ DestinationAnswer MakeDestinationName(Destination& destination, const std::strin
 // are taken, which counts as a write abort; otherwise failed with InvalidDestination (the search
 // was given up) or ErrorCreatingFile (the system cannot tell).
 void SayNoName(const Destination& destination, FileOutcome& outcome);
+
+// Says why an output is numbered: the path was free, but another file of the run has it.
+RecordedText SharedNameNote(const std::string& path);
 
 // Adds to an outcome's note which attributes of the replaced file the new one does not have; takes
 // them from the platform.

@@ -53,6 +53,7 @@ inline constexpr size_t kPrefixedFunctionCount = 11;
 struct NamingOptions {
   int32_t extensionCase = 0;  // ExtensionCaseStyle
   bool askName = false;       // PromptForDestName
+  bool skipNames = false;     // files whose name would be asked are left out: the user said so
   bool beside = false;        // DestForceSourceDir: every output is beside its source
   bool askPassword = false;   // PasswordProtect
   // WarnDestinationWrite: the format is asked about before anything is written

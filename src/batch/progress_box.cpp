@@ -59,8 +59,10 @@ void FinishProgress(BatchJob& job) {
 }
 
 std::string FileLine(const FileOutcome& outcome) {
-  if (outcome.status == Status::Ok && !outcome.skipped)
-    return outcome.source + " -> " + outcome.destination;
+  if (outcome.status == Status::Ok && !outcome.skipped) {
+    const std::string line = outcome.source + " -> " + outcome.destination;
+    return outcome.note.empty() ? line : line + ": " + outcome.note.shown;
+  }
   std::string line = outcome.source + ": ";
   if (!outcome.skipped) line += StatusText(outcome.status);
   if (!outcome.hint.empty()) line += (outcome.skipped ? "" : " ") + outcome.hint;

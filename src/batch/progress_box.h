@@ -11,6 +11,13 @@ namespace fotomill {
 struct BatchJob;
 struct FileOutcome;
 
+// What a batch works on, in whatever order files are finished: `done` of `count` files are.
+struct ProgressWork {
+  uint32_t done = 0, count = 0;
+  uint32_t inWork = 0;
+  std::string file;  // in work for the longest time; empty when none is
+};
+
 // Receives the reports of a batch. Front ends implement it. Every call comes from the thread that
 // runs the batch, which waits for it to return: a window copies what it needs to its own thread.
 // Arguments are valid during the call.
@@ -25,6 +32,8 @@ class ProgressBox {
   virtual void ShowStatus(const std::string& status) = 0;  // replaces the status line
   // `done` of `count` files are finished.
   virtual void ShowProgress(uint32_t done, uint32_t count) { (void)done, (void)count; }
+  // What is in work: when the batch begins, and several times a second while it waits.
+  virtual void ShowWork(const ProgressWork& work) { (void)work; }
   // Called several times a second while the batch waits, to redraw times.
   virtual void Tick() {}
   // False ends the batch as Abort does, for a box that can report no more.
@@ -52,7 +61,8 @@ void SetStatus(BatchJob& job, std::string_view text);
 // says.
 void FinishProgress(BatchJob& job);
 
-// A line of the list: "SOURCE -> DESTINATION", or "SOURCE: MESSAGE" followed by the hint.
+// A line of the list: "SOURCE -> DESTINATION" with ": NOTE" behind it if there is one, or
+// "SOURCE: MESSAGE" followed by the hint.
 std::string FileLine(const FileOutcome& outcome);
 
 }  // namespace fotomill

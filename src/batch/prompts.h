@@ -70,13 +70,20 @@ struct NameQuestion {
   std::string problem;    // as above
 };
 
+// What the user decided about the name of an output.
+struct NameAnswer {
+  bool ok = false;        // false: this file is skipped
+  std::string name = {};  // a path; its extension is replaced
+  bool skipRest = false;  // not ok, and so for every name of this batch
+};
+
 // What a batch asks its user. Faces implement it; every call comes from the thread that called the
 // batch, blocks until there is an answer, and comes in the order of the selection.
 class Prompts {
  public:
   virtual ~Prompts() = default;
-  // The name of an output; nullopt skips the file.
-  virtual std::optional<std::string> AskDestinationName(const NameQuestion& question) = 0;
+  // The name of an output.
+  virtual NameAnswer AskDestinationName(const NameQuestion& question) = 0;
   // What is to become of an output whose name is taken.
   virtual OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) = 0;
   // The password that protects an output; nullopt skips the file.

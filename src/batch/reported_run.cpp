@@ -21,7 +21,28 @@ ReportedRun::ReportedRun(std::span<const BatchFile> files, BatchJob& job, Task t
             .goesOn = [this] { return !ended_ && !stop_.Asked(); },
             .tick = [this] { Tick(); }}) {}
 
+// A file while it is in work, however the work ends.
+class ReportedRun::AtWork {
+ public:
+  AtWork(ReportedRun& run, size_t file) : run_(run), file_(file) {
+    const std::lock_guard lock(run_.workMutex_);
+    run_.inWork_.insert(file_);
+  }
+  ~AtWork() {
+    const std::lock_guard lock(run_.workMutex_);
+    run_.inWork_.erase(file_);
+    ++run_.done_;
+  }
+  AtWork(const AtWork&) = delete;
+  AtWork& operator=(const AtWork&) = delete;
+
+ private:
+  ReportedRun& run_;
+  const size_t file_;
+};
+
 void ReportedRun::Run(uint32_t jobs) {
+  ShowWork();
   run_.Run(files_.size(), jobs == 0 ? CoreJobs() : jobs);
   MarkChangedRecords(std::exchange(job_.changes, {}));
 }
@@ -30,8 +51,23 @@ uint32_t ReportedRun::CoreJobs() { return platform::CoreCount(); }
 
 Status ReportedRun::Work(size_t file) {
   const FolderScope folder(files_[file].name);
+  const AtWork atWork(*this, file);
+  if (std::this_thread::get_id() == caller_) ShowWork();  // it is not going to tick meanwhile
   outcomes_[file] = task_.process(file);
   return Status::Ok;
+}
+
+// On the calling thread.
+void ReportedRun::ShowWork() {
+  if (job_.box == nullptr) return;
+  ProgressWork work{.count = static_cast<uint32_t>(files_.size()), .file = {}};
+  {
+    const std::lock_guard lock(workMutex_);
+    work.done = done_;
+    work.inWork = static_cast<uint32_t>(inWork_.size());
+    if (!inWork_.empty()) work.file = files_[*inWork_.begin()].name;
+  }
+  job_.box->ShowWork(work);
 }
 
 void ReportedRun::Deliver(size_t file, Status status) {
@@ -67,6 +103,7 @@ void ReportedRun::Report(size_t file, const FileOutcome& outcome) {
 
 void ReportedRun::Tick() {
   if (job_.box == nullptr) return;
+  ShowWork();
   job_.box->Tick();
   if (!job_.box->GoesOn()) ended_ = true;
 }

@@ -4,9 +4,12 @@
 #include <cstdint>
 #include <functional>
 #include <memory>
+#include <mutex>
 #include <optional>
+#include <set>
 #include <span>
 #include <string>
+#include <thread>
 #include <vector>
 
 #include "batch/job.h"
@@ -38,6 +41,7 @@ class ReportedRun {
   bool InTurn(size_t file, const std::function<void()>& step) { return run_.InTurn(file, step); }
 
  private:
+  class AtWork;
   static uint32_t CoreJobs();
   Status Work(size_t file);
   void Deliver(size_t file, Status status);
@@ -45,6 +49,7 @@ class ReportedRun {
   void Tick();
   void NoteUse(const std::string& source);
   void NoteChange(const FileOutcome& outcome);
+  void ShowWork();
 
   const std::span<const BatchFile> files_;
   BatchJob& job_;
@@ -53,6 +58,10 @@ class ReportedRun {
   // of files that are done and not yet reported; none: given up
   std::vector<std::vector<FileOutcome>> outcomes_;
   std::atomic<bool> ended_{false};
+  const std::thread::id caller_ = std::this_thread::get_id();
+  std::mutex workMutex_;     // over what follows
+  std::set<size_t> inWork_;  // the first one was begun first
+  uint32_t done_ = 0;
   OrderedRun run_;
 };
 

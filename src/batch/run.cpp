@@ -94,9 +94,12 @@ class Batch {
     OverwritePolicy overwrite;
     bool applyToRest = false;
     bool asks = false;
+    bool skipNames = false;
   };
 
-  void TakeRules() { rules_ = {job_.overwrite, job_.applyToRest, AsksAboutCollisions(job_)}; }
+  void TakeRules() {
+    rules_ = {job_.overwrite, job_.applyToRest, AsksAboutCollisions(job_), job_.naming.skipNames};
+  }
 
   std::vector<OutputTarget> TargetsOf(const BatchFile& file) const {
     std::vector<OutputTarget> targets;
@@ -278,6 +281,7 @@ class Batch {
     const std::string& source = files_[i].name;
     {
       const std::lock_guard lock(mutex_);
+      if (rules_.skipNames) return true;
       if (!rules_.overwrite.skip) return false;
       if (IsIndependent(source, destination.path)) {
         return destination.taken =
@@ -429,20 +433,25 @@ class Batch {
     cancelled = job_.stop.Token().Asked();
     if (cancelled) return DestinationAnswer::Skip;
     const TakenTest taken = [&](const std::string& path) { return IsTaken(path, source); };
-    const VariantMaker variant = [&](std::string& path) {
-      const std::lock_guard lock(mutex_);
+    const auto number = [&](std::string& path) {
+      if (names_.TakenByRun(path, source)) destination.shared = path;
       return MakeVariant(
           path, [&](const std::string& candidate) { return names_.Taken(candidate, source); });
     };
+    const VariantMaker variant = [&](std::string& path) {
+      const std::lock_guard lock(mutex_);
+      return number(path);
+    };
     DestinationAnswer answer =
         MakeDestinationName(destination, source, {}, job_, taken, variant, &picture);
+    // a question that was answered by ending the batch
+    cancelled = answer == DestinationAnswer::Skip && job_.stop.Token().Asked();
     const std::lock_guard lock(mutex_);
     // Unless the user said so of this very file, the files of one run never replace each other.
     if (answer == DestinationAnswer::Write && destination.replace && !destination.asked) {
       if (names_.TakenByRun(destination.path, source)) {
         destination.replace = destination.recycle = false;
-        destination.search = MakeVariant(
-            destination.path, [&](const std::string& path) { return names_.Taken(path, source); });
+        destination.search = number(destination.path);
       }
       if (destination.search != VariantSearch::Found) answer = DestinationAnswer::Skip;
     }
@@ -471,7 +480,8 @@ class Batch {
       return outcome;
     }
     FileOutcome outcome{.source = file.name, .destination = destination.path, .replaced = replaces};
-    outcome.note = writer_.Note(output);
+    if (!destination.shared.empty()) outcome.note = SharedNameNote(destination.shared);
+    outcome.note.Append(writer_.Note(output));
     outcome.detail = output.detail;
     if (!function_.dryRun) NoteLostAttributes(outcome);
     return outcome;

@@ -58,8 +58,9 @@ std::string NewBaseName(const BatchJob& job, const SequentialRenameRules& rules,
   return std::string(job.rename.baseName.view()) + rules.separator + number;
 }
 
-std::string RenameHint(const std::string& path, const BatchJob& job) {
-  if (!IsPlainName(job.rename.baseName.view()))
+std::string RenameHint(const std::string& path, const SequentialRenameRules& rules,
+                       const BatchJob& job) {
+  if (!rules.numberFirst && !IsPlainName(job.rename.baseName.view()))
     return Tr("The base name must be part of a file name, not a path.");
   if (path.size() > PathText::Capacity())
     return Tr("The path would be longer than 260 characters.");
@@ -96,7 +97,7 @@ FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules,
   outcome.destination = file.name;
   outcome.status = RenameSequentially(job, outcome.destination, rules, files);
   if (outcome.status != Status::Ok) {
-    outcome.hint = RenameHint(outcome.destination, job);
+    outcome.hint = RenameHint(outcome.destination, rules, job);
     if (outcome.hint.empty()) outcome.hint = ReasonSentence();
   } else if (outcome.destination == file.name) {
     outcome.skipped = true;
@@ -144,7 +145,7 @@ Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRena
   for (uint32_t attempt = 1; attempt < rules.maxAttempts; ++attempt) {
     path = platform::JoinPath(
         {parts.drive, parts.folder, NewBaseName(job, rules, parts.base), parts.extension});
-    if (!RenameHint(path, job).empty()) return Status::RenameError;
+    if (!RenameHint(path, rules, job).empty()) return Status::RenameError;
     const bool free = path != old && !files.Exists(path);
     const platform::CommitResult result =
         free ? files.Rename(old, path) : platform::CommitResult::Taken;

@@ -16,11 +16,14 @@ class ScriptedPrompts : public Prompts {
   std::vector<OverwriteAnswer> answers;
   std::vector<std::optional<std::string>> names;
   std::vector<OverwriteQuestion> questions;
+  bool skipNames = false;
+  int namesAsked = 0;
 
-  std::optional<std::string> AskDestinationName(const NameQuestion&) override {
+  NameAnswer AskDestinationName(const NameQuestion&) override {
+    ++namesAsked;
     const auto name = names.empty() ? std::nullopt : names.front();
     if (!names.empty()) names.erase(names.begin());
-    return name;
+    return {.ok = name.has_value(), .name = name.value_or(""), .skipRest = skipNames};
   }
   OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) override {
     questions.push_back(question);
@@ -155,7 +158,9 @@ TEST(DestinationName, ExistingNames) {
       {"applied to the rest, both", {}, true, true, {}, "a [2].tif", 0},
       {"applied to the rest", {.keepBoth = false}, true, true, {}, "!a.tif", 0},
       {"cancelled", {}, false, true, {{}}, "skipped", 1},
-      {"both", {}, false, true, {{true, ask, "b", false}}, "a [2].tif", 1},
+      {"both", {}, false, true, {{true, ask, "a", false}}, "a [2].tif", 1},
+      {"both, by a typed name", {}, false, true, {{true, ask, "new", false}}, "new.tif", 1},
+      {"both, by a typed name that is taken", {}, false, true, {{true, ask, "b", false}}, "b [1].tif", 1},
       {"replaced", {}, false, true, {{true, replace, "a", false}}, "!a.tif", 1, {{Remembered::OverwriteKeepBoth, 0}}},
       {"renamed", {.keepBoth = false}, false, true, {{true, replace, "new", false}}, "new.tif", 1},
       {"renamed to a taken one, then cancelled", {.keepBoth = false}, false, true, {{true, replace, "b", false}}, "skipped", 2},
@@ -224,6 +229,10 @@ TEST(DestinationName, TypedNamesAndVariants) {
   prompts.names = {"/other/b.tif"};
   EXPECT_EQ(Settle(job, {"/other/b.tif"}, "in/a.bmp"), "skipped");  // the prompt was canceled
   EXPECT_EQ(Settle(job, {}, "in/a.bmp"), "skipped");
+  prompts.skipNames = true;
+  prompts.namesAsked = 0;
+  for (const char* source : {"in/a.bmp", "in/b.bmp"}) EXPECT_EQ(Settle(job, {}, source), "skipped");
+  EXPECT_EQ(prompts.namesAsked, 1) << "the rest is skipped, too";
   job.naming.askName = false;
 
   job.applyToRest = true;

@@ -42,6 +42,8 @@ TEST(Progress, ClosingLines) {
     for (size_t i = before; i < job.progress.Lines().size(); ++i)
       closing.push_back(job.progress.Lines()[i].text);
     EXPECT_EQ(closing, row.closing);
+    EXPECT_EQ(job.progress.StatusText(), CountLine(static_cast<uint32_t>(row.files)))
+        << "no file is in work";
     EXPECT_EQ(job.progress.IsOpen(), row.open);
     EXPECT_EQ(job.progress.CloseLive() && job.progress.HasScrollBar(), row.open);
     EXPECT_FALSE(job.progress.AbortLive());

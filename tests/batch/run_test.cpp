@@ -159,6 +159,36 @@ TEST_F(Run, PrefixesApplyBeforeCollisions) {
   }
 }
 
+TEST_F(Run, TheLaterOfTwoOutputsOfOneNameIsNumberedAndSaysWhy) {
+  fs::create_directory(In("two"));
+  fs::create_directory(In("out"));
+  std::vector<BatchFile> files;
+  for (const char* name : {"a.bmp", "two/a.bmp", "b.bmp"}) {
+    WriteBytes(In(name), BitmapFile(8, 8, 24));
+    files.push_back({In(name), {}, Status::Ok, {}});
+  }
+  WriteText(In("out/b.pcx"), "old");
+  const std::string why = ": Numbered, as another file of this run is \"a.pcx\".";
+  const struct {
+    const char* name;
+    OverwritePolicy policy;
+    const char* third;
+  } rows[] = {{"keep both", {}, "b [1].pcx"}, {"replace", {.prompt = false}, "b.pcx"}};
+  for (const auto& row : rows) {
+    for (const uint32_t jobs : {1u, 3u}) {
+      SCOPED_TRACE(row.name);
+      for (const char* made : {"a.pcx", "a [1].pcx", "b [1].pcx"}) fs::remove(In("out/") + made);
+      BatchJob job = NewJob();
+      job.overwrite = row.policy;
+      ASSERT_EQ(RunBatch(files, {.jobs = jobs}, job), Status::Ok);
+      EXPECT_EQ(job.progress.Lines()[0].text, files[0].name + " -> " + In("out/a.pcx"));
+      EXPECT_EQ(job.progress.Lines()[1].text, files[1].name + " -> " + In("out/a [1].pcx") + why);
+      // one that was there before says nothing of that
+      EXPECT_EQ(job.progress.Lines()[2].text, files[2].name + " -> " + In("out/") + row.third);
+    }
+  }
+}
+
 TEST_F(Run, FailedOutputsReleaseTheirName) {
   fs::create_directory(In("two"));
   WriteBytes(In("a.bmp"), BitmapFile(70000, 1, 24));  // too wide for JPEG
@@ -206,7 +236,8 @@ TEST_F(Run, SourcesAreReadBeforeTheyAreReplaced) {
     job.destinationFolder.clear();
     job.overwrite.prompt = false;
     ASSERT_EQ(RunBatch(files, {.jobs = jobs}, job), Status::Ok);
-    EXPECT_EQ(job.progress.Lines()[0].text, In("a.dib") + " -> " + In("a [1].bmp"));  // sources stay
+    EXPECT_EQ(job.progress.Lines()[0].text, In("a.dib") + " -> " + In("a [1].bmp") +
+                                                ": Numbered, as another file of this run is \"a.bmp\".");
     EXPECT_EQ(job.progress.Lines()[1].text, In("a.bmp") + " -> " + In("a.bmp"));
     EXPECT_EQ(ReadBytes(In("a [1].bmp")).size(), ReadBytes(In("a.dib")).size());
   }
@@ -244,6 +275,60 @@ TEST_F(Run, KeepsToTheJobLimitAndStartsNothingAfterAbort) {
     EXPECT_EQ(job.progress.Files(), whole);
     EXPECT_EQ(LinesOf(job).back(), CountLine(whole));
   }
+}
+
+// The first file waits until the box was told that the others are done.
+TEST_F(Run, TellsWhatIsInWorkBeforeTheFirstFileIsDone) {
+  class Box : public ProgressBox {
+   public:
+    explicit Box(std::atomic<bool>& told) : told_(told) {}
+    bool Open(const ProgressModel&) override { return true; }
+    void ShowLine(const ProgressLine&, const FileOutcome*) override { ++lines; }
+    void ShowStatus(const std::string&) override {}
+    void ShowWork(const ProgressWork& work) override {
+      works.push_back(work);
+      if (work.done == 2 && lines == 0) told_ = true;
+    }
+    void StayOpen(const ProgressModel&) override {}
+    void Close(const ProgressModel&) override {}
+    int lines = 0;
+    std::vector<ProgressWork> works;
+
+   private:
+    std::atomic<bool>& told_;
+  };
+  std::vector<BatchFile> files;
+  for (const char* name : {"a.bmp", "b.bmp", "c.bmp"}) {
+    WriteBytes(In(name), BitmapFile(name[0] == 'a' ? 9 : 8, 8, 24));
+    files.push_back({In(name), {}, Status::Ok, {}});
+  }
+  std::atomic<bool> told{false};
+  Box box(told);
+  const auto transform = [&](PictureRecord& picture) {
+    for (int i = 0; i < 1000 && picture.width == 9 && !told; ++i)
+      std::this_thread::sleep_for(std::chrono::milliseconds(10));
+    return Status::Ok;
+  };
+  BatchJob job = NewJob();
+  job.box = &box;
+  ASSERT_EQ(RunBatch(files, {.transform = transform, .jobs = 2}, job), Status::Ok);
+  if (std::thread::hardware_concurrency() > 1) {
+    EXPECT_TRUE(told);
+    const auto waiting = std::ranges::find(box.works, 2u, &ProgressWork::done);
+    EXPECT_EQ(waiting->file, files[0].name);
+    EXPECT_EQ(waiting->inWork, 1u);
+  }
+  EXPECT_EQ(box.works.front().done, 0u);
+  EXPECT_EQ(box.works.front().count, 3u);
+  // one after the other, each is told when it begins
+  told = true;
+  Box single(told);
+  BatchJob other = NewJob();
+  other.box = &single;
+  other.overwrite.prompt = false;
+  ASSERT_EQ(RunBatch(files, {.jobs = 1}, other), Status::Ok);
+  for (const BatchFile& file : files)
+    EXPECT_NE(std::ranges::find(single.works, file.name, &ProgressWork::file), single.works.end());
 }
 
 TEST_F(Run, NoFaultLosesAFile) {

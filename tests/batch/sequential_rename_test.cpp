@@ -151,6 +151,15 @@ TEST_F(Rename, Names) {
   }
 }
 
+TEST_F(Rename, TheBaseNameHasNoPartInNumbersInFront) {
+  for (const char* base : {"a/b", "", "PICTURE"}) {
+    Make({"beach.jpg"});
+    const BatchJob job = RunOn({"beach.jpg"}, {.rules = {.baseName = base, .numberFirst = true}});
+    EXPECT_FALSE(job.errors) << base;
+    EXPECT_THAT(There(), ElementsAre("0001beach.jpg=beach.jpg")) << base;
+  }
+}
+
 // The settings may change while a run waits for others.
 TEST_F(Rename, KeepsTheRulesItWasStartedWith) {
   Make({"a.jpg", "b.jpg"});

@@ -158,6 +158,7 @@ TEST(Turn, KeepsNamesAndOldFiles) {
   ASSERT_EQ(LoadPicture({.fileName = folder.Path("c.bmp")}, once), Status::Ok);
   EXPECT_TRUE(SamePixels(once->image, twice->image));
   EXPECT_TRUE(fs::exists(folder.Path("out/a [1].bmp")));
+  EXPECT_THAT(LinesOf(other)[2], testing::HasSubstr("a [1].bmp: Numbered, as another file of this run is \"a.bmp\"."));
   // A rotation by nothing leaves the file alone.
   EXPECT_FALSE(TurnPictureFile(folder.Path("c.bmp"), folder.Path("c.bmp"), {}, {}, {}).changed);
 }

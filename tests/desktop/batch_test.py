@@ -2,8 +2,9 @@
 """Batches of the real program: converting, collisions, errors that keep the box open, abort."""
 import os
 import struct
+import subprocess
 
-from driven_desktop import Desktop, Failure, make_pictures, run
+from driven_desktop import Desktop, Failure, make_pictures, needs_manager, run
 
 
 def start_convert(desktop):
@@ -133,6 +134,129 @@ def destination_in_parts(folder):
         assert "DefaultFileExtension=jpg\n" in text and "LastFormatSelected=15\n" in text, text
 
 
+def name_prompt(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.bmp", "c.bmp"])
+    with Desktop(folder, pictures, settings=["DefaultFileExtension=png", "DestForceSourceDir=1", "PromptForDestName=1",
+                                             "WarnDestinationWrite=0"]) as desktop:
+        desktop.wait(r"lines=3 .*missing=0 listing=0")
+        start_convert(desktop)
+        desktop.key("Return")
+        desktop.wait(r"prompt name .*/a.png")
+        desktop.focus("^Destination name$")
+        desktop.screenshot("destination-name")
+        # The field holds the name without its extension, which stays whatever is typed.
+        desktop.key("ctrl+a")
+        desktop.type("first.one")
+        desktop.key("Return")
+        desktop.wait(r"batch-line .*a.bmp -> .*/first.one.png")
+        desktop.wait(r"prompt name .*/b.png")
+        desktop.focus("^Destination name$")
+        desktop.key("alt+l")
+        desktop.wait(r"batch-line .*b.bmp: skipped")
+        desktop.wait(r"batch-line .*c.bmp: skipped")
+        desktop.wait(r"batch ended")
+        # Abort is in the prompt, as the box behind it cannot be reached.
+        start_convert(desktop)
+        desktop.key("Return")
+        desktop.wait(r"prompt name .*/a.png")
+        desktop.focus("^Destination name$")
+        desktop.key("alt+a")
+        desktop.wait(r"batch-line No files were processed")
+        desktop.wait(r"batch ended")
+        assert sorted(path.name for path in pictures.glob("*.png")) == ["first.one.png"]
+
+
+def previews_when_wanted(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp"])
+    (pictures / "a.png").write_bytes(b"old")
+    with Desktop(folder, pictures, settings=["DefaultFileExtension=png", "DestForceSourceDir=1",
+                                             "OverwritePromptPreviews=0", "WarnDestinationWrite=0"]) as desktop:
+        desktop.wait(r"lines=2 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "ctrl+e")
+        desktop.wait(r"prompt destination")
+        desktop.focus("^Convert$")
+        desktop.key("Return")
+        desktop.wait(r"prompt overwrite .*a.png")
+        desktop.focus("^Overwrite File$")
+        desktop.key("Tab", "Tab", "Tab", "Tab", "space")
+        desktop.wait(r"overwrite previews")
+        desktop.screenshot("overwrite-previews")
+        desktop.key("space")
+        desktop.wait(r"overwrite no-previews")
+        desktop.key("Escape")
+        desktop.wait(r"batch-line .*a.bmp: skipped")
+
+
+def box_shows_work(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a" * 120 + ".bmp", "b.bmp"])
+    with Desktop(folder, pictures, settings=["DefaultFileExtension=png", "DefaultViewMode=0", "CloseProgressWhenDone=0",
+                                             "DestForceSourceDir=1", "ProgressShowMissingThumbnails=1",
+                                             "WarnDestinationWrite=0"]) as desktop:
+        desktop.wait(r"lines=2 .*listing=0 view=0")
+        start_convert(desktop)
+        desktop.key("Return")
+        # The browser's details have no thumbnails; the box has its own.
+        desktop.wait(r"progress-thumbnail .*b.bmp", again=True)
+        desktop.wait(r"progress-status 2 files were processed")
+        desktop.focus("^Progress$")
+        desktop.screenshot("progress-thumbnails")
+        desktop.key("shift+Tab")
+        desktop.key("Right")
+        desktop.wait(r"progress-list left=[1-9]")
+
+
+def other_program(desktop):
+    """A window of another program, in front; its title."""
+    folder = desktop.folder / "other"
+    (folder / "data").mkdir(parents=True, exist_ok=True)
+    environment = dict(desktop.environment, FOTOMILL_DATA=str(folder / "data"), XDG_RUNTIME_DIR=str(folder),
+                       FOTOMILL_DESKTOP_LOG=str(folder / "log"))
+    program = subprocess.Popen([desktop.program.args[0], str(folder)], env=environment, stdin=subprocess.DEVNULL,
+                               stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
+    desktop.focus("^other - Fotomill", settle=False, native=True)
+    return program
+
+
+@needs_manager
+def raised_at_the_end(folder):
+    for raises in (0, 1):
+        pictures = folder / f"pictures{raises}"
+        make_pictures(pictures, ["p.bmp"])
+        for number in range(3000):
+            os.link(pictures / "p.bmp", pictures / f"p{number}.bmp")
+        with Desktop(folder, pictures, settings=["DefaultFileExtension=tif", "DestForceSourceDir=1",
+                                                 "CloseProgressWhenDone=0", "WarnDestinationWrite=0",
+                                                 "PromptBeforeOverwrite=0", f"ProgressRaiseAppWindow={raises}"]) as desktop:
+            desktop.wait(r"lines=3001 .*listing=0")
+            start_convert(desktop)
+            desktop.key("Return")
+            desktop.wait(r"batch opened")
+            # A second one opens its box when the first has ended.
+            desktop.focus("^pictures[01] - Fotomill", settle=False)
+            desktop.key("Home", "ctrl+e")
+            desktop.wait(r"prompt destination")
+            desktop.focus("^Convert$", settle=False)
+            desktop.key("Return")
+            desktop.wait(r"batch waiting=1")
+            program = other_program(desktop)
+            try:
+                if "batch stays-open" in desktop.log_text():
+                    raise Failure("the batch was faster than the test")
+                desktop.wait(r"batch stays-open")
+                desktop.wait(r"batch stays-open")
+                desktop.settle()
+                front = desktop.xdotool("getactivewindow", "getwindowname")
+                assert ("batch raised" in desktop.log_text()) == bool(raises)
+                assert front[:1] == (["Progress"] if raises else ["other"]), (raises, front)
+            finally:
+                program.terminate()
+                program.wait()
+
+
 def errors_stay_and_abort_stops(folder):
     pictures = folder / "pictures"
     make_pictures(pictures, ["p.bmp"])
@@ -195,4 +319,5 @@ def resize_to_a_named_size(folder):
 
 
 run(convert_and_collide, destination_step, destination_in_parts, resize_to_a_named_size,
-    errors_stay_and_abort_stops)
+    name_prompt, previews_when_wanted,
+    box_shows_work, raised_at_the_end, errors_stay_and_abort_stops)

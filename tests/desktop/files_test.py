@@ -112,6 +112,17 @@ def rename_in_sequence(folder):
         desktop.key("ctrl+z")
         desktop.wait(r"files Undo rename of 3 files done=3")
         assert names(pictures) == ["a.bmp", "b.bmp", "c.bmp"], names(pictures)
+        # With the number in front the base name has no part in it, whatever it is.
+        desktop.key("ctrl+a", "shift+F2")
+        desktop.wait(r"prompt sequential-rename")
+        desktop.focus("^Sequential Rename$")
+        desktop.key("ctrl+a")
+        desktop.type("no/name")
+        desktop.key("alt+p", "Return")
+        desktop.wait(r"batch ended")
+        assert [name[4:] for name in names(pictures)] == ["a.bmp", "b.bmp", "c.bmp"], names(pictures)
+        ini = (desktop.data / "Fotomill Professional 11.ini").read_text()
+        assert "SequentialRenameBaseName=beach\n" in ini, ini
 
 
 def thumbnails_and_session(folder):

@@ -114,7 +114,11 @@ class RewriteBatch {
     destination.path = outcome.destination;
     destination.search = names_.MakeVariant(outcome.destination, job_.naming.firstVariant,
                                             job_.naming.lastVariant, taken, job_.stop.Token());
-    if (destination.search != VariantSearch::Found) SayNoName(destination, outcome);
+    if (destination.search != VariantSearch::Found) {
+      SayNoName(destination, outcome);
+    } else if (byRun) {
+      outcome.note = SharedNameNote(destination.path);
+    }
   }
 
   void Rewrite(FileOutcome& outcome) const {
@@ -142,7 +146,7 @@ class RewriteBatch {
     outcome.hint =
         kept ? made.hint
              : std::string(Tr("There is not enough disk space to keep the old file for undo."));
-    outcome.note = made.note;
+    outcome.note.Append(made.note);
     if (made.changed) NoteLostAttributes(outcome);
     outcome.skipped = made.status == Status::Ok && !made.changed;
     if (outcome.skipped)

@@ -86,11 +86,12 @@ std::optional<std::string> TerminalPrompts::Ask(const std::string& question) {
   return Trimmed(line);
 }
 
-std::optional<std::string> TerminalPrompts::AskDestinationName(const NameQuestion& question) {
+NameAnswer TerminalPrompts::AskDestinationName(const NameQuestion& question) {
   const std::string problem = question.problem.empty() ? "" : question.problem + " ";
   const auto line = Ask(
       problem + Tr("Name of the output (empty: %1; Ctrl-D: skip):", EscapeControls(question.path)));
-  return line && line->empty() ? question.path : line;
+  if (!line) return {};
+  return {.ok = true, .name = line->empty() ? question.path : *line};
 }
 
 OverwriteAnswer TerminalPrompts::AskOverwrite(const OverwriteQuestion& question) {

@@ -18,7 +18,7 @@ class TerminalPrompts : public Prompts {
   TerminalPrompts(const CommandContext& context, ResultOutput& output)
       : context_(context), output_(output) {}
 
-  std::optional<std::string> AskDestinationName(const NameQuestion& question) override;
+  NameAnswer AskDestinationName(const NameQuestion& question) override;
   OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) override;
   std::optional<std::string> AskPassword(const std::string& path) override;
   bool ConfirmFormat(const std::string&) override { return true; }  // given on the command line

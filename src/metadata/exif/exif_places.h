@@ -11,8 +11,8 @@ struct ExifPlace {
   double latitude = 0, longitude = 0;
 };
 
-// The places that the GPS directory of an EXIF block tells; none where an angle or its hemisphere is
-// missing or impossible. Source: CIPA DC-008-2012, section 4.6.6.
+// The places that the GPS directory of an EXIF block tells; none where an angle or its hemisphere
+// is missing or impossible. Source: CIPA DC-008-2012, section 4.6.6.
 struct ExifPlaces {
   std::optional<ExifPlace> taken;        // where the picture was taken
   std::optional<ExifPlace> destination;  // what it shows

@@ -1,5 +1,7 @@
 #include "desktop/models/batch/batch_thread.h"
 
+#include <algorithm>
+
 #include "batch/new_job.h"
 #include "core/choice_lists.h"
 #include "desktop/models/browser/browser_model.h"
@@ -79,9 +81,15 @@ class BatchThread::Box : public ProgressBox {
   void ShowStatus(const std::string& status) override {
     batch_.PostToWindows([&windows = batch_.windows_, status] { windows.BatchStatus(status); });
   }
+  void ShowWork(const ProgressWork& work) override {
+    work_ = work;
+    batch_.PostToWindows([&windows = batch_.windows_, work] { windows.BatchWork(work); });
+  }
+  // What is reported follows what is done; batches without work to tell report only that.
   void ShowProgress(uint32_t done, uint32_t count) override {
-    batch_.PostToWindows(
-        [&windows = batch_.windows_, done, count] { windows.BatchProgress(done, count); });
+    work_.done = std::max(work_.done, done);
+    work_.count = count;
+    ShowWork(work_);
   }
   void StayOpen(const ProgressModel& model) override {
     batch_.PostToWindows([&windows = batch_.windows_, model] { windows.BatchStaysOpen(model); });
@@ -92,6 +100,7 @@ class BatchThread::Box : public ProgressBox {
 
  private:
   BatchThread& batch_;
+  ProgressWork work_;
 };
 
 // The batch's side of the prompts.
@@ -100,16 +109,19 @@ class BatchThread::Questions : public Prompts {
   Questions(BatchThread& batch, const ThumbnailOptions& thumbnails)
       : batch_(batch), thumbnails_(thumbnails) {}
   OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) override {
+    const auto make = [&] { return MakeOverwritePreview(question, kPreviewSide, thumbnails_); };
+    // what is going to be shown is made here, and what the user asks for then by the window
     OverwritePreview preview;
-    if (question.checks.previews)
-      preview = MakeOverwritePreview(question, kPreviewSide, thumbnails_);
+    if (question.checks.previews) preview = make();
+    const OverwritePreviewMaker maker =
+        question.checks.previews ? OverwritePreviewMaker([&] { return preview; }) : make;
     OverwriteAnswer answer;
     answer.skipRest =
-        !batch_.AskWindow([&] { answer = batch_.windows_.AskOverwrite(question, preview); });
+        !batch_.AskWindow([&] { answer = batch_.windows_.AskOverwrite(question, maker); });
     return answer;
   }
-  std::optional<std::string> AskDestinationName(const NameQuestion& question) override {
-    std::optional<std::string> answer;
+  NameAnswer AskDestinationName(const NameQuestion& question) override {
+    NameAnswer answer;
     (void)batch_.AskWindow([&] { answer = batch_.windows_.AskDestinationName(question); });
     return answer;
   }

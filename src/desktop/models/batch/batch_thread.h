@@ -24,6 +24,8 @@ struct OverwritePreview {
   std::string existingText, incomingText;  // size, dimensions and date of each, a line each
 };
 
+using OverwritePreviewMaker = std::function<OverwritePreview()>;
+
 // What a batch tells and asks its windows. Every call comes on the window's thread.
 class BatchWindows {
  public:
@@ -34,15 +36,15 @@ class BatchWindows {
   virtual void BatchLine(const ProgressLine& line, const FileOutcome& outcome) = 0;
   // The line that tells which file is in work.
   virtual void BatchStatus(const std::string& status) = 0;
-  virtual void BatchProgress(uint32_t done, uint32_t count) = 0;  // files
+  virtual void BatchWork(const ProgressWork& work) = 0;
   // The end: the box stays open to be read, or goes.
   virtual void BatchStaysOpen(const ProgressModel& model) = 0;
   virtual void BatchCloses() = 0;
-  // The name of an output is taken. The batch waits for the answer.
+  // The name of an output is taken. The batch waits for the answer. `makePreview` may be called on
+  // any thread until then, and takes as long as it takes.
   virtual OverwriteAnswer AskOverwrite(const OverwriteQuestion& question,
-                                       const OverwritePreview& preview) = 0;
-  // `nullopt`: the file is skipped.
-  virtual std::optional<std::string> AskDestinationName(const NameQuestion& question) = 0;
+                                       const OverwritePreviewMaker& makePreview) = 0;
+  virtual NameAnswer AskDestinationName(const NameQuestion& question) = 0;
   virtual std::optional<std::string> AskPassword(const std::string& path) = 0;  // nullopt: Cancel
   virtual bool ConfirmFormat(const std::string& question) = 0;
   // `yes`: the text of the button that agrees.

@@ -57,13 +57,14 @@ void AddPlaces(const ExifPlaces& places, const ExifReportOptions& options, ExifR
   report.rows.push_back({true, 0, Tr("Places"), {}});
   report.text.append(Tr("Places")).append("\n");
   const auto distance = [&](const ExifPlace& from, const ExifPlace& to) {
-    return DecimalText(GpsDistance(from.latitude, from.longitude, to.latitude, to.longitude,
-                                   options.unit),
-                       1) +
+    return DecimalText(
+               GpsDistance(from.latitude, from.longitude, to.latitude, to.longitude, options.unit),
+               1) +
            " " + Tr(DistanceUnitName(options.unit));
   };
   if (places.taken) {
-    AddRow(TrLater("Place of the picture"), GpsPlaceText(places.taken->latitude, places.taken->longitude), report);
+    AddRow(TrLater("Place of the picture"),
+           GpsPlaceText(places.taken->latitude, places.taken->longitude), report);
     if (options.home)
       AddRow(TrLater("Distance to the default location"), distance(*options.home, *places.taken),
              report);

@@ -8,6 +8,7 @@
 #include "desktop/models/batch/destination_choice.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/batch/destination_dialog.h"
+#include "desktop/windows/batch/name_dialog.h"
 #include "desktop/windows/batch/notification.h"
 #include "desktop/windows/batch/overwrite_dialog.h"
 #include "desktop/windows/batch/progress_window.h"
@@ -94,7 +95,12 @@ void BatchRunner::BatchOpened() {
   };
   LeaveBox();
   box_ = new ProgressWindow(&shell_.Window(), shell_.Thumbnails(), events);
-  box_->Show();
+  // the keyboard stays with another program that has it
+  if (InFront()) {
+    box_->Show();
+  } else {
+    box_->ShowWithoutActivating();
+  }
   ReportWaiting();
   LogEvent("batch", "opened");
 }
@@ -113,15 +119,15 @@ void BatchRunner::BatchStatus(const std::string& status) {
   if (box_ != nullptr) box_->SetStatus(status);
 }
 
-void BatchRunner::BatchProgress(uint32_t done, uint32_t count) {
-  if (box_ != nullptr) box_->SetProgress(done, count);
+void BatchRunner::BatchWork(const ProgressWork& work) {
+  if (box_ != nullptr) box_->SetWork(work);
 }
 
 // Checks whether the user saw the end before the box takes the focus.
 void BatchRunner::BatchStaysOpen(const ProgressModel& model) {
   seen_ = InFront();
   LogEvent("batch", "stays-open files=" + std::to_string(model.Files()));
-  if (box_ != nullptr) box_->StayOpen();
+  if (box_ != nullptr) box_->StayOpen(model.StatusText());
 }
 
 void BatchRunner::BatchCloses() {
@@ -137,6 +143,7 @@ void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   if (job.formatIndex != kNoFormat) shell_.Files().NoteDone(std::exchange(written_, {}));
   if (previous_ != nullptr) shell_.Files().NoteDone(std::exchange(previous_, nullptr)->Operation());
   if (job.filesChanged) shell_.FilesChanged();
+  if (!seen_ && settings.ProgressRaiseAppWindow != 0) RaiseProgram();
   if (!seen_)
     NotifyUser(shell_.Window(),
                failed_ == 0 ? Label("Batch finished") : Label("Batch finished with errors"),
@@ -145,25 +152,32 @@ void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   CallAfter([this] { StartNext(); });
 }
 
+// The user looks at another program: brings what is to be seen in front of it.
+void BatchRunner::RaiseProgram() {
+  wxTopLevelWindow* const window = box_ != nullptr && box_->StaysOpen()
+                                       ? static_cast<wxTopLevelWindow*>(box_)
+                                       : &shell_.Window();
+  if (window->IsIconized()) window->Iconize(false);
+  window->Raise();
+  LogEvent("batch", "raised");
+}
+
 // --- questions ---
 
 OverwriteAnswer BatchRunner::AskOverwrite(const OverwriteQuestion& question,
-                                          const OverwritePreview& preview) {
-  OverwriteDialog dialog(DialogParent(), question, preview);
+                                          const OverwritePreviewMaker& makePreview) {
+  OverwriteDialog dialog(DialogParent(), question, makePreview);
   LogEvent("prompt", "overwrite " + question.path);
   dialog.ShowModal();
   return dialog.Answer();
 }
 
-std::optional<std::string> BatchRunner::AskDestinationName(const NameQuestion& question) {
-  const wxString problem = question.problem.empty() ? wxString() : Shown(question.problem) + "\n";
-  wxTextEntryDialog dialog(
-      DialogParent(), problem + Label("Write %1 to:", Shown(platform::FileNameOf(question.source))),
-      question.title.empty() ? Label("Destination name") : Shown(Tr(question.title)),
-      wxString::FromUTF8(question.path));
+NameAnswer BatchRunner::AskDestinationName(const NameQuestion& question) {
+  NameDialog dialog(DialogParent(), question);
   LogEvent("prompt", "name " + question.path);
-  if (dialog.ShowModal() != wxID_OK) return std::nullopt;
-  return Utf8(dialog.GetValue());
+  dialog.ShowModal();
+  if (dialog.Aborts()) thread_->Abort();
+  return dialog.Answer();
 }
 
 std::optional<std::string> BatchRunner::AskPassword(const std::string& path) {

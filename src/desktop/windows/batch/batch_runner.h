@@ -46,16 +46,17 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
   void BatchOpened() override;
   void BatchLine(const ProgressLine& line, const FileOutcome& outcome) override;
   void BatchStatus(const std::string& status) override;
-  void BatchProgress(uint32_t done, uint32_t count) override;
+  void BatchWork(const ProgressWork& work) override;
   void BatchStaysOpen(const ProgressModel& model) override;
   void BatchCloses() override;
   OverwriteAnswer AskOverwrite(const OverwriteQuestion& question,
-                               const OverwritePreview& preview) override;
-  std::optional<std::string> AskDestinationName(const NameQuestion& question) override;
+                               const OverwritePreviewMaker& makePreview) override;
+  NameAnswer AskDestinationName(const NameQuestion& question) override;
   std::optional<std::string> AskPassword(const std::string& path) override;
   bool ConfirmFormat(const std::string& question) override;
   bool Confirm(const std::string& question, const std::string& yes) override;
   void BatchEnded(Status status, const BatchJob& job) override;
+  void RaiseProgram();
   wxWindow* DialogParent() const;
 
   Shell& shell_;

@@ -7,6 +7,7 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/widgets/bitmaps.h"
 #include "desktop/windows/widgets/looks.h"
@@ -25,9 +26,11 @@ constexpr int kPaneSide = 240;
 }  // namespace
 
 OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& question,
-                                 const OverwritePreview& preview)
+                                 OverwritePreviewMaker makePreview)
     : wxDialog(parent, wxID_ANY, Label(kOverwriteTitle.data()), wxDefaultPosition, wxDefaultSize,
-               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "OverwriteBox") {
+               wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "OverwriteBox"),
+      question_(question),
+      makePreview_(std::move(makePreview)) {
   const int gap = FromDIP(8);
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   const auto below = wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap);
@@ -49,10 +52,7 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
     problem->SetForegroundColour(FaultColor());
     sizer->Add(problem, below);
   }
-  if (question.checks.previews)
-    sizer->Add(panes_ = MakePreviews(question, preview),
-               wxSizerFlags(1).Expand().Border(wxALL, gap));
-
+  panesPlace_ = sizer->GetItemCount();
   const auto check = [&](std::string_view label, bool value) {
     auto* box = new wxCheckBox(this, wxID_ANY, Shown(Tr(label)));
     box->SetValue(value);
@@ -80,7 +80,13 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
   buttons->Add(ok);
   sizer->Add(buttons, wxSizerFlags().Expand().Border(wxALL, gap));
   ok->SetDefault();
-  SetSizerAndFit(sizer);
+  SetSizer(sizer);
+  if (question.checks.previews) {
+    preview_ = makePreview_();
+    AddPanes();
+  }
+  Fit();
+  SetMinSize(GetSize());
   CentreOnParent();
   name_->SetFocus();
   name_->SelectAll();
@@ -89,15 +95,31 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
     skipRest_ = true;
     EndModal(wxID_CANCEL);
   });
-  previews_->Bind(wxEVT_CHECKBOX, [this](wxCommandEvent&) {
-    if (panes_ == nullptr) return;
-    panes_->ShowItems(previews_->GetValue());
-    Fit();
-  });
+  previews_->Bind(wxEVT_CHECKBOX, [this](wxCommandEvent&) { ShowPreviews(); });
 }
 
-wxSizer* OverwriteDialog::MakePreviews(const OverwriteQuestion& question,
-                                       const OverwritePreview& preview) {
+// Where they were not wanted at first they are made apart when they are.
+void OverwriteDialog::ShowPreviews() {
+  if (panes_ == nullptr && previews_->GetValue())
+    return work_.Start(
+        *this, [this](const StopToken&) { preview_ = makePreview_(); },
+        [this](Status) {
+          AddPanes();
+          ShowPreviews();
+        });
+  if (panes_ == nullptr) return work_.Stop();
+  GetSizer()->Show(panes_, previews_->GetValue());
+  SetMinSize(wxDefaultSize);
+  Fit();
+  LogEvent("overwrite", previews_->GetValue() ? "previews" : "no-previews");
+}
+
+void OverwriteDialog::AddPanes() {
+  panes_ = MakePanes(preview_);
+  GetSizer()->Insert(panesPlace_, panes_, wxSizerFlags(1).Expand().Border(wxALL, FromDIP(8)));
+}
+
+wxSizer* OverwriteDialog::MakePanes(const OverwritePreview& preview) {
   auto* panes = new wxBoxSizer(wxHORIZONTAL);
   const auto pane = [&](const wxString& title, const RgbImage& image, const std::string& text) {
     auto* column = new wxBoxSizer(wxVERTICAL);
@@ -121,7 +143,7 @@ wxSizer* OverwriteDialog::MakePreviews(const OverwriteQuestion& question,
     panes->Add(column, wxSizerFlags(1).Expand().Border(wxALL, FromDIP(4)));
   };
   pane(Label("Existing file"), preview.existing, preview.existingText);
-  pane(Label("New, from %1", Shown(platform::FileNameOf(question.source))), preview.incoming,
+  pane(Label("New, from %1", Shown(platform::FileNameOf(question_.source))), preview.incoming,
        preview.incomingText);
   return panes;
 }

@@ -2,122 +2,36 @@
 
 #include <wx/button.h>
 #include <wx/clipbrd.h>
-#include <wx/dcclient.h>
 #include <wx/listbox.h>
 #include <wx/panel.h>
-#include <wx/settings.h>
 #include <wx/stattext.h>
-#include <wx/vlbox.h>
 
 #include <algorithm>
-#include <cmath>
+#include <utility>
 
 #include "batch/new_job.h"
-#include "core/choice_lists.h"
-#include "core/text.h"
-#include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/models/shell/event_log.h"
+#include "desktop/windows/batch/notification.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/clock.h"
-#include "platform/paths.h"
-#include "settings/settings.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-constexpr double kTimeLeftAfter = 3;  // seconds
-constexpr int kThumbnailSide = 48;
 constexpr int kNewsMs = 40;  // what comes is gathered for so long
 
-wxString TimeLeft(double seconds) {
-  const long whole = std::lround(std::ceil(seconds));
-  if (whole < 60) return ", " + Label("%1 s left", whole);
-  return ", " + Label("%1 min left", (whole + 59) / 60);
-}
-
 }  // namespace
-
-// Rows drawn here, with the thumbnail of each file.
-class ProgressWindow::DrawnList : public wxVListBox {
- public:
-  DrawnList(ProgressWindow& box, long style) : box_(box) {
-    Create(box.panel_, kProgressListId, wxDefaultPosition, wxDefaultSize, style | wxBORDER_THEME,
-           Label("Files"));
-    SetItemCount(box.rows_.size());
-  }
-
-  void OnDrawItem(wxDC& dc, const wxRect& rect, size_t n) const override {
-    const Row& row = box_.rows_[n];
-    const int side = IsAboutFile(row) ? FromDIP(kThumbnailSide) : 0;
-    int left = rect.x + FromDIP(6);
-    if (box_.settings_.thumbnails && (side > 0 || box_.settings_.showMissingThumbnails)) {
-      const ThumbnailPointer thumbnail = side > 0 ? box_.thumbnails_.FindAny(row.source) : nullptr;
-      if (thumbnail != nullptr && thumbnail->status == Status::Ok)
-        DrawThumbnail(dc, *thumbnail, wxRect(left, rect.y, side, rect.height));
-      if (HasPicture(row) || box_.settings_.showMissingThumbnails)
-        left += FromDIP(kThumbnailSide) + FromDIP(8);
-    }
-    const bool failed = row.line.item.status != Status::Ok && !row.line.item.skipped;
-    wxColour text = wxSystemSettings::GetColour(IsSelected(n) ? wxSYS_COLOUR_HIGHLIGHTTEXT
-                                                              : wxSYS_COLOUR_LISTBOXTEXT);
-    if (failed && !IsSelected(n)) text = ToWx(CurrentPalette().fault);
-    dc.SetTextForeground(text);
-    dc.SetFont(GetFont());
-    const wxRect place(left, rect.y, rect.GetRight() - left - FromDIP(4), rect.height);
-    const auto cut = [&](const wxString& line) {
-      return wxControl::Ellipsize(line, dc, wxELLIPSIZE_MIDDLE, place.width,
-                                  wxELLIPSIZE_FLAGS_NONE);
-    };
-    // Tall rows have the name above and what became of the file below.
-    const bool two = IsAboutFile(row) && rect.height >= 2 * GetCharHeight() + FromDIP(4) &&
-                     row.line.text.starts_with(row.source);
-    wxString label = cut(Shown(row.line.text));
-    if (two) {
-      std::string outcome = row.line.text.substr(row.source.size());
-      outcome.erase(0, std::min(outcome.find_first_not_of(": "), outcome.size()));
-      label = cut(Shown(platform::FileNameOf(row.source))) + "\n" + cut(Shown(outcome));
-    }
-    dc.DrawLabel(label, place, wxALIGN_CENTER_VERTICAL | wxALIGN_LEFT);
-  }
-
-  wxCoord OnMeasureItem(size_t n) const override {
-    const int fixed = LayOutProgressBox(1, 1, box_.settings_).rowHeight;
-    if (fixed > 0) return TextWidth(*this, fixed);
-    const bool tall = box_.settings_.thumbnails && HasPicture(box_.rows_[n]);
-    return tall ? FromDIP(kThumbnailSide + 6) : GetCharHeight() + FromDIP(8);
-  }
-
- private:
-  static bool IsAboutFile(const Row& row) { return row.line.item.file >= 0 && !row.source.empty(); }
-  bool HasPicture(const Row& row) const {
-    const ThumbnailPointer thumbnail =
-        IsAboutFile(row) ? box_.thumbnails_.FindAny(row.source) : nullptr;
-    return thumbnail != nullptr && thumbnail->status == Status::Ok;
-  }
-  void DrawThumbnail(wxDC& dc, const Thumbnail& thumbnail, const wxRect& place) const {
-    const wxBitmap bitmap = BitmapOf(thumbnail.pixels, GetContentScaleFactor());
-    const wxSize size = bitmap.GetSize();
-    const double shrink =
-        std::min(1.0, static_cast<double>(place.width) / std::max({size.x, size.y, 1}));
-    const wxPoint corner(place.x + static_cast<int>((place.width - size.x * shrink) / 2),
-                         place.y + static_cast<int>((place.height - size.y * shrink) / 2));
-    dc.SetUserScale(shrink, shrink);
-    dc.DrawBitmap(bitmap, static_cast<int>(corner.x / shrink), static_cast<int>(corner.y / shrink));
-    dc.SetUserScale(1, 1);
-  }
-
-  ProgressWindow& box_;
-};
 
 // A plain list of texts.
 class ProgressWindow::PlainList : public wxListBox {
  public:
   PlainList(ProgressWindow& box, long style)
-      : wxListBox(box.panel_, kProgressListId, wxDefaultPosition, wxDefaultSize, 0, nullptr, style,
-                  wxDefaultValidator, Label("Files")) {
-    for (const Row& row : box.rows_) Append(Shown(row.line.text));
+      : wxListBox(box.panel_, kProgressListId, wxDefaultPosition, wxDefaultSize, 0, nullptr,
+                  style | wxLB_HSCROLL, wxDefaultValidator, Label("Files")) {
+    for (const ProgressRow& row : box.rows_) Append(Shown(row.line.text));
   }
 };
 
@@ -126,8 +40,11 @@ ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Ev
               wxCAPTION | wxRESIZE_BORDER | wxFRAME_FLOAT_ON_PARENT | wxFRAME_NO_TASKBAR,
               kProgressBoxClass),
       events_(std::move(events)),
-      thumbnails_(thumbnails),
       settings_(ProgressSettingsFromSettings()),
+      thumbnails_(thumbnails, settings_.showMissingThumbnails,
+                  [this] {
+                    if (drawn_ != nullptr) drawn_->ShowNewThumbnails();
+                  }),
       started_(platform::MonotonicSeconds()),
       newsTimer_(this) {
   panel_ = new wxPanel(this);
@@ -146,8 +63,13 @@ ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Ev
   select_->Hide();
   abort_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) {
     abort_->Disable();
-    SetStatus(Tr("Stopping after the current files..."));
+    facts_.stopping = true;
+    GatherNews();
     events_.abort();
+  });
+  Bind(wxEVT_ACTIVATE, [this](wxActivateEvent& event) {
+    event.Skip();
+    if (event.GetActive() && std::exchange(focusesClose_, false)) close_->SetFocus();
   });
   Bind(wxEVT_TIMER, [this](wxTimerEvent&) { ShowNews(); });
   close_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { events_.closed(*this); });
@@ -156,25 +78,26 @@ ProgressWindow::ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Ev
   panel_->Bind(wxEVT_SIZE, [this](wxSizeEvent& event) { LayOut(), event.Skip(); });
   Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
     if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
-    if (done_) events_.closed(*this);
+    if (facts_.ended) events_.closed(*this);
   });
   Bind(wxEVT_CLOSE_WINDOW, [this](wxCloseEvent& event) {
     if (event.CanVeto()) event.Veto();
-    if (done_) events_.closed(*this);
+    if (facts_.ended) events_.closed(*this);
   });
   const wxSize client = InUnits(frame->GetClientSize());
   const Rectangle place = ProgressBoxPlace(client.x, client.y, settings_);
   const wxRect pixels = InPixels(place);
   SetSize(pixels.GetSize());
   SetPosition(frame->ClientToScreen(pixels.GetPosition()));
-  if (settings.ProgressRaiseAppWindow == 0) SetExtraStyle(GetExtraStyle() | wxWS_EX_BLOCK_EVENTS);
 }
 
 wxWindow* ProgressWindow::MakeList(bool scrollBar) {
   drawn_ = nullptr;
   plain_ = nullptr;
   const bool drawn = LayOutProgressBox(1, 1, settings_).kind != ProgressListKind::Plain;
-  if (drawn) return drawn_ = new DrawnList(*this, scrollBar ? wxALWAYS_SHOW_SB : 0);
+  if (drawn)
+    return drawn_ = new ProgressList(panel_, rows_, thumbnails_, settings_,
+                                     scrollBar ? wxALWAYS_SHOW_SB : 0);
   return plain_ = new PlainList(*this, scrollBar ? wxLB_ALWAYS_SB : 0);
 }
 
@@ -233,18 +156,17 @@ void ProgressWindow::AddLine(const ProgressLine& line, const std::string& source
 }
 
 void ProgressWindow::SetStatus(const std::string& status) {
-  text_ = status;
+  facts_.status = status;
   GatherNews();
 }
 
-void ProgressWindow::SetProgress(uint32_t done, uint32_t count) {
-  fileDone_ = done;
-  fileCount_ = count;
+void ProgressWindow::SetWork(const ProgressWork& work) {
+  facts_.work = work;
   GatherNews();
 }
 
 void ProgressWindow::SetWaiting(size_t batches) {
-  waiting_ = batches;
+  facts_.waiting = batches;
   GatherNews();
 }
 
@@ -253,34 +175,27 @@ void ProgressWindow::GatherNews() {
 }
 
 void ProgressWindow::ShowNews() {
-  if (drawn_ != nullptr && drawn_->GetItemCount() != rows_.size()) {
-    drawn_->SetItemCount(rows_.size());
-    drawn_->ScrollToRow(rows_.size() - 1);
-    drawn_->Refresh();
-  }
+  if (drawn_ != nullptr) drawn_->ShowNewRows();
   if (plain_ != nullptr && plain_->GetCount() != rows_.size()) {
     for (size_t row = plain_->GetCount(); row < rows_.size(); ++row)
       plain_->Append(Shown(rows_[row].line.text));
     plain_->EnsureVisible(static_cast<int>(rows_.size()) - 1);
   }
-  bar_->SetRange(static_cast<int>(std::max(fileCount_, 1u)));
-  bar_->SetValue(static_cast<int>(fileDone_));
-  const double passed = platform::MonotonicSeconds() - started_;
-  const bool tells =
-      passed >= kTimeLeftAfter && fileDone_ > 0 && fileDone_ < fileCount_ && abort_->IsEnabled();
-  const wxString left =
-      tells ? TimeLeft(passed / fileDone_ * (fileCount_ - fileDone_)) : wxString();
-  const wxString waiting =
-      waiting_ == 0 || done_
-          ? wxString()
-          : ", " + LabelCount("%1 batch is waiting", "%1 batches are waiting", waiting_);
-  status_->SetLabel(Shown(text_) + left + waiting);
+  bar_->SetRange(static_cast<int>(std::max(facts_.work.count, 1u)));
+  bar_->SetValue(static_cast<int>(facts_.work.done));
+  facts_.seconds = platform::MonotonicSeconds() - started_;
+  const std::string line = ProgressStatusLine(facts_);
+  if (shownLine_ == line) return;
+  shownLine_ = line;
+  LogEvent("progress-status", line);
+  status_->SetLabel(Shown(line));
 }
 
 // The list is made anew with a scroll bar that always shows, at the same place and with the same
 // rows in sight.
-void ProgressWindow::StayOpen() {
-  done_ = true;
+void ProgressWindow::StayOpen(const std::string& status) {
+  facts_.ended = true;
+  facts_.status = status;
   newsTimer_.Stop();
   ShowNews();
   const int first = FirstVisible();
@@ -300,22 +215,23 @@ void ProgressWindow::StayOpen() {
     select_->Show();
   }
   bar_->SetValue(bar_->GetRange());
-  close_->SetFocus();
+  // the toolkit would take the keyboard from another program with it
+  focusesClose_ = !InFront();
+  if (!focusesClose_) close_->SetFocus();
   LayOut();
 }
 
 std::vector<std::string> ProgressWindow::FailedFiles() const {
   std::vector<std::string> files;
-  for (const Row& row : rows_) {
-    if (row.line.item.status != Status::Ok && !row.line.item.skipped && !row.source.empty())
-      files.push_back(row.source);
+  for (const ProgressRow& row : rows_) {
+    if (row.IsFailure() && !row.source.empty()) files.push_back(row.source);
   }
   return files;
 }
 
 void ProgressWindow::CopyList() {
   wxString text;
-  for (const Row& row : rows_) text += Shown(row.line.text) + "\n";
+  for (const ProgressRow& row : rows_) text += Shown(row.line.text) + "\n";
   const wxClipboardLocker clipboard;
   if (!clipboard || !wxTheClipboard->SetData(new wxTextDataObject(text))) wxBell();
 }

@@ -9,11 +9,12 @@
 #include <vector>
 
 #include "batch/progress_model.h"
-#include "desktop/windows/browser/thumbnail_service.h"
+#include "desktop/models/batch/progress_status.h"
+#include "desktop/windows/batch/progress_list.h"
+#include "desktop/windows/batch/progress_thumbnails.h"
 
 class wxButton;
 class wxStaticText;
-class wxVListBox;
 
 namespace fotomill::desktop {
 
@@ -35,21 +36,17 @@ class ProgressWindow : public wxFrame {
   // empty for none.
   void AddLine(const ProgressLine& line, const std::string& source);
   void SetStatus(const std::string& status);
-  void SetProgress(uint32_t done, uint32_t count);
+  void SetWork(const ProgressWork& work);
   // How many batches wait for this one.
   void SetWaiting(size_t batches);
-  // The batch has ended and the box stays: closing lines are there, Close is live.
-  void StayOpen();
+  // The batch has ended and the box stays: closing lines are there, Close is live, and the status
+  // line says the last.
+  void StayOpen(const std::string& status);
   // Whether StayOpen was called.
-  bool StaysOpen() const { return done_; }
+  bool StaysOpen() const { return facts_.ended; }
 
  private:
-  class DrawnList;
   class PlainList;
-  struct Row {
-    ProgressLine line;
-    std::string source;
-  };
   wxWindow* MakeList(bool scrollBar);
   wxSize InUnits(const wxSize& pixels) const;
   wxRect InPixels(const Rectangle& units) const;
@@ -63,18 +60,17 @@ class ProgressWindow : public wxFrame {
   void ShowFrom(int row, int selected);
 
   const Events events_;
-  ThumbnailService& thumbnails_;
   const ProgressSettings settings_;
-  std::vector<Row> rows_;
+  ProgressThumbnails thumbnails_;
+  std::vector<ProgressRow> rows_;
   double started_ = 0;
-  bool done_ = false;
-  std::string text_;  // of the status line, without the time left
-  uint32_t fileDone_ = 0, fileCount_ = 0;
-  size_t waiting_ = 0;
+  ProgressFacts facts_;
+  std::string shownLine_;
+  bool focusesClose_ = false;  // when the box next gets the keyboard
   wxTimer newsTimer_;
   wxWindow* panel_ = nullptr;
   wxWindow* list_ = nullptr;
-  DrawnList* drawn_ = nullptr;  // the list, when the box draws it
+  ProgressList* drawn_ = nullptr;  // the list, when the box draws it
   PlainList* plain_ = nullptr;  // the list, when it is one of texts
   wxStaticText* status_ = nullptr;
   wxGauge* bar_ = nullptr;

@@ -180,12 +180,14 @@ SequentialRenameRules SequentialRenameDialog::ReadControls() const {
 }
 
 void SequentialRenameDialog::StoreControls() const {
-  settings.SequentialRenameBaseName.AssignCut(Utf8(base_->GetValue()));
+  const bool named = !flags_[kPrefix]->GetValue();  // otherwise the base name has no part in it
+  if (named) settings.SequentialRenameBaseName.AssignCut(Utf8(base_->GetValue()));
   settings.SequentialRenameBaseNumber = number_->GetValue();
   settings.SequentialRenameIncrement = increment_->GetValue();
   for (size_t i = 0; i < std::size(kFlags); ++i)
     StoreNumber(KeyOf(kFlags[i].key), flags_[i]->GetValue() ? 1 : 0);
-  (void)AddChoice(HistoryList::RenameBases, settings.SequentialRenameBaseName, BuiltInBase());
+  if (named)
+    (void)AddChoice(HistoryList::RenameBases, settings.SequentialRenameBaseName, BuiltInBase());
   (void)SaveConfiguration();
 }
 
@@ -194,8 +196,8 @@ void SequentialRenameDialog::UpdateControls() {
   const std::string base = Utf8(base_->GetValue());
   // with the number in front every file keeps its own name behind it
   base_->Enable(!flags_[kPrefix]->GetValue());
-  const bool plain = IsPlainName(base) && !base.empty();
-  ok_->Enable(plain || flags_[kPrefix]->GetValue());
+  const bool plain = flags_[kPrefix]->GetValue() || (IsPlainName(base) && !base.empty());
+  ok_->Enable(plain);
   if (!plain)
     return problem_->SetLabel(Label("The base name must be part of a file name, not a path."));
   PreviewBox box;
