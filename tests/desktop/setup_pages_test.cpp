@@ -96,7 +96,7 @@ TEST(SetupHelp, EntriesArePlainTextAndSeparate) {
   EXPECT_EQ(general.title, "Configuration");
   EXPECT_THAT(general.text,
               testing::StartsWith(
-                  "Everything that can be adjusted is a named key. fotomill config list shows all of them with their values, "));
+                  "Every setting is a named key. fotomill config list shows all of them with their values, "));
   EXPECT_THAT(general.text, testing::HasSubstr("\n    [Fotomill]\n    JpegCompression=85\n"));
   EXPECT_THAT(general.text, testing::HasSubstr("\n\nLocation\n\n"));
   for (const char* topic : {"OVERWRITE", "RENAME"})
