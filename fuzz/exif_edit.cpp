@@ -7,6 +7,7 @@
 
 #include "core/limits.h"
 #include "metadata/edit/exif_input.h"
+#include "metadata/edit/picture_edit.h"
 #include "metadata/edit/strip.h"
 
 namespace {

@@ -1,4 +1,5 @@
-// A GPX track, and where it was at times around its own; the input is also read as a list of places.
+// A GPX track, and where it was at times around its own; the input is also read as a list of
+// places.
 
 #include <cmath>
 #include <cstdlib>

@@ -36,8 +36,8 @@ struct Entry {
   uint16_t tag = 0, type = 0;
   uint64_t count = 0;
   std::vector<uint8_t> field = {};  // as stored: the values, or their offset
-  uint64_t value = 0, size = 0;  // offset and size of the values; size 0: unknown type
-  bool outside = false;          // outside the entry
+  uint64_t value = 0, size = 0;     // offset and size of the values; size 0: unknown type
+  bool outside = false;             // outside the entry
 };
 
 struct Directory {
@@ -139,7 +139,8 @@ class Editor {
     if (count > limits.exifEntries || !Holds(entries, count * EntryBytes())) return false;
     directory.at = at;
     directory.oldCount = count;
-    for (uint64_t i = 0; i < count; ++i) directory.entries.push_back(ReadEntry(entries + i * EntryBytes()));
+    for (uint64_t i = 0; i < count; ++i)
+      directory.entries.push_back(ReadEntry(entries + i * EntryBytes()));
     directory.oldEnd = entries + count * EntryBytes();
     if (!Holds(directory.oldEnd, Word())) return true;  // blocks may end without a next one
     directory.next = Number(directory.oldEnd, Word());
@@ -168,7 +169,9 @@ class Editor {
   bool Map(uint64_t at, int32_t depth) {
     Directory directory;
     if (visited_.size() >= limits.filePages || mappedEntries_ > limits.exifEntries) return false;
-    if (!visited_.insert(at).second || !ReadDirectory(at, directory)) return false;
+    const bool seen = !visited_.insert(at).second;
+    shared_ = shared_ || seen;
+    if (seen || !ReadDirectory(at, directory)) return false;
     mappedEntries_ += directory.oldCount;
     used_.push_back({at, directory.oldEnd});
     for (const Entry& entry : directory.entries) {
@@ -194,7 +197,8 @@ class Editor {
   void MapData(const Directory& directory, uint16_t offsetsTag, uint16_t sizesTag) {
     const auto find = [&](uint16_t tag) {
       const auto found = std::ranges::find(directory.entries, tag, &Entry::tag);
-      return found == directory.entries.end() || !Holds(found->value, found->size) ? nullptr : &*found;
+      return found == directory.entries.end() || !Holds(found->value, found->size) ? nullptr
+                                                                                   : &*found;
     };
     const Entry *offsets = find(offsetsTag), *sizes = sizesTag == 0 ? nullptr : find(sizesTag);
     if (offsets == nullptr) return;
@@ -219,7 +223,7 @@ class Editor {
     const auto overlaps = [&](const Range& other) {
       return other.begin < range.end && range.begin < other.end;
     };
-    return range.end <= file_.size() && pieces_ < kMostPieces &&
+    return !shared_ && range.end <= file_.size() && pieces_ < kMostPieces &&
            std::ranges::count_if(used_, overlaps) == 1;
   }
 
@@ -371,6 +375,7 @@ class Editor {
   std::vector<Range> used_;
   uint64_t mappedNext_ = 0, mappedEntries_ = 0, pieces_ = 0;
   bool pointsBeyond_ = false;  // something refers to data past the end
+  bool shared_ = false;        // a directory is reached twice: nothing is changed in place
 };
 
 }  // namespace

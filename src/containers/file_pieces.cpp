@@ -7,7 +7,8 @@ namespace fotomill {
 
 void FilePieces::Keep(std::span<const uint8_t> bytes) {
   if (bytes.empty()) return;
-  const bool follows = lastKept_ && !parts_.empty() && parts_.back().data() + parts_.back().size() == bytes.data();
+  const bool follows =
+      lastKept_ && !parts_.empty() && parts_.back().data() + parts_.back().size() == bytes.data();
   if (follows) {
     parts_.back() = {parts_.back().data(), parts_.back().size() + bytes.size()};
   } else {
@@ -30,8 +31,9 @@ std::span<const uint8_t> FilePieces::Own(std::vector<uint8_t> bytes) {
 
 bool FilePieces::Are(std::span<const uint8_t> bytes) const {
   for (const auto& part : parts_) {
-    const bool same = part.size() <= bytes.size() &&
-                      (part.data() == bytes.data() || std::ranges::equal(part, bytes.first(part.size())));
+    const bool same =
+        part.size() <= bytes.size() &&
+        (part.data() == bytes.data() || std::ranges::equal(part, bytes.first(part.size())));
     if (!same) return false;
     bytes = bytes.subspan(part.size());
   }

@@ -16,7 +16,8 @@ constexpr std::string_view kMpf("MPF\0", 4), kExifName("Exif", 4);
 
 // As lenient as readers: the two bytes after the name are ignored.
 bool IsExif(const JpegSegment& segment) {
-  return segment.marker == kApp1 && segment.data.size() >= kExifHead.size() && segment.Starts(kExifName);
+  return segment.marker == kApp1 && segment.data.size() >= kExifHead.size() &&
+         segment.Starts(kExifName);
 }
 bool IsXmp(const JpegSegment& segment) {
   return segment.marker == kApp1 && segment.Starts(kXmpHead);
@@ -53,7 +54,8 @@ class JpegRewrite {
       : file_(file),
         made_(made),
         reason_(reason),
-        wanted_{{blocks.exif, kExifHead, kMostExif, IsExif}, {blocks.xmp, kXmpHead, kMostXmp, IsXmp}} {}
+        wanted_{{blocks.exif, kExifHead, kMostExif, IsExif},
+                {blocks.xmp, kXmpHead, kMostXmp, IsXmp}} {}
 
   Status Run() {
     JpegHead head;

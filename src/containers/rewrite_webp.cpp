@@ -105,8 +105,7 @@ class WebpRewrite {
     }
     made_.Clear();
     if (parts_[0].name != "VP8X" && Adds()) {
-      std::vector<uint8_t> extended =
-          Extended({.name = parts_[0].name}, parts_[0].data);
+      std::vector<uint8_t> extended = Extended({.name = parts_[0].name}, parts_[0].data);
       if (extended.empty()) return Status::DamagedFile;
       extended[8] |= Flags(0);
       Push(std::move(extended));
@@ -159,7 +158,8 @@ class WebpRewrite {
     Keep(part.whole);
     if (part.whole.size() % 2 != 0) Push({0});  // the last chunk of a file may lack padding
     // new blocks follow the pixels, EXIF before XMP
-    const bool last = IsPixels(part.name) && (i + 1 == parts_.size() || !IsPixels(parts_[i + 1].name));
+    const bool last =
+        IsPixels(part.name) && (i + 1 == parts_.size() || !IsPixels(parts_[i + 1].name));
     for (Wanted& wanted : wanted_) {
       if (last && !wanted.there) Put(wanted, {});
     }

@@ -59,6 +59,25 @@ TEST(ExifFile, FaultsLoseNothing) {
   EXPECT_GT(faults, 4);
 }
 
+TEST(ExifFile, WhatAnotherProgramChangesIsNotUsed) {
+  const TemporaryFolder folder;
+  const std::string path = folder.Path("a.jpg"), copy = folder.Path("b.jpg");
+  const std::vector<uint8_t> old = Encode(JpegWrite, *PatternPicture(32, 16, 24));
+  for (const std::string& destination : {path, copy}) {
+    WriteBytes(path, old);
+    WriteOptions options;
+    options.makeWay = [&] {
+      WriteText(path, "somebody's work");
+      return true;
+    };
+    const RewrittenFile result = EditExifFile(path, destination, Artist("Ann"), {}, options);
+    EXPECT_EQ(result.status, Status::FileReadError);
+    EXPECT_EQ(result.hint, "The file was changed by another program.");
+    EXPECT_EQ(ReadText(path), "somebody's work");
+    EXPECT_EQ(folder.Names(), std::vector<std::string>{"a.jpg"});
+  }
+}
+
 TEST(ExifFile, UndoGivesTheOldFileBack) {
   const TemporaryFolder folder;
   const std::vector<uint8_t> jpeg = Encode(JpegWrite, *PatternPicture(32, 16, 24)),

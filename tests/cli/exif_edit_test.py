@@ -96,6 +96,19 @@ def change_everything():
         check(good >= count - 2, True, f"nearly all of {count} can be changed, not {good}")
 
 
+def extend_webp():
+    """A plain file gets a header that tells of its transparency."""
+    with Place() as place:
+        for mode, transparent in (("RGB", False), ("RGBA", True)):
+            Image.new(mode, (9, 5), "red" if mode == "RGB" else (255, 0, 0, 9)).save(place.path / "a.webp", lossless=True)
+            check((place.path / "a.webp").read_bytes()[12:16], b"VP8L", "a plain file")
+            place.run("exif", "set", "a.webp", "--in-place", "Artist=x")
+            data = (place.path / "a.webp").read_bytes()
+            check((data[12:16], data[20] & 0x18, data[24:30], len(data) - 8),
+                  (b"VP8X", 0x18 if transparent else 0x08, bytes([8, 0, 0, 4, 0, 0]), int.from_bytes(data[4:8], "little")),
+                  f"{mode}: its new header")
+
+
 def hold_arguments():
     """What is a file, a tag or a mistake."""
     with Place() as place:
@@ -287,6 +300,7 @@ def main():
     if not shutil.which("exiftool"):
         print("exiftool is not installed: nobody judges the changed files")
     hold_arguments()
+    extend_webp()
     remove_for_good()
     move_between()
     go_places()

@@ -21,28 +21,35 @@ int64_t Time(std::string_view text) { return ParseExifTime(text).value_or(0); }
 // A block with nothing but the place, in either byte order.
 ExifDirectories Told(const GpsPlace& place) {
   ExifDirectories directories;
-  for (const DirectoryChange& change : PlaceEntries(place)) directories.gps.push_back(*change.entry);
+  for (const DirectoryChange& change : PlaceEntries(place))
+    directories.gps.push_back(*change.entry);
   return directories;
 }
 
 TEST(GpsPlaces, EntriesTellThePlaceAgain) {
-  for (const auto& [latitude, longitude, back] :
-       {std::tuple{45.33, -79.22, -79.22}, {-33.86, 151.21, 151.21}, {0.0, 0.0, 0.0}, {90.0, 180.0, 180.0},
-        {12.5, 359.5, -0.5}, {-0.00001, 179.99999, 179.99999}}) {
+  for (const auto& [latitude, longitude, back] : {std::tuple{45.33, -79.22, -79.22},
+                                                  {-33.86, 151.21, 151.21},
+                                                  {0.0, 0.0, 0.0},
+                                                  {90.0, 180.0, 180.0},
+                                                  {12.5, 359.5, -0.5},
+                                                  {-0.00001, 179.99999, 179.99999}}) {
     SCOPED_TRACE(latitude);
     const auto place = PlaceOf(Told({.latitude = latitude, .longitude = longitude}));
     ASSERT_TRUE(place);
     EXPECT_THAT(place->latitude, DoubleNear(latitude, 5e-8));
     EXPECT_THAT(place->longitude, DoubleNear(back, 5e-8));
   }
-  const std::vector<uint8_t> block = MakeExifBlock(
-      Told({.latitude = -1.5, .longitude = 2.25, .altitude = -4.5, .time = Time("2024:05:31 23:05:09")}));
+  const std::vector<uint8_t> block = MakeExifBlock(Told({.latitude = -1.5,
+                                                         .longitude = 2.25,
+                                                         .altitude = -4.5,
+                                                         .time = Time("2024:05:31 23:05:09")}));
   CollectedLines lines;
   WalkExif(block, &lines);
-  for (const char* line : {"North or South latitude=South", "Latitude=1.000 30.000 0.000",
-                           "East or West longitude=East", "Longitude=2.000 15.000 0.000", "Altitude=4.500",
-                           "Altitude reference=Sea level reference", "GPS time=23:05:09", "GPS date=2024:05:31",
-                           "Geodetic survey data used=WGS-84"})
+  for (const char* line :
+       {"North or South latitude=South", "Latitude=1.000 30.000 0.000",
+        "East or West longitude=East", "Longitude=2.000 15.000 0.000", "Altitude=4.500",
+        "Altitude reference=Sea level reference", "GPS time=23:05:09", "GPS date=2024:05:31",
+        "Geodetic survey data used=WGS-84"})
     EXPECT_THAT(lines.lines, Contains(line));
   EXPECT_FALSE(PlaceOf({}));
   EXPECT_EQ(MapLink({.latitude = 1.5, .longitude = -2}),
@@ -65,7 +72,7 @@ TEST(GpsPlaces, TrackIsInterpolated) {
     const char* time;
     double latitude, longitude, altitude;  // latitude 99: none; altitude -1: none
   } rows[] = {
-      {"2024:05:31 12:00:00", 10.0, 179.9, 100}, {"2024:05:31 12:05:00", 10.1, 180.0, 110},
+      {"2024:05:31 12:00:00", 10.0, 179.9, 100},  {"2024:05:31 12:05:00", 10.1, 180.0, 110},
       {"2024:05:31 12:10:00", 10.2, -179.9, 120}, {"2024:05:31 11:30:00", 10.0, 179.9, 100},
       {"2024:05:31 11:29:59", 99, 0, 0},          {"2024:05:31 12:40:00", 10.2, -179.9, 120},
       {"2024:05:31 13:30:00", 99, 0, 0},          {"2024:05:31 14:45:00", 20, 30, -1},
@@ -104,9 +111,11 @@ TEST(GpsPlaces, CameraTimeBecomesUtc) {
 }
 
 TEST(GpsPlaces, AreFoundInTheList) {
-  constexpr std::string_view kList = "# mine\r\n\r\nHome = 48.5, 11.25\nA = b=1,2\n;x\nLake=45,30,0,N,79,15,0,W\nwrong\nEnd=1,1";
+  constexpr std::string_view kList =
+      "# mine\r\n\r\nHome = 48.5, 11.25\nA = b=1,2\n;x\nLake=45,30,0,N,79,15,0,W\nwrong\nEnd=1,1";
   size_t badLine = 0;
-  const auto home = FindListedPlace(kList, "home", badLine), lake = FindListedPlace(kList, " Lake ", badLine),
+  const auto home = FindListedPlace(kList, "home", badLine),
+             lake = FindListedPlace(kList, " Lake ", badLine),
              odd = FindListedPlace(kList, "a = B", badLine);
   ASSERT_TRUE(home && lake && odd);
   EXPECT_EQ(badLine, 0u);

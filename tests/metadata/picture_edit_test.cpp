@@ -4,6 +4,7 @@
 
 #include "metadata/edit/exif_dates.h"
 #include "metadata/edit/exif_input.h"
+#include "metadata/edit/strip.h"
 #include "metadata/exif/exif_names.h"
 #include "support/exif_blocks.h"
 #include "support/hex.h"
@@ -60,9 +61,9 @@ TEST(PictureEdit, ChangesWhatIsAskedFor) {
   const struct {
     const char *tag, *text, *line;  // the resulting line of the block; null: none
   } rows[] = {
-      {"Make", "Acm", "Image input equipment manufacturer=Acm"},      // fits in place
-      {"Make", "Acm5", "Image input equipment manufacturer=Acm5"},    // fits exactly
-      {"Make", "A", "Image input equipment manufacturer=A"},          // fits in the entry
+      {"Make", "Acm", "Image input equipment manufacturer=Acm"},    // fits in place
+      {"Make", "Acm5", "Image input equipment manufacturer=Acm5"},  // fits exactly
+      {"Make", "A", "Image input equipment manufacturer=A"},        // fits in the entry
       {"Make", "Acme Cameras", "Image input equipment manufacturer=Acme Cameras"},
       {"Make", nullptr, nullptr},
       {"Orientation", "Top Left", "Orientation of image=Top Left"},
@@ -147,7 +148,10 @@ TEST(PictureEdit, RefusesWhatCannotBeKept) {
     ExifChanges changes;
     Status status;
   } rows[] = {
-      {"grows into what is pointed to", beyond.block, {Typed("Artist", "Ann Lee")}, Status::UnsuitableImage},
+      {"grows into what is pointed to",
+       beyond.block,
+       {Typed("Artist", "Ann Lee")},
+       Status::UnsuitableImage},
       {"directory cut short", cut.block, {Typed("Artist", nullptr)}, Status::DamagedFile},
       {"EXIF directory outside", pointer.block, {Typed("ISO", "100")}, Status::DamagedFile},
       {"no picture", Hex("00010203040506070809"), {Typed("ISO", "100")}, Status::UnsupportedFormat},
@@ -165,13 +169,14 @@ TEST(PictureEdit, RefusesWhatCannotBeKept) {
               Contains("Person who created the image=Ann"));  // in another directory
 }
 
-Bytes Jpeg(const Bytes& block, std::string_view others = "FFE0 0010 4A46494600 010100 0001 0001 0000") {
+Bytes Jpeg(const Bytes& block,
+           std::string_view others = "FFE0 0010 4A46494600 010100 0001 0001 0000") {
   Bytes file = Hex("FFD8"), more = Hex(others);
   file.insert(file.end(), more.begin(), more.end());
   if (!block.empty()) {
     const size_t length = 8 + block.size();
-    file.insert(file.end(), {0xFF, 0xE1, static_cast<uint8_t>(length >> 8), static_cast<uint8_t>(length),
-                             'E', 'x', 'i', 'f', 0, 0});
+    file.insert(file.end(), {0xFF, 0xE1, static_cast<uint8_t>(length >> 8),
+                             static_cast<uint8_t>(length), 'E', 'x', 'i', 'f', 0, 0});
     file.insert(file.end(), block.begin(), block.end());
   }
   more = Hex("FFFE 0005 616263 FFDA 0002 1234 FFD9 AABB");
@@ -181,7 +186,8 @@ Bytes Jpeg(const Bytes& block, std::string_view others = "FFE0 0010 4A46494600 0
 
 TEST(PictureEdit, JpegKeepsItsSegments) {
   const Bytes added = Edited(Jpeg({}), {Typed("Artist", "A")});
-  EXPECT_THAT(added, ElementsAreArray(Jpeg(Hex("49492A00 08000000 0100 3B01 0200 02000000 41000000 00000000"))));
+  EXPECT_THAT(added, ElementsAreArray(
+                         Jpeg(Hex("49492A00 08000000 0100 3B01 0200 02000000 41000000 00000000"))));
   EXPECT_EQ(Edited(added, {Typed("Artist", nullptr)}), Jpeg({}));  // EXIF is removed completely
   // An index of further pictures has offsets relative to itself, so nothing before them may grow.
   const char* const index = "FFE2 0008 4D504600 0000";
@@ -190,11 +196,55 @@ TEST(PictureEdit, JpegKeepsItsSegments) {
   EXPECT_EQ(Edit(Jpeg(LittleEndianBlock(), index), {Typed("Make", "Acme Cameras")}, made, reason),
             Status::UnsuitableImage);
   EXPECT_FALSE(reason.empty());
-  EXPECT_NE(Edited(Jpeg(LittleEndianBlock(), index), {Typed("Make", "Acmo")}), Jpeg(LittleEndianBlock(), index));
+  EXPECT_NE(Edited(Jpeg(LittleEndianBlock(), index), {Typed("Make", "Acmo")}),
+            Jpeg(LittleEndianBlock(), index));
   Bytes large = LittleEndianBlock();
   large.resize(65500);
   EXPECT_EQ(Edit(Jpeg(large), {Typed("Make", "A manufacturer with a long name")}, made, reason),
             Status::UnsuitableImage);
+}
+
+TEST(PictureEdit, MakerNotesAndThumbnailsAreNeverKept) {
+  BlockBuilder blocks;
+  const uint32_t first = blocks.Directory({{0x010f, 2, 4, 0x00656d41}, {0x8769, 4, 1, 0}});
+  const uint32_t exif =
+      blocks.Directory({{0x8827, 3, 1, 100}, {0x927c, 7, 12, 0}, {0xa001, 3, 1, 1}});
+  blocks.Patch32(first + 2 + 12 + 8, exif);
+  blocks.Patch32(exif + 2 + 12 + 8,
+                 blocks.Bytes({'M', 'a', 'k', 'e', 'r', 's', 'e', 'c', 'r', 'e', 't', 0}));
+  FilePieces made;
+  std::string reason;
+  for (const Bytes& file : {Jpeg(blocks.block), blocks.block, Jpeg(LittleEndianBlock())}) {
+    ASSERT_EQ(StripPicture(file, kKeepExif | kKeepGps, made, reason), Status::Ok);
+    const Bytes bytes = made.Joined();
+    const std::string text(bytes.begin(), bytes.end());
+    EXPECT_EQ(text.find("secret"), std::string::npos);
+    EXPECT_EQ(text.find("\xFF\xD8\xFF\xD9"), std::string::npos);
+  }
+}
+
+TEST(PictureEdit, SharedDirectoriesAreCopied) {
+  BlockBuilder blocks;
+  const uint32_t first = blocks.Directory({{0x8769, 4, 1, 0}, {0x8825, 4, 1, 0}});
+  const uint32_t shared = blocks.Directory({{0x0001, 2, 2, 'N'}, {0x8827, 3, 1, 100}});
+  blocks.Patch32(first + 2 + 8, shared);
+  blocks.Patch32(first + 2 + 12 + 8, shared);
+  const Bytes made = Edited(blocks.block, {Typed("ISO", "200"), Typed("GPSLatitudeRef", "S")});
+  EXPECT_THAT(Without(Without(LinesOf(made), "GPS tag="), "Exif tag"),
+              ElementsAre("DIRECTORY IFD 0", "DIRECTORY EXIF", "North or South latitude=North",
+                          "ISO speed rating=200", "DIRECTORY GPS", "North or South latitude=South",
+                          "ISO speed rating=100"));
+}
+
+TEST(PictureEdit, ADirectoryMayEndWithTheFile) {
+  BlockBuilder blocks;
+  const uint32_t first = blocks.Directory({{0x0100, 4, 1, 1}, {0x8769, 4, 1, 0}});
+  blocks.Patch32(first + 2 + 12 + 8, blocks.Directory({{0x8827, 3, 1, 100}}));
+  blocks.block.resize(blocks.block.size() - 4);  // no link
+  FilePieces made;
+  std::string reason;
+  ASSERT_EQ(StripPicture(blocks.block, kKeepUsually, made, reason), Status::Ok);
+  EXPECT_LT(made.Joined().size(), blocks.block.size());
 }
 
 TEST(PictureEdit, ReadsWhatPeopleType) {
@@ -216,8 +266,10 @@ TEST(PictureEdit, ReadsWhatPeopleType) {
       {"Exposure bias", "-99.991", nullptr},
       {"Lens focal length", "0.5", nullptr},
       {"Subject distance", "infinity", "FFFFFFFF 01000000"},
-      {"Lens specification", "24 70 2.8 4", "18000000 01000000 46000000 01000000 1C000000 0A000000 04000000 01000000"},
-      {"Lens specification", "Focal length minimum: 24 Focal length maximum: 70 F-stop minimum: 2.8 F-stop maximum: 4 ",
+      {"Lens specification", "24 70 2.8 4",
+       "18000000 01000000 46000000 01000000 1C000000 0A000000 04000000 01000000"},
+      {"Lens specification",
+       "Focal length minimum: 24 Focal length maximum: 70 F-stop minimum: 2.8 F-stop maximum: 4 ",
        "18000000 01000000 46000000 01000000 1C000000 0A000000 04000000 01000000"},
       {"Lens specification", "24 70", nullptr},
       {"Subject area", "Circular area X: 10 Y: 20 R: 5", "0A00 1400 0500"},
@@ -254,7 +306,8 @@ TEST(PictureEdit, ReadsWhatPeopleType) {
     SCOPED_TRACE(std::string(row.tag) + "=" + row.text);
     ExifEntry entry;
     std::string reason;
-    const bool taken = ParseExifInput(FindExifTagByName(row.tag).value_or(0), row.text, entry, reason);
+    const bool taken =
+        ParseExifInput(FindExifTagByName(row.tag).value_or(0), row.text, entry, reason);
     EXPECT_EQ(taken, row.value != nullptr);
     EXPECT_EQ(reason.empty(), taken);
     if (taken && row.value != nullptr) {
@@ -270,11 +323,13 @@ TEST(PictureEdit, TimesAreThoseOfTheCalendar) {
     ASSERT_TRUE(time) << text;
     EXPECT_EQ(ExifTimeText(*time), text);
   }
-  for (const char* text : {"2023:02:29 00:00:00", "2024:01:01", "2024:01:01 24:00:00", "", "2024:01:01 00:00:00Z"})
+  for (const char* text :
+       {"2023:02:29 00:00:00", "2024:01:01", "2024:01:01 24:00:00", "", "2024:01:01 00:00:00Z"})
     EXPECT_FALSE(ParseExifTime(text)) << text;
   EXPECT_EQ(ParseTimeShift("+1:30:00"), 5400);
   EXPECT_EQ(ParseTimeShift("-100:05"), -360300);
-  for (const char* text : {"1:30", "+1", "+1:60", "+1:30:", "+-1:30", "+1:30:00x", "+999999999999:00"})
+  for (const char* text :
+       {"1:30", "+1", "+1:60", "+1:30:", "+-1:30", "+1:30:00x", "+999999999999:00"})
     EXPECT_FALSE(ParseTimeShift(text)) << text;
 }
 

@@ -9,15 +9,15 @@
 namespace fotomill {
 
 // Changes the EXIF of a picture file, or writes a changed copy; `options` say what to do if the
-// destination exists. Nothing is written unless Ok. Statuses: those of EditPictureExif, and those of
-// opening and writing files.
+// destination exists. Nothing is written unless Ok. Statuses: those of EditPictureExif, and those
+// of opening and writing files.
 RewrittenFile EditExifFile(const std::string& source, const std::string& destination,
                            const ExifChanger& changer, const RewriteRequest& request,
                            const WriteOptions& options);
 
 // What of a file's metadata is removed.
 struct StripRequest {
-  uint32_t kept = 0;       // what stays: kKeep bits
+  uint32_t kept = 0;        // what stays: kKeep bits
   bool placesOnly = false;  // everything stays but where the picture was taken
 };
 // The same for removing metadata. The new file is read again; the note names what is left in it.

@@ -28,8 +28,7 @@ Status FileRewrite::Write(std::span<const std::span<const uint8_t>> parts, bool 
     return result.changed ? Status::Ok : Fail(Status::ErrorCreatingFile, CannotCreate());
   }
   ByteWriter out;
-  const bool replaces =
-      source_ != destination_ && options_.existing == platform::Existing::Replace;
+  const bool replaces = source_ != destination_ && options_.existing == platform::Existing::Replace;
   if (replaces && !held_.Hold(destination_))
     return Fail(Status::ErrorCreatingFile, ReasonSentence());
   if (!out.Create(destination_)) return Fail(Status::ErrorCreatingFile, CannotCreate());
@@ -53,8 +52,7 @@ Status FileRewrite::Write(std::span<const std::span<const uint8_t>> parts, bool 
 
 Status FileRewrite::KeepTime() {
   if (!time_ || platform::SetModificationTime(destination_, *time_)) return Status::Ok;
-  return Fail(Status::ErrorWritingFile,
-              Tr("The file was written, but its time could not be set."));
+  return Fail(Status::ErrorWritingFile, Tr("The file was written, but its time could not be set."));
 }
 
 std::string FileRewrite::CannotCreate() const {

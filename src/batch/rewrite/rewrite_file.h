@@ -40,8 +40,9 @@ class FileRewrite {
   // To be called before the source is read: takes it as it is now. ErrorCreatingFile (10) where it
   // cannot be held.
   Status Begin();
-  // Writes the new file from its parts; `same` says that they are the old file. An unchanged file is
-  // copied, unless source and destination are the same. Sets `changed` and the hint of the result.
+  // Writes the new file from its parts; `same` says that they are the old file. An unchanged file
+  // is copied, unless source and destination are the same. Sets `changed` and the hint of the
+  // result.
   Status Write(std::span<const std::span<const uint8_t>> parts, bool same);
   // Fails with a hint.
   Status Fail(Status status, std::string hint);

@@ -164,7 +164,8 @@ class RewriteBatch {
 
 }  // namespace
 
-Status RunRewrite(std::span<const BatchFile> files, const RewriteFunction& function, BatchJob& job) {
+Status RunRewrite(std::span<const BatchFile> files, const RewriteFunction& function,
+                  BatchJob& job) {
   if (!OpenProgressBox(job)) return Status::FunctionCancelled;
   RewriteBatch(files, function, job).Run();
   FinishProgress(job);

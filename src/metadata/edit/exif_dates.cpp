@@ -32,10 +32,11 @@ bool TakeOneOf(std::string_view& text, std::string_view characters) {
 
 std::optional<int64_t> ParseExifTime(std::string_view text) {
   int year, month, day, hour, minute, second;
-  const bool fits = TakeDigits(text, 4, year) && TakeOneOf(text, ":-") && TakeDigits(text, 2, month) &&
-                    TakeOneOf(text, ":-") && TakeDigits(text, 2, day) && TakeOneOf(text, " T") &&
-                    TakeDigits(text, 2, hour) && TakeOneOf(text, ":") && TakeDigits(text, 2, minute) &&
-                    TakeOneOf(text, ":") && TakeDigits(text, 2, second) && text.empty();
+  const bool fits =
+      TakeDigits(text, 4, year) && TakeOneOf(text, ":-") && TakeDigits(text, 2, month) &&
+      TakeOneOf(text, ":-") && TakeDigits(text, 2, day) && TakeOneOf(text, " T") &&
+      TakeDigits(text, 2, hour) && TakeOneOf(text, ":") && TakeDigits(text, 2, minute) &&
+      TakeOneOf(text, ":") && TakeDigits(text, 2, second) && text.empty();
   if (!fits || hour > 23 || minute > 59 || second > 59) return {};
   const std::chrono::year_month_day date{std::chrono::year(year),
                                          std::chrono::month(static_cast<unsigned>(month)),
@@ -70,7 +71,8 @@ std::optional<int64_t> ParseTimeShift(std::string_view text) {
   if (!TakeOneOf(text, ":") || !TakeDigits(text, 2, minutes) || minutes > 59) return {};
   if (!text.empty() && (!TakeOneOf(text, ":") || !TakeDigits(text, 2, seconds) || seconds > 59))
     return {};
-  return text.empty() ? std::optional(sign * (hours * 3600 + minutes * 60 + seconds)) : std::nullopt;
+  return text.empty() ? std::optional(sign * (hours * 3600 + minutes * 60 + seconds))
+                      : std::nullopt;
 }
 
 }  // namespace fotomill

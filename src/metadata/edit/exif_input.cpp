@@ -101,7 +101,8 @@ std::vector<Fraction> Numbers(std::string_view text, bool labels) {
       text.remove_prefix(std::min(end, text.size()));
     } else if (const auto number = TakeFraction(text)) {
       numbers.push_back(*number);
-      if (!text.empty() && std::string_view(" ,:\t").find(text[0]) == std::string_view::npos) return {};
+      if (!text.empty() && std::string_view(" ,:\t").find(text[0]) == std::string_view::npos)
+        return {};
     } else {
       return {};
     }
@@ -113,7 +114,8 @@ std::vector<Fraction> Numbers(std::string_view text, bool labels) {
 bool FitRational(Fraction& fraction, bool isSigned) {
   const int64_t least = isSigned ? INT32_MIN : 0, most = isSigned ? INT32_MAX : UINT32_MAX;
   const auto fits = [&] {
-    return fraction.numerator >= least && fraction.numerator <= most && fraction.denominator <= most;
+    return fraction.numerator >= least && fraction.numerator <= most &&
+           fraction.denominator <= most;
   };
   while (!fits() && fraction.denominator >= 10 && fraction.denominator % 10 == 0) {
     fraction.numerator = (fraction.numerator + (fraction.numerator < 0 ? -5 : 5)) / 10;
@@ -199,8 +201,10 @@ class Input {
   // ASCII if possible, else UTF-16.
   bool Comment() {
     if (!Characters()) return false;
-    const bool ascii = std::ranges::all_of(text_, [](char c) { return static_cast<signed char>(c) > 0; });
-    const std::string_view code = ascii ? std::string_view("ASCII\0\0\0", 8) : std::string_view("UNICODE\0", 8);
+    const bool ascii =
+        std::ranges::all_of(text_, [](char c) { return static_cast<signed char>(c) > 0; });
+    const std::string_view code =
+        ascii ? std::string_view("ASCII\0\0\0", 8) : std::string_view("UNICODE\0", 8);
     entry_.value.assign(code.begin(), code.end());
     if (ascii) {
       entry_.value.insert(entry_.value.end(), text_.begin(), text_.end());
@@ -212,7 +216,8 @@ class Input {
   }
 
   bool Version() {
-    if (text_.size() != 4 || !std::ranges::all_of(text_, IsDigit)) return NotAllowed(Tr("four digits."));
+    if (text_.size() != 4 || !std::ranges::all_of(text_, IsDigit))
+      return NotAllowed(Tr("four digits."));
     entry_.value.assign(text_.begin(), text_.end());
     entry_.count = 4;
     return true;
@@ -222,8 +227,11 @@ class Input {
     constexpr struct {
       std::string_view label, words;
       int shift;
-    } kFields[] = {{"Fire:", "N;Y", 0}, {"Return:", "X;U;N;D", 1}, {"Mode:", "U;F;S;A", 3},
-                   {"Function:", "P;N", 5}, {"Redeye:", "N;Y", 6}};
+    } kFields[] = {{"Fire:", "N;Y", 0},
+                   {"Return:", "X;U;N;D", 1},
+                   {"Mode:", "U;F;S;A", 3},
+                   {"Function:", "P;N", 5},
+                   {"Redeye:", "N;Y", 6}};
     if (IsDigit(text_[0])) return Values(127);
     int64_t bits = 0;
     std::string_view rest = text_;
@@ -232,7 +240,8 @@ class Input {
       if (!rest.starts_with(field.label)) return FlashRefused();
       rest.remove_prefix(field.label.size());
       rest.remove_prefix(std::min(rest.find_first_not_of(' '), rest.size()));
-      const size_t place = rest.empty() || rest[0] == ';' ? std::string_view::npos : field.words.find(rest[0]);
+      const size_t place =
+          rest.empty() || rest[0] == ';' ? std::string_view::npos : field.words.find(rest[0]);
       if (place == std::string_view::npos) return FlashRefused();
       bits |= static_cast<int64_t>(place / 2) << field.shift;
       rest.remove_prefix(1);
@@ -242,7 +251,8 @@ class Input {
     return true;
   }
   bool FlashRefused() {
-    return NotAllowed(Tr("0 to 127, or a text such as \"%1\".", "Fire: Y Return: X Mode: A Function: P Redeye: N"));
+    return NotAllowed(Tr("0 to 127, or a text such as \"%1\".",
+                         "Fire: Y Return: X Mode: A Function: P Redeye: N"));
   }
 
   // An item of the tag's word list, or its number or letter.
@@ -253,13 +263,15 @@ class Input {
     std::string allowed;
     for (int32_t i = 0; i < items; ++i) {
       const std::string_view word = ListItem(list.words, i);
-      const int32_t code = list.codes.empty()                                ? i
-                           : static_cast<size_t>(i) < list.codes.size() ? list.codes[static_cast<size_t>(i)]
-                                                                        : -1;
+      const int32_t code = list.codes.empty() ? i
+                           : static_cast<size_t>(i) < list.codes.size()
+                               ? list.codes[static_cast<size_t>(i)]
+                               : -1;
       if (code < 0 || (row_.tag == kOrientation && code == 0)) continue;
       if (row_.tag == kDistanceReference) continue;
       allowed.append(allowed.empty() ? "" : ", ").append(word);
-      const std::string number = letters ? std::string(1, static_cast<char>(code)) : std::to_string(code);
+      const std::string number =
+          letters ? std::string(1, static_cast<char>(code)) : std::to_string(code);
       if (EqualIgnoringCase(text_, word) || EqualIgnoringCase(text_, number)) return Code(code);
     }
     // the word list has directions here, but the standard has units
@@ -300,7 +312,8 @@ class Input {
       return NotAllowed(Tr("%1 to %2 numbers.", counts.least, counts.most));
     }
     if ((degrees || row_.tag == kGpsTime) && !InRange(numbers))
-      return NotAllowed(degrees ? Tr("degrees, minutes and seconds.") : Tr("hours, minutes and seconds."));
+      return NotAllowed(degrees ? Tr("degrees, minutes and seconds.")
+                                : Tr("hours, minutes and seconds."));
     return std::ranges::all_of(numbers, [&](Fraction& number) { return Value(number, most); });
   }
 
@@ -308,12 +321,14 @@ class Input {
     constexpr int64_t kParts = 1000000;
     if (value < 0 || value > 360) return {};
     const auto all = static_cast<int64_t>(std::llround(value * 3600 * kParts));
-    return {{all / (3600 * kParts), 1}, {all / (60 * kParts) % 60, 1}, {all % (60 * kParts), kParts}};
+    return {
+        {all / (3600 * kParts), 1}, {all / (60 * kParts) % 60, 1}, {all % (60 * kParts), kParts}};
   }
 
   bool InRange(const std::vector<Fraction>& numbers) const {
     const double most = row_.tag == kGpsTime ? 23 : IsAnyOf(row_.tag, kLatitudes) ? 90 : 180;
-    const double first = numbers[0].Value(), second = numbers[1].Value(), third = numbers[2].Value();
+    const double first = numbers[0].Value(), second = numbers[1].Value(),
+                 third = numbers[2].Value();
     // degrees and minutes may have a fraction if they come last
     return first >= 0 && first <= most && second >= 0 && second < 60 && third >= 0 && third < 60 &&
            (row_.tag == kGpsTime || first + second / 60 + third / 3600 <= most);
@@ -328,17 +343,19 @@ class Input {
     if (bounded && (value * scale < row_.minimum || value * scale > row_.maximum))
       return NotAllowed(Tr("%1 to %2.", Bound(row_.minimum / scale), Bound(row_.maximum / scale)));
     if (rational) {
-      if (!FitRational(number, row_.type == kExifSRational)) return NotAllowed(Tr("a smaller number."));
+      if (!FitRational(number, row_.type == kExifSRational))
+        return NotAllowed(Tr("a smaller number."));
       Put(entry_.value, static_cast<uint64_t>(number.numerator), 4);
       Put(entry_.value, static_cast<uint64_t>(number.denominator), 4);
       ++entry_.count;
       return true;
     }
-    const int64_t greatest = most != 0                    ? most
-                             : row_.type == kExifLong     ? int64_t{UINT32_MAX}
-                             : row_.type == kExifByte     ? 255
-                                                          : 65535;
-    if (number.numerator % number.denominator != 0 || value < 0 || value > static_cast<double>(greatest))
+    const int64_t greatest = most != 0                ? most
+                             : row_.type == kExifLong ? int64_t{UINT32_MAX}
+                             : row_.type == kExifByte ? 255
+                                                      : 65535;
+    if (number.numerator % number.denominator != 0 || value < 0 ||
+        value > static_cast<double>(greatest))
       return NotAllowed(Tr("a whole number from 0 to %1.", greatest));
     Number(number.numerator / number.denominator);
     return true;
@@ -362,8 +379,8 @@ ExifPlace PlaceOfExifTag(uint16_t tag) {
   constexpr uint16_t kLastGpsTag = 0x001f;
   constexpr struct {
     uint16_t first, last;
-  } kExifTags[] = {{0x829a, 0x829d}, {0x8822, 0x8824}, {0x8827, 0x8835},
-                   {0x9000, 0x9bff}, {0xa000, 0xbbff}};
+  } kExifTags[] = {
+      {0x829a, 0x829d}, {0x8822, 0x8824}, {0x8827, 0x8835}, {0x9000, 0x9bff}, {0xa000, 0xbbff}};
   if (tag <= kLastGpsTag) return ExifPlace::Gps;
   for (const auto& range : kExifTags) {
     if (tag >= range.first && tag <= range.last) return ExifPlace::Exif;
@@ -372,7 +389,8 @@ ExifPlace PlaceOfExifTag(uint16_t tag) {
 }
 
 ExifEntry ExifTextEntry(uint16_t tag, std::string_view text) {
-  ExifEntry entry{tag, kExifAscii, static_cast<uint32_t>(text.size() + 1), {text.begin(), text.end()}};
+  ExifEntry entry{
+      tag, kExifAscii, static_cast<uint32_t>(text.size() + 1), {text.begin(), text.end()}};
   entry.value.push_back(0);
   return entry;
 }

@@ -37,7 +37,8 @@ ExifChanges CopiedEntries(const ExifDirectories& from) {
     for (const ExifEntry& entry : directory) {
       const bool own = std::ranges::find(kOwn, entry.tag) != std::end(kOwn);
       const uint8_t editClass = ExifEditClass(entry.tag);
-      if (own || editClass == kExifOpaque || (editClass == kExifStructural && place != ExifPlace::Gps))
+      if (own || editClass == kExifOpaque ||
+          (editClass == kExifStructural && place != ExifPlace::Gps))
         continue;
       DirectoryChange change{place, entry.tag, entry};
       if (from.bigEndian) SwapExifNumbers(entry.type, change.entry->value);

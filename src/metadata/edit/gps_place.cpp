@@ -35,7 +35,8 @@ double Wrapped(double longitude) {
 
 // Value `i` of a RATIONAL entry, if present.
 std::optional<double> RationalOf(const ExifEntry* entry, size_t i, bool bigEndian) {
-  if (entry == nullptr || entry->type != kExifRational || entry->value.size() < 8 * (i + 1)) return {};
+  if (entry == nullptr || entry->type != kExifRational || entry->value.size() < 8 * (i + 1))
+    return {};
   const auto number = [&](size_t at) {
     uint32_t value = 0;
     for (size_t k = 0; k < 4; ++k) value = value << 8 | entry->value[at + (bigEndian ? k : 3 - k)];
@@ -113,16 +114,14 @@ std::optional<GpsPlace> PlaceOf(const ExifDirectories& directories) {
 std::string MapLink(const GpsPlace& place) {
   char link[160];
   std::snprintf(link, sizeof link,
-                "https://www.openstreetmap.org/?mlat=%.5f&mlon=%.5f#map=15/%.5f/%.5f", place.latitude,
-                place.longitude, place.latitude, place.longitude);
+                "https://www.openstreetmap.org/?mlat=%.5f&mlon=%.5f#map=15/%.5f/%.5f",
+                place.latitude, place.longitude, place.latitude, place.longitude);
   return link;
 }
 
 std::optional<int64_t> TakenUtc(const ExifDirectories& directories, std::optional<int64_t> offset) {
   // DateTimeOriginal and DateTimeDigitized, each with its offset from UTC
-  constexpr struct {
-    uint16_t time, offset;
-  } kTags[] = {{0x9003, 0x9011}, {0x9004, 0x9012}};
+  constexpr struct { uint16_t time, offset; } kTags[] = {{0x9003, 0x9011}, {0x9004, 0x9012}};
   for (const auto& tags : kTags) {
     const ExifEntry* entry = FindExifEntry(directories.exif, tags.time);
     const auto time = entry == nullptr ? std::nullopt : ParseExifTime(ExifEntryText(*entry));

@@ -79,7 +79,8 @@ Status GpsTrack::Parse(std::span<const uint8_t> file) {
           if (NameOf(fact) == "time") time = TimeOf(fact.child_value());
           if (NameOf(fact) == "ele") point.place.altitude = NumberOf(fact.child_value());
         }
-        if (!latitude || !longitude || !time || std::abs(*latitude) > 90 || std::abs(*longitude) > 180)
+        if (!latitude || !longitude || !time || std::abs(*latitude) > 90 ||
+            std::abs(*longitude) > 180)
           continue;
         point.time = *time;
         point.place.latitude = *latitude;

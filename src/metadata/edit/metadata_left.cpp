@@ -91,9 +91,9 @@ void LookIntoJpeg(std::span<const uint8_t> file, Found& found) {
 
 void LookIntoPng(std::span<const uint8_t> file, Found& found) {
   // chunks starting with an uppercase letter belong to the picture; so do these
-  constexpr std::string_view kPicture[] = {"tRNS", "cHRM", "gAMA", "sBIT", "sRGB", "cICP", "mDCv",
-                                           "mDCV", "cLLi", "cLLI", "bKGD", "hIST", "pHYs", "sPLT",
-                                           "oFFs", "acTL", "fcTL", "fdAT"};
+  constexpr std::string_view kPicture[] = {"tRNS", "cHRM", "gAMA", "sBIT", "sRGB", "cICP",
+                                           "mDCv", "mDCV", "cLLi", "cLLI", "bKGD", "hIST",
+                                           "pHYs", "sPLT", "oFFs", "acTL", "fcTL", "fdAT"};
   PngChunks chunks(file);
   for (PngChunk chunk; chunks.Next(chunk);) {
     const std::string_view type = chunk.type;
@@ -126,7 +126,10 @@ void LookIntoDirectory(std::span<const uint8_t> file, Found& found) {
   constexpr struct {
     uint16_t tag;
     const char* name;
-  } kTags[] = {{700, kXmpName}, {33723, kIptcName}, {34377, kIptcName}, {34675, kProfileName},
+  } kTags[] = {{700, kXmpName},
+               {33723, kIptcName},
+               {34377, kIptcName},
+               {34675, kProfileName},
                {0xBC02, kOrientationName}};
   for (const auto& tag : kTags) {
     if (!FindDirectoryValue(file, tag.tag).bytes.empty()) found.Add(tag.name);

@@ -40,9 +40,10 @@ bool Starts(std::span<const uint8_t> file, std::string_view text) {
 // A new directory needs the version of the standard.
 void AddVersions(const ExifDirectories& old, ExifChanges& changes) {
   const auto adds = [&](ExifPlace place, uint16_t version) {
-    return std::ranges::any_of(changes, [&](const DirectoryChange& change) {
-             return change.place == place && change.entry.has_value();
-           }) &&
+    return std::ranges::any_of(changes,
+                               [&](const DirectoryChange& change) {
+                                 return change.place == place && change.entry.has_value();
+                               }) &&
            std::ranges::none_of(changes, [&](const DirectoryChange& change) {
              return change.place == place && change.tag == version;
            });
@@ -52,8 +53,8 @@ void AddVersions(const ExifDirectories& old, ExifChanges& changes) {
                        ExifEntry{kExifVersionTag, kExifUndefined, 4, {'0', '2', '3', '0'}}});
   }
   if (old.gps.empty() && adds(ExifPlace::Gps, kGpsVersionTag)) {
-    changes.push_back({ExifPlace::Gps, kGpsVersionTag,
-                       ExifEntry{kGpsVersionTag, kExifByte, 4, {2, 3, 0, 0}}});
+    changes.push_back(
+        {ExifPlace::Gps, kGpsVersionTag, ExifEntry{kGpsVersionTag, kExifByte, 4, {2, 3, 0, 0}}});
   }
 }
 
@@ -141,7 +142,8 @@ ExifDirectories GatherPictureExif(std::span<const uint8_t> file) {
     bytes.Skip(2);
     const bool wide = (big ? bytes.Be16() : bytes.Le16()) == 43;
     if (wide) bytes.Skip(4);
-    const uint64_t first = wide ? (big ? bytes.Be64() : bytes.Le64()) : (big ? bytes.Be32() : bytes.Le32());
+    const uint64_t first =
+        wide ? (big ? bytes.Be64() : bytes.Le64()) : (big ? bytes.Be32() : bytes.Le32());
     return GatherExif(file, {big, wide}, first);
   }
   MetadataViews views;

@@ -34,8 +34,7 @@ const ExifEntry* FindExifEntry(const ExifDirectory& directory, uint16_t tag);
 
 // Computes changes from the current entries. To fail, set `reason` (a sentence).
 using ExifChanges = std::vector<DirectoryChange>;
-using ExifChanger =
-    std::function<ExifChanges(const ExifDirectories& old, std::string& reason)>;
+using ExifChanger = std::function<ExifChanges(const ExifDirectories& old, std::string& reason)>;
 
 // Makes a file with changed EXIF from pieces of the old one, which must stay valid. Everything else
 // is kept byte for byte. If nothing would change, `changed` is false and `made` is empty.

@@ -20,9 +20,14 @@ constexpr uint16_t kOrientation = 0x0112, kArtist = 0x013b, kCopyright = 0x8298,
                    kMakerNote = 0x927c, kXmpTag = 700;
 
 constexpr KeptName kNames[] = {
-    {"orientation", kKeepOrientation}, {"profile", kKeepProfile}, {"copyright", kKeepCopyright},
-    {"exif", kKeepExif},               {"gps", kKeepGps},         {"xmp", kKeepXmp},
-    {"iptc", kKeepIptc},               {"comments", kKeepComments},
+    {"orientation", kKeepOrientation},
+    {"profile", kKeepProfile},
+    {"copyright", kKeepCopyright},
+    {"exif", kKeepExif},
+    {"gps", kKeepGps},
+    {"xmp", kKeepXmp},
+    {"iptc", kKeepIptc},
+    {"comments", kKeepComments},
 };
 
 bool IsKept(const ExifEntry& entry, ExifPlace place, uint32_t kept) {
@@ -75,8 +80,9 @@ std::vector<uint8_t> BlockOf(const ExifChanges& changes) {
   return MakeExifBlock(directories);
 }
 
-Status StripDirectories(std::span<const uint8_t> file, MetadataForm form, const BareOptions& options,
-                        uint32_t kept, FilePieces& made, std::string& reason) {
+Status StripDirectories(std::span<const uint8_t> file, MetadataForm form,
+                        const BareOptions& options, uint32_t kept, FilePieces& made,
+                        std::string& reason) {
   std::vector<uint8_t> bare;
   RETURN_IF_BAD(MakeBareTiff(file, options, bare));
   const auto view = made.Own(std::move(bare));
@@ -227,7 +233,8 @@ Status StripPicture(std::span<const uint8_t> file, uint32_t kept, FilePieces& ma
   FilePieces pieces;
   const auto view = pieces.Own(std::move(bare));
   const MetadataBlocks blocks{exif, xmp};
-  RETURN_IF_BAD(png ? RewritePng(view, blocks, made, reason) : RewriteWebp(view, blocks, made, reason));
+  RETURN_IF_BAD(png ? RewritePng(view, blocks, made, reason)
+                    : RewriteWebp(view, blocks, made, reason));
   made.Append(std::move(pieces));  // `made` refers to them
   return Status::Ok;
 }

@@ -20,7 +20,7 @@ namespace fotomill {
 inline constexpr uint32_t kKeepOrientation = 1;
 inline constexpr uint32_t kKeepProfile = 2;
 inline constexpr uint32_t kKeepCopyright = 4;  // creator and copyright
-inline constexpr uint32_t kKeepExif = 8;  // except GPS, thumbnail, maker notes
+inline constexpr uint32_t kKeepExif = 8;       // except GPS, thumbnail, maker notes
 inline constexpr uint32_t kKeepGps = 16;
 inline constexpr uint32_t kKeepXmp = 32;
 inline constexpr uint32_t kKeepIptc = 64;

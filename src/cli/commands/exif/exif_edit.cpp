@@ -76,8 +76,8 @@ class TagArguments {
       }
     }
     context_.names.values = std::move(files);
-    return !changes_.empty() || Refuse(withValues ? Tr("Name at least one TAG=VALUE.")
-                                                  : Tr("Name at least one TAG."));
+    return !changes_.empty() ||
+           Refuse(withValues ? Tr("Name at least one TAG=VALUE.") : Tr("Name at least one TAG."));
   }
   const ExifChanges& Changes() const { return changes_; }
 
@@ -134,8 +134,8 @@ std::shared_ptr<RewriteOptions> SetUp(CLI::App& app, CommandContext& context, co
 
 // Removes the first argument that is a time difference from the names.
 std::optional<int64_t> TakeShift(std::vector<std::string>& names) {
-  const auto found =
-      std::ranges::find_if(names, [](const std::string& name) { return ParseTimeShift(name).has_value(); });
+  const auto found = std::ranges::find_if(
+      names, [](const std::string& name) { return ParseTimeShift(name).has_value(); });
   if (found == names.end()) return {};
   const auto shift = ParseTimeShift(*found);
   names.erase(found);
@@ -159,7 +159,9 @@ bool OwnerChanges(ExifChanges& changes, std::string& reason) {
     changes.push_back({PlaceOfExifTag(key.tag), key.tag, std::move(entry)});
   }
   if (changes.empty())
-    reason = Tr("No owner is configured; set ExifPersonWhoCreatedImage, ExifCopyrightHolder or another of these keys.");
+    reason =
+        Tr("No owner is configured; set ExifPersonWhoCreatedImage, ExifCopyrightHolder or another "
+           "of these keys.");
   return reason.empty();
 }
 
@@ -174,7 +176,9 @@ std::optional<uint32_t> ParseKept(const std::string& list, const CommandContext&
     const std::string_view name = rest.substr(0, rest.find(','));
     const auto found = std::ranges::find(KeptNames(), name, &KeptName::name);
     if (found == KeptNames().end()) {
-      (void)UsageError(context, Tr("--keep: \"%1\" is none of orientation, profile, copyright, exif, gps, xmp, iptc, comments.", name) +
+      (void)UsageError(context, Tr("--keep: \"%1\" is none of orientation, profile, copyright, "
+                                   "exif, gps, xmp, iptc, comments.",
+                                   name) +
                                     NearestNameHint(name, names));
       return {};
     }
@@ -200,17 +204,22 @@ int RunStrip(StripOptions& options, const CommandContext& context) {
   return RunExifRewrite(
       options.rewrite,
       [&](const std::string& source, const std::string& destination, const RewriteRequest& request,
-          const WriteOptions& write) { return StripFile(source, destination, strip, request, write); },
+          const WriteOptions& write) {
+        return StripFile(source, destination, strip, request, write);
+      },
       context);
 }
 
 }  // namespace
 
-int RunExifEdit(RewriteOptions& options, const ExifChanger& changer, const CommandContext& context) {
+int RunExifEdit(RewriteOptions& options, const ExifChanger& changer,
+                const CommandContext& context) {
   return RunExifRewrite(
       options,
       [&](const std::string& source, const std::string& destination, const RewriteRequest& request,
-          const WriteOptions& write) { return EditExifFile(source, destination, changer, request, write); },
+          const WriteOptions& write) {
+        return EditExifFile(source, destination, changer, request, write);
+      },
       context);
 }
 
@@ -218,8 +227,10 @@ void SetUpExifSet(CLI::App& app, CommandContext& context) {
   auto options = SetUp(app, context, "FILE... TAG=VALUE...",
                        "Pictures or folders, and tags with their new values");
   SetFooter(app,
-            "A tag is named as fotomill exif shows it, as the standard calls it, or by its number (0x9003). A value is typed as it\n"
-            "is shown, or plain: Flash=16, \"Exposure time=1/250\", \"Orientation of image=Top Left\". JPEG, TIFF, PNG, WebP and\n"
+            "A tag is named as fotomill exif shows it, as the standard calls it, or by its number "
+            "(0x9003). A value is typed as it\n"
+            "is shown, or plain: Flash=16, \"Exposure time=1/250\", \"Orientation of image=Top "
+            "Left\". JPEG, TIFF, PNG, WebP and\n"
             "HD Photo files; pixels, maker notes and everything else stay the same bytes.",
             "fotomill exif set holiday --in-place Artist=\"Ann Lee\" \"Image title=At the lake\"");
   context.run = [options, &context] {
@@ -233,7 +244,8 @@ void SetUpExifUnset(CLI::App& app, CommandContext& context) {
   auto options =
       SetUp(app, context, "FILE... TAG...", "Pictures or folders, and tags that are removed");
   SetFooter(app,
-            "A tag is named as fotomill exif shows it, as the standard calls it, or by its number (0x9003). A file that has the\n"
+            "A tag is named as fotomill exif shows it, as the standard calls it, or by its number "
+            "(0x9003). A file that has the\n"
             "name of a tag is written with its folder: ./Flash.",
             "fotomill exif unset photo.jpg --in-place Artist \"Body serial number\"");
   context.run = [options, &context] {
@@ -246,10 +258,12 @@ void SetUpExifUnset(CLI::App& app, CommandContext& context) {
 void SetUpExifCopy(CLI::App& app, CommandContext& context) {
   auto options = SetUp(app, context, "FROM TO...",
                        "The picture whose EXIF is copied, and pictures or folders that get it");
-  SetFooter(app,
-            "Everything that FROM says of who took it, when, where and how. Orientation, sizes, resolution and color space belong to the\n"
-            "pixels and are not copied; maker notes would not survive the move. Other tags of TO stay.",
-            "fotomill exif copy camera.jpg edited.jpg --in-place");
+  SetFooter(
+      app,
+      "Everything that FROM says of who took it, when, where and how. Orientation, sizes, "
+      "resolution and color space belong to the\n"
+      "pixels and are not copied; maker notes would not survive the move. Other tags of TO stay.",
+      "fotomill exif copy camera.jpg edited.jpg --in-place");
   context.run = [options, &context] {
     if (context.names.values.empty()) return UsageError(context, Tr("%1 is missing.", "FROM"));
     const std::string from = context.names.values.front();
@@ -267,12 +281,14 @@ void SetUpExifCopy(CLI::App& app, CommandContext& context) {
 void SetUpExifShift(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<ShiftOptions>();
   AddSelection(app, options->rewrite.selection, context);
-  context.names.Declare("FILE... +H:MM[:SS]", "Pictures or folders, and what is added to their times", 0);
+  context.names.Declare("FILE... +H:MM[:SS]",
+                        "Pictures or folders, and what is added to their times", 0);
   AddName(app, "--by", options->by, "SHIFT",
           "The same as an option, for times that are subtracted: --by=-1:30:00");
   AddRewriteOptions(app, options->rewrite);
   SetFooter(app,
-            "Moves the date and time that a picture was taken, digitized and changed, as the camera's clock had them.",
+            "Moves the date and time that a picture was taken, digitized and changed, as the "
+            "camera's clock had them.",
             "fotomill exif shift holiday --in-place +1:30:00");
   context.run = [options, &context] {
     const auto shift =
@@ -280,7 +296,9 @@ void SetUpExifShift(CLI::App& app, CommandContext& context) {
     if (!shift) return UsageError(context, Tr("Name a shift such as +1:30:00 or --by=-0:05."));
     return RunExifEdit(
         options->rewrite,
-        [&](const ExifDirectories& old, std::string& reason) { return ShiftedTimes(old, *shift, reason); },
+        [&](const ExifDirectories& old, std::string& reason) {
+          return ShiftedTimes(old, *shift, reason);
+        },
         context);
   };
 }
@@ -288,8 +306,10 @@ void SetUpExifShift(CLI::App& app, CommandContext& context) {
 void SetUpExifOwner(CLI::App& app, CommandContext& context) {
   auto options = SetUp(app, context, "FILE...", "Picture files, or folders of pictures");
   SetFooter(app,
-            "Sets the tags that these configuration keys have values for: ExifPersonWhoCreatedImage, ExifCopyrightHolder,\n"
-            "ExifCameraOwnerName, ExifSoftwareName, ExifEquipmentManufacturer, ExifEquipmentModel, ExifNewImageTitle.",
+            "Sets the tags that these configuration keys have values for: "
+            "ExifPersonWhoCreatedImage, ExifCopyrightHolder,\n"
+            "ExifCameraOwnerName, ExifSoftwareName, ExifEquipmentManufacturer, ExifEquipmentModel, "
+            "ExifNewImageTitle.",
             "fotomill --set ExifCopyrightHolder=\"Ann Lee\" exif owner holiday --in-place");
   context.run = [options, &context] {
     ExifChanges changes;
@@ -303,14 +323,17 @@ void SetUpExifStrip(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<StripOptions>();
   AddSelection(app, options->rewrite.selection, context);
   CLI::Option* keep = AddName(app, "--keep", options->keep, "LIST",
-                              "What stays, with commas: orientation, profile, copyright, exif, gps, xmp, iptc, comments; or none (default: orientation,profile)");
-  CLI::Option* gpsOnly =
-      AddFlag(app, "--gps-only", options->gpsOnly, "Remove only where the picture was taken, in EXIF and XMP");
+                              "What stays, with commas: orientation, profile, copyright, exif, "
+                              "gps, xmp, iptc, comments; or none (default: orientation,profile)");
+  CLI::Option* gpsOnly = AddFlag(app, "--gps-only", options->gpsOnly,
+                                 "Remove only where the picture was taken, in EXIF and XMP");
   Exclude(gpsOnly, keep);
   AddRewriteOptions(app, options->rewrite);
   SetFooter(app,
-            "Removes EXIF with thumbnail, GPS and maker notes, XMP, IPTC, Photoshop data, comments, PNG texts and times, further\n"
-            "pictures inside and what follows the picture. Pixels stay the same bytes. The new file is read again, and a note names what\n"
+            "Removes EXIF with thumbnail, GPS and maker notes, XMP, IPTC, Photoshop data, "
+            "comments, PNG texts and times, further\n"
+            "pictures inside and what follows the picture. Pixels stay the same bytes. The new "
+            "file is read again, and a note names what\n"
             "is left in it.",
             "fotomill exif strip holiday --dest bare");
   context.run = [options, &context] { return RunStrip(*options, context); };

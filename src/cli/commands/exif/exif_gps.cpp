@@ -59,7 +59,8 @@ std::string ReadTrack(const std::string& path, GpsTrack& track) {
 
 // Creates the changer for the options. Returns an error message, empty on success.
 std::string MakeChanger(const GpsOptions& options, ExifChanger& changer) {
-  const int ways = (options.gpx.empty() ? 0 : 1) + (options.at.empty() ? 0 : 1) + (options.place.empty() ? 0 : 1);
+  const int ways = (options.gpx.empty() ? 0 : 1) + (options.at.empty() ? 0 : 1) +
+                   (options.place.empty() ? 0 : 1);
   if (ways != 1) return Tr("Choose one of --gpx, --at and --place.");
   if (!options.offset.empty() && options.gpx.empty()) return Tr("--offset needs --gpx.");
   const auto offset = ParseTimeShift(options.offset);
@@ -72,7 +73,8 @@ std::string MakeChanger(const GpsOptions& options, ExifChanger& changer) {
       const auto place = time ? track->At(*time) : std::nullopt;
       if (!time) reason = Tr("It does not tell when it was taken.");
       if (time && !place)
-        reason = Tr("The track has no point within %1 minutes of its time.", GpsTrack::kMostGap / 60);
+        reason =
+            Tr("The track has no point within %1 minutes of its time.", GpsTrack::kMostGap / 60);
       return place ? PlaceEntries(*place) : ExifChanges();
     };
     return ReadTrack(options.gpx, *track);
@@ -96,13 +98,17 @@ void SetUpExifGps(CLI::App& app, CommandContext& context) {
   AddName(app, "--gpx", options->gpx, "TRACK",
           "Take the places from a GPX track, by the time each picture was taken");
   AddName(app, "--offset", options->offset, "SHIFT",
-          "What is added to the camera's time to get that of the track, UTC: +1:30:00 (default: the EXIF offset, else 0)");
-  AddName(app, "--at", options->at, "LAT,LON", "The place in decimal degrees, north and east positive");
+          "What is added to the camera's time to get that of the track, UTC: +1:30:00 (default: "
+          "the EXIF offset, else 0)");
+  AddName(app, "--at", options->at, "LAT,LON",
+          "The place in decimal degrees, north and east positive");
   AddName(app, "--place", options->place, "NAME", "A place of the list ExifLocationsFile");
   AddRewriteOptions(app, options->rewrite);
   SetFooter(app,
-            "A track gives latitude, longitude, altitude and time; between two points they are interpolated. A line of ExifLocationsFile, in the\n"
-            "data folder unless it has a path, is NAME = LAT,LON in decimal degrees, or as in ExifDefaultLocation.",
+            "A track gives latitude, longitude, altitude and time; between two points they are "
+            "interpolated. A line of ExifLocationsFile, in the\n"
+            "data folder unless it has a path, is NAME = LAT,LON in decimal degrees, or as in "
+            "ExifDefaultLocation.",
             "fotomill exif gps holiday --in-place --gpx walk.gpx --offset=-2:00");
   context.run = [options, &context] {
     ExifChanger changer;
