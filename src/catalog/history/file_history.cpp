@@ -50,13 +50,12 @@ static_assert(std::size(kNames) == kFileFunctionCount);
 constexpr std::string_view kExtension = ".fhdb";
 constexpr std::string_view kPathTag = "\tPATH:", kFunctionTag = "\tFUNCTION:",
                            kAccessedTag = "\tACCESSED:", kEndTag = "\tEND:";
-constexpr size_t kLongestLine = 4095;  // what is longer continues as a line of its own
+constexpr size_t kLongestLine = 4095;  // longer lines are split
 
-// What is known of an entry. With the thumbnail that belongs to it in the list's window it is one
-// slot.
+// An entry. Together with its thumbnail for the list window it takes one slot.
 #pragma pack(push, 1)
 struct Slot {
-  char path[261];  // zero-terminated
+  char path[261];  // NUL-terminated
   int32_t function, created, accessed;
   uint64_t size;
 };
@@ -74,8 +73,7 @@ std::string_view PathOf(const Slot& slot) {
   return {slot.path, strnlen(slot.path, sizeof slot.path - 1)};
 }
 
-// Whether `a` is before `b`: the later use, of equal ones the higher file name, then the higher
-// path.
+// Sort order: most recent use first; ties by file name, then path, both descending.
 bool StandsBefore(const Slot& a, const Slot& b) {
   if (a.accessed != b.accessed) return a.accessed > b.accessed;
   const std::string_view aName = platform::FileNameOf(PathOf(a)),
@@ -83,8 +81,8 @@ bool StandsBefore(const Slot& a, const Slot& b) {
   return aName != bName ? aName > bName : PathOf(a) > PathOf(b);
 }
 
-// The list. Its room holds the fixed parts of all slots in front and room for their thumbnails
-// behind, so that of the much that is reserved only what holds entries is ever touched.
+// The list. The fixed parts of all slots come first in memory, then the thumbnails, so that most of
+// the large reserved range is never touched.
 class HistoryList {
  public:
   bool Exists() const { return !room_.Empty(); }
@@ -114,7 +112,7 @@ class HistoryList {
     return true;
   }
 
-  // The thumbnail in an entry's slot, which is filled when it is first asked for.
+  // The thumbnail of an entry, loaded on first use.
   const ThumbnailRecord* Thumbnail(size_t index) {
     const uint32_t number = order_[index];
     const uint64_t offset =
@@ -126,7 +124,7 @@ class HistoryList {
     return hasThumbnail_[number] ? &record : nullptr;
   }
 
-  // Keeps the first `count` entries.
+  // Truncates the list to `count` entries.
   void Cut(size_t count) {
     for (; order_.size() > count; order_.pop_back()) {
       free_.push_back(order_.back());
@@ -140,7 +138,7 @@ class HistoryList {
   Slot* Slots() { return room_.Items<Slot>(0, used_).data(); }
   const Slot* Slots() const { return const_cast<HistoryList*>(this)->Slots(); }
 
-  // Where a slot is in the order, or would be.
+  // The position of a slot in the order, or where to insert it.
   std::vector<uint32_t>::iterator Place(uint32_t number) {
     return std::lower_bound(order_.begin(), order_.end(), number, [this](uint32_t a, uint32_t b) {
       return a != b && StandsBefore(Slots()[a], Slots()[b]);
@@ -155,9 +153,8 @@ class HistoryList {
     return number;
   }
 
-  // A full list asks for room for count x 128 slots and counts on 128 entries more. That is far
-  // more than it counts on, so where it cannot be had, the room that is there lasts as long as it
-  // has slots.
+  // A full list reserves memory for count x 128 slots, but only raises its capacity by 128 entries.
+  // If that much cannot be reserved, the existing memory is used up to its last slot.
   bool MakeRoom() {
     if (room_.Empty()) {
       if (!room_.Reserve(kGrowth * kSlotBytes)) return false;
@@ -169,23 +166,23 @@ class HistoryList {
       return order_.size() < room_.Size() / kSlotBytes;
     std::memcpy(larger.Items<Slot>(0, used_).data(), Slots(), used_ * sizeof(Slot));
     room_ = std::move(larger);
-    hasThumbnail_.clear();  // they are read again rather than copied, if ever
+    hasThumbnail_.clear();  // reloaded on demand instead of copied
     capacity_ += kGrowth;
     return true;
   }
 
   platform::ReservedMemory room_;
   uint64_t capacity_ = 0;           // entries
-  uint32_t used_ = 0;               // slots that ever held an entry
-  std::vector<uint32_t> order_;     // slots as they are in the list
-  std::vector<uint32_t> free_;      // slots whose entry is gone
-  std::vector<bool> hasThumbnail_;  // of slots
+  uint32_t used_ = 0;               // slots used so far, including free ones
+  std::vector<uint32_t> order_;     // slots in list order
+  std::vector<uint32_t> free_;      // slots of removed entries
+  std::vector<bool> hasThumbnail_;  // by slot
   std::unordered_map<std::string, uint32_t> slotOf_;
 };
 
 HistoryList list;
-bool outOfMemory = false;  // an entry found no room: the list lacks some
-bool loaded = false;       // the list began with what the file held
+bool outOfMemory = false;  // the list is incomplete
+bool loaded = false;       // the list was loaded from the file
 
 void LimitList(const HistoryOptions& options) {
   size_t count = list.Count();
@@ -198,7 +195,7 @@ void LimitList(const HistoryOptions& options) {
   list.Cut(count);
 }
 
-// What follows `tag` in a line up to the next tab.
+// Finds the text between `tag` and the next tab.
 bool FindField(std::string_view line, std::string_view tag, std::string_view& value) {
   const size_t start = line.find(tag);
   if (start == std::string_view::npos) return false;
@@ -207,7 +204,7 @@ bool FindField(std::string_view line, std::string_view tag, std::string_view& va
   return true;
 }
 
-// Takes the next line, or as much of it as is read at once, off the text.
+// Removes the next line from the text, or its first part if it is too long.
 std::string_view TakeLine(std::string_view& text) {
   const size_t end = std::min({text.find('\n'), text.size() - 1, kLongestLine - 1});
   std::string_view line = text.substr(0, end + 1);
@@ -217,9 +214,9 @@ std::string_view TakeLine(std::string_view& text) {
   return line.substr(0, line.find_first_of(std::string_view("\n\r\0", 3)));
 }
 
-// Records the entries of a history file's text, under the paths that their files have now. False
-// when it holds bytes, but no line of a history. `followed` turns true when an entry was concerned
-// by a move or removal.
+// Records the entries in a history file's text, with the current paths of their files. False if it
+// is not empty but has no valid line. Sets `followed` if an entry was affected by a move or
+// removal.
 bool ReadEntries(const HistoryOptions& options, std::string_view text, const FileMoves& moves,
                  bool& followed) {
   bool any = text.empty();
@@ -273,13 +270,13 @@ size_t RecordUses(const HistoryOptions& options, std::span<const FileUse> uses,
   size_t recorded = 0;
   for (size_t i = 0; i < uses.size(); ++i) {
     const FileUse& use = uses[i];
-    if (use.removed) continue;  // its entry was left out
+    if (use.removed) continue;  // its entry was dropped
     recorded += RecordFileHistory(options, paths[i], use.function, use.created, use.accessed);
   }
   return recorded;
 }
 
-// Takes up the moves and removals of uses, the last first; the path that the file of each has now.
+// Records the moves and removals of uses, last one first; returns the current paths of their files.
 std::vector<std::string> FollowUses(std::span<const FileUse> uses, FileMoves& moves) {
   std::vector<std::string> paths(uses.size());
   for (size_t i = uses.size(); i > 0; --i) {

@@ -6,13 +6,13 @@ namespace fotomill {
 
 void FileMoves::MovedBefore(const std::string& from, const std::string& to) {
   std::string last = PathNow(to).value_or(to);
-  now_.erase(to);  // what was there before, if anything, is not what came
+  now_.erase(to);  // a previous file of that name is a different one
   now_[from] = std::move(last);
 }
 
 void FileMoves::RemovedBefore(const std::string& path) { now_[path].clear(); }
 
-// By the path itself, or the folder next above it of which something is known.
+// Looks up the path itself, or its nearest known parent folder.
 std::optional<std::string> FileMoves::PathNow(std::string_view path) const {
   if (now_.empty()) return std::nullopt;
   for (size_t end = path.size(); end != std::string_view::npos && end > 0;

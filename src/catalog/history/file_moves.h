@@ -7,20 +7,20 @@
 
 namespace fotomill {
 
-// Where files are now that had other paths before: renames, moves and removals of files and
-// folders, taken up from the last to the first.
+// Maps old paths to current ones: renames, moves and removals of files and folders, recorded from
+// last to first.
 class FileMoves {
  public:
-  // Before everything that was taken up so far, what was at `from` came to `to`; or what was at
-  // `path` went away.
+  // Records that `from` was renamed to `to`, or that `path` was removed, before everything recorded
+  // so far.
   void MovedBefore(const std::string& from, const std::string& to);
   void RemovedBefore(const std::string& path);
-  // Where the file is now that had this path before all of it; empty when it is gone. nullopt when
-  // nothing of it concerns the file.
+  // The current path of the file that originally had this path; empty if removed. nullopt if the
+  // file was not affected.
   std::optional<std::string> PathNow(std::string_view path) const;
 
  private:
-  // by the path before; empty: gone
+  // by original path; empty: removed
   std::unordered_map<std::string, std::string> now_;
 };
 

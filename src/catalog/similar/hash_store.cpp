@@ -19,7 +19,7 @@ constexpr uint64_t kMostRecordBytes = kHeadBytes + 4096;
 constexpr uint64_t kMostStoreBytes = uint64_t{1} << 30;
 constexpr uint32_t kHasHashes = 1, kHasDigest = 2;
 constexpr int64_t kFresh = 2;             // seconds
-constexpr uint64_t kFewRecords = 10000;   // a store of fewer is not worth making anew
+constexpr uint64_t kFewRecords = 10000;   // smaller stores are never rewritten
 
 uint32_t SumOf(std::span<const uint8_t> bytes) {
   uint32_t sum = 0x811c9dc5u;
@@ -65,7 +65,7 @@ std::string DigestText(std::span<const uint8_t> bytes) {
   return text;
 }
 
-// The next record. False at the end, and at one that is not whole.
+// Parses the next record. False at the end, or if it is incomplete.
 bool TakeRecord(ByteReader& reader, std::string& path, HashRecord& record) {
   const uint64_t start = reader.Position();
   const uint64_t length = reader.Le32();
@@ -93,7 +93,7 @@ bool TakeRecord(ByteReader& reader, std::string& path, HashRecord& record) {
 
 HashStore::HashStore(std::string path) : path_(std::move(path)) { writable_ = Load(); }
 
-// False when the store is there and cannot be used.
+// False if the store exists but cannot be used.
 bool HashStore::Load() {
   using enum platform::StoreFile::OpenResult;
   records_.clear();
@@ -114,7 +114,7 @@ bool HashStore::Load() {
   return writable;
 }
 
-// Takes in records, and tells how many bytes they have.
+// Adds records; returns the number of bytes parsed.
 uint64_t HashStore::TakeRecords(std::span<const uint8_t> bytes) {
   ByteReader reader(bytes);
   std::string path;
@@ -144,7 +144,7 @@ void HashStore::Put(const std::string& path, const HashRecord& record) {
 
 bool HashStore::Save() {
   if (unsaved_.empty()) return true;
-  // Another program may make the store, or make it anew, at any time: then it is read once more.
+  // Another program may create or replace the store at any time; then reload it.
   for (int tries = 0; tries < 3 && writable_; ++tries) {
     if (!file_.IsOpen()) {
       if (Rewrite(platform::Existing::Refuse)) return true;
@@ -162,9 +162,9 @@ bool HashStore::Save() {
   return false;
 }
 
-// Under the lock.
+// Needs the lock.
 bool HashStore::Append() {
-  // Behind what was read may be records of another program, or half a one.
+  // After the parsed part there may be records of another program, or an incomplete one.
   const uint64_t size = file_.Size();
   if (size < end_ || size > kMostStoreBytes) return false;
   std::vector<uint8_t> added(size - end_);

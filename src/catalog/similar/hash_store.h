@@ -12,53 +12,53 @@
 
 namespace fotomill {
 
-// What is known of a picture file, so that it need not be decoded again. Good as long as the file
-// has the size and time that it was computed for.
+// Cached results for a picture file, so that it need not be decoded again. Valid as long as size
+// and time of the file do not change.
 struct HashRecord {
   uint64_t size = 0;     // of the file, bytes
   int64_t modified = 0;  // seconds since 1970 UTC
   int32_t width = 0, height = 0;
   bool hasHashes = false;
   PictureHashes hashes{};
-  std::string digest = {};  // of the pixels, 32 characters; empty unless asked for
+  std::string digest = {};  // of the pixels, 32 characters; empty if not computed
 };
 
-// The store of picture hashes in the data folder: a file that is only ever appended to, and made
-// anew when most of it is out of date. Little-endian:
+// The store of picture hashes in the data folder: an append-only file that is rewritten when most
+// of it is outdated. Little-endian:
 //
 //   offset size  content
 //        0    8  magic "FMWHASH1"
-//   then records, one after the other
+//   followed by records
 //        0    4  bytes of the record, 120 + length of the path
-//        4    4  sum of what follows (FNV-1a, 32 bits)
+//      4    4  checksum of the rest (FNV-1a, 32 bits)
 //        8    8  size of the file
 //       16    8  its modification time, seconds since 1970 UTC
-//       24    4  width, 4 height
+//     24    8  width and height, 4 bytes each
 //       32   64  eight hashes
 //       96   16  digest of the pixels
 //      112    4  bit 0: has hashes, bit 1: has a digest
 //      116    4  0
 //      120       absolute path
 //
-// The last record of a path counts. Reading ends at the first record that is cut short or whose sum
-// is wrong: that of a program that was stopped while it wrote. Several programs may write at a
-// time.
+// The last record of a path applies. Reading stops at the first record that is incomplete or
+// has a wrong checksum, as left by an interrupted program. Several programs may write
+// concurrently.
 inline constexpr std::string_view kHashStoreName = "Fotomill.hashes";
 
-// One store. Belongs to one thread.
+// A store. Not thread-safe.
 class HashStore {
  public:
-  // Reads the store. One that is missing is empty; one that cannot be read, or is something else,
-  // is empty as well and will not be written.
+  // Loads the store. A missing store is empty; if it cannot be read or is not valid, it is empty
+  // and never written.
   explicit HashStore(std::string path);
 
-  // What is known of a file of that size and time; null if nothing is.
+  // The record for a file with this size and time; null if there is none.
   const HashRecord* Find(const std::string& path, uint64_t size, int64_t modified) const;
-  // Takes in what was found out; Save writes it. A file that was changed within the last two
-  // seconds is not kept, as it may change again without a new time.
+  // Adds a record; Save writes it. Files modified within the last two seconds are ignored, as they
+  // may change again without a new time.
   void Put(const std::string& path, const HashRecord& record);
-  // Appends what was taken in since the last time. False when it could not be written; it stays to
-  // be written then.
+  // Appends all records added since the last call. If writing fails, returns false and keeps them
+  // for the next call.
   [[nodiscard]] bool Save();
 
  private:
@@ -68,11 +68,11 @@ class HashStore {
   uint64_t TakeRecords(std::span<const uint8_t> bytes);
 
   const std::string path_;
-  platform::StoreFile file_;  // closed while there is none
+  platform::StoreFile file_;  // closed if there is no file
   std::unordered_map<std::string, HashRecord> records_;
   std::unordered_map<std::string, HashRecord> unsaved_;
-  uint64_t end_ = 0;     // of the records that are whole, in the file
-  uint64_t parsed_ = 0;  // how many records the file has, replaced ones included
+  uint64_t end_ = 0;     // end of the valid records in the file
+  uint64_t parsed_ = 0;  // number of records in the file, including replaced ones
   bool writable_ = true;
 };
 

@@ -15,8 +15,7 @@ namespace fotomill {
 namespace {
 
 constexpr int32_t kSide = 32, kFrequencies = 8;
-// Coefficients are compared in steps of 1/16, so that what should be equal is not told apart by the
-// last digit.
+// Coefficients are compared in steps of 1/16, so that rounding errors do not separate equal ones.
 constexpr double kSteps = 16;
 
 using Levels = std::array<double, static_cast<size_t>(kSide) * kSide>;
@@ -47,7 +46,7 @@ Coefficients Transformed(const Levels& levels) {
   return result;
 }
 
-// The first coefficient is the mean brightness, which says nothing of what is seen.
+// The first coefficient is the mean brightness, which is irrelevant for similarity.
 PictureHash BitsOf(const Coefficients& coefficients) {
   Coefficients sorted = coefficients;
   const auto middle = sorted.begin() + 1 + (sorted.size() - 1) / 2;
@@ -59,7 +58,7 @@ PictureHash BitsOf(const Coefficients& coefficients) {
   return hash;
 }
 
-// Mirroring a picture changes the sign of every other frequency.
+// Mirroring changes the sign of every other frequency.
 Coefficients Turned(const Coefficients& own, bool across, bool down, bool swapped) {
   Coefficients turned{};
   for (size_t v = 0; v < kFrequencies; ++v) {
@@ -111,7 +110,7 @@ Status DigestPixels(const PictureRecord& picture, std::string& digest) {
   const bool alpha = !picture.alpha.Empty() && !IsOpaque(picture.alpha);
   BgrRows rows;
   RETURN_IF_BAD(rows.Open(picture.image));
-  // The digest of the rows' digests.
+  // Hashes the digests of the rows.
   std::string all = std::to_string(width) + (alpha ? "a" : "");
   for (int32_t y = 0; y < picture.image.Height(); ++y) {
     all += Md5Text({rows.Row(y), width * 3});

@@ -11,7 +11,7 @@ namespace fotomill {
 namespace {
 
 constexpr size_t kParts = 4, kPartBits = 16, kPartValues = size_t{1} << kPartBits;
-// Beyond that the parts may differ in so many bits that looking at every pair is as fast.
+// For larger distances, so many bits may differ per part that comparing all pairs is as fast.
 constexpr int32_t kMostByParts = 15;
 constexpr size_t kAskedEvery = 256;
 
@@ -19,7 +19,7 @@ uint32_t PartOf(PictureHash hash, size_t part) {
   return static_cast<uint32_t>(hash >> (part * kPartBits)) & (kPartValues - 1);
 }
 
-// Sets that are joined one by one (Tarjan 1975); the least member stands for each.
+// Disjoint sets (Tarjan 1975), represented by their smallest member.
 class Sets {
  public:
   explicit Sets(size_t count) : above_(count) {
@@ -38,7 +38,7 @@ class Sets {
   std::vector<size_t> above_;
 };
 
-// All numbers of 16 bits with at most so many of them set.
+// All 16-bit numbers with at most `most` bits set.
 std::vector<uint32_t> FewBits(int32_t most) {
   std::vector<uint32_t> masks;
   for (uint32_t mask = 0; mask < kPartValues; ++mask) {
@@ -47,7 +47,7 @@ std::vector<uint32_t> FewBits(int32_t most) {
   return masks;
 }
 
-// Different hashes, listed by each of their parts.
+// Distinct hashes, indexed by each of their parts.
 class PartIndex {
  public:
   explicit PartIndex(const std::vector<PictureHash>& hashes) : hashes_(hashes) {
@@ -63,7 +63,7 @@ class PartIndex {
     }
   }
 
-  // Calls `found` for each hash that is near enough, some of them several times.
+  // Calls `found` for each hash within the distance, possibly more than once.
   template <typename Found>
   void Near(PictureHash hash, int32_t most, const std::vector<uint32_t>& masks,
             const Found& found) const {
@@ -84,11 +84,11 @@ class PartIndex {
   std::array<std::vector<uint32_t>, kParts> starts_, places_;
 };
 
-// The pictures of one hash.
+// Pictures grouped by hash.
 struct Distinct {
-  std::vector<PictureHash> hashes;     // each once
-  std::vector<PictureHashes> turned;   // of a picture with that hash
-  std::vector<size_t> of;              // for each picture, its place above
+  std::vector<PictureHash> hashes;     // distinct
+  std::vector<PictureHashes> turned;   // hashes of one picture with that hash
+  std::vector<size_t> of;              // for each picture, its index in `hashes`
 };
 
 Distinct DistinctOf(std::span<const PictureHashes> pictures) {
@@ -105,7 +105,7 @@ Distinct DistinctOf(std::span<const PictureHashes> pictures) {
   return distinct;
 }
 
-// The least distance of a picture, as it is or turned, to another one.
+// The smallest distance of a picture, in any orientation if `turned`, to another one.
 int32_t Apart(const PictureHashes& picture, PictureHash other, bool turned) {
   int32_t least = HashDistance(picture[0], other);
   for (size_t i = 1; turned && i < picture.size(); ++i)
@@ -113,7 +113,7 @@ int32_t Apart(const PictureHashes& picture, PictureHash other, bool turned) {
   return least;
 }
 
-// False when it was stopped.
+// False if stopped.
 bool JoinNear(const Distinct& distinct, int32_t most, bool turned,
               const std::function<bool()>& goesOn, Sets& sets) {
   const size_t count = distinct.hashes.size(), ways = turned ? PictureHashes().size() : 1;
@@ -137,7 +137,7 @@ bool JoinNear(const Distinct& distinct, int32_t most, bool turned,
   return true;
 }
 
-// The groups of pictures whose `keys` are equal, in the order of their first members.
+// Groups pictures with equal `keys`, ordered by their first members.
 template <typename Key>
 std::vector<SimilarGroup> GroupsOf(const std::vector<Key>& keys) {
   std::vector<SimilarGroup> groups;
@@ -172,7 +172,7 @@ std::vector<SimilarGroup> FindSimilar(std::span<const PictureHashes> pictures, i
 std::vector<SimilarGroup> FindEqual(std::span<const std::string> digests) {
   std::vector<std::string> keys(digests.begin(), digests.end());
   for (size_t i = 0; i < keys.size(); ++i) {
-    if (keys[i].empty()) keys[i] = std::to_string(i);  // shorter than any digest
+    if (keys[i].empty()) keys[i] = std::to_string(i);  // unique, as it is shorter than any digest
   }
   return GroupsOf(keys);
 }

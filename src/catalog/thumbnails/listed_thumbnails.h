@@ -9,13 +9,13 @@
 
 namespace fotomill {
 
-// The records of the virtual mode, which live in memory only: those of the pictures that the
-// browsers' lists showed last, 2,000 at most (56 MB). From any thread.
+// The in-memory records of the virtual mode: of the pictures most recently shown in browser lists,
+// at most 2,000 (56 MB). Thread-safe.
 class ListedThumbnails {
  public:
-  // The record of a picture, unless it was made of other contents. False if there is none.
+  // Finds the record of a picture. False if there is none, or its contents have changed.
   bool Find(const std::string& path, const PictureStamp& stamp, ThumbnailRecord& record);
-  // Keeps the record of a picture in place of an earlier one.
+  // Adds or replaces the record of a picture.
   void Attach(const std::string& path, const PictureStamp& stamp, const ThumbnailRecord& record);
 
  private:
@@ -26,7 +26,7 @@ class ListedThumbnails {
     ThumbnailRecord record;
   };
   std::mutex mutex_;
-  std::list<Entry> entries_;  // the last attached first
+  std::list<Entry> entries_;  // most recently attached first
   std::unordered_map<std::string, std::list<Entry>::iterator> places_;
 };
 

@@ -21,7 +21,7 @@ struct Line {
   std::string_view folder;
 };
 
-// Takes the next line off a text, with its end; a line that is not understood has no folder.
+// Removes the next line from a text, including its end; invalid lines have no folder.
 Line TakeLine(std::string_view& text) {
   std::string_view line = text.substr(0, text.find('\n'));
   text.remove_prefix(std::min(line.size() + 1, text.size()));

@@ -5,13 +5,13 @@
 
 namespace fotomill {
 
-// When thumbnail files without a picture were last removed from a folder, kept for later runs in
-// the file "FMWThumbnailCleanUp.txt" of the data folder: a line "SECONDS,FOLDER" each, seconds
-// since 1970 UTC, the latest first, 5,000 folders at most.
+// Times of the last removal of orphaned thumbnail files per folder, stored in the file
+// "FMWThumbnailCleanUp.txt" in the data folder: lines "SECONDS,FOLDER", seconds since 1970 UTC,
+// latest first, at most 5,000 folders.
 
-// 0: never, or it is not known.
+// 0: never or unknown.
 int64_t LastOrphanRemoval(const std::string& folder);
-// False when it could not be written; a file that cannot be read is left alone.
+// False if it could not be written; a file that cannot be read is left unchanged.
 bool KeepOrphanRemoval(const std::string& folder, int64_t time);
 
 }  // namespace fotomill

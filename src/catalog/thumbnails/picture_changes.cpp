@@ -15,20 +15,20 @@ namespace fotomill {
 
 namespace {
 
-// What is to be marked in one database.
+// What to mark in one database.
 struct Marks {
   std::vector<std::string> paths, folders;
 };
 
-// Whether what had a path may have been a folder. One that is gone cannot be asked; pictures have
-// names of pictures.
+// Whether a path may have been a folder. For removed ones, guessed from the name: those of pictures
+// are not folders.
 bool MayHaveBeenFolder(const PictureChange& change) {
   if (!change.to.empty()) return platform::IsFolder(change.to);
   return platform::FactsOf(change.path).kind == platform::FileKind::Missing &&
          FindFormatByName(change.path) == kNoFormat;
 }
 
-// Whether a path is that of a thumbnail file rather than of something that merely has its name.
+// Whether a file really is a thumbnail file, not just by name.
 bool IsThumbnailFile(const std::string& path) {
   ThumbnailRecord record;
   return !platform::FactsOf(path).link && ReadThumbnailFile(record, path);
@@ -50,14 +50,14 @@ void MarkChangedRecords(std::span<const PictureChange> changes) {
   for (const PictureChange& change : changes) {
     const bool folder = MayHaveBeenFolder(change);
     if (folder) marks[global].folders.push_back(change.path);
-    if (folder && !change.to.empty()) {  // its own database went with it
+    if (folder && !change.to.empty()) {  // its local database moved with it
       marks[ThumbnailDatabasePath(change.to)].folders.push_back(change.path);
       continue;
     }
     markFile(change.path);
     if (!change.to.empty()) markFile(change.to);
   }
-  marks.erase(std::string());  // there is no data folder
+  marks.erase(std::string());  // no data folder
   for (const auto& [database, marked] : marks)
     (void)SharedThumbnailStore().Delete(database, marked.paths, marked.folders);
 }
@@ -69,7 +69,7 @@ void FollowThumbnailFile(const std::string& from, const std::string& to) {
   if (!follows) return DeleteMisleadingThumbnailFile(to);
   if (platform::RenameFile(old, wanted, platform::Existing::Refuse) == platform::CommitResult::Done)
     return;
-  // Of two that could be meant, neither is known to be the right one.
+  // With two candidates, neither is known to be right.
   (void)platform::DeleteFile(old);
   DeleteMisleadingThumbnailFile(to);
 }

@@ -6,27 +6,27 @@
 
 namespace fotomill {
 
-// What became of a file or folder that may have thumbnails. Paths are absolute.
+// A change of a file or folder that may have thumbnails. Absolute paths.
 struct PictureChange {
-  std::string path;     // it is gone from here, or has other contents now
-  std::string to = {};  // its new path, if it was renamed or moved
+  std::string path;     // removed from here, or its contents were replaced
+  std::string to = {};  // new path, if renamed or moved
 };
 
-// Marks the database records of changed files deleted, in the global database and in those of their
-// folders, so that compaction drops them and no new file under an old name gets the old thumbnail;
-// with folders, of all files that were in them. Records that cannot be marked, in a folder that may
-// not be written to, are still not used for a picture of another time or size. May take long; any
-// thread.
+// Marks the database records of changed files as deleted, in the global database and those of their
+// folders, so that compaction removes them and no new file of the same name gets the old thumbnail.
+// For folders, marks the records of all files that were in them. Records in read-only folders
+// cannot be marked, but are still not used for a picture of different time or size. May take long;
+// any thread.
 void MarkChangedRecords(std::span<const PictureChange> changes);
 
-// What becomes of the thumbnail file of one picture, called at once as it is renamed or moved: it
-// follows the picture, or is deleted where the new name has one already. Nothing for folders, whose
-// thumbnail files are in them.
+// Handles the thumbnail file of a picture; call right after renaming or moving the picture: it is
+// renamed along, or deleted if the new name already has one. Does nothing for folders, as they
+// contain their thumbnail files.
 void FollowThumbnailFile(const std::string& from, const std::string& to);
-// Deletes the thumbnail file of a picture that is gone or about to be replaced. What merely has its
-// name, and links, stay.
+// Deletes the thumbnail file of a picture that was removed or will be replaced. Links, and files
+// that only have the name of a thumbnail file, are kept.
 void DeleteThumbnailFile(const std::string& path);
-// The same for a picture that is there, only if the thumbnail file would pass for a current one.
+// The same for an existing picture, if the thumbnail file looks current but is not.
 void DeleteMisleadingThumbnailFile(const std::string& path);
 
 }  // namespace fotomill

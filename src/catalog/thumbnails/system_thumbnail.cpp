@@ -19,7 +19,7 @@ namespace {
 constexpr std::string_view kUriKey = "Thumb::URI", kTimeKey = "Thumb::MTime";
 constexpr std::string_view kAllowedMarks = "-_.!~*'():@&=+$,/";
 
-// The folders of the cache and the longest side of what is in them.
+// Folders of the cache, with the maximum side of their thumbnails.
 struct CacheFolder {
   const char* name;
   int32_t side;
@@ -35,7 +35,7 @@ std::string CachedFile(const CacheFolder& folder, std::string_view uri) {
       Md5Text(bytes) + ".png");
 }
 
-// The value of a text chunk with that key.
+// Finds the value of a text chunk by key.
 bool HasText(std::span<const uint8_t> file, std::string_view key, std::string_view& value) {
   PngChunks chunks(file);
   for (PngChunk chunk; chunks.Next(chunk);) {

@@ -8,22 +8,22 @@
 
 namespace fotomill {
 
-// The system's own thumbnails, made by file managers and only read here: on free desktops PNG files
+// The system's thumbnails, created by file managers and read-only here: on free desktops, PNG files
 // in the folder "thumbnails/large" of the user's cache, at most 256 pixels wide and high, named
-// after the MD5 of the picture's URI. A text in each names the URI ("Thumb::URI"), another the
-// picture's modification time ("Thumb::MTime"); it is out of date when that is not the picture's.
-// Source: freedesktop.org, "Thumbnail Managing Standard".
+// after the MD5 of the picture's URI. Text chunks contain the URI ("Thumb::URI") and the picture's
+// modification time ("Thumb::MTime"); a thumbnail with a different time is outdated. Source:
+// freedesktop.org, "Thumbnail Managing Standard".
 
-// The address of an absolute path, every byte escaped that RFC 2396 does not allow in one.
+// The URI of an absolute path, escaped according to RFC 2396.
 std::string FileUri(std::string_view path);
 
-// The system's thumbnail of a picture as a record of its own, from the first of these folders and
-// of "x-large" and "xx-large" (512 and 1024 pixels) that is made for `side` pixels at least. Null
-// without a valid one.
+// Loads the system's thumbnail of a picture, from the first of the folders "large", "x-large" and
+// "xx-large" (256, 512 and 1024 pixels) suitable for `side` pixels. Null if there is no valid
+// one.
 PicturePointer ReadSystemPicture(const std::string& picturePath, int32_t side);
 
-// Fills a large record with the system's thumbnail of a picture. False without a valid one;
-// `record` is then as before.
+// Loads the system's thumbnail into a large record. False, with `record` unchanged, if there is no
+// valid one.
 bool ReadSystemThumbnail(const std::string& picturePath, Color matte, LargeThumbnailRecord& record);
 
 }  // namespace fotomill

@@ -25,7 +25,7 @@ static_assert(kPathOffset == sizeof(ThumbnailRecord) && kVolumeOffset == kPathOf
               kSizeOffset == kTimeOffset + 4 && kSizeOffset + kSizeBytes == kDatabaseRecordSize);
 constexpr uint8_t kDeletedFlag = 1;
 constexpr size_t kKeySize = kDatabaseRecordSize - kPathOffset;
-// records; the index of fewer is made faster than it is worth a file
+// records; a smaller index is rebuilt faster than loaded from a file
 constexpr int64_t kLargeIndex = 1000;
 
 std::string IndexPath(const std::string& databasePath) { return databasePath + ".index"; }
@@ -54,7 +54,7 @@ std::array<uint8_t, kDatabaseHeaderSize> BytesOf(const DatabaseHeader& header) {
   return bytes;
 }
 
-// What is behind the thumbnail.
+// The bytes after the thumbnail.
 using KeyBytes = std::array<uint8_t, kKeySize>;
 
 bool BytesOf(const DatabaseRecord& record, KeyBytes& bytes) {
@@ -68,25 +68,25 @@ bool BytesOf(const DatabaseRecord& record, KeyBytes& bytes) {
   return true;
 }
 
-// A text that ends at its first zero byte, or with its field.
+// A text that ends at the first NUL or the end of the field.
 std::string_view TextViewIn(std::span<const uint8_t> field) {
   const std::string_view text(reinterpret_cast<const char*>(field.data()), kTextSize - 1);
   return text.substr(0, text.find('\0'));
 }
 
-// What an index knows a record by.
+// The hash of a record in an index.
 uint32_t IndexedHash(const DatabaseRecord& record) {
   const bool findable = !record.deleted && record.thumbnail.HasMagic(kSmallThumbnailMagic);
   return findable ? ThumbnailIndex::HashOf(record.path) : 0;
 }
 
-// What two paths of the same picture have in common.
+// Paths with the same key belong to the same picture.
 std::string_view ComparisonKey(std::string_view path) {
   if ((browserOptions & kCompareExtensions) != 0) return path;
   return path.substr(0, path.size() - platform::SplitPath(path).extension.size());
 }
 
-// From the bytes behind the thumbnail.
+// Parses the bytes after the thumbnail.
 template <typename Target>
 void TakeKey(std::span<const uint8_t> bytes, Target& target) {
   target.path = TextViewIn(bytes);
@@ -109,14 +109,14 @@ bool ReadHeaderOf(const platform::StoreFile& file, DatabaseHeader& header) {
   return true;
 }
 
-// How many of the counted records a file of a size holds.
+// The number of counted records in a file of this size.
 int64_t RecordsIn(const DatabaseHeader& header, uint64_t size) {
   const auto most = static_cast<int64_t>(
       size < kDatabaseHeaderSize ? 0 : (size - kDatabaseHeaderSize) / kDatabaseRecordSize);
   return std::clamp<int64_t>(header.count, 0, most);
 }
 
-// Gives a database's lock back at the end of a scope.
+// Unlocks a database at the end of a scope.
 class Unlocker {
  public:
   explicit Unlocker(platform::StoreFile& file) : file_(file) {}
@@ -128,7 +128,8 @@ class Unlocker {
   platform::StoreFile& file_;
 };
 
-// A copy that an interrupted compaction left: it begins as one of ours, or is empty.
+// Whether a file is left over from an interrupted compaction: it starts like a database, or is
+// empty.
 bool IsLeftover(const std::string& path) {
   const platform::FileFacts facts = platform::FactsOf(path);
   if (facts.kind != platform::FileKind::Regular || facts.link) return false;
@@ -176,8 +177,7 @@ std::string VolumeKeyFor(const std::string& path) {
 }
 
 bool PurgesMissing(const DatabaseKey& key) {
-  // The volume of the nearest folder that is there: of a drive that is not plugged in, another
-  // one's.
+  // The volume of the nearest existing folder; for a drive that is not mounted, a different volume.
   std::string nearest = key.path;
   while (platform::FactsOf(nearest).kind == platform::FileKind::Missing) {
     const platform::PathParts parts = platform::SplitPath(nearest);
@@ -230,7 +230,7 @@ ThumbnailDatabase::Opened ThumbnailDatabase::OpenFile(const std::string& path, b
 }
 
 void ThumbnailDatabase::CloseThumbnailDatabase() {
-  // Only of a file that is still as the index knows it.
+  // Only if the file still has the state known to the index.
   const bool worthSaving = file_.IsOpen() && indexed_.count >= kLargeIndex && indexed_ != saved_;
   if (worthSaving && indexed_.size == file_.Size() && indexed_.modified == file_.Modified() &&
       file_.IsStill(path_)) {
@@ -276,8 +276,7 @@ ThumbnailDatabase::KeyRead ThumbnailDatabase::TryKey(int64_t index, DatabaseKey&
   return ByteReader(magic).Match(kSmallThumbnailMagic) ? KeyRead::Done : KeyRead::NoThumbnail;
 }
 
-// Takes the lock; where another process has put a new file in the old one's place meanwhile, that
-// of the new one.
+// Locks the file; if another process has replaced it meanwhile, opens and locks the new one.
 bool ThumbnailDatabase::LockAndCheck(DatabaseHeader& header) {
   while (!readOnly_ && file_.Lock()) {
     if (file_.IsStill(path_)) {
@@ -296,8 +295,8 @@ ThumbnailIndex::State ThumbnailDatabase::StateOf(const DatabaseHeader& header) c
   return {RecordsIn(header, size), size, file_.Modified()};
 }
 
-// Has the index know the file as it is. False when a record could not be read; the index then lacks
-// it, and is made again the next time.
+// Updates the index to the current file. False if a record could not be read; the index then lacks
+// it and is rebuilt the next time.
 bool ThumbnailDatabase::UpdateIndex(const ThumbnailIndex::State& state) {
   if (indexed_ == state) return true;
   indexed_ = {};
@@ -309,7 +308,7 @@ bool ThumbnailDatabase::UpdateIndex(const ThumbnailIndex::State& state) {
   return true;
 }
 
-// Reads the names alone: those of a record and the magic of the next lie side by side.
+// Reads only the keys, together with the magic of the next record, which is adjacent.
 bool ThumbnailDatabase::BuildIndex(int64_t count) {
   index_.Clear();
   std::array<uint8_t, kKeySize + kSmallThumbnailMagic.size()> bytes;
@@ -334,8 +333,8 @@ bool ThumbnailDatabase::MarkDeleted(int64_t index) {
   return file_.WriteAt(OffsetOf(index) + kFlagsOffset, {&flags, 1});
 }
 
-// The records of the same paths and volumes as new ones, which are to be from `first` on: those
-// that are there, and new ones that come again further on. False when one cannot be read.
+// Finds records with the same paths and volumes as new ones, which start at `first`: existing ones,
+// and new ones repeated later. False if one cannot be read.
 bool ThumbnailDatabase::FindRecordsToReplace(std::span<const DatabaseRecord> records, int64_t first,
                                              std::vector<int64_t>& replaced) const {
   std::map<std::pair<std::string_view, std::string_view>, int64_t> added;
@@ -385,7 +384,7 @@ bool ThumbnailDatabase::AppendDatabaseRecords(std::span<const DatabaseRecord> re
   header.count += static_cast<int32_t>(records.size());
   header.appended = static_cast<uint32_t>(platform::Now());
   if (!WriteDatabaseHeader(header)) return false;
-  // Only now, as a record that is counted must never be lost.
+  // Must come last, so that a counted record is never lost.
   for (const int64_t index : replaced) {
     if (!MarkDeleted(index)) return false;
   }
@@ -411,7 +410,7 @@ bool ThumbnailDatabase::WriteDatabaseRecord(int64_t index, const DatabaseRecord&
   return true;
 }
 
-// What a lookup asks for.
+// The parameters of a lookup.
 struct ThumbnailDatabase::Wanted {
   std::string_view path, volume;
   PictureStamp stamp;
@@ -421,7 +420,7 @@ bool ThumbnailDatabase::Find(const std::string& path, const std::string& volume,
                              ThumbnailRecord& thumbnail, const PictureStamp& stamp) {
   ThumbnailIndex::State state;
   DatabaseHeader header;
-  if (!file_.IsStill(path_, state.size, state.modified)) {  // it was compacted meanwhile
+  if (!file_.IsStill(path_, state.size, state.modified)) {  // compacted meanwhile
     if (OpenFile(path_, false, readOnlyToo_) != Opened::Done ||
         !file_.IsStill(path_, state.size, state.modified))
       return false;
@@ -432,18 +431,18 @@ bool ThumbnailDatabase::Find(const std::string& path, const std::string& volume,
   const auto isIt = [&](size_t index) {
     return TakeThumbnail(static_cast<int64_t>(index), {path, volume, stamp}, thumbnail);
   };
-  // The first lookup after opening asks the saved index for this one; only the next is worth
-  // loading it.
+  // The first lookup after opening uses the index file directly; loading it is worthwhile only for
+  // the next one.
   if (state != indexed_ && state.count >= kLargeIndex && !std::exchange(triedFile_, true)) {
     if (const std::optional<bool> found =
             ThumbnailIndex::FindInFile(IndexPath(path_), state, hash, isIt))
       return *found;
   }
-  (void)UpdateIndex(state);  // what cannot be read is passed over
+  (void)UpdateIndex(state);  // ignore unreadable records
   return index_.Find(hash, isIt);
 }
 
-// The thumbnail of a record when it is the one that is wanted.
+// Loads the thumbnail of a record if it matches.
 bool ThumbnailDatabase::TakeThumbnail(int64_t index, const Wanted& wanted,
                                       ThumbnailRecord& thumbnail) const {
   KeyBytes bytes;
@@ -496,7 +495,7 @@ int64_t ThumbnailDatabase::DeleteBelow(std::span<const std::string> folders) {
   return MarkAllDeleted(deleted, header);
 }
 
-// With the lock held and the index up to date.
+// Needs the lock and an up-to-date index.
 int64_t ThumbnailDatabase::MarkAllDeleted(const std::vector<size_t>& records,
                                           const DatabaseHeader& header) {
   indexed_ = {};  // until all is done
@@ -515,8 +514,7 @@ ThumbnailDatabase::Compacted ThumbnailDatabase::CopyLiveRecords(platform::StoreF
                                                                 const StopToken& stop) {
   const int32_t count = header.count;
   header.count = 0;
-  // The header comes first, so that what an interrupted pass leaves is known as ours by its first
-  // bytes.
+  // Write the header first, so that leftovers of an interrupted run can be recognized.
   if (!to.WriteAt(0, BytesOf(header))) return Compacted::Failed;
   std::vector<uint8_t> bytes(kDatabaseRecordSize);
   for (int32_t i = 0; i < count; ++i) {

@@ -11,7 +11,7 @@ namespace {
 
 constexpr int32_t kHalfSide = kSmallThumbnailSide / 2;
 
-// Each of the three terms is rounded down by itself.
+// Rounds down each of the three terms.
 void TurnGray(PackedImage& bitmap) {
   for (int32_t r = 0; r < bitmap.Height(); ++r) {
     uint8_t* pixel = bitmap.StoredRow(r).data();
@@ -21,8 +21,8 @@ void TurnGray(PackedImage& bitmap) {
   }
 }
 
-// How much of each old pixel, of `from`, a new one of `to` covers, in parts of which an old pixel
-// has `to` and a new one `from`.
+// The overlap of old pixels (`from` per side) with new ones (`to` per side), in units in which an
+// old pixel is `to` and a new one `from` wide.
 struct Covered {
   int32_t first, count;
   int32_t Weight(int32_t old, int32_t to, int32_t from, int32_t made) const {
@@ -34,7 +34,7 @@ Covered CoveredBy(int32_t made, int32_t from, int32_t to) {
   return {first, last - first + 1};
 }
 
-// Stretches a square bitmap: each new pixel is the mean of the area that it covers.
+// Scales a square bitmap; each new pixel is the mean of the area it covers.
 Status Stretch(const PackedImage& bitmap, int32_t side, PackedImage& stretched) {
   const int32_t from = bitmap.Width();
   RETURN_IF_BAD(NewPackedImage(side, side, nullptr, 24, stretched));
@@ -96,8 +96,8 @@ bool IsMatte(const PackedImage& bitmap, int32_t x, int32_t y, Color matte) {
          pixel[1] == static_cast<uint8_t>(matte >> 8) && pixel[2] == static_cast<uint8_t>(matte);
 }
 
-// Rows above and below, or columns at both sides, that are all matte. The two sides of a margin
-// differ by one pixel at most, since the picture is in the middle.
+// Number of matte rows on both the top and bottom, or of columns on both sides. They differ by at
+// most one, as pictures are centered.
 template <typename IsMatteAt>
 int32_t EvenMargin(int32_t side, IsMatteAt isMatteAt) {
   for (int32_t margin = 0; 2 * (margin + 1) < side; ++margin) {
@@ -108,7 +108,7 @@ int32_t EvenMargin(int32_t side, IsMatteAt isMatteAt) {
   return (side - 1) / 2;
 }
 
-// Of the square as it is drawn. What an enlarged or reduced pixel has of the matte goes too.
+// The margin after scaling. Pixels that are partly matte belong to the margin.
 int32_t DrawnMargin(int32_t margin, int32_t side, int32_t drawn) {
   return std::min((margin * drawn + side - 1) / side, (drawn - 1) / 2);
 }

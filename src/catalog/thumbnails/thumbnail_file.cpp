@@ -22,8 +22,8 @@ bool WriteRecord(const ThumbnailRecord& record, const std::string& path) {
          file.Commit(platform::Existing::Replace) == platform::CommitResult::Done;
 }
 
-// The bytes of a file that a record can take, the rest zero; how many there were, 0 when it cannot
-// be read.
+// Reads as many bytes as fit in a record, and zeroes the rest; returns their number, 0 if the file
+// cannot be read.
 size_t ReadRecord(const std::string& path, ThumbnailRecord& record) {
   platform::FileView file;
   if (!file.OpenHead(path.c_str(), record.bytes.size())) return 0;
@@ -63,7 +63,7 @@ bool WriteThumbnailFile(ThumbnailRecord& record, const std::string& path, bool h
   if (facts.kind == platform::FileKind::Regular && !facts.link && !platform::SetNormal(path))
     return false;
   if (!WriteRecord(record, path)) return false;
-  if (hidden) (void)platform::SetHidden(path, true);  // seen or not, it is there
+  if (hidden) (void)platform::SetHidden(path, true);  // ignore errors: the file is complete
   return true;
 }
 
@@ -77,7 +77,7 @@ bool WriteThumbnailForPicture(const std::string& picturePath, const PictureRecor
 Status MakeThumbnailOfFile(const std::string& picturePath, const ThumbnailOptions& options,
                            ThumbnailRecord& record, Status* shortfall) {
   PicturePointer picture;
-  // The quick scaler's result depends on the size that it starts from.
+  // The quick scaler's result depends on the source size.
   const int32_t side = options.quick     ? 0
                        : options.onFaces ? kFramingSide
                                          : kSmallThumbnailSide;

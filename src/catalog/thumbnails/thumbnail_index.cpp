@@ -15,7 +15,7 @@ namespace {
 
 constexpr std::string_view kMagic = "FMTDBIX1";
 constexpr size_t kHeadSize = 48, kBlockSize = 512, kCellSize = 8;
-// on an average; what is free ends a search
+// average fill; a free cell ends a search
 constexpr size_t kCellsInBlock = kBlockSize / kCellSize - 1, kCellsUsed = 40;
 constexpr size_t kSmallestTable = 1024;                                        // cells
 constexpr uint64_t kFactor = 0x9E3779B97F4A7C15;
@@ -30,7 +30,7 @@ void PutWord(uint8_t* bytes, uint64_t word) {
   for (int i = 0; i < 8; ++i) bytes[i] = static_cast<uint8_t>(word >> (8 * i));
 }
 
-// Of a whole number of words: two sums side by side.
+// Whole words only; computes two interleaved sums.
 uint64_t ChecksumOf(std::span<const uint8_t> bytes, uint64_t sum) {
   uint64_t other = ~sum;
   for (size_t i = 0; i + 8 <= bytes.size(); i += 8) {
@@ -57,7 +57,7 @@ HeadBytes BytesOf(const ThumbnailIndex::State& state, uint64_t blocks) {
   return bytes;
 }
 
-// False unless these are the bytes of that state.
+// False unless the bytes match this state.
 bool ReadHead(std::span<const uint8_t, kHeadSize> bytes, const ThumbnailIndex::State& state,
               Head& head) {
   head = {WordAt(&bytes[32]), WordAt(&bytes[40])};
@@ -81,8 +81,8 @@ Cell CellAt(const uint8_t* block, size_t place) {
   return {static_cast<uint32_t>(word), static_cast<uint32_t>(word >> 32)};
 }
 
-// Whether a name may be taken for an index: there is an older one, or nothing yet. The file is then
-// open.
+// Opens the file of an index for writing: an existing index, or a new file. False if the name is
+// taken by another file.
 bool OpenForSaving(const std::string& path, platform::StoreFile& file) {
   using platform::StoreFile;
   const StoreFile::OpenResult result = file.Open(path, StoreFile::Mode::ReadWrite);
@@ -121,8 +121,8 @@ void ThumbnailIndex::Change(size_t record, uint32_t hash) {
     hashes_[record] = 0;
     return;
   }
-  // A record in the middle gets another name, as good as never: only all over again, each hash has
-  // its records in order.
+  // Rare: a record in the middle gets another path. Rebuild the table, so that records with the
+  // same hash stay in order.
   hashes_[record] = hash;
   MakeTable(hashes_.size());
 }
@@ -133,7 +133,7 @@ void ThumbnailIndex::Insert(size_t record) {
   cells_[cell] = static_cast<uint32_t>(record + 1);
 }
 
-// Takes a record out of the table; those behind it that may come nearer to their homes do.
+// Removes a record from the table and moves later ones closer to their home cells.
 void ThumbnailIndex::Remove(size_t record) {
   size_t hole = Home(hashes_[record]);
   while (cells_[hole] != record + 1) {
@@ -143,7 +143,7 @@ void ThumbnailIndex::Remove(size_t record) {
   const size_t mask = cells_.size() - 1;
   for (size_t cell = Next(hole); cells_[cell] != kFree; cell = Next(cell)) {
     const size_t home = Home(hashes_[cells_[cell] - 1]);
-    if (((cell - home) & mask) < ((cell - hole) & mask)) continue;  // its home is behind the hole
+    if (((cell - home) & mask) < ((cell - hole) & mask)) continue;  // its home is after the hole
     cells_[hole] = cells_[cell];
     hole = cell;
   }
@@ -230,7 +230,7 @@ void ThumbnailIndex::Save(const std::string& path, const State& state) const {
     PutWord(block, BlockChecksum(block, number, head));
   }
   platform::StoreFile file;
-  // In place and unsynced, as what a crash or another process makes of it shows in the checksums.
+  // In place and without sync, as checksums detect damage by crashes or other processes.
   if (OpenForSaving(path, file)) (void)file.WriteAt(0, headBytes, blocks);
 }
 

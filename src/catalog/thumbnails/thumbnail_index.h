@@ -10,14 +10,14 @@
 
 namespace fotomill {
 
-// Finds the records of a thumbnail database by their paths without reading them: a hash of each,
-// and a table of the hashes. It knows too much at times (two paths of one hash) but never too
-// little, so that who looks a record up reads it and compares. Records are numbered as in the
-// database; those that are deleted or hold no thumbnail are in no table.
+// Finds records of a thumbnail database by path without reading them: a hash per record, and a hash
+// table. It may find too many (paths with equal hashes) but never too few, so callers read the
+// records found and compare. Records are numbered as in the database; deleted records and those
+// without thumbnail are not in the table.
 //
-// A large index is between two runs in a file beside the database, little-endian. It is a copy of
-// what the database says: a file that is damaged or belongs to another state of the database counts
-// for nothing, and may be deleted.
+// A large index is stored between runs in a file beside the database, little-endian. It contains no
+// additional data: a file that is damaged or belongs to another state of the database is ignored,
+// and can be deleted.
 //
 //   offset size      field
 //        0    8      magic "FMTDBIX1"
@@ -26,34 +26,34 @@ namespace fotomill {
 //       24    8      its modification time, nanoseconds since 1970
 //       32    8      count of blocks
 //       40    8      checksum of the fields before
-//       48  512 x n  blocks: a checksum of this block and the one above, 8 bytes, and 63 cells:
-//       hash of a record, and
-//                    record + 1, or 0, 0; in order of records, from the block hash x n / 2^32 on
+//       48  512 x n  blocks: an 8-byte checksum of the block, seeded with the one above, and 63
+//                    cells: hash of a record, and record + 1, or 0, 0; ordered by record,
+//                    starting in block hash x n / 2^32
 //
-// So a single record is found by reading one block, and blocks of two different states are never
-// taken for one file.
+// So a record is found by reading a single block, and blocks of different states are never
+// mixed.
 class ThumbnailIndex {
  public:
-  // The state of a database file that an index belongs to.
+  // The state of a database file for which an index was made.
   struct State {
-    int64_t count = -1;  // -1: of none
+    int64_t count = -1;  // -1: none
     uint64_t size = 0;
     int64_t modified = 0;
     bool operator==(const State&) const = default;
   };
 
-  // Paths that differ in their extension only have the same hash, which is never 0.
+  // Paths that differ only in their extension have the same hash, which is never 0.
   static uint32_t HashOf(std::string_view path);
 
-  // Forgets all records, and how many there are, those that cannot be found included.
+  // Removes all records.
   void Clear();
-  size_t Count() const { return hashes_.size(); }  // those that cannot be found included
-  // Takes in the next record: its hash, or 0 for one that cannot be found.
+  size_t Count() const { return hashes_.size(); }  // including those that cannot be found
+  // Adds the next record: its hash, or 0 if it cannot be found.
   void Append(uint32_t hash);
-  // Gives a record another hash; 0 takes it out.
+  // Changes the hash of a record; 0 removes it from the table.
   void Change(size_t record, uint32_t hash);
 
-  // Calls `take` with each record of a hash, in order, until it answers true; whether it did.
+  // Calls `take` with each record of this hash, in order, until it returns true; whether it did.
   template <typename Take>
   bool Find(uint32_t hash, Take take) const {
     for (size_t cell = Home(hash); !cells_.empty() && cells_[cell] != kFree; cell = Next(cell)) {
@@ -63,14 +63,14 @@ class ThumbnailIndex {
     return false;
   }
 
-  // Finds like Find, without loading, in a file; nullopt unless what was read of it is whole and of
-  // that state.
+  // As Find, but directly in a file, without loading it; nullopt if the part read is damaged or
+  // belongs to another state.
   static std::optional<bool> FindInFile(const std::string& path, const State& state, uint32_t hash,
                                         const std::function<bool(size_t record)>& take);
-  // Fills the index from a file. False, with the index empty, unless the file is whole and of that
-  // state.
+  // Loads the index from a file. False, with the index empty, if the file is damaged or belongs to
+  // another state.
   bool Load(const std::string& path, const State& state);
-  // Writes the file, over an older index only. Silent when that fails, as nothing is lost.
+  // Writes the file, replacing only an older index. Errors are ignored, as nothing is lost.
   void Save(const std::string& path, const State& state) const;
 
  private:
@@ -84,9 +84,9 @@ class ThumbnailIndex {
   void Remove(size_t record);
   void MakeTable(size_t records);
 
-  std::vector<uint32_t> hashes_;  // of every record
-  // Record + 1 in the first free cell from its hash's home on, so that records of one hash are met
-  // in order; kFree ends the search. A power of two of them, at most half in use.
+  std::vector<uint32_t> hashes_;  // of all records
+  // Record + 1 in the first free cell from its hash's home, so records with the same hash are found
+  // in order; kFree ends a search. Size is a power of two, at most half used.
   std::vector<uint32_t> cells_;
   int shift_ = 63;
 };

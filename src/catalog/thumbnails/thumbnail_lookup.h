@@ -11,31 +11,31 @@ namespace fotomill {
 class ListedThumbnails;
 class ThumbnailStore;
 
-// The picture whose thumbnail is wanted.
+// The picture whose thumbnail to find.
 struct ThumbnailQuery {
   std::string path;
-  int64_t modified = 0;  // seconds since 1970 UTC; with a size of 0 as well, not known
+  int64_t modified = 0;  // seconds since 1970 UTC; unknown if `size` is 0 as well
   uint64_t size = 0;     // bytes
   bool large = false;    // for a large view
 };
 
-// Where a browser's thumbnails may come from.
+// Where to look for a browser's thumbnails.
 struct ThumbnailSources {
   choice::ThumbnailMode mode = choice::kDiskBased;
-  bool systemCache = true;  // the browser lets large records come from the system
-  ListedThumbnails* listed = nullptr;   // of the virtual mode, or none
-  ThumbnailStore* databases = nullptr;  // of the two database modes, or none
+  bool systemCache = true;  // large records may come from the system's cache
+  ListedThumbnails* listed = nullptr;   // for the virtual mode; may be null
+  ThumbnailStore* databases = nullptr;  // for the two database modes; may be null
   ThumbnailOptions options = {};
 };
 
-// The database of a picture's browser in the two database modes; empty in the others, and where
-// there is no data folder.
+// The database for a picture in the two database modes; empty in other modes, or without a data
+// folder.
 std::string DatabaseForMode(choice::ThumbnailMode mode, const std::string& picturePath);
 
-// Fills a record with the thumbnail of a picture as the mode says: thumbnail file, list, database
-// or, for a large view in the disk-based mode, the system's cache. Large records come from that
-// cache only. Whatever is older than the picture, or was made of other contents, is passed over.
-// False if there is no thumbnail.
+// Finds the thumbnail of a picture according to the mode: in the thumbnail file, list, database or,
+// for a large view in the disk-based mode, the system's cache. Large records only come from that
+// cache. Thumbnails older than the picture, or of other contents, are ignored. False if there is
+// none.
 bool LookUpThumbnail(const ThumbnailQuery& picture, const ThumbnailSources& sources,
                      AnyThumbnailRecord& record);
 

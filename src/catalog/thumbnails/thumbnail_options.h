@@ -9,21 +9,21 @@
 
 namespace fotomill {
 
-// How thumbnails are made, kept and shown.
+// How thumbnails are created, stored and shown.
 struct ThumbnailOptions {
-  bool quick = false;       // records are scaled by the quick scaler
-  Color matte = 0xCCCCCC;   // around pictures and behind their alpha
-  bool hidden = true;       // thumbnail files and databases are hidden
-  bool fromFiles = true;    // thumbnail files serve in the database and virtual modes as well
-  bool fromSystem = true;   // large ones may come from the system's own thumbnails
-  bool keep = true;         // what was made for a browser goes into its database
-  bool fastZoom = false;    // small records are enlarged by spreading their pixels
-  int32_t zoomFilter = choice::kBicubic;  // else by this choice::ResampleFilter
-  bool onFaces = false;        // stored ones show the largest face
-  bool onFacesUnkept = false;  // so do those that are made for a browser and not stored
-  bool onAllFaces = false;     // all faces instead of the largest
+  bool quick = false;       // use the quick scaler
+  Color matte = 0xCCCCCC;   // around pictures and behind transparency
+  bool hidden = true;       // hide thumbnail files and databases
+  bool fromFiles = true;    // use thumbnail files in the database and virtual modes as well
+  bool fromSystem = true;   // use the system's thumbnails for large ones
+  bool keep = true;         // store thumbnails made for a browser in its database
+  bool fastZoom = false;    // enlarge small records by repeating pixels
+  int32_t zoomFilter = choice::kBicubic;  // else this choice::ResampleFilter
+  bool onFaces = false;        // crop stored ones to the largest face
+  bool onFacesUnkept = false;  // also crop those made for a browser and not stored
+  bool onAllFaces = false;     // crop to all faces instead of the largest
   FaceOptions faces = {};
-  ReadOptions read = {};                  // how the pictures are decoded
+  ReadOptions read = {};                  // for decoding the pictures
 
   bool operator==(const ThumbnailOptions&) const = default;
 };

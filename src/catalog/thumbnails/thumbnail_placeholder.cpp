@@ -10,11 +10,10 @@ namespace fotomill {
 namespace {
 
 struct Point {
-  float x, y;  // pixels from the left and the top
+  float x, y;  // pixels from the left and top
 };
 
-// One flat color inside an outline. An outline of two points is a circle: its middle, and a point
-// on it.
+// An outline filled with a color. Two points are a circle: its center, and a point on it.
 struct Shape {
   uint32_t color;  // 0x00RRGGBB
   std::span<const Point> outline;
@@ -29,7 +28,7 @@ constexpr Point kFrameEdge[] = {{11, 19}, {85, 19}, {85, 77}, {11, 77}},
 constexpr Shape kPhotograph[] = {{0x969696, kFrameEdge}, {0xFAFAFA, kFrame},   {0xBCD7EA, kSky},
                                  {0xF6D873, kSun},       {0x86AB86, kFarHill}, {0x5D8761, kNearHill}};
 
-// A sheet of paper with a corner turned down, crossed out.
+// A crossed-out sheet of paper with a folded corner.
 constexpr Point kSheetEdge[] = {{21, 9}, {61.5F, 9}, {76, 23.5F}, {76, 87}, {21, 87}},
                 kSheet[] = {{22, 10}, {61, 10}, {75, 24}, {75, 86}, {22, 86}},
                 kCorner[] = {{61, 10}, {75, 24}, {61, 24}},
@@ -53,7 +52,7 @@ bool IsInside(std::span<const Point> outline, Point point) {
   return inside;
 }
 
-// How many of the 16 samples of a pixel lie inside.
+// How many of the 16 samples of a pixel are inside.
 int32_t Coverage(std::span<const Point> outline, int32_t x, int32_t y) {
   int32_t count = 0;
   for (int32_t i = 0; i < 16; ++i) {

@@ -12,7 +12,7 @@ namespace fotomill {
 
 namespace {
 
-// How a pixel and what is behind it are mixed.
+// Blends a pixel with the background.
 using Mix = uint8_t (*)(uint8_t background, uint8_t pixel, uint8_t alpha);
 
 uint8_t MixEachRoundedDown(uint8_t background, uint8_t pixel, uint8_t alpha) {
@@ -23,7 +23,7 @@ struct ScaledPicture {
   PackedImage image, alpha;
 };
 
-// Both edges by the one percentage at which the longer one fits.
+// Scales both edges by the percentage at which the longer one fits.
 Status ScaleQuickly(const PictureRecord& picture, ScaledPicture& scaled) {
   const int32_t width = picture.image.Width(), height = picture.image.Height();
   const int32_t percentage =
@@ -99,7 +99,7 @@ const Palette& ThumbnailPalette() {
 void ExpandOldRecord(ThumbnailRecord& record) {
   const Palette& palette = ThumbnailPalette();
   uint8_t* const pixels = record.bytes.data() + kThumbnailHeaderSize;
-  // From the last one on, as each pixel takes the room of later indices.
+  // Backward, as each pixel overwrites later indices.
   for (size_t i = kSmallThumbnailSide * kSmallThumbnailSide; i-- > 0;) {
     const uint8_t* const color = &palette[size_t{3} * pixels[i]];
     pixels[3 * i] = color[2];

@@ -10,25 +10,25 @@
 
 namespace fotomill {
 
-// The thumbnail databases as the program works with them, from any thread. The one that was asked
-// last stays open, since its index is what makes a search quick; new records are gathered, since
-// every append waits for the disk. A database that cannot be read or written costs thumbnails no
-// more than being made again, so nothing here fails.
+// Thread-safe access to the thumbnail databases of the program. The last one used stays open,
+// since its index makes lookups fast; new records are collected, since every append waits for the
+// disk. No errors are reported: if a database cannot be read or written, thumbnails are just made
+// again.
 class ThumbnailStore {
  public:
-  // As ThumbnailDatabase::Find, for a path on its own volume; false without such a database.
+  // As ThumbnailDatabase::Find, for a path on its current volume; false without a database.
   bool Find(const std::string& database, const std::string& path, const PictureStamp& stamp,
             ThumbnailRecord& thumbnail);
-  // Takes over a record for a database, which is made if it is missing, and hidden with `hidden`.
-  // Earlier records of the same path and volume are then marked deleted.
+  // Adds a record to a database, which is created if missing, and hidden with `hidden`. Earlier
+  // records of the same path and volume are marked as deleted.
   void Add(const std::string& database, DatabaseRecord record, bool hidden);
-  // Appends the records that were gathered.
+  // Appends the collected records.
   void Flush();
-  // Marks the records of these paths deleted, and all those below these folders, in a database that
-  // exists. True if there was nothing to mark or it was done.
+  // Marks the records of these paths, and of all files below these folders, as deleted in an
+  // existing database. True on success, or if there was nothing to mark.
   bool Delete(const std::string& database, std::span<const std::string> paths,
               std::span<const std::string> folders);
-  // Closes what is open; what was gathered is appended.
+  // Closes the open database after appending collected records.
   void Close();
 
  private:
@@ -45,7 +45,7 @@ class ThumbnailStore {
   std::vector<DatabaseRecord> new_;  // for newPath_
 };
 
-// The one of this program.
+// The store of this program.
 ThumbnailStore& SharedThumbnailStore();
 
 }  // namespace fotomill

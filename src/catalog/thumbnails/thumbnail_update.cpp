@@ -39,7 +39,7 @@ bool HasThumbnailFile(const std::string& path) {
   return platform::FileExists(ThumbnailPathFor(path));
 }
 
-// Records of the pictures that have no thumbnail file. False when it was given up.
+// Creates records for pictures without a thumbnail file. False if canceled.
 bool MakeRecordsInMemory(const ThumbnailBrowser& browser, ThumbnailUpdateFace& face) {
   for (size_t i = 0; i < browser.files.size(); ++i) {
     const std::string& file = browser.files[i];
@@ -53,7 +53,7 @@ bool MakeRecordsInMemory(const ThumbnailBrowser& browser, ThumbnailUpdateFace& f
   return true;
 }
 
-// The files of the list without a thumbnail file. False when it was given up.
+// Finds the files without a thumbnail file. False if canceled.
 bool FindMissing(const ThumbnailBrowser& browser, ThumbnailUpdateFace& face,
                  std::vector<std::string>& missing) {
   const std::string text = Tr("Scanning %1", browser.folder);
@@ -82,7 +82,7 @@ void ApplyChoice(int32_t choice, const std::vector<std::string>& missing, Thumbn
       if (face.BuildThumbnails(missing) > 0) face.Refresh();
       break;
     case kUpdateLater: Keep(choice, browser, face); break;
-    // what is stored stays, as this was said of one browser only
+    // applies to this browser only, so the stored setting is kept
     case kUpdateNotHere: browser.asks = false; break;
     case kUpdateNever:
       browser.options.offers = false;
