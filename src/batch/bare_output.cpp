@@ -11,7 +11,7 @@ namespace fotomill {
 
 namespace {
 
-// Turns a JPEG file first; `turned` stays empty if that cannot be done without loss.
+// Turns a JPEG file losslessly; `turned` is empty if that is not possible.
 Status TurnUprightWithoutLoss(std::span<const uint8_t> file, std::vector<uint8_t>& turned) {
   JpegTurnResult result;
   RETURN_IF_BAD(MakeTurnedJpeg(file, {}, turned, result));
@@ -24,7 +24,7 @@ Status TurnUprightWithoutLoss(std::span<const uint8_t> file, std::vector<uint8_t
 BareOutput MakeBareOutput(const PictureRecord& picture, bool upright) {
   const FormatEntry& row = FormatRow(picture.formatIndex);
   const bool turns = upright && OrientationOf(picture) != Orientation::Upright;
-  // A picture of which more would be lost keeps its tag.
+  // Keep the orientation tag if re-encoding would lose more.
   const bool keepsTag = row.bareKeepsOrientation && (picture.simplified || picture.pageCount > 1);
   BareOutput output;
   if (row.bare == nullptr || (turns && !row.turnsWithoutLoss && !keepsTag)) return output;

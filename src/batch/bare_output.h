@@ -9,16 +9,16 @@
 
 namespace fotomill {
 
-// An output that is its source without metadata: the compressed pixels are copied.
+// An output that is its source without metadata, with the compressed pixels copied.
 struct BareOutput {
-  std::vector<uint8_t> file;  // empty: the picture has to be encoded
-  RecordedText note = {};     // why it has to be, if that is a surprise
-  bool asSource = false;      // and then with the quality of its source
+  std::vector<uint8_t> file;  // empty: the picture must be encoded
+  RecordedText note = {};     // the reason for that, if it needs explaining
+  bool asSource = false;      // encode with the quality of the source
 };
 
-// Makes the file for a picture that was read from `picture.fileName` and not changed since, if the
-// format can. `upright`: the picture is to be turned by its EXIF orientation, which happens without
-// loss or not here.
+// Makes the file for an unmodified picture read from `picture.fileName`, if the format
+// supports it. `upright`: turn the picture by EXIF orientation, but only if that is
+// lossless.
 BareOutput MakeBareOutput(const PictureRecord& picture, bool upright);
 
 }  // namespace fotomill

@@ -21,13 +21,13 @@ constexpr const char* kTooLong = TrLater("The path would be longer than 260 char
 
 bool FitsPath(const std::string& path) { return path.size() <= PathText::Capacity(); }
 
-// `path` with another base name.
+// Replaces the base name of `path`.
 std::string WithBase(const std::string& path, std::string_view base) {
   const platform::PathParts parts = platform::SplitPath(path);
   return platform::JoinPath({parts.drive, parts.folder, base, parts.extension});
 }
 
-// Whether a path leads up on its way.
+// Whether a path contains "..".
 bool LeadsUp(std::string_view path) {
   while (!path.empty()) {
     const size_t end = std::min(path.find_first_of("/\\"), path.size());
@@ -39,8 +39,8 @@ bool LeadsUp(std::string_view path) {
 
 bool IsFileName(std::string_view name) { return !name.empty() && name != "." && IsPlainName(name); }
 
-// Asks until the name can be used or the user gives up. The extension stays the format's, cased
-// after the source's.
+// Asks until the name is valid or the user cancels. The extension is that of the format, cased like
+// the source's.
 bool AskName(Destination& destination, const std::string& source, std::string_view title,
              BatchJob& job) {
   const std::string_view format = destination.extension.empty()
@@ -70,7 +70,7 @@ bool AskName(Destination& destination, const std::string& source, std::string_vi
   }
 }
 
-// The check boxes that are settings are kept as the user left them.
+// Saves the check boxes that are settings.
 void StoreChecks(const OverwriteChecks& old, const OverwriteChecks& now, BatchJob& job) {
   const struct {
     Remembered what;
@@ -97,7 +97,7 @@ DestinationAnswer KeepBoth(Destination& destination, const VariantMaker& variant
                                                     : DestinationAnswer::Skip;
 }
 
-// Whether the destination's name is taken; where that cannot be known, the file has no name.
+// Whether the destination exists. If that cannot be determined, no name is chosen.
 bool IsTaken(Destination& destination, const TakenTest& taken) {
   const platform::Existence existence = taken(destination.path);
   if (existence == platform::Existence::Unknown) destination.search = VariantSearch::Unknown;
@@ -251,8 +251,8 @@ bool AsksAboutCollisions(const BatchJob& job) {
   return job.overwrite.prompt && !job.overwrite.skip && !job.applyToRest && job.prompts != nullptr;
 }
 
-// A prompt that is not shown counts as answered with OK; where nobody could have seen it, nothing
-// may be lost.
+// A suppressed prompt counts as answered with OK; if prompting is not possible, no file may be
+// lost.
 DestinationAnswer SettleUnasked(Destination& destination, const OverwritePolicy& policy,
                                 bool applyToRest, const VariantMaker& variant) {
   if (policy.skip) return DestinationAnswer::Skip;

@@ -15,43 +15,43 @@
 
 namespace fotomill {
 
-// The extension of an output, without its dot: the format's own in lower case, then cased letter by
-// letter after the source's extension as `style` says: 0 like the letter in its place, 1 upper, 2
-// lower. Letters beyond the source's extension, and places where either has no letter, stay as they
-// are.
+// The extension of an output, without dot: the format's extension in lowercase, with letters
+// cased by `style`: 0 like the letter at that position in the source's extension, 1 upper, 2
+// lower. Positions beyond the source's extension, or where either has no letter, are not
+// changed.
 std::string CasedExtension(std::string_view formatExtension, std::string_view sourceExtension,
                            int32_t style);
 
-// Asks before anything is written: whether to write files of this format, and whether to create a
-// missing destination folder (if the outputs go `intoFolder`). False if the user declines.
+// Asks before writing anything: whether to write files of this format, and whether to create a
+// missing destination folder (with `intoFolder`). False if the user declines.
 bool IsDestinationWanted(const BatchJob& job, bool intoFolder);
 
-// The extension of the job's outputs, as the format spells it.
+// The extension of the job's outputs, as spelled by the format.
 std::string_view ExtensionOfFormat(const BatchJob& job);
 
-// The planned path of a source's output, free or not: the job's destination folder and `below` (or
-// the source's folder, if there is none or the rules say so), prefix, base name, dot and extension.
+// The planned path of a source's output, which may exist: the job's destination folder and `below`
+// (or the source's folder, if there is none or the rules say so), prefix, base name and extension.
 std::string PlannedDestination(const std::string& source, std::string_view below,
                                std::string_view prefix, const BatchJob& job);
 
-// The same for one of several outputs of a source.
+// Name of one of several outputs of a source.
 struct OutputPlace {
-  std::string_view extension;  // as the format has it
-  // folder beneath the job's destination folder, or beneath the source's where it has none
+  std::string_view extension;  // as spelled by the format
+  // folder relative to the job's destination folder, or to the source's if there is none
   std::string_view below;
-  std::string_view subfolder;  // and beneath that one
+  std::string_view subfolder;  // relative to that
   std::string_view base;       // name without extension
 };
 // As above, for one of several outputs.
 std::string PlannedDestination(const std::string& source, const OutputPlace& place,
                                const BatchJob& job);
 
-// A destination without drive and folder, put into the job's destination folder; others stay.
-// nullopt when that gives 261 characters or more.
+// Adds the job's destination folder to a destination without drive and folder. nullopt if the
+// result has more than 260 characters.
 std::optional<std::string> CompletedDestination(const std::string& destination,
                                                 std::string_view folder);
 
-// The decision about an output's name.
+// The decision on an output's name.
 struct Destination {
   std::string path = {};
   bool replace = false;    // a file of that name is to be replaced
@@ -66,28 +66,28 @@ struct Destination {
   std::string extension = {};       // of the output, as the format has it; empty: the job's
 };
 
-// The "path" of outputs that go to the clipboard, and the hint of a file for which no numbered
-// variant was free.
+// The "path" of outputs to the clipboard, and the hint for a file for which no numbered variant was
+// free.
 inline constexpr std::string_view kClipboardName = "Clipboard";
 inline constexpr std::string_view kWriteAborted =
     TrLater("Unable to create a new file - write aborted.");
 
-// Whether an output is written under its settled name, or its file is left out.
+// Whether to write an output under its settled name, or skip its file.
 enum class DestinationAnswer : int32_t { Write = 1, Skip = 2 };
 
-// Decides the name of an output, whose planned path is in `destination`: asks for it if the
+// Chooses the name of an output, whose planned path is in `destination`: asks for it if the
 // settings say so, and what to do if the file exists. `title` says what the name is for, `picture`
-// is the new picture for previews; both are optional. `variant` makes numbered variants.
+// is the new picture for previews; both are optional. `variant` creates numbered variants.
 using VariantMaker = std::function<VariantSearch(std::string& path)>;
-// Settles `destination` in place; Skip leaves its file out.
+// Updates `destination` in place; Skip: do not write the file.
 DestinationAnswer MakeDestinationName(Destination& destination, const std::string& source,
                                       std::string_view title, BatchJob& job, const TakenTest& taken,
                                       const VariantMaker& variant,
                                       const PictureRecord* picture = nullptr);
 
-// Records in an outcome why its file has no name: skipped with ErrorCreatingFile if all variants
-// are taken, which counts as a write abort; otherwise failed with InvalidDestination (the search
-// was given up) or ErrorCreatingFile (the system cannot tell).
+// Records in an outcome why there is no name: skipped with ErrorCreatingFile if all variants are
+// taken, which counts as a write abort; otherwise failed with InvalidDestination (search given up)
+// or ErrorCreatingFile (existence cannot be determined).
 void SayNoName(const Destination& destination, FileOutcome& outcome);
 
 // Says why an output is numbered: the path was free, but another file of the run has it.
@@ -99,7 +99,7 @@ void NoteLostAttributes(FileOutcome& outcome);
 
 // Whether the user is asked about existing files.
 bool AsksAboutCollisions(const BatchJob& job);
-// The decision about an existing file without asking.
+// The decision on an existing file without asking.
 DestinationAnswer SettleUnasked(Destination& destination, const OverwritePolicy& policy,
                                 bool applyToRest, const VariantMaker& variant);
 

@@ -10,8 +10,8 @@
 
 namespace fotomill {
 
-// What a window does around an external program. Faces implement it; the calls come from the
-// calling thread.
+// Callbacks of a window while an external program runs, on the calling
+// thread.
 class ExternalProgramHost {
  public:
   virtual ~ExternalProgramHost() = default;
@@ -24,10 +24,10 @@ class ExternalProgramHost {
   virtual void TakeFocus() {}            // redraws itself and takes the focus back
 };
 
-// Flag: does not wait for the program to end.
+// Flag: do not wait for the program to exit.
 inline constexpr uint32_t kDoNotWait = 0x20000;
 
-// The message when no program is registered for a file, or it cannot be started.
+// Shown if no program is registered for a file, or it cannot be started.
 inline constexpr std::string_view kNoExternalProgram = TrLater(
     "The external player for the file type you selected cannot be found. Please consult the "
     "Fotomill Formats document "

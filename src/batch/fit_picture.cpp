@@ -13,7 +13,7 @@ namespace fotomill {
 
 namespace {
 
-// Whether the palette is the usual one of grays; files with another one may count as colored.
+// Whether the palette is a standard gray ramp; readers may treat files with another one as color.
 bool IsRamp(const PictureRecord& picture) {
   const Palette ramp = GrayLevels(picture.image.Bits());
   return std::equal(ramp.begin(), ramp.begin() + 3 * picture.image.Colors(),
@@ -24,8 +24,8 @@ bool IsGray(const PictureRecord& picture) {
   return HasOnlyGrays(picture.palette, picture.image.Colors());
 }
 
-// Gray pixels need a profile of grays, others one of RGB; gray ones with alpha may be stored as
-// RGB. Inks have no profile of their own any more when they are RGB pixels here.
+// Gray pixels need a gray profile, others an RGB one; gray ones with alpha may be stored as RGB.
+// CMYK profiles no longer apply, as pixels have been converted to RGB.
 bool SuitsPixels(const PictureRecord& picture, const FormatEntry& row) {
   const ProfileColors colors = ColorsOfProfile(picture.metadata.icc);
   if (!IsGray(picture)) return colors == ProfileColors::Rgb;
@@ -33,7 +33,7 @@ bool SuitsPixels(const PictureRecord& picture, const FormatEntry& row) {
          (row.keepsMetadata & kLostGrayIcc) != 0 && IsRamp(picture);
 }
 
-// Brings the colors from the picture's profile to another one; empty: sRGB.
+// Converts colors from the picture's profile to another one; empty: sRGB.
 Status ConvertColors(PictureRecord& picture, std::span<const uint8_t> target) {
   const ColorTransform transform(picture.metadata.icc, target);
   if (!transform.ChangesColors()) return Status::Ok;
@@ -47,7 +47,7 @@ Status ConvertColors(PictureRecord& picture, std::span<const uint8_t> target) {
 
 Status FitOrientation(PictureRecord& picture, bool keepsTag) {
   if (keepsTag || OrientationOf(picture) == Orientation::Upright) return Status::Ok;
-  // the old and the turned picture are there at a time
+  // both the old and the turned picture are in memory
   RETURN_IF_BAD(CheckFileMemory(2 * (picture.image.Bytes().size() + picture.alpha.Bytes().size())));
   return TurnUpright(picture);
 }

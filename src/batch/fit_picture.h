@@ -11,32 +11,32 @@
 
 namespace fotomill {
 
-// What becomes of a picture's color profile.
+// How to handle a picture's color profile.
 struct ProfileRequest {
   enum class Use {
-    Keep,   // goes along; if the format has no place for it, the colors become sRGB
-    Srgb,   // the colors become sRGB, without a profile
-    Given,  // the colors become those of `profile`, which goes along
+    Keep,   // copy it; convert to sRGB if the format does not support it
+    Srgb,   // convert to sRGB, without a profile
+    Given,  // convert to `profile` and store that
   };
   Use use = Use::Keep;
-  // An ICC profile of RGB colors; only for Given.
+  // An RGB ICC profile; only for Given.
   std::shared_ptr<const std::vector<uint8_t>> profile = {};
 };
 
-// How a picture is to look in a file that may not hold what it says about itself.
+// Options for fitting a picture to a format.
 struct FitRequest {
-  bool keepsMetadata = true;     // EXIF goes along where the format can hold it
-  bool turnsUpright = true;      // pixels are turned where the orientation tag gets lost
+  bool keepsMetadata = true;  // copy EXIF if the format supports it
+  bool turnsUpright = true;   // turn the pixels if the orientation tag gets lost
   ProfileRequest profile = {};
 };
 
-// Whether a file of this format carries a profile.
+// Whether files of this format can have a profile.
 bool HoldsProfile(const FormatEntry& row);
 
-// Makes a picture look the same in a file of the format: if the EXIF orientation cannot go along,
-// the pixels are turned; if the color profile cannot, or does not suit the pixels, the colors
-// become sRGB. UnsuitableImage (13) if a profile is given that the format cannot hold, with the
-// reason in `hint`; MemoryAllocationError (6) leaves the picture whole.
+// Makes a picture look the same in a file of the format: turns the pixels if the EXIF orientation
+// cannot be stored; converts colors to sRGB if the color profile cannot be stored or does not match
+// the pixels. UnsuitableImage (13), with the reason in `hint`, if a profile is given but not
+// supported by the format; MemoryAllocationError (6) leaves the picture valid.
 Status FitPicture(PictureRecord& picture, const FormatEntry& row, const FitRequest& request,
                   std::string& hint);
 

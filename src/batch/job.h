@@ -24,13 +24,13 @@ namespace fotomill {
 
 class Prompts;
 
-// What happens to an output whose name is taken. Answers of the overwrite prompt change it.
+// What to do if an output exists. Answers to the overwrite prompt change it.
 struct OverwritePolicy {
-  bool prompt = true;    // ask; without it the file that is there is replaced
-  bool keepBoth = true;  // the answer to prompts that cannot be shown: a numbered variant
-  bool recycle = false;  // a file that is replaced goes to the recycle bin
-  bool previews = true;  // in the prompt
-  bool skip = false;     // leave out the file, without a question
+  bool prompt = true;    // ask; false: replace
+  bool keepBoth = true;  // answer to prompts that cannot be shown: numbered variant
+  bool recycle = false;  // move replaced files to the trash
+  bool previews = true;  // show them in the prompt
+  bool skip = false;     // skip the file without asking
 };
 
 // The functions that put something in front of the names of their outputs: the Prefix keys.
@@ -56,7 +56,7 @@ struct NamingOptions {
   bool skipNames = false;     // files whose name would be asked are left out: the user said so
   bool beside = false;        // DestForceSourceDir: every output is beside its source
   bool askPassword = false;   // PasswordProtect
-  // WarnDestinationWrite: the format is asked about before anything is written
+  // WarnDestinationWrite: ask about the format before writing anything
   bool confirmFormat = true;
   int32_t firstVariant = 1, lastVariant = INT32_MAX;
   // What they put there, by number of the function; blanks belong to it.
@@ -70,8 +70,8 @@ struct NamingOptions {
   std::string_view PrefixOf(FileFunction function) const;
 };
 
-// What holds for later jobs as well once the user has changed it during one: the check boxes of the
-// overwrite prompt, 0 or 1, and the number that the next sequential rename begins with.
+// Values that users can change during a job and that apply to later jobs as well: the check boxes
+// of the overwrite prompt, 0 or 1, and the first number of the next sequential rename.
 enum class Remembered {
   PromptBeforeOverwrite,
   OverwriteKeepBoth,
@@ -80,74 +80,74 @@ enum class Remembered {
   NextRenameNumber
 };
 
-// How far a sequential rename has counted.
+// The progress of a sequential rename.
 struct SequentialRenameState {
-  uint32_t number = 1;  // of the next try
+  uint32_t number = 1;  // to try next
   int32_t digits = 4;
   PathText baseName;
 };
 
 // The state of a running function: its request and its results. NewBatchJob creates jobs with the
-// user's settings; a plain job has the built-in defaults, adds no prefixes, and stores nothing.
-// Belongs to the thread that runs the batch.
+// user's settings; a default job has built-in defaults, no prefixes, and saves nothing. Belongs to
+// the thread that runs the batch.
 struct BatchJob {
-  // Abort: set by the button of the job's own progress box, or by its owner. Functions ask its
-  // token between files and codecs between rows; what is in work is given up or finished, nothing
-  // new is begun. Whoever asks the program to end stops every job.
+  // Abort: set by the button of the job's progress box, or by its owner. Functions poll its token
+  // between files, codecs between rows; current work is canceled or finished, no new work is
+  // started. A request to exit the program stops all jobs.
   StopSource stop;
-  PathText source;                  // the file in work
+  PathText source;                  // current file
   int32_t formatIndex = kNoFormat;  // of the outputs
-  std::string extension;  // of the outputs, without dot; empty: the format's own. A plug-in
-                          // format's has to be kept, as its row may serve another one meanwhile
+  std::string extension;  // of the outputs, without dot; empty: the format's default. Needed for
+                          // plug-in formats, whose row may be reused for another one meanwhile
   std::string destinationFolder;    // empty: beside the source
-  ProgressBox* box = nullptr;       // or none; not owned
-  Prompts* prompts = nullptr;       // none: no one can be asked; not owned
+  ProgressBox* box = nullptr;       // may be null; not owned
+  Prompts* prompts = nullptr;       // null: prompting is not possible; not owned
   bool errors = false;              // a file failed
-  bool noSummary = false;           // no closing count line
-  // the overwrite prompt is not shown and counts as answered with OK
+  bool noSummary = false;           // omit the closing count line
+  // the overwrite prompt is suppressed and counts as answered with OK
   bool applyToRest = false;
   uint32_t catalogPage = 0;
   SequentialRenameState rename;
-  bool filesChanged = false;  // a file was renamed or written: browsers must refresh
+  bool filesChanged = false;  // a file was renamed or written; browsers must refresh
 
   OverwritePolicy overwrite;
   NamingOptions naming;
   ReadOptions read;      // of sources
   EncodeOptions encode;  // of outputs
-  FaceOptions faces;     // of operations that look for faces
-  ReduceOptions reduction;          // of outputs whose format takes fewer colors
+  FaceOptions faces;     // for operations that detect faces
+  ReduceOptions reduction;  // for outputs whose format supports fewer colors
   ProgressSettings boxSettings;
-  // FileHistoryFunctions: a bit for each function whose files are recorded
+  // FileHistoryFunctions: a bit for each function to record
   uint32_t historyFunctions = ~0u;
-  bool writeComments = false;       // into files of plug-in formats
-  // ExifAdjustOrientation: pictures are turned where their orientation tag gets lost
+  bool writeComments = false;  // to files of plug-in formats
+  // ExifAdjustOrientation: turn pictures if their orientation tag gets lost
   bool turnsUpright = true;
-  // Extensions of formats into whose files every page of a source goes where no page was asked for:
+  // Extensions of formats for which all pages of a source go into one file by default:
   // MultipleImageGIF, IconCompleteStack
   std::vector<std::string_view> everyPage;
-  // Keeps a value permanently. Called on the thread that runs the batch; none: nothing is kept.
+  // Saves a value permanently. Called on the thread that runs the batch; empty: do not save.
   std::function<void(Remembered what, int32_t value)> remember = {};
   ProgressModel progress;
-  uint32_t writeAborts = 0;   // files left out because no numbered variant was free
-  // for the file history, which belongs to the main thread: UpdateFileHistory(job.uses)
+  uint32_t writeAborts = 0;  // files skipped because all numbered variants are taken
+  // for the file history, on the main thread: UpdateFileHistory(job.uses)
   std::vector<FileUse> uses;
-  // files that were written, renamed or replaced; their database records are marked at the end
+  // files written, renamed or replaced, whose database records are to be marked at the end
   std::vector<PictureChange> changes;
 };
 
-// What became of one file.
+// The result for one file.
 struct FileOutcome {
   std::string source = {};
-  // Ok: where its output is, or would be in a dry run. Skipped: the file that is in the way
+  // Ok: path of the output, also in a dry run. Skipped: the existing file
   std::string destination = {};
   Status status = Status::Ok;
-  // a sentence that follows the message; may be empty
+  // a sentence printed after the message; may be empty
   std::string hint = {};
-  bool skipped = false;   // left out by choice or for want of a name; not a failure
-  bool replaced = false;  // the output took the place of a file
-  std::string output = {};  // which of several outputs of its source, by name
-  RecordedText note = {};   // a remark that is not a failure; empty if there is none
-  RecordedText detail = {};  // what was done that the user need not know, as a sentence; or empty
+  bool skipped = false;      // skipped by choice, or because no name was free; not a failure
+  bool replaced = false;     // an existing file was replaced
+  std::string output = {};   // label of the output, if the source has several
+  RecordedText note = {};    // a remark, not a failure; may be empty
+  RecordedText detail = {};  // details for --verbose, a sentence; may be empty
 };
 
 }  // namespace fotomill

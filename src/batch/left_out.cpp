@@ -10,7 +10,7 @@ namespace {
 
 constexpr uint16_t kMakerNote = 0x927C;
 
-// What reading cannot take, by its bit.
+// Data not supported by readers, by bit.
 struct Unread {
   uint8_t bit;
   bool metadata;
@@ -30,7 +30,7 @@ bool HasMakerNote(const PictureRecord& picture) {
                              [](const ExifEntry& entry) { return entry.tag == kMakerNote; });
 }
 
-// A list of names in English and as people read it.
+// A list of names, in English and translated.
 class Names {
  public:
   void Add(const RecordedText& name) {

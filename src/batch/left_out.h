@@ -7,16 +7,16 @@
 
 namespace fotomill {
 
-// What is known about an output beside its record.
+// Facts about an output besides its record.
 struct LeftOutFacts {
-  bool metadataWanted = true;  // what the user had removed is not left out
-  int32_t pages = 0;           // of the source that no output of it has
-  bool frames = false;         // these are frames of an animation
+  bool metadataWanted = true;  // false: metadata was removed on request
+  int32_t pages = 0;           // number of the source's pages without output
+  bool frames = false;         // the pages are animation frames
   bool transparency = false;   // alpha was flattened
 };
 
-// Names what of the source is not in its written output, as a sentence; empty for nothing. The
-// record says what reading and writing could not take.
+// Names what is missing in an output compared to its source, as a sentence; empty for nothing. The
+// record says what reading and writing did not support.
 RecordedText LeftOut(const PictureRecord& picture, const LeftOutFacts& facts);
 
 }  // namespace fotomill

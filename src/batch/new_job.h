@@ -5,19 +5,19 @@
 
 namespace fotomill {
 
-// Where jobs are made, and the only place of the batch that knows the settings. All of this belongs
-// to the main thread.
+// Creates jobs from the settings; the only part of the batch code that accesses them. Main thread
+// only.
 
-// A job with the policies, names and options of the settings in force. It runs with them, whatever
-// is changed until it does, and keeps permanently by StoreRemembered what its user changes on the
-// way.
+// A job with the current policies, names and options. Later changes to the settings do
+// not affect it; changes made by the user during the job are saved with
+// StoreRemembered.
 BatchJob NewBatchJob();
-// The keys of the progress box, as they are in force.
+// The current keys of the progress box.
 ProgressSettings ProgressSettingsFromSettings();
 // The SequentialRename... keys.
 SequentialRenameRules SequentialRenameRulesFromSettings();
 
-// Stores what is remembered under its key. What cannot be written holds for this run at least.
+// Saves a value under its key. If it cannot be written, it applies to this run only.
 void StoreRemembered(Remembered what, int32_t value);
 
 }  // namespace fotomill

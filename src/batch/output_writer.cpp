@@ -28,13 +28,13 @@ namespace fotomill {
 
 namespace {
 
-// What operations return, with the reason if it is known.
+// Passes on the status of operations, setting the reason if known.
 Status Worked(Status status, std::string& hint) {
   if (status != Status::Ok) hint = WorkHint(status);
   return status;
 }
 
-// The best quality whose file is small enough, found by writing temporary files.
+// Finds the best quality that is small enough by writing temporary files.
 Status ChooseQuality(PictureRecord& picture, const OutputTarget& target, WriteOptions& write,
                      std::string& hint) {
   const PathText source = picture.fileName;
@@ -59,7 +59,7 @@ Status ChooseQuality(PictureRecord& picture, const OutputTarget& target, WriteOp
   return status;
 }
 
-// How many pictures of a file that ends early can be had.
+// The number of readable pictures in a truncated file.
 size_t CountReadable(const ReadRequest& request) {
   PageSource source;
   if (source.Open(request) != Status::Ok) return 0;
@@ -108,17 +108,17 @@ Status OutputWriter::Prepare(PreparedOutput& output, std::string& hint) const {
   if (profile && picture.metadata.icc.empty()) {
     if (colors == ProfileColors::Rgb || colors == ProfileColors::Gray) {
       output.detail.Append(TrRecorded("Colors converted to sRGB."));
-    } else {  // of other colors than the pixels, or no profile at all
+    } else {  // the wrong kind of profile, or not a profile
       output.note.Append(
           TrRecorded("Its color profile does not match the picture and was left out."));
     }
   }
-  // frames keep what is transparent where a single picture is flattened
+  // frames keep transparency that is flattened in a single picture
   const uint32_t keeps = target.sequence ? FMT_ALPHA | FMT_TRANSPARENT : FMT_ALPHA;
   output.transparency =
       (row.flags & keeps) == 0 && !picture.alpha.Empty() && !IsOpaque(picture.alpha);
   output.allPages = target.sequence;
-  if (target.sequence) return Status::Ok;  // each page is made ready when it is written
+  if (target.sequence) return Status::Ok;  // pages are prepared when written
   RETURN_IF_BAD(Plan(picture, target, hint));
   const auto deepest = static_cast<int32_t>(row.maxBits);
   return picture.bitsPerPixel <= deepest ? Status::Ok
@@ -132,7 +132,7 @@ bool OutputWriter::TurnsItself() const {
          });
 }
 
-// Whether all that is asked for is a file without metadata in the format of the source.
+// Whether the only change is to remove metadata, keeping the format.
 bool OutputWriter::OnlyDropsMetadata(const PictureRecord& picture,
                                      const OutputTarget& target) const {
   if (function_.keepMetadata || function_.transform || target.output->transform) return false;
@@ -144,7 +144,7 @@ bool OutputWriter::OnlyDropsMetadata(const PictureRecord& picture,
       function_.profile.use == ProfileRequest::Use::Given ||
       (function_.profile.use == ProfileRequest::Use::Srgb && !picture.metadata.icc.empty());
   if (converts || picture.formatIndex == kNoFormat) return false;
-  // the rows of one codec share its settings
+  // formats of the same codec share its settings
   const FormatEntry &from = FormatRow(picture.formatIndex), &to = FormatRow(target.formatIndex);
   return from.bare != nullptr && from.settings == to.settings;
 }
@@ -222,7 +222,7 @@ Status OutputWriter::WriteFile(const PreparedOutput& output, const Destination& 
   return status;
 }
 
-// What Prepare does to a single picture.
+// Prepares a single picture.
 Status OutputWriter::FitPage(PictureRecord& picture, const OutputTarget& target,
                              std::string& hint) const {
   if (function_.autoOrient) RETURN_IF_BAD(TurnUpright(picture));
@@ -244,7 +244,7 @@ Status OutputWriter::AddPage(SequenceWriter& sequence, PictureRecord& picture, i
                              const OutputTarget& target, std::string& hint) const {
   Status status = sequence.Add(picture, delayMs);
   if (status == Status::TooManyColors && Reduces(target)) {
-    // one entry is left for transparency
+    // reserve one entry for transparency
     const PaletteChoice choice{.colors = 255};
     RETURN_IF_BAD(ReduceToPalette(picture, choice, job_.reduction, {}));
     status = sequence.Add(picture, delayMs);
@@ -298,7 +298,7 @@ RecordedText OutputWriter::Note(const PreparedOutput& output) const {
   const bool frames =
       picture.formatIndex != kNoFormat && FormatRow(picture.formatIndex).animate != nullptr;
   const OutputTarget& target = output.target;
-  // a dry run has not made the output
+  // a dry run does not create the output
   const bool all = output.allPages || target.sequence || OnlyDropsMetadata(picture, target);
   const bool chosen = function_.page > 0 || target.page > 0 || all;
   note.Append(LeftOut(picture, {.metadataWanted = KeepsMetadata(),

@@ -13,46 +13,46 @@
 
 namespace fotomill {
 
-// A picture on its way into a file.
+// A picture ready to be written.
 struct PreparedOutput {
   PictureRecord& picture;
   const OutputTarget& target;
-  std::vector<uint8_t> file = {};  // not empty: the whole file, nothing is encoded
-  bool asSource = false;           // JPEG with the quality of its source
-  bool transparency = false;       // which the format cannot hold
-  bool allPages = false;           // the file has every page of the source
-  RecordedText note = {};          // what is remarkable about it
+  std::vector<uint8_t> file = {};  // not empty: the complete file; nothing is encoded
+  bool asSource = false;           // JPEG: encode with the quality of the source
+  bool transparency = false;       // transparency not supported by the format
+  bool allPages = false;           // the file has all pages of the source
+  RecordedText note = {};          // remarks
   RecordedText detail = {};        // what was done to it
 };
 
-// How the outputs of a run are made and written once they have a name. Threads may share one.
+// Creates and writes the outputs of a run after their names are chosen. Thread-safe.
 class OutputWriter {
  public:
-  // Both must outlive it.
+  // Both must outlive this object.
   OutputWriter(const BatchFunction& function, const BatchJob& job)
       : function_(function), job_(job) {}
 
-  // The output's own work on a picture, then what its format asks for: orientation, colors, depth.
-  // TooManyColors (12), UnsuitableImage (13) and whatever the work returns, with a hint.
+  // Applies the output's transform, then fits the picture to its format: orientation, colors,
+  // depth. TooManyColors (12), UnsuitableImage (13) and the transform's statuses, with a hint.
   Status Prepare(PreparedOutput& output, std::string& hint) const;
-  // What Prepare would return for a picture of which only the facts are known.
+  // As Prepare, but for a picture without pixels.
   Status Plan(const PictureRecord& picture, const OutputTarget& target, std::string& hint) const;
-  // Writes it. Codecs may take fewer colors than their row says; they are reduced step by step
-  // then, where that is allowed. Statuses as WritePicture, with a hint.
+  // Writes an output. If a codec supports fewer colors than its row says, they are reduced step by
+  // step, if allowed. Statuses of WritePicture, with a hint.
   Status Write(const PreparedOutput& output, const Destination& destination,
                std::string& hint) const;
-  // What Write would return, as far as the place of the output decides.
+  // The result of Write, as far as it depends on the destination.
   Status PlanFile(const PreparedOutput& output, const Destination& destination,
                   std::string& hint) const;
-  // Names what of the source a written output does not have; empty for nothing.
+  // Names what is missing in a written output compared to its source; empty for nothing.
   RecordedText Note(const PreparedOutput& output) const;
 
-  // Whether Prepare turns pictures that are to be upright: those that lose their metadata and
-  // nothing else, as their files may be turned without loss.
+  // Whether Prepare turns pictures upright: only if nothing but their metadata is removed, as their
+  // files may be turned losslessly.
   bool TurnsItself() const;
 
  private:
-  // Whether the folder of an output is made if it is missing.
+  // Whether to create the folder of an output if it is missing.
   bool MakesFolder(const Destination& destination, const OutputTarget& target) const;
   bool Reduces(const OutputTarget& target) const { return function_.reduce || target.kept; }
   bool KeepsMetadata() const { return function_.keepMetadata && job_.encode.preserveMetadata; }

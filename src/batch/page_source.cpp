@@ -10,7 +10,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr int32_t kPageDelayMs = 1000;  // of pages that become frames
+constexpr int32_t kPageDelayMs = 1000;  // for pages that become frames
 
 }  // namespace
 
@@ -20,7 +20,7 @@ Status PageSource::Open(const ReadRequest& request) {
   count_ = static_cast<size_t>(facts_->pageCount);
   const FormatEntry& row = FormatRow(facts_->formatIndex);
   if (row.animate == nullptr) return Status::Ok;
-  ReadRequest whole = request_;  // a frame that is cut short would not be told from others
+  ReadRequest whole = request_;  // truncated frames cannot be told from complete ones
   whole.partial = false;
   RETURN_IF_BAD(row.animate(whole, animation_));
   count_ = animation_->Delays().size();

@@ -12,7 +12,7 @@ namespace fotomill {
 
 namespace {
 
-// Which library a format lacks here; empty when it uses none.
+// The library that a format lacks; empty if it needs none.
 std::string MissingLibrary(int32_t formatIndex) {
   if (formatIndex == kNoFormat || FormatRow(formatIndex).libraries.empty()) return {};
   return Tr("The library %1 is not installed.", FormatRow(formatIndex).libraries[0].name);

@@ -10,16 +10,16 @@ namespace fotomill {
 struct FormatEntry;
 struct PictureRecord;
 
-// What a file looks like by its first bytes ("AVIF"), where that is not what its name says; empty
+// The detected type of a file ("AVIF"), if it differs from its name; empty
 // otherwise.
 std::string_view LooksLike(const std::string& fileName, int32_t formatIndex);
-// A sentence about a picture that was opened by its contents, since its name lies; empty for
+// A remark about a picture that was opened by contents because its extension is wrong; empty for
 // others.
 std::string MisnamedRemark(const PictureRecord& picture);
 
-// What follows the message of a file that could not be opened or decoded: what it looks like,
-// what the build lacks, or which format its name should have selected. Empty when there is nothing
-// to add.
+// A hint to follow the message for a file that could not be opened or decoded: its
+// detected type, what the build lacks, or the format of its extension. May be
+// empty.
 std::string OpenHint(const std::string& fileName, Status status);
 
 // That message with what follows it, for people.
@@ -29,7 +29,7 @@ std::string FailureText(const std::string& fileName, Status status);
 // empty.
 std::string WorkHint(Status status);
 
-// What size pictures of the row can have, if this one does not fit; empty if it does.
+// The size limits of the format, if this picture exceeds them; else empty.
 std::string SizeHint(const PictureRecord& picture, const FormatEntry& row);
 
 }  // namespace fotomill

@@ -24,10 +24,10 @@ struct ProgressWork {
 class ProgressBox {
  public:
   virtual ~ProgressBox() = default;
-  // A batch starts; the model is empty. False if there can be no box; the batch is then not
-  // started.
+  // A batch starts; the model is empty. Return false if no box can be shown, to cancel the
+  // batch.
   virtual bool Open(const ProgressModel& model) = 0;
-  // A new last line of the list; `outcome` is null for lines that are not about a file.
+  // A line was added to the list; `outcome` is null for lines that are not about a file.
   virtual void ShowLine(const ProgressLine& line, const FileOutcome* outcome) = 0;
   virtual void ShowStatus(const std::string& status) = 0;  // replaces the status line
   // `done` of `count` files are finished.
@@ -36,29 +36,29 @@ class ProgressBox {
   virtual void ShowWork(const ProgressWork& work) { (void)work; }
   // Called several times a second while the batch waits, to redraw times.
   virtual void Tick() {}
-  // False ends the batch as Abort does, for a box that can report no more.
+  // Returns false to end the batch like Abort, if output is no longer possible.
   virtual bool GoesOn() { return true; }
   // The batch has ended and the box stays open: the list is rebuilt with a vertical scroll bar,
-  // every line with its item and row height, the first visible line as before and the last one
-  // selected; Close is live, Abort is not.
+  // with the item and row height of every line, the same first visible line, and the last line
+  // selected; Close is enabled, Abort is not.
   virtual void StayOpen(const ProgressModel& model) = 0;
   // The batch has ended and the box closes.
   virtual void Close(const ProgressModel& model) = 0;
 };
 
-// Opens the job's box, empties its list, and clears the job's error flag. False when the box cannot
-// be shown. A job without a box keeps its lines anyway.
+// Opens the job's box, clears its list and the job's error flag. False if the box cannot be shown.
+// A job without a box still collects its lines.
 bool OpenProgressBox(BatchJob& job);
 // Adds `text` as a new line and sets the status line to "Processing file %d of %d" with index + 1
 // and count.
 void ReportFile(BatchJob& job, std::string_view text, uint32_t index, uint32_t count);
-// The same with the outcome of the file. The text is FileLine(outcome); a failure sets the job's
+// The same with the outcome of the file. The text is FileLine(outcome); failures set the job's
 // error flag.
 void ReportOutcome(BatchJob& job, const FileOutcome& outcome, uint32_t index, uint32_t count);
-// Sets the job's status line and shows it in its box, if there is one.
+// Sets the job's status line, also in its box, if any.
 void SetStatus(BatchJob& job, std::string_view text);
-// Adds the closing lines and closes the box or leaves it open for reading, as CloseProgressWhenDone
-// says.
+// Adds the closing lines and closes the box, or leaves it open, depending on
+// CloseProgressWhenDone.
 void FinishProgress(BatchJob& job);
 
 // A line of the list: "SOURCE -> DESTINATION" with ": NOTE" behind it if there is one, or

@@ -11,61 +11,61 @@ namespace fotomill {
 
 // The texts of the overwrite prompt.
 inline constexpr std::string_view kOverwriteTitle = TrLater("Overwrite File");
-// The question of the prompt.
+// The text of the prompt.
 inline constexpr std::string_view kOverwriteText = TrLater(
     "Click on OK to overwrite the existing file.\nChange the file name and click on Ok for a new "
     "name.\n"
     "Click on Cancel to skip this file.");
 inline constexpr std::string_view kOverwriteHelpPage = "OVERWRITE";  // of the overwrite prompt
-// Check box: later files are asked about as well.
+// Check box: ask again for later files.
 inline constexpr std::string_view kNotifyText =
     TrLater("Notify me the next time I'm about to overwrite a file");
 inline constexpr std::string_view kNotifyNote =
     TrLater("Note: if you disable this option, it can be re-enabled later in the Setup window.");
 // Check box: write a numbered variant.
 inline constexpr std::string_view kKeepBothText = TrLater("Keep both files");
-// Check box: the answer holds for the rest of the job.
+// Check box: apply the answer to the rest of the job.
 inline constexpr std::string_view kApplyToRestText = TrLater("Apply to rest of batch");
-// Check box: a replaced file goes to the recycle bin.
+// Check box: move replaced files to the trash.
 inline constexpr std::string_view kRecycleText = TrLater("Move ovewritten files to recycle bin");
-// Check box: both pictures are shown.
+// Check box: show both pictures.
 inline constexpr std::string_view kPreviewsText = TrLater("Show previews");
 
 // The five check boxes of the overwrite prompt.
 struct OverwriteChecks {
   bool notify = true;        // PromptBeforeOverwrite
   bool keepBoth = true;      // OverwriteKeepBoth
-  bool applyToRest = false;  // of this batch; ends with it
+  bool applyToRest = false;  // for this batch only
   bool recycle = false;      // OverwritePromptRecycle
   bool previews = true;      // OverwritePromptPreviews
   bool operator==(const OverwriteChecks&) const = default;
 };
 
-// What the overwrite prompt shows.
+// Data for the overwrite prompt.
 struct OverwriteQuestion {
-  std::string source;                      // the file that is being worked on
+  std::string source;                      // the file being processed
   std::string path;                        // the output, which exists
   std::string name;                        // its base name, for the File name field
-  OverwriteChecks checks;                  // as they stand
-  // the new picture, for its preview; null if there is none. Valid during the call
+  OverwriteChecks checks;                  // initial state
+  // the new picture, for its preview; may be null. Valid during the call
   const PictureRecord* picture = nullptr;
-  // why the last answer could not be taken, a sentence; empty at first
+  // why the last answer was rejected, a sentence; empty at first
   std::string problem;
 };
 
-// What the user decided about one output whose name is taken.
+// The user's decision about an existing output.
 struct OverwriteAnswer {
-  bool ok = false;  // false: this file is skipped and nothing else is looked at
+  bool ok = false;  // false: skip this file and ignore the rest
   OverwriteChecks checks;
-  std::string name;       // of the File name field: without folder and extension
-  bool skipRest = false;  // not ok, and so for every collision of this batch
+  std::string name;       // from the File name field: without folder and extension
+  bool skipRest = false;  // if not ok: skip all existing files in this batch
 };
 
-// What the prompt for the name of an output shows.
+// Data for the output name prompt.
 struct NameQuestion {
-  std::string title;  // what the name is for; may be empty
+  std::string title;  // purpose of the name; may be empty
   std::string source;
-  std::string path;       // the name that is offered
+  std::string path;       // suggested name
   std::string extension;  // of the format, without dot
   std::string problem;    // as above
 };
@@ -86,12 +86,12 @@ class Prompts {
   virtual NameAnswer AskDestinationName(const NameQuestion& question) = 0;
   // What is to become of an output whose name is taken.
   virtual OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) = 0;
-  // The password that protects an output; nullopt skips the file.
+  // Asks for a password to protect an output; nullopt skips the file.
   virtual std::optional<std::string> AskPassword(const std::string& path) = 0;
-  // "Write files to the PNG format?" False ends the batch before it begins.
+  // "Write files to the PNG format?" False cancels the batch.
   virtual bool ConfirmFormat(const std::string& question) = 0;
-  // Whether a destination folder that is not there may be made. False ends the batch before it
-  // begins.
+  // Asks whether to create a missing destination folder. False cancels the
+  // batch.
   virtual bool ConfirmNewFolder(const std::string& folder) = 0;
 };
 

@@ -13,7 +13,7 @@ namespace fotomill {
 
 namespace {
 
-// What the steps of every output share.
+// State shared by the steps of all outputs.
 struct RecipeRun {
   std::shared_ptr<const Recipe> recipe;
   std::string copyrightHolder;
@@ -35,27 +35,27 @@ struct RecipeRun {
   }
 };
 
-// The step that gets the decoded picture, where only one does.
+// The only step that receives the decoded picture, if there is just one.
 const Step* FirstStep(const Recipe& recipe) {
   if (!recipe.common.empty()) return &recipe.common.front();
   const bool one = recipe.outputs.size() == 1 && !recipe.outputs.front().steps.empty();
   return one ? &recipe.outputs.front().steps.front() : nullptr;
 }
 
-// How much of a picture the first step needs, see ReadRequest::thumbnailSide.
+// The size that the first step needs; see ReadRequest::thumbnailSide.
 int32_t DecodedSide(const Step& first, const PictureRecord& facts) {
-  constexpr int32_t kLeastEdge = 512;  // smaller pictures are decoded in no time
-  constexpr int32_t kBlock = 8;  // a reduced decode of other sizes has partial pixels at its end
-  // JPEG files only: the smaller pictures that other formats hold need not look like the large one.
+  constexpr int32_t kLeastEdge = 512;  // smaller pictures are decoded fast enough
+  constexpr int32_t kBlock = 8;        // for other sizes, a reduced decode ends with partial pixels
+  // JPEG only: in other formats, embedded smaller pictures may look different.
   if (facts.formatIndex == kNoFormat || !FormatRow(facts.formatIndex).turnsWithoutLoss) return 0;
-  if ((facts.unread & kUnreadInks) != 0) return 0;  // the mean of inks is not that of their colors
+  if ((facts.unread & kUnreadInks) != 0) return 0;  // averages of inks and colors differ
   if (std::max(facts.width, facts.height) < kLeastEdge) return 0;
   const Orientation orientation = OrientationOf(facts);
   const bool whole = facts.width % kBlock == 0 && facts.height % kBlock == 0;
-  if (orientation != Orientation::Upright && !whole) return 0;  // which would come to the front
+  if (orientation != Orientation::Upright && !whole) return 0;  // partial pixels would come first
   Size size{facts.width, facts.height};
   if (SwapsSides(orientation)) {
-    if (facts.metadata.dpiX != facts.metadata.dpiY) return 0;  // these change places as well
+    if (facts.metadata.dpiX != facts.metadata.dpiY) return 0;  // these are swapped as well
     std::swap(size.width, size.height);
   }
   return first.operation->decodedSide(first.arguments, size, facts.metadata);
@@ -65,7 +65,7 @@ bool HasQuality(std::string_view extension) { return extension == "JPG" || exten
 
 std::string ReadFormat(const SaveStep& save, const BatchJob& job, const FormatLookup& lookup,
                        BatchOutput& output) {
-  // An option of the command line wins over the recipe.
+  // The command line overrides the recipe.
   if (job.formatIndex == kNoFormat && !save.to.empty()) {
     if (std::string wrong = lookup(save.to, output.formatIndex, output.extension); !wrong.empty())
       return wrong;

@@ -8,20 +8,20 @@
 
 namespace fotomill {
 
-// Formats that a recipe's `save to=` names, looked up by the face. Empty when done, else what is
-// wrong, as a sentence.
+// Looks up the format of `save to=`; implemented by front ends. Empty on success, else an error
+// message, a sentence.
 using FormatLookup = std::function<std::string(const std::string& extension, int32_t& formatIndex,
                                                std::string& format)>;
 
-// Makes a batch run a recipe over its files: the common steps once for each file, then each output.
-// Sets `transform`, `outputs` and `autoOrient` of a function whose other fields are set.
-// `copyrightHolder` is for the macro %N. Empty when done, else what is wrong with the recipe's
-// formats, as a sentence.
+// Sets up a batch to run a recipe: the common steps once per file, then each output. Sets
+// `transform`, `outputs` and `autoOrient`; set the other fields before. `copyrightHolder` is
+// for the macro %N. Empty on success, else what is wrong with the recipe's formats, as a
+// sentence.
 std::string SetRecipe(std::shared_ptr<const Recipe> recipe, const std::string& copyrightHolder,
                       const BatchJob& job, const FormatLookup& lookup, BatchFunction& function);
 
-// Under which function the file history notes operations of a family, and whose prefix their
-// outputs have.
+// The function recorded in the file history for operations of a family; also decides the prefix of
+// their outputs.
 FileFunction FunctionOfFamily(Family family);
 
 }  // namespace fotomill

@@ -73,8 +73,7 @@ void ReportedRun::ShowWork() {
 void ReportedRun::Deliver(size_t file, Status status) {
   std::vector<FileOutcome> outcomes = std::move(outcomes_[file]);
   if (status != Status::Ok) outcomes = {FileOutcome{.source = files_[file].name, .status = status}};
-  // A file that was given up in the middle left nothing behind; to its reader it is one that was
-  // not begun.
+  // A canceled file left nothing behind; report it like one that was never started.
   if (stop_.Asked())
     std::erase_if(outcomes, [](const FileOutcome& outcome) {
       return outcome.status == Status::FunctionCancelled;
@@ -108,7 +107,7 @@ void ReportedRun::Tick() {
   if (!job_.box->GoesOn()) ended_ = true;
 }
 
-// The thumbnail file of an output may be another picture's unless a file was replaced.
+// Unless a file was replaced, a thumbnail file of that name may belong to another picture.
 void ReportedRun::NoteChange(const FileOutcome& outcome) {
   const std::string path = platform::AbsolutePath(outcome.destination);
   job_.changes.push_back({path});

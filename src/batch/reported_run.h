@@ -18,24 +18,24 @@
 
 namespace fotomill {
 
-// How every batch over files runs: each is worked on, on some thread, into an outcome; outcomes are
-// reported on the calling thread in the order of the selection, to the job's box, and what was
-// written goes into the file history; thumbnails of what was there before go.
+// Runs every kind of batch: files are processed on several threads; outcomes are reported to the
+// job's box on the calling thread in selection order, written files are added to the file history,
+// and outdated thumbnails are removed.
 class ReportedRun {
  public:
-  // What is done with each file, and how it is recorded.
+  // How to process and record files.
   struct Task {
-    // On any thread: an outcome for each output of the file. None for a file that was given up by
+    // On any thread: returns an outcome per output of the file; none if canceled by
     // Abort.
     std::function<std::vector<FileOutcome>(size_t file)> process;
     FileFunction history = FileFunction::Convert;
     bool dryRun = false;
   };
 
-  // Files and job must outlive the run.
+  // `files` and `job` must outlive this object.
   ReportedRun(std::span<const BatchFile> files, BatchJob& job, Task task);
 
-  // At most `jobs` files at a time; 0: one per core.
+  // Processes at most `jobs` files at a time; 0: one per core.
   void Run(uint32_t jobs);
   // As OrderedRun::InTurn.
   bool InTurn(size_t file, const std::function<void()>& step) { return run_.InTurn(file, step); }
@@ -55,7 +55,7 @@ class ReportedRun {
   BatchJob& job_;
   const Task task_;
   const StopToken stop_;
-  // of files that are done and not yet reported; none: given up
+  // of finished files not yet reported; none: canceled
   std::vector<std::vector<FileOutcome>> outcomes_;
   std::atomic<bool> ended_{false};
   const std::thread::id caller_ = std::this_thread::get_id();

@@ -35,7 +35,7 @@ constexpr const char* kTooLong = TrLater("The path would be longer than 260 char
 constexpr const char* kOneFile =
     TrLater("Its pages would be several files; choose one with --page.");
 
-// Whether names are settled by more than a look at the folder.
+// Whether choosing a name needs more than checking the folder.
 bool AsksEveryName(const BatchJob& job) {
   if (job.formatIndex == kNoFormat)
     return job.prompts != nullptr && (job.naming.askName || job.naming.askPassword);
@@ -45,7 +45,7 @@ bool AsksEveryName(const BatchJob& job) {
          (job.naming.askName || (job.naming.askPassword && row.takesPassword));
 }
 
-// The name of a page's file: "scan-03.png" of "scan.png". All have as many digits.
+// The file name of a page: "scan-03.png" from "scan.png". All numbers have the same width.
 std::string NumberedPage(const std::string& path, int32_t page, int32_t pages) {
   const std::string digits = std::to_string(page);
   const size_t width = std::to_string(pages).size();
@@ -89,7 +89,7 @@ class Batch {
   void Run() { run_.Run(function_.jobs); }
 
  private:
-  // What decides about a collision, as it stood when the last question was answered.
+  // The rules for existing files, as of the last answer.
   struct Rules {
     OverwritePolicy overwrite;
     bool applyToRest = false;
@@ -111,7 +111,7 @@ class Batch {
     return targets;
   }
 
-  // Where an output goes; empty when its name comes out empty.
+  // The path of an output; empty if its name is empty.
   std::string PathOf(const BatchFile& file, const OutputTarget& target,
                      const PictureRecord* picture) const {
     if (!function_.out.empty()) return function_.out;
@@ -129,16 +129,15 @@ class Batch {
     return PlannedDestination(file.name, {target.extension, below, output.folder, base}, job_);
   }
 
-  // On any thread: one file from its source to its outputs. None where it was given up by Abort
-  // before it had a name.
+  // On any thread: processes one file from source to outputs. None if canceled before it had a
+  // name.
   std::vector<FileOutcome> Process(size_t i) {
     const BatchFile& file = files_[i];
     if (file.status != Status::Ok) return {Failure(file, file.status, file.hint)};
     std::vector<OutputTarget> targets = TargetsOf(file);
     std::vector<std::string> planned;
     for (const OutputTarget& target : targets) planned.push_back(target.path);
-    // Where another file's output may take this source's place, the order of the selection says
-    // which comes first.
+    // If another file's output may replace this source, they must run in selection order.
     if (names_.IsOutputOfOthers(file.name, planned) && !run_.InTurn(i, [] {})) return {};
     std::vector<FileOutcome> outcomes(targets.size());
     std::vector<size_t> open;  // outputs that need the picture
@@ -146,7 +145,7 @@ class Batch {
       if (!IsSettledEarly(i, targets[k], outcomes[k])) open.push_back(k);
     }
     if (open.empty()) return outcomes;
-    platform::HeldFile held;  // from before it is read, if an output is going to replace it
+    platform::HeldFile held;  // held before reading, if an output will replace the source
     const bool inPlace = std::ranges::any_of(
         targets, [&](const OutputTarget& target) { return target.path == file.name; });
     if (inPlace && !function_.dryRun && !held.Hold(file.name)) return {NotHeld(file)};
@@ -171,15 +170,15 @@ class Batch {
       outcomes[k] = std::move(*outcome);
       outcomes[k].output = targets[k].output->label;
     }
-    // numbered outputs have added outcomes of their own
+    // numbered outputs have added their own outcomes
     std::erase_if(outcomes, [](const FileOutcome& outcome) { return outcome.source.empty(); });
     return outcomes;
   }
 
-  // Whether a dry run can do without the pictures.
+  // Whether a dry run does not need the pictures.
   bool IsOnlyPlanned() const { return function_.dryRun && !needsPicture_; }
 
-  // Whether it is known without the picture what becomes of an output; tells it then.
+  // Whether the result of an output is known without the picture; then sets `outcome`.
   bool IsSettledEarly(size_t i, const OutputTarget& target, FileOutcome& outcome) {
     const BatchFile& file = files_[i];
     outcome.output = target.output->label;
@@ -197,7 +196,7 @@ class Batch {
     return true;
   }
 
-  // Whether an output gets more than one picture, and how.
+  // Decides whether an output gets several pictures, and how.
   void ChoosePages(const PictureRecord& picture, OutputTarget& target) const {
     if (picture.pageCount < 2 || function_.page > 0 || picture.formatIndex == kNoFormat) return;
     const FormatEntry &from = FormatRow(picture.formatIndex), &to = FormatRow(target.formatIndex);
@@ -205,14 +204,14 @@ class Batch {
     const bool all =
         function_.page == kAllPages ||
         std::ranges::find(job_.everyPage, to.extension.view()) != job_.everyPage.end();
-    // PNG holds frames, not pages
+    // PNG has frames, but not pages
     const bool holds = to.sequence != nullptr && target.output->mostBytes == 0 &&
                        (animation || (all && (to.flags & FMT_PNG) == 0));
     target.sequence = holds;
     target.pages = all && !holds ? picture.pageCount : 0;
   }
 
-  // Every page into a file of its own. False if the run ended.
+  // Writes every page to its own file. False if the run ended.
   bool ProduceNumbered(size_t i, OutputTarget target, platform::HeldFile& held,
                        std::vector<FileOutcome>& outcomes) {
     const BatchFile& file = files_[i];
@@ -235,8 +234,8 @@ class Batch {
     return true;
   }
 
-  // Makes one output of a picture that has gone through the function's own work. All but the last
-  // one get a copy.
+  // Creates one output from a picture after the function's own transform. All but the last one get
+  // a copy.
   std::optional<FileOutcome> Produce(size_t i, const OutputTarget& target, PicturePointer& picture,
                                      bool last, platform::HeldFile& held) {
     const BatchFile& file = files_[i];
@@ -248,7 +247,8 @@ class Batch {
       if (status != Status::Ok) return Failure(file, status);
     }
     PictureRecord& own = copy != nullptr ? *copy : *picture;
-    // The source may have bound its own plug-in format to the row that the destination's had.
+    // The source may have bound the shared plug-in row to its own format; bind it to the
+    // destination's.
     if (target.formatIndex == kSpareRow) (void)FindPluginFormat("x." + target.extension);
     std::string hint;
     PreparedOutput output{.picture = own, .target = target};
@@ -276,7 +276,7 @@ class Batch {
     return outcome;
   }
 
-  // Whether a file is only going to be skipped; it need not be decoded then.
+  // Whether a file will be skipped and need not be decoded.
   bool IsLeftOut(size_t i, Destination& destination) {
     const std::string& source = files_[i].name;
     {
@@ -316,8 +316,7 @@ class Batch {
                    static_cast<uint64_t>(picture->pageCount));
   }
 
-  // Settles the name and writes, again when someone else has taken the name since it was found
-  // free.
+  // Chooses the name and writes; repeats if another program takes the name meanwhile.
   std::optional<FileOutcome> WriteUnderFreeName(size_t i, const Destination& planned,
                                                 const PreparedOutput& output,
                                                 platform::HeldFile& source) {
@@ -327,8 +326,7 @@ class Batch {
     return settled ? outcome : Failure(files_[i], Status::ErrorCreatingFile, Tr(kWriteAborted));
   }
 
-  // One attempt at that. False when the name was lost; otherwise `outcome` is what came of the
-  // file, none if it was given up.
+  // One attempt. False if the name was taken; otherwise `outcome` is the result, none if canceled.
   bool TryToWrite(size_t i, Destination destination, const PreparedOutput& output,
                   platform::HeldFile& source, std::optional<FileOutcome>& outcome) {
     const BatchFile& file = files_[i];
@@ -363,8 +361,8 @@ class Batch {
     return true;
   }
 
-  // Holds the file to be replaced. One that goes to the recycle bin is not lost, whoever has
-  // changed it.
+  // Holds the file to be replaced. One that is moved to the trash cannot be lost, even if modified
+  // by others.
   static bool Hold(const Destination& destination, platform::HeldFile& source,
                    platform::HeldFile& held) {
     if (destination.recycle) source.Release();
@@ -379,7 +377,7 @@ class Batch {
   DestinationAnswer Settle(size_t i, Destination& destination, const PreparedOutput& output,
                            bool& cancelled) {
     DestinationAnswer answer = DestinationAnswer::Skip;
-    // names of numbered pages are not planned ahead
+    // numbered pages have no planned names
     const bool planned = output.target.page == 0;
     if (planned && SettleAtOnce(files_[i].name, destination, answer)) return answer;
     const bool done = run_.InTurn(
@@ -388,13 +386,13 @@ class Batch {
     return answer;
   }
 
-  // Whether what happens to other files of the run changes nothing about this one's name.
+  // Whether other files of the run cannot affect the name of this one.
   bool IsIndependent(const std::string& source, const std::string& planned) const {
     return function_.out.empty() && names_.ConcernsNobodyElse(source, planned);
   }
 
-  // Settles a name without waiting for earlier files, where they do not matter and there is no
-  // question to ask. False when that is not possible; the destination is then unchanged.
+  // Chooses a name without waiting for earlier files, if they do not matter and no prompt is
+  // needed. False, with the destination unchanged, if that is not possible.
   bool SettleAtOnce(const std::string& source, Destination& destination,
                     DestinationAnswer& answer) {
     const std::lock_guard lock(mutex_);
@@ -447,7 +445,7 @@ class Batch {
     // a question that was answered by ending the batch
     cancelled = answer == DestinationAnswer::Skip && job_.stop.Token().Asked();
     const std::lock_guard lock(mutex_);
-    // Unless the user said so of this very file, the files of one run never replace each other.
+    // Outputs of a run never replace each other, unless confirmed for this file.
     if (answer == DestinationAnswer::Write && destination.replace && !destination.asked) {
       if (names_.TakenByRun(destination.path, source)) {
         destination.replace = destination.recycle = false;
@@ -493,12 +491,12 @@ class Batch {
   const std::string prefix_;
   const bool asksEveryName_;
   std::vector<BatchOutput> outputs_;
-  const bool needsPicture_;  // a name of an output has macros about the picture
+  const bool needsPicture_;  // a name has macros about the picture
   const OutputWriter writer_;
-  mutable std::mutex mutex_;  // over what follows
+  mutable std::mutex mutex_;  // guards the following members
   RunNames names_;
   Rules rules_;
-  ReportedRun run_;  // last: its threads use the rest
+  ReportedRun run_;  // must be last: its threads use the other members
 };
 
 }  // namespace

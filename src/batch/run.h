@@ -13,69 +13,69 @@
 
 namespace fotomill {
 
-// One file of the selection.
+// A file of the selection.
 struct BatchFile {
   std::string name;
-  // subfolder below the chosen folder, "" or "a/b": for outputs that keep the tree
+  // subfolder relative to the given folder, "" or "a/b": to recreate the tree
   std::string below;
-  // what is known to be wrong with it already; it is reported and not opened
+  // a known error; the file is reported but not opened
   Status status = Status::Ok;
-  std::string hint;            // what goes behind the message of such a failure
+  std::string hint;  // printed after that error message
 };
 
-// Every page goes into an output: into one file where the format holds several, else into files
-// with numbered names.
+// All pages: into one file if the format supports several, else into numbered
+// files.
 inline constexpr int32_t kAllPages = -1;
 
-// What a function does to every file of its selection.
+// How to process each file of a selection.
 struct BatchFunction {
-  // Changes the decoded picture; empty for plain conversion. Called on several threads at once,
-  // with different pictures.
+  // Changes the decoded picture; empty for plain conversion. Called concurrently on several
+  // threads, with different pictures.
   std::function<Status(PictureRecord& picture)> transform = {};
-  // ReadRequest::thumbnailSide for a picture whose facts are known; empty: every pixel is needed
+  // ReadRequest::thumbnailSide for a picture without pixels yet; empty: full size needed
   std::function<int32_t(const PictureRecord& facts)> decodedSide = {};
-  // each file is decoded once for all of them; none: one, as the job says
+  // created from a single decode; none: one output with the job's options
   std::vector<BatchOutput> outputs = {};
-  // for jobs without a format: of sources whose own cannot be written
+  // for jobs without format: if the source's format cannot be written
   FallbackFormat fallback = {};
-  FileFunction history = FileFunction::Convert;  // under which the sources go into the file history
+  FileFunction history = FileFunction::Convert;  // recorded in the file history for the sources
   std::optional<std::string> prefix =
-      {};  // in front of every name: at most 32 characters, a plain name; none: the job's,
-           // but nothing in front of names that an output makes itself
-  // not empty: the whole path of the output of a selection of one
+      {};  // of all names: at most 32 characters, without separators; none: the job's,
+           // but no prefix for names chosen by an output
+  // not empty: the full output path for a selection of one file
   std::string out = {};
-  // that path is all there is, such as a stream: pages in several files fail with UnsuitableImage
+  // `out` is the only possible output, such as a stream: several files fail with UnsuitableImage
   bool oneFile = false;
-  // of files with several, from 1, or kAllPages; 0: all frames where an animation becomes one, else
-  // the first page
+  // for files with several: from 1, or kAllPages; 0: all frames if an animation stays one, else the
+  // first page
   int32_t page = 0;
   uint32_t jobs = 0;                             // number of parallel jobs; 0: one per core
-  bool reduce = false;  // colors of pictures that are too deep for the format are reduced, as
-                        // they always are for a format that was kept
+  bool reduce = false;  // reduce colors if the format supports fewer; always done for formats
+                        // kept from the source
   std::string reduceHint = {};                   // follows "Too many colors."
-  // what can be read of files that end early is converted, with a note
+  // convert the readable part of truncated files, with a note
   bool salvage = false;
-  std::string salvageHint = {};                  // follows "File read error." without that
-  bool autoOrient = false;                       // pictures are rotated upright by EXIF orientation
-  bool keepMetadata = true;                      // EXIF, XMP and comments are copied
-  ProfileRequest profile = {};                   // color profiles
-  // files that only lose their metadata are encoded anyway, with a quality that was asked for
+  std::string salvageHint = {};  // follows "File read error." if not set
+  bool autoOrient = false;       // rotate pictures upright by EXIF orientation
+  bool keepMetadata = true;      // copy EXIF, XMP and comments
+  ProfileRequest profile = {};   // how to handle color profiles
+  // also re-encode files that only lose metadata, as a quality was requested
   bool encodesAnew = false;
-  // outputs get the modification times of their sources
+  // copy the modification times of the sources
   bool keepTimes = false;
-  // the folders of the selection are recreated in the destination folder
+  // recreate the folders of the selection in the destination folder
   bool keepTree = false;
-  // nothing is written; outcomes are those of a run, as far as they can be told
+  // write nothing; same outcomes as a run, as far as possible
   bool dryRun = false;
 };
 
-// Runs a function over a selection: opens the job's progress box, asks questions, converts, reports
-// every file in selection order, collects entries for the file history, and finishes the box.
+// Runs a function on a selection: opens the job's progress box, shows prompts, converts, reports
+// every file in selection order, collects entries for the file history, and closes the box.
 // Decoding, transforming and encoding run on several threads; everything else happens on the
-// calling thread in the order of the selection, so that outputs, names, questions and lines are the
-// same as with one thread; only a name typed into a question may be refused because a later file
-// already has it. After Abort no more files are started, and current files are finished or leave
-// nothing behind. Ok, or FunctionCancelled if the user declined to start.
+// calling thread in selection order, so that outputs, names, prompts and lines are the same as with
+// one thread; only a name entered at a prompt may be rejected because a later file already has it.
+// After Abort no more files are started, and current files are finished or leave nothing behind.
+// Ok, or FunctionCancelled if the user declined to start.
 Status RunBatch(std::span<const BatchFile> files, const BatchFunction& function, BatchJob& job);
 
 }  // namespace fotomill

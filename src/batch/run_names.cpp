@@ -11,7 +11,7 @@ namespace fotomill {
 
 namespace {
 
-// The path of which `path` is a numbered variant; empty when it cannot be one.
+// The path of which `path` may be a numbered variant; empty if it is not one.
 std::string OriginOfVariant(const std::string& path) {
   const platform::PathParts parts = platform::SplitPath(path);
   const size_t bracket = parts.base.rfind(" [");

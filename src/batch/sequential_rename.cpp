@@ -17,11 +17,10 @@ namespace fotomill {
 
 namespace {
 
-constexpr double kStoreInterval = 1;  // seconds between two writes of the next number
+constexpr double kStoreInterval = 1;  // seconds between writes of the next number
 constexpr const char* kNotSafe = TrLater("It could not be recorded for --undo.");
 
-// Has the job remember the number that the next run begins with: a few times a second at most, and
-// at the end.
+// Saves the first number of the next run in the job: a few times a second at most, and at the end.
 class NextNumber {
  public:
   NextNumber(const BatchJob& job, bool on) : job_(job), on_(on) {}
@@ -67,13 +66,13 @@ std::string RenameHint(const std::string& path, const SequentialRenameRules& rul
   return {};
 }
 
-// Whether a noted rename has happened and can be taken back. A killed run may have noted one that
-// it did not do, or have taken one back.
+// Whether a logged rename was done and can be undone. Killed runs may have logged a rename before
+// doing it, or may have undone one already.
 bool HasHappened(const RenamedFile& file) {
   return platform::FileExists(file.to) || !platform::FileExists(file.from);
 }
 
-// Takes down a rename that was done, and lets the thumbnail file follow.
+// Records a completed rename and renames the thumbnail file.
 void NoteRename(const std::string& from, const std::string& to, bool dryRun, BatchJob& job) {
   job.filesChanged = true;
   if (dryRun) return;
@@ -160,13 +159,13 @@ Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRena
       path = old;
       return Status::Ok;
     }
-    // no other number would do better
+    // another number would not help
     if (result == platform::CommitResult::Failed) return Status::RenameError;
   }
   return Status::RenameError;
 }
 
-// Fisher and Yates with the numbers of Mersenne Twister, which the language fixes.
+// Fisher-Yates shuffle with the Mersenne Twister, whose numbers are standardized.
 std::vector<size_t> RandomOrder(size_t count, uint64_t seed) {
   std::vector<size_t> order(count);
   std::iota(order.begin(), order.end(), size_t{0});
@@ -235,7 +234,7 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
     ReportOutcome(job, outcome, done++, count);
   }
   left.insert(left.end(), wanted.begin(), wanted.end());
-  // the last one first again, when it is tried again
+  // in reverse, so that a retry starts with the last one
   left.insert(left.end(), failed.rbegin(), failed.rend());
   MarkChangedRecords(std::exchange(job.changes, {}));
   if (!dryRun && !log->files.empty() && !WriteRenameLog(remaining)) {

@@ -15,31 +15,31 @@
 
 namespace fotomill {
 
-// How files are named and numbered: the SequentialRename... keys.
+// Rules for naming and numbering files: the SequentialRename... keys.
 struct SequentialRenameRules {
   std::string baseName = "PICTURE";
-  uint32_t number = 1;  // the first
+  uint32_t number = 1;  // first number
   int32_t digits = 4;
   uint32_t increment = 1;  // at least 1
   uint32_t maxAttempts = 32760;
-  std::string separator = {};  // between name and number; empty: none
-  bool numberFirst = false;  // the number, then the file's own old name
+  std::string separator = {};  // between name and number; may be empty
+  bool numberFirst = false;    // number before the file's own name
   bool skipColliding = false;
-  bool update = true;  // the job remembers the next number
+  bool update = true;  // save the next number in the job
   bool random = false;
 };
 
-// The files that are renamed. In a dry run they only seem to be.
+// Renames files, or pretends to in a dry run.
 class RenamedFiles {
  public:
-  // Each rename is noted in `log`, if there is one, before it is done.
+  // Renames are recorded in `log`, if not null, before they are done.
   explicit RenamedFiles(bool dryRun, RenameLog* log = nullptr) : dryRun_(dryRun), log_(log) {}
-  // Whether a path is taken; in a dry run, whether it would be by now.
+  // Whether a path exists, or would exist by now in a dry run.
   bool Exists(const std::string& path) const;
-  // Renames without replacing anything: Taken when the new name is. A dry run only remembers it.
+  // Renames without replacing: returns Taken if the new name exists. A dry run only records it.
   platform::CommitResult Rename(const std::string& from, const std::string& to);
   bool IsDryRun() const { return dryRun_; }
-  // Whether the last rename was noted.
+  // Whether the last rename was logged.
   bool IsNoted() const { return noted_; }
 
  private:
@@ -49,33 +49,33 @@ class RenamedFiles {
   std::set<std::string> gone_, there_;
 };
 
-// The number as names hold it: `digits` wide, zero-filled.
+// Formats a number with `digits` digits, zero-padded.
 std::string NumberText(uint32_t number, int32_t digits);
 
-// Gives `path` the next free number and stores the new path in it. Ok when the file was renamed or,
-// the new name being taken, left unchanged; RenameError when no number was free within the
-// attempts, or when the system does not rename it. A rename sets the job's files-changed flag and
-// goes to job.uses and job.changes, unless it is a dry run's; the thumbnail file follows.
+// Renames `path` to the next free number and updates it. Ok if renamed, or if left unchanged
+// because the new name is taken; RenameError if no number was free within the attempts, or the
+// system refuses. A rename sets the job's files-changed flag and is added to job.uses and
+// job.changes, except in a dry run; the thumbnail file is renamed along.
 Status RenameSequentially(BatchJob& job, std::string& path, const SequentialRenameRules& rules,
                           RenamedFiles& files);
 
-// The order of a random run: places 0 to count - 1, the same for the same seed everywhere.
+// A random permutation of 0 to count - 1, the same for the same seed on every system.
 std::vector<size_t> RandomOrder(size_t count, uint64_t seed);
 
-// How one run goes.
+// Options for a run.
 struct RenameOptions {
   SequentialRenameRules rules = {};
-  std::optional<uint64_t> seed = {};  // of the random order; none: another one each time
+  std::optional<uint64_t> seed = {};  // for random order; none: different each time
   bool dryRun = false;
 };
 
-// Renames a selection by the rules of the options: opens the job's progress box, reports every
-// file, finishes the box. What was renamed can be taken back by UndoRename until the next run.
+// Renames a selection: opens the job's progress box, reports every file, closes the box. UndoRename
+// can undo it until the next run.
 void RunRename(std::span<const BatchFile> files, const RenameOptions& options, BatchJob& job);
-// Gives the files of the last run their old names again, the last one first; with `only`, absolute
-// paths, those of them only. What cannot be taken back can be tried again. When all is taken back,
-// the next run counts from where the last one did. Unreadable, or locked by another program: false,
-// nothing was done.
+// Restores the old names of the last run, last file first; with `only`, just those absolute paths.
+// Files that cannot be restored can be retried. If all are restored, the next run starts with the
+// same number as the last one. False, with no change, if the log is unreadable or locked by another
+// program.
 bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job);
 
 }  // namespace fotomill

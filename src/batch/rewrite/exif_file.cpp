@@ -13,7 +13,7 @@ namespace fotomill {
 
 namespace {
 
-// Makes the new file from the old one; `changed` is false where they are the same.
+// Makes the new file from the old one; `changed` is false if they are identical.
 using Maker = std::function<Status(std::span<const uint8_t> file, FilePieces& made, bool& changed,
                                    std::string& reason)>;
 

@@ -15,12 +15,12 @@ RewrittenFile EditExifFile(const std::string& source, const std::string& destina
                            const ExifChanger& changer, const RewriteRequest& request,
                            const WriteOptions& options);
 
-// What of a file's metadata is removed.
+// Which metadata to remove.
 struct StripRequest {
   uint32_t kept = 0;        // what stays: kKeep bits
   bool placesOnly = false;  // everything stays but where the picture was taken
 };
-// The same for removing metadata. The new file is read again; the note names what is left in it.
+// Removes metadata. The new file is read back; the note names what is left in it.
 RewrittenFile StripFile(const std::string& source, const std::string& destination,
                         const StripRequest& strip, const RewriteRequest& request,
                         const WriteOptions& options);

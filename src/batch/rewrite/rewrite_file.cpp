@@ -37,7 +37,7 @@ Status FileRewrite::Write(std::span<const std::span<const uint8_t>> parts, bool 
     out.Bytes(part);
   }
   WriteOptions options = options_;
-  bool unchanged = true;  // a file that another program changed meanwhile is not replaced
+  bool unchanged = true;  // do not replace a file modified by another program
   options.makeWay = [&] {
     return (!options_.makeWay || options_.makeWay()) &&
            (unchanged = platform::StampOf(source_) == stamp_);

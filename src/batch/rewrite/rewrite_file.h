@@ -16,35 +16,35 @@ namespace fotomill {
 // The result for one file.
 struct RewrittenFile {
   Status status = Status::Ok;
-  std::string hint = {};   // to a failure, as a sentence
-  RecordedText note = {};  // what was done if not as usual
-  bool changed = false;    // false: nothing was written, the file is so already
+  std::string hint = {};   // reason for a failure, a sentence
+  RecordedText note = {};  // remark about what was done, if unusual
+  bool changed = false;    // false: nothing was written, no change needed
 };
 
-// How a file is rewritten: to another one, or in place.
+// Options for rewriting a file, to another one or in place.
 struct RewriteRequest {
-  bool keepTime = false;  // the new file has the time of the old one
-  bool dryRun = false;    // nothing is written; the result is that of a run
-  StopToken stop = {};    // ends the work with FunctionCancelled (4)
+  bool keepTime = false;  // keep the modification time
+  bool dryRun = false;    // write nothing; same result as a run
+  StopToken stop = {};    // cancels with FunctionCancelled (4)
 };
 
-// A file that is made from another one or takes its place. Nothing is lost: the old file stays
-// until the new one is complete, and where another program changes it meanwhile.
+// Writes a file made from another one, or replaces that. The old file is kept until the new one is
+// complete, or if another program modifies it meanwhile.
 class FileRewrite {
  public:
-  // All of them must outlive it; `options` say what to do if the destination exists.
+  // Arguments must outlive this object; `options` say what to do if the destination exists.
   FileRewrite(const std::string& source, const std::string& destination,
               const RewriteRequest& request, const WriteOptions& options)
       : source_(source), destination_(destination), request_(request), options_(options) {}
 
-  // To be called before the source is read: takes it as it is now. ErrorCreatingFile (10) where it
-  // cannot be held.
+  // Call before reading the source; records its current state. ErrorCreatingFile (10) if it cannot
+  // be held.
   Status Begin();
   // Writes the new file from its parts; `same` says that they are the old file. An unchanged file
   // is copied, unless source and destination are the same. Sets `changed` and the hint of the
   // result.
   Status Write(std::span<const std::span<const uint8_t>> parts, bool same);
-  // Fails with a hint.
+  // Sets status and hint of a failure.
   Status Fail(Status status, std::string hint);
 
   RewrittenFile result;
@@ -56,8 +56,8 @@ class FileRewrite {
   const std::string &source_, &destination_;
   const RewriteRequest& request_;
   const WriteOptions& options_;
-  platform::HeldFile held_;    // the file to be replaced
-  platform::FileStamp stamp_;  // of the source when it was not read yet
+  platform::HeldFile held_;    // the file to replace
+  platform::FileStamp stamp_;  // of the source before reading it
   std::optional<platform::ExactTime> time_;
 };
 

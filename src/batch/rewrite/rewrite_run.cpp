@@ -55,7 +55,7 @@ class RewriteBatch {
     return platform::JoinFolder(folder, platform::FileNameOf(file.name));
   }
 
-  // On any thread. nullopt for a file that was given up by Abort before it had a name.
+  // On any thread. nullopt if canceled before the file had a name.
   std::optional<FileOutcome> Process(size_t i) {
     const BatchFile& file = files_[i];
     if (file.status != Status::Ok) return Failure(file, file.status, file.hint);
@@ -75,7 +75,7 @@ class RewriteBatch {
     return outcome;
   }
 
-  // Gives a file its destination. False when it is left out.
+  // Chooses the destination of a file. False if it is skipped.
   bool Settle(FileOutcome& outcome) {
     const std::lock_guard lock(mutex_);
     const std::string planned = outcome.destination;
@@ -157,9 +157,9 @@ class RewriteBatch {
   const std::span<const BatchFile> files_;
   const RewriteFunction& function_;
   BatchJob& job_;
-  std::mutex mutex_;  // over what is given to names_
+  std::mutex mutex_;  // guards the names given by names_
   RunNames names_;
-  ReportedRun run_;  // last: its threads use the rest
+  ReportedRun run_;  // must be last: its threads use the other members
 };
 
 }  // namespace

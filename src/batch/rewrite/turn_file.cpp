@@ -17,7 +17,7 @@ namespace fotomill {
 
 namespace {
 
-// Whether both show the same, pixel for pixel, at whatever depth.
+// Whether both have the same pixels, regardless of depth.
 bool LookTheSame(const PictureRecord& a, const PictureRecord& b) {
   if (a.image.Width() != b.image.Width() || a.image.Height() != b.image.Height()) return false;
   if (a.alpha.Empty() != b.alpha.Empty()) return false;
@@ -46,7 +46,7 @@ bool LookTheSame(const PictureRecord& a, const PictureRecord& b) {
   return true;
 }
 
-// Why a picture cannot be rewritten unchanged, apart from its pixels; empty if it can.
+// Why a picture cannot be rewritten losslessly, apart from its pixels; empty if it can.
 std::string Obstacle(const PictureRecord& picture) {
   if (!CanWrite(FormatRow(picture.formatIndex)))
     return Tr("Files of this format cannot be written.");
@@ -117,8 +117,8 @@ class Turning {
                             turned.method == JpegTurnMethod::Nothing);
   }
 
-  // The old and the turned picture are there at a time, as are the turned one and what is read
-  // back.
+  // Two pictures are in memory at a time: the old and the turned one, then the turned one and the
+  // one read back.
   static Status CheckMemory(const PictureRecord& picture) {
     const uint64_t rows = PackedRowBytes(picture.width, picture.height, picture.bitsPerPixel);
     const bool alpha = (picture.alphaFlags & kHasAlpha) != 0;

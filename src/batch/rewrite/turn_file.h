@@ -11,15 +11,15 @@
 
 namespace fotomill {
 
-// How to turn pictures.
+// Options for turning pictures.
 struct TurnRequest {
-  Orientation turn = Orientation::Upright;  // of the picture as it is seen
-  bool seenByExif = true;                   // the EXIF orientation is applied first
-  // JPEG edges that cannot be turned losslessly are cropped
+  Orientation turn = Orientation::Upright;  // as displayed
+  bool seenByExif = true;                   // apply the EXIF orientation first
+  // crop JPEG edges that cannot be turned losslessly
   bool trim = false;
-  bool keepTime = false;                    // the new file has the time of the old one
-  bool dryRun = false;                      // nothing is written; the result is that of a run
-  StopToken stop = {};                      // ends the work with FunctionCancelled (4)
+  bool keepTime = false;  // keep the modification time
+  bool dryRun = false;    // write nothing; same result as a run
+  StopToken stop = {};    // cancels with FunctionCancelled (4)
 };
 
 // Writes a turned copy of a picture file, or replaces it; `options` say what to do if the
