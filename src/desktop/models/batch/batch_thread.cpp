@@ -21,7 +21,7 @@ std::string DimensionsText(int32_t width, int32_t height, int32_t bits) {
   return Tr("%1 x %2, %3 bits", width, height, bits);
 }
 
-// A copy of a picture that another thread owns, scaled to a square.
+// A copy of a picture owned by another thread, scaled to a square.
 RgbImage SmallCopy(const PictureRecord& picture, int32_t side, Color matte) {
   PackedImage scaled, alpha;
   RgbImage rgb;
@@ -64,7 +64,7 @@ OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t
   return preview;
 }
 
-// The batch's side of the progress box.
+// Progress box on the batch's thread.
 class BatchThread::Box : public ProgressBox {
  public:
   explicit Box(BatchThread& batch) : batch_(batch) {}
@@ -103,7 +103,7 @@ class BatchThread::Box : public ProgressBox {
   ProgressWork work_;
 };
 
-// The batch's side of the prompts.
+// Prompts on the batch's thread.
 class BatchThread::Questions : public Prompts {
  public:
   Questions(BatchThread& batch, const ThumbnailOptions& thumbnails)
@@ -168,7 +168,7 @@ void BatchThread::Start(std::vector<BatchFile> files, BatchFunction function, Ba
 void BatchThread::StartWork(BatchJob job, Work work) {
   task_.Wait();
   job_ = std::move(job);
-  // The settings belong to the window's thread.
+  // Settings belong to the window's thread.
   job_.remember = [this](Remembered what, int32_t value) {
     PostToWindows([what, value] { StoreRemembered(what, value); });
   };
@@ -192,7 +192,7 @@ void BatchThread::StartWork(BatchJob job, Work work) {
 }
 
 bool BatchThread::AskWindow(const std::function<void()>& action) {
-  // Shared with the window's thread, which may come to it after the batch was given up.
+  // Shared with the window's thread, which may run it after the batch was aborted.
   struct Turn {
     std::mutex mutex;
     bool done = false;

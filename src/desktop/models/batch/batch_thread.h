@@ -18,10 +18,10 @@
 
 namespace fotomill::desktop {
 
-// What the overwrite prompt shows beside its question, made where the batch runs.
+// Previews for the overwrite prompt, made on the batch's thread.
 struct OverwritePreview {
   RgbImage existing, incoming;
-  std::string existingText, incomingText;  // size, dimensions and date of each, a line each
+  std::string existingText, incomingText;  // one line each for size, dimensions and date
 };
 
 using OverwritePreviewMaker = std::function<OverwritePreview()>;
@@ -30,11 +30,11 @@ using OverwritePreviewMaker = std::function<OverwritePreview()>;
 class BatchWindows {
  public:
   virtual ~BatchWindows() = default;
-  // A batch begins; its box comes up, empty.
+  // A batch starts; show an empty box.
   virtual void BatchOpened() = 0;
-  // `outcome` is that of the file that the line is about, empty for lines about the batch.
+  // `outcome` belongs to the file of the line; empty for lines about the batch.
   virtual void BatchLine(const ProgressLine& line, const FileOutcome& outcome) = 0;
-  // The line that tells which file is in work.
+  // Shows which file is being processed.
   virtual void BatchStatus(const std::string& status) = 0;
   virtual void BatchWork(const ProgressWork& work) = 0;
   // The end: the box stays open to be read, or goes.
@@ -47,42 +47,42 @@ class BatchWindows {
   virtual NameAnswer AskDestinationName(const NameQuestion& question) = 0;
   virtual std::optional<std::string> AskPassword(const std::string& path) = 0;  // nullopt: Cancel
   virtual bool ConfirmFormat(const std::string& question) = 0;
-  // `yes`: the text of the button that agrees.
+  // `yes`: label of the confirm button.
   virtual bool Confirm(const std::string& question, const std::string& yes) = 0;
-  // After everything else. MemoryAllocationError where the batch itself ran out of memory.
+  // Called last. MemoryAllocationError if the batch itself ran out of memory.
   virtual void BatchEnded(Status status, const BatchJob& job) = 0;
 };
 
-// Runs one batch apart; its reports and questions go to the windows by `post`, which has to run
-// what it is given on the window's thread, in order. A question holds the batch until it is
+// Runs a batch in the background; reports and prompts go to the windows with `post`, which must
+// run its argument on the window's thread, in order. The batch waits until a prompt is
 // answered.
 class BatchThread {
  public:
   using Post = std::function<void(std::function<void()>)>;
 
-  // The windows must outlive it.
+  // `windows` must outlive this object.
   BatchThread(BatchWindows& windows, Post post) : windows_(windows), post_(std::move(post)) {}
-  // Asks a running batch to stop, answers its questions with no, and waits for it. `post` must not
-  // be waiting for this.
+  // Stops a running batch, answers its prompts with no, and waits for it. `post` must not be
+  // waiting for this.
   ~BatchThread();
   BatchThread(const BatchThread&) = delete;
   BatchThread& operator=(const BatchThread&) = delete;
 
-  // Begins RunBatch with these; to be called when nothing runs. `job.box` and `job.prompts` are set
-  // here.
+  // Starts RunBatch; must not be called while running. Sets `job.box` and
+  // `job.prompts`.
   void Start(std::vector<BatchFile> files, BatchFunction function, BatchJob job);
-  // Any other work that reports to a box: `work` gets the job, with box and prompts set, and
-  // returns its status.
+  // Any other work that reports to a box: `work` receives the job, with box and prompts
+  // set.
   using Work = std::function<Status(BatchJob& job)>;
   void StartWork(BatchJob job, Work work);
-  // Asks the batch to stop; it finishes what is in work.
+  // Stops the batch after the current files.
   void Abort() { job_.stop.Stop(); }
   bool Running() const { return running_; }  // until BatchEnded
 
  private:
   class Box;
   class Questions;
-  // Runs `action` on the window's thread and waits for it. False when the batch is being given up.
+  // Runs `action` on the window's thread and waits. False if the batch is being aborted.
   bool AskWindow(const std::function<void()>& action);
   void PostToWindows(std::function<void()> action) { post_(std::move(action)); }
 
@@ -91,12 +91,12 @@ class BatchThread {
   BatchJob job_;
   std::mutex mutex_;
   std::condition_variable answered_;
-  bool given_ = false;    // up
-  bool running_ = false;  // belongs to the window's thread
-  BackgroundTask task_;   // last: it uses the rest
+  bool given_ = false;    // aborted
+  bool running_ = false;  // window's thread only
+  BackgroundTask task_;   // must be last: it uses the other members
 };
 
-// What the overwrite prompt shows of the file that is there and of the new picture, which may be
+// Previews of the existing file and of the new picture, which may be
 // missing.
 OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side,
                                       const ThumbnailOptions& options);

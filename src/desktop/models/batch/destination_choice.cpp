@@ -29,7 +29,7 @@ int32_t RowOf(const std::string& extension) {
   return FindPluginFormat("x." + extension);
 }
 
-// The folder, or the nearest one above it that is there.
+// The folder, or its nearest existing parent.
 std::string ExistingFolder(std::string folder) {
   while (folder.size() > 1 && !platform::FileExists(folder)) {
     if (folder.back() == platform::kSeparator) folder.pop_back();

@@ -9,23 +9,23 @@
 
 namespace fotomill::desktop {
 
-// The formats of the destination step, and what the user chose there last.
+// An output format to choose from.
 struct DestinationFormat {
-  std::string extension;    // lower case, without dot
+  std::string extension;    // lowercase, without dot
   std::string description;  // "(PNG) Portable Network Graphics"
-  int32_t row = kNoFormat;  // of the registry; the spare row for plug-in formats
+  int32_t row = kNoFormat;  // in the registry; the spare row for plug-in formats
 };
-// What can be written, in the order of the registry, plug-in formats last.
+// All writable formats in registry order, plug-in formats last.
 std::vector<DestinationFormat> DestinationFormats();
 // Which of these formats, at least one, the step begins with: the last one used
 // (LastFormatSelected), or DefaultFileExtension if UseDefaultDestFormat is on or none was used yet.
 size_t FirstFormat(const std::vector<DestinationFormat>& formats);
 
-// What the destination step asks for.
+// The user's choices in the destination dialog.
 struct DestinationChoice {
   std::string extension;
   std::string folder;  // empty: beside each source
-  bool reduce = true;  // colors of pictures that are too deep for the format
+  bool reduce = true;  // reduce colors if the format supports fewer
   bool autoOrient = true;
   bool keepMetadata = true;
   std::string comment = {};  // of all outputs; empty: each has that of its source
@@ -44,28 +44,28 @@ enum class DestinationPart { Format, Folder, Both };
 // PromptForDestination no folder.
 std::vector<DestinationPart> DestinationParts();
 
-// What is wrong with a choice, a whole sentence; empty when nothing is.
+// What is wrong with a choice, a sentence; empty if valid.
 std::string DestinationProblem(const DestinationChoice& choice);
 
-// The folder that a typed one means, as a whole path: relative ones are inside `shown`, the folder
-// of the browser. Empty stays empty.
+// Makes an entered folder absolute: relative ones are inside `shown`, the browser's folder. Empty
+// stays empty.
 std::string WholeFolder(const std::string& typed, const std::string& shown);
 
-// What the destination step tells before anything is written.
+// A preview of the output.
 struct DestinationOutlook {
-  std::string first;       // path of the first file's output, free or not
-  uint64_t freeSpace = 0;  // bytes where it goes; 0: unknown
-  size_t existing = 0;     // outputs whose name is taken, among the first kMostLookedUp
+  std::string first;       // path of the first output, existing or not
+  uint64_t freeSpace = 0;  // bytes at the destination; 0: unknown
+  size_t existing = 0;     // existing outputs, among the first kMostLookedUp
 };
 inline constexpr size_t kMostLookedUp = 500;
-// Of a choice without a problem, for at least one file.
+// For a valid choice and at least one file.
 DestinationOutlook OutlookOf(const DestinationChoice& choice,
                              const std::vector<std::string>& files);
 
-// A job that writes to the choice, whatever DestForceSourceDir says. The choice has no problem.
+// A job for a valid choice, ignoring DestForceSourceDir.
 BatchJob JobFor(const DestinationChoice& choice);
 
-// What that job does to every picture of the choice.
+// How that job processes each picture.
 BatchFunction FunctionFor(const DestinationChoice& choice, const BatchJob& job);
 
 }  // namespace fotomill::desktop

@@ -10,7 +10,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr int32_t kMostPixels = 100000;  // along an edge
+constexpr int32_t kMostPixels = 100000;  // per edge
 
 std::optional<NamedSize> ReadSize(std::string_view text) {
   const size_t comma = text.find(',');

@@ -36,7 +36,7 @@ int CompareDimensions(const FolderItem& a, const FolderItem& b) {
 
 using Comparison = int (*)(const FolderItem& a, const FolderItem& b);
 
-// By choice::SortMode; equal ones, and all of kSortName, are in order of their names.
+// By choice::SortMode; ties, and kSortName, are sorted by name.
 constexpr Comparison kComparisons[] = {nullptr,     CompareType,  CompareSize,
                                        CompareDate, CompareTaken, CompareDimensions};
 

@@ -71,8 +71,8 @@ size_t CellLayout::Move(size_t line, Step step) const {
   const int64_t last = static_cast<int64_t>(count_) - 1;
   const int64_t page = int64_t{std::max(windowHeight_ / RowHeight(), 1)} * columns_;
   const int64_t from = static_cast<int64_t>(line);
-  // A step over rows keeps the column; if there is no cell in it, up stays, and down goes to the
-  // last one.
+  // Vertical steps keep the column; if there is no cell there, up does not move, and down moves to
+  // the last one.
   const auto rows = [&](int64_t distance) {
     if (from + distance < 0) return distance == -columns_ ? from : from % columns_;
     if (from + distance <= last) return from + distance;

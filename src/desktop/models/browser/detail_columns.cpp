@@ -35,7 +35,7 @@ std::string DepthText(const FolderItem& item) {
                         : TrCount("%1 bit", "%1 bits", static_cast<uint64_t>(item.bits));
 }
 
-// 20040831223208 as "2004-08-31 22:32".
+// Formats 20040831223208 as "2004-08-31 22:32".
 std::string TakenText(const FolderItem& item) {
   if (item.taken <= 0) return {};
   const auto part = [&](int64_t unit, int64_t size) {

@@ -10,30 +10,30 @@
 
 namespace fotomill::desktop {
 
-// What a column of the details tells. The first one is always shown.
+// A column of the details view. The first one is always shown.
 struct DetailFacts {
   const char* title;
-  int32_t width;  // device-independent pixels, until the user changes it
-  bool number;    // to the right
-  bool shown;     // unless the user chooses otherwise
-  int32_t sort;   // choice::SortMode that a click on its head asks for, -1 for none
+  int32_t width;  // default, in device-independent pixels
+  bool number;    // right-aligned
+  bool shown;     // by default
+  int32_t sort;   // choice::SortMode for clicks on the header, -1: none
   std::string (*text)(const FolderItem& item);
 };
-// Every column there is, in the order in which they are at first.
+// All columns, in default order.
 std::span<const DetailFacts> AllDetails();
 
-// A column as the user has arranged it.
+// A column as arranged by the user.
 struct DetailColumn {
-  size_t detail = 0;  // of AllDetails()
+  size_t detail = 0;  // index in AllDetails()
   int32_t width = 0;
   bool shown = true;
 
   bool operator==(const DetailColumn&) const = default;
 };
-using DetailColumns = std::vector<DetailColumn>;  // from left to right, every detail once
+using DetailColumns = std::vector<DetailColumn>;  // from left to right, each detail once
 
-// "Name:260,Size:110,-Depth:70", hidden ones behind a "-", and back. What the text lacks comes
-// last, as it is without a text; what is not understood is passed over.
+// Converts to and from "Name:260,Size:110,-Depth:70", with "-" for hidden columns. Missing columns
+// come last, with defaults; invalid entries are ignored.
 DetailColumns ParseDetailColumns(std::string_view text);
 std::string DetailColumnsText(const DetailColumns& columns);
 

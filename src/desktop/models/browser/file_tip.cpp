@@ -20,7 +20,7 @@ namespace {
 
 constexpr size_t kLongestComment = 300;  // bytes
 
-// The beginning of a text that is not cut inside a character.
+// The beginning of a text, not cut inside a character.
 std::string Beginning(std::string_view text) {
   text = text.substr(0, text.find('\0'));
   while (!text.empty() && static_cast<unsigned char>(text.back()) <= ' ') text.remove_suffix(1);
@@ -28,7 +28,7 @@ std::string Beginning(std::string_view text) {
   return std::string(CutText(text, kLongestComment)) + "...";
 }
 
-// The lines that need the file's header.
+// Adds the lines that need the file's header.
 void AddHeaderLines(const std::string& path, Status known, std::vector<std::string>& lines) {
   PicturePointer picture;
   const Status status =

@@ -15,7 +15,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// Formats by extension, so that a folder of 100,000 files asks the registry a handful of times.
+// Caches formats by extension; a folder of 100,000 files needs only a few registry lookups.
 class FormatFinder {
  public:
   int32_t Find(std::string_view name) {

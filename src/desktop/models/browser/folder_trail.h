@@ -6,17 +6,17 @@
 
 namespace fotomill::desktop {
 
-// The folders that a tab went through, the first one first, and where among them it is.
+// The visited folders of a tab, oldest first, and the current position.
 class FolderTrail {
  public:
-  // Goes to a folder that was not gone back or forward to; what lay ahead is forgotten, and so are
-  // the oldest of many.
+  // Goes to a new folder, discarding those ahead, and the oldest ones if there are too
+  // many.
   void Go(const std::string& folder);
   // Whether there is a folder `steps` back (negative) or ahead.
   bool CanStep(int steps) const {
     return steps >= -static_cast<int>(place_) && place_ + steps < folders_.size();
   }
-  // Takes steps that it can; the folder there.
+  // Moves; CanStep must allow it. Returns the folder there.
   const std::string& Step(int steps) { return folders_[place_ += static_cast<size_t>(steps)]; }
   // The folder `steps` back (negative) or ahead; CanStep must allow it.
   const std::string& FolderAt(int steps) const {

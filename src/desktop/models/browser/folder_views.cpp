@@ -22,7 +22,7 @@ bool FitsLine(std::string_view folder) {
          folder.find_first_of(std::string_view("\n\r\0", 3)) == std::string_view::npos;
 }
 
-// A number up to `last` in front of a comma, taken off the line.
+// Removes a number up to `last` and the comma after it from the line.
 std::optional<int32_t> ReadField(std::string_view& line, int32_t last) {
   const size_t comma = line.find(',');
   if (comma == std::string_view::npos) return std::nullopt;

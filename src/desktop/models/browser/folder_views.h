@@ -10,7 +10,7 @@
 
 namespace fotomill::desktop {
 
-// How a browser shows a folder.
+// The view of a folder.
 struct FolderView {
   BrowserModes modes;
   bool descending = false;
@@ -18,25 +18,25 @@ struct FolderView {
   bool operator==(const FolderView&) const = default;
 };
 
-// How folders were last asked to be shown: order, direction and view mode, not where thumbnails
-// come from. Kept in the data folder in the file "FMWFolderViews.txt", a line
-// "VIEW,SORT,DESCENDING,FOLDER" each, the latest first, 500 at most.
+// The user's last choices per folder: order, direction and view mode, but not the thumbnail mode.
+// Stored in the file "FMWFolderViews.txt" in the data folder, in lines
+// "VIEW,SORT,DESCENDING,FOLDER", latest first, at most 500.
 class FolderViews {
  public:
-  // `otherwise` with what is kept of a folder.
+  // The view stored for a folder, with all else from `otherwise`.
   FolderView Find(const std::string& folder, const FolderView& otherwise) const;
-  // Remembers how a folder is shown, as the latest one.
+  // Stores the view of a folder, as the latest one.
   void Keep(const std::string& folder, const FolderView& view);
 
-  // Takes up what the file holds; without one, nothing is kept of any folder.
+  // Loads the file; if missing, the list is empty.
   void Load();
-  // Merges what was kept since the last call into the file, which other processes change too. False
-  // when it cannot be written.
+  // Merges changes since the last call into the file, which other processes may change too. False
+  // if it cannot be written.
   [[nodiscard]] bool Save();
 
-  // The text of the file. Lines that are not understood are passed over.
+  // Parses the text of the file, ignoring invalid lines.
   static FolderViews Parse(std::string_view text);
-  // The text that Parse reads.
+  // The text for Parse.
   std::string Text() const;
 
  private:
@@ -44,8 +44,8 @@ class FolderViews {
     std::string folder;
     FolderView view;
   };
-  std::vector<Entry> entries_;  // the latest first
-  std::vector<Entry> unsaved_;  // the latest last
+  std::vector<Entry> entries_;  // latest first
+  std::vector<Entry> unsaved_;  // latest last
 };
 
 }  // namespace fotomill::desktop

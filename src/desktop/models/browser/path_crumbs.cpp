@@ -16,7 +16,7 @@ std::vector<Crumb> CrumbsOf(const std::string& folder) {
     const std::string_view name = platform::FileNameOf(at);
     crumbs.push_back({name.empty() ? at : std::string(name), at});
     std::string above = platform::AbsolutePath(platform::JoinFolder(at, ".."));
-    if (above.size() >= at.size()) break;  // the root, or a path that is not absolute
+    if (above.size() >= at.size()) break;  // the root, or not an absolute path
     at = std::move(above);
   }
   std::ranges::reverse(crumbs);
@@ -30,7 +30,7 @@ std::vector<std::string> Completions(const std::string& typed,
   std::vector<std::string> paths;
   if (begun.empty() || std::ranges::find(names, begun) != names.end()) return paths;
   for (const std::string& name : names) {
-    // Other bytes cannot be in a field for text.
+    // Other names cannot be entered in a text field.
     if (IsUtf8(name) && EqualIgnoringCase(std::string_view(name).substr(0, begun.size()), begun))
       paths.push_back(folder + name);
   }

@@ -7,7 +7,7 @@
 
 namespace fotomill::desktop {
 
-// One folder on the way to another.
+// A folder in a path.
 struct Crumb {
   std::string label;
   std::string folder;
@@ -15,18 +15,18 @@ struct Crumb {
   bool operator==(const Crumb&) const = default;
 };
 
-// The folders on the way to a folder given by its absolute path, the root first, the folder itself
-// last.
+// The folders in an absolute path, from the root to the folder
+// itself.
 std::vector<Crumb> CrumbsOf(const std::string& folder);
 
-// How a typed path may continue, with the names of the folders in the folder that it names: whole
-// paths in their order, those of equal case first. None for a path that is complete: it ends in a
-// separator, or in one of the names.
+// Completions of a typed path, given the names in its folder: full paths in the same order, but
+// those with matching case first. Empty if the path is complete: it ends with a separator or one of
+// the names.
 std::vector<std::string> Completions(const std::string& typed,
                                      const std::vector<std::string>& names);
 
-// Crumbs so wide are put into a room from the last one on; where not all of them fit, a button
-// `more` wide stands for the others. The first one shown; the last one always is.
+// The first crumb to show: as many of the last ones as fit in `room`, at least one. If not all fit,
+// a button of width `more` replaces the others.
 size_t FirstCrumbShown(std::span<const int> widths, int room, int more);
 
 }  // namespace fotomill::desktop

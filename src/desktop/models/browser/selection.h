@@ -7,53 +7,53 @@
 
 namespace fotomill::desktop {
 
-// Stands for no line.
+// No line.
 inline constexpr size_t kNoLine = static_cast<size_t>(-1);
 
-// What is selected among the lines of a list, which line has the focus, and from where a range
-// extends: the rules that mouse and keyboard follow in every file list. Lines are counted from 0.
+// Selection, focus and range anchor in a list: implements the mouse and keyboard rules of all file
+// lists. Lines are counted from 0.
 class Selection {
  public:
-  // A list of `count` lines with nothing selected.
+  // A list of `count` lines, none selected.
   void Reset(size_t count);
-  // The list anew: `selected` for each line, and where focus and anchor are now, kNoLine for
-  // nowhere.
+  // Replaces the list: `selected` for each line, focus and anchor (kNoLine:
+  // none).
   void Assign(std::vector<bool> selected, size_t focus, size_t anchor);
 
-  // How many lines there are and how many are selected; focus and anchor are kNoLine when they are
-  // nowhere.
+  // Number of lines and of selected lines; focus and anchor may be
+  // kNoLine.
   size_t Count() const { return selected_.size(); }
   size_t SelectedCount() const { return selectedCount_; }  // at most Count
   // False beyond the last line.
   bool IsSelected(size_t line) const { return line < selected_.size() && selected_[line]; }
   size_t Focus() const { return focus_; }    // a line, or kNoLine
-  size_t Anchor() const { return anchor_; }  // where a range begins that Shift extends
+  size_t Anchor() const { return anchor_; }  // start of a range extended with Shift
   // Selected lines in list order.
   std::vector<size_t> SelectedLines() const;
 
-  // A click, with Shift to extend from the anchor and Ctrl to keep what is selected.
+  // Handles a click; Shift extends from the anchor, Ctrl keeps the selection.
   void Click(size_t line, bool shift, bool control);
-  // A right click: selects the line unless it is selected already.
+  // Handles a right click: selects the line, unless it is selected.
   void ContextClick(size_t line);
-  // A click into empty space.
+  // Handles a click on empty space.
   void ClickBlank(bool clears) {
     if (clears) SelectNone();
   }
-  // The focus goes to a line by keyboard: alone it selects the line, with Shift the range from the
-  // anchor, with Ctrl it moves without selecting.
+  // Moves the focus with the keyboard: selects only this line; with Shift the range from the
+  // anchor; with Ctrl nothing.
   void MoveFocus(size_t line, bool shift, bool control);
-  void ToggleFocus();  // selects the focused line, or not any more; others stay
-  void SelectOnly(size_t line);  // focus and anchor go there
-  // The focus stays.
+  void ToggleFocus();            // toggles the focused line, keeping others
+  void SelectOnly(size_t line);  // moves focus and anchor there
+  // Keeps the focus.
   void SelectAll();
-  void SelectNone();  // the focus stays
-  void Invert();  // selects what was not, and nothing else
-  void Set(size_t line, bool selected);  // focus and anchor stay
+  void SelectNone();                     // keeps the focus
+  void Invert();                         // inverts the selection
+  void Set(size_t line, bool selected);  // keeps focus and anchor
 
-  // The rubber band: `inside` are the lines that it touches now; with `keep` they add to what was
-  // selected when it began.
+  // Rubber band: selects the lines `inside` it; with `keep`, in addition to the selection at its
+  // start.
   void BeginBand(bool keep);
-  // Lines that the band has left get back what they were.
+  // Lines that the band has left get their previous state back.
   void MoveBand(std::span<const size_t> inside);
 
  private:

@@ -39,7 +39,7 @@ Shade Readable(Shade wanted, Shade other) {
       if (Contrast(shade, other) >= kReadable) return shade;
     }
   }
-  return wanted;  // never: black or white is readable on everything
+  return wanted;  // not reached: black or white is always readable
 }
 
 ListPalette PaletteOf(Shade background, Shade text, Shade highlight, Shade highlightText) {

@@ -4,34 +4,34 @@
 
 namespace fotomill::desktop {
 
-// A color of the screen, in sRGB.
+// A screen color, in sRGB.
 struct Shade {
   uint8_t red = 0, green = 0, blue = 0;
 
   bool operator==(const Shade&) const = default;
 };
 
-// How well two shades are told apart, from 1 to 21, as WCAG 2 measures it; texts want 4.5.
+// Contrast ratio of two shades, 1 to 21, as defined by WCAG 2; text should have 4.5.
 double Contrast(Shade a, Shade b);
 inline constexpr double kReadable = 4.5;
 
-// `part` of the way from one shade to the other.
+// Interpolates between two shades.
 Shade Blend(Shade from, Shade to, double part);
-// The shade next to `wanted` that is readable on, or under, `other`: nearer to black or to white,
-// whichever takes less.
+// The closest shade to `wanted` that is readable on `other`, lightened or darkened as little as
+// possible.
 Shade Readable(Shade wanted, Shade other);
 
-// The shades of a canvas that lists files. Every text is readable on what it is on.
+// Colors of a file list. All texts are readable on their backgrounds.
 struct ListPalette {
   Shade background, text;
-  Shade selected, selectedText;  // with the keyboard
-  Shade resting, restingText;    // selected, while the keyboard is elsewhere
-  Shade frame, faint;            // lines and fillings
-  Shade note;                    // text that matters less, on background or filling
-  Shade fault;                   // text about what went wrong, likewise
+  Shade selected, selectedText;  // if the list is focused
+  Shade resting, restingText;    // selected, if the list is not focused
+  Shade frame, faint;            // lines and fills
+  Shade note;                    // secondary text, on background or fill
+  Shade fault;                   // error text, likewise
 };
 
-// From the system's own colors, light or dark.
+// Derived from the system colors, light or dark.
 ListPalette PaletteOf(Shade background, Shade text, Shade highlight, Shade highlightText);
 
 }  // namespace fotomill::desktop

@@ -22,7 +22,7 @@ namespace {
 
 constexpr const char* kExtension = ".png";
 
-// The first path that is free; empty if there is none.
+// The first unused path; empty if there is none.
 std::string FreePath(const std::string& folder) {
   const std::string_view wanted = settings.ClipboardPictureName.view();
   const std::string name(IsPlainName(wanted) && !wanted.empty()
@@ -48,7 +48,7 @@ Status ToRecord(const PastedPicture& pasted, PictureRecord& picture) {
   return Status::Ok;
 }
 
-// Writes it under a name that is free there, and says which.
+// Writes it under an unused name, returned in `path`.
 Status Write(const PastedPicture& pasted, const std::string& folder, std::string& path) {
   const PicturePointer picture = NewPictureRecord(ReadOptionsFromSettings().alphaBackground);
   if (picture == nullptr) return Status::MemoryAllocationError;

@@ -12,12 +12,12 @@ namespace fotomill::desktop {
 // A picture from the clipboard or from a drag.
 struct PastedPicture {
   RgbImage pixels;
-  std::vector<uint8_t> alpha;  // a byte a pixel, top row first; empty for none
+  std::vector<uint8_t> alpha;  // one byte per pixel, top row first; may be empty
 };
 
-// Keeps a picture that came from another program: as a PNG file in `folder`, called
-// ClipboardPictureName, or that with a number where the name is taken. The operation makes that
-// file; a failure says why there is none. May take long; any thread.
+// Saves a picture from another program as a PNG file in `folder`, named ClipboardPictureName, with
+// a number if that is taken. The operation creates that file; a failure has the reason. May take
+// long; any thread.
 FileOperationResult KeepPastedPicture(const PastedPicture& pasted, const std::string& folder);
 
 }  // namespace fotomill::desktop

@@ -7,8 +7,8 @@
 
 namespace fotomill::desktop {
 
-// Turns the picture in a file and keeps what the file was. Neither step nor failure if it is
-// so already.
+// Turns the picture in a file and keeps the old contents. Neither step nor failure if nothing
+// changes.
 FileOperationResult TurnOneFile(const std::string& path, Orientation turn);
 
 }  // namespace fotomill::desktop

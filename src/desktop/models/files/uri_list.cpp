@@ -14,8 +14,7 @@ bool IsPlain(char c) {
          std::string_view("-._~/").find(c) != std::string_view::npos;
 }
 
-// A text with its escapes read; empty if one is broken or stands for a zero byte, which no path
-// has.
+// Decodes escapes; empty if one is invalid or a NUL, which paths cannot have.
 std::string Unescaped(std::string_view text) {
   std::string result;
   for (size_t i = 0; i < text.size(); ++i) {
@@ -32,7 +31,7 @@ std::string Unescaped(std::string_view text) {
   return result;
 }
 
-// The path of one URI; empty if it names no file of this machine.
+// The path of a URI; empty if it is not a local file.
 std::string PathOfUri(std::string_view uri) {
   if (!EqualIgnoringCase(uri.substr(0, kScheme.size()), kScheme)) return {};
   uri.remove_prefix(kScheme.size());

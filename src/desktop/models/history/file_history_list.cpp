@@ -31,8 +31,7 @@ constexpr HistoryColumnFacts kColumns[] = {
 };
 // clang-format on
 
-// Negative when `a` is before `b`. Where the column does not decide, the names do, and then the
-// last use.
+// Negative if `a` comes before `b`. Ties are sorted by name, then last use.
 int Compare(const HistoryRow& a, const HistoryRow& b, int32_t column) {
   const auto larger = [](auto left, auto right) {
     return left > right ? -1 : left < right ? 1 : 0;

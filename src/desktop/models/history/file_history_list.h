@@ -9,18 +9,18 @@
 
 namespace fotomill::desktop {
 
-// One column of the file history's list, in the order of choice::HistoryColumn. The key holds its
-// width in ten-thousandths of the list's.
+// A column of the file history's list, in the order of choice::HistoryColumn. The key has its width
+// in 1/10000 of the list's width.
 struct HistoryColumnFacts {
   const char* title;
   KeyNumber width;
-  bool number;  // is at the right
+  bool number;  // right-aligned
 };
-// All columns, and what the widths of those that are shown add up to.
+// All columns, and the total width of those shown.
 std::span<const HistoryColumnFacts> HistoryColumns();
 inline constexpr int32_t kWholeWidth = 10000;
 
-// An entry of the history, kept after the history itself was freed.
+// A copy of a history entry, valid after the history is freed.
 struct HistoryRow {
   std::string path;
   int32_t function = 0;
@@ -28,28 +28,28 @@ struct HistoryRow {
   uint64_t size = 0;                  // bytes
 };
 
-// The entries of the file history in the order of a column. Belongs to the main thread.
+// The entries of the file history, sorted by a column. Main thread only.
 class FileHistoryList {
  public:
-  // Takes up the history as its file has it now, and sorts it as FileHistorySortMode says. False
-  // when there is a file that cannot be read as one.
+  // Loads the current history file, and sorts by FileHistorySortMode. False if the file exists but
+  // is invalid.
   bool Read();
-  // Sorts by a column; the one that sorts already, the other way round. Times and sizes begin with
-  // the largest.
+  // Sorts by a column; reverses the order if it is the current one. Times and sizes start with the
+  // largest.
   void SortBy(int32_t column);
   int32_t SortColumn() const { return column_; }
   bool Reversed() const { return reversed_; }
 
-  // Rows from 0 in the order shown; a cell's text is as the list shows it, dates and sizes in
-  // words.
+  // Rows from 0 in display order; cell texts as displayed, with formatted dates and
+  // sizes.
   size_t Count() const { return rows_.size(); }
   const HistoryRow& Row(size_t row) const { return rows_[row]; }
   std::string Cell(size_t row, size_t column) const;
 
-  // Takes entries out of the history file; what other programs recorded meanwhile stays. False when
-  // it could not be written: the entries are still there.
+  // Removes entries from the history file, keeping what other programs recorded meanwhile. False,
+  // with the entries unchanged, if it could not be written.
   bool Remove(std::vector<size_t> rows);
-  // Deletes the history file. False when it could not be deleted.
+  // Deletes the history file. False on failure.
   bool Clear();
 
  private:
@@ -60,8 +60,8 @@ class FileHistoryList {
   bool reversed_ = false;
 };
 
-// Whether a row gets a thumbnail: not from drives of the kinds whose bits FileHistoryDriveTypes has
-// set (2 removable, 16 optical by default), where reading a picture may mean waiting.
+// Whether to load a row's thumbnail: not from types of drives set in FileHistoryDriveTypes (by
+// default 2 removable, 16 optical), where reading may be slow.
 bool GetsThumbnail(const std::string& path);
 
 }  // namespace fotomill::desktop

@@ -13,7 +13,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// Gathers a walk as rows and as the text that the core makes of it.
+// Collects a walk as rows, and as text.
 class Gather : public ExifSink {
  public:
   Gather(ExifReport& report, const ExifTextOptions& options)

@@ -13,11 +13,11 @@
 
 namespace fotomill::desktop {
 
-// One line of the EXIF viewer: the head of a directory, or a value below it.
+// A line of the EXIF viewer: a directory heading, or a value.
 struct ExifRow {
   bool heading = false;
   uint16_t tag = 0;
-  std::string name;  // "DIRECTORY EXIF", or the tag's name, with its type where that is wanted
+  std::string name;  // "DIRECTORY EXIF", or the tag's name, optionally with type
   std::string text;
 };
 
@@ -33,14 +33,14 @@ ExifReportOptions ExifReportOptionsFromSettings();
 // The EXIF of one picture file as the viewer shows it.
 struct ExifReport {
   Status status = Status::Ok;
-  // a sentence for people if there is nothing to show, or not all; empty otherwise
+  // an error message if not everything can be shown; else empty
   std::string problem;
   // those of the block, then what its GPS directory means: places, and how far they are
   std::vector<ExifRow> rows;
-  // the same lines as one text, to be copied, saved or printed
+  // all lines as text, for copying, saving and printing
   std::string text;
-  RgbImage thumbnail;                   // decoded; empty if there is none that can be
-  std::vector<uint8_t> thumbnailBytes;  // as it is in the block: a JPEG stream
+  RgbImage thumbnail;                   // decoded; empty if missing or damaged
+  std::vector<uint8_t> thumbnailBytes;  // as stored: a JPEG stream
 };
 
 // Reads and walks a file's EXIF block. Takes as long as the disk takes; any thread may call it.

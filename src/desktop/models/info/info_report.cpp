@@ -24,7 +24,7 @@ namespace {
 constexpr const char* kDetailsTitle = TrLater("Details");
 constexpr const char* kFileName = TrLater("File name");
 
-// A resolution: whole, or with two digits.
+// Formats a resolution: integer, or two decimals.
 std::string DpiText(double dpi) {
   return DecimalText(dpi, std::abs(dpi - std::round(dpi)) < 0.005 ? 0 : 2);
 }
@@ -37,8 +37,7 @@ std::string PixelsText(int32_t width, int32_t height) {
 
 std::string BytesText(uint64_t bytes) { return TrCount("%1 byte", "%1 bytes", bytes); }
 
-// How large the picture is on paper at its own resolution, or at the assumed one when the file has
-// none.
+// Print size at the picture's resolution, or at the default one if it has none.
 std::string PrintSize(const PictureRecord& picture, const InfoOptions& options) {
   const bool own = picture.metadata.dpiX > 0 && picture.metadata.dpiY > 0;
   const double assumed = std::max(options.resolution, 1);
@@ -115,8 +114,7 @@ InfoSection DetailsOf(const PictureRecord& picture) {
     if (colon == std::string_view::npos) {
       section.lines.push_back({{}, std::string(line)});
     } else {
-      // Codecs put blanks in front of the names, so that the values of their lines stand in one
-      // column.
+      // Codecs pad names with blanks to align their values.
       const std::string_view name = line.substr(0, colon);
       section.lines.push_back(
           {std::string(name.substr(std::min(name.find_first_not_of(' '), colon))), std::string(line.substr(colon + 2))});
@@ -162,7 +160,7 @@ std::vector<Compared> Compare(std::span<const FileInfo> files) {
   std::unordered_map<std::string_view, size_t> places;
   for (const FileInfo& file : files) {
     for (const InfoSection& section : file.sections) {
-      // they mean something in files of one format only
+      // only comparable within a format
       if (section.title == Tr(kDetailsTitle)) continue;
       for (const InfoLine& line : section.lines) {
         if (line.label.empty() || line.label == Tr(kFileName)) continue;

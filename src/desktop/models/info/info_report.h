@@ -12,7 +12,7 @@ namespace fotomill::desktop {
 
 // A line of the report: a label with its value.
 struct InfoLine {
-  std::string label;  // empty for a line that is a text of its own
+  std::string label;  // empty for a line of plain text
   std::string value;
 };
 
@@ -22,36 +22,36 @@ struct InfoSection {
   std::vector<InfoLine> lines;
 };
 
-// How "Get info" tells it.
+// Options of "Get info".
 struct InfoOptions {
-  int32_t resolution = 96;  // dots per inch of pictures whose file names none
+  int32_t resolution = 96;  // dots per inch, for pictures without resolution
   int32_t units = 0;        // choice::LengthUnit of the print size
   int32_t dateMode = 0;     // choice::DateMode
   ExifReportOptions exif;
 };
 InfoOptions InfoOptionsFromSettings();
 
-// What "Get info" tells of one file.
+// Information about one file.
 struct FileInfo {
   std::string path;
   Status status = Status::Ok;
-  std::string problem;  // a sentence, empty when all went well
-  std::string format;   // the row's description
+  std::string problem;  // a sentence; empty on success
+  std::string format;   // the format's description
   int32_t width = 0, height = 0;
   uint64_t size = 0, imageBytes = 0;
   std::vector<InfoSection> sections;
 };
 
-// Opens a file's header and gathers its facts; any thread may call it.
+// Reads a file's header and collects its facts; any thread.
 FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options);
 
-// What several files have together: totals, what is the same in all of them, and what differs with
-// its values.
+// A summary of several files: totals, common values, and differing
+// ones.
 std::vector<InfoSection> SummaryOf(std::span<const FileInfo> files);
 
-// Sections as a text: titles, and lines "label: value" set in beneath them.
+// Formats sections as text: titles, with indented lines "label: value".
 std::string TextOf(std::span<const InfoSection> sections);
-// One file's, under its path.
+// The same for one file, below its path.
 std::string TextOf(const FileInfo& file);
 
 }  // namespace fotomill::desktop

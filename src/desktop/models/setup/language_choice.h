@@ -4,10 +4,10 @@
 
 namespace fotomill::desktop {
 
-// The language that the user chose for the windows, in the section "Desktop" of the configuration
-// file. Empty: the language of the system.
+// The user's language for the windows, from the section "Desktop" of the configuration file. Empty:
+// system language.
 std::string StoredLanguage();
-// Stores it; false if it could not be written. It takes effect at the next start.
+// Stores it; false if it cannot be written. Takes effect at the next start.
 bool StoreLanguage(const std::string& code);
 
 }  // namespace fotomill::desktop

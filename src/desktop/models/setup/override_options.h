@@ -8,10 +8,10 @@
 
 namespace fotomill::desktop {
 
-// The options that a destination step offers for one format, by its extension, in any case and by
-// any of its rows' extensions; null when it has none or cannot be written.
+// The options dialog's settings for a format, given any of its extensions, in any case; null if
+// there are none or the format cannot be written.
 const FormatSettings* FindOverrideOptions(std::string_view extension);
-// Their rows as Setup has them, those of the format first.
+// Their rows as in Setup, those of the format first.
 std::vector<SetupItem> ItemsOf(const FormatSettings& options);
 
 }  // namespace fotomill::desktop

@@ -9,7 +9,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// Topics that buttons name, and where the manual has them.
+// Topics of Help buttons, and their headings in the manual.
 struct Topic {
   std::string_view topic, heading;
 };
@@ -18,8 +18,7 @@ constexpr Topic kTopics[] = {
     {"RENAME", "Renaming in sequence"},
 };
 
-// The lines between a heading of the third rank and the next heading; empty if there is no such
-// heading.
+// The text between a third-level heading and the next heading; empty if not found.
 std::string_view EntryOf(std::string_view page, std::string_view title) {
   const std::string heading = "\n### " + std::string(title) + "\n";
   const size_t start = page.find(heading);
@@ -34,7 +33,7 @@ std::string_view ReadLine(std::string_view& text) {
   return line;
 }
 
-// Lines that stand by themselves: headings, items of lists, rows of tables, what is set in.
+// Lines that are not joined: headings, list items, table rows, indented lines.
 bool StandsAlone(std::string_view line) {
   return line.starts_with("    ") || line.starts_with("#") || line.starts_with("- ") ||
          line.starts_with("|") ||
@@ -43,7 +42,7 @@ bool StandsAlone(std::string_view line) {
 
 bool IsLeftOut(std::string_view line) { return line.starts_with("![") || line.starts_with("|---"); }
 
-// A line without marks of emphasis, code, links and tables. What is code stays as it is.
+// Removes marks for emphasis, code, links and tables. Indented code is not changed.
 std::string WithoutMarks(std::string_view line) {
   std::string text;
   bool address = false, code = false;
@@ -68,7 +67,7 @@ std::string WithoutMarks(std::string_view line) {
   return text.substr(std::min(text.find_first_not_of(' '), text.size()));
 }
 
-// A page as plain text, with paragraphs on one line each.
+// Converts a page to plain text, with one line per paragraph.
 std::string PlainText(std::string_view page) {
   std::string text;
   bool paragraph = false;

@@ -7,25 +7,25 @@
 
 namespace fotomill::desktop {
 
-// Pages of the documentation that are part of the program; docs/user/settings.md is in
+// Documentation pages built into the program; docs/user/settings.md is in
 // settings/key_help.h.
 extern const std::string_view kConfigurationPage;  // docs/user/configuration.md
 extern const std::string_view kDesktopPage;        // docs/user/desktop.md, the manual
 extern const std::string_view kFormatsPage;        // docs/user/formats.md
 
-// A text of the documentation, ready to be shown.
+// A documentation text, ready for display.
 struct HelpText {
   std::string title;
-  std::string text;  // paragraphs, divided by empty lines; blocks that are set in keep their lines
+  std::string text;  // paragraphs, separated by empty lines; indented blocks keep their lines
 };
-// The topic that stands for the whole manual.
+// The topic of the whole manual.
 inline constexpr std::string_view kManual = "desktop";
 // The topic of the page about formats, with the format list of Setup.
 inline constexpr std::string_view kFormatsTopic = "formats";
 // The entry of a key, the part of the manual for a topic that a Help button names, or one of the
 // pages above; for anything else the page about the configuration as a whole.
 HelpText HelpOn(std::string_view topic);
-// Whether a key has an entry of its own.
+// Whether a key has an entry.
 bool HasHelpEntry(std::string_view key);
 
 // The numbers that a key takes, "0 to 100"; empty if it takes any.

@@ -213,7 +213,7 @@ consteval bool EveryItemIsShownOnce() {
 }
 static_assert(EveryItemIsShownOnce());
 
-// The rows above, and on a page of their own those that the formats have themselves, a group each.
+// The rows above, plus a page with the settings of formats, one group per format.
 std::vector<SetupItem> WithSettingsOfFormats() {
   std::vector<SetupItem> items(std::begin(kItems), std::end(kItems));
   auto place =

@@ -9,7 +9,7 @@
 
 namespace fotomill::desktop {
 
-// The pages of Setup, in the order of the list at its left.
+// The pages of Setup, in list order.
 enum class SetupPage {
   Browsing,
   Thumbnails,
@@ -25,27 +25,27 @@ enum class SetupPage {
   Formats
 };
 inline constexpr size_t kSetupPageCount = 12;
-// The title of a page in English.
+// Title of a page, in English.
 const char* TitleOf(SetupPage page);
 
-// One setting in a Setup page or an option box: its page, the box around it, the key, its label.
-// Rows of one page and group stand together, in the order in which they are shown. A new setting in
-// Setup is a row here, or of a format one in its rows.cpp, and an entry in docs/user/settings.md.
+// A setting in a Setup page or options dialog: page, group, key, label. Rows of a page and group
+// are adjacent, in display order. To add a setting to Setup, add a row here, or for a format in its
+// rows.cpp, and an entry in docs/user/settings.md.
 struct SetupItem {
   SetupPage page;
   const char* group;
   KeyNumber key;
   const char* label;
 };
-// All rows, and those of one page, in the order in which they are shown.
+// All rows, and those of one page, in display order.
 std::span<const SetupItem> SetupItems();
 std::vector<SetupItem> ItemsOf(SetupPage page);
 
-// Settings whose label, group, page, key or help holds every word of `words`, whatever the case; in
-// the order of the rows. Nothing for an empty text.
+// Settings whose label, group, page, key or help contains all words, ignoring case; in row order.
+// Empty for an empty text.
 std::vector<SetupItem> FindSettings(std::string_view words);
 
-// The file functions that FileHistoryFunctions switches, one bit each: a list to tick.
+// Whether a key is a bit mask of file functions, shown as a check list (FileHistoryFunctions).
 bool IsFunctionMask(KeyNumber key);
 
 }  // namespace fotomill::desktop

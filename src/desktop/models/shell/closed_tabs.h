@@ -6,19 +6,19 @@
 
 namespace fotomill::desktop {
 
-// The folders of the tabs that were closed last, TabHistoryMax at most. They are kept for later
+// The folders of recently closed tabs, at most TabHistoryMax, also of earlier
 // runs.
 class ClosedTabs {
  public:
-  // Takes up the list of earlier runs. Add puts a folder on top and writes the list.
+  // Loads the list of earlier runs. Add appends a folder and saves the list.
   void Load();
-  bool Empty() const { return folders_.empty(); }  // there is no tab to reopen
+  bool Empty() const { return folders_.empty(); }  // no tab to reopen
   void Add(const std::string& folder);
-  // The folder of the tab closed last, which is forgotten; none if there is none.
+  // Removes and returns the last closed tab's folder, if any.
   std::optional<std::string> Pop();
 
  private:
-  std::vector<std::string> folders_;  // the latest last
+  std::vector<std::string> folders_;  // latest last
 };
 
 }  // namespace fotomill::desktop

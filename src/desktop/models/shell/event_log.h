@@ -4,11 +4,11 @@
 
 namespace fotomill::desktop {
 
-// The program's own log of what it did and when: lines "SECONDS EVENT TEXT", seconds since the
-// start with milliseconds, appended to the file that the environment variable FOTOMILL_DESKTOP_LOG
-// names. Without it nothing is written.
+// The program's event log: lines "SECONDS EVENT TEXT", seconds since startup with milliseconds,
+// appended to the file in the environment variable FOTOMILL_DESKTOP_LOG. If not set, nothing is
+// written.
 void StartEventLog();
-bool EventLogOn();  // the environment named a log file
+bool EventLogOn();  // FOTOMILL_DESKTOP_LOG is set
 void LogEvent(std::string_view event, std::string_view text = {});
 
 }  // namespace fotomill::desktop

@@ -17,7 +17,7 @@ namespace {
 constexpr const char* kFile = "FMWFavourites.txt";
 constexpr size_t kMostFolders = 200;
 
-// Changes the list as it is in the file now. The list afterwards; unchanged if the file cannot be
+// Edits the current list in the file. Sets `folders` to the result; unchanged if the file cannot be
 // written.
 bool EditList(std::vector<std::string>& folders,
               const std::function<void(std::vector<std::string>&)>& edit) {
@@ -48,7 +48,7 @@ bool Favorites::Has(const std::string& folder) const {
 }
 
 bool Favorites::Add(const std::string& folder) {
-  if (ParseHistoryList(folder, 1) != std::vector{folder}) return false;  // it cannot be on a line
+  if (ParseHistoryList(folder, 1) != std::vector{folder}) return false;  // not storable as a line
   const bool written = EditList(folders_, [&](std::vector<std::string>& folders) {
     if (std::ranges::find(folders, folder) == folders.end() && folders.size() < kMostFolders)
       folders.push_back(folder);

@@ -5,32 +5,32 @@
 
 namespace fotomill::desktop {
 
-// The folders that the user wants at hand, in the order in which they were added. Kept in the data
-// folder in the file "FMWFavourites.txt", a folder a line; changes are merged with those of other
-// processes and written at once.
+// The user's favorite folders, in the order added. Stored in the file "FMWFavourites.txt" in the
+// data folder, one per line; changes are saved immediately and merged with those of other
+// processes.
 class Favorites {
  public:
-  // Takes up the folders that the file holds now.
+  // Loads the file.
   void Load();
   // Absolute paths in the user's order.
   const std::vector<std::string>& Folders() const { return folders_; }
   // Whether the folder is one of them.
   bool Has(const std::string& folder) const;
-  // False when the folder cannot be on a line, there are too many, or the file cannot be written.
+  // False if the folder cannot be stored, there are too many, or the file cannot be written.
   [[nodiscard]] bool Add(const std::string& folder);
-  // False when the file cannot be written.
+  // False if the file cannot be written.
   [[nodiscard]] bool Remove(const std::string& folder);
-  // A folder was renamed: it, and those in it, are found under the new name. True when that
-  // concerns one of them.
+  // After a folder was renamed: updates it and its subfolders. True if any favorite was
+  // affected.
   bool FollowRename(const std::string& from, const std::string& to);
 
  private:
   std::vector<std::string> folders_;
 };
 
-// Whether a folder is `above` or is in it.
+// Whether a folder is `above` or inside it.
 bool LiesIn(const std::string& folder, const std::string& above);
-// The path under which something in `from` is found after `from` was renamed to `to`.
+// The new path of something in `from` after `from` was renamed to `to`.
 std::string RenamedPath(const std::string& path, const std::string& from, const std::string& to);
 
 }  // namespace fotomill::desktop

@@ -9,16 +9,15 @@
 
 namespace fotomill::desktop {
 
-// What is open: the tabs of a frame and its size. Kept as a text in the data folder, under the name
+// The open tabs and size of a frame. Stored as text in the data folder, in the file
 // TabsetCurrentName:
 //
-//   [Frame]            Width, Height (device-independent pixels), Maximized, Columns (of the
-//   details), Tab (the
-//                      one in front, from 0)
-//   [Tab]              Folder, ThumbnailMode, ViewMode, SortMode, Descending, Scroll (pixels),
-//   Focus (a name), AskForThumbnails (0: the tab does not offer to make missing ones)
+//   [Frame]  Width, Height (device-independent pixels), Maximized, Columns (of the details),
+//            Tab (the current one, from 0)
+//   [Tab]    Folder, ThumbnailMode, ViewMode, SortMode, Descending, Scroll (pixels),
+//            Focus (a name), AskForThumbnails (0: do not offer to make missing ones)
 //
-// a line "KEY=VALUE" each; lines that are not understood are passed over.
+// One line "KEY=VALUE" each; invalid lines are ignored.
 struct SessionTab {
   std::string folder;
   FolderView view;
@@ -30,23 +29,23 @@ struct SessionTab {
 };
 // A frame with its tabs.
 struct Session {
-  int32_t width = 0, height = 0;  // 0: nothing is known
+  int32_t width = 0, height = 0;  // 0: unknown
   bool maximized = false;
-  std::string columns;  // of the details
+  std::string columns;  // of the details view
   size_t tab = 0;
   std::vector<SessionTab> tabs;
 
   bool operator==(const Session&) const = default;
 };
 
-// Reads the text of a session; what is missing or makes no sense is as in a new one.
+// Parses a session; missing or invalid values get defaults.
 Session ParseSession(std::string_view text);
-// Tabs whose folder cannot be on a line are left out.
+// Tabs whose folder cannot be stored are skipped.
 std::string SessionText(const Session& session);
 
-// The session of the last run, without tabs whose folder is missing. Empty if there is none.
+// The session of the last run, without tabs of missing folders. Empty if there is none.
 Session LoadSession();
-// False when it could not be written.
+// False if it cannot be written.
 bool SaveSession(const Session& session);
 
 }  // namespace fotomill::desktop

@@ -5,9 +5,9 @@
 
 namespace fotomill::desktop {
 
-// The folder or file that a command line names. `parsed` is what the toolkit made of it: the
-// toolkit drops arguments that it cannot read as text, such as names that are not UTF-8.
-// `arguments` are all of them, as the system gave them, without the program's name.
+// The folder or file on the command line. `parsed` is the toolkit's result, which lacks arguments
+// that are not valid text, such as names that are not UTF-8. `arguments` are all original ones,
+// without the program name.
 std::string StartArgument(std::span<const std::string> arguments, const std::string& parsed);
 
 }  // namespace fotomill::desktop

@@ -6,18 +6,18 @@
 
 namespace fotomill::desktop {
 
-// Named sets of tabs: files "NAME.fmwtabset" in the data folder, as session.h describes them.
-// TabsetCurrentName names the one in use, to which the tabs of this run are written in the end.
+// Named tab sets: files "NAME.fmwtabset" in the data folder; see session.h for the format.
+// TabsetCurrentName is the current one, to which the tabs are saved on exit.
 
-// The names of all sets, in order.
+// All names, sorted.
 std::vector<std::string> TabSetNames();
-// The file of a set; empty for a name that no file can have.
+// Path of a set; empty if the name is invalid.
 std::string TabSetFile(std::string_view name);
-// The name of the set in use.
+// Name of the current set.
 std::string CurrentTabSet();
-// Whether there is a set of that name.
+// Whether a set exists.
 bool HasTabSet(std::string_view name);
-// False when the file is still there.
+// False if the file still exists.
 [[nodiscard]] bool DeleteTabSet(std::string_view name);
 
 }  // namespace fotomill::desktop

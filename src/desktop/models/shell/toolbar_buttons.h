@@ -7,7 +7,7 @@
 
 namespace fotomill::desktop {
 
-// A button of the toolbar, by a name that stays the same from version to version.
+// A toolbar button, identified by a name that is stable across versions.
 struct ToolbarButton {
   std::string name;
   bool shown = true;
@@ -15,14 +15,14 @@ struct ToolbarButton {
   bool operator==(const ToolbarButton&) const = default;
 };
 
-// The buttons in the order of a text with a name a line, "-" in front of those that are hidden.
-// Names that `known` does not have are passed over; known ones that the text does not have follow
-// at the end, shown.
+// Parses the order of buttons: one name per line, "-" before hidden
+// ones. Names not in `known` are ignored; missing ones are appended,
+// visible.
 std::vector<ToolbarButton> ParseToolbar(std::string_view text, std::span<const std::string> known);
 
-// As the user has chosen them, kept in the data folder in the file "FMWToolbar.txt".
+// The user's choice, stored in the file "FMWToolbar.txt" in the data folder.
 std::vector<ToolbarButton> LoadToolbar(std::span<const std::string> known);
-// False when the file cannot be written.
+// False if the file cannot be written.
 [[nodiscard]] bool SaveToolbar(std::span<const ToolbarButton> buttons);
 
 }  // namespace fotomill::desktop

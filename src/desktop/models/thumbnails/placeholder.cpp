@@ -9,7 +9,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// The view whose square is the next one, larger rather than smaller.
+// The smallest view that is at least as large.
 uint32_t FlagsFor(int32_t side) {
   if (side > kSmallThumbnailSide) return kDrawLargeView;
   return side <= kSmallThumbnailSide / 2 ? kDrawHalfSize : 0;

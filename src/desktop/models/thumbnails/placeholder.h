@@ -6,9 +6,9 @@
 
 namespace fotomill::desktop {
 
-// The picture that stands for a thumbnail, as a square on a background of one color, 0x00BBGGRR: a
-// photograph while the thumbnail is on its way, a crossed-out sheet when there can be none. `side`:
-// pixels. Empty without memory.
+// A square placeholder for a thumbnail, on a background color, 0x00BBGGRR: a photograph while the
+// thumbnail is loading, a crossed-out sheet if there is none. `side` in pixels. Empty if out of
+// memory.
 RgbImage PlaceholderPixels(bool unreadable, int32_t side, Color background);
 
 }  // namespace fotomill::desktop

@@ -37,7 +37,7 @@ Status ScaleDown(const PackedImage& image, int32_t side, RgbImage& pixels) {
   return ToRgb(scaled, pixels);
 }
 
-// Records are drawn at the sides of the three views; what is smaller than that is scaled down.
+// Records are drawn in one of the three view sizes; smaller sides are scaled down.
 Status PixelsOfRecord(const AnyThumbnailRecord& record, const ThumbnailRequest& request,
                       RgbImage& pixels) {
   const uint32_t flags = request.side > kSmallThumbnailSide        ? kDrawLargeView
@@ -53,8 +53,8 @@ Status PixelsOfPicture(PictureRecord& picture, const ThumbnailRequest& request, 
   return ScaleDown(picture.image, request.side, pixels);
 }
 
-// A thumbnail that was made earlier. For dense screens records are too small; pictures of the
-// system may do.
+// Loads an existing thumbnail. Records are too small for dense screens; system thumbnails may be
+// large enough.
 bool ReadReady(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   const bool large = request.side == kLargeThumbnailSide;
   if (request.side <= kSmallThumbnailSide || large) {
@@ -73,7 +73,7 @@ bool ReadReady(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   return picture != nullptr && PixelsOfPicture(*picture, request, thumbnail.pixels) == Status::Ok;
 }
 
-// The thumbnail in the file's EXIF, upright as the picture would be.
+// Loads the EXIF thumbnail, upright like the picture.
 bool ReadEmbedded(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   ExifSource source;
   ExifFindings findings;
@@ -98,7 +98,7 @@ void CopyFacts(const PictureRecord& picture, Thumbnail& thumbnail) {
       picture.pageCount > 1 && (FormatRow(picture.formatIndex).flags & FMT_ANIMATED) != 0;
 }
 
-// What a record does not know of its picture; the head of the file tells it quickly.
+// Reads the facts missing in a record from the file's header, which is fast.
 void ReadFacts(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   PicturePointer picture;
   if (LoadPictureInfo({.fileName = request.path, .options = request.options.read}, picture) ==
@@ -106,13 +106,13 @@ void ReadFacts(const ThumbnailRequest& request, Thumbnail& thumbnail) {
     CopyFacts(*picture, thumbnail);
 }
 
-// Whether the mode has a place for the record of a picture that is read.
+// Whether a new record of the picture is stored in this mode.
 bool Keeps(const ThumbnailRequest& request) {
   return request.mode == choice::kVirtual || (InDatabase(request) && request.options.keep);
 }
 
-// How large a picture has to be decoded, 0 for all of it: enough for its record as well, however
-// small the view. The quick scaler's result depends on the size that it starts from.
+// The size at which to decode a picture, 0 for full size: enough for its record, even if the view
+// is smaller. The quick scaler's result depends on the source size.
 int32_t DecodedSide(const ThumbnailRequest& request, bool onFaces) {
   if (Keeps(request) && request.options.quick) return 0;
   return std::max({request.side, onFaces ? kFramingSide : 0,

@@ -13,23 +13,23 @@
 
 namespace fotomill::desktop {
 
-// Loads thumbnails on threads of the pool, in the order in which they are wanted now. The request
-// of a result tells whether it is a stand-in; its thumbnail is null when there is none. Where a
-// stand-in was wanted and the proper one was ready, no one loads it again.
+// Loads thumbnails on pool threads, in order of priority. The request in a result says if it is a
+// stand-in; its thumbnail is null if there is none. If the proper one was available for a stand-in
+// request, it is not loaded again.
 class ThumbnailLoader {
  public:
-  // A request that was dealt with.
+  // A finished request.
   struct Result {
     ThumbnailRequest request;
     ThumbnailPointer thumbnail;
   };
   using Load = ThumbnailPointer (*)(const ThumbnailRequest& request);
 
-  // `wake` is called on a worker when results wait that no one was told of yet, `idle` on the
-  // worker that has done the last request.
+  // `wake` is called on a worker when new results are available, `idle` on the worker that finished
+  // the last request.
   ThumbnailLoader(unsigned atOnce, std::function<void()> wake, Load load = LoadThumbnail,
                   void (*idle)() = KeepThumbnailRecords);
-  // Waits for what is in work.
+  // Waits for running requests.
   ~ThumbnailLoader() = default;
   ThumbnailLoader(const ThumbnailLoader&) = delete;
   ThumbnailLoader& operator=(const ThumbnailLoader&) = delete;
@@ -37,8 +37,8 @@ class ThumbnailLoader {
   // Sets the wanted thumbnails, most urgent first. Pending requests are replaced; running ones
   // finish.
   void Want(std::vector<ThumbnailRequest> requests);
-  std::vector<Result> FetchResults();  // those that came since the last call
-  // Thumbnails that wait or are in progress.
+  std::vector<Result> FetchResults();  // results since the last call
+  // Number of pending and running requests.
   size_t Pending() const;
 
  private:
@@ -49,30 +49,30 @@ class ThumbnailLoader {
   const Load load_;
   void (*const idle_)();
   mutable std::mutex mutex_;
-  std::vector<ThumbnailRequest> requests_;  // the most urgent last
-  std::vector<ThumbnailRequest> inWork_;  // one a thread
+  std::vector<ThumbnailRequest> requests_;  // most urgent last
+  std::vector<ThumbnailRequest> inWork_;    // one per thread
   std::vector<Result> results_;
-  LatestWork work_;  // last: it uses the rest
+  LatestWork work_;  // must be last: it uses the other members
 };
 
-// How many thumbnails to load at a time, so that a core is left for the windows.
+// Number of thumbnails to load in parallel, leaving one core for the windows.
 unsigned ThumbnailsAtOnce();
 
 // Loaded thumbnails: an LRU cache, bounded in bytes.
 class ThumbnailCache {
  public:
   explicit ThumbnailCache(uint64_t capacity) : capacity_(capacity) {}  // bytes
-  // Null when it is not there, or is there for another state of the file, or another side.
+  // Null if not cached, or cached for another state of the file or another size.
   ThumbnailPointer Find(const ThumbnailRequest& request);
-  // The thumbnail of a path in whatever state and size there is: something to show until the right
-  // one comes.
+  // Any thumbnail of a path, regardless of state and size, to show until the right one is
+  // loaded.
   ThumbnailPointer FindAny(const std::string& path) const;
-  // Adds or replaces the thumbnail of a path; the least recently used ones may go.
+  // Adds or replaces the thumbnail of a path; may drop the least recently used ones.
   void Put(const ThumbnailRequest& request, ThumbnailPointer thumbnail);
-  // Forgets all thumbnails.
+  // Removes all thumbnails.
   void Clear();
-  uint64_t Bytes() const { return bytes_; }  // of all thumbnails in it
-  size_t Count() const { return entries_.size(); }  // thumbnails in it
+  uint64_t Bytes() const { return bytes_; }         // of all thumbnails
+  size_t Count() const { return entries_.size(); }  // number of thumbnails
 
  private:
   struct Entry {
@@ -81,7 +81,7 @@ class ThumbnailCache {
   };
   const uint64_t capacity_;
   uint64_t bytes_ = 0;
-  std::list<Entry> entries_;  // the last used first
+  std::list<Entry> entries_;  // most recently used first
   std::unordered_map<std::string, std::list<Entry>::iterator> places_;
 };
 

@@ -30,7 +30,7 @@ class ThumbnailOffer::Face : public ThumbnailUpdateFace {
   int32_t AskForUpdate(int32_t count, int32_t selected) override {
     {
       const std::lock_guard lock(offer_.mutex_);
-      if (offer_.answer_ >= 0) return offer_.answer_;  // the bar was closed while it was searched
+      if (offer_.answer_ >= 0) return offer_.answer_;  // the bar was closed during the search
     }
     offer_.events_.ask(count, selected);
     std::unique_lock lock(offer_.mutex_);
@@ -55,7 +55,7 @@ class ThumbnailOffer::Face : public ThumbnailUpdateFace {
   void KeepChoice(const ThumbnailUpdateOptions& options) override { offer_.events_.keep(options); }
 
  private:
-  static constexpr double kEverySeconds = 0.1;  // between two reports
+  static constexpr double kEverySeconds = 0.1;  // between reports
 
   ThumbnailOffer& offer_;
   const double begin_ = platform::MonotonicSeconds();
@@ -78,7 +78,7 @@ std::shared_ptr<ThumbnailOffer> ThumbnailOffer::Start(ThumbnailBrowser browser, 
 
 void ThumbnailOffer::Run(ThumbnailBrowser browser) {
   Face face(*this, browser);
-  // Records of the list itself are not needed: the browser loads what it shows.
+  // The browser loads its records itself.
   if (browser.mode == choice::kVirtual) browser.mode = choice::kDiskBased;
   (void)OfferThumbnailUpdate(browser, face);
   if (!stop_) events_.ended(face.changed);

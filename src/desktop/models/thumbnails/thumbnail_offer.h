@@ -12,30 +12,30 @@
 
 namespace fotomill::desktop {
 
-// The offer to make missing thumbnail files of one folder, apart: it looks for them, asks, waits
-// for the answer as long as it takes, and makes them on all cores that no one else wants.
+// Offers to create a folder's missing thumbnail files, in the background: searches for missing
+// ones, asks, waits for the answer, and creates them on all free cores.
 class ThumbnailOffer : public std::enable_shared_from_this<ThumbnailOffer> {
  public:
-  // Called apart.
+  // Called on the background thread.
   struct Events {
     std::function<void(int32_t count, int32_t selected)> ask;
-    // it takes long: files looked at, now and then
+    // slow search: files checked so far, called from time to time
     std::function<void(const std::string& text, size_t done, size_t total)> scanning;
-    // the choice, for later offers
+    // the choice to save for later offers
     std::function<void(const ThumbnailUpdateOptions& options)> keep;
     std::function<void(size_t done, size_t total)> building;
     std::function<void(bool changed)> ended;
   };
-  static constexpr double kSilentSeconds = 0.5;  // before it is told how far the search is
+  static constexpr double kSilentSeconds = 0.5;  // delay before reporting progress of the search
 
-  // Begins to look for what is missing. The offer lives until its thread has ended, whoever lets go
-  // of it.
+  // Starts the search. The object lives until its thread has ended, regardless of other
+  // references.
   static std::shared_ptr<ThumbnailOffer> Start(ThumbnailBrowser browser, Events events,
                                                double silentSeconds = kSilentSeconds);
 
-  // The answer: one of the choices, or 0, which also ends a search that has asked nothing yet.
+  // The answer: one of the choices, or 0, which also cancels a search before it asks.
   void Answer(int32_t choice);
-  // The offer is withdrawn.
+  // Cancels the offer.
   void Stop();
 
  private:
@@ -46,7 +46,7 @@ class ThumbnailOffer : public std::enable_shared_from_this<ThumbnailOffer> {
   double silentSeconds_ = kSilentSeconds;
   std::mutex mutex_;
   std::condition_variable answered_;
-  int32_t answer_ = -1;  // none yet
+  int32_t answer_ = -1;  // -1: none yet
   std::atomic<bool> stop_{false};
 };
 

@@ -21,7 +21,7 @@ using Compacted = ThumbnailDatabase::Compacted;
 
 constexpr const char* kNoDatabase = TrLater("Not a readable thumbnail database; left unchanged.");
 constexpr const char* kUnchanged = TrLater("The database was left unchanged.");
-constexpr int kDeepest = 64;  // levels of folders
+constexpr int kDeepest = 64;  // of nested folders
 
 std::string OutcomeText(Compacted result, int32_t before, int32_t after, uint64_t saved) {
   switch (result) {

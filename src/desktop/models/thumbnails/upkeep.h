@@ -11,25 +11,25 @@
 
 namespace fotomill::desktop {
 
-// Compaction of one thumbnail database on a thread of its own, for a window that shows how far it
-// is.
+// Compacts a thumbnail database on its own thread, for a window that shows the
+// progress.
 class DatabaseCompaction : private ProgressSink {
  public:
-  // Begins at once; `purge` drops the thumbnails of missing pictures as well; with `hidden` the
-  // new file is hidden.
+  // Starts immediately; `purge` also drops thumbnails of missing pictures; with `hidden` the new
+  // file is hidden.
   DatabaseCompaction(std::string path, bool purge, bool hidden);
-  // Stops it and waits; the database is then as it was, unless it was done.
+  // Stops and waits; the database is unchanged unless it has finished.
   ~DatabaseCompaction() override = default;
   DatabaseCompaction(const DatabaseCompaction&) = delete;
   DatabaseCompaction& operator=(const DatabaseCompaction&) = delete;
 
-  // Asks it to stop, whether it has ended either way, and how many records it has dealt with.
+  // Cancels; whether it has ended either way; number of records processed.
   void Stop() { task_.Stop(); }
   bool Ended() const { return ended_; }
   int32_t Done() const { return done_; }
-  int32_t Total() const { return total_; }  // records, 0 until it is known
+  int32_t Total() const { return total_; }  // records, 0 until known
 
-  // What became of it, once it has ended: a sentence or two for people.
+  // The result after it has ended, a sentence or two.
   bool Succeeded() const { return succeeded_; }
   const std::string& Outcome() const { return outcome_; }
 
@@ -43,18 +43,18 @@ class DatabaseCompaction : private ProgressSink {
   std::atomic<int32_t> done_{0}, total_{0};
   bool succeeded_ = false;  // written before `ended_`
   std::string outcome_;
-  BackgroundTask task_;  // last: it uses the rest
+  BackgroundTask task_;  // must be last: it uses the other members
 };
 
-// "1,234 records, 35.1 MB", or why there is nothing to compact.
+// "1,234 records, 35.1 MB", or why it cannot be compacted.
 std::string DescribeDatabase(const std::string& path);
 
-// Thumbnail files of a folder, and with `below` of the folders below it, whose pictures are gone.
-// Folders on optical drives and those that cannot be read give none. Ends early when `stop` is
-// asked.
+// Orphaned thumbnail files in a folder, with `below` also in
+// subfolders. Skips optical drives and unreadable folders. Ends early
+// if stopped.
 std::vector<std::string> FindOrphanThumbnails(const std::string& folder, bool below,
                                               const StopToken& stop);
-// Deletes them; those that could not be deleted come back.
+// Deletes the files; returns those that could not be deleted.
 std::vector<std::string> DeleteThumbnails(const std::vector<std::string>& files);
 
 }  // namespace fotomill::desktop

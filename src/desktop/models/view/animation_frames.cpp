@@ -10,11 +10,11 @@ namespace fotomill::desktop {
 
 namespace {
 
-// A larger canvas is not played: beside it a copy, the frame that is made of that and the one on
-// the screen must be held.
+// Larger canvases are not played: besides the canvas, a copy, the frame made from it and the one on
+// the screen must fit in memory.
 constexpr uint64_t kMostCanvasBytes = uint64_t{256} << 20;
 
-// A record of its own for the frame that the animation has on its canvas.
+// Copies the animation's current frame from the canvas to a new record.
 Status CopyFrame(const PictureRecord& facts, const Canvas& canvas, PicturePointer& picture) {
   picture = NewPictureRecord(facts.defaultColour);
   if (picture == nullptr) return Status::MemoryAllocationError;
@@ -96,13 +96,13 @@ void AnimationFrames::Fit(int32_t width, int32_t height) {
   work_.Look();
 }
 
-// How many frames may be kept: the one that is shown and the next one in any case.
+// The number of frames to keep, at least the current and the next one.
 size_t AnimationFrames::Room() const {
   const uint64_t room = frameBytes_ == 0 ? 2 : std::max<uint64_t>(capacity_ / frameBytes_, 2);
   return static_cast<size_t>(std::min<uint64_t>(room, frames_.size()));
 }
 
-// Where not all frames have room, a quarter of it is for those before the one that is shown.
+// If there is not enough room for all frames, a quarter of it is for those before the current one.
 bool AnimationFrames::Keeps(size_t frame) const {
   const size_t count = frames_.size(), room = Room();
   if (room == count) return true;
@@ -115,8 +115,8 @@ bool AnimationFrames::IsFitted(size_t frame) const {
   return request.fitWidth == request_.fitWidth && request.fitHeight == request_.fitHeight;
 }
 
-// What is to be decoded next: in the order of playing the first frame that is missing; then, where
-// all are kept, the first one that was made for another window.
+// The next frame to decode: the first missing one in playing order; then, if all are kept, the
+// first one made for another window size.
 bool AnimationFrames::NextFrame(size_t& frame) const {
   const size_t count = frames_.size();
   const auto first = [&](auto isWanted) {
@@ -138,8 +138,8 @@ Status AnimationFrames::OpenFile() {
   return OpenAnimation({.fileName = request_.path, .options = request_.read}, animation_);
 }
 
-// Composes frames from `position_`, the next one of the animation, up to the wanted one. Null when
-// it cannot be had; the frames then end at `position_`.
+// Composes frames from `position_`, the animation's next one, up to `frame`. Null on failure; then
+// there are no frames from `position_` on.
 ViewPicturePointer AnimationFrames::Decode(size_t frame) {
   ViewRequest request;
   if (frame < position_) {
@@ -160,7 +160,7 @@ ViewPicturePointer AnimationFrames::Decode(size_t frame) {
   view->request = request;
   if (status == Status::Ok) status = PrepareView(std::move(picture), *view);
   if (status == Status::Ok) {
-    view->picture->metadata = {};  // the same for each frame
+    view->picture->metadata = {};  // the same for all frames
     return view;
   }
   position_ = frame;
@@ -208,7 +208,7 @@ void AnimationFrames::MakeFrame(size_t frame) {
     if (status != Status::Ok) failure_ = status;
     if (picture != nullptr) {
       Keep(frame, std::move(picture));
-    } else if (!stop_) {  // what is behind cannot be reached either
+    } else if (!stop_) {  // later frames cannot be decoded either
       position_ = std::min(position_, frame);
       delaysMs_.resize(position_);
       frames_.resize(position_);

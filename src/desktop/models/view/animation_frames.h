@@ -12,31 +12,31 @@
 
 namespace fotomill::desktop {
 
-// Decodes the frames of an animation apart. All of them are kept when they fit into a number of
-// bytes; else as many around the one that is shown as do, and they are decoded again in each round.
+// Decodes the frames of an animation in the background. Keeps all of them if they fit in `capacity`
+// bytes; otherwise those around the current one, decoding them again in each loop.
 class AnimationFrames {
  public:
-  // `wake` is called on a thread of the pool whenever the file was opened, a frame came or one
-  // could not be decoded.
+  // `wake` is called on a pool thread when the file was opened, or a frame was decoded or
+  // failed.
   AnimationFrames(ViewRequest request, uint64_t capacity, std::function<void()> wake);
   ~AnimationFrames();
   AnimationFrames(const AnimationFrames&) = delete;
   AnimationFrames& operator=(const AnimationFrames&) = delete;
 
-  // How many frames there are, 0 until the file was opened. Less than the file says when one of
-  // them cannot be decoded.
+  // Number of frames, 0 until the file is opened. Less than in the file if one of them cannot be
+  // decoded.
   size_t Count() const;
-  // Why there are no frames, or none behind the last one; Ok otherwise.
+  // Why there are no frames, or no more after the last one; Ok otherwise.
   Status Failure() const;
-  int32_t DelayMs(size_t frame) const;  // that it is shown; 0 for one that is not there
-  int32_t Rounds() const;               // 0 for ever
+  int32_t DelayMs(size_t frame) const;  // duration of a frame; 0 if there is none
+  int32_t Rounds() const;               // loop count, 0: endless
 
-  // This frame is on the screen and those behind it are wanted next. At first that is the first
+  // Sets the frame on the screen; the following ones are decoded next. Initially the first
   // one.
   void Want(size_t frame);
-  // A frame if it is decoded, fitted to whatever window.
+  // A frame if it is decoded, fitted to any window size.
   ViewPicturePointer Find(size_t frame) const;
-  // From here on frames are made for a window of this size; those that stay in memory are made
+  // From now on, makes frames for a window of this size; those in memory are made
   // again.
   void Fit(int32_t width, int32_t height);
 
@@ -59,16 +59,16 @@ class AnimationFrames {
   std::vector<int32_t> delaysMs_;
   int32_t rounds_ = 1;
   Status failure_ = Status::Ok;
-  std::vector<ViewPicturePointer> frames_;  // as many as delays; null where none is kept
-  uint64_t frameBytes_ = 0;                 // of the largest so far
+  std::vector<ViewPicturePointer> frames_;  // same size as delays; null if not kept
+  uint64_t frameBytes_ = 0;                 // largest so far
   size_t shown_ = 0;
-  bool opened_ = false;                     // or tried to
+  bool opened_ = false;  // or failed to open
   bool stop_ = false;
-  // Of the piece of work that goes on.
+  // For the current piece of work.
   PicturePointer facts_;
   AnimationPointer animation_;
-  size_t position_ = 0;  // the next frame of the animation
-  LatestWork work_;      // last: it uses the rest
+  size_t position_ = 0;  // the animation's next frame
+  LatestWork work_;      // must be last: it uses the other members
 };
 
 }  // namespace fotomill::desktop

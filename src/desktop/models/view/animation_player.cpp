@@ -23,7 +23,7 @@ void AnimationPlayer::Step(int32_t frames) {
 }
 
 ViewPicturePointer AnimationPlayer::At(double now) {
-  // fewer than the file said
+  // fewer than the file claims
   if (const size_t count = Count(); count > 0 && frame_ >= count) frame_ = count - 1;
   if (playing_ && due_ != kNotBegun && now >= due_) MoveOn(now);
   frames_.Want(frame_);
@@ -48,7 +48,7 @@ void AnimationPlayer::MoveOn(double now) {
   due_ = due_ + Delay() > now ? due_ + Delay() : now + Delay();
 }
 
-// Whether nothing comes behind the frame that is shown.
+// Whether the current frame is the last one to be shown.
 bool AnimationPlayer::IsLast() const {
   return AtTheEnd() && (Count() == 1 || (frames_.Rounds() > 0 && round_ + 1 >= frames_.Rounds()));
 }

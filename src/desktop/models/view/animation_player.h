@@ -7,37 +7,37 @@
 
 namespace fotomill::desktop {
 
-// Plays an animation. Times are seconds of a clock that its holder keeps; every frame is shown, so
-// that an animation that cannot be decoded in time goes slower. Used by one thread.
+// Plays an animation. Times are in seconds of the caller's clock; every frame is shown, so playing
+// slows down if decoding takes too long. Not thread-safe.
 class AnimationPlayer {
  public:
-  // `wake` as of AnimationFrames: At is to be asked again.
+  // `wake` as for AnimationFrames: call At again.
   AnimationPlayer(ViewRequest request, uint64_t capacity, std::function<void()> wake)
       : frames_(std::move(request), capacity, std::move(wake)) {}
 
-  // Goes on from the frame that is shown; once the last round has ended, from the first one.
+  // Continues from the current frame; after the last loop, from the first one.
   void Play();
   // Stays at the current frame.
   void Pause();
-  bool Playing() const { return playing_; }  // between Play and Pause, or the end of the last round
-  // Pauses and goes that many frames on, or back; beyond the last one comes the first one.
+  bool Playing() const { return playing_; }  // from Play until Pause or the end of the last loop
+  // Pauses and steps forward or back, wrapping around.
   void Step(int32_t frames);
   // The size that frames are decoded for, in pixels.
   void Fit(int32_t width, int32_t height) { frames_.Fit(width, height); }
 
-  // The frame to show at this time; null while it is not decoded yet. Asked too early it is the
-  // frame shown already.
+  // The frame to show at this time; null if not decoded yet. If called early, the current
+  // one.
   ViewPicturePointer At(double now);
-  // Seconds until At moves on; negative when it never does by itself: paused, at the end, or
+  // Seconds until the next frame; negative if At does not advance by itself: paused, at the end, or
   // waiting for a frame.
   double SecondsLeft(double now) const;
 
-  // The frame that is shown, from 0, of how many are known so far; why decoding ended, Ok while it
-  // has not failed.
+  // The current frame, from 0; the number of frames known so far; why decoding ended, Ok if it has
+  // not failed.
   size_t Frame() const { return frame_; }
   size_t Count() const { return frames_.Count(); }
   Status Failure() const { return frames_.Failure(); }
-  // Whether all frames were shown for their time, or never will be.
+  // Whether all frames were shown for their duration, or can never be.
   bool PlayedOnce() const { return playedOnce_ || (Failure() != Status::Ok && Count() == 0); }
 
  private:
@@ -51,8 +51,8 @@ class AnimationPlayer {
 
   AnimationFrames frames_;
   size_t frame_ = 0;
-  int32_t round_ = 0;       // complete ones
-  double due_ = kNotBegun;  // when the next frame is to come
+  int32_t round_ = 0;       // completed loops
+  double due_ = kNotBegun;  // time of the next frame
   bool playing_ = false;
   bool playedOnce_ = false;
 };

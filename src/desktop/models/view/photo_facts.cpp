@@ -16,10 +16,10 @@ namespace {
 constexpr uint16_t kMake = 0x010f, kModel = 0x0110, kChanged = 0x0132, kExposure = 0x829a,
                    kFNumber = 0x829d, kIso = 0x8827, kTaken = 0x9003, kFocalLength = 0x920a,
                    kLensMake = 0xa433, kLens = 0xa434;
-constexpr double kLongestFraction = 0.3;  // seconds; longer exposures are told as decimals
+constexpr double kLongestFraction = 0.3;  // seconds; longer exposures are shown as decimals
 
-// The texts and first numbers of a walk; of a tag that is in several directories, the first
-// that has a value.
+// Texts and first numbers of a walk; if a tag is in several directories, the first one with a
+// value.
 class Values : public ExifSink {
  public:
   void Directory(int32_t, std::string_view) override {}
@@ -33,7 +33,7 @@ class Values : public ExifSink {
     const auto found = texts_.find(tag);
     return found == texts_.end() ? std::string() : found->second;
   }
-  // 0 if there is none.
+  // 0 if not found.
   double Number(uint16_t tag) const {
     const auto found = numbers_.find(tag);
     return found == numbers_.end() ? 0 : found->second;
@@ -63,7 +63,7 @@ std::string Printed(const char* format, double number) {
   return text;
 }
 
-// Makers like to be in front of their models' names as well.
+// Some makers repeat their name in the model.
 std::string Named(const std::string& make, const std::string& model) {
   const std::string_view firstWord = std::string_view(make).substr(0, make.find(' '));
   return make.empty() || model.starts_with(firstWord) ? model
@@ -85,7 +85,7 @@ std::string ExposureLine(const Values& values) {
   return line;
 }
 
-// "2001:05:19 18:36:41", with the hyphens that people are used to.
+// "2001:05:19 18:36:41" with hyphens in the date.
 std::string DateLine(const Values& values) {
   std::string date = values.Text(kTaken).empty() ? values.Text(kChanged) : values.Text(kTaken);
   for (const size_t colon : {4, 7}) {

@@ -7,9 +7,9 @@
 
 namespace fotomill::desktop {
 
-// What a photographer wants to know of an EXIF block, a line each for camera, lens, exposure and
-// date; lines about which the block says nothing are left out. "1/125 s   f/2.8   ISO 400   50 mm"
-// is such a line.
+// The main facts in an EXIF block, one line each for camera, lens,
+// exposure and date, if available, such as "1/125 s   f/2.8   ISO 400   50
+// mm".
 std::vector<std::string> PhotoFacts(std::span<const uint8_t> exif);
 
 }  // namespace fotomill::desktop

@@ -53,7 +53,7 @@ Slideshow::Slideshow(const SlideshowChoices& choices, size_t count, size_t place
   BeginRound(place, count);
 }
 
-// The place that is on the screen comes first, so that it does not come again.
+// Starts with the current place, so that it is not repeated.
 void Slideshow::BeginRound(size_t first, size_t count) {
   order_.resize(count);
   std::iota(order_.begin(), order_.end(), size_t{0});
@@ -76,7 +76,8 @@ std::optional<size_t> Slideshow::Next(size_t place, size_t count) {
   if (shown_ < count) return order_[shown_++];
   if (!choices_.repeat) return {};
   BeginRound(place, count);
-  // The new round begins with another place than the one that is shown, which comes anywhere in it.
+  // The new round starts with a different place than the current one, which may come anywhere
+  // later.
   if (count > 1)
     std::iter_swap(order_.begin(),
                    order_.begin() + static_cast<std::ptrdiff_t>(1 + random_() % (count - 1)));

@@ -8,34 +8,34 @@
 
 namespace fotomill::desktop {
 
-// What the user chose of a slide show.
+// The user's slideshow settings.
 struct SlideshowChoices {
   static constexpr int32_t kMostSeconds = 3600;
 
-  int32_t seconds = 4;  // that a picture stays, 1 to kMostSeconds
-  bool random = false;  // else in the order of the list
-  bool repeat = true;   // from the beginning after the last picture
+  int32_t seconds = 4;  // per picture, 1 to kMostSeconds
+  bool random = false;  // false: list order
+  bool repeat = true;   // start over after the last picture
 
   bool operator==(const SlideshowChoices&) const = default;
 };
 
-// The choices of the last time, kept in the data folder in the file "FMWSlideshow.txt": Seconds,
-// Random and Repeat in the section [Slideshow]. What is not there or makes no sense is as at first.
+// The saved settings, from the file "FMWSlideshow.txt" in the data folder: Seconds, Random and
+// Repeat in the section [Slideshow]. Missing or invalid values get defaults.
 SlideshowChoices LoadSlideshowChoices();
-// False when they could not be written.
+// False if they cannot be written.
 [[nodiscard]] bool SaveSlideshowChoices(const SlideshowChoices& choices);
 
-// The order in which a slideshow goes through the places of a list.
+// The order of a slideshow through a list.
 class Slideshow {
  public:
-  // Begins at `place` of a list of `count`; equal seeds give equal orders.
+  // Starts at `place` in a list of `count`; the same seed gives the same order.
   Slideshow(const SlideshowChoices& choices, size_t count, size_t place, uint32_t seed);
 
-  // The place that comes after `place`, which is shown; none at the end. In random order every
-  // place comes once in a round, and none twice in a row. A list of another length begins a new
-  // round.
+  // The place after the current one, `place`; none at the end. In random order, every place comes
+  // once per round, and never twice in a row. If the length of the list changes, a new round
+  // starts.
   std::optional<size_t> Next(size_t place, size_t count);
-  // The place that comes next, as far as that is no matter of the list's order.
+  // The next place, if it does not depend on list order.
   std::optional<size_t> Upcoming() const;
 
  private:
@@ -44,7 +44,7 @@ class Slideshow {
   SlideshowChoices choices_;
   std::mt19937 random_;
   std::vector<size_t> order_;  // of a random round
-  size_t shown_ = 0;           // how many of them have been
+  size_t shown_ = 0;           // number of those already shown
 };
 
 }  // namespace fotomill::desktop

@@ -15,7 +15,7 @@ namespace {
 // Positions are in 1/65536 of a source pixel.
 using Positions = std::vector<int64_t>;
 
-// The source position for each of the shown pixels from `first` on.
+// Source positions for `count` shown pixels from `first`.
 Positions PositionsOf(int32_t first, int32_t count, int32_t shown, int32_t size, bool between) {
   Positions positions(static_cast<size_t>(count));
   const double step = static_cast<double>(size) / shown;
@@ -28,10 +28,10 @@ Positions PositionsOf(int32_t first, int32_t count, int32_t shown, int32_t size,
   return positions;
 }
 
-// Two rows of a picture, and where between them a line is.
+// Two rows of a picture, and a line's position between them.
 struct RowPair {
   const uint8_t *upper, *lower;
-  int32_t v;  // parts of 256 that are of the lower row
+  int32_t v;  // weight of the lower row, in 1/256
 
   RowPair(const PackedImage& image, int64_t row)
       : upper(image.Row(static_cast<int32_t>(row >> 16)).data()),
@@ -39,7 +39,7 @@ struct RowPair {
         v(static_cast<int32_t>(row & 0xffff) >> 8) {}
 };
 
-// The columns beside a position, and the parts of 256 that are of the right one.
+// The columns next to a position, and the weight of the right one, in 1/256.
 struct ColumnPair {
   int32_t left, right, u;
 
@@ -49,8 +49,8 @@ struct ColumnPair {
         u(static_cast<int32_t>(column & 0xffff) >> 8) {}
 };
 
-// A line between two rows of bytes, as 256 times the values, for the columns that positions need.
-// Whole rows are quick to blend.
+// A line interpolated between two rows of bytes, times 256, for the columns needed. Blending whole
+// rows is fast.
 class LineBetween {
  public:
   void Set(const RowPair& rows, const Positions& columns, int32_t width, int32_t channels) {
@@ -79,11 +79,11 @@ inline uint8_t* DrawPixelBetween(const LineBetween& line, const ColumnPair& at, 
   return rgb;
 }
 
-// The same of pixels with alpha: each color counts by its alpha, so that what is transparent gives
-// none away.
+// The same for pixels with alpha: colors are weighted by alpha, so that transparent pixels do not
+// contribute.
 uint8_t* BlendPixelBetween(const RowPair& rows, const RowPair& alphas, const ColumnPair& at,
                            const uint8_t* behind, uint8_t* rgb) {
-  constexpr uint32_t kWhole = 65536 * 255;  // the weight of what is opaque
+  constexpr uint32_t kWhole = 65536 * 255;  // weight of an opaque pixel
   const auto weight = [](int32_t across, int32_t down, uint8_t alpha) {
     return static_cast<uint32_t>(across * down * alpha);
   };
@@ -101,7 +101,7 @@ uint8_t* BlendPixelBetween(const RowPair& rows, const RowPair& alphas, const Col
   return rgb;
 }
 
-// Draws lines between four pixels each.
+// Draws lines with bilinear interpolation.
 class BetweenPixels {
  public:
   BetweenPixels(const ViewSource& source, const Positions& columns)
@@ -156,8 +156,7 @@ void BlendNearest(const uint8_t* bgr, const uint8_t* alpha, const Positions& col
   }
 }
 
-// Two rows of what is behind a picture: of the lines whose squares begin with the one color, and
-// with the other.
+// Two background rows: one for lines whose squares start with the first color, one for the other.
 class RowsBehind {
  public:
   RowsBehind(const Backdrop& backdrop, int32_t left, int32_t width)

@@ -7,25 +7,25 @@
 
 namespace fotomill::desktop {
 
-// Pixels to draw, of 24 bits, and their alpha plane of the same size; that is empty where all are
+// Pixels to draw, 24 bits, and their alpha plane, empty if all are
 // opaque.
 struct ViewSource {
   const PackedImage& image;
   const PackedImage& alpha;
 };
 
-// What shows through a picture, and what surrounds it. Colors are 0x00BBGGRR.
+// The background behind and around a picture. Colors are 0x00BBGGRR.
 struct Backdrop {
   Color around = 0;
-  bool squares = false;  // a checkerboard behind the picture instead of `around`
+  bool squares = false;  // draw a checkerboard behind the picture
   Color square[2] = {0, 0};
-  int32_t side = 1;  // of a square, device pixels
+  int32_t side = 1;  // of a square, in device pixels
 };
 
-// Draws what a window shows of a picture into `canvas`, whose size is the window's in device
-// pixels: `source`, the picture at any size, in the place that `transform` gives it. A source of
-// just the shown size is copied; others are sampled at the nearest pixel, or with `smooth` between
-// pixels. The squares of the backdrop keep their places in the window.
+// Draws a picture into `canvas`, which has the size of the window in device pixels: `source` is the
+// picture at any size, drawn at the position given by `transform`. A source of exactly the shown
+// size is copied; others are sampled at the nearest pixel, or with `smooth` interpolated. The
+// checkerboard does not move with the picture.
 void DrawView(const ViewSource& source, const ViewTransform& transform, const Backdrop& backdrop,
               bool smooth, RgbImage& canvas);
 

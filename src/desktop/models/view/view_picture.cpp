@@ -23,7 +23,7 @@ namespace {
 
 std::vector<uint8_t> screenProfile;
 
-constexpr uint64_t kRecordBytes = 64 * 1024;  // of a decoded picture beside its pixels
+constexpr uint64_t kRecordBytes = 64 * 1024;  // of a decoded picture besides its pixels
 
 ScaleFilter ShrinkFilter() {
   const ScaleFilter filter = ScaleFilterFromKey(settings.ResizeFilter);
@@ -35,7 +35,7 @@ Status Shrink(const PictureRecord& picture, int32_t width, int32_t height, ViewP
                        shrunk.alpha);
 }
 
-// The transform of the profile that this thread met last: pictures of a folder and frames of an
+// The transform for the thread's last profile, as the pictures in a folder and frames of an
 // animation mostly share theirs.
 const ColorTransform& TransformOf(const std::vector<uint8_t>& profile) {
   thread_local std::vector<uint8_t> last;
@@ -96,7 +96,7 @@ uint64_t ViewPicture::Bytes() const {
 
 Status PrepareView(PicturePointer picture, ViewPicture& view) {
   const ViewRequest& request = view.request;
-  // Before the background joins in, whose color is the screen's.
+  // Before compositing with the background, whose color is already for the screen.
   const bool profiles = !picture->metadata.icc.empty() || !screenProfile.empty();
   if (request.look.profiles && profiles)
     (void)TransformOf(picture->metadata.icc).Apply(picture->image);
@@ -208,7 +208,7 @@ void ViewLoader::Forget(const std::string& path) {
                 [&](const ViewPicturePointer& picture) { return picture->request.path == path; });
 }
 
-// The most urgent request that has no picture yet and may still have one.
+// The most urgent request not yet loaded or failed.
 bool ViewLoader::NextRequest(ViewRequest& request) {
   if (full_) return false;
   for (const ViewRequest& candidate : requests_) {
@@ -222,8 +222,7 @@ bool ViewLoader::NextRequest(ViewRequest& request) {
   return false;
 }
 
-// Removes pictures that are no longer requested, then, from the least urgent on, those beyond the
-// capacity.
+// Drops pictures that are no longer requested, then the least urgent ones beyond the capacity.
 void ViewLoader::DropUnwanted() {
   std::vector<ViewPicturePointer> kept;
   uint64_t bytes = 0;

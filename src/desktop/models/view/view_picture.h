@@ -17,76 +17,76 @@
 
 namespace fotomill::desktop {
 
-// How a picture is to look, whichever it is.
+// Display options of pictures.
 struct ViewLook {
-  bool profiles = false;   // in the colors that its color profile means
-  bool keepAlpha = false;  // with its alpha plane, instead of on ViewModeBackground
+  bool profiles = false;   // apply color profiles
+  bool keepAlpha = false;  // keep the alpha plane instead of using ViewModeBackground
 
-  // From the keys as they are now.
+  // From the current settings.
   static ViewLook FromSettings();
   bool operator==(const ViewLook&) const = default;
 };
 
-// The color profile of the screen that pictures are made for from here on; empty for sRGB. To be
-// told before the first picture is asked for.
+// Sets the screen's color profile for pictures made from now on; empty for sRGB. Call before
+// requesting the first picture.
 void SetScreenProfile(std::vector<uint8_t> profile);
 
-// A picture as a view window wants it: a page of a file, with the size of the window that it is to
+// A picture for a view window: a page of a file, and the size of the window to
 // fit.
 struct ViewRequest {
   std::string path;
   int32_t page = 0;
-  int32_t fitWidth = 0, fitHeight = 0;  // device pixels, 0 for none
+  int32_t fitWidth = 0, fitHeight = 0;  // device pixels, 0: none
   ViewLook look = ViewLook::FromSettings();
   ReadOptions read = ReadOptionsFromSettings();
 
-  // Whether both mean the same pixels, whatever window they are to fit.
+  // Whether both have the same pixels, regardless of window size.
   bool SamePicture(const ViewRequest& other) const {
     return path == other.path && page == other.page && look == other.look;
   }
 };
 
-// Pixels of 24 bits with their alpha plane, which is empty where all are opaque.
+// Pixels of 24 bits with their alpha plane, empty if all are opaque.
 struct ViewPixels {
   PackedImage image, alpha;
 };
 
-// A decoded picture: upright, 24 bits, with an alpha plane only if its look wants it and not all of
-// it is opaque.
+// A decoded picture: upright, 24 bits, with an alpha plane only if its look keeps it and it is not
+// opaque.
 struct ViewPicture {
   ViewRequest request;
-  platform::FileFacts facts;  // of the file, as it was read
+  platform::FileFacts facts;  // of the file when it was read
   Status status = Status::Ok;
   std::string problem;             // why there is no picture, for people; empty if Ok
   PicturePointer picture;          // null unless Ok
-  // as large as the fit of the request's window; empty where that is the picture's own size or more
+  // scaled to fit the request's window; empty if the picture is smaller
   ViewPixels fitted;
-  std::vector<std::string> photo;  // what the camera wrote about it, in lines
-  double seconds = 0;              // that decoding took
+  std::vector<std::string> photo;  // the camera's facts, in lines
+  double seconds = 0;              // decoding time
 
-  // What it takes of memory, for caches.
+  // Memory size, for caches.
   uint64_t Bytes() const;
-  // Whether the file has become another one since.
+  // Whether the file has changed since.
   bool HasChanged() const;
 };
-// Shared between threads; no one changes it once it is made.
+// Shared between threads; immutable.
 using ViewPicturePointer = std::shared_ptr<const ViewPicture>;
 
-// "4000 x 3000 pixels, 3.2 MB, 25%" of a picture at a scale, and whether its file is incomplete.
+// "4000 x 3000 pixels, 3.2 MB, 25%" for a picture at a scale; also shows if the file is incomplete.
 std::string SizeAndZoom(const PictureRecord& picture, double scale);
 
-// A decoded picture's pixels for other programs: on a background, 0x00BBGGRR, and in sRGB whatever
-// the screen's colors are.
+// A decoded picture's pixels for other programs: on a background, 0x00BBGGRR, in sRGB regardless of
+// the screen.
 Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels);
 
-// Makes a decoded picture what the request of `view` asks for. Statuses of PrepareForDisplay.
+// Prepares a decoded picture for the request in `view`. Statuses of PrepareForDisplay.
 Status PrepareView(PicturePointer picture, ViewPicture& view);
 // Decodes and prepares a picture; never null, its status tells a failure. Any thread.
 ViewPicturePointer LoadViewPicture(const ViewRequest& request, ProgressSink* progress = nullptr);
 // A turned copy of a picture that was loaded; null if there is no memory for it.
 ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn);
 
-// Decodes pictures ahead, apart, and keeps those that are wanted up to a number of bytes.
+// Decodes pictures ahead in the background, and caches requested ones up to a number of bytes.
 class ViewLoader {
  public:
   // How far a file is decoded, in percent, a few times a second at most.
@@ -98,13 +98,13 @@ class ViewLoader {
   ViewLoader(const ViewLoader&) = delete;
   ViewLoader& operator=(const ViewLoader&) = delete;
 
-  // What is wanted from here on, most urgent first. Pictures that are not among these are given
-  // back; what does not fit into the capacity beside more urgent ones is not decoded, the first one
-  // always is.
+  // Sets the requested pictures, most urgent first. All others are
+  // dropped; those beyond the capacity are not decoded, except for the
+  // first one.
   void Want(std::vector<ViewRequest> requests);
-  // The picture of a request if it is there, whatever window it was fitted to.
+  // The picture for a request if it is loaded, fitted to any window size.
   ViewPicturePointer Find(const ViewRequest& request) const;
-  // Forgets a picture whose file has changed.
+  // Drops a picture whose file has changed.
   void Forget(const std::string& path);
 
  private:
@@ -120,26 +120,26 @@ class ViewLoader {
   std::vector<ViewRequest> requests_;
   std::vector<ViewPicturePointer> pictures_;
   bool full_ = false;
-  LatestWork work_;  // last: it uses the rest
+  LatestWork work_;  // must be last: it uses the other members
 };
 
-// Scales pictures apart; only the latest request counts.
+// Scales pictures in the background; only the latest request counts.
 class ViewScaler {
  public:
-  // `wake` is called on a thread of the pool when Fetch has something.
+  // `wake` is called on a pool thread when Fetch has a result.
   explicit ViewScaler(std::function<void()> wake);
   ~ViewScaler() = default;
   ViewScaler(const ViewScaler&) = delete;
   ViewScaler& operator=(const ViewScaler&) = delete;
 
-  // Wants the picture scaled to a size in device pixels, in place of an earlier request.
+  // Requests a picture scaled to a size in device pixels, replacing an earlier request.
   void Request(ViewPicturePointer picture, int32_t width, int32_t height);
-  // A picture, and its pixels in the size that was wanted.
+  // A picture, and its pixels in the requested size.
   struct Scaled {
     ViewPicturePointer picture;
     ViewPixels pixels;
   };
-  // What was finished since the last call, null if nothing.
+  // The result since the last call, null if there is none.
   std::unique_ptr<Scaled> Fetch();
 
  private:
@@ -151,7 +151,7 @@ class ViewScaler {
   ViewPicturePointer request_;
   int32_t width_ = 0, height_ = 0;
   std::unique_ptr<Scaled> finished_;
-  LatestWork work_;  // last: it uses the rest
+  LatestWork work_;  // must be last: it uses the other members
 };
 
 }  // namespace fotomill::desktop

@@ -14,8 +14,7 @@ namespace {
 // The scales of choice::ViewZoom 1 to 12.
 constexpr double kListedScales[] = {0.10, 0.20, 0.25, 1.0 / 3, 0.50, 0.75, 1, 1.5, 2, 3, 4, 8};
 
-// Where an edge of a picture of that length is: in the middle when it fits, else with no gap at
-// either side.
+// The position of an edge of this length: centered if it fits, otherwise without gaps.
 double KeptInside(double position, double length, double window) {
   if (length <= window) return (window - length) / 2;
   return std::clamp(position, window - length, 0.0);
@@ -56,7 +55,7 @@ void ViewTransform::ZoomTo(double scale, double x, double y) {
   const double before = scale_;
   mode_ = ZoomMode::Free;
   scale_ = std::clamp(scale, kSmallest, kLargest);
-  if (std::abs(scale_ - 1) < 0.01) scale_ = 1;  // steps up and down again end at exactly one
+  if (std::abs(scale_ - 1) < 0.01) scale_ = 1;  // zooming in and out again ends at exactly 1
   x_ = x - (x - x_) * scale_ / before;
   y_ = y - (y - y_) * scale_ / before;
   KeepInside();
@@ -109,7 +108,7 @@ void ViewTransform::ScaleByMode() {
   if (mode_ == ZoomMode::Fit && settings.OptimumZoomNoUpsize != 0) scale_ = std::min(scale_, 1.0);
 }
 
-// What was in the middle of the window stays there.
+// Keeps the center of the window.
 void ViewTransform::Update() {
   const double before = scale_;
   ScaleByMode();

@@ -4,56 +4,56 @@
 
 namespace fotomill::desktop {
 
-// How the scale follows the window: all of the picture in it, its width alone, the window filled,
-// or not at all.
+// How the scale follows the window: fit the picture, fit its width, fill the window, or
+// fixed.
 enum class ZoomMode { Fit, FitWidth, Fill, Free };
 
-// Zoom and place in relation to a picture and a window, so that they mean the same for others.
+// Zoom and position relative to picture and window, to apply them to another picture.
 struct ViewPlace {
   ZoomMode mode = ZoomMode::Fit;
-  double timesFit = 1;                  // the scale as a multiple of that which fits the window
-  // what is in the middle of the window, in parts of the picture
+  double timesFit = 1;  // the scale divided by the one that fits the window
+  // the picture's point at the center of the window, as fractions of its size
   double centerX = 0.5, centerY = 0.5;
 };
 
-// Where a picture is in a view window and how large: pure arithmetic in device pixels. A scale of 1
-// shows each pixel of the picture as one pixel of the screen.
+// Position and scale of a picture in a view window, in device pixels. At scale 1, each pixel of the
+// picture is one pixel on the screen.
 class ViewTransform {
  public:
-  static constexpr double kStep = 1.25;  // of zooming in and out
+  static constexpr double kStep = 1.25;  // for zooming in and out
   static constexpr double kSmallest = 0.01, kLargest = 64;
 
-  // Another picture at the same zoom, and at the same place in parts of it.
+  // Sets another picture with the same zoom and relative position.
   void SetPicture(int32_t width, int32_t height);
   void SetWindow(int32_t width, int32_t height);  // device pixels
-  // How the scale follows the window from now on.
+  // Sets how the scale follows the window.
   void SetMode(ZoomMode mode);
-  // What the key DefaultViewZoom stands for (choice::ViewZoom).
+  // Sets the mode of the key DefaultViewZoom (choice::ViewZoom).
   void SetModeFromKey(int32_t zoom);
-  // A scale of its own; the picture's point at x, y of the window stays there.
+  // Sets a fixed scale, keeping the picture's point at x, y of the window in place.
   void ZoomTo(double scale, double x, double y);
-  // As ZoomTo, in relation to the scale now.
+  // As ZoomTo, relative to the current scale.
   void ZoomBy(double factor, double x, double y) { ZoomTo(scale_ * factor, x, y); }
-  // To the scale in the middle of the window.
+  // Zooms around the center of the window.
   void ZoomToMiddle(double scale) { ZoomTo(scale, windowWidth_ / 2.0, windowHeight_ / 2.0); }
   void Pan(double dx, double dy);  // device pixels; stops at the picture's edges
-  // Zoom and position, for SetPlace of a later picture.
+  // Zoom and position, to restore with SetPlace.
   ViewPlace Place() const;
-  // From another picture or canvas; within the limits of the scale.
+  // Restores a place from another picture or canvas, within the scale limits.
   void SetPlace(const ViewPlace& place);
-  // To the middle; a zoom of its own gives way to what the key stands for, fitting stays.
+  // Centers the picture; a fixed scale is replaced by the key's, fit modes are kept.
   void StartAfresh(int32_t zoom);
 
-  // How the scale is found, and pixels of the screen a pixel of the picture.
+  // The mode, and screen pixels per picture pixel.
   ZoomMode Mode() const { return mode_; }
   double Scale() const { return scale_; }
-  // Size on the screen, at least a pixel.
+  // Size on the screen, at least 1 pixel.
   int32_t ShownWidth() const;
   int32_t ShownHeight() const;  // device pixels
-  // Of the picture's top left corner; negative when it is outside.
+  // Position of the picture's top left corner; negative if outside.
   int32_t X() const;
   int32_t Y() const;  // device pixels
-  // More of the picture is outside the window.
+  // Whether part of the picture is outside the window.
   bool CanPan() const { return ShownWidth() > windowWidth_ || ShownHeight() > windowHeight_; }
 
  private:
