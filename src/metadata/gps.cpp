@@ -63,7 +63,8 @@ bool ParseGpsLocation(std::string_view text, GpsLocation& location) {
 bool ParseGpsDegrees(std::string_view text, double& latitude, double& longitude) {
   double first = 0, second = 0;
   const bool parsed = TakeNumber(text, first) && TakeComma(text) && TakeNumber(text, second);
-  if (!parsed || !text.empty() || !(std::abs(first) <= 90) || !(std::abs(second) <= 360)) return false;
+  if (!parsed || !text.empty() || !(std::abs(first) <= 90) || !(std::abs(second) <= 360))
+    return false;
   latitude = first;
   longitude = second;
   return true;

@@ -115,8 +115,8 @@ TEST(Turn, SkipsFilesThatWouldLoseTexts) {
     for (const bool kept : {false, true}) {
       settings.PreserveEXIF = kept;
       WriteBytes(path, file);
-      const RewrittenFile turned = TurnPictureFile(path, path, {.turn = Orientation::QuarterRight}, {},
-                                                {.encode = EncodeOptionsFromSettings()});
+      const RewrittenFile turned = TurnPictureFile(path, path, {.turn = Orientation::QuarterRight},
+                                                   {}, {.encode = EncodeOptionsFromSettings()});
       EXPECT_EQ(turned.status, kept ? Status::Ok : Status::UnsuitableImage);
       EXPECT_EQ(turned.hint, kept ? "" : row.hint);
       EXPECT_EQ(ReadBytes(path) == file, !kept);

@@ -137,7 +137,8 @@ def destination_in_parts(folder):
 def name_prompt(folder):
     pictures = folder / "pictures"
     make_pictures(pictures, ["a.bmp", "b.bmp", "c.bmp"])
-    with Desktop(folder, pictures, settings=["DefaultFileExtension=png", "DestForceSourceDir=1", "PromptForDestName=1",
+    with Desktop(folder, pictures, settings=["DefaultFileExtension=png", "DestForceSourceDir=1",
+                                             "PromptForDestName=1",
                                              "WarnDestinationWrite=0"]) as desktop:
         desktop.wait(r"lines=3 .*missing=0 listing=0")
         start_convert(desktop)
@@ -193,7 +194,8 @@ def previews_when_wanted(folder):
 def box_shows_work(folder):
     pictures = folder / "pictures"
     make_pictures(pictures, ["a" * 120 + ".bmp", "b.bmp"])
-    with Desktop(folder, pictures, settings=["DefaultFileExtension=png", "DefaultViewMode=0", "CloseProgressWhenDone=0",
+    with Desktop(folder, pictures, settings=["DefaultFileExtension=png", "DefaultViewMode=0",
+                                             "CloseProgressWhenDone=0",
                                              "DestForceSourceDir=1", "ProgressShowMissingThumbnails=1",
                                              "WarnDestinationWrite=0"]) as desktop:
         desktop.wait(r"lines=2 .*listing=0 view=0")
@@ -213,9 +215,11 @@ def other_program(desktop):
     """A window of another program, in front; its title."""
     folder = desktop.folder / "other"
     (folder / "data").mkdir(parents=True, exist_ok=True)
-    environment = dict(desktop.environment, FOTOMILL_DATA=str(folder / "data"), XDG_RUNTIME_DIR=str(folder),
+    environment = dict(desktop.environment, FOTOMILL_DATA=str(folder / "data"),
+                       XDG_RUNTIME_DIR=str(folder),
                        FOTOMILL_DESKTOP_LOG=str(folder / "log"))
-    program = subprocess.Popen([desktop.program.args[0], str(folder)], env=environment, stdin=subprocess.DEVNULL,
+    program = subprocess.Popen([desktop.program.args[0], str(folder)], env=environment,
+                               stdin=subprocess.DEVNULL,
                                stdout=subprocess.DEVNULL, stderr=subprocess.DEVNULL)
     desktop.focus("^other - Fotomill", settle=False, native=True)
     return program

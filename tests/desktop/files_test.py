@@ -33,7 +33,7 @@ def rename_delete_undo_paste(folder):
         desktop.wait(r"files Undo rename of a.bmp done=1")
         desktop.wait(r"listed 2")
         assert names(pictures) == ["a.bmp", "b.bmp"], names(pictures)
-        # Copy and paste between folders; pasting into the same folder adds the prefix for duplicates.
+        # Copy and paste between folders; within one folder, copies get the prefix for duplicates.
         desktop.key("ctrl+a", "ctrl+c", "ctrl+v")
         desktop.wait(r"files Copy of 2 files done=2 failed=0")
         assert names(pictures) == ["Duplicate of a.bmp", "Duplicate of b.bmp", "a.bmp",
@@ -120,7 +120,8 @@ def rename_in_sequence(folder):
         desktop.type("no/name")
         desktop.key("alt+p", "Return")
         desktop.wait(r"batch ended")
-        assert [name[4:] for name in names(pictures)] == ["a.bmp", "b.bmp", "c.bmp"], names(pictures)
+        renamed = [name[4:] for name in names(pictures)]
+        assert renamed == ["a.bmp", "b.bmp", "c.bmp"], renamed
         ini = (desktop.data / "Fotomill Professional 11.ini").read_text()
         assert "SequentialRenameBaseName=beach\n" in ini, ini
 

@@ -1,5 +1,5 @@
 #!/usr/bin/env python3
-"""How the real program opens files: other programs for media, the File menu; what folders say of themselves."""
+"""How the program opens files: other programs for media, the File menu, folders' own settings."""
 import struct
 import zlib
 
@@ -16,7 +16,8 @@ def register_player(home, script, marker):
     script.write_text(f'#!/bin/sh\nsleep 2.5\nprintf "%s" "$2" >{marker}\n')
     script.chmod(0o755)
     (applications / "player.desktop").write_text(
-        f"[Desktop Entry]\nType=Application\nName=Player\nExec={script} 100%% %u\nMimeType=audio/x-wav;\n")
+        f"[Desktop Entry]\nType=Application\nName=Player\nExec={script} 100%% %u\n"
+        "MimeType=audio/x-wav;\n")
     (applications / "mimeinfo.cache").write_text("[MIME Cache]\naudio/x-wav=player.desktop;\n")
 
 
@@ -92,10 +93,12 @@ def override_that_appears(folder):
 def large_png(path, side=13000):
     """A gray picture that takes a while to decode."""
     def chunk(kind, body):
-        return struct.pack(">I", len(body)) + kind + body + struct.pack(">I", zlib.crc32(kind + body))
+        checksum = zlib.crc32(kind + body)
+        return struct.pack(">I", len(body)) + kind + body + struct.pack(">I", checksum)
 
     pixels = zlib.compress((b"\4" + bytes(side)) * side, 1)
-    path.write_bytes(b"\x89PNG\r\n\x1a\n" + chunk(b"IHDR", struct.pack(">2I5B", side, side, 8, 0, 0, 0, 0)) +
+    header = struct.pack(">2I5B", side, side, 8, 0, 0, 0, 0)
+    path.write_bytes(b"\x89PNG\r\n\x1a\n" + chunk(b"IHDR", header) +
                      chunk(b"IDAT", pixels) + chunk(b"IEND", b""))
 
 

@@ -37,7 +37,8 @@ TEST(NameField, KeepsTheExtensionApart) {
   EXPECT_EQ(NameInField("/p/else/a.png", "/p/out/"), "/p/else/a");
   const struct {
     const char *text, *path;
-  } rows[] = {{"photo", "photo.png"}, {"my.photo", "my.photo.png"}, {"photo.PNG", "photo.PNG"}, {"", ""}};
+  } rows[] = {
+      {"photo", "photo.png"}, {"my.photo", "my.photo.png"}, {"photo.PNG", "photo.PNG"}, {"", ""}};
   for (const auto& row : rows) EXPECT_EQ(PathOfField(row.text, "png"), row.path);
 }
 

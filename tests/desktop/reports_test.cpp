@@ -98,8 +98,10 @@ TEST_F(Reports, ExifRowsMatchTheText) {
 std::vector<uint8_t> BlockWithPlace() {
   test::BlockBuilder builder;
   const uint32_t first = builder.Directory({{0x8825, 4, 1, 0}});
-  const uint32_t angle = builder.Bytes({0, 0, 0, 0, 1, 0, 0, 0, 0, 0, 0, 0, 1, 0, 0, 0, 0, 0, 0, 0, 1, 0, 0, 0});
-  const uint32_t gps = builder.Directory({{1, 2, 2, 'N'}, {2, 5, 3, angle}, {3, 2, 2, 'E'}, {4, 5, 3, angle}});
+  const uint32_t angle =
+      builder.Bytes({0, 0, 0, 0, 1, 0, 0, 0, 0, 0, 0, 0, 1, 0, 0, 0, 0, 0, 0, 0, 1, 0, 0, 0});
+  const uint32_t gps =
+      builder.Directory({{1, 2, 2, 'N'}, {2, 5, 3, angle}, {3, 2, 2, 'E'}, {4, 5, 3, angle}});
   builder.Patch32(first + 2 + 8, gps);
   return builder.block;
 }
@@ -120,8 +122,9 @@ TEST_F(Reports, PlacesAreReadableAndMeasured) {
 TEST_F(Reports, CardsStayWhole) {
   const std::string path = folder_.Path("a.fits");
   std::string header;
-  for (const char* card : {"SIMPLE  =                    T", "BITPIX  =                    8", "NAXIS   =                    2",
-                           "NAXIS1  =                    2", "NAXIS2  =                    1", "OBJECT  = 'NGC: 4565'", "END"})
+  for (const char* card : {"SIMPLE  =                    T", "BITPIX  =                    8",
+                           "NAXIS   =                    2", "NAXIS1  =                    2",
+                           "NAXIS2  =                    1", "OBJECT  = 'NGC: 4565'", "END"})
     header += std::string(card).append(80 - std::string_view(card).size(), ' ');
   header.resize(2880, ' ');
   test::WriteText(path, header + std::string(2880, '\0'));

@@ -64,14 +64,16 @@ Expect "a wrong option" "usage:*status 2" "$(Release --chek)"
 
 # A release: the source, packages (a stand-in here), and checksums that hold.
 printf '#!/bin/sh\nexit 0\n' >"$project/check"
-printf '#!/bin/sh\nmkdir -p "$1" && echo package >"$1/fotomill_1.2.3-1_all.deb" && echo >"$1/build.log"\n' \
+printf '%s\n' '#!/bin/sh' \
+  'mkdir -p "$1" && echo package >"$1/fotomill_1.2.3-1_all.deb" && echo >"$1/build.log"' \
   >"$project/packaging/deb/make"
 git -C "$project" commit -qam five
 Expect "a release" '*fotomill-1.2.3.tar.xz*git tag -a v1.2.3*status 0' "$(Release)"
 release=$project/build/release-1.2.3
 Expect "its files" "2" "$(wc -l <"$release/SHA256SUMS")"
 Expect "a package" "1" "$(grep -c '  debian-.*/fotomill_1.2.3-1_all.deb$' "$release/SHA256SUMS")"
-Expect "checksums" "0" "$(cd "$release" && sha256sum -c --quiet SHA256SUMS >/dev/null 2>&1; echo $?)"
+checked=$(cd "$release" && sha256sum -c --quiet SHA256SUMS >/dev/null 2>&1; echo $?)
+Expect "checksums" "0" "$checked"
 first=$(grep tar.xz "$release/SHA256SUMS")
 touch "$project/src/a b.cpp"
 Expect "the same source again" "$first" \

@@ -59,11 +59,13 @@ TEST(GpsPlaces, EntriesTellThePlaceAgain) {
 constexpr std::string_view kTrack = R"(<?xml version="1.0"?>
 <g:gpx xmlns:g="http://www.topografix.com/GPX/1/1"><g:trk><g:trkseg>
 <g:trkpt lat="10.2" lon="-179.9"><g:ele>120</g:ele><g:time>2024-05-31T12:10:00.0Z</g:time></g:trkpt>
-<g:trkpt lat="10.0" lon="179.9"><g:ele>100</g:ele><g:time> 2024-05-31T14:00:00+02:00 </g:time></g:trkpt>
+<g:trkpt lat="10.0" lon="179.9"><g:ele>100</g:ele><g:time> 2024-05-31T14:00:00+02:00
+ </g:time></g:trkpt>
 <g:trkpt lat="95" lon="0"><g:time>2024-05-31T12:05:00Z</g:time></g:trkpt>
 <g:trkpt lat="50" lon="0"></g:trkpt>
 <g:trkpt lat="x" lon="0"><g:time>2024-05-31T12:05:00Z</g:time></g:trkpt>
-</g:trkseg><g:trkseg><g:trkpt lat="20" lon="30"><g:time>2024-05-31T15:00:00Z</g:time></g:trkpt></g:trkseg></g:trk></g:gpx>)";
+</g:trkseg><g:trkseg><g:trkpt lat="20" lon="30"><g:time>2024-05-31T15:00:00Z</g:time></g:trkpt>
+</g:trkseg></g:trk></g:gpx>)";
 
 TEST(GpsPlaces, TrackIsInterpolated) {
   GpsTrack track;

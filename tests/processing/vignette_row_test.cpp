@@ -13,7 +13,8 @@ TEST(VignetteRow, IsTheSameOnEveryProcessor) {
       SCOPED_TRACE(testing::Message() << pixels << " pixels, size " << size);
       const VignetteRow row{across.data(), 0.1, size, 0.7, {20, 255, 0}};
       std::vector<uint8_t> here(3 * pixels + 8);  // the last eight must not be written
-      for (size_t i = 0; i < here.size(); ++i) here[i] = static_cast<uint8_t>(Scatter(int32_t(i), 3));
+      for (size_t i = 0; i < here.size(); ++i)
+        here[i] = static_cast<uint8_t>(Scatter(int32_t(i), 3));
       std::vector<uint8_t> baseline = here;
       ShadeRowHere()(row, here.data(), pixels);
       BaselineShadeRow()(row, baseline.data(), pixels);

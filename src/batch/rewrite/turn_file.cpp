@@ -106,7 +106,8 @@ class Turning {
       return Fail(status, turned.obstacle.shown);
     }
     if (!file.Intact()) return Status::FileReadError;
-    if (turned.method == JpegTurnMethod::Trimmed) rewrite_.result.note = TrRecorded("An edge was cropped.");
+    if (turned.method == JpegTurnMethod::Trimmed)
+      rewrite_.result.note = TrRecorded("An edge was cropped.");
     if (!turned.obstacle.empty()) {
       const bool tag = turned.method == JpegTurnMethod::Tag;
       rewrite_.result.note = tag ? TrRecorded("Only the EXIF orientation was changed.")

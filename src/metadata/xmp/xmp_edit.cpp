@@ -66,7 +66,8 @@ bool BlankXmpPlaces(std::span<uint8_t> packet) {
       const size_t close = text.find('>', at);
       if (close == std::string_view::npos) break;
       const std::string closing = "</" + tag;
-      const size_t last = text[close - 1] == '/' ? close : text.find('>', text.find(closing, close));
+      const size_t last =
+          text[close - 1] == '/' ? close : text.find('>', text.find(closing, close));
       if (last == std::string_view::npos) break;
       end = last + 1;
     } else {
@@ -76,8 +77,8 @@ bool BlankXmpPlaces(std::span<uint8_t> packet) {
       if (last == std::string_view::npos) break;
       end = last + 1;
     }
-    std::fill(packet.begin() + static_cast<ptrdiff_t>(begin), packet.begin() + static_cast<ptrdiff_t>(end),
-              uint8_t{' '});
+    std::fill(packet.begin() + static_cast<ptrdiff_t>(begin),
+              packet.begin() + static_cast<ptrdiff_t>(end), uint8_t{' '});
     found = true;
     at = end;
   }

@@ -36,8 +36,8 @@ constexpr uint8_t RoundedLevel(double value) {
 }
 
 // Applies effects in order in a single pass; adjacent tables are merged
-// first, also into an effect that absorbs them. For palette pictures only the palette is changed; 24-bit pictures
-// are changed row by row. The result equals that of separate passes.
+// first, also into an effect that absorbs them. For palette pictures only the palette is changed;
+// 24-bit pictures are changed row by row. The result equals that of separate passes.
 // FunctionCancelled (4) leaves the picture half done; EmptyImage without one.
 Status ApplyPointEffects(PictureRecord& picture, std::span<const PointEffect> effects,
                          const Work& work);

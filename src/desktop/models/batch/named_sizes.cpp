@@ -15,7 +15,8 @@ constexpr int32_t kMostPixels = 100000;  // per edge
 std::optional<NamedSize> ReadSize(std::string_view text) {
   const size_t comma = text.find(',');
   if (comma == std::string_view::npos) return std::nullopt;
-  const auto width = ParseNumber(text.substr(0, comma)), height = ParseNumber(text.substr(comma + 1));
+  const auto width = ParseNumber(text.substr(0, comma)),
+             height = ParseNumber(text.substr(comma + 1));
   const auto isEdge = [](const std::optional<int32_t>& edge) {
     return edge && *edge >= 1 && *edge <= kMostPixels;
   };
