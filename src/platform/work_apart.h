@@ -4,6 +4,7 @@
 #include <functional>
 #include <optional>
 #include <span>
+#include <string>
 
 namespace fotomill::platform {
 
@@ -65,6 +66,9 @@ struct ApartOrder {
   const char* task;  // its name in the table
   std::span<const uint8_t> request = {};
   std::span<const uint8_t> input = {};
+  // A regular file as the input, for files too large to copy; empty: `input`. The process can only
+  // read it, and a file that is truncated meanwhile breaks the task.
+  std::string inputFile = {};
   SharedBlock& reply;
   // CPU time; the wall-clock limit is ten times this
   unsigned seconds = 60;

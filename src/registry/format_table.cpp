@@ -20,10 +20,6 @@ Status UnpublishedInfo(PictureRecord&, const ReadRequest&) { return Status::Unsu
 Status UnpublishedRead(PictureRecord&, const ReadRequest&) { return Status::UnsupportedFormat; }
 Status UnpublishedWrite(PictureRecord&, const WriteOptions&) { return Status::UnsupportedFormat; }
 
-// Hooks of the archive rows: ZIP needs nothing loaded; RAR needs its library.
-int32_t Ready() { return 1; }
-int32_t NoStartup() { return 0; }
-
 // A position in the registry. A codec family with a row of that extension fills it; otherwise the
 // values here are used.
 struct Place {
@@ -33,7 +29,6 @@ struct Place {
   uint32_t maxBits = 0;
   uint32_t flags = 0;
   bool unpublished = false;
-  LifeOperation startup = nullptr;  // and shutdown
 };
 
 // The order matters: the first row that matches a name wins, so .jpeg is read as JPE and
@@ -115,8 +110,8 @@ constexpr Place kPlaces[] = {
     {"WDP"},
     {"WMF", "(WMF) Windows Metafile", 1, 24, FMT_RENDERED | FMT_SECONDARY},
     {"WMV", "(WMV) WMV video", 1, 24, FMT_BITMAP | FMT_ANIMATED | FMT_TIMED | FMT_SECONDARY | FMT_MEDIA},
-    {"RAR", "(RAR) RAR archive", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE, false, NoStartup},
-    {"ZIP", "(ZIP) ZIP archive", 1, 24, FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE, false, Ready},
+    {"RAR"},
+    {"ZIP"},
 };
 // clang-format on
 static_assert(std::size(kPlaces) == kSpareRow);
@@ -126,8 +121,6 @@ FormatEntry RowWithoutCodec(const Place& place) {
   row.info = place.unpublished ? UnpublishedInfo : NoInfo;
   row.read = place.unpublished ? UnpublishedRead : NoRead;
   row.write = place.unpublished ? UnpublishedWrite : NoWrite;
-  row.startup = row.shutdown = place.startup;
-  row.canStartUp = place.startup == Ready;
   row.maxBits = place.maxBits;
   row.extension = place.extension;
   row.description = place.description;

@@ -19,6 +19,7 @@ FLOORS = [
     ["texts"],
     ["picture"],
     ["containers"],
+    ["archive"],
     ["processing"],
     ["drawing"],
     ["formats"],
@@ -27,7 +28,6 @@ FLOORS = [
     ["plugins"],
     ["catalog"],
     ["files"],
-    ["archive"],
     ["operations"],
     ["settings"],  # lower layers get settings as options of a job
     ["batch"],

@@ -1,5 +1,6 @@
 #include "cli/frame/commands.h"
 
+#include "cli/commands/archive/archive.h"
 #include "cli/commands/config.h"
 #include "cli/commands/contact_sheet.h"
 #include "cli/commands/convert.h"
@@ -51,6 +52,10 @@ constexpr Command kCommands[] = {
     {"exif owner",  TrLater("set owner, copyright and equipment from the configuration"), Needs::Formats, SetUpExifOwner},
     {"exif gps",    TrLater("set where pictures were taken, from a track, a list or by hand"), Needs::Formats, SetUpExifGps},
     {"exif strip",  TrLater("remove metadata for good, pixels unchanged"),              Needs::Formats,  SetUpExifStrip},
+    {"archive list",    TrLater("list what is in a ZIP or RAR archive"),                Needs::Settings, SetUpArchiveList},
+    {"archive extract", TrLater("extract files from a ZIP or RAR archive"),             Needs::Settings, SetUpArchiveExtract},
+    {"archive create",  TrLater("create a ZIP archive, encrypted if you like"),         Needs::Settings, SetUpArchiveCreate},
+    {"archive test",    TrLater("verify the checksums of a ZIP or RAR archive"),        Needs::Settings, SetUpArchiveTest},
     {"faces",   TrLater("find faces in pictures"),                                      Needs::Formats,  SetUpFaces},
     {"plugins", TrLater("list the plug-in formats"),                                    Needs::Settings, SetUpPlugins},
     {"similar", TrLater("find pictures that look alike"),                               Needs::Formats,  SetUpSimilar},

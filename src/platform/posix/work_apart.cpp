@@ -7,6 +7,7 @@
 #include <sys/prctl.h>
 #include <sys/resource.h>
 #include <sys/socket.h>
+#include <sys/stat.h>
 #include <sys/wait.h>
 #include <unistd.h>
 
@@ -266,17 +267,42 @@ bool StartProcess(Process& process) {
   return started;
 }
 
-bool SendOrder(const Process& process, const ApartOrder& order, const SharedBlock& input) {
+// The input of a process: a copy in memory, or an open file. A handle of -1: there is none.
+struct Input {
+  SharedBlock block;
+  Handle file;
+  uint64_t size = 0;
+  intptr_t SystemHandle() const { return file.IsOpen() ? file.Number() : block.SystemHandle(); }
+
+  // False if memory runs out, or the file is not a regular one that can be read.
+  bool Take(const ApartOrder& order) {
+    if (!order.inputFile.empty()) {
+      file.Reset(open(order.inputFile.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));
+      struct stat facts = {};
+      if (!file.IsOpen() || fstat(file.Number(), &facts) != 0 || !S_ISREG(facts.st_mode))
+        return false;
+      size = static_cast<uint64_t>(facts.st_size);
+      return true;
+    }
+    size = order.input.size();
+    if (size == 0) return true;
+    if (!block.Allocate(size)) return false;
+    std::ranges::copy(order.input, block.Bytes().begin());
+    return true;
+  }
+};
+
+bool SendOrder(const Process& process, const ApartOrder& order, const Input& input) {
   OrderHead head;
   std::strncpy(head.task.data(), order.task, head.task.size() - 1);
   head.seconds = order.seconds;
   head.requestSize = static_cast<uint32_t>(order.request.size());
   head.memory = order.memory;
-  head.inputSize = order.input.size();
+  head.inputSize = input.size;
   head.replySize = order.reply.Bytes().size();
   // Both are always sent; the worker ignores an empty input.
   const std::array<int, 2> handles = {
-      static_cast<int>(order.input.empty() ? order.reply.SystemHandle() : input.SystemHandle()),
+      static_cast<int>(input.size == 0 ? order.reply.SystemHandle() : input.SystemHandle()),
       static_cast<int>(order.reply.SystemHandle())};
   alignas(cmsghdr) std::array<char, CMSG_SPACE(sizeof handles)> control{};
   iovec parts[] = {{&head, sizeof head},
@@ -344,11 +370,8 @@ std::optional<int> ServeApart(int count, const char* const* arguments,
 
 ApartResult RunApart(const ApartOrder& order, const std::function<void(int32_t)>& told) {
   if (!servesItself || order.request.size() > kMostRequest) return ApartResult::NotStarted;
-  SharedBlock input;
-  if (!order.input.empty()) {
-    if (!input.Allocate(order.input.size())) return ApartResult::NotStarted;
-    std::ranges::copy(order.input, input.Bytes().begin());
-  }
+  Input input;
+  if (!input.Take(order)) return ApartResult::NotStarted;
   Process process;
   if (!idleProcesses.Take(process) && !StartProcess(process)) return ApartResult::NotStarted;
   const ApartResult result =

@@ -1,0 +1,214 @@
+#include <memory>
+#include <set>
+#include <string>
+#include <vector>
+
+#include "archive/entry_name.h"
+#include "archive/zip_writer.h"
+#include "catalog/thumbnails/thumbnail_file.h"
+#include "cli/commands/archive/archive.h"
+#include "cli/commands/archive/archive_options.h"
+#include "cli/frame/options.h"
+#include "cli/frame/result_output.h"
+#include "cli/frame/terminal_prompts.h"
+#include "core/text.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+#include "settings/settings.h"
+#include "texts/system_reason.h"
+#include "texts/texts.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+struct CreateOptions {
+  PasswordOptions password;
+  std::string overwrite;
+  bool json = false;
+  bool dryRun = false;
+};
+
+// A file to be archived.
+struct Member {
+  std::string path, name;  // on disk, and in the archive
+  Status status = Status::Ok;
+  std::string hint = {};
+};
+
+// Collects the files of the command line; folders with everything below them, except behind links.
+class Members {
+ public:
+  explicit Members(const std::string& archive) : archive_(platform::AbsolutePath(archive)) {}
+
+  void AddNamed(const std::string& path) {
+    const platform::FileKind kind = platform::FactsOf(path).kind;
+    if (kind == platform::FileKind::Folder) {
+      AddFolder(path);
+    } else if (kind == platform::FileKind::Regular) {
+      AddFile(path);
+    } else {
+      members_.push_back({path, path, Status::FileOpenError});
+    }
+  }
+  const std::vector<Member>& All() const { return members_; }
+
+ private:
+  void AddFolder(const std::string& folder) {
+    const auto entries = platform::ListFolder(folder);
+    if (!entries) {
+      members_.push_back({folder, folder, Status::FileOpenError, WithReason("")});
+      return;
+    }
+    for (const platform::FolderEntry& entry : *entries) {
+      const std::string path = platform::JoinFolder(folder, entry.name);
+      if (entry.kind == platform::FileKind::Folder && !entry.link) AddFolder(path);
+      if (entry.kind == platform::FileKind::Regular) AddFile(path);
+    }
+  }
+  void AddFile(const std::string& path) {
+    if (platform::AbsolutePath(path) == archive_) return;
+    Add(path);
+    const std::string thumbnail = ThumbnailPathFor(path);
+    if (settings.ArchiveAddThumbnails != 0 && thumbnail != path &&
+        platform::IsRegularFile(thumbnail) && !paths_.contains(thumbnail))
+      Add(thumbnail);
+  }
+  void Add(const std::string& path) {
+    if (!paths_.insert(path).second) return;  // named twice
+    const std::string stored = settings.ArchivePreservePaths != 0
+                                   ? StoredEntryName(path)
+                                   : std::string(platform::FileNameOf(path));
+    Member member = {path, ReadableEntryName(stored)};
+    if (!IsSafeEntryName(member.name)) {
+      member.status = Status::InvalidDestination;
+      member.hint = Tr("Archives take no such names.");
+    } else if (!names_.insert(member.name).second) {
+      member.status = Status::InvalidDestination;
+      member.hint = Tr("Another file has the same name in the archive.");
+    }
+    members_.push_back(std::move(member));
+  }
+
+  const std::string archive_;
+  std::vector<Member> members_;
+  std::set<std::string> paths_, names_;
+};
+
+// What to do with an existing archive: false to leave it, with a note.
+bool SettleArchive(const std::string& overwrite, const CommandContext& context,
+                   ResultOutput& output, std::string& path, platform::Existing& existing) {
+  existing = platform::Existing::Refuse;
+  if (platform::ExistenceOf(path) == platform::Existence::No) return true;
+  std::string how = overwrite;
+  if (how == "ask") {
+    TerminalPrompts prompts(context, output);
+    OverwriteQuestion question;
+    question.source = question.path = path;
+    question.name = platform::SplitPath(path).base;
+    const OverwriteAnswer answer = prompts.AskOverwrite(question);
+    const bool sameName = answer.name == question.name;
+    how = !answer.ok ? "skip" : answer.checks.keepBoth || !sameName ? "keep-both" : "replace";
+    if (answer.ok && !sameName && answer.name.find('/') == std::string::npos) {
+      path = platform::JoinFolder(platform::FolderOf(path), answer.name + ".zip");
+      if (platform::ExistenceOf(path) == platform::Existence::No) return true;
+    }
+  }
+  if (how == "replace") existing = platform::Existing::Replace;
+  if (how == "replace" || (how == "keep-both" && KeepBoth(path, platform::ExistenceOf)))
+    return true;
+  output.Note(output.ShownMessage(path) + ": " + Tr("exists; skipped."));
+  return false;
+}
+
+// Adds the files that can be added, and names those that cannot. Anything but Ok ends the archive.
+Status AddMembers(const std::vector<Member>& members, ZipWriter& zip, ResultOutput& output,
+                  std::vector<const Member*>& added) {
+  for (const Member& member : members) {
+    output.ShowProgress(added.size(), members.size());
+    Status status = member.status;
+    if (status == Status::Ok) status = zip.Add(member.path, member.name, {});
+    if (status == Status::Ok) {
+      added.push_back(&member);
+    } else if (member.status != Status::Ok || status == Status::FileOpenError) {
+      output.FileFailed(member.path, status,
+                        member.hint.empty() ? WithReason("") : member.hint);
+    } else {
+      return status;
+    }
+  }
+  return Status::Ok;
+}
+
+Status WriteArchive(const std::string& path, platform::Existing existing,
+                    const std::string& password, const std::vector<Member>& members,
+                    ResultOutput& output) {
+  ZipWriter zip;
+  RETURN_IF_BAD(zip.Create(path, password));
+  std::vector<const Member*> added;
+  RETURN_IF_BAD(AddMembers(members, zip, output, added));
+  if (added.empty()) return Status::Ok;  // each has its message
+  if (zip.Finish(existing) != platform::CommitResult::Done) return Status::ErrorWritingFile;
+  for (const Member* member : added) output.FileDone(member->path, member->name);
+  return Status::Ok;
+}
+
+int RunCreate(CreateOptions options, const CommandContext& context) {
+  std::string path = context.names.values[0], password;
+  std::string wrong = ReadPassword(options.password, password);
+  if (wrong.empty()) wrong = SettleOverwrite(context, options.overwrite);
+  if (wrong.empty() && !EqualIgnoringCase(platform::ExtensionOf(path), "zip"))
+    wrong = Tr("The name of the archive must end in \".zip\"; no other kind can be written.");
+  if (wrong.empty() && options.password.ask && !context.MayAsk())
+    wrong = Tr("--ask-password needs a terminal.");
+  if (!wrong.empty()) return UsageError(context, wrong);
+  ResultOutput output(context, options.json);
+  output.KeepGoing();
+  platform::Existing existing = platform::Existing::Refuse;
+  if (options.dryRun && options.overwrite == "ask") options.overwrite = "keep-both";
+  if (!SettleArchive(options.overwrite, context, output, path, existing)) return output.Finish();
+  Members members(path);
+  for (size_t i = 1; i < context.names.values.size(); ++i) members.AddNamed(context.names.values[i]);
+  if (options.dryRun) {
+    for (const Member& member : members.All()) {
+      if (member.status == Status::Ok) {
+        output.FileDone(member.path, member.name);
+      } else {
+        output.FileFailed(member.path, member.status, member.hint);
+      }
+    }
+    return output.Finish();
+  }
+  if (options.password.ask && password.empty()) {
+    TerminalPrompts prompts(context, output);
+    const auto typed = prompts.AskPassword(path);
+    if (!typed) return output.Finish();
+    password = *typed;
+  }
+  const Status status = WriteArchive(path, existing, password, members.All(), output);
+  if (status != Status::Ok) output.FileFailed(path, status, WithReason(""));
+  return output.Finish();
+}
+
+}  // namespace
+
+void SetUpArchiveCreate(CLI::App& app, CommandContext& context) {
+  auto options = std::make_shared<CreateOptions>();
+  context.names.Declare("ARCHIVE FILE...", "The ZIP archive to create, and files and folders for it",
+                        2);
+  AddName(app, "--password-file", options->password.file, "FILE",
+          "Encrypt with the password in the first line of a file (AES-256)");
+  AddFlag(app, "--ask-password", options->password.ask, "Encrypt with a password that is asked for");
+  AddOverwrite(app, options->overwrite);
+  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be archived");
+  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
+  SetFooter(app,
+            "Folders are archived with everything below them. Files of compressed formats are stored, others deflated.\n"
+            "Names stay readable in an encrypted archive. ArchivePreservePaths says whether paths are kept,\n"
+            "ArchiveAddThumbnails whether thumbnail files are added to their pictures.",
+            "fotomill archive create holiday.zip holiday");
+  context.run = [options, &context] { return RunCreate(*options, context); };
+}
+
+}  // namespace fotomill::cli
