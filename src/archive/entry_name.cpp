@@ -61,7 +61,7 @@ std::string ReadableEntryName(std::string_view bytes) {
     }
   }
   while (name.starts_with("./") && name.size() > 2) name.erase(0, 2);
-  if (name.size() > 1 && name.ends_with('/')) name.pop_back();
+  while (name.size() > 1 && name.ends_with('/')) name.pop_back();
   return name;
 }
 
