@@ -42,7 +42,7 @@ ArchiveKind Rar4Kind(ByteReader bytes) {
 }
 
 ArchiveKind Rar5Kind(ByteReader bytes) {
-  bytes.Skip(4);  // CRC
+  bytes.Skip(4);         // CRC
   (void)Number5(bytes);  // size of the header
   const uint64_t type = Number5(bytes), flags = Number5(bytes);
   if (type == kEncryptionHeader5) return {ArchiveKind::Rar5, false, true};

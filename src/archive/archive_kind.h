@@ -10,8 +10,8 @@ namespace fotomill {
 // public description of the older RAR headers.
 struct ArchiveKind {
   enum Type : uint8_t { None, Zip, Rar4, Rar5 } type = None;
-  bool volume = false;        // one of several parts
-  bool namesLocked = false;   // even the list of names is encrypted
+  bool volume = false;       // one of several parts
+  bool namesLocked = false;  // even the list of names is encrypted
 };
 // Looks at a whole file; reads its headers only.
 ArchiveKind ArchiveKindOf(std::span<const uint8_t> file);

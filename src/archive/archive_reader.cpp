@@ -151,7 +151,9 @@ class Unpacker final : public Records {
  public:
   Unpacker(std::span<const ArchiveEntry> entries, const std::vector<bool>& wanted,
            uint64_t fileSize, EntryReceiver& receiver)
-      : entries_(entries), wanted_(wanted), receiver_(receiver),
+      : entries_(entries),
+        wanted_(wanted),
+        receiver_(receiver),
         most_(std::max(archiveLimits.unpackedBytes, fileSize * archiveLimits.ratio)) {}
 
   bool Entry(const RawEntry&, std::string_view name) override {
@@ -241,7 +243,8 @@ std::string_view TroubleText(ArchiveTrouble trouble) {
     case ArchiveTrouble::Method: return TrLater("It is compressed or encrypted in an unknown way.");
     case ArchiveTrouble::TooManyEntries: return TrLater("It has too many entries.");
     case ArchiveTrouble::Bomb:
-      return TrLater("It unpacks to far more than its own size, as archives made to fill a disk do.");
+      return TrLater(
+          "It unpacks to far more than its own size, as archives made to fill a disk do.");
     case ArchiveTrouble::Changed: return TrLater("The archive was changed meanwhile.");
   }
   return {};
@@ -254,8 +257,7 @@ std::string_view RefusalText(EntryRefusal refusal) {
       return TrLater("Its name is unsafe: it could lead out of the folder.");
     case EntryRefusal::Link: return TrLater("It is a link.");
     case EntryRefusal::Special: return TrLater("It is a device or another special file.");
-    case EntryRefusal::Duplicate:
-      return TrLater("An earlier entry has the same name.");
+    case EntryRefusal::Duplicate: return TrLater("An earlier entry has the same name.");
   }
   return {};
 }

@@ -37,8 +37,8 @@ struct ArchiveSource {
   StopToken stop = {};
 };
 
-// Reads the entries' headers, in the order of the archive. `entries` has those before an error. Statuses of WalkArchive,
-// besides FileOpenError, and FunctionCancelled if `stop` was requested.
+// Reads the entries' headers, in the order of the archive. `entries` has those before an error.
+// Statuses of WalkArchive, besides FileOpenError, and FunctionCancelled if `stop` was requested.
 ArchiveEnd ListArchive(const ArchiveSource& source, std::vector<ArchiveEntry>& entries);
 
 // Receives the contents of entries.

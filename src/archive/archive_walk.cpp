@@ -24,8 +24,7 @@ class Walk {
   Walk(const ArchiveKind& kind, bool hasPassword, ArchiveSink& sink)
       : rar_(kind.type != ArchiveKind::Zip), hasPassword_(hasPassword), sink_(sink) {}
 
-  ArchiveEnd Run(std::span<const uint8_t> file, const std::string& password,
-                 uint32_t mostEntries) {
+  ArchiveEnd Run(std::span<const uint8_t> file, const std::string& password, uint32_t mostEntries) {
     const ArchiveLibrary& library = LibArchive();
     Reader reader(library.read_new());
     if (reader == nullptr) return {Status::MemoryAllocationError};
@@ -55,9 +54,9 @@ class Walk {
     RawEntry raw;
     const auto type = library.entry_filetype(entry);
     raw.kind = library.entry_hardlink(entry) != nullptr || type == AE_IFLNK ? RawEntry::Link
-               : type == AE_IFDIR                                            ? RawEntry::Folder
-               : type == AE_IFREG                                            ? RawEntry::File
-                                                                             : RawEntry::Other;
+               : type == AE_IFDIR                                           ? RawEntry::Folder
+               : type == AE_IFREG                                           ? RawEntry::File
+                                                                            : RawEntry::Other;
     raw.sizeKnown = library.entry_size_is_set(entry) != 0 && library.entry_size(entry) >= 0;
     raw.size = raw.sizeKnown ? static_cast<uint64_t>(library.entry_size(entry)) : 0;
     raw.modified = library.entry_mtime_is_set(entry) != 0 ? library.entry_mtime(entry) : 0;

@@ -19,8 +19,8 @@ enum class ArchiveTrouble : uint8_t {
   Volume,         // UnsupportedFormat: one of several parts
   Method,         // UnsupportedFormat: compressed in an unknown way
   TooManyEntries,
-  Bomb,           // it unpacks to far more than its size
-  Changed,        // the file was changed while it was read
+  Bomb,     // it unpacks to far more than its size
+  Changed,  // the file was changed while it was read
 };
 
 // How an archive or an entry ended.

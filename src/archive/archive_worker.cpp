@@ -25,8 +25,7 @@ class Sender final : public ArchiveSink {
     Put(RecordHead::Entry, {reinterpret_cast<const uint8_t*>(&entry), sizeof entry},
         {reinterpret_cast<const uint8_t*>(name.data()), name.size()});
     const uint32_t index = count_++;
-    return data_ && index < kMostWanted &&
-           (exchange_.wanted[index / 8] >> (index % 8) & 1) != 0;
+    return data_ && index < kMostWanted && (exchange_.wanted[index / 8] >> (index % 8) & 1) != 0;
   }
   void Data(std::span<const uint8_t> bytes) override { Put(RecordHead::Data, bytes); }
   void EndEntry(const ArchiveEnd& end) override { PutEnd(RecordHead::EndEntry, end); }
@@ -77,8 +76,8 @@ bool ReadArchiveApart(const platform::ApartCall& call) {
   if (rest.size() != request.password) return false;
   auto& exchange = *reinterpret_cast<ArchiveExchange*>(call.reply.data());
   Sender sender(exchange, call, request.data != 0);
-  sender.End(WalkArchive(call.input, std::string(rest.begin(), rest.end()), request.mostEntries,
-                         sender));
+  sender.End(
+      WalkArchive(call.input, std::string(rest.begin(), rest.end()), request.mostEntries, sender));
   return true;
 }
 

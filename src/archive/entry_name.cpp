@@ -16,7 +16,8 @@ constexpr size_t kLongestPart = 255;  // bytes, as file systems have it
 
 // The upper half of code page 437, from 0x80 (Unicode, mapping table CP437.TXT).
 constexpr std::u32string_view kCodePage437 =
-    U"ÇüéâäàåçêëèïîìÄÅÉæÆôöòûùÿÖÜ¢£¥₧ƒáíóúñÑªº¿⌐¬½¼¡«»░▒▓│┤╡╢╖╕╣║╗╝╜╛┐└┴┬├─┼╞╟╚╔╩╦╠═╬╧╨╤╥╙╘╒╓╫╪┘┌█▄▌▐▀"
+    U"ÇüéâäàåçêëèïîìÄÅÉæÆôöòûùÿÖÜ¢£¥₧ƒáíóúñÑªº¿⌐¬½¼¡«»░▒▓│┤╡╢╖╕╣║╗╝╜╛┐└┴┬├─┼╞╟╚╔╩╦╠═╬╧╨╤╥╙╘╒╓╫╪┘┌█▄"
+    U"▌▐▀"
     U"αßΓπΣσµτΦΘΩδ∞φε∩≡±≥≤⌠⌡÷≈°∙·√ⁿ²■\u00a0";
 static_assert(kCodePage437.size() == 128);
 
@@ -74,8 +75,7 @@ bool IsSafeEntryName(std::string_view name) {
 std::string StoredEntryName(std::string_view path) {
   path.remove_prefix(platform::SplitPath(path).drive.size());
   std::string name;
-  for (const std::string_view part :
-       PartsOf(path, platform::kSeparator == '/' ? "/" : "/\\")) {
+  for (const std::string_view part : PartsOf(path, platform::kSeparator == '/' ? "/" : "/\\")) {
     if (part.empty() || part == ".") continue;
     if (part == "..") {
       name.clear();

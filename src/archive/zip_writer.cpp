@@ -16,10 +16,10 @@ namespace fotomill {
 namespace {
 
 constexpr std::string_view kCompressed[] = {
-    "7z",  "apng", "avif", "bz2", "docx", "flac", "gif", "gz",   "hdp",  "heic", "heif",
-    "jfi", "jfif", "jpe",  "jpeg", "jpg", "jxl",  "jxr", "lzma", "m4a",  "m4v",  "mkv",
-    "mov", "mp3",  "mp4",  "odt", "ogg",  "opus", "pdf", "png",  "pptx", "rar",  "tgz",
-    "wdp", "webm", "webp", "wmv", "xlsx", "xz",   "zip", "zst"};
+    "7z",  "apng", "avif", "bz2",  "docx", "flac", "gif", "gz",   "hdp",  "heic", "heif",
+    "jfi", "jfif", "jpe",  "jpeg", "jpg",  "jxl",  "jxr", "lzma", "m4a",  "m4v",  "mkv",
+    "mov", "mp3",  "mp4",  "odt",  "ogg",  "opus", "pdf", "png",  "pptx", "rar",  "tgz",
+    "wdp", "webm", "webp", "wmv",  "xlsx", "xz",   "zip", "zst"};
 static_assert(std::ranges::is_sorted(kCompressed));
 
 constexpr size_t kBlock = 1 << 20;  // bytes written at once
@@ -30,8 +30,8 @@ struct EntryCloser {
 };
 
 la_ssize_t WriteBytes(archive*, void* file, const void* bytes, size_t size) {
-  const bool done = static_cast<platform::OutputFile*>(file)->Write(
-      {static_cast<const uint8_t*>(bytes), size});
+  const bool done =
+      static_cast<platform::OutputFile*>(file)->Write({static_cast<const uint8_t*>(bytes), size});
   return done ? static_cast<la_ssize_t>(size) : -1;
 }
 

@@ -14,11 +14,11 @@ TEST(EntryName, IsSafeBelowAFolderOnly) {
   std::string deep = "a";
   while (deep.size() <= 4096) deep += "/a";
   for (const std::string& name :
-       {std::string(), std::string("/"), std::string("/etc/x"), std::string(".."),
-        std::string("../x"), std::string("a/../x"), std::string("a/.."), std::string("./a"),
-        std::string("a/./b"), std::string("a//b"), std::string("a/"), std::string("C:x"),
-        std::string("c:/x"), std::string("a\\b"), std::string("..\\x"), std::string("a\nb"),
-        std::string("a\x7f"), std::string("a\0b", 3), longPart + "x", deep})
+       {std::string(),        std::string("/"),       std::string("/etc/x"), std::string(".."),
+        std::string("../x"),  std::string("a/../x"),  std::string("a/.."),   std::string("./a"),
+        std::string("a/./b"), std::string("a//b"),    std::string("a/"),     std::string("C:x"),
+        std::string("c:/x"),  std::string("a\\b"),    std::string("..\\x"),  std::string("a\nb"),
+        std::string("a\x7f"), std::string("a\0b", 3), longPart + "x",        deep})
     EXPECT_FALSE(IsSafeEntryName(name)) << name;
 }
 
@@ -45,9 +45,9 @@ TEST(EntryName, IsStoredRelative) {
   const struct {
     const char *path, *stored;
   } rows[] = {
-      {"a/b.jpg", "a/b.jpg"},   {"./a", "a"},          {"/home/me/a", "home/me/a"},
-      {"../../a/b", "a/b"},     {"x/../a", "a"},       {"a//b/", "a/b"},
-      {"a/./b", "a/b"},         {"..", ""},            {"a/..", ""},
+      {"a/b.jpg", "a/b.jpg"}, {"./a", "a"},    {"/home/me/a", "home/me/a"},
+      {"../../a/b", "a/b"},   {"x/../a", "a"}, {"a//b/", "a/b"},
+      {"a/./b", "a/b"},       {"..", ""},      {"a/..", ""},
   };
   for (const auto& row : rows) EXPECT_EQ(StoredEntryName(row.path), row.stored) << row.path;
 }

@@ -25,11 +25,53 @@ def zip_bytes(entries, compression=zipfile.ZIP_DEFLATED):
 def raw_name_zip(raw, contents):
     """A ZIP archive with one stored entry whose name is not flagged as UTF-8."""
     crc = zlib.crc32(contents)
-    local = struct.pack("<4s5H3I2H", b"PK\3\4", 20, 0, 0, 0x63D4, 0x58B1, crc, len(contents), len(contents), len(raw), 0) + raw
-    central = struct.pack("<4s6H3I5H2I", b"PK\1\2", 20, 20, 0, 0, 0x63D4, 0x58B1, crc, len(contents), len(contents),
-                          len(raw), 0, 0, 0, 0, 0, 0) + raw
+    local = (
+        struct.pack(
+            "<4s5H3I2H",
+            b"PK\3\4",
+            20,
+            0,
+            0,
+            0x63D4,
+            0x58B1,
+            crc,
+            len(contents),
+            len(contents),
+            len(raw),
+            0,
+        )
+        + raw
+    )
+    central = (
+        struct.pack(
+            "<4s6H3I5H2I",
+            b"PK\1\2",
+            20,
+            20,
+            0,
+            0,
+            0x63D4,
+            0x58B1,
+            crc,
+            len(contents),
+            len(contents),
+            len(raw),
+            0,
+            0,
+            0,
+            0,
+            0,
+            0,
+        )
+        + raw
+    )
     start = len(local) + len(contents)
-    return local + contents + central + struct.pack("<4s4H2IH", b"PK\5\6", 0, 0, 1, 1, len(central), start, 0)
+    return (
+        local
+        + contents
+        + central
+        + struct.pack("<4s4H2IH", b"PK\5\6", 0, 0, 1, 1, len(central), start, 0)
+    )
 
 
 def zip_crypto(name, contents, password):
@@ -54,7 +96,7 @@ def zip_crypto(name, contents, password):
         update(byte)
     plain = bytearray(raw_name_zip(name.encode(), contents))
     header = 30 + len(name)
-    result = plain[:header] + encrypted + plain[header + len(contents):]
+    result = plain[:header] + encrypted + plain[header + len(contents) :]
     central = result.index(b"PK\1\2")
     end = result.index(b"PK\5\6")
     for flags, size in ((6, 18), (central + 8, central + 20)):
@@ -74,7 +116,12 @@ def number5(value):
 
 
 def block5(kind, flags, fields, data=b""):
-    body = number5(kind) + number5(flags | (2 if data else 0)) + (number5(len(data)) if data else b"") + fields
+    body = (
+        number5(kind)
+        + number5(flags | (2 if data else 0))
+        + (number5(len(data)) if data else b"")
+        + fields
+    )
     body = number5(len(body)) + body
     return struct.pack("<I", zlib.crc32(body)) + body + data
 
@@ -84,8 +131,16 @@ def rar5(entries, archive_flags=0):
     out = b"Rar!\x1a\7\1\0" + block5(1, 0, number5(archive_flags))
     for name, contents in entries:
         raw = name.encode()
-        fields = (number5(4) + number5(len(contents)) + number5(0o100644) + struct.pack("<I", zlib.crc32(contents))
-                  + number5(0) + number5(1) + number5(len(raw)) + raw)
+        fields = (
+            number5(4)
+            + number5(len(contents))
+            + number5(0o100644)
+            + struct.pack("<I", zlib.crc32(contents))
+            + number5(0)
+            + number5(1)
+            + number5(len(raw))
+            + raw
+        )
         out += block5(2, 0, fields, contents)
     return out + block5(5, 0, number5(0))
 
@@ -96,6 +151,7 @@ def locked_rar5():
 
 def rar4(entries, archive_flags=0, file_flags=0):
     """An older RAR archive of stored files."""
+
     def block(kind, flags, fields, data=b""):
         body = struct.pack("<BHH", kind, flags, 7 + len(fields)) + fields
         return struct.pack("<H", zlib.crc32(body) & 0xFFFF) + body + data
@@ -103,16 +159,29 @@ def rar4(entries, archive_flags=0, file_flags=0):
     out = b"Rar!\x1a\7\0" + block(0x73, archive_flags, bytes(6))
     for name, contents in entries:
         raw = name.encode()
-        fields = struct.pack("<IIBIIBBHI", len(contents), len(contents), 3, zlib.crc32(contents), 0x58B163D4, 20, 0x30,
-                             len(raw), 0o100644) + raw
+        fields = (
+            struct.pack(
+                "<IIBIIBBHI",
+                len(contents),
+                len(contents),
+                3,
+                zlib.crc32(contents),
+                0x58B163D4,
+                20,
+                0x30,
+                len(raw),
+                0o100644,
+            )
+            + raw
+        )
         out += block(0x74, 0x8000 | file_flags, fields, contents)
     return out + block(0x7B, 0x4000, b"")
 
 
 def sparse_zip(path, size):
-    """An archive of one stored entry of zeros, which takes no room on the disk. Its checksum is wrong."""
+    """An archive of one stored entry of zeros, a sparse file. Its checksum is wrong."""
     made = raw_name_zip(b"zeros", b"")
-    local, central, end = made[:35], bytearray(made[35:35 + 51]), bytearray(made[35 + 51:])
+    local, central, end = made[:35], bytearray(made[35 : 35 + 51]), bytearray(made[35 + 51 :])
     local = bytearray(local)
     struct.pack_into("<II", local, 18, size, size)
     struct.pack_into("<II", central, 20, size, size)

@@ -17,8 +17,8 @@ std::string LibraryVersion() { return HasArchiveLibrary() ? "present" : "missing
 constexpr FormatLibrary kLibraries[] = {
     {"libarchive", LibraryVersion, TrLater("ZIP and RAR archives, loaded when needed")}};
 
-constexpr uint32_t kFlags = FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED |
-                            FMT_SECONDARY | FMT_ARCHIVE;
+constexpr uint32_t kFlags =
+    FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE;
 
 // The library is not loaded before an archive is opened, which would slow down every start.
 int32_t Ready() { return 1; }

@@ -132,8 +132,7 @@ Status AddMembers(const std::vector<Member>& members, ZipWriter& zip, ResultOutp
     if (status == Status::Ok) {
       added.push_back(&member);
     } else if (member.status != Status::Ok || status == Status::FileOpenError) {
-      output.FileFailed(member.path, status,
-                        member.hint.empty() ? WithReason("") : member.hint);
+      output.FileFailed(member.path, status, member.hint.empty() ? WithReason("") : member.hint);
     } else {
       return status;
     }
@@ -169,7 +168,8 @@ int RunCreate(CreateOptions options, const CommandContext& context) {
   if (options.dryRun && options.overwrite == "ask") options.overwrite = "keep-both";
   if (!SettleArchive(options.overwrite, context, output, path, existing)) return output.Finish();
   Members members(path);
-  for (size_t i = 1; i < context.names.values.size(); ++i) members.AddNamed(context.names.values[i]);
+  for (size_t i = 1; i < context.names.values.size(); ++i)
+    members.AddNamed(context.names.values[i]);
   if (options.dryRun) {
     for (const Member& member : members.All()) {
       if (member.status == Status::Ok) {
@@ -195,17 +195,21 @@ int RunCreate(CreateOptions options, const CommandContext& context) {
 
 void SetUpArchiveCreate(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<CreateOptions>();
-  context.names.Declare("ARCHIVE FILE...", "The ZIP archive to create, and files and folders for it",
-                        2);
+  context.names.Declare("ARCHIVE FILE...",
+                        "The ZIP archive to create, and files and folders for it", 2);
   AddName(app, "--password-file", options->password.file, "FILE",
           "Encrypt with the password in the first line of a file (AES-256)");
-  AddFlag(app, "--ask-password", options->password.ask, "Encrypt with a password that is asked for");
+  AddFlag(app, "--ask-password", options->password.ask,
+          "Encrypt with a password that is asked for");
   AddOverwrite(app, options->overwrite);
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be archived");
-  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, destination, status, message}");
   SetFooter(app,
-            "Folders are archived with everything below them. Files of compressed formats are stored, others deflated.\n"
-            "Names stay readable in an encrypted archive. ArchivePreservePaths says whether paths are kept,\n"
+            "Folders are archived with everything below them. Files of compressed formats are "
+            "stored, others deflated.\n"
+            "Names stay readable in an encrypted archive. ArchivePreservePaths says whether paths "
+            "are kept,\n"
             "ArchiveAddThumbnails whether thumbnail files are added to their pictures.",
             "fotomill archive create holiday.zip holiday");
   context.run = [options, &context] { return RunCreate(*options, context); };

@@ -25,15 +25,15 @@ std::string ReadPassword(const PasswordOptions& options, std::string& password) 
 
 void AddOverwrite(CLI::App& app, std::string& overwrite) {
   AddChoice(app, "--overwrite", overwrite, "HOW",
-            "What to do if the file exists: ask, replace, keep-both (adds a number), skip (default: ask on a terminal, else keep-both)",
+            "What to do if the file exists: ask, replace, keep-both (adds a number), skip "
+            "(default: ask on a terminal, else keep-both)",
             {"ask", "replace", "keep-both", "skip"});
 }
 
 std::string SettleOverwrite(const CommandContext& context, std::string& overwrite) {
   if (overwrite.empty())
     overwrite = context.MayAsk() && settings.ArchivePromptOverwrite != 0 ? "ask" : "keep-both";
-  if (overwrite == "ask" && !context.MayAsk())
-    return Tr("--overwrite ask needs a terminal.");
+  if (overwrite == "ask" && !context.MayAsk()) return Tr("--overwrite ask needs a terminal.");
   return {};
 }
 

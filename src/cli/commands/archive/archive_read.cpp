@@ -195,11 +195,14 @@ class Places {
  public:
   Places(const ReadingOptions& options, const CommandContext& context, const OpenArchive& archive,
          ResultOutput& output)
-      : overwrite_(options.overwrite), dryRun_(options.dryRun), output_(output),
+      : overwrite_(options.overwrite),
+        dryRun_(options.dryRun),
+        output_(output),
         prompts_(context, output),
-        folder_(!options.dest.empty()                   ? options.dest
-                : !settings.ArchiveExtractPath.view().empty() ? std::string(settings.ArchiveExtractPath.view())
-                                            : platform::FolderOf(archive.source.path)) {}
+        folder_(!options.dest.empty() ? options.dest
+                : !settings.ArchiveExtractPath.view().empty()
+                    ? std::string(settings.ArchiveExtractPath.view())
+                    : platform::FolderOf(archive.source.path)) {}
 
   // nullopt after a message, or if the file is skipped.
   std::optional<ExtractPlace> Of(const ArchiveEntry& entry) {
@@ -251,9 +254,9 @@ class Places {
       const platform::PathParts parts = platform::SplitPath(question.path);
       question.name = parts.base;
       const OverwriteAnswer answer = prompts_.AskOverwrite(question);
-      const std::string how = !answer.ok                 ? "skip"
-                              : answer.checks.keepBoth   ? "keep-both"
-                                                         : "replace";
+      const std::string how = !answer.ok               ? "skip"
+                              : answer.checks.keepBoth ? "keep-both"
+                                                       : "replace";
       if (answer.skipRest || answer.checks.applyToRest) overwrite_ = how;
       recycle = answer.checks.recycle;
       if (how != "replace" || answer.name == question.name) {
@@ -302,10 +305,8 @@ int RunExtract(ReadingOptions options, const CommandContext& context) {
   Places places(options, context, archive, output);
   const ExtractJob job = {
       .place = [&](const ArchiveEntry& entry) { return places.Of(entry); },
-      .done =
-          [&](const ArchiveEntry& entry, const std::string& path, const ArchiveEnd& end) {
-            ReportExtracted(entry, path, end, output);
-          },
+      .done = [&](const ArchiveEntry& entry, const std::string& path,
+                  const ArchiveEnd& end) { ReportExtracted(entry, path, end, output); },
       .keepTimes = settings.ArchivePreserveTimestamps != 0,
   };
   const uint64_t failures = output.Failures();
@@ -332,7 +333,8 @@ std::shared_ptr<ReadingOptions> SetUp(CLI::App& app, CommandContext& context, Ru
                                       bool password, const char* notes, const char* example) {
   auto options = std::make_shared<ReadingOptions>();
   context.names.Declare("ARCHIVE [NAME...]",
-                        "A ZIP or RAR archive, and entries or folders in it, \"*\" and \"?\" for any characters (default: all)",
+                        "A ZIP or RAR archive, and entries or folders in it, \"*\" and \"?\" for "
+                        "any characters (default: all)",
                         1);
   if (password)
     AddName(app, "--password-file", options->password.file, "FILE",
@@ -358,20 +360,24 @@ void SetUpArchiveTest(CLI::App& app, CommandContext& context) {
       app, context, [](ReadingOptions o, const CommandContext& c) { return RunTest(o, c); }, true,
       TrLater("Unpacks everything and compares the checksums; nothing is written."),
       "fotomill archive test holiday.zip");
-  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, destination, status, message}");
 }
 
 void SetUpArchiveExtract(CLI::App& app, CommandContext& context) {
-  const auto options = SetUp(
-      app, context, RunExtract, true,
-      TrLater("Without --dest, files go to ArchiveExtractPath, else beside the archive. ArchivePreservePaths and\n"
-      "ArchivePreserveTimestamps say whether folders and times are kept. Names that lead out of the folder,\n"
-      "links and special files are not extracted."),
-      "fotomill archive extract holiday.zip '*.jpg' --dest pictures");
-  AddName(app, "-d,--dest", options->dest, "DIR", "Extract into this folder, which is created if missing");
+  const auto options = SetUp(app, context, RunExtract, true,
+                             TrLater("Without --dest, files go to ArchiveExtractPath, else beside "
+                                     "the archive. ArchivePreservePaths and\n"
+                                     "ArchivePreserveTimestamps say whether folders and times are "
+                                     "kept. Names that lead out of the folder,\n"
+                                     "links and special files are not extracted."),
+                             "fotomill archive extract holiday.zip '*.jpg' --dest pictures");
+  AddName(app, "-d,--dest", options->dest, "DIR",
+          "Extract into this folder, which is created if missing");
   AddOverwrite(app, options->overwrite);
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be extracted");
-  AddFlag(app, "--json", options->json, "Print a JSON array of {file, destination, status, message}");
+  AddFlag(app, "--json", options->json,
+          "Print a JSON array of {file, destination, status, message}");
 }
 
 }  // namespace fotomill::cli
