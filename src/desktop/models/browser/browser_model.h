@@ -52,8 +52,8 @@ class BrowserModel {
   std::string PathOfLine(size_t line) const;  // folder and name
   // The line with this name; kNoLine if not shown.
   size_t FindLine(std::string_view name) const;
-  // The next line starting with `typed`, from the focus on; with `next`, or if the same letter is
-  // repeated, after the focus.
+  // The first line from the focus on, or with `next` after it, whose name starts with `typed`;
+  // wraps around. kNoLine if not found.
   size_t FindTyped(std::string_view typed, bool next) const;
 
   // The selection of lines. Callers must update the display after a change.

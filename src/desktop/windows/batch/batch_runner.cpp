@@ -67,7 +67,7 @@ void BatchRunner::StartNext() {
   thread_->StartWork(std::move(next.job), std::move(next.work));
 }
 
-// A box that stays to be read does so, whatever batch comes after it; another one goes.
+// A box that stays open is left alone by later batches; any other is replaced.
 void BatchRunner::LeaveBox() {
   if (box_ != nullptr && box_->StaysOpen()) box_ = nullptr;
   CloseBox();
@@ -95,7 +95,7 @@ void BatchRunner::BatchOpened() {
   };
   LeaveBox();
   box_ = new ProgressWindow(&shell_.Window(), shell_.Thumbnails(), events);
-  // the keyboard stays with another program that has it
+  // do not take the focus from another program
   if (InFront()) {
     box_->Show();
   } else {
@@ -123,7 +123,7 @@ void BatchRunner::BatchWork(const ProgressWork& work) {
   if (box_ != nullptr) box_->SetWork(work);
 }
 
-// Checks whether the user saw the end before the box takes the focus.
+// Check whether the user saw the end before the box takes the focus.
 void BatchRunner::BatchStaysOpen(const ProgressModel& model) {
   seen_ = InFront();
   LogEvent("batch", "stays-open files=" + std::to_string(model.Files()));
@@ -139,7 +139,7 @@ void BatchRunner::BatchCloses() {
 void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   LogEvent("batch", "ended status=" + std::to_string(StatusNumber(status)));
   shell_.Uses().Note(job.uses);
-  // Outputs, not files that were given other names.
+  // Outputs, but not renamed files.
   if (job.formatIndex != kNoFormat) shell_.Files().NoteDone(std::exchange(written_, {}));
   if (previous_ != nullptr) shell_.Files().NoteDone(std::exchange(previous_, nullptr)->Operation());
   if (job.filesChanged) shell_.FilesChanged();
@@ -152,7 +152,7 @@ void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   CallAfter([this] { StartNext(); });
 }
 
-// The user looks at another program: brings what is to be seen in front of it.
+// The user is in another program: raises the relevant window.
 void BatchRunner::RaiseProgram() {
   wxTopLevelWindow* const window = box_ != nullptr && box_->StaysOpen()
                                        ? static_cast<wxTopLevelWindow*>(box_)
@@ -162,7 +162,7 @@ void BatchRunner::RaiseProgram() {
   LogEvent("batch", "raised");
 }
 
-// --- questions ---
+// --- prompts ---
 
 OverwriteAnswer BatchRunner::AskOverwrite(const OverwriteQuestion& question,
                                           const OverwritePreviewMaker& makePreview) {
@@ -220,7 +220,7 @@ void TurnSelection(Shell& shell, Orientation turn) {
 
 namespace {
 
-// Asks for the destination and runs the batch over the frame's selection.
+// Asks for the destination and runs the batch on the frame's selection.
 void RunWithDestination(Shell& shell, const wxString& verb, const std::vector<NamedSize>& sizes) {
   const std::vector<std::string> files = shell.Tabs().SelectedFiles();
   if (files.empty()) return;

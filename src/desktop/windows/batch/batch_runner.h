@@ -20,15 +20,15 @@ namespace fotomill::desktop {
 class Shell;
 class ProgressWindow;
 
-// Runs batches for a frame, one after the other, with their progress box and prompts.
+// Runs the batches of a frame in sequence, with progress box and prompts.
 class BatchRunner : public wxEvtHandler, public BatchWindows {
  public:
   explicit BatchRunner(Shell& shell);
   ~BatchRunner() override;
 
-  // Begins a batch, or has it wait for those before.
+  // Starts a batch, or queues it.
   void Run(std::vector<BatchFile> files, BatchFunction function, BatchJob job);
-  // With the files that the batch will replace, where it keeps them.
+  // `previous`: keeps the files that the batch replaces, if any.
   void Run(BatchJob job, BatchThread::Work work, std::shared_ptr<PreviousFiles> previous = nullptr);
   bool Running() const { return thread_->Running(); }  // one batch at a time
 
@@ -61,21 +61,21 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
 
   Shell& shell_;
   std::deque<Waiting> waiting_;
-  ProgressWindow* box_ = nullptr;            // of the batch that runs or was the last
-  bool seen_ = false;                        // its end, by the user
-  size_t failed_ = 0;                        // files of the batch that runs
-  std::shared_ptr<PreviousFiles> previous_;  // of the batch that runs
-  // by the batch that runs, as far as it can be taken back
+  ProgressWindow* box_ = nullptr;            // of the current or last batch
+  bool seen_ = false;                        // the user saw its end
+  size_t failed_ = 0;                        // in the current batch
+  std::shared_ptr<PreviousFiles> previous_;  // of the current batch
+  // files of the current batch that can be undone
   FileOperation written_;
   std::unique_ptr<BatchThread> thread_;
 };
 
-// Turns the frame's selection in its files.
+// Turns the pictures in the frame's selected files.
 void TurnSelection(Shell& shell, Orientation turn);
 
-// The function Convert: asks for the destination and runs the batch over the frame's selection.
+// The function Convert: asks for the destination and runs the batch on the frame's selection.
 void ConvertSelection(Shell& shell);
-// The function Resize: the same, to one of the sizes of the settings.
+// The function Resize: the same, to one of the sizes in the settings.
 void ResizeSelection(Shell& shell);
 
 }  // namespace fotomill::desktop

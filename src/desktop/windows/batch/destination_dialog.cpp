@@ -104,7 +104,7 @@ void DestinationDialog::BuildFolder() {
   folderSizer_->Add(row, Below());
 }
 
-// Behind the format, with which they are shown.
+// Shown together with the format.
 void DestinationDialog::BuildOptions() {
   reduce_ = new wxCheckBox(this, wxID_ANY, Label("Reduce &colors if the format supports fewer"));
   orient_ = new wxCheckBox(this, wxID_ANY, Label("Rotate pictures &upright by EXIF orientation"));
@@ -154,7 +154,7 @@ void DestinationDialog::ShowPart(size_t part) {
   part_ = part;
   const bool format = parts_[part] != DestinationPart::Folder;
   GetSizer()->Show(formatSizer_, format, true);
-  orient_->Show(format && sizes_.empty());  // operations always do
+  orient_->Show(format && sizes_.empty());  // operations always do this
   GetSizer()->Show(folderSizer_, parts_[part] != DestinationPart::Format, true);
   ok_->SetLabel(part + 1 < parts_.size() ? Label("Nex&t") : okText_);
   UpdateControls();
@@ -214,15 +214,15 @@ void DestinationDialog::Browse() {
   UpdateControls();
 }
 
-// The toolkit's default button knows Enter alone; Shift+Enter is OK with Shift held.
+// The toolkit's default button only reacts to Enter; Shift+Enter is OK with Shift held.
 void DestinationDialog::OnKey(wxKeyEvent& event) {
   const bool enter = event.GetKeyCode() == WXK_RETURN || event.GetKeyCode() == WXK_NUMPAD_ENTER;
   if (!enter || event.GetModifiers() != wxMOD_SHIFT) return event.Skip();
   if (ok_->IsEnabled() && Accept(true)) EndModal(wxID_OK);
 }
 
-// Takes the choice, or goes on to the next part. Shift brings up the format's own options on the
-// way; Cancel in them goes back to this step.
+// Accepts the choice, or goes on to the next part. With Shift, shows the format's options first;
+// canceling them returns to this step.
 bool DestinationDialog::Accept(bool shift) {
   const bool options = shift && ShiftOpensOverrideBox() && HasOverrideBox(Choice().extension) &&
                        parts_[part_] != DestinationPart::Folder;

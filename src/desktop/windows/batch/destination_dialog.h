@@ -19,11 +19,11 @@ class wxTextCtrl;
 
 namespace fotomill::desktop {
 
-// The destination step of a function: format, folder, and what becomes of colors and metadata. The
-// folder comes in the same window at once, behind the format, or not at all (DestinationParts).
+// The destination step of a function: format, folder, and how to handle colors and metadata. The
+// folder is in the same window, in a second step, or not asked for (DestinationParts).
 class DestinationDialog : public wxDialog {
  public:
-  // `verb` is what OK does: "Convert". With `sizes`, pictures are also resized to one of them.
+  // `verb` is the label of OK: "Convert". With `sizes`, also resizes pictures to one of them.
   DestinationDialog(wxWindow* parent, const wxString& verb, const std::vector<std::string>& files,
                     std::vector<NamedSize> sizes = {});
   DestinationChoice Choice() const;
@@ -35,25 +35,25 @@ class DestinationDialog : public wxDialog {
   void BuildOptions();
   void BuildButtons(const wxString& verb);
   void BindControls();
-  wxSizerFlags Below() const;  // of a row under the one before
+  wxSizerFlags Below() const;  // for a row below another
   void ShowPart(size_t part);
   void UpdateControls();
   bool ShowFormatOptions();  // false: canceled
   std::string OutlookText(const DestinationChoice& choice) const;
   void Browse();
   void OnKey(wxKeyEvent& event);
-  bool Accept(bool shift);  // false: the step is not over
+  bool Accept(bool shift);  // false: not finished yet
 
   const std::vector<std::string> files_;
-  const std::string shownFolder_;  // in which relative folders are
+  const std::string shownFolder_;  // base of relative folders
   const std::vector<DestinationFormat> formats_ = DestinationFormats();
   const std::vector<DestinationPart> parts_ = DestinationParts();
-  size_t part_ = 0;  // that is shown
+  size_t part_ = 0;  // current one
   wxString okText_;
-  wxSizer* formatSizer_ = nullptr;  // of the controls for each part
+  wxSizer* formatSizer_ = nullptr;  // contains the controls of each part
   wxSizer* folderSizer_ = nullptr;
   const std::vector<NamedSize> sizes_;
-  wxChoice* size_ = nullptr;  // without sizes, none
+  wxChoice* size_ = nullptr;  // null without sizes
   wxChoice* format_ = nullptr;
   wxButton* options_ = nullptr;
   wxRadioButton* beside_ = nullptr;
@@ -63,7 +63,7 @@ class DestinationDialog : public wxDialog {
   wxCheckBox* reduce_ = nullptr;
   wxCheckBox* orient_ = nullptr;
   wxCheckBox* metadata_ = nullptr;
-  wxTextCtrl* comment_ = nullptr;  // null unless PromptForFileComments is on
+  wxTextCtrl* comment_ = nullptr;  // null if PromptForFileComments is off
   wxStaticText* preview_ = nullptr;
   wxButton* ok_ = nullptr;
 };

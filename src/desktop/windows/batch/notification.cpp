@@ -14,7 +14,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// Where notifications go by a bus that the session has; looking for one would start it.
+// Whether the session has a message bus, without which notifications would start one.
 bool HasPlaceForNotifications() {
   if (wxPlatformInfo::Get().GetPortId() != wxPORT_GTK) return true;
   wxString folder;
@@ -34,7 +34,7 @@ bool InFront() {
 void NotifyUser(wxTopLevelWindow& window, const wxString& title, const wxString& text) {
   window.RequestUserAttention(wxUSER_ATTENTION_INFO);
   if (!HasPlaceForNotifications()) return;
-  const wxLogNull quiet;  // a desktop without notifications is no fault
+  const wxLogNull quiet;  // notifications are optional
   wxNotificationMessage message(title, text, &window, wxICON_INFORMATION);
   LogEvent("notification", Utf8(title + ": " + text) + (message.Show() ? "" : " (not shown)"));
 }

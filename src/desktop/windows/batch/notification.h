@@ -4,11 +4,11 @@
 
 namespace fotomill::desktop {
 
-// Whether one of the program's windows has the keyboard.
+// Whether one of the program's windows has the focus.
 bool InFront();
 
-// Tells the user, who looks at another program, that something has happened: the window asks for
-// attention, and the desktop shows a notification where it has a place for them.
+// Notifies a user who is in another program: the window requests attention, and the desktop shows a
+// notification, if supported.
 void NotifyUser(wxTopLevelWindow& window, const wxString& title, const wxString& text);
 
 }  // namespace fotomill::desktop

@@ -98,7 +98,7 @@ OverwriteDialog::OverwriteDialog(wxWindow* parent, const OverwriteQuestion& ques
   previews_->Bind(wxEVT_CHECKBOX, [this](wxCommandEvent&) { ShowPreviews(); });
 }
 
-// Where they were not wanted at first they are made apart when they are.
+// Creates the previews in the background when first enabled.
 void OverwriteDialog::ShowPreviews() {
   if (panes_ == nullptr && previews_->GetValue())
     return work_.Start(

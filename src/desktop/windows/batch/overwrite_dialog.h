@@ -11,11 +11,11 @@ class wxTextCtrl;
 
 namespace fotomill::desktop {
 
-// The overwrite prompt: what is there beside what would take its place, a field for another name,
-// and what to do.
+// The overwrite prompt: the existing file beside the new one, a field for another name, and
+// options.
 class OverwriteDialog : public wxDialog {
  public:
-  // The question must outlive it.
+  // `question` must outlive this object.
   OverwriteDialog(wxWindow* parent, const OverwriteQuestion& question,
                   OverwritePreviewMaker makePreview);
   // After ShowModal.
@@ -35,10 +35,10 @@ class OverwriteDialog : public wxDialog {
   wxCheckBox* applyToRest_ = nullptr;
   wxCheckBox* recycle_ = nullptr;
   wxCheckBox* previews_ = nullptr;
-  wxSizer* panes_ = nullptr;  // none until previews are wanted
-  size_t panesPlace_ = 0;     // in the window's sizer
+  wxSizer* panes_ = nullptr;  // null until previews are enabled
+  size_t panesPlace_ = 0;     // index in the window's sizer
   bool skipRest_ = false;
-  Background work_;  // last, so that it ends first
+  Background work_;  // must be last, so that it ends first
 };
 
 }  // namespace fotomill::desktop

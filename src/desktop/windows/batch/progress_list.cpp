@@ -66,7 +66,7 @@ void ProgressList::ShowNewRows() {
   Refresh();
 }
 
-// Rows may be higher now.
+// Row heights may have changed.
 void ProgressList::ShowNewThumbnails() {
   const size_t first = GetVisibleRowsBegin();
   const bool atEnd = GetVisibleRowsEnd() >= rows_.size();
@@ -98,7 +98,7 @@ ThumbnailPointer ProgressList::ThumbnailOf(const ProgressRow& row) const {
   return settings_.thumbnails && row.IsAboutFile() ? thumbnails_.Find(row.source) : nullptr;
 }
 
-// Tall rows have the name above and what became of the file below.
+// Tall rows show the name above, and the result below.
 wxString ProgressList::TextOf(const ProgressRow& row, int height) const {
   const bool two = row.IsAboutFile() && height >= 2 * GetCharHeight() + FromDIP(4) &&
                    row.line.text.starts_with(row.source);

@@ -41,7 +41,7 @@ void ProgressThumbnails::Want(const std::string& path, int side) {
   wanted_.push_back(path);
 }
 
-// What was in sight before is forgotten, unless it is in work.
+// Pending requests for rows no longer visible are dropped; running ones finish.
 void ProgressThumbnails::Order() {
   std::vector<ThumbnailRequest> requests;
   for (const std::string& path : std::exchange(wanted_, {})) {

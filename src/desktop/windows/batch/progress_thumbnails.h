@@ -11,17 +11,17 @@
 
 namespace fotomill::desktop {
 
-// Thumbnails of a progress box's files: those that the browser has loaded, and others, loaded apart
+// Thumbnails for a progress box: those loaded by the browser, and others loaded in the background
 // when their rows are drawn.
 class ProgressThumbnails : public wxEvtHandler {
  public:
-  // With `makes`, missing thumbnails are made from the pictures; without it only those are loaded
-  // that are stored or in the file. `came` is called when some have come.
+  // With `makes`, creates missing thumbnails from the pictures; otherwise only loads stored or
+  // embedded ones. `came` is called when thumbnails have been loaded.
   ProgressThumbnails(ThumbnailService& browser, bool makes, std::function<void()> came);
 
-  // The thumbnail of a file, null if there is none yet.
+  // The thumbnail of a file; null if not loaded yet.
   ThumbnailPointer Find(const std::string& path) const;
-  // Wants that of a file that is in sight, in a square of `side` pixels of the screen.
+  // Requests the thumbnail of a visible file, in a square of `side` screen pixels.
   void Want(const std::string& path, int side);
 
  private:
@@ -33,9 +33,9 @@ class ProgressThumbnails : public wxEvtHandler {
   const std::function<void()> came_;
   ThumbnailCache cache_;
   int side_ = 0;
-  std::vector<std::string> wanted_;          // since the last order
-  std::unordered_set<std::string> settled_;  // whether there is one or not
-  ThumbnailLoader loader_;                   // last, so that it ends first
+  std::vector<std::string> wanted_;          // since the last Order
+  std::unordered_set<std::string> settled_;  // loaded or found missing
+  ThumbnailLoader loader_;                   // must be last, so that it ends first
 };
 
 }  // namespace fotomill::desktop

@@ -21,7 +21,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr int kNewsMs = 40;  // what comes is gathered for so long
+constexpr int kNewsMs = 40;  // updates are collected for this long
 
 }  // namespace
 
@@ -101,8 +101,7 @@ wxWindow* ProgressWindow::MakeList(bool scrollBar) {
   return plain_ = new PlainList(*this, scrollBar ? wxLB_ALWAYS_SB : 0);
 }
 
-// The box's geometry is in pixels of a screen of the usual resolution, with texts of the usual
-// size.
+// The box's geometry is in pixels at standard resolution and text size.
 wxSize ProgressWindow::InUnits(const wxSize& pixels) const {
   return ToDIP(pixels) / TextScale(*this);
 }
@@ -122,12 +121,11 @@ void ProgressWindow::LayOut() {
   put(status_, layout.status);
   put(abort_, layout.abort);
   put(close_, layout.close);
-  // The bar takes the gap between list and status line.
+  // The bar is between list and status line.
   const int32_t under = layout.list.y + layout.list.height;
   put(bar_,
       {layout.list.x, under + 2, layout.list.width, std::max(layout.status.y - under - 4, 2)});
-  // The buttons for files that failed take the place of the one that stops, as wide as their texts
-  // if there is room.
+  // The buttons for failed files replace the stop button, as wide as their labels if there is room.
   const int gap = 4, room = layout.close.x - layout.list.x - 2 * gap;
   const int copy = InUnits(copy_->GetBestSize()).x, select = InUnits(select_->GetBestSize()).x;
   const int copyWidth = copy + select <= room ? copy : std::max(room * copy / (copy + select), 1);
@@ -191,8 +189,7 @@ void ProgressWindow::ShowNews() {
   status_->SetLabel(Shown(line));
 }
 
-// The list is made anew with a scroll bar that always shows, at the same place and with the same
-// rows in sight.
+// Recreates the list with a permanent scroll bar, at the same position and showing the same rows.
 void ProgressWindow::StayOpen(const std::string& status) {
   facts_.ended = true;
   facts_.status = status;
@@ -215,7 +212,7 @@ void ProgressWindow::StayOpen(const std::string& status) {
     select_->Show();
   }
   bar_->SetValue(bar_->GetRange());
-  // the toolkit would take the keyboard from another program with it
+  // otherwise the toolkit would take the focus from another program
   focusesClose_ = !InFront();
   if (!focusesClose_) close_->SetFocus();
   LayOut();

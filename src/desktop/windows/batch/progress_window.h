@@ -18,29 +18,29 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// The progress box: lists files as they are processed, with Abort while the batch runs and Close
-// after it. Not modal.
+// The progress box: lists processed files, with Abort while the batch runs and Close afterwards.
+// Not modal.
 class ProgressWindow : public wxFrame {
  public:
-  // What the box tells its owner. They are called on the main thread.
+  // Callbacks to the owner, on the main thread.
   struct Events {
     std::function<void()> abort;
-    // the user is done with the box
+    // the user has closed the box
     std::function<void(ProgressWindow& box)> closed;
-    // shows the failed files in their browser
+    // show the failed files in their browser
     std::function<void(const std::vector<std::string>& files)> selectFailed;
   };
   ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Events events);
 
-  // Shows what the batch reports. `source` is the file that the line is about, for its thumbnail;
-  // empty for none.
+  // Adds a line. `source` is the file of the line, for its thumbnail; may be
+  // empty.
   void AddLine(const ProgressLine& line, const std::string& source);
   void SetStatus(const std::string& status);
   void SetWork(const ProgressWork& work);
-  // How many batches wait for this one.
+  // Sets the number of queued batches.
   void SetWaiting(size_t batches);
-  // The batch has ended and the box stays: closing lines are there, Close is live, and the status
-  // line says the last.
+  // The batch has ended and the box stays open: closing lines are shown, Close is enabled, and the
+  // status line is final.
   void StayOpen(const std::string& status);
   // Whether StayOpen was called.
   bool StaysOpen() const { return facts_.ended; }
@@ -51,7 +51,7 @@ class ProgressWindow : public wxFrame {
   wxSize InUnits(const wxSize& pixels) const;
   wxRect InPixels(const Rectangle& units) const;
   void LayOut();
-  // Shows what has come since the last time: many lines at once cost as much as one.
+  // Collects updates: many lines at once cost as much as one.
   void GatherNews();
   void ShowNews();
   void CopyList();
@@ -66,17 +66,17 @@ class ProgressWindow : public wxFrame {
   double started_ = 0;
   ProgressFacts facts_;
   std::string shownLine_;
-  bool focusesClose_ = false;  // when the box next gets the keyboard
+  bool focusesClose_ = false;  // when the box is next activated
   wxTimer newsTimer_;
   wxWindow* panel_ = nullptr;
   wxWindow* list_ = nullptr;
-  ProgressList* drawn_ = nullptr;  // the list, when the box draws it
-  PlainList* plain_ = nullptr;  // the list, when it is one of texts
+  ProgressList* drawn_ = nullptr;  // the list, if owner-drawn
+  PlainList* plain_ = nullptr;  // the list, if plain text
   wxStaticText* status_ = nullptr;
   wxGauge* bar_ = nullptr;
   wxButton* abort_ = nullptr;
   wxButton* close_ = nullptr;
-  wxButton* copy_ = nullptr;  // what the errors leave to do; hidden until there are some
+  wxButton* copy_ = nullptr;  // for failed files; hidden if there are none
   wxButton* select_ = nullptr;
 };
 

@@ -6,8 +6,8 @@ class wxWindow;
 
 namespace fotomill::desktop {
 
-// PromptForDestinationBox: asks whether files are to be written to a format, and whether to ask
-// again (WarnDestinationWrite).
+// PromptForDestinationBox: asks whether to write files to a format, and whether to ask again
+// (WarnDestinationWrite).
 bool PromptForDestination(wxWindow& parent, const std::string& question);
 
 }  // namespace fotomill::desktop

@@ -25,7 +25,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// pages of the book, the second made when it is first shown
+// pages of the book; the second is created when first shown
 enum View { kThumbnailView, kDetailsView };
 
 constexpr BrowserModes kNoModes{-1, -1, -1};
@@ -136,8 +136,8 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
   host_.BrowserChanged();
 }
 
-// How the folder was last asked to be shown, else as all folders are here; what the folder itself
-// says wins, and continues.
+// The last view chosen for the folder, else the default one; settings of the folder itself take
+// precedence and persist.
 void BrowserPage::UseViewOf(const std::string& folder) {
   override_ = ModesForFolder(folder, kNoModes);
   const FolderView kept = host_.Views().Find(folder, base_);
@@ -152,7 +152,7 @@ void BrowserPage::Reload() {
   reader_.List(model_.Folder(), model_.ItemCount() == 0);
 }
 
-// What the user chose since the folder was opened stays until the folder says something else.
+// The user's choices apply until the folder's settings change.
 void BrowserPage::TakeChangedOverride() {
   if (ModesForFolder(model_.Folder(), kNoModes) == override_) return;
   UseViewOf(model_.Folder());
@@ -193,7 +193,7 @@ void BrowserPage::OfferThumbnails() {
   offer_.Offer(model_.Folder(), std::move(files), model_.Modes());
 }
 
-// --- what only the files' headers tell ---
+// --- facts that need the files' headers ---
 
 bool BrowserPage::NeedsFacts() const {
   const BrowserModes& modes = model_.Modes();
@@ -224,7 +224,7 @@ void BrowserPage::ShowFacts(const PlacedItems& found, bool last) {
   if (last) LogEvent("facts", model_.Folder());
 }
 
-// --- what is shown how ---
+// --- view modes ---
 
 bool BrowserPage::ShowsDetails() const { return views_->GetSelection() == kDetailsView; }
 
@@ -269,7 +269,7 @@ void BrowserPage::ShowAs(const FolderView& view) {
   host_.BrowserChanged();
 }
 
-// What the user chooses is kept for this folder, and goes for folders of which nothing is kept.
+// The user's choice is saved for this folder, and used for folders without a saved view.
 void BrowserPage::ChooseView(const FolderView& view) {
   base_ = view;
   host_.KeepView(model_.Folder(), view);

@@ -22,73 +22,73 @@ class DetailsList;
 class PathBar;
 class ThumbnailCanvas;
 
-// What a browser asks of its frame.
+// What a browser needs from its frame.
 class BrowserHost {
  public:
   virtual ~BrowserHost() = default;
   virtual void BrowserChanged() = 0;     // folder, selection, modes or counts
-  virtual DetailColumns& Columns() = 0;  // of the details of all browsers
-  // How the user wants the folder shown from now on.
+  virtual DetailColumns& Columns() = 0;  // of the details view in all browsers
+  // Saves the view chosen for a folder.
   virtual void KeepView(const std::string& folder, const FolderView& view) = 0;
-  virtual const FolderViews& Views() = 0;  // how folders are to be shown
-  // What the user did to files of the browser: the frame does it.
+  virtual const FolderViews& Views() = 0;  // saved views of folders
+  // Actions on files of the browser, performed by the frame.
   virtual void ViewFile(const std::string& path) = 0;
-  // `onFile`: of the selection, else of the folder.
+  // `onFile`: for the selection, otherwise for the folder.
   virtual void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) = 0;
   // `name` without a folder.
   virtual void RenameFile(const std::string& path, const std::string& name) = 0;
-  // `move`: else they are copied.
+  // `move`: move instead of copying.
   virtual void DropFiles(const std::vector<std::string>& files, const std::string& folder,
                          bool move) = 0;
 };
 
-// One browser: the contents of a tab. Shows a folder as thumbnails, names or details.
+// A browser, the contents of a tab. Shows a folder as thumbnails, names or details.
 class BrowserPage : public wxPanel {
  public:
-  // Host and thumbnails must outlive it.
+  // `host` and `thumbnails` must outlive this object.
   BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails,
               const FolderView& view);
 
-  // Goes to a folder; `focus` is the name that gets the focus once it is listed.
+  // Opens a folder; `focus` is the name to focus once it is listed.
   void Open(const std::string& folder, const std::string& focus = {});
-  void Reload();  // reads the folder again; the selection stays with its names
-  // Goes back, or ahead, to folders that this browser showed.
+  void Reload();  // reads the folder again, keeping the selection by name
+  // Moves along the visited folders of this browser.
   void StepAlongTrail(int steps);
-  void GoBack() { StepAlongTrail(-1); }    // nothing at the beginning of the trail
-  void GoForward() { StepAlongTrail(1); }  // nothing at its end
+  void GoBack() { StepAlongTrail(-1); }    // does nothing at the start
+  void GoForward() { StepAlongTrail(1); }  // does nothing at the end
   void GoUp();  // to the parent folder
 
-  // What the browser shows. After changing its selection, call SelectionChanged.
+  // The contents of the browser. After changing the selection, call SelectionChanged.
   const BrowserModel& Model() const { return model_; }
   BrowserModel& Model() { return model_; }
-  // By choice::ViewMode, choice::ThumbnailMode and choice::SortMode; the folder's view is kept as
-  // well.
+  // Values of choice::ViewMode, choice::ThumbnailMode and choice::SortMode; also saves the view of
+  // the folder.
   void SetViewMode(int32_t mode);
-  void SetThumbnailMode(int32_t mode);          // reads them anew, from there
-  void SetSort(int32_t sort, bool descending);  // the selection stays with its files
-  // Next larger or smaller way of showing thumbnails.
+  void SetThumbnailMode(int32_t mode);          // reloads the thumbnails
+  void SetSort(int32_t sort, bool descending);  // keeps the selected files
+  // Changes to the next larger or smaller thumbnails.
   void ChangeSize(int steps);
-  // Shows the selection as the model has it now.
+  // Updates the display of the model's selection.
   void SelectionChanged();
-  // Focus on the line of a name, scrolled into view.
+  // Focuses the line with this name and scrolls it into view.
   void FocusName(const std::string& name);
-  void EditFocusedName();  // in place, in the list
-  void EditPath();         // the keyboard goes to the path, all of it selected
-  void OfferTrail();  // the folders to go back to, as a menu
-  void EditFilter();  // the keyboard goes to the filter
-  // Lets the user choose the columns of the details, which are then shown.
+  void EditFocusedName();  // in the list
+  void EditPath();         // focuses the path and selects its text
+  void OfferTrail();  // shows a menu of visited folders
+  void EditFilter();  // focuses the filter
+  // Lets the user choose the columns of the details view.
   void ChooseColumns();
-  // Takes down how the columns are arranged here.
+  // Stores the current arrangement of columns.
   void KeepColumns();
-  // This browser comes to the front.
+  // Call when this browser becomes active.
   void Activated();
-  void FocusList();  // the keyboard goes to the list
-  bool Listing() const { return reader_.Listing(); }  // the folder is still being read
-  size_t MissingThumbnails() const;                   // of the pictures shown
+  void FocusList();  // focuses the list
+  bool Listing() const { return reader_.Listing(); }  // the folder is being read
+  size_t MissingThumbnails() const;                   // among the pictures shown
   int64_t Scroll() const;  // pixels
-  // Scrolled so far once the folder is listed.
+  // Sets the scroll position to restore after listing.
   void RestoreScroll(int64_t scroll) { wantedScroll_ = scroll; }
-  // Whether this browser offers to make missing thumbnails.
+  // Whether this browser offers to create missing thumbnails.
   bool AsksForThumbnails() const { return offer_.Asks(); }
   void SetAsksForThumbnails(bool asks) { offer_.SetAsks(asks); }
 
@@ -117,8 +117,8 @@ class BrowserPage : public wxPanel {
   BrowserHost& host_;
   ThumbnailService& thumbnails_;
   BrowserModel model_;
-  FolderView base_;  // of folders of which nothing is kept
-  BrowserModes override_;  // what the folder's own file says; -1: nothing
+  FolderView base_;  // for folders without saved view
+  BrowserModes override_;  // from the folder's own file; -1: none
   FolderTrail trail_;
   std::string wantedFocus_;
   int64_t wantedScroll_ = -1;

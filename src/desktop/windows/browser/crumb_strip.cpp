@@ -92,7 +92,7 @@ void CrumbStrip::LayOut() {
     place.below->Show(i >= firstShown_);
     if (i < firstShown_) continue;
     const int below = place.below->GetBestSize().x;
-    // The last name may be wider than the whole strip.
+    // The last name may be wider than the strip.
     const int width = std::min(widths[i] - below, std::max(GetClientSize().x - x - below, 1));
     place.button->SetSize(x, 0, width, height);
     place.below->SetSize(x + width, 0, below, height);
@@ -124,7 +124,7 @@ void CrumbStrip::OfferHidden() {
   if (chosen) OpenLater(hidden[*chosen].folder);
 }
 
-// The buttons go when the folder changes, so that none of them may be in its event any more.
+// Opening a folder deletes the buttons, so wait until their event handler has returned.
 void CrumbStrip::OpenLater(const std::string& folder) {
   CallAfter([this, folder] { events_.open(folder); });
 }

@@ -13,18 +13,18 @@ class wxButton;
 
 namespace fotomill::desktop {
 
-// The way to a folder: a button for each folder on it, and behind each a button that lists the
-// folders in it.
+// The path of a folder: a button for each folder in it, each followed by a button that lists its
+// subfolders.
 class CrumbStrip : public wxPanel {
  public:
-  // What the user did in it.
+  // User actions.
   struct Events {
     std::function<void(const std::string& folder)> open;
     std::function<void()> edit;  // empty space was clicked
   };
   CrumbStrip(wxWindow* parent, Events events);
 
-  // Makes the buttons for a folder; those at the front that do not fit are left out.
+  // Creates the buttons for a folder; the first ones are left out if there is not enough room.
   void ShowFolder(const std::string& folder);
 
  private:
@@ -42,7 +42,7 @@ class CrumbStrip : public wxPanel {
 
   const Events events_;
   std::vector<Place> places_;
-  wxButton* more_ = nullptr;  // stands for the places that do not fit
+  wxButton* more_ = nullptr;  // for the folders left out
   size_t firstShown_ = 0;
   LooseWork listing_;
 };

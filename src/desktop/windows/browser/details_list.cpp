@@ -77,7 +77,7 @@ void DetailsList::KeepColumns() {
     const wxDataViewColumn* const column = GetColumn(i);
     const size_t detail = column->GetModelColumn();
     const auto before = std::ranges::find(shown_, detail, &DetailColumn::detail);
-    // A hidden column has no width, and the last one shown fills the list up.
+    // Hidden columns have no width, and the last one shown is stretched.
     const bool measured = column->IsShown() && column->GetWidth() > 0;
     now.push_back(
         {detail, measured ? ToDIP(column->GetWidth()) : before->width, column->IsShown()});
@@ -119,7 +119,7 @@ void DetailsList::ShowLines() {
   changing_ = false;
 }
 
-// What stood at the top stays there, as far as it goes.
+// Keeps the top line in place, if possible.
 void DetailsList::ModelChanged() {
   const wxDataViewItem top = GetTopItem();
   const unsigned row = top.IsOk() ? lines_->GetRow(top) : 0;

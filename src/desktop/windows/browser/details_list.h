@@ -9,29 +9,29 @@
 
 namespace fotomill::desktop {
 
-// The details view of a browser: a native list, which screen readers know how to read.
+// The details view of a browser: a native list, for screen readers.
 class DetailsList : public wxDataViewCtrl {
  public:
-  // What the user did in it; lines are those of the model.
+  // User actions; lines are those of the model.
   struct Events {
-    std::function<void()> selectionChanged;                        // the model has it already
+    std::function<void()> selectionChanged;                        // already in the model
     std::function<void(size_t line)> activated;                    // double click or Return
-    std::function<void(size_t line, const wxPoint&)> contextMenu;  // the point is one of the list
-    std::function<void(int32_t sortMode)> sort;  // the head of a column was clicked
-    std::function<void()> dragBegins;            // of the selection
+    std::function<void(size_t line, const wxPoint&)> contextMenu;  // relative to the list
+    std::function<void(int32_t sortMode)> sort;  // a column header was clicked
+    std::function<void()> dragBegins;            // with the selection
   };
 
-  // `columns` are the frame's: all lists show the same.
+  // `columns` belong to the frame: all lists share them.
   DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& columns, Events events);
 
-  // Other lines, another order or other facts.
+  // Call after changes of lines, order or facts.
   void ModelChanged();
-  // Marks what the model has selected and shows the focused line.
+  // Shows the model's selection and scrolls to the focused line.
   void ShowSelection();
-  // Shows the columns as they are arranged, and takes down how the user has arranged them here.
+  // Applies the arrangement of columns; stores the user's current arrangement.
   void ShowColumns();
   void KeepColumns();
-  // Lets the user choose the columns from a menu.
+  // Shows a menu to choose the columns.
   void ChooseColumns();
 
  private:
@@ -41,10 +41,10 @@ class DetailsList : public wxDataViewCtrl {
 
   BrowserModel& model_;
   DetailColumns& columns_;
-  DetailColumns shown_;  // as they are in the list
+  DetailColumns shown_;  // as currently shown
   const Events events_;
   wxObjectDataPtr<Lines> lines_;
-  bool changing_ = false;  // what the list tells now is what it was told
+  bool changing_ = false;  // events are caused by the program
 };
 
 }  // namespace fotomill::desktop

@@ -12,7 +12,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr size_t kMostFolders = 300;  // a longer menu is of no use
+constexpr size_t kMostFolders = 300;  // longer menus are useless
 constexpr int kFirstId = wxID_HIGHEST + 1;
 
 }  // namespace

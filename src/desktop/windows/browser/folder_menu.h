@@ -10,8 +10,8 @@
 
 namespace fotomill::desktop {
 
-// Lets the user choose one of some folders in a menu below a window; the folder `current` has a
-// mark. nullopt when none was chosen. The window may not go meanwhile.
+// Shows a menu of folders below a window, with `current` checked; nullopt if canceled. The window
+// must not be destroyed meanwhile.
 std::optional<size_t> ChooseFolderFromMenu(wxWindow& window, const std::vector<Crumb>& folders,
                                            const std::string& current);
 

@@ -25,7 +25,7 @@ void FolderReader::List(const std::string& folder, bool namesFirst) {
       },
       [this] {
         listing_.Stop();
-        events_.listed({}, true);  // as a folder that cannot be read
+        events_.listed({}, true);  // like an unreadable folder
       });
 }
 

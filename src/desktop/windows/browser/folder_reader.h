@@ -10,28 +10,28 @@
 
 namespace fotomill::desktop {
 
-// Items by their place in the list that they were taken from.
+// Items with their index in the original list.
 using PlacedItems = std::vector<std::pair<size_t, FolderItem>>;
 
-// Reads a browser's folder apart from the window: what is in it, and what only the headers of files
-// tell.
+// Reads a browser's folder in the background: its contents, and facts from the files'
+// headers.
 class FolderReader {
  public:
-  // Called on the window's thread, never after the reader has gone.
+  // Called on the window's thread, never after the reader is destroyed.
   struct Events {
-    // Names alone first where that was asked for: `complete` is false then.
+    // `complete` is false for the first listing with names only, if requested.
     std::function<void(FolderListing listing, bool complete)> listed;
-    // `last`: nothing more comes.
+    // `last`: no more follow.
     std::function<void(const PlacedItems& found, bool last)> factsFound;
   };
   explicit FolderReader(Events events) : events_(std::move(events)) {}
 
-  // Lists a folder. With `namesFirst` the names come at once and sizes and times in a second,
-  // complete list, so that even a folder of 100,000 files is shown at once.
+  // Lists a folder. With `namesFirst`, names are delivered first, and sizes and times in a second,
+  // complete list, so that even a folder of 100,000 files is shown immediately.
   void List(const std::string& folder, bool namesFirst);
   // Whether a listing is in progress.
   bool Listing() const { return listing_.Started(); }
-  // Reads the headers of items; those that told something come in bunches. Ends with the next
+  // Reads the headers of items; results are delivered in batches. Stopped by the next
   // listing.
   void ReadFacts(const std::string& folder, PlacedItems wanted);
   // Whether headers are being read.

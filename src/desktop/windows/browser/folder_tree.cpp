@@ -29,7 +29,7 @@ struct FolderData : wxTreeItemData {
 
 }  // namespace
 
-// A folder at the top of the tree.
+// A top-level folder of the tree.
 struct FolderTree::Place {
   Image image;
   wxString label;
@@ -50,7 +50,7 @@ FolderTree::FolderTree(wxWindow* parent, const Favorites& favorites, Events even
   });
   AddRoot("");
   UpdatePlaces();
-  // What is not read yet opens when it has been.
+  // Folders not read yet are expanded after reading.
   Bind(wxEVT_TREE_ITEM_EXPANDING, [this](wxTreeEvent& event) {
     if (GetChildrenCount(event.GetItem(), false) > 0) return;
     opening_.insert(FolderOf(event.GetItem()));
@@ -67,7 +67,7 @@ FolderTree::FolderTree(wxWindow* parent, const Favorites& favorites, Events even
        [this](wxTreeEvent& event) { ShowMenu(event.GetItem(), event.GetPoint()); });
 }
 
-// In the color of texts.
+// In the text color.
 void FolderTree::LoadImages() {
   wxVector<wxBitmapBundle> images;
   for (const char* symbol : {"folder", "home", "favorite", "volume"})
@@ -75,7 +75,7 @@ void FolderTree::LoadImages() {
   SetImages(images);
 }
 
-// --- places at the top ---
+// --- top-level folders ---
 
 std::vector<FolderTree::Place> FolderTree::Places() const {
   std::vector<Place> places;
@@ -173,7 +173,7 @@ void FolderTree::Read(std::vector<std::string> folders) {
 }
 
 void FolderTree::ShowNames(const std::string& folder, const std::vector<std::string>& names) {
-  // A folder may hang in the tree more than once: under a place of its own and under the file
+  // A folder may occur in the tree more than once: below another top-level folder and in the file
   // system.
   for (const wxTreeItemId& place : ChildrenOf(GetRootItem())) {
     wxTreeItemId item = place;
@@ -185,7 +185,7 @@ void FolderTree::ShowNames(const std::string& folder, const std::vector<std::str
   FollowOn();
 }
 
-// Folders that are still there stay as they are, open or not.
+// Keeps the state of existing folders, expanded or not.
 void FolderTree::MergeNames(const wxTreeItemId& item, const std::string& folder,
                             const std::vector<std::string>& names) {
   following_ = true;
@@ -250,7 +250,7 @@ void FolderTree::FollowOn() {
   following_ = false;
 }
 
-// --- what can be done with a folder ---
+// --- folder commands ---
 
 void FolderTree::ShowMenu(const wxTreeItemId& item, const wxPoint& point) {
   const std::string folder = FolderOf(item);

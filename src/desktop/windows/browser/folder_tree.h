@@ -13,30 +13,30 @@
 
 namespace fotomill::desktop {
 
-// The folders at the left of the frame: the user's favorites, home, pictures, mounted volumes and
-// the root of the file system. Folders are read when they open, on a thread of their own.
+// The folder tree of the frame: the user's favorites, home, pictures, mounted volumes and the root
+// of the file system. Folders are read when expanded, on separate threads.
 class FolderTree : public wxTreeCtrl {
  public:
-  // What the user did in it.
+  // User actions.
   struct Events {
-    std::function<void(const std::string& folder)> chosen;     // by the user, not by Follow
-    std::function<void(const std::string& folder)> openInTab;  // a new one
-    std::function<void(const std::string& folder)> newFolder;  // in that one
-    std::function<void(const std::string& folder, const std::string& name)> rename;  // to that name
+    std::function<void(const std::string& folder)> chosen;     // not by Follow
+    std::function<void(const std::string& folder)> openInTab;  // in a new tab
+    std::function<void(const std::string& folder)> newFolder;  // inside that folder
+    std::function<void(const std::string& folder, const std::string& name)> rename;  // to `name`
     std::function<void(const std::string& folder)> toggleFavorite;
   };
-  // The favorites are the frame's; they outlive the tree.
+  // `favorites` belong to the frame and must outlive the tree.
   FolderTree(wxWindow* parent, const Favorites& favorites, Events events);
 
-  // Shows the favorites and the volumes as they are now.
+  // Updates favorites and volumes.
   void UpdatePlaces();
-  // Reads the folders that are open again.
+  // Reads all expanded folders again.
   void Reread();
-  // Opens the way to a folder and marks it, without telling `chosen`.
+  // Expands the tree to a folder and selects it, without calling `chosen`.
   void Follow(const std::string& folder);
-  // The folder of an item; empty for none.
+  // The folder of an item; empty if invalid.
   std::string FolderOf(const wxTreeItemId& item) const;
-  // The folder shown at a point of the window; empty for none.
+  // The folder at a point of the window; empty if there is none.
   std::string FolderAt(const wxPoint& point) const;
 
  private:
@@ -49,11 +49,11 @@ class FolderTree : public wxTreeCtrl {
   void ShowNames(const std::string& folder, const std::vector<std::string>& names);
   void MergeNames(const wxTreeItemId& item, const std::string& folder,
                   const std::vector<std::string>& names);
-  // Goes on along the way to the followed folder as far as folders have been read.
+  // Expands further toward the followed folder, as far as folders have been read.
   void FollowOn();
   wxTreeItemId FindChild(const wxTreeItemId& item, const std::string& folder) const;
-  // The place at the top from which the way to a folder goes, and the item furthest along it that
-  // is there.
+  // The item closest to a folder, starting at the top-level folder that contains
+  // it.
   wxTreeItemId NearestItem(const std::string& folder) const;
   void ShowMenu(const wxTreeItemId& item, const wxPoint& point);
   void AskForName(const std::string& folder);
@@ -61,9 +61,9 @@ class FolderTree : public wxTreeCtrl {
   const Favorites& favorites_;
   const Events events_;
   std::string followed_;
-  // folders that open once they have been read
+  // folders to expand after reading
   std::set<std::string> opening_;
-  // what is marked was not chosen by the user
+  // the selection was changed by Follow, not by the user
   bool following_ = false;
   // for threads that outlive the window
   const std::shared_ptr<bool> alive_ = std::make_shared<bool>(true);

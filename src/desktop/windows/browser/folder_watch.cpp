@@ -9,7 +9,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr int kGatherMs = 300;  // changes are gathered for so long
+constexpr int kGatherMs = 300;  // changes are collected for this long
 
 }  // namespace
 

@@ -9,12 +9,12 @@
 
 namespace fotomill::desktop {
 
-// Tells of changes in one folder, many at once as one.
+// Watches a folder for changes; reports several changes at once.
 class FolderWatch : public wxEvtHandler {
  public:
   explicit FolderWatch(std::function<void()> changed);
-  // Watches a folder from here on, unless WatchFolders is off; an empty name watches nothing. Only
-  // works once the program waits for events.
+  // Watches another folder, unless WatchFolders is off; empty: none. Works only while the event
+  // loop runs.
   void Watch(const std::string& folder);
 
  private:

@@ -13,7 +13,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr int kSystemsDelayMs = 500;  // that it waits itself before it shows a tip
+constexpr int kSystemsDelayMs = 500;  // the toolkit's own delay for tooltips
 
 }  // namespace
 

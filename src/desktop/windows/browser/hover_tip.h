@@ -12,11 +12,11 @@ class wxWindow;
 
 namespace fotomill::desktop {
 
-// The tip of the file below the pointer, after FileTipDelay; what it tells is read apart.
+// The tooltip of the file below the pointer, after FileTipDelay; read in the background.
 class HoverTip : public wxEvtHandler {
  public:
   explicit HoverTip(wxWindow& window);
-  // The pointer is over an item of a folder, or over none. `known` as in FileTipLines.
+  // The pointer is over an item of a folder, or null. `known` as in FileTipLines.
   void Over(const std::string& folder, const FolderItem* item, Status known);
 
  private:
@@ -25,7 +25,7 @@ class HoverTip : public wxEvtHandler {
   wxWindow& window_;
   wxTimer wait_;
   std::string folder_;
-  FolderItem item_;  // without a name: none
+  FolderItem item_;  // empty name: none
   Status known_ = Status::Ok;
   LooseWork reading_;
 };

@@ -22,7 +22,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// What is typed may begin with "~" for the home folder.
+// "~" at the start means the home folder.
 std::string FolderTyped(std::string typed) {
   if (typed.starts_with('~'))
     typed.replace(0, 1, platform::SpecialFolderPath(platform::SpecialFolder::Home));
@@ -85,7 +85,7 @@ void PathBar::BuildEdit() {
 
 void PathBar::ShowFolder(const std::string& folder) {
   folder_ = folder;
-  // A button that goes gray would take the keyboard with it.
+  // A disabled button would lose the focus.
   if ((back_->HasFocus() && !trail_.CanStep(-1)) || (forward_->HasFocus() && !trail_.CanStep(1)))
     events_.left();
   back_->Enable(trail_.CanStep(-1));
@@ -104,8 +104,7 @@ void PathBar::Edit() {
   ReadNames();
 }
 
-// The folders beside what is typed are read apart, since a folder may hang, and complete it once
-// they are there.
+// Reads the folders for completion in the background, since the file system may hang.
 void PathBar::ReadNames() {
   const std::string above(platform::SplitPath(Utf8(edit_->GetValue())).folder);
   if (above.empty() || above == namesOf_) return CallAfter([this] { CompleteTyped(); });
@@ -120,7 +119,7 @@ void PathBar::ReadNames() {
   });
 }
 
-// The field's text without what completes it.
+// The field's text without the completion.
 wxString PathBar::Typed() const {
   long from = 0, to = 0;
   edit_->GetSelection(&from, &to);
@@ -128,7 +127,7 @@ wxString PathBar::Typed() const {
   return completed ? edit_->GetValue().Left(static_cast<size_t>(from)) : edit_->GetValue();
 }
 
-// Completes what has become longer by typing at its end.
+// Completes the text if it was extended at its end.
 void PathBar::CompleteTyped() {
   const wxString typed = Typed();
   const bool longer =
@@ -137,8 +136,7 @@ void PathBar::CompleteTyped() {
   if (longer && typed == edit_->GetValue()) ShowCompletion(0);
 }
 
-// Puts a way how the path may go on behind what was typed, marked, so that typing on replaces it.
-// `step` goes on to the next.
+// Appends a completion, selected, so that further typing replaces it. `step` goes to the next one.
 void PathBar::ShowCompletion(int step) {
   const wxString typed = Typed();
   const std::vector<std::string> paths = Completions(Utf8(typed), names_);
@@ -166,7 +164,7 @@ void PathBar::OpenTyped() {
   events_.open(folder);
 }
 
-// The nearest first.
+// Nearest first.
 void PathBar::OfferSteps(wxWindow& button, int direction) {
   std::vector<Crumb> folders;
   for (int steps = direction; trail_.CanStep(steps); steps += direction) {
@@ -176,7 +174,7 @@ void PathBar::OfferSteps(wxWindow& button, int direction) {
   if (chosen) events_.step(direction * (static_cast<int>(*chosen) + 1));
 }
 
-// The latest first, the one that is shown marked.
+// Latest first, with the current one checked.
 void PathBar::OfferTrail() {
   int last = 0;
   while (trail_.CanStep(last + 1)) ++last;

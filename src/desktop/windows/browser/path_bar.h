@@ -17,25 +17,25 @@ namespace fotomill::desktop {
 class CrumbStrip;
 class FolderTrail;
 
-// Where a browser is, and the ways from there: back, forward, up, a folder on the way or below it,
-// or one that is typed.
+// The path of a browser with navigation: back, forward, up, parent folders and their subfolders,
+// and a field to type a path.
 class PathBar : public wxPanel {
  public:
-  // What the user did in it.
+  // User actions.
   struct Events {
-    std::function<void(int steps)> step;  // back or ahead along the trail
+    std::function<void(int steps)> step;  // back or forward in the trail
     std::function<void()> up;
-    std::function<void(const std::string& folder)> open;  // a folder that is there
-    std::function<void()> left;                           // by Escape
+    std::function<void(const std::string& folder)> open;  // an existing folder
+    std::function<void()> left;                           // with Escape
   };
-  // The trail is the browser's; it outlives the bar.
+  // `trail` belongs to the browser and must outlive the bar.
   PathBar(wxWindow* parent, const FolderTrail& trail, Events events);
 
-  // The browser is there now: shows the way to it and which of the buttons lead on.
+  // The browser's folder has changed: updates path and buttons.
   void ShowFolder(const std::string& folder);
-  // Lets the user type a folder in the place of the buttons.
+  // Lets the user type a folder, instead of the buttons.
   void Edit();
-  // Offers the folders that the browser went through.
+  // Shows a menu of the visited folders.
   void OfferTrail();
 
  private:
@@ -55,9 +55,9 @@ class PathBar : public wxPanel {
   wxBitmapButton* forward_ = nullptr;
   CrumbStrip* crumbs_ = nullptr;
   wxTextCtrl* edit_ = nullptr;
-  std::string namesOf_;             // the folder that is typed so far
-  std::vector<std::string> names_;  // of the folders in it
-  // of the field's text when it was last looked at, without what completes it
+  std::string namesOf_;             // the folder typed so far
+  std::vector<std::string> names_;  // of its subfolders
+  // length of the last text, without the completion
   size_t typedLength_ = 0;
   LooseWork reading_;
 };

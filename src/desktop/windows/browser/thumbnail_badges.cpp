@@ -39,7 +39,7 @@ void DrawCheckerboard(wxDC& dc, const wxWindow& window, const wxRect& picture) {
   dc.DrawRectangle(badge);
 }
 
-// For a picture of which a part is missing.
+// For incomplete pictures.
 void DrawMark(wxDC& dc, const wxWindow& window, const wxRect& picture, const wxColour& color,
               const wxColour& textColor) {
   const wxString mark("!");

@@ -7,9 +7,9 @@
 
 namespace fotomill::desktop {
 
-// Draws what there is to know of a picture at the foot of its thumbnail, which fills `picture`: at
-// the right how many pages it has, behind a triangle when they are frames of an animation; at the
-// left a checkerboard when it has an alpha channel.
+// Draws badges at the bottom of a thumbnail, which fills `picture`: the number of pages on the
+// right, after a triangle if they are frames of an animation; a checkerboard on the left for an
+// alpha channel.
 void DrawBadges(wxDC& dc, const wxWindow& window, const wxRect& picture, const Thumbnail& thumbnail,
                 const wxColour& color, const wxColour& textColor);
 

@@ -22,9 +22,9 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr int kListWidth = 240;       // of a line in the list of names
-constexpr double kTypingPause = 1.0;  // seconds after which typing begins anew
-constexpr size_t kPrecache = 256;     // thumbnails wanted beyond what is near
+constexpr int kListWidth = 240;       // line width in the list of names
+constexpr double kTypingPause = 1.0;  // seconds until typing starts over
+constexpr size_t kPrecache = 256;     // thumbnails requested beyond nearby ones
 
 bool OpensMenu(const wxKeyEvent& event) {
   const int key = event.GetKeyCode();
@@ -69,7 +69,7 @@ ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model,
   Bind(wxEVT_SYS_COLOUR_CHANGED,
        [this](wxSysColourChangedEvent& event) { Refresh(), event.Skip(); });
   Bind(wxEVT_DPI_CHANGED, [this](wxDPIChangedEvent& event) { ModelChanged(), event.Skip(); });
-  // While the rubber band is held beyond the edge the list continues scrolling.
+  // Continues scrolling while the rubber band is beyond the edge.
   Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
     const wxPoint mouse = ScreenToClient(wxGetMousePosition());
     const int beyond = mouse.y < 0 ? mouse.y : std::max(mouse.y - GetClientSize().y, 0);
@@ -126,15 +126,14 @@ ThumbnailRequest ThumbnailCanvas::RequestOf(size_t line) const {
   return request;
 }
 
-// Stand-ins for what is visible first, then the thumbnails themselves, then a screen ahead in the
-// direction of scrolling, then the rest from there on, if it is to be made before anybody looks at
-// it.
+// Requests stand-ins for visible files, then their thumbnails, then one screen ahead in scroll
+// direction, then the rest from there on if precaching is enabled.
 void ThumbnailCanvas::WantThumbnails() {
   std::vector<ThumbnailRequest> requests;
   const auto want = [&](size_t first, size_t end) {
     for (size_t line = first; line < end; ++line) {
       const FolderItem& item = model_.Line(line);
-      if (item.folder || item.modified == 0) continue;  // its time is not known yet
+      if (item.folder || item.modified == 0) continue;  // its time is not read yet
       ThumbnailRequest request = RequestOf(line);
       if (thumbnails_.Find(request) == nullptr) requests.push_back(std::move(request));
     }
@@ -256,7 +255,7 @@ size_t ThumbnailCanvas::LineAt(const wxPoint& point) const {
   return layout_.LineAt(point.x, point.y + scroll_);
 }
 
-// Screen readers know the canvas by the file with the focus, and say it again when that changes.
+// Screen readers identify the canvas by its focused file; updates that on change.
 void ThumbnailCanvas::ReportFocus() {
   const wxString focus = Shown(model_.FocusText());
   const wxString count = Label("Thumbnails, %1 selected", model_.Selected().SelectedCount());
@@ -282,8 +281,8 @@ void ThumbnailCanvas::OnMouseDown(wxMouseEvent& event) {
     if (!keep) selection.ClickBlank(settings.ClearAllOnBlankClick != 0);
     return ReportSelection();
   }
-  // A press on a selected line may begin a drag of all; what a plain click does is done when the
-  // button goes up.
+  // Pressing on a selected line may start a drag of the selection; a plain click is handled on
+  // release.
   if (selection.IsSelected(line) && !event.ControlDown() && !event.ShiftDown()) return;
   selection.Click(line, event.ShiftDown(), event.ControlDown());
   ReportSelection();
@@ -393,7 +392,7 @@ void ThumbnailCanvas::OnKey(wxKeyEvent& event) {
   event.Skip();
 }
 
-// Letters jump to the next name that begins with what was typed.
+// Jumps to the next name starting with the typed letters.
 void ThumbnailCanvas::OnChar(wxKeyEvent& event) {
   const wxChar key = event.GetUnicodeKey();
   if (key < 0x20 || key == 0x7f || event.HasModifiers()) return event.Skip();

@@ -19,36 +19,36 @@ class wxTextCtrl;
 
 namespace fotomill::desktop {
 
-// The thumbnail list of a browser: one window that draws the cells that are visible, whatever the
-// number of files.
+// The thumbnail list of a browser: a window that only draws visible cells, regardless of the number
+// of files.
 class ThumbnailCanvas : public wxWindow {
  public:
-  // What it tells the browser.
+  // Callbacks to the browser.
   struct Events {
     std::function<void()> selectionChanged;
     std::function<void(size_t line)> activated;                    // double click
-    // kNoLine: on empty space; where in the canvas
+    // kNoLine: on empty space; position in the canvas
     std::function<void(size_t line, const wxPoint&)> contextMenu;
     std::function<void()> dragBegins;
-    std::function<void(int steps)> resize;  // Ctrl and the wheel
+    std::function<void(int steps)> resize;  // Ctrl and wheel
     std::function<void(size_t line, const std::string& name)> renamed;
   };
 
   ThumbnailCanvas(wxWindow* parent, BrowserModel& model, ThumbnailService& thumbnails,
                   Events events);
 
-  // The model has other lines, or another view mode.
+  // Call if the model has other lines or another view mode.
   void ModelChanged();
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
-  // Asks for what is visible, then for what is near. To be called when this browser comes to the
-  // front.
+  // Requests thumbnails of visible files, then of nearby ones. Call when this browser becomes
+  // active.
   void WantThumbnails();
   void ShowLine(size_t line);
   int64_t Scroll() const { return scroll_; }
   void ScrollTo(int64_t scroll);
-  // Lets the user type another name for a line, in its place.
+  // Lets the user rename a file in place.
   void EditName(size_t line);
-  // Visible thumbnails that are not there yet.
+  // The number of visible thumbnails not loaded yet.
   size_t MissingThumbnails();
   bool ListsNames() const;
 
@@ -91,11 +91,11 @@ class ThumbnailCanvas : public wxWindow {
   const Events events_;
   CellLayout layout_;
   int64_t scroll_ = 0;
-  int direction_ = 1;  // of scrolling: what is ahead is loaded first
-  int square_ = 96;    // the picture's place in a cell, 0 if there is none
+  int direction_ = 1;  // of scrolling; what is ahead is loaded first
+  int square_ = 96;    // size of the picture in a cell, 0: none
   int textHeight_ = 16;
   int painted_ = 0;     // 1: anything, 2: files
-  std::string filled_;  // the folder of which every visible cell has shown a picture
+  std::string filled_;  // the folder whose visible cells were all filled
 
   struct Drawn {
     ThumbnailPointer thumbnail;
@@ -112,7 +112,7 @@ class ThumbnailCanvas : public wxWindow {
   std::unordered_map<std::string, wxString> cutNames_;
   int cutWidth_ = 0;
 
-  std::optional<wxPoint> pressed_;  // where the left button went down, in the list
+  std::optional<wxPoint> pressed_;  // where the left button was pressed, in list coordinates
   size_t pressedLine_ = kNoLine;
   bool banding_ = false;
   wxPoint bandEnd_;

@@ -20,13 +20,13 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr double kBitmapBytes = 96e6;  // kept for drawing, beside the thumbnails themselves
+constexpr double kBitmapBytes = 96e6;  // cache of drawn bitmaps, besides the thumbnails
 constexpr size_t kMostCutNames = 5000;
-constexpr unsigned long kInkOnPaper = 0x3D3D90;  // of an extension on the sheet, 0xBBGGRR
+constexpr unsigned long kInkOnPaper = 0x3D3D90;  // for an extension on the sheet, 0xBBGGRR
 
 }  // namespace
 
-// The colors of one painting.
+// Colors for one paint event.
 struct ThumbnailCanvas::Looks {
   ListPalette palette = CurrentPalette();
   wxColour background = ToWx(palette.background), text = ToWx(palette.text);
@@ -35,8 +35,7 @@ struct ThumbnailCanvas::Looks {
   wxColour frame = ToWx(palette.frame), note = ToWx(palette.note);
 };
 
-// Painting tells the log when the first one, and the first one with files, was done, and which ones
-// were slow.
+// Logs the first paint, the first one with files, and slow ones.
 void ThumbnailCanvas::OnPaint(wxPaintEvent&) {
   constexpr double kFrame = 1.0 / 60;
   const double start = platform::MonotonicSeconds();
@@ -126,7 +125,7 @@ void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, c
     return DrawPlaceholder(dc, line, square, thumbnail != nullptr, looks);
   const wxBitmap& bitmap = BitmapOfThumbnail(thumbnail);
   if (!bitmap.IsOk()) return DrawPlaceholder(dc, line, square, true, looks);
-  // One of another size, or the file's own, stands in until the right one comes.
+  // Uses another size, or the embedded thumbnail, until the right one is loaded.
   double scale = 1;
   const wxSize size = wxSize(static_cast<int>(std::lround(bitmap.GetLogicalWidth())),
                              static_cast<int>(std::lround(bitmap.GetLogicalHeight())));
@@ -149,8 +148,7 @@ void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, c
   DrawBadges(dc, *this, wxRect(corner, shown), *thumbnail, looks.selected, looks.selectedText);
 }
 
-// A folder, or the picture of the record that stands for a thumbnail, with the file's extension:
-// what there is before, or instead of, a thumbnail.
+// Draws a folder, or the placeholder with the file's extension, before or instead of a thumbnail.
 void ThumbnailCanvas::DrawPlaceholder(wxDC& dc, size_t line, const wxRect& square, bool unreadable,
                                       const Looks& looks) {
   const FolderItem& item = model_.Line(line);
@@ -185,7 +183,7 @@ void ThumbnailCanvas::DrawPlaceholder(wxDC& dc, size_t line, const wxRect& squar
                wxALIGN_CENTER);
 }
 
-// Few are in use at a time: two kinds on three backgrounds.
+// Only a few are used at a time: two kinds on three backgrounds.
 const wxBitmap& ThumbnailCanvas::PlaceholderBitmap(bool unreadable, int side,
                                                    const wxColour& background) {
   constexpr size_t kMost = 12;

@@ -14,13 +14,13 @@ ThumbnailService::ThumbnailService()
       })) {}
 
 ThumbnailService::~ThumbnailService() {
-  loader_.reset();  // before its events' handler goes
+  loader_.reset();  // before the handler of its events is destroyed
 }
 
 void ThumbnailService::FetchResults() {
   const std::vector<ThumbnailLoader::Result> results = loader_->FetchResults();
   for (const ThumbnailLoader::Result& result : results) {
-    // A stand-in that comes late is of no use.
+    // Ignore stand-ins that arrive late.
     const bool late = result.request.standIn && cache_.FindAny(result.request.path) != nullptr;
     if (result.thumbnail != nullptr && !late) cache_.Put(result.request, result.thumbnail);
   }

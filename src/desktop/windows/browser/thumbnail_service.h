@@ -10,8 +10,8 @@
 
 namespace fotomill::desktop {
 
-// The program's thumbnails: one cache and one set of workers for all browsers. Whoever shows
-// thumbnails says what it wants and is told, on the window's thread, when something of it has come.
+// The program's thumbnails: one cache and one set of workers for all browsers. Users request
+// thumbnails and are notified on the window's thread when some are loaded.
 class ThumbnailService : public wxEvtHandler {
  public:
   using Listener = std::function<void(const std::vector<ThumbnailLoader::Result>&)>;
@@ -19,11 +19,11 @@ class ThumbnailService : public wxEvtHandler {
   ThumbnailService();
   ~ThumbnailService() override;
 
-  // The thumbnail that serves a request, and any that is there of a file, whatever its size and
-  // age; null if there is none in the cache.
+  // The thumbnail for a request; any thumbnail of a file, regardless of size and age. Null if not
+  // cached.
   ThumbnailPointer Find(const ThumbnailRequest& request) { return cache_.Find(request); }
   ThumbnailPointer FindAny(const std::string& path) const { return cache_.FindAny(path); }
-  // Replaces all requests; only one browser is in front.
+  // Replaces all requests, as only one browser is active.
   void Want(std::vector<ThumbnailRequest> requests) { loader_->Want(std::move(requests)); }
   void SetListener(Listener listener) { listener_ = std::move(listener); }
   void Clear() { cache_.Clear(); }

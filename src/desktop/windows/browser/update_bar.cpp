@@ -35,7 +35,7 @@ UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answe
   ok_ = ok;
   auto* close = new wxButton(this, wxID_CLOSE, wxString::FromUTF8("\xC3\x97"), wxDefaultPosition,
                              FromDIP(wxSize(32, -1)), wxBORDER_NONE);
-  close->SetName(Label("Close"));  // the sign would be read as "times"
+  close->SetName(Label("Close"));  // the symbol would be read as "times"
   close->SetToolTip(Label("Close"));
   auto* question = new wxBoxSizer(wxHORIZONTAL);
   question->Add(text_, wxSizerFlags(1).CenterVertical());

@@ -9,13 +9,13 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// The offer to make missing thumbnail files, as a bar that blocks nothing.
+// The offer to create missing thumbnail files, as a non-modal bar.
 class UpdateBar : public wxPanel {
  public:
-  // `answered` gets the choice that was made, 0 when the bar was closed.
+  // `answered` receives the choice, 0 if the bar was closed.
   UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answered);
   void Ask(int32_t count, int32_t selected);
-  // What is going on instead of a question; closing the bar ends it.
+  // Shows progress instead of a question; closing the bar cancels.
   void Report(const wxString& text);
 
  private:

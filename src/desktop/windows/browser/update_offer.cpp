@@ -34,7 +34,7 @@ void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> file
   browser.view = static_cast<choice::ViewMode>(modes.view);
   browser.asks = asks_;
   browser.options = ThumbnailUpdateOptionsFromSettings();
-  // What the offer tells of a folder that was left meanwhile is dropped.
+  // Drops reports about a folder that was left meanwhile.
   const auto weak = std::make_shared<std::weak_ptr<ThumbnailOffer>>();
   const auto post = [weak](std::function<void()> action) {
     wxTheApp->CallAfter([weak, action = std::move(action)] {
@@ -56,7 +56,7 @@ void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> file
       LogEvent("scanning", text);
     });
   };
-  events.keep = [](const ThumbnailUpdateOptions& options) {  // wherever the frame has gone since
+  events.keep = [](const ThumbnailUpdateOptions& options) {  // whatever the browser shows now
     wxTheApp->CallAfter([options] { StoreThumbnailUpdate(options); });
   };
   events.building = [this, post](size_t done, size_t total) {

@@ -14,25 +14,25 @@ namespace fotomill::desktop {
 
 class UpdateBar;
 
-// A browser's offer to make the missing thumbnail files of its folder: the bar above the list, and
-// what continues behind it.
+// A browser's offer to create the missing thumbnail files of its folder: the bar above the list,
+// and the background work.
 class UpdateOffer {
  public:
-  // What the browser has to follow.
+  // Notifications to the browser.
   struct Events {
     std::function<void()> answered;  // the bar was closed
-    std::function<void()> made;      // there are new thumbnails
+    std::function<void()> made;      // new thumbnails were created
   };
   UpdateOffer(wxWindow* parent, Events events);
   ~UpdateOffer();
 
-  // The bar, hidden while there is nothing to ask or tell; its parent lays it out.
+  // The bar, hidden if not needed; laid out by its parent.
   UpdateBar* Bar() const { return bar_; }
-  // Offers once for a folder with these files; one without any is only cleaned up.
+  // Offers once for a folder with these files; if empty, only cleans up.
   void Offer(const std::string& folder, std::vector<std::string> files, const BrowserModes& modes);
-  // The browser goes to another folder.
+  // Call when the browser changes to another folder.
   void Forget();
-  // Whether this browser asks; kept with its tab.
+  // Whether this browser asks; saved with its tab.
   bool Asks() const { return asks_; }
   void SetAsks(bool asks) { asks_ = asks; }
 
@@ -41,9 +41,9 @@ class UpdateOffer {
 
   const Events events_;
   UpdateBar* bar_;
-  std::shared_ptr<ThumbnailOffer> offer_;  // of this folder
+  std::shared_ptr<ThumbnailOffer> offer_;  // for this folder
   bool offered_ = false;
-  bool asks_ = true;  // until the user wants no more offers here
+  bool asks_ = true;  // false if the user wants no more offers here
 };
 
 }  // namespace fotomill::desktop

@@ -29,9 +29,9 @@ namespace fotomill::desktop {
 
 namespace {
 
-// all pictures are on the screen: none can be given back
+// all pictures are visible, so none can be dropped
 constexpr uint64_t kNoLimit = std::numeric_limits<uint64_t>::max();
-constexpr int kAcross = 2;                                           // panes beside each other
+constexpr int kAcross = 2;                                           // panes side by side
 // around the pane with the focus
 constexpr int kFrameWidth = 3;
 
@@ -95,7 +95,7 @@ CompareFrame::Pane CompareFrame::BuildPane(const std::string& path) {
   Pane pane{path, panel, nullptr,
             new wxStaticText(panel, wxID_ANY, Shown(platform::FileNameOf(path)), wxDefaultPosition,
                              wxDefaultSize, wxST_ELLIPSIZE_MIDDLE)};
-  // The events need the canvas that they come from, which is not there yet.
+  // The events need their canvas, which does not exist yet.
   const auto self = std::make_shared<ViewCanvas*>(nullptr);
   pane.canvas = new ViewCanvas(panel, {.resized = [this] { WantPictures(); },
                                        .changed = [this, self] { ShowFacts(*self); },
@@ -122,7 +122,7 @@ CompareFrame::Pane CompareFrame::BuildPane(const std::string& path) {
 
 void CompareFrame::ArrangePanes() {
   const int count = static_cast<int>(panes_.size());
-  SetSizer(nullptr);  // the old one lets go of its panes
+  SetSizer(nullptr);  // removes the panes from the old sizer
   auto* grid = new wxGridSizer(std::min(count, kAcross), FromDIP(wxSize(kFrameWidth, kFrameWidth)));
   for (const Pane& pane : panes_) grid->Add(pane.panel, wxSizerFlags(1).Expand());
   SetSizer(grid);
@@ -191,7 +191,7 @@ void CompareFrame::Placed(const ViewCanvas* canvas) {
 }
 
 void CompareFrame::Focused(size_t pane) {
-  if (pane >= panes_.size()) return;  // while it is being built
+  if (pane >= panes_.size()) return;  // during construction
   focus_ = pane;
   for (const Pane& each : panes_) {
     const bool own = &each == &panes_[focus_];
@@ -256,7 +256,7 @@ void CompareFrame::DeleteFile() {
   loader_->Forget(gone.path);
   panes_.erase(panes_.begin() + static_cast<std::ptrdiff_t>(focus_));
   gone.panel->Hide();
-  // This may be one of its own events.
+  // May be called from one of its events.
   CallAfter([panel = gone.panel] { panel->Destroy(); });
   if (panes_.empty()) {
     Close();

@@ -15,34 +15,34 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// Two to four pictures beside each other, zoomed and moved together in parts of each. Commands go
-// to the pane with the focus.
+// Compares two to four pictures side by side, zoomed and moved together relative to their sizes.
+// Commands apply to the pane with the focus.
 class CompareFrame : public wxFrame {
  public:
-  // Whether that number of files can be compared.
+  // Whether this number of files can be compared.
   static constexpr bool CanShow(size_t files) { return files >= 2 && files <= 4; }
 
-  // A pane for each file, for which CanShow holds; destroys itself when it is closed.
+  // One pane per file; CanShow must be true. Deletes itself when closed.
   CompareFrame(Shell& shell, const std::vector<std::string>& files);
   ~CompareFrame() override;
 
-  // Files were written: panes whose files are others now load them again.
+  // Call after files were written: reloads panes whose files have changed.
   void FilesChanged();
-  // Commands, by keys and menu.
+  // Commands of keys and menu.
   ViewCanvas& Canvas() { return *panes_[focus_].canvas; }
-  bool Joined() const { return joined_; }  // zoom and place are those of all panes
-  void ToggleJoined();                     // joined, all take those of the pane with the focus
-  void StepPane(int panes);                // moves the focus, around the ends
+  bool Joined() const { return joined_; }  // all panes share zoom and position
+  void ToggleJoined();                     // when joining, all use those of the focused pane
+  void StepPane(int panes);                // moves the focus, wrapping around
   void ToggleFullScreen();
-  void SettingSwitched();  // one that says how pictures look: all are loaded again
-  void ShowInfoWindow();   // of the pane with the focus
-  void DeleteFile();  // to the trash, and its pane goes
-  void Leave();       // full screen first, then the window
+  void SettingSwitched();  // after a change of display settings: reloads all
+  void ShowInfoWindow();   // for the focused pane
+  void DeleteFile();  // moves it to the trash and closes the pane
+  void Leave();       // leaves full screen, or else closes the window
 
  private:
   struct Pane {
     std::string path;
-    wxPanel* panel;  // its color is a frame around the pane with the focus
+    wxPanel* panel;  // its color frames the focused pane
     ViewCanvas* canvas;
     wxStaticText* caption;
   };
@@ -63,11 +63,11 @@ class CompareFrame : public wxFrame {
   std::vector<Pane> panes_;
   size_t focus_ = 0;
   bool joined_ = true;
-  ViewPlace place_;  // of all panes while they are joined
+  ViewPlace place_;  // of all panes while joined
   std::unique_ptr<ViewLoader> loader_;
 };
 
-// Functions > Compare: the selected files.
+// Functions > Compare: for the selected files.
 void CompareSelection(Shell& shell);
 
 }  // namespace fotomill::desktop

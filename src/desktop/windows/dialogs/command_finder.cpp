@@ -57,7 +57,7 @@ class FinderBox : public wxDialog {
     words_->SetFocus();
   }
 
-  // The id of the chosen command, wxID_NONE when nothing is found.
+  // The ID of the chosen command, wxID_NONE if nothing was found.
   int Chosen() const {
     const int line = list_->GetSelection();
     return line == wxNOT_FOUND ? wxID_NONE : CommandId(*found_[static_cast<size_t>(line)]);
@@ -79,7 +79,7 @@ class FinderBox : public wxDialog {
     LogEvent("finder", "found=" + std::to_string(found_.size()));
   }
 
-  // The arrows choose while the words keep the keyboard.
+  // Arrow keys move the selection while the text field keeps the focus.
   void OnKey(wxKeyEvent& event) {
     const int step = event.GetKeyCode() == WXK_DOWN ? 1 : event.GetKeyCode() == WXK_UP ? -1 : 0;
     const bool enter = event.GetKeyCode() == WXK_RETURN || event.GetKeyCode() == WXK_NUMPAD_ENTER;
@@ -100,7 +100,7 @@ class FinderBox : public wxDialog {
 void FindCommand(Shell& shell) {
   FinderBox box(&shell.Window());
   if (box.ShowModal() != wxID_OK || box.Chosen() == wxID_NONE) return;
-  // After the box is closed, so that the command runs on the frame behind it.
+  // After the dialog is closed, so that the command applies to the frame.
   shell.Window().CallAfter([&shell, id = box.Chosen()] { shell.Window().ProcessCommand(id); });
 }
 

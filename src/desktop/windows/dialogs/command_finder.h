@@ -4,7 +4,7 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// Lets the user find a command by words of its name, and runs it.
+// Lets the user search for a command by name, and runs it.
 void FindCommand(Shell& shell);
 
 }  // namespace fotomill::desktop

@@ -11,8 +11,8 @@ class wxWindow;
 
 namespace fotomill::desktop {
 
-// Asks for a folder that is there, offering those of a history list and the pictures folder, which
-// is the list's built-in choice. Puts the answer first in the list.
+// Asks for an existing folder, offering those in a history list and the pictures folder as a
+// built-in choice. Moves the answer to the top of the list.
 std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title,
                                         const wxString& verb, HistoryList history);
 

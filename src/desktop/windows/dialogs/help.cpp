@@ -12,7 +12,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr size_t kMostOfAnEntry = 800;  // bytes; what is longer gets a larger window
+constexpr size_t kMostOfAnEntry = 800;  // bytes; longer entries get a larger window
 
 }  // namespace
 

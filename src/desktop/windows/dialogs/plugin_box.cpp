@@ -97,7 +97,7 @@ void PluginBox::FillList() {
                           " formats=" + std::to_string(PluginFormatCount()));
 }
 
-// One line for each format of a module; one for a module that is not loaded.
+// One line per format of a module; one for a module that is not loaded.
 void PluginBox::AddModule(const PluginModule& module) {
   const auto add = [&](int32_t row, std::string_view extension, std::string_view plugin,
                        std::string_view formats, std::string_view can) {

@@ -12,8 +12,8 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// The formats of all plug-ins, what each can do, the switches of their modules, and the way to
-// their own settings.
+// The formats of all plug-ins with their capabilities, check boxes for the modules, and access to
+// their settings.
 class PluginBox : public wxDialog {
  public:
   explicit PluginBox(wxWindow* parent);
@@ -27,8 +27,8 @@ class PluginBox : public wxDialog {
 
   wxDataViewListCtrl* list_ = nullptr;
   struct Line {
-    std::string module;  // its file name
-    int32_t row;         // of the plug-in table, -1 for a module that is not loaded
+    std::string module;  // file name
+    int32_t row;         // in the plug-in table, -1: module not loaded
   };
   std::vector<Line> lines_;
   wxStaticText* note_ = nullptr;

@@ -35,7 +35,7 @@ bool AskAndSelect(wxWindow& parent, BrowserModel& model) {
       new wxTextCtrl(&dialog, wxID_ANY, LastPattern(), wxDefaultPosition,
                      dialog.FromDIP(wxSize(320, -1)), 0, wxDefaultValidator, Label("Pattern"));
   sizer->Add(pattern, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, gap));
-  // as MatchMode
+  // in the order of MatchMode
   const wxString modes[] = {Label("&Replace the selection"), Label("&Add to the selection"),
                             Label("Re&move from the selection")};
   auto* mode = new wxRadioBox(&dialog, wxID_ANY, Label("Selection"), wxDefaultPosition,

@@ -29,7 +29,7 @@ bool Confirm(wxWindow& parent, const wxString& question, const wxString& verb) {
   return dialog.ShowModal() == wxID_OK;
 }
 
-// The list of sets with what can be done to them.
+// The list of tab sets with buttons to open and delete.
 class TabSetBox : public wxDialog {
  public:
   explicit TabSetBox(wxWindow& parent)

@@ -7,9 +7,9 @@ class wxWindow;
 
 namespace fotomill::desktop {
 
-// Asks for the name under which the tabs are to be kept, and before another set is replaced.
+// Asks for a name to save the tabs, and for confirmation before replacing a set.
 std::optional<std::string> AskForTabSetName(wxWindow& parent);
-// Lets the user choose a set to open, and delete sets.
+// Lets the user choose a tab set to open, or delete sets.
 std::optional<std::string> ChooseTabSet(wxWindow& parent);
 
 }  // namespace fotomill::desktop

@@ -35,7 +35,7 @@ bool AskForToolbar(wxWindow& parent) {
   wxArrayString labels;
   for (const ToolbarButton& button : before) {
     const int place = static_cast<int>(labels.size());
-    order.push_back(button.shown ? place : ~place);  // as wxRearrangeList marks what is not checked
+    order.push_back(button.shown ? place : ~place);  // how wxRearrangeList marks unchecked items
     wxString label = wxControl::RemoveMnemonics(CommandOfSymbol(button.name)->text);
     label.EndsWith("...", &label);
     labels.push_back(label);
@@ -45,8 +45,7 @@ bool AskForToolbar(wxWindow& parent) {
   dialog.GetList()->SetName(Label("Buttons"));
   dialog.GetList()->SetSelection(0);
   dialog.GetList()->SetFocus();
-  // Space turns the mark of the selected line from the start; of itself the list does so only after
-  // an arrow key.
+  // Space toggles the selected line; by itself, the list only does so after an arrow key.
   dialog.Bind(wxEVT_CHAR_HOOK, [list = dialog.GetList()](wxKeyEvent& event) {
     const int line = list->GetSelection();
     if (event.GetKeyCode() != WXK_SPACE || !list->HasFocus() || line == wxNOT_FOUND)

@@ -8,9 +8,9 @@
 
 namespace fotomill::desktop {
 
-// The buttons of the toolbar as the user has chosen them, of all that the table of commands has.
+// The toolbar buttons as chosen by the user, from the table of commands.
 std::vector<ToolbarButton> ToolbarButtons();
-// Lets the user choose order and set of the buttons. True when they were changed and saved.
+// Lets the user choose and order the buttons. True if they were changed and saved.
 bool AskForToolbar(wxWindow& parent);
 
 }  // namespace fotomill::desktop

@@ -150,7 +150,7 @@ void CleanUpBox::Search() {
       [this, below = below_->GetValue()](const StopToken& stop) {
         orphans_ = FindOrphanThumbnails(folder_, below, stop);
       },
-      [this](Status) { Found(); });  // as many as there was memory for
+      [this](Status) { Found(); });  // as many as fit in memory
 }
 
 void CleanUpBox::Found() {

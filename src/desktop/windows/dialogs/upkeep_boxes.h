@@ -18,17 +18,17 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// Compaction of a thumbnail database: which one, how far it is, what became of it.
+// Compacts a thumbnail database: choice, progress, result.
 class CompactionBox : public wxDialog {
  public:
   CompactionBox(wxWindow* parent, const std::string& folder);
 
  private:
   void Begin();
-  void Look();  // how far it is
+  void Look();  // updates the progress
   void UpdateControls();
 
-  const std::string paths_[2];  // of the global and the folder's own database
+  const std::string paths_[2];  // of the global and the folder's database
   wxRadioBox* which_ = nullptr;
   wxStaticText* facts_ = nullptr;
   wxCheckBox* purge_ = nullptr;
@@ -38,7 +38,7 @@ class CompactionBox : public wxDialog {
   std::unique_ptr<DatabaseCompaction> compaction_;
 };
 
-// Thumbnail files whose pictures are gone: lists them, and deletes them when told to.
+// Lists orphaned thumbnail files, and deletes them on request.
 class CleanUpBox : public wxDialog {
  public:
   CleanUpBox(wxWindow* parent, const std::string& folder);
@@ -53,7 +53,7 @@ class CleanUpBox : public wxDialog {
   wxCheckBox* below_ = nullptr;
   wxListBox* list_ = nullptr;
   wxStaticText* outcome_ = nullptr;
-  Background work_;  // last, so that it ends first
+  Background work_;  // must be last, so that it ends first
 };
 
 }  // namespace fotomill::desktop

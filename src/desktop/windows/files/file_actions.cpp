@@ -46,7 +46,7 @@ PastedPicture PictureOf(const wxBitmap& bitmap) {
   return picture;
 }
 
-// "cut" or "copy", then a URL a line
+// "cut" or "copy", then one URL per line
 constexpr const char* kGnomeFiles = "x-special/gnome-copied-files";
 constexpr size_t kMostFailuresShown = 10;
 
@@ -306,12 +306,12 @@ void FileActions::Paste(const std::string& folder) {
       cut = std::string(static_cast<const char*>(marked.GetData()), marked.GetSize())
                 .starts_with("cut");
     }
-    if (cut) wxTheClipboard->Clear();  // they can be moved once only
+    if (cut) wxTheClipboard->Clear();  // they can be moved only once
   }
   Do(cut ? FileOperationKind::Move : FileOperationKind::Copy, files.Paths(), folder);
 }
 
-// With the clipboard open.
+// The clipboard must be open.
 void FileActions::PastePicture(const std::string& folder) {
   wxBitmapDataObject bitmap;
   if (!wxTheClipboard->GetData(bitmap) || !bitmap.GetBitmap().IsOk()) {
@@ -331,7 +331,7 @@ void FileActions::PastePicture(const std::string& folder) {
       });
 }
 
-// --- functions of the menu ---
+// --- menu functions ---
 
 void TrashSelection(Shell& shell) { shell.Files().Trash(shell.Tabs().SelectedPaths()); }
 void DeleteSelection(Shell& shell) { shell.Files().Delete(shell.Tabs().SelectedPaths()); }

@@ -14,50 +14,50 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// What the frame does to files: apart, one thing after the other, told of in the status bar, and
-// kept so that it can be taken back.
+// The frame's file operations: run in the background, one at a time, reported in the status bar,
+// and can be undone.
 class FileActions : public wxEvtHandler {
  public:
-  explicit FileActions(Shell& shell);  // the shell outlives it
+  explicit FileActions(Shell& shell);  // must outlive this object
   ~FileActions() override = default;
 
-  // False when there is no trash and the user, being asked, declined.
+  // False if there is no trash and the user declined to delete permanently.
   bool Trash(const std::vector<std::string>& paths);
-  // The same of a file that `view` shows; asks first if PromptDeleteFromView wants it. False when
-  // the answer was no, or other files are in progress.
+  // The same for a file shown in `view`; asks first, depending on PromptDeleteFromView. False if
+  // the user declined, or another operation is running.
   bool TrashFromView(wxWindow* view, const std::string& path);
-  // Asks first. False when the answer was no.
+  // Asks first. False if the user declined.
   bool Delete(const std::vector<std::string>& paths);
-  // Copies files and folders; a name that is taken gets a number.
+  // Copies files and folders; adds a number if a name is taken.
   void CopyTo(const std::vector<std::string>& paths, const std::string& folder);
-  // Moves them; where a name is taken, that one stays and is told of.
+  // Moves files and folders; reports taken names and skips them.
   void MoveTo(const std::vector<std::string>& paths, const std::string& folder);
   // Files were dropped on a folder.
   void Drop(const std::vector<std::string>& paths, const std::string& folder, bool move);
-  // `name` without a folder; reports when it is taken.
+  // `name` without folder; reports if it is taken.
   void Rename(const std::string& path, const std::string& name);
-  // Several files at once, as the caller has planned it.
+  // Renames several files, as planned by the caller.
   void RenameAll(std::vector<FileStep> steps);
   void NewFolder(const std::string& parent);  // asks for its name
-  // Turns the picture in a file; `then` is told whether that was done, with a remark. False when
-  // something else is being done.
+  // Turns the picture in a file; `then` is called with the result and a remark. False if another
+  // operation is running.
   using Turned = std::function<void(bool done, const std::string& note)>;
   bool SaveTurned(const std::string& path, Orientation turn, Turned then);
 
-  // Takes back what was done last, or does it again; nothing while something is being done.
+  // Undoes or redoes the last operation; does nothing while another one is running.
   void Undo();
-  void Redo();  // what Undo took back last
-  // Somebody else did it; it can be taken back like the rest.
+  void Redo();  // the last one undone
+  // Adds an operation done elsewhere, to be undone like others.
   void NoteDone(FileOperation operation) { undo_.Add(std::move(operation)); }
   const UndoList& Undoable() const { return undo_; }  // for the state and names of Undo and Redo
   void SettingsChanged();              // applies UndoLevels
-  bool Busy() const { return busy_; }  // something is being done; nothing else can begin
+  bool Busy() const { return busy_; }  // an operation is running; no other can start
   void Stop() { task_.Stop(); }
 
-  // The clipboard holds the files for other programs too; `cut` asks whoever pastes to move them.
+  // Puts files on the clipboard, also for other programs; `cut`: pasting moves them.
   void ToClipboard(const std::vector<std::string>& paths, bool cut);
-  void PathsToClipboard(const std::vector<std::string>& paths);  // as text, a path a line
-  // Files, or else a picture, which becomes a file.
+  void PathsToClipboard(const std::vector<std::string>& paths);  // as text, one path per line
+  // Pastes files, or else a picture as a new file.
   void Paste(const std::string& folder);
 
  private:
@@ -67,21 +67,21 @@ class FileActions : public wxEvtHandler {
   void Do(FileOperationKind kind, const std::vector<std::string>& paths, const std::string& folder);
   void Finished(const std::string& what, FileOperationResult result, const Then& then);
   void PastePicture(const std::string& folder);
-  // Windows that show a renamed or moved folder go with it.
+  // Updates windows that show a renamed or moved folder.
   void Follow(const FileOperation& operation, bool back);
-  // Such windows, and the file history.
+  // Updates those windows and the file history.
   void Took(const FileOperation& operation, bool back);
   void ReportFailures(const std::vector<FileOperationFailure>& failures);
 
   Shell& shell_;
   UndoList undo_;
   bool busy_ = false;
-  BackgroundTask task_;  // last: it uses the rest
+  BackgroundTask task_;  // must be last: it uses the other members
 };
 
 // Functions of the frame's menu.
 void TrashSelection(Shell& shell);
-void DeleteSelection(Shell& shell);  // for good, after asking
+void DeleteSelection(Shell& shell);  // permanently, after asking
 void CopySelectionTo(Shell& shell);  // asks for the folder
 void MoveSelectionTo(Shell& shell);  // asks for the folder
 

@@ -8,7 +8,7 @@
 
 namespace fotomill::desktop {
 
-// Files on the clipboard or in a drag. In contrast to the toolkit's own class, names may be any
+// Files for clipboard and drag and drop. Unlike in the toolkit's class, names may be any
 // bytes.
 class FileListData : public wxCustomDataObject {
  public:

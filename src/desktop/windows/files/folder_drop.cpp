@@ -22,7 +22,7 @@ DropKind KindNow() {
   return settings.DropOptions == choice::kDropAsk ? DropKind::Ask : DropKind::Move;
 }
 
-// nullopt-like: 1 move, 0 copy, -1 neither.
+// Returns 1: move, 0: copy, -1: canceled.
 int AskKind(const std::string& folder) {
   wxMessageDialog dialog(nullptr, Label("Move or copy the files to %1?", Shown(folder)),
                          Label("Drop files"), wxYES_NO | wxCANCEL | wxICON_QUESTION);
@@ -44,13 +44,13 @@ wxDragResult FolderDrop::OnData(wxCoord x, wxCoord y, wxDragResult suggested) {
   return Drop(folderAt_(wxPoint(x, y)), std::move(files)) ? suggested : wxDragNone;
 }
 
-// False if nothing is to be done.
+// False if there is nothing to do.
 bool FolderDrop::Drop(const std::string& folder, std::vector<std::string> files) const {
   if (folder.empty() || files.empty()) return false;
-  // What is there already stays.
+  // Ignore files already in the folder.
   if (platform::SplitPath(files.front()).folder == platform::JoinFolder(folder, "")) return false;
   const DropKind kind = KindNow();
-  // The drag is over before anything is asked or done.
+  // Wait for the end of the drag before asking or doing anything.
   wxTheApp->CallAfter([dropped = dropped_, files = std::move(files), folder, kind] {
     const int move = kind == DropKind::Ask ? AskKind(folder) : kind == DropKind::Move ? 1 : 0;
     if (move >= 0) dropped(files, folder, move == 1);

@@ -10,11 +10,11 @@
 
 namespace fotomill::desktop {
 
-// Files dropped on a window go to a folder: moved with Shift, copied with Ctrl, else as DropOptions
-// says.
+// Accepts files dropped on a window for a folder: moves them with Shift, copies them with Ctrl,
+// otherwise depends on DropOptions.
 class FolderDrop : public wxDropTarget {
  public:
-  // The folder at a place of the window, empty for none.
+  // The folder at a position in the window; empty if there is none.
   using FolderAt = std::function<std::string(const wxPoint& place)>;
   using Dropped = std::function<void(const std::vector<std::string>& files,
                                      const std::string& folder, bool move)>;

@@ -4,7 +4,7 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// Asks for a picture and opens it. Folder and filter are kept in OpenPath and OpenFilterIndex.
+// Asks for a picture and opens it. Remembers folder and filter in OpenPath and OpenFilterIndex.
 void AskAndOpenFile(Shell& shell);
 
 }  // namespace fotomill::desktop

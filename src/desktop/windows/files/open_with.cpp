@@ -22,10 +22,10 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr double kHandOverSeconds = 2;  // a program that ends earlier has handed over to another
+constexpr double kHandOverSeconds = 2;  // earlier exit: passed on to another process
 
-// The command that was chosen, or else the registered program's. Talks to the window's thread as
-// long as the window is there.
+// Runs the chosen command, or else the registered program. Reports to the window's thread as long
+// as the window exists.
 class Host : public ExternalProgramHost {
  public:
   Host(Shell& shell, StopToken stop, std::vector<std::string> command)

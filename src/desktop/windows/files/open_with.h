@@ -12,8 +12,8 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// Other programs, started on files: they run beside this one. When one ends, the folders are read
-// again and the window comes to the front, unless the program only handed over to another.
+// Opens files with other programs, which run in parallel. When one exits, reloads the folders and
+// raises the window, unless the program only passed the file to another process.
 class ExternalPrograms {
  public:
   explicit ExternalPrograms(Shell& shell) : shell_(shell) {}
@@ -21,9 +21,9 @@ class ExternalPrograms {
   ExternalPrograms& operator=(const ExternalPrograms&) = delete;
   ~ExternalPrograms() { stop_.Stop(); }
 
-  // With the program registered for the file; a message if there is none.
+  // Uses the registered program; shows a message if there is none.
   void Open(const std::string& file);
-  // With a chosen one, at least one file.
+  // Uses the given program; at least one file.
   void OpenWith(const platform::Program& program, const std::vector<std::string>& files);
 
  private:
@@ -33,8 +33,8 @@ class ExternalPrograms {
   const StopSource stop_;
 };
 
-// A new menu of the programs registered for files like the first of these; each opens all of them.
-// Null if there are none.
+// Creates a menu of the programs registered for the first file's type; each opens all files. Null
+// if there are none.
 wxMenu* NewOpenWithMenu(Shell& shell, const std::vector<std::string>& files);
 
 }  // namespace fotomill::desktop

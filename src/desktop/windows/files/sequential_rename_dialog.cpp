@@ -40,7 +40,7 @@ constexpr int kMostNumber = 32760, kMostIncrement = 1000;
 
 std::string_view BuiltInBase() { return DefaultText(KeyOf(KeyNumber::SequentialRenameBaseName)); }
 
-// Keeps what a run would do instead of showing it.
+// Records the results of a dry run instead of showing them.
 class PreviewBox : public ProgressBox {
  public:
   std::vector<FileOutcome> outcomes;
@@ -57,7 +57,7 @@ struct FlagBox {
   KeyNumber key;
   const char* text;
 };
-// their places in the table
+// indices in kFlags
 enum Flag : size_t { kSkipColliding, kUpdate, kPrefix, kRandom, kHyphen };
 constexpr FlagBox kFlags[] = {
     {KeyNumber::SequentialRenameSkipCollide, TrLater("&Skip colliding files")},
@@ -77,8 +77,7 @@ std::vector<BatchFile> BatchFiles(const std::vector<std::string>& files, size_t 
 class SequentialRenameDialog : public wxDialog {
  public:
   SequentialRenameDialog(wxWindow* parent, const std::vector<std::string>& files);
-  // The rules that the user chose, which the settings hold then; nullopt, and nothing is changed,
-  // when nothing is wanted.
+  // The user's rules, also saved in the settings; nullopt, with nothing changed, if canceled.
   std::optional<SequentialRenameRules> Ask();
 
  private:
@@ -164,7 +163,7 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent,
   base_->SetFocus();
 }
 
-// What the dialog does not show is as the settings say.
+// Rules that are not in the dialog come from the settings.
 SequentialRenameRules SequentialRenameDialog::ReadControls() const {
   SequentialRenameRules rules = SequentialRenameRulesFromSettings();
   rules.baseName = Utf8(base_->GetValue());
@@ -180,7 +179,7 @@ SequentialRenameRules SequentialRenameDialog::ReadControls() const {
 }
 
 void SequentialRenameDialog::StoreControls() const {
-  const bool named = !flags_[kPrefix]->GetValue();  // otherwise the base name has no part in it
+  const bool named = !flags_[kPrefix]->GetValue();  // otherwise the base name is not used
   if (named) settings.SequentialRenameBaseName.AssignCut(Utf8(base_->GetValue()));
   settings.SequentialRenameBaseNumber = number_->GetValue();
   settings.SequentialRenameIncrement = increment_->GetValue();
@@ -191,10 +190,10 @@ void SequentialRenameDialog::StoreControls() const {
   (void)SaveConfiguration();
 }
 
-// The new names as a run would give them now; nothing is renamed.
+// Shows the new names a run would give; renames nothing.
 void SequentialRenameDialog::UpdateControls() {
   const std::string base = Utf8(base_->GetValue());
-  // with the number in front every file keeps its own name behind it
+  // with the number first, every file keeps its own name after it
   base_->Enable(!flags_[kPrefix]->GetValue());
   const bool plain = flags_[kPrefix]->GetValue() || (IsPlainName(base) && !base.empty());
   ok_->Enable(plain);
@@ -229,7 +228,7 @@ std::optional<SequentialRenameRules> SequentialRenameDialog::Ask() {
   return ReadControls();
 }
 
-// What the last run renamed, for the frame's undo.
+// Adds the renames of the last run to the frame's undo list.
 void NoteRenames(Shell& shell) {
   FileOperation operation{FileOperationKind::Rename, {}};
   for (const RenamedFile& file : ReadRenameLog().value_or(RenameHistory()).files)

@@ -4,8 +4,8 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// The box "Sequential Rename" for the frame's selection: numbers the files, shows their new names
-// first.
+// The dialog "Sequential Rename" for the frame's selection: numbers the files, with a preview of
+// the new names.
 void RenameSelectionSequentially(Shell& shell);
 
 }  // namespace fotomill::desktop

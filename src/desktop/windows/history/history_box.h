@@ -14,7 +14,7 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// The file history: which files were recently used, for what, and when.
+// The file history: recently used files, with function and time.
 class FileHistoryBox : public wxDialog {
  public:
   explicit FileHistoryBox(Shell& shell);
@@ -45,7 +45,7 @@ class FileHistoryBox : public wxDialog {
   wxObjectDataPtr<Lines> lines_;
 };
 
-// The settings of the file history in a box of their own. True when they were confirmed.
+// Shows the settings of the file history in a dialog. True if confirmed.
 bool ShowFileHistorySetup(wxWindow* parent);
 
 }  // namespace fotomill::desktop

@@ -14,7 +14,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// A picture in the middle of a square that shows what is behind it.
+// Centers a picture in a transparent square.
 wxBitmapBundle OnSquare(const RgbImage& pixels, int side, double scale) {
   wxImage square(side, side);
   square.InitAlpha();

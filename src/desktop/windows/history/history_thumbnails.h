@@ -12,16 +12,16 @@
 
 namespace fotomill::desktop {
 
-// Thumbnails of the file history's rows, made apart; each on a square of one size, so that rows
-// keep their height.
+// Thumbnails for the rows of the file history, loaded in the background; padded to squares of equal
+// size, so that row heights do not change.
 class HistoryThumbnails : public wxEvtHandler {
  public:
-  // `came` is called with the paths whose thumbnails are there now.
+  // `came` is called with the paths of loaded thumbnails.
   explicit HistoryThumbnails(std::function<void(const std::vector<std::string>&)> came);
 
-  // Thumbnails of these files in squares of `side` pixels of the screen; 0 for none.
+  // Requests thumbnails of files in squares of `side` screen pixels; 0: none.
   void Want(const std::vector<std::string>& paths, int side, double scale);
-  // The thumbnail of a file, an empty square until it is there.
+  // The thumbnail of a file, an empty square if not loaded yet.
   const wxBitmapBundle& Find(const std::string& path) const;
 
  private:
@@ -32,7 +32,7 @@ class HistoryThumbnails : public wxEvtHandler {
   wxBitmapBundle empty_;
   int side_ = 0;
   double scale_ = 1;
-  ThumbnailLoader loader_;  // last, so that it ends first
+  ThumbnailLoader loader_;  // must be last, so that it ends first
 };
 
 }  // namespace fotomill::desktop

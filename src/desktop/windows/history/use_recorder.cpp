@@ -33,8 +33,8 @@ void UseRecorder::NoteAll(const std::vector<std::string>& paths, FileFunction fu
   Note(uses);
 }
 
-// What was taken down waits while the history is off, since the user may change his mind before the
-// program ends.
+// While the history is disabled, uses are kept in memory, as the user may enable it again before
+// the program ends.
 void UseRecorder::Flush() {
   if (!uses_.empty() && settings.FileHistoryEnable != 0)
     (void)UpdateFileHistory(HistoryOptionsFromSettings(), std::exchange(uses_, {}));

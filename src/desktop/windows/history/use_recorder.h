@@ -9,20 +9,20 @@
 
 namespace fotomill::desktop {
 
-// Takes down which files were used and for what, and writes that to the file history when nothing
-// else is to be done. While the history is switched off nothing is taken down.
+// Records used files with their function, and writes them to the file history when idle. Records
+// nothing while the history is disabled.
 class UseRecorder {
  public:
   UseRecorder();
 
-  // Takes uses over; they are written within a moment, or by Flush.
+  // Adds uses; they are written shortly after, or by Flush.
   void Note(const std::vector<FileUse>& uses);
-  // The same function on each of these files, now.
+  // Adds a use of each file with the same function, now.
   void NoteAll(const std::vector<std::string>& paths, FileFunction function);
-  // Writes what is still to be written.
+  // Writes pending uses.
   void Flush();
-  // The program ends: writes what is still to be written, or deletes the history file if the
-  // history is switched off by then.
+  // At program exit: writes pending uses, or deletes the history file if the history is disabled by
+  // then.
   void End();
 
  private:

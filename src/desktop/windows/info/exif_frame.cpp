@@ -58,7 +58,7 @@ ExifFrame::ExifFrame(Shell& shell, wxWindow* parent, const std::string& path)
       {wxID_CLOSE, TrLater("C&lose"), [this] { Close(); }},
   };
   wxSizer* buttons = BuildButtonRow(*this, *panel, rows);
-  // until the file is read
+  // until the file has been read
   for (const RowButton& row : rows) FindWindow(row.id)->Enable(row.id == wxID_CLOSE);
   auto* column = new wxBoxSizer(wxVERTICAL);
   column->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));

@@ -15,7 +15,7 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// The EXIF viewer: the lines of the walk as a list, and the thumbnail that the block holds.
+// The EXIF viewer: the EXIF entries as a list, and the embedded thumbnail.
 class ExifFrame : public wxFrame {
  public:
   ExifFrame(Shell& shell, wxWindow* parent, const std::string& path);
@@ -32,7 +32,7 @@ class ExifFrame : public wxFrame {
   wxDataViewListCtrl* list_ = nullptr;
   wxStaticBitmap* thumbnail_ = nullptr;
   wxStaticText* thumbnailFacts_ = nullptr;
-  Background work_;  // last, so that it ends first
+  Background work_;  // must be last, so that it ends first
 };
 
 }  // namespace fotomill::desktop

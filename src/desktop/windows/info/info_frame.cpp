@@ -76,7 +76,7 @@ InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> pa
         }
         summary_ = SummaryOf(files_);
       },
-      [this](Status) { Finished(); });  // with what could be read
+      [this](Status) { Finished(); });  // shows what could be read
 }
 
 wxSizer* InfoFrame::BuildButtons(wxWindow& panel) {
@@ -127,7 +127,7 @@ void InfoFrame::ShowChoice() {
 
 std::string InfoFrame::WholeText() const {
   const int line = list_ == nullptr ? 1 : list_->GetSelection();
-  // files are still being read apart
+  // files are still being read
   if (timer_.IsRunning() || files_.empty() || line == wxNOT_FOUND) return {};
   if (line > 0) return TextOf(files_[static_cast<size_t>(line) - 1]);
   std::string text = TextOf(summary_);

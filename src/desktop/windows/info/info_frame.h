@@ -19,8 +19,8 @@ namespace fotomill::desktop {
 class Shell;
 class ReportTree;
 
-// "Get info": the facts of one file, or of several with their totals and differences. Files are
-// read apart.
+// "Get info": information about one file, or about several with totals and differences. Files are
+// read in the background.
 class InfoFrame : public wxFrame {
  public:
   InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> paths);
@@ -28,19 +28,19 @@ class InfoFrame : public wxFrame {
  private:
   wxSizer* BuildButtons(wxWindow& panel);
   void Finished();
-  void ShowChoice();  // what the list at the left has selected
+  void ShowChoice();  // of the selected list item
   std::string WholeText() const;
 
   Shell& shell_;
   const std::vector<std::string> paths_;
-  std::vector<FileInfo> files_;  // written apart, then read here
+  std::vector<FileInfo> files_;  // written by the background task, then read here
   std::vector<InfoSection> summary_;
   std::atomic<size_t> read_{0};
   wxTimer timer_;
-  wxListBox* list_ = nullptr;  // none for one file
+  wxListBox* list_ = nullptr;  // null for a single file
   wxStaticText* problem_ = nullptr;
   ReportTree* tree_ = nullptr;
-  Background work_;  // last, so that it ends first
+  Background work_;  // must be last, so that it ends first
 };
 
 }  // namespace fotomill::desktop

@@ -8,14 +8,14 @@
 
 namespace fotomill::desktop {
 
-// Sections of lines as a tree of two columns, name and value.
+// Shows sections of lines as a tree with two columns, name and value.
 class ReportTree : public wxTreeListCtrl {
  public:
   explicit ReportTree(wxWindow* parent);
 
-  // Replaces what is shown.
+  // Replaces the contents.
   void Show(std::span<const InfoSection> sections);
-  // The value of the selected line; of a section, its title. Empty without a selection.
+  // The value of the selected line, or the title of a section; empty without a selection.
   wxString SelectedValue() const;
 };
 

@@ -19,7 +19,7 @@ namespace {
 constexpr int kLinesOfAPage = 66;
 constexpr size_t kCharactersOfALine = 92;
 
-// Lines of a text as they fit on paper: tabs are blanks, long lines continue in the next.
+// Splits a text into printed lines: expands tabs, wraps long lines.
 wxArrayString PrintedLines(const std::string& text) {
   wxArrayString lines;
   wxStringTokenizer tokens(wxString::FromUTF8(text.data(), text.size()), "\n", wxTOKEN_RET_EMPTY);

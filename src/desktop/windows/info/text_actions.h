@@ -6,11 +6,11 @@
 
 namespace fotomill::desktop {
 
-// What a window can do with a text that it shows.
+// Actions on a text shown in a window.
 void CopyText(const wxString& text);
-// Asks for a file and writes the text, with a message if that fails. `name` is offered.
+// Asks for a file and writes the text; shows a message on failure. `name` is the suggested name.
 void SaveTextAs(wxWindow& parent, const wxString& name, const std::string& text);
-// Prints a text, page by page in a fixed font, through the system's dialog.
+// Prints a text in a fixed-width font, using the system's dialog.
 void PrintText(wxWindow& parent, const wxString& title, const std::string& text);
 
 }  // namespace fotomill::desktop

@@ -17,7 +17,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// Every byte of a text that is not UTF-8 as the character of its number.
+// Converts every byte of a text that is not UTF-8 to the character with that number.
 wxString AsCharacters(std::string_view text) {
   wxString shown;
   for (const char c : text) shown += static_cast<wchar_t>(static_cast<unsigned char>(c));
@@ -91,7 +91,7 @@ void BoundControls::SetChoices(uint32_t control, std::span<const std::string> te
   if (choice == nullptr) return;
   wxArrayString items;
   for (const std::string& text : texts) items.Add(Shown(text));
-  // A list that is emptied for a moment loses the keyboard.
+  // Clearing a list, even briefly, would lose the focus.
   if (choice->GetStrings() != items) choice->Set(items);
 }
 

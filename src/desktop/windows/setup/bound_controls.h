@@ -10,8 +10,8 @@
 
 namespace fotomill::desktop {
 
-// The controls below a window as the binding of settings sees them: the number of a control is its
-// window's id.
+// Adapts the controls below a window to the settings binding: the number of a control is its window
+// ID.
 class BoundControls : public SetupDialog {
  public:
   explicit BoundControls(wxWindow& root) : root_(root) {}
@@ -29,17 +29,17 @@ class BoundControls : public SetupDialog {
   void Select(uint32_t control, int32_t position) override;
   int32_t Selected(uint32_t control) const override;
 
-  // The window of a control, null if there is none.
+  // The window of a control; null if there is none.
   wxWindow* Find(uint32_t control) const { return root_.FindWindow(static_cast<long>(control)); }
 
  private:
   wxWindow& root_;
-  // Texts that are not UTF-8, as their bytes and as they are shown: one that no one changed goes
-  // back byte for byte.
+  // Texts that are not UTF-8: original bytes and displayed text; if unchanged, they are stored back
+  // byte for byte.
   std::unordered_map<uint32_t, std::pair<std::string, wxString>> foreignTexts_;
 };
 
-// The formats that a destination list offers.
+// The formats in a destination list.
 class RegistryDestinations : public DestinationSource {
  public:
   std::vector<std::string> Extensions() const override;

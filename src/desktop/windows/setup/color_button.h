@@ -11,12 +11,12 @@ namespace fotomill::desktop {
 // The window class of the color selector.
 inline constexpr const char* kColorSelectBox = "COMMONColourSelectBox";
 
-// Asks for a color, beginning with one; both are 0x00BBGGRR. Nothing when the user cancels. Colors
-// that were put aside stay until the program ends.
+// Asks for a color, with an initial one; both are 0x00BBGGRR. nullopt if canceled. Custom colors
+// are remembered until the program exits.
 std::optional<int32_t> SelectColor(wxWindow* parent, int32_t color, const wxString& title);
 
-// A button that shows the color of a setting; a click opens the color selector. Tells a change as a
-// button event of its own id.
+// A button that shows the color of a setting; a click opens the color selector. Sends a button
+// event with its own ID when the color changes.
 class ColorButton : public wxButton {
  public:
   ColorButton(wxWindow* parent, wxWindowID id, const wxString& title);

@@ -4,8 +4,8 @@
 
 namespace fotomill::desktop {
 
-// The format list: every format with its switch and what this build can do with it. A switch that
-// is turned takes effect and is saved at once.
+// The format list: all formats with a check box and their capabilities in this build. Changes take
+// effect and are saved immediately.
 class FormatList : public wxDataViewListCtrl {
  public:
   explicit FormatList(wxWindow* parent);

@@ -9,12 +9,12 @@ class wxChoice;
 
 namespace fotomill::desktop {
 
-// The language of the windows: that of the system, or one of the installed translations.
+// The language of the windows: the system's, or one of the installed translations.
 class LanguagePanel : public wxPanel {
  public:
   explicit LanguagePanel(wxWindow* parent);
 
-  // Stores what is chosen. The first time it differs from before, a message says when it takes
+  // Stores the choice. On the first change, a message says when it takes
   // effect.
   void Store();
 
@@ -22,7 +22,7 @@ class LanguagePanel : public wxPanel {
   std::string Chosen() const;
 
   wxChoice* choice_ = nullptr;
-  std::vector<std::string> codes_;  // of the lines; empty: the system's language
+  std::vector<std::string> codes_;  // per line; empty: system language
 };
 
 }  // namespace fotomill::desktop

@@ -6,13 +6,13 @@
 
 namespace fotomill::desktop {
 
-// A number as a list of its bits, each with a name to tick. Bits beyond the list stay as they are.
+// Shows a number as a check list with a name for each bit. Other bits are preserved.
 class MaskList : public wxCheckListBox {
  public:
   MaskList(wxWindow* parent, wxWindowID id, const wxArrayString& names)
       : wxCheckListBox(parent, id, wxDefaultPosition, wxDefaultSize, names) {}
 
-  // Ticks the names of the bits that are set; Mask gives the number back as it is ticked now.
+  // Checks the names of the set bits; Mask returns the number as currently checked.
   void SetMask(int32_t mask) {
     mask_ = mask;
     for (unsigned bit = 0; bit < GetCount(); ++bit) Check(bit, (mask >> bit & 1) != 0);

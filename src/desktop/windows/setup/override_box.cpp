@@ -10,7 +10,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// The operation `options` of the rows that have one; `parameter` is the row's index.
+// The `options` operation of rows; `parameter` is the row's index.
 int32_t RowOptions(void* parentWindow, int32_t parameter) {
   return ShowOverrideBox(static_cast<wxWindow*>(parentWindow),
                          FormatRow(parameter).extension.view())

@@ -7,14 +7,14 @@
 
 namespace fotomill::desktop {
 
-// Whether a format, given by its extension, has options of its own, and the box that shows them:
-// true when the user confirmed.
+// Whether a format, given by extension, has an options dialog; and shows that dialog: true if
+// confirmed.
 bool HasOverrideBox(std::string_view extension);
 bool ShowOverrideBox(wxWindow* parent, std::string_view extension);
-// Whether Shift at the destination step opens the box.
+// Whether Shift opens the dialog in the destination step.
 bool ShiftOpensOverrideBox();
 
-// Makes the boxes known to the rows of the registry.
+// Registers the dialogs in the rows of the registry.
 void InstallOverrideBoxes();
 
 }  // namespace fotomill::desktop

@@ -25,8 +25,8 @@ namespace fotomill::desktop {
 
 namespace {
 
-// Device-independent pixels. Labels of all groups are as wide as the widest, so that the controls
-// are aligned.
+// Device-independent pixels. The labels of all groups have the same width, so that controls are
+// aligned.
 constexpr int kLeastLabelWidth = 330;
 const wxString kMark = wxString::FromUTF8("\xE2\x97\x8F");
 
@@ -39,7 +39,7 @@ wxArrayString FunctionNames() {
   return names;
 }
 
-// The toolkit's field takes anything and makes a number of it when it is left.
+// The toolkit's field accepts any text and converts it to a number when it loses the focus.
 void RefuseLetters(wxKeyEvent& event, bool negative) {
   const int key = event.GetKeyCode();
   const bool control = key < WXK_SPACE || key == WXK_DELETE || key >= WXK_START ||
@@ -49,7 +49,7 @@ void RefuseLetters(wxKeyEvent& event, bool negative) {
 }
 
 wxWindow* MakeSpin(wxWindow* box, const KeyRow& row, wxWindowID id) {
-  // The range is where the binding looks for it.
+  // The binding expects the range in this control.
   auto* range = new wxStaticText(box, id + static_cast<int>(kSpinRangeControl),
                                  Shown(SpinRangeText(SpinRangeOf(row))));
   range->Hide();
@@ -95,7 +95,7 @@ SettingsPanel::SettingsPanel(wxWindow* parent, std::vector<SetupItem> items,
   auto* column = new wxBoxSizer(wxVERTICAL);
   if (above) {
     wxWindow* const window = above(this);
-    const bool list = dynamic_cast<wxDataViewCtrl*>(window) != nullptr;  // takes the free space
+    const bool list = dynamic_cast<wxDataViewCtrl*>(window) != nullptr;  // gets the remaining space
     column->Add(window, wxSizerFlags(list ? 1 : 0).Expand().Border(wxALL, gap));
   }
   const char* group = nullptr;

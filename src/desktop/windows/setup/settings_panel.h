@@ -13,21 +13,21 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// A page of settings: a box for each group, in it a labeled control for each key, and a mark
-// before those that do not show their default. It fills nothing: whoever made it binds its
-// controls.
+// A page of settings: a box per group, with a labeled control for each key, and marks
+// for keys that differ from their defaults. The caller binds the controls to the
+// settings.
 class SettingsPanel : public wxScrolledWindow {
  public:
-  // `changed` is called after the user changed a control. `above` is on top of the groups, if
+  // `changed` is called after the user has changed a control. `above` is shown above the groups, if
   // given.
   SettingsPanel(wxWindow* parent, std::vector<SetupItem> items, std::function<void()> changed,
                 const std::function<wxWindow*(wxWindow*)>& above = {});
 
-  // The rows that it was made of.
+  // The rows it was created from.
   const std::vector<SetupItem>& Items() const { return items_; }
-  // Marks what differs from its default; how many do.
+  // Marks controls that differ from their defaults; returns their number.
   size_t UpdateMarks(const BoundControls& controls);
-  // The rows of the keys, for resetting them together.
+  // The key rows, to reset them together.
   std::vector<KeyRow> Rows() const;
 
  private:
@@ -38,7 +38,7 @@ class SettingsPanel : public wxScrolledWindow {
   std::vector<wxStaticText*> marks_;
 };
 
-// F1 in a window of settings: shows the help page of the control that has the focus.
+// F1 in a settings window shows help on the focused control.
 void BindSettingsHelp(wxWindow& window);
 
 }  // namespace fotomill::desktop

@@ -36,7 +36,7 @@ namespace {
 constexpr const char* kSetupTitle = TrLater("Setup");
 constexpr const char* kTransferFiles = TrLater("Settings (*.ini)|*.ini|All files|*");
 
-// Settings never change during a batch. False after a message when one is running.
+// Settings never change during a batch. False, after showing a message, if one is running.
 bool MayChangeSettings(wxWindow& window) {
   auto* const shell = dynamic_cast<Shell*>(wxTheApp->GetTopWindow());
   if (shell == nullptr || !shell->Batches().Running()) return true;
@@ -46,8 +46,7 @@ bool MayChangeSettings(wxWindow& window) {
   return false;
 }
 
-// Takes up what the controls hold and saves it. False after a message about the control that holds
-// something else.
+// Saves the values of the controls. False, after showing a message, if one of them is invalid.
 bool ReadSettings(wxWindow& window, const BoundControls& controls,
                   const std::function<void(uint32_t)>& show, bool& changed) {
   const RegistryDestinations destinations;
@@ -103,7 +102,7 @@ SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage fi
   SetMinSize(FromDIP(wxSize(760, 420)));
 
   FillSetupDialog(controls_, destinations_);
-  // Wide enough for the longest choice of every page, whatever the language.
+  // Wide enough for the longest choice on any page, in any language.
   const int pages =
       ClientToWindowSize(column->CalcMin()).x + wxSystemSettings::GetMetric(wxSYS_VSCROLL_X, this);
   SetSize(std::max(TextWidth(*this, 980), pages), TextWidth(*this, 680));

@@ -15,18 +15,18 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// All settings: pages at the left, a search field over all of them above, the controls of one page
-// at the right.
+// All settings: list of pages on the left, search field above, controls of one page on the
+// right.
 class SetupBox : public wxDialog {
  public:
-  // `applied` is called whenever settings have changed and were saved.
+  // `applied` is called after settings have been changed and saved.
   SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage first = SetupPage::Browsing);
 
  private:
   void BuildPages();
   wxSizer* BuildButtons();
-  void ShowPages();             // fills the list at the left: all pages, or what the search found
-  void ChooseLine(bool focus);  // shows what the list has selected
+  void ShowPages();             // fills the list: all pages, or search results
+  void ChooseLine(bool focus);  // shows the selected item
   void ShowPage(SetupPage page);
   void ControlChanged();
   bool Apply();
@@ -42,7 +42,7 @@ class SetupBox : public wxDialog {
   RegistryDestinations destinations_;
   std::vector<SettingsPanel*> panels_;
   LanguagePanel* language_ = nullptr;
-  std::vector<SetupItem> found_;  // what the list shows while something is searched for
+  std::vector<SetupItem> found_;  // list contents during a search
   bool searching_ = false;
   SetupPage page_;
   wxSearchCtrl* search_ = nullptr;
@@ -51,8 +51,8 @@ class SetupBox : public wxDialog {
   wxSimplebook* book_ = nullptr;
 };
 
-// A box of a few settings with OK and Cancel: the options of a format, of the file history. True
-// when the user confirmed; the settings are saved then.
+// A dialog for a few settings with OK and Cancel: options of a format, or of the file history. True
+// if confirmed and saved.
 bool ShowSettingsBox(wxWindow* parent, const wxString& title, const wxString& name,
                      const std::vector<SetupItem>& items);
 

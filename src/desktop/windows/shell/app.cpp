@@ -42,10 +42,10 @@ namespace fotomill::desktop {
 
 namespace {
 
-std::vector<std::string> programArguments;  // as the system gave them
-constexpr double kHandOverSeconds = 2;  // that a running program has to answer
+std::vector<std::string> programArguments;  // original arguments
+constexpr double kHandOverSeconds = 2;  // time for a running instance to answer
 
-// Starts of the same user on the same screen with the same data folder are one program.
+// Instances of the same user, display and data folder are combined into one.
 std::string NameOfInstance() {
   std::string place = DataFolder();
   for (const char* variable : {"WAYLAND_DISPLAY", "DISPLAY"}) {
@@ -59,7 +59,7 @@ std::string NameOfInstance() {
 
 class App : public wxApp {
  public:
-  // The language comes first: the toolkits choose theirs when they start.
+  // Set the language first: toolkits choose theirs at startup.
   bool Initialize(int& count, wxChar** arguments) override {
     SetDataFolder({});
     carried_ = CarryOverAtFirstStart();
@@ -90,7 +90,7 @@ class App : public wxApp {
     SetAppName("fotomill-desktop");
     SetAppDisplayName("Fotomill Professional");
     if (!wxApp::OnInit()) return false;
-    wxImage::AddHandler(new wxPNGHandler);  // pictures travel over the clipboard as PNG
+    wxImage::AddHandler(new wxPNGHandler);  // the clipboard transfers pictures as PNG
     if (!newInstance_ && HandOver()) return true;
     (void)LoadConfiguration();
     TakeFormatSwitches();
@@ -129,7 +129,7 @@ class App : public wxApp {
     return Event_Skip;
   }
 
-  // One that has handed over has no window to wait for.
+  // After passing its argument to a running instance, it has no window.
   int OnRun() override { return frame_ == nullptr ? 0 : wxApp::OnRun(); }
 
   int OnExit() override {
@@ -140,7 +140,7 @@ class App : public wxApp {
  private:
   static constexpr const char* kNewInstance = "new-instance";
 
-  // The toolkit sets the locale when it starts, so the texts choose theirs again.
+  // Select the translation again, as the toolkit has set the locale.
   void StartTranslations() {
     (void)StartTexts(StoredLanguage());
     auto* const translations = new wxTranslations;
@@ -149,7 +149,7 @@ class App : public wxApp {
     translations->AddStdCatalog();
   }
 
-  // In the status bar; a failure must not be missed.
+  // Shown in the status bar; failures in a message.
   void ReportCarryOver() {
     if (!carried_) return;
     const std::string text = CarryOverText(*carried_);
@@ -174,7 +174,7 @@ class App : public wxApp {
     frame_->OpenStart(start.Message(), false);
   }
 
-  std::string argument_;  // an absolute path, or empty
+  std::string argument_;  // absolute path or empty
   std::optional<CarryOver> carried_;
   bool newInstance_ = false;
   bool formatsStarted_ = false;

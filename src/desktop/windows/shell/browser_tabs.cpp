@@ -20,7 +20,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr int kViewsMs = 2000;  // after the last change
+constexpr int kViewsMs = 2000;  // delay after the last change
 
 }  // namespace
 
@@ -48,7 +48,7 @@ BrowserTabs::BrowserTabs(wxWindow* parent, Shell& shell, FrameMenus& menus,
 
 wxWindow& BrowserTabs::Window() const { return *book_; }
 
-// --- the browser in front ---
+// --- current browser ---
 
 BrowserPage* BrowserTabs::PageAt(size_t tab) const {
   return static_cast<BrowserPage*>(book_->GetPage(tab));
@@ -158,7 +158,7 @@ void BrowserTabs::FollowRename(const std::string& from, const std::string& to) {
   }
 }
 
-// --- what is kept ---
+// --- session ---
 
 void BrowserTabs::Restore(const Session& session) {
   const size_t first = book_->GetPageCount();
@@ -200,7 +200,7 @@ void BrowserTabs::Keep(Session& session) {
   (void)views_.Save();
 }
 
-// --- what browsers ask for ---
+// --- BrowserHost ---
 
 void BrowserTabs::BrowserChanged() {
   const BrowserPage* browser = Front();

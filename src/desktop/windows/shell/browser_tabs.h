@@ -21,46 +21,46 @@ namespace fotomill::desktop {
 class FrameMenus;
 class Shell;
 
-// The browsers of the frame, a tab each, and what they share: the columns of the details and how
-// folders are shown.
+// The browsers of the frame, one per tab, and shared data: columns of the details view and views of
+// folders.
 class BrowserTabs : private BrowserHost {
  public:
-  // `changed` is called when the browser in front has another folder, selection, mode or count, or
-  // is another one.
+  // `changed` is called when another browser becomes current, or when the current one changes its
+  // folder, selection, mode or count.
   BrowserTabs(wxWindow* parent, Shell& shell, FrameMenus& menus, std::function<void()> changed);
 
   wxWindow& Window() const;
 
-  // The browser in front; there is always one once a folder was opened.
+  // The current browser; not null once a folder was opened.
   BrowserPage* Front() const;
-  // What functions work on: files selected in the browser in front, in list order, or else the
-  // focused one.
+  // Input for functions: files selected in the current browser, in list order, or else the focused
+  // one.
   std::vector<std::string> SelectedFiles() const;
-  // The same with folders.
+  // The same including folders.
   std::vector<std::string> SelectedPaths() const;
-  std::string CurrentFolder() const;  // of the browser in front
-  // Selects those of the files that the browser in front shows.
+  std::string CurrentFolder() const;  // of the current browser
+  // Selects those files that the current browser shows.
   void SelectFiles(const std::vector<std::string>& files);
 
-  BrowserPage* Open(const std::string& folder);  // in a new tab, which comes to the front
-  // The tab that shows the folder, or a new one.
+  BrowserPage* Open(const std::string& folder);  // in a new tab, which becomes current
+  // The tab with this folder, or a new one.
   BrowserPage* Show(const std::string& folder);
-  // The tab in front, unless it is the last one.
+  // Closes the current tab, unless it is the last one.
   void Close();
-  bool HasClosed() const { return !closed_.Empty(); }  // there is a tab to reopen
+  bool HasClosed() const { return !closed_.Empty(); }  // a tab can be reopened
   void Reopen();
-  // Goes `step` tabs on, or back, round about.
+  // Moves `step` tabs forward or back, wrapping around.
   void Step(int step);
 
-  // Every browser reads its folder again.
+  // Reloads the folders of all browsers.
   void Reload();
-  // Browsers of the folder, or of one below, go with it.
+  // Updates browsers of the folder and its subfolders.
   void FollowRename(const std::string& from, const std::string& to);
 
-  // Opens the tabs of a session behind those that are open, or in their place.
+  // Opens the tabs of a session in addition to the open tabs, or instead of them.
   void Restore(const Session& session);
   void Replace(const Session& session);
-  // Writes the tabs and the columns into a session, and how folders are shown to its file.
+  // Stores tabs and columns in a session, and writes the views of folders to their file.
   void Keep(Session& session);
   void SetColumns(const std::string& text) { columns_ = ParseDetailColumns(text); }
 
@@ -85,13 +85,13 @@ class BrowserTabs : private BrowserHost {
   const std::function<void()> changed_;
   wxAuiNotebook* book_ = nullptr;
   FolderViews views_;
-  wxTimer viewsTimer_;  // until they are written
+  wxTimer viewsTimer_;  // delay before writing views
   DetailColumns columns_ = ParseDetailColumns({});
   ClosedTabs closed_;
   std::string loggedState_;
 };
 
-// The name of a folder on its tab and in the frame's title.
+// The name of a folder for its tab and the frame's title.
 wxString FolderLabel(const std::string& folder);
 
 }  // namespace fotomill::desktop

@@ -21,7 +21,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// A command of the browser in front.
+// A command for the current browser.
 template <void (BrowserPage::*action)()>
 void OfBrowser(Shell& shell) {
   if (BrowserPage* browser = shell.Tabs().Front()) (browser->*action)();
@@ -32,7 +32,7 @@ void ShowAs(Shell& shell) {
   if (BrowserPage* browser = shell.Tabs().Front()) browser->SetViewMode(view);
 }
 
-// Whether a mode of the browser in front has a value.
+// Whether the current browser has a mode set to this value.
 template <int32_t BrowserModes::*mode, int32_t value>
 bool Has(Shell& shell) {
   const BrowserPage* browser = shell.Tabs().Front();
@@ -45,7 +45,7 @@ void ThumbnailsFrom(Shell& shell) {
   if (BrowserPage* browser = shell.Tabs().Front()) browser->SetThumbnailMode(mode);
 }
 
-// Sorts by a mode; chosen again, the other way round.
+// Sorts by a mode; if it is already set, reverses the order.
 template <int32_t sort>
 void SortBy(Shell& shell) {
   BrowserPage* browser = shell.Tabs().Front();
@@ -74,7 +74,7 @@ void SelectSameType(Shell& shell) {
   }
 }
 
-// A command of the frame's file actions.
+// A command for the frame's file actions.
 template <void (FileActions::*action)()>
 void OfFiles(Shell& shell) {
   (shell.Files().*action)();

@@ -12,31 +12,31 @@ namespace fotomill::desktop {
 class FolderTree;
 class Shell;
 
-// The left side of the frame: the folder tree with the favorites at its top, which can be hidden
-// and resized.
+// The left side of the frame: the folder tree with the favorites at the top. Can be hidden and
+// resized.
 class FolderPane {
  public:
-  explicit FolderPane(Shell& shell);  // builds it into the frame; the shell outlives it
+  explicit FolderPane(Shell& shell);  // must outlive this object
 
-  // The parent of what is beside the folders.
+  // The parent for the window beside the folders.
   wxWindow* Parent() const;
-  void PlaceBeside(wxWindow& other);  // what is at its right, a child of Parent
-  void Show(bool show);               // keeps the width for the next time
+  void PlaceBeside(wxWindow& other);  // on the right; a child of Parent
+  void Show(bool show);               // remembers the width when hidden
   bool Shown() const;
-  // Takes down the width in RememberNavPaneHPosition.
+  // Saves the width in RememberNavPaneHPosition.
   void KeepWidth();
 
-  // Marks a folder, as deep as the tree has to open for that.
+  // Selects a folder, expanding the tree to it.
   void Follow(const std::string& folder);
-  // Favorites, volumes or folders may have come or gone.
+  // Call after changes of favorites or volumes.
   void UpdatePlaces();
-  void Reread();  // folders may have come or gone below those that are open
-  // Favorites go with their folder.
+  void Reread();  // call after changes of expanded folders
+  // Updates favorites after a folder was renamed.
   void FollowRename(const std::string& from, const std::string& to);
 
-  // That folder itself, not one below it.
+  // Whether this folder itself is a favorite.
   bool IsFavorite(const std::string& folder) const { return favorites_.Has(folder); }
-  // Puts the folder among the favorites, or takes it out.
+  // Adds a folder to the favorites, or removes it.
   void ToggleFavorite(const std::string& folder);
 
  private:

@@ -21,11 +21,11 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr size_t kFileMenu = 0, kRecentPlace = 1;  // in the menu bar, in its menu
+constexpr size_t kFileMenu = 0, kRecentPlace = 1;  // index in the menu bar; index in that menu
 constexpr int kMostRecent = 1000;
-constexpr int kRecentId = kFirstCommandId + 1000;  // of the menu; its items follow
+constexpr int kRecentId = kFirstCommandId + 1000;  // of the submenu; its items follow
 
-// With its key, as menus show it and take it.
+// The menu text with its key, in wxWidgets syntax.
 wxString MenuText(const Command& command) {
   const wxString keys =
       *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;

@@ -13,14 +13,14 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// The menu bar, the keys, and the context menu of files, from the rows of commands.cpp.
+// The menu bar, keys, and context menu of files, created from the rows of commands.cpp.
 class FrameMenus {
  public:
   explicit FrameMenus(Shell& shell);
 
-  // Shows the menu of the selected files at a place of `window`, with the programs that open them.
+  // Shows the context menu of the selected files at a position in `window`, including "Open with".
   void ShowContextMenu(wxWindow& window, const wxPoint& place);
-  // Reads the list of recent files again; it is a menu below Open.
+  // Reloads the submenu of recent files.
   void UpdateRecentFiles();
 
  private:
@@ -32,7 +32,7 @@ class FrameMenus {
 
   Shell& shell_;
   wxMenu* recent_ = nullptr;
-  std::vector<std::string> recentFiles_;  // in the order of its items
+  std::vector<std::string> recentFiles_;  // in menu order
 };
 
 }  // namespace fotomill::desktop

@@ -39,7 +39,7 @@ bool FrameSession::Keep(bool withTabs) {
   const wxFrame& frame = shell_.Window();
   Session session;
   session.maximized = frame.IsMaximized();
-  if (session.maximized) {  // the size to come back to is the last one before
+  if (session.maximized) {  // keep the last unmaximized size
     const Session last = LoadSession();
     session.width = last.width;
     session.height = last.height;
@@ -58,7 +58,7 @@ bool FrameSession::Keep(bool withTabs) {
   return SaveSession(session);
 }
 
-// The tabs under a name of their own, to which they are also written in the end.
+// Saves the tabs as a named set, which is also updated on exit.
 void FrameSession::SaveTabSet() {
   const auto name = AskForTabSetName(shell_.Window());
   if (!name) return;
@@ -74,7 +74,7 @@ void FrameSession::SaveTabSet() {
   LogEvent("tab-set", "saved " + *name);
 }
 
-// Other tabs come in the place of those that are open, which their own set keeps.
+// Replaces the open tabs, which are saved in their own set.
 void FrameSession::OpenTabSet() {
   const auto name = ChooseTabSet(shell_.Window());
   if (!name || *name == CurrentTabSet()) return;

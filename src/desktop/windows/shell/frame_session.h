@@ -6,28 +6,28 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// What comes back at the next start: the frame's size and its tabs. Tabs can also be kept as sets
-// with names of their own.
+// Saves and restores the frame's size and tabs. Tabs can also be saved as named
+// sets.
 class FrameSession {
  public:
   explicit FrameSession(Shell& shell) : shell_(shell) {}
 
-  // Gives the frame the size and place of the last run; its tabs are opened later.
+  // Restores the frame's size and position of the last run; its tabs are opened later.
   void RestorePlace();
-  // Opens the tabs of the last run, where they are to be remembered. False if there are none.
+  // Opens the tabs of the last run, if enabled. False if there are none.
   bool RestoreTabs();
-  // Writes the tabs, or none, and the frame's size to the set in use. False when that could not be
-  // done.
+  // Saves the tabs, or none, and the frame's size to the current set. False if that
+  // failed.
   [[nodiscard]] bool Keep(bool withTabs);
 
-  // Ask for a name; the tabs are kept under it from then on.
+  // Asks for a name; the tabs are saved under it from then on.
   void SaveTabSet();
-  // Asks for a set, whose tabs take the place of those that are open.
+  // Asks for a set and replaces the open tabs with it.
   void OpenTabSet();
 
  private:
   Shell& shell_;
-  Session lastTabs_;  // of the last run, as long as they are not open
+  Session lastTabs_;  // of the last run, until opened
 };
 
 }  // namespace fotomill::desktop

@@ -19,12 +19,12 @@ FunctionToolbar::FunctionToolbar(Shell& shell)
       bar_(shell.Window().CreateToolBar(wxTB_FLAT | wxTB_HORIZONTAL | wxTB_TEXT | wxTB_NODIVIDER,
                                         wxID_ANY, "Functions")) {
   Fill();
-  // The tips follow; whether the button can be used is left to the frame.
+  // Updates tooltips; the frame handles enabling.
   bar_->Bind(wxEVT_UPDATE_UI, [this](wxUpdateUIEvent& event) {
     if (IsCommandId(event.GetId())) ShowTip(CommandOfId(event.GetId()));
     event.Skip();
   });
-  // Symbols are in the color of texts.
+  // Symbols use the text color.
   shell_.Window().Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
     Fill();
     LogEvent("colors", "changed");
@@ -51,7 +51,7 @@ void FunctionToolbar::Choose() {
   if (AskForToolbar(shell_.Window())) Fill();
 }
 
-// The tip of a button that is gray says why.
+// The tooltip of a disabled button says why.
 void FunctionToolbar::ShowTip(const Command& command) {
   const wxString key =
       *command.accelerator == '\0' ? wxString() : wxString(" (") + command.accelerator + ")";

@@ -7,12 +7,12 @@ namespace fotomill::desktop {
 class Shell;
 struct Command;
 
-// The toolbar of the frame: buttons of commands, which and in which order as the user wants them.
+// The toolbar of the frame: command buttons, selected and ordered by the user.
 class FunctionToolbar {
  public:
   explicit FunctionToolbar(Shell& shell);
 
-  // Lets the user choose the buttons.
+  // Lets the user select the buttons.
   void Choose();
 
  private:

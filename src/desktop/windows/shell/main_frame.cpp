@@ -56,7 +56,7 @@ MainFrame::MainFrame()
   files_ = std::make_unique<FileActions>(*this);
   batches_ = std::make_unique<BatchRunner>(*this);
   Bind(wxEVT_CLOSE_WINDOW, &MainFrame::OnClose, this);
-  // A volume may have come or gone while others had the keyboard.
+  // Volumes may have changed while the window was inactive.
   Bind(wxEVT_ACTIVATE, [this](wxActivateEvent& event) {
     if (event.GetActive()) folders_->UpdatePlaces();
     event.Skip();
@@ -64,11 +64,11 @@ MainFrame::MainFrame()
 }
 
 MainFrame::~MainFrame() {
-  // Their threads call back into this window and those on it.
+  // Their threads call back into this window and its children.
   batches_.reset();
   files_.reset();
   thumbnails_.SetListener(nullptr);
-  // Windows on this one ask its parts to the end, so they go first.
+  // Child windows use its parts until the end, so destroy them first.
   DestroyChildren();
 }
 
@@ -95,7 +95,7 @@ void MainFrame::OpenPath(const std::string& path) {
   OpenStart(path, false);
 }
 
-// Into the menu of recent files; the number that another version gave the entry stays.
+// Adds a file to the list of recent files, keeping the number of an entry from another version.
 void MainFrame::NoteRecentFile(const std::string& path) {
   const std::vector<RecentFile> files = LoadRecentFiles();
   const auto known = std::ranges::find(files, path, &RecentFile::path);

@@ -12,15 +12,15 @@ namespace fotomill::desktop {
 
 class FrameMenus;
 
-// The program's window: makes its parts, and passes on to all of them what concerns them all.
+// The main window: creates its parts, and forwards global changes to them.
 class MainFrame : public wxFrame, public Shell {
  public:
   MainFrame();
   ~MainFrame() override;
 
-  // What the program was started with, a folder or a file: shows it. A file is shown at once and
-  // its folder listed afterwards; the tabs of the last time are opened with it when `restore`.
-  // Nothing: the tabs of the last time or a folder.
+  // Shows the folder or file the program was started with. A file is shown immediately, and its
+  // folder listed afterwards; with `restore`, also opens the tabs of the last session. Empty: the
+  // tabs of the last session, or a folder.
   void OpenStart(const std::string& path, bool restore);
 
   // Shell

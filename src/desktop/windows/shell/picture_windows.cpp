@@ -27,7 +27,7 @@ void PictureWindows::ViewBeforeFolder(const std::string& path, std::function<voi
   view.WhenShown([this, showFolder = std::move(showFolder), weak = wxWeakRef<ViewFrame>(&view)] {
     wantsList_ = weak.get();
     showFolder();
-    // The new tab has asked for the keyboard; it stays with the picture.
+    // The new tab has requested the focus; give it back to the picture.
     shell_.Window().CallAfter([weak] {
       if (weak == nullptr) return;
       weak->Raise();

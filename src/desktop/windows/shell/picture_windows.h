@@ -13,29 +13,29 @@ namespace fotomill::desktop {
 class BrowserPage;
 class Shell;
 
-// The view windows and those that compare pictures, as far as they are opened on the frame.
+// The view and compare windows opened from the frame.
 class PictureWindows {
  public:
   explicit PictureWindows(Shell& shell) : shell_(shell) {}
 
-  // Opens a view window on a file, with the files of `list` as its neighbors. It deletes itself
-  // when it is closed.
+  // Opens a view window for a file, with `list` as its neighbors. Deletes itself when
+  // closed.
   ViewFrame& View(const std::vector<std::string>& list, const std::string& file);
-  // Opens one on a file of the browser in front: among the selected files if there are several,
-  // else among all shown. A sound or video is opened with its own program instead.
+  // Opens a view window for a file of the current browser: among the selected files if there are
+  // several, else all shown ones. Sounds and videos are opened with their own program.
   void ViewFromBrowser(const std::string& path);
-  // Opens one on a file whose folder is not listed yet. `showFolder` is called once the picture is
-  // on the screen; the keyboard stays with the picture, whose neighbors come with the list of that
-  // folder.
+  // Opens a view window for a file whose folder is not listed yet. `showFolder` is called when the
+  // picture is on the screen; the picture keeps the focus, and gets its neighbors after that folder
+  // is listed.
   void ViewBeforeFolder(const std::string& path, std::function<void()> showFolder);
-  // The browser in front has changed; a window may have waited for its list.
+  // Call when the current browser has changed; a window may be waiting for its list.
   void OfferList(const BrowserPage& browser);
-  // Files were written: windows look again.
+  // Call after files were written, to reload changed pictures.
   void FilesChanged();
 
  private:
   Shell& shell_;
-  wxWeakRef<ViewFrame> wantsList_;  // shows a file whose folder is being listed
+  wxWeakRef<ViewFrame> wantsList_;  // waiting for the listing of its folder
 };
 
 }  // namespace fotomill::desktop

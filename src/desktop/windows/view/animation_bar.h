@@ -8,20 +8,20 @@
 
 namespace fotomill::desktop {
 
-// What is below an animation: a line that tells how far it is, with
-// AnimationViewModeProgressBar, and buttons, with AnimationViewModeToolbar. Hidden until there is
-// something to tell.
+// The bar below an animation: progress, with
+// AnimationViewModeProgressBar, and buttons, with
+// AnimationViewModeToolbar. Hidden if not needed.
 class AnimationBar : public wxPanel {
  public:
-  // What its buttons do.
+  // Actions of the buttons.
   struct Events {
     std::function<void()> toggle;  // play or pause
-    std::function<void(int frames)> step;  // back below 0
+    std::function<void(int frames)> step;  // negative: back
   };
 
   AnimationBar(wxWindow* parent, Events events);
 
-  // Shows what the settings want of it, if anything.
+  // Shows the parts enabled in the settings, if any.
   void Open();
   void Close() { Show(false); }
   void Report(bool playing, size_t frame, size_t count);  // `frame` from 0, of `count` known so far

@@ -8,10 +8,10 @@ namespace {
 
 constexpr char kProperty[] = "_ICC_PROFILE";  // "ICC Profiles in X", version 0.4
 constexpr size_t kLargestProfile = 8 << 20;
-constexpr int kByteFormat = 8;  // bits of a value
+constexpr int kByteFormat = 8;  // bits per value
 
-// wxWidgets has no words for properties of the root window; the few functions are those of the
-// libraries that it has loaded.
+// wxWidgets has no functions for properties of the root window; uses those of the libraries it has
+// loaded.
 class Gdk {
  public:
   Gdk() {

@@ -5,8 +5,8 @@
 
 namespace fotomill::desktop {
 
-// The color profile of the screen where the desktop says it: X11 desktops keep that of the first
-// monitor at the root window. Empty if there is none, and on other systems.
+// The color profile of the screen: X11 desktops store that of the first monitor at the root window.
+// Empty if there is none, and on other systems.
 std::vector<uint8_t> ReadScreenProfile();
 
 }  // namespace fotomill::desktop

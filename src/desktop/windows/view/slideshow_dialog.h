@@ -8,7 +8,7 @@
 
 namespace fotomill::desktop {
 
-// Asks how a slideshow is to go, beginning with `choices`; none when it was cancelled.
+// Asks for the settings of a slideshow, with initial `choices`; nullopt if canceled.
 std::optional<SlideshowChoices> AskForSlideshow(wxWindow& parent, const SlideshowChoices& choices);
 
 }  // namespace fotomill::desktop

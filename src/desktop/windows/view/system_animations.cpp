@@ -4,8 +4,8 @@
 
 namespace fotomill::desktop {
 
-// wxWidgets has no words for it; under GTK it is a property of the settings that wxWidgets itself
-// has loaded.
+// wxWidgets has no function for it; under GTK it is a property of GtkSettings, read with the
+// libraries wxWidgets has loaded.
 bool SystemAnimates() {
   platform::SharedLibrary gtk, objects;
   if (!gtk.LoadSystem("libgtk-3.so.0") || !objects.LoadSystem("libgobject-2.0.so.0")) return true;

@@ -2,7 +2,7 @@
 
 namespace fotomill::desktop {
 
-// Whether the user lets the system's programs move things about by themselves.
+// Whether animations are enabled in the user's system settings.
 bool SystemAnimates();
 
 }  // namespace fotomill::desktop

@@ -18,7 +18,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr uint64_t kFrameBytes = 256ull * 1024 * 1024;  // of frames that are kept
+constexpr uint64_t kFrameBytes = 256ull * 1024 * 1024;  // cache size
 
 bool IsAnimation(const ViewPicturePointer& picture) {
   return picture->picture != nullptr && picture->picture->pageCount > 1 &&
@@ -75,7 +75,7 @@ void ViewAnimation::End() {
   if (player_ == nullptr) return;
   shown_.reset();
   *alive_ = false;
-  // The frame being decoded is no longer needed.
+  // The current decode is no longer needed; let it finish in the background.
   (void)RunLoose([player = std::shared_ptr<AnimationPlayer>(std::move(player_))]() mutable { player.reset(); });
 }
 

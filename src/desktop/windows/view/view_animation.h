@@ -14,41 +14,41 @@ namespace fotomill::desktop {
 
 class AnimationPlayer;
 
-// The animation in a view window: its frames come onto the canvas at their time, with the bar below
-// it.
+// Plays the animation in a view window: shows frames on the canvas at their times, with the bar
+// below.
 class ViewAnimation {
  public:
-  // What its window does for it.
+  // Callbacks to the window.
   struct Events {
-    // another frame is on the canvas, or the animation plays or pauses
+    // another frame is shown, or the animation was started or paused
     std::function<void()> changed;
-    // a frame prepared for display; null if it cannot be
+    // returns a frame prepared for display; null on failure
     std::function<ViewPicturePointer(const ViewPicturePointer&)> dressed;
   };
 
-  // Canvas and bar must outlive it.
+  // `canvas` and `bar` must outlive this object.
   ViewAnimation(ViewCanvas& canvas, AnimationBar& bar, Events events);
   ~ViewAnimation();
   ViewAnimation(const ViewAnimation&) = delete;
   ViewAnimation& operator=(const ViewAnimation&) = delete;
 
-  // Begins with a picture that has come onto the canvas, if it is an animation; it plays at once
-  // unless the system's animations are off. The bar comes and goes with it.
+  // Call when a picture is shown: if it is an animation, plays it, unless animations are disabled
+  // in the system, and shows the bar.
   void Begin(const ViewPicturePointer& picture);
-  // Another picture is awaited.
+  // Call when another picture is requested.
   void End();
-  bool Active() const { return player_ != nullptr; }  // there is an animation on the canvas
-  bool Playing() const;                               // false where there is none, or it is paused
-  // In full screen there is the picture alone.
+  bool Active() const { return player_ != nullptr; }  // an animation is shown
+  bool Playing() const;                               // false if paused, or not an animation
+  // Hides the bar in full screen.
   void HideBar(bool hide);
   void Toggle();  // plays or pauses
-  void Step(int frames);  // pauses, and moves by that number of frames
-  void Resized();         // frames are to fit another size
-  // Frames are to be shown in another way.
+  void Step(int frames);  // pauses and steps by that many frames
+  void Resized();         // decodes frames for the new size
+  // Call after display settings have changed.
   void ShowAgain();
-  // "frame 3 of 12" with what else there is to tell; empty where no animation is.
+  // "frame 3 of 12", with further information; empty if there is no animation.
   std::string StatusText() const;
-  // Whether it plays, and has not been shown from beginning to end yet.
+  // Whether it is playing and has not been shown completely yet.
   bool MustFinish() const;
 
  private:
@@ -59,11 +59,11 @@ class ViewAnimation {
   AnimationBar& bar_;
   const Events events_;
   wxTimer timer_;
-  bool hasBar_ = false;  // the picture that came last is an animation
+  bool hasBar_ = false;  // the last picture is an animation
   bool hideBar_ = false;
   std::unique_ptr<AnimationPlayer> player_;
-  ViewPicturePointer shown_;                  // the player's frame, null before the first one
-  // whether the player's thread may still tell something
+  ViewPicturePointer shown_;  // the player's current frame, null before the first one
+  // false: ignore further callbacks of the player's thread
   std::shared_ptr<std::atomic<bool>> alive_;
 };
 

@@ -21,8 +21,8 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr int kPanSteps = 8;          // across the window
-constexpr double kPlainPixelsAt = 2;  // from this zoom on pixels are squares
+constexpr int kPanSteps = 8;          // per window size
+constexpr double kPlainPixelsAt = 2;  // from this zoom on, pixels are drawn as squares
 constexpr int kSquareSide = 8;        // of the checkerboard
 constexpr Color kLightSquares[] = {0xffffff, 0xcccccc};
 constexpr Color kDarkSquares[] = {0x666666, 0x444444};
@@ -138,8 +138,7 @@ void ViewCanvas::UserPanned() {
   if (events_.placed) events_.placed();
 }
 
-// The picture is drawn at once from what there is; a smaller scale then gets pixels that are made
-// for it.
+// Draws what is available immediately; if reduced, then requests pixels scaled for this size.
 void ViewCanvas::TransformChanged() {
   if (standIn_.Empty() && Showable() && transform_.Scale() < 1) {
     const PackedImage& source = BestSource().image;
@@ -171,7 +170,7 @@ ViewSource ViewCanvas::BestSource() const {
 
 // --- painting ---
 
-// Tells the log of paintings that took longer than a frame of the screen.
+// Logs paint events that take longer than a screen frame.
 void ViewCanvas::OnPaint(wxPaintEvent&) {
   constexpr double kFrame = 1.0 / 60;
   const double start = platform::MonotonicSeconds();

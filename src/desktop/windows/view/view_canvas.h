@@ -13,57 +13,57 @@
 
 namespace fotomill::desktop {
 
-// Shows one picture: zoomed by keys, wheel and double click, moved by dragging, scaled on a thread
-// of its own. Which picture that is, its window decides.
+// Shows a picture: zoomed with keys, wheel and double click, moved by dragging, scaled on a
+// background thread. The window chooses the picture.
 class ViewCanvas : public wxWindow {
  public:
-  // What it tells its window. Keys, right clicks and movements of the pointer are events of the
+  // Callbacks to the window. Keys, right clicks and pointer movements are events of the
   // canvas.
   struct Events {
-    std::function<void()> resized;           // pictures are to fit another size
+    std::function<void()> resized;           // pictures need another size
     std::function<void()> changed;           // another picture or zoom
-    std::function<void()> painted;           // a picture, not what stands in for it
+    std::function<void()> painted;           // a picture, not its stand-in
     std::function<void()> placed = nullptr;  // zoomed or moved by the user
   };
 
-  // The events are called on the window's thread, as long as the canvas is there.
+  // The callbacks are called on the window's thread while the canvas exists.
   ViewCanvas(wxWindow* parent, Events events);
   ~ViewCanvas() override;
 
-  // What is shown from here on; of a picture that could not be loaded, why.
+  // Shows a picture, or the reason why it could not be loaded.
   void Show(ViewPicturePointer picture);
-  // Another frame of an animation, in the same place. While it plays it is drawn from what there
-  // is, quickly rather than well.
+  // Shows another frame of an animation at the same position. While playing, quality is traded for
+  // speed.
   void ShowFrame(ViewPicturePointer frame, bool plays);
-  // Makes pixels for the zoom of the frame at which the animation was paused.
+  // Scales the frame at which the animation was paused in full quality.
   void Sharpen() { TransformChanged(); }
-  // An image that stands in for a picture of `width` by `height` until that comes.
+  // Shows an image as a stand-in for a picture of `width` by `height` until that is loaded.
   void ShowStandIn(PackedImage image, int32_t width, int32_t height);
-  const ViewPicturePointer& Picture() const { return picture_; }  // null before the first
-  // The next picture is another one: it is shown as pictures open, unless ViewModeKeepZoom keeps
-  // zoom and place.
+  const ViewPicturePointer& Picture() const { return picture_; }  // null before the first one
+  // The next picture is a different one: resets zoom and position, unless ViewModeKeepZoom is
+  // on.
   void StartAfresh();
-  // Lines on top of the picture; empty for none.
+  // Text lines on top of the picture; may be empty.
   void SetOverlay(const std::vector<std::string>& lines);
 
-  // Zoom by a step, to one pixel a pixel, or by a mode, about the middle of the window.
+  // Zooms around the center of the window by a step, to actual size, or to a mode.
   void ZoomIn() { ZoomBy(ViewTransform::kStep); }
   void ZoomOut() { ZoomBy(1 / ViewTransform::kStep); }
-  void ZoomActual();  // one pixel of the screen a pixel
-  void SetZoom(ZoomMode mode);  // also sets how it follows the window
-  // Pixels of the screen a pixel of the picture, and whether more of it is outside the window.
+  void ZoomActual();  // one screen pixel per pixel
+  void SetZoom(ZoomMode mode);  // also sets how the zoom follows the window
+  // Screen pixels per pixel; whether part of the picture is outside the window.
   double Zoom() const { return transform_.Scale(); }
-  bool CanPan() const { return transform_.CanPan(); }  // more of it is outside
-  // By eighths of the window.
+  bool CanPan() const { return transform_.CanPan(); }  // part of it is outside
+  // In eighths of the window.
   void PanBy(int stepsAcross, int stepsDown);
-  // Arrows move a picture that is larger than the window. False for other keys, and where all of it
-  // is seen.
+  // Arrow keys move a picture larger than the window. False for other keys, or if all of it is
+  // visible.
   bool PanByKey(int key);
-  // Zoom and place, to be taken from one canvas to others.
+  // Zoom and position, to copy between canvases.
   ViewPlace Place() const { return transform_.Place(); }
   void SetPlace(const ViewPlace& place);  // does not call `placed`
 
-  // Pixels of the screen.
+  // In screen pixels.
   wxSize DeviceSize() const { return GetClientSize() * GetContentScaleFactor(); }
 
  private:
@@ -89,7 +89,7 @@ class ViewCanvas : public wxWindow {
 
   const Events events_;
   ViewPicturePointer picture_;
-  PackedImage standIn_;  // on the screen until the picture comes; else empty
+  PackedImage standIn_;  // shown until the picture is loaded; else empty
   std::unique_ptr<ViewScaler::Scaled> scaled_;
   ViewTransform transform_;
   wxString overlay_;

@@ -6,7 +6,7 @@ namespace fotomill::desktop {
 
 class ViewFrame;
 
-// What a view window can do.
+// The commands of a view window.
 std::span<const KeyCommand<ViewFrame>> ViewCommands();
 
 }  // namespace fotomill::desktop

@@ -33,7 +33,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr uint64_t kAheadBytes = 768ull * 1024 * 1024;  // of decoded pictures
+constexpr uint64_t kAheadBytes = 768ull * 1024 * 1024;  // for decoded pictures
 constexpr int kPointerMs = 2000;
 
 }  // namespace
@@ -97,7 +97,7 @@ ViewFrame::~ViewFrame() {
   if (shown_) shell_.Window().CallAfter(shown_);
 }
 
-// --- which picture ---
+// --- choosing pictures ---
 
 ViewRequest ViewFrame::RequestOf(size_t place) const {
   const wxSize size = canvas_->DeviceSize();
@@ -152,7 +152,7 @@ void ViewFrame::ShowPlace() {
   ViewChanged();
 }
 
-// Whether the picture was there already, and is shown.
+// Whether the picture was already loaded, and is shown.
 bool ViewFrame::AskForPicture() {
   animation_->End();
   loadedPercent_ = 0;
@@ -168,23 +168,23 @@ bool ViewFrame::AskForPicture() {
   return ready != nullptr;
 }
 
-// Until the picture is there its thumbnail stands in, where the browser has one.
+// Shows the browser's thumbnail, if any, until the picture is loaded.
 void ViewFrame::ShowStandIn() {
   const ThumbnailPointer thumbnail = shell_.Thumbnails().FindAny(list_[place_]);
   PackedImage image;
   if (thumbnail == nullptr || thumbnail->pixels.Empty() ||
       ToPacked(thumbnail->pixels, image) != Status::Ok)
     return;
-  constexpr int32_t kUnknown = 16;  // times the thumbnail, where its picture's size is not known
+  constexpr int32_t kUnknown = 16;  // assumed scale of the picture, if its size is unknown
   const bool known = thumbnail->width > 0;
   int32_t width = known ? thumbnail->width : image.Width() * kUnknown;
   int32_t height = known ? thumbnail->height : image.Height() * kUnknown;
-  // it was turned upright
+  // the thumbnail is upright
   if ((width > height) != (image.Width() > image.Height())) std::swap(width, height);
   canvas_->ShowStandIn(std::move(image), width, height);
 }
 
-// The picture itself, then what the slideshow goes to, then two each way.
+// Requests this picture, then the slideshow's next one, then two in each direction.
 void ViewFrame::WantPictures() {
   if (loader_ == nullptr || canvas_ == nullptr) return;
   std::vector<ViewRequest> requests;
@@ -230,7 +230,7 @@ void ViewFrame::ShowPicture(ViewPicturePointer picture) {
 }
 
 void ViewFrame::WhenShown(std::function<void()> shown) {
-  // a small one may have come already
+  // small pictures may be loaded already
   if (IsCurrent(loaded_)) return shell_.Window().CallAfter(shown);
   shown_ = std::move(shown);
 }
@@ -247,7 +247,7 @@ bool ViewFrame::UseList(const std::vector<std::string>& list) {
 }
 
 void ViewFrame::Resized() {
-  if (animation_ == nullptr) return;  // still being made
+  if (animation_ == nullptr) return;  // during construction
   WantPictures();
   animation_->Resized();
 }
@@ -259,7 +259,7 @@ void ViewFrame::ShowTurned() {
   canvas_->Show(std::move(turned));
 }
 
-// A picture, or a frame of it, prepared for display; null if memory runs out.
+// A picture or frame prepared for display; null if out of memory.
 ViewPicturePointer ViewFrame::Turned(const ViewPicturePointer& picture) const {
   const bool turns = turn_ != Orientation::Upright && picture->picture != nullptr;
   return turns ? TurnedView(*picture, turn_) : picture;
@@ -271,8 +271,7 @@ bool ViewFrame::IsCurrent(const ViewPicturePointer& picture) const {
 
 // --- showing ---
 
-// Each picture and zoom once, with the time since the picture was asked for; each frame of an
-// animation.
+// Logs each picture and zoom once, with the time since the request; and each frame of an animation.
 void ViewFrame::LogPaint() {
   if (animation_->Active()) LogEvent("view-frame", animation_->StatusText());
   const std::string shown =
@@ -305,7 +304,7 @@ std::string ViewFrame::StatusLine() const {
   return line;
 }
 
-// Name, what the status bar tells, what the camera wrote.
+// File name, status bar text, camera facts.
 std::vector<std::string> ViewFrame::OverlayLines() const {
   std::vector<std::string> lines = {std::string(platform::FileNameOf(list_[place_])), StatusLine()};
   const ViewPicturePointer& shown = canvas_->Picture();
@@ -314,7 +313,7 @@ std::vector<std::string> ViewFrame::OverlayLines() const {
 }
 
 void ViewFrame::ViewChanged() {
-  if (canvas_ == nullptr || GetStatusBar() == nullptr) return;  // still being made
+  if (canvas_ == nullptr || GetStatusBar() == nullptr) return;  // during construction
   const std::string line = StatusLine();
   const wxString name = Shown(platform::FileNameOf(list_[place_]));
   const wxString title = turn_ == Orientation::Upright
@@ -322,7 +321,7 @@ void ViewFrame::ViewChanged() {
                              : Label("%1 (rotated, not saved) - View", name);
   if (title != GetTitle()) SetTitle(title);
   SetStatusText(Shown(line));
-  // A number that changes many times a second is nothing to listen to.
+  // Do not announce a number that changes many times per second.
   if (!animation_->Playing()) ReportToScreenReader(*canvas_, name, Shown(line));
   canvas_->SetOverlay(overlay_ ? OverlayLines() : std::vector<std::string>());
 }
@@ -377,7 +376,7 @@ void ViewFrame::DeleteFile() {
   const std::string path = list_[place_];
   if (!shell_.Files().TrashFromView(this, path)) return;
   loader_->Forget(path);
-  // A slideshow may have gone on while the user was asked.
+  // A slideshow may have advanced while the user was asked.
   const auto gone = std::ranges::find(list_, path);
   if (gone == list_.end()) return;
   const auto place = static_cast<size_t>(gone - list_.begin());
@@ -464,7 +463,7 @@ void ViewFrame::OnKey(wxKeyEvent& event) {
   if (event.ShiftDown() && key == 'S') return ChooseSlideshow();
   if (event.AltDown() && key == WXK_RETURN) return ShowInfoWindow();
   if (event.AltDown()) return event.Skip();
-  // Some letters with Ctrl have the numbers of other keys.
+  // Some letters with Ctrl have the same codes as other keys.
   constexpr int kLettersWithCtrl[] = {'C', 'S', 'Y', 'Z'};
   const bool letter = std::ranges::find(kLettersWithCtrl, key) != std::end(kLettersWithCtrl);
   const int typed = !event.ControlDown() ? key : letter ? key - 'A' + WXK_CONTROL_A : 0;

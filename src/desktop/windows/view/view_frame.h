@@ -18,42 +18,42 @@ class AnimationBar;
 class Shell;
 class ViewAnimation;
 
-// A view window: one picture at a time, with its neighbors of the list that it was opened from
-// decoded ahead.
+// A view window: shows one picture at a time, and decodes its neighbors in the list
+// ahead.
 class ViewFrame : public wxFrame {
  public:
-  // Opens on `file`; `list` has its neighbors, and the file itself.
+  // Opens `file`; `list` contains it and its neighbors.
   ViewFrame(Shell& shell, const std::vector<std::string>& list, const std::string& file);
   ~ViewFrame() override;
 
-  // Commands, by keys and menu.
+  // Commands of keys and menu.
   void Step(int files);
-  void GoTo(size_t place);  // in the list, from 0
+  void GoTo(size_t place);  // index in the list, from 0
   void StepPage(int pages);  // or frames of an animation
-  void StepFrame(int frames);  // pauses the animation; without one nothing happens
-  void PlayOrNext();  // plays or pauses an animation; without one, the next picture
+  void StepFrame(int frames);  // pauses the animation; no-op without one
+  void PlayOrNext();  // plays or pauses an animation; otherwise next picture
   void ToggleFullScreen();
-  void ToggleSlideshow();  // begins as chosen last, with the picture shown
-  void ChooseSlideshow();  // asks for seconds and order first
-  void ToggleOverlay();    // file and camera facts on the picture
-  void SettingSwitched();  // one that says how pictures look or stay
-  void Leave();            // full screen first, then the window
-  void CopyPicture();  // to the clipboard; alpha on the background of view windows
-  void DeleteFile();  // to the trash; the next one is shown
-  void ShowInfoWindow();        // of the file shown
-  void Turn(Orientation turn);  // the view; nothing is written
-  void SaveTurned();            // the file, as it is seen
-  void Undo();                  // the view's turn, else what was done to files
-  void Redo();  // of what was done to files
-  // Files were written: a picture whose file is another one now is loaded again.
+  void ToggleSlideshow();  // starts with the last settings, at the current picture
+  void ChooseSlideshow();  // asks for duration and order first
+  void ToggleOverlay();    // file and camera facts on top of the picture
+  void SettingSwitched();  // after a change of display settings
+  void Leave();            // leaves full screen, or else closes the window
+  void CopyPicture();  // to the clipboard, on the view background
+  void DeleteFile();  // moves it to the trash and shows the next one
+  void ShowInfoWindow();        // for the current file
+  void Turn(Orientation turn);  // turns the view only; nothing is written
+  void SaveTurned();            // saves the file as displayed
+  void Undo();                  // undoes turning the view, or else the last file operation
+  void Redo();  // of file operations
+  // Call after files were written: reloads the picture if its file has changed.
   void FilesChanged();
-  // Calls once when the first picture is there, or the window goes without.
+  // Calls `shown` once, when the first picture is shown or the window is closed.
   void WhenShown(std::function<void()> shown);
-  // The files that neighbor the picture from here on. False when it is not among them; they are as
-  // before then.
+  // Replaces the list of neighbors. False, with no change, if it does not contain the current
+  // file.
   bool UseList(const std::vector<std::string>& list);
-  size_t LastPlace() const { return list_.size() - 1; }  // in the list, from 0
-  ViewCanvas& Canvas() { return *canvas_; }              // for zoom and movement
+  size_t LastPlace() const { return list_.size() - 1; }  // index in the list, from 0
+  ViewCanvas& Canvas() { return *canvas_; }              // for zooming and moving
 
  private:
   void ShowPlace();
@@ -81,21 +81,21 @@ class ViewFrame : public wxFrame {
   std::vector<std::string> list_;
   size_t place_ = 0;
   int32_t page_ = 0;
-  Orientation turn_ = Orientation::Upright;  // how the view is turned against the file
-  ViewPicturePointer loaded_;                // as the file has it
+  Orientation turn_ = Orientation::Upright;  // of the view relative to the file
+  ViewPicturePointer loaded_;                // unturned, as in the file
   bool saving_ = false;
-  std::string note_;    // how the file was turned, where that is not as usual
-  double keyTime_ = 0;  // when the picture that is awaited was asked for
+  std::string note_;    // remark about turning the file
+  double keyTime_ = 0;  // time of the request for the pending picture
   bool overlay_ = false;
   std::function<void()> shown_;
-  std::string painted_;  // what the log was told of
+  std::string painted_;  // last logged text
   wxTimer pointerTimer_;
   ViewCanvas* canvas_ = nullptr;
   AnimationBar* bar_ = nullptr;
   std::unique_ptr<ViewAnimation> animation_;
   ViewSlideshow slideshow_;
   std::unique_ptr<ViewLoader> loader_;
-  int loadedPercent_ = 0;  // of the picture that is being loaded, if that is shown
+  int loadedPercent_ = 0;  // loading progress, if shown
 };
 
 }  // namespace fotomill::desktop

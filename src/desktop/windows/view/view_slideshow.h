@@ -10,29 +10,29 @@
 
 namespace fotomill::desktop {
 
-// The slideshow of a view window: when the next picture comes, and which.
+// The slideshow of a view window: timing and order.
 class ViewSlideshow {
  public:
-  // What it asks and tells its window.
+  // Callbacks to the window.
   struct Events {
-    std::function<bool()> busy;              // the picture is not to go yet
-    std::function<void(size_t place)> show;  // a place of the list
+    std::function<bool()> busy;              // do not leave the picture yet
+    std::function<void(size_t place)> show;  // index in the list
   };
 
   explicit ViewSlideshow(Events events);
 
-  // Begins at `place` of a list of `count`, as was chosen last. ShownAt is to follow when that
-  // picture is on the screen.
+  // Starts at `place` in a list of `count`, with the last settings. Call ShownAt when that picture
+  // is on the screen.
   void Start(size_t place, size_t count);
-  void Stop();  // the picture shown stays
+  void Stop();  // keeps the current picture
   bool Running() const {
     return order_.has_value();
-  }  // between Start and Stop, or the last picture
-  // This place is on the screen, from now on for its seconds.
+  }  // from Start until Stop or the last picture
+  // This place is now on the screen; starts its time.
   void ShownAt(size_t place, size_t count);
-  // The position to decode ahead in addition to the neighbors.
+  // The place to decode ahead in addition to the neighbors.
   std::optional<size_t> Upcoming() const { return Running() ? order_->Upcoming() : std::nullopt; }
-  // Asks for other choices and keeps them for the next time. False when that was cancelled.
+  // Asks for settings and saves them. False if canceled.
   bool Choose(wxWindow& parent);
 
  private:
@@ -40,7 +40,7 @@ class ViewSlideshow {
 
   const Events events_;
   SlideshowChoices choices_;
-  std::optional<SlideshowChoices> unkept_;  // that could not be written
+  std::optional<SlideshowChoices> unkept_;  // could not be written
   std::optional<Slideshow> order_;
   wxTimer timer_;
   size_t place_ = 0, count_ = 0;

@@ -9,13 +9,13 @@
 
 namespace fotomill::desktop {
 
-// Work that a window has done apart. Goes with the window: what is in work is asked to stop and
-// waited for.
+// Background work for a window. When destroyed, stops running work and waits for
+// it.
 class Background {
  public:
-  // Runs `work` apart, and then `done` on the window's thread, unless it was stopped: with
-  // MemoryAllocationError where the work ran out of memory, Ok otherwise. Work that goes on is
-  // stopped first.
+  // Runs `work` in the background, then `done` on the window's thread, unless stopped: with
+  // MemoryAllocationError if the work ran out of memory, otherwise Ok. Stops running work
+  // first.
   void Start(wxEvtHandler& window, std::function<void(const StopToken& stop)> work,
              std::function<void(Status)> done) {
     Stop();
@@ -34,14 +34,14 @@ class Background {
           });
         });
   }
-  // Asks the work to stop and waits for it; `done` is not called any more.
+  // Stops the work and waits; `done` is not called.
   void Stop() {
     wanted_.reset();
     task_.StopAndWait();
   }
 
  private:
-  std::shared_ptr<bool> wanted_;  // belongs to the window's thread
+  std::shared_ptr<bool> wanted_;  // window's thread only
   BackgroundTask task_;
 };
 

@@ -12,10 +12,10 @@ namespace {
 
 struct SymbolShape {
   std::string_view name;
-  const char* shape;  // drawn in a square of 16 by 16; COLOR is replaced
+  const char* shape;  // in a 16 by 16 square; COLOR is replaced
 };
 
-// Line drawings of one weight.
+// Line drawings with a common stroke width.
 constexpr SymbolShape kSymbols[] = {
     {"back", "<path d='M10 3 L5 8 L10 13'/>"},
     {"forward", "<path d='M6 3 L11 8 L6 13'/>"},

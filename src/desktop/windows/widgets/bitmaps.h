@@ -9,12 +9,12 @@
 
 namespace fotomill::desktop {
 
-// Pixels as a bitmap for drawing; `scale` device pixels make one of the window's. Not ok for an
-// empty image.
+// Converts pixels to a bitmap; `scale` is device pixels per window pixel. Not ok for an empty
+// image.
 wxBitmap BitmapOf(const RgbImage& image, double scale = 1);
 
-// A symbol by its name in the color of the system's texts, 16 by 16 and any multiple. An unknown
-// name gives an empty one.
+// A symbol by name, in the system's text color, 16 by 16 or any multiple. Empty if
+// unknown.
 wxBitmapBundle Symbol(std::string_view name, int side = 16);
 
 }  // namespace fotomill::desktop

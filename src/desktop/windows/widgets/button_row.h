@@ -10,20 +10,20 @@ class wxButton;
 
 namespace fotomill::desktop {
 
-// A button of the row; wxID_CLOSE is the one apart.
+// A button; wxID_CLOSE is set apart.
 struct RowButton {
   wxWindowID id;
   const char* label;  // in English
-  std::function<void()> run;  // when the button is pressed
+  std::function<void()> run;  // called when pressed
 };
 
-// The buttons at the foot of a dialog, at the right: `answer`, which becomes its default, behind
-// Cancel.
+// The bottom row of a dialog: Cancel and `answer`, which becomes the default, on the
+// right.
 wxSizer* BuildAnswerRow(wxWindow& dialog, wxButton& answer);
 
-// The buttons at the foot of a frame, on its panel, the one that closes it apart at the right. A
-// button runs when it is pressed and when the frame's accelerators send its number, as long as it
-// is enabled.
+// The bottom row of a frame, on its panel, with the close button set apart on the
+// right. A button also runs when the frame's accelerators send its ID, if it is
+// enabled.
 wxSizer* BuildButtonRow(wxFrame& frame, wxWindow& panel, std::span<const RowButton> rows);
 
 }  // namespace fotomill::desktop

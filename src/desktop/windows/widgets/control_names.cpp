@@ -31,8 +31,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-// Whether a window has a name of its own, not the one that wxWidgets gives to every one of its
-// kind.
+// Whether a window has an individual name, not the default of its wxWidgets class.
 bool HasOwnName(const wxWindow& window) {
   static const wxString kNamesOfKinds[] = {
       wxEmptyString,         wxPanelNameStr,    wxControlNameStr,   wxTextCtrlNameStr,
@@ -55,19 +54,19 @@ wxString PlainText(const wxString& label) {
   return text.Strip(wxString::both);
 }
 
-// The text that was made just before a control, as labels are.
+// The text of a label created just before a control.
 wxString TextBefore(const wxWindow& window) {
   const auto* const text = dynamic_cast<wxStaticText*>(window.GetPrevSibling());
   return text == nullptr ? wxString() : PlainText(text->GetLabel());
 }
 
-// Whether a control is made of windows that no one else sees.
+// Whether a control consists of internal child windows.
 bool IsComposite(wxWindow* window) {
   return dynamic_cast<wxListCtrl*>(window) != nullptr ||
          dynamic_cast<wxTreeListCtrl*>(window) != nullptr;
 }
 
-// Empty where the window's own texts say enough, or nothing is known.
+// Empty if the window's own text is sufficient, or if there is nothing better.
 wxString NameOf(wxWindow& window) {
   if (HasOwnName(window)) return window.GetName();
   if (IsComposite(window.GetParent())) return NameOf(*window.GetParent());
@@ -77,7 +76,7 @@ wxString NameOf(wxWindow& window) {
 }
 
 void NameControl(wxWindow& window) {
-  // The buttons of toolbars have names already.
+  // Toolbar buttons already have names.
   if (window.IsTopLevel() || dynamic_cast<wxStaticText*>(&window) != nullptr ||
       dynamic_cast<wxToolBar*>(&window) != nullptr)
     return;
@@ -85,8 +84,7 @@ void NameControl(wxWindow& window) {
   if (!name.empty()) ReportToScreenReader(window, name);
 }
 
-// A window that has just come may still be being made, so that its name comes later: it is named
-// when nothing else is to do.
+// New windows may get their name during construction, so they are named when idle.
 class Newcomers : public wxEventFilter {
  public:
   Newcomers() { wxEvtHandler::AddFilter(this); }

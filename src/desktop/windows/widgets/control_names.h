@@ -2,9 +2,9 @@
 
 namespace fotomill::desktop {
 
-// From now on every control that comes onto the screen is told to screen readers by a name: that of
-// its window, where it was given one; its own text; the text that is before it; its tip. To be
-// called once.
+// From now on, gives every control shown an accessible name: the
+// window's name, its own text, the text before it, or its tooltip. Call
+// once.
 void NameControlsAsTheyCome();
 
 }  // namespace fotomill::desktop

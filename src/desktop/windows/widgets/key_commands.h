@@ -10,21 +10,21 @@
 
 namespace fotomill::desktop {
 
-// One thing that a window without a menu bar can do, by keys and by the menu of the right mouse
-// button, whose order is that of the rows; a row without text is a line there.
+// A command of a window without menu bar, by keys and in its context menu, which is in row order; a
+// row without text is a separator.
 template <typename Window>
 struct KeyCommand {
   static constexpr int kMostKeys = 3;
 
   const char* text;
-  const char* shownKey;  // beside the text
-  int keys[kMostKeys];   // WXK_* or characters; 0 ends them
+  const char* shownKey;  // displayed beside the text
+  int keys[kMostKeys];   // WXK_* or characters; ends with 0
   void (*run)(Window& window);
-  // whether its menu item has a mark; null for one that never has
+  // whether the menu item is checked; null: not checkable
   bool (*checked)(const Window& window) = nullptr;
 };
 
-// The command of a key, null if none.
+// Finds the command of a key; null if there is none.
 template <typename Window>
 const KeyCommand<Window>* CommandOfKey(std::span<const KeyCommand<Window>> commands, int key) {
   const auto has = [key](const KeyCommand<Window>& command) {
@@ -34,7 +34,7 @@ const KeyCommand<Window>* CommandOfKey(std::span<const KeyCommand<Window>> comma
   return found == commands.end() ? nullptr : &*found;
 }
 
-// Shows the commands of `window` as a menu at a place of `owner`, which may be a part of it.
+// Shows the commands of `window` as a menu at a position in `owner`, which may be a child of it.
 template <typename Window>
 void ShowCommandMenu(std::span<const KeyCommand<Window>> commands, Window& window, wxWindow& owner,
                      const wxPoint& place) {
@@ -45,7 +45,7 @@ void ShowCommandMenu(std::span<const KeyCommand<Window>> commands, Window& windo
       menu.AppendSeparator();
       continue;
     }
-    // The key is shown beside the text only: keys are the window's own.
+    // Keys are only displayed, as the window handles them.
     const wxString text = Label(command.text) + "    " + command.shownKey;
     if (command.checked == nullptr) {
       menu.Append(++id, text);
@@ -58,7 +58,7 @@ void ShowCommandMenu(std::span<const KeyCommand<Window>> commands, Window& windo
   owner.PopupMenu(&menu, place);
 }
 
-// Members as commands: of the window itself, and of the canvas in it that has the focus.
+// Converts member functions to commands: of the window, or of its focused canvas.
 template <auto action, typename Window>
 void Of(Window& window) {
   (window.*action)();
@@ -72,7 +72,7 @@ void Zoom(Window& window) {
   window.Canvas().SetZoom(mode);
 }
 
-// A setting that is on or off, as a command of windows that follow it.
+// A command that toggles a setting.
 template <typename Window, int32_t Settings::*setting>
 void SwitchSetting(Window& window) {
   settings.*setting = settings.*setting == 0 ? 1 : 0;

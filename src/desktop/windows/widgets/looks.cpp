@@ -27,7 +27,7 @@ wxColour FaultColor() {
 }
 
 double TextScale(const wxWindow& window) {
-  constexpr double kUsualHeight = 17;  // of a line, device-independent pixels
+  constexpr double kUsualHeight = 17;  // line height in device-independent pixels
   return std::max(window.GetCharHeight() / (kUsualHeight * window.FromDIP(1)), 1.0);
 }
 

@@ -7,19 +7,19 @@
 
 namespace fotomill::desktop {
 
-// The colors of own drawings, from those of the system as they are now.
+// Colors for owner-drawn windows, from the current system colors.
 ListPalette CurrentPalette();
-// Of texts about what went wrong, in a window among the system's controls.
+// For error messages among system controls.
 wxColour FaultColor();
-// Of a bar that stands out of its window a little.
+// For a bar that is slightly set off from its window.
 wxColour BarColor();
 
-// How much larger texts are than usual, at least 1.
+// Scale of texts relative to the normal size, at least 1.
 double TextScale(const wxWindow& window);
-// A width for text, given for texts of the usual size: wider where the user wants larger ones.
+// Scales a width given for the normal text size.
 int TextWidth(const wxWindow& window, int width);
 
-// The same color for the toolkit.
+// Converts to the toolkit's color type.
 inline wxColour ToWx(Shade shade) { return {shade.red, shade.green, shade.blue}; }
 
 }  // namespace fotomill::desktop

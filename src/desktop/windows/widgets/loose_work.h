@@ -10,11 +10,11 @@
 
 namespace fotomill::desktop {
 
-// Work that no one waits for, since a folder may hang: it is asked to stop, and what it reports
-// when nobody is interested any more is dropped. Goes with the window that wants its results.
+// Background work that is never waited for, as the file system may hang: it is asked to stop, and
+// its later reports are ignored. Owned by the window that needs the results.
 class LooseWork {
  public:
-  // Has something done on the window's thread, unless the work was stopped meanwhile.
+  // Runs an action on the window's thread, unless the work was stopped meanwhile.
   using Report = std::function<void(std::function<void()> action)>;
 
   LooseWork() = default;
@@ -22,8 +22,8 @@ class LooseWork {
   LooseWork& operator=(const LooseWork&) = delete;
   ~LooseWork() { Stop(); }
 
-  // Runs `work` apart; where it runs out of memory, `failed` on the window's thread. Work that goes
-  // on is stopped first.
+  // Runs `work` in the background; if memory runs out, `failed` on the window's thread. Stops
+  // running work first.
   void Start(
       std::function<void(const StopToken& stop, const Report& report)> work,
       std::function<void()> failed = [] {}) {
@@ -40,12 +40,12 @@ class LooseWork {
     });
     if (!begun) report(std::move(failed));
   }
-  // Does not wait; what the work reports from here on is dropped.
+  // Does not wait; later reports are ignored.
   void Stop() {
     if (source_) source_->Stop();
     source_.reset();
   }
-  // Whether work was started that nobody stopped; who is told of its end stops it then.
+  // Whether work was started and not stopped; call Stop when it reports its end.
   bool Started() const { return source_ != nullptr; }
 
  private:

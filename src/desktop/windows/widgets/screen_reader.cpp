@@ -9,9 +9,8 @@ namespace fotomill::desktop {
 
 namespace {
 
-// wxAccessible speaks on Windows only. Under GTK screen readers read the accessible objects behind
-// the widgets, which wxWidgets has no words for; the few functions that it takes are those of the
-// libraries that wxWidgets itself has loaded.
+// wxAccessible only works on Windows. Under GTK, screen readers use the accessible objects of the
+// widgets, for which wxWidgets has no functions; uses those of the libraries it has loaded.
 class Gtk {
  public:
   static const Gtk& The() {
@@ -26,7 +25,7 @@ class Gtk {
     setName_(object, name);
     if (*description != '\0') setDescription_(object, description);
   }
-  // Every part of a widget, hidden ones too.
+  // All children of a widget, including internal ones.
   std::vector<void*> PartsOf(void* widget) const {
     std::vector<void*> parts;
     if (isA_(widget, container_()) != 0) {

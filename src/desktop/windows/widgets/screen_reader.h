@@ -4,10 +4,10 @@
 
 namespace fotomill::desktop {
 
-// What screen readers hear of a window, beside what its own texts tell them: `name` says what it
-// is, `description` more about it; `name` becomes the window's own name as well. Replaces what was
-// told before; an empty description leaves that as it was. The name holds for the parts that a
-// control is made of as well, but not for the windows in it.
+// Sets what screen readers announce for a window besides its own text: `name` identifies it and
+// also becomes the window's name, `description` adds details. Replaces earlier values; an empty
+// description keeps the old one. The name also applies to a control's internal parts, but not to
+// child windows.
 void ReportToScreenReader(wxWindow& window, const wxString& name, const wxString& description = {});
 
 }  // namespace fotomill::desktop

@@ -11,7 +11,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-double scales[] = {1, 1, 1};  // in the order of TextSize
+double scales[] = {1, 1, 1};  // indexed by TextSize
 
 double ScaleOf(int32_t size, int32_t usual) {
   return std::clamp(static_cast<double>(size) / usual, 0.5, 4.0);

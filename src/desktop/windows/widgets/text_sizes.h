@@ -10,17 +10,17 @@ struct EarlySettings;
 
 namespace fotomill::desktop {
 
-// Texts whose size a key sets.
+// Texts whose size is a setting.
 enum class TextSize {
   Normal,         // NormalTextFontSize: lists and reports
   Small,          // SmallTextFontSize: notes
   ThumbnailName,  // NormalThumbFontSize: names below thumbnails
 };
 
-// Takes the sizes over, once at startup. A key at its default stands for the system's size, other
-// values for proportionally larger or smaller texts.
+// Sets the sizes, once at startup. The default value of a key means the system's size, other values
+// are relative to that.
 void SetTextSizes(const EarlySettings& sizes);
-// The window's font in such a size.
+// The window's font in this size.
 wxFont FontOf(const wxWindow& window, TextSize size);
 
 }  // namespace fotomill::desktop

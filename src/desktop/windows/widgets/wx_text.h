@@ -10,20 +10,20 @@
 
 namespace fotomill::desktop {
 
-// A text of the core as a window shows it; names may hold anything.
+// Converts a core text for display; names may contain anything.
 inline wxString Shown(std::string_view text) {
   const std::string safe = EscapeControls(text);
   return wxString::FromUTF8(safe.data(), safe.size());
 }
 
-// What the user typed, as the core keeps it.
+// Converts user input for the core.
 inline std::string Utf8(const wxString& text) {
   const wxScopedCharBuffer bytes = text.utf8_str();
   return std::string(bytes.data(), bytes.length());
 }
 
-// A text of the program in the user's language, as Tr and TrCount give it; arguments may be
-// wxStrings, too.
+// A translated text, as from Tr and TrCount; arguments may also be
+// wxStrings.
 inline wxString Label(const char* text) { return wxString::FromUTF8(Tr(text)); }
 inline TextArgument LabelArgument(const wxString& text) { return Utf8(text); }
 template <typename Argument>
