@@ -1,9 +1,6 @@
 #include "texts/texts.h"
 
-#include <libintl.h>
-
 #include <algorithm>
-#include <clocale>
 #include <cstdio>
 #include <cstdlib>
 #include <span>
@@ -15,6 +12,7 @@
 #include "platform/paths.h"
 #include "platform/process.h"
 #include "texts/grouped_count.h"
+#include "texts/message_catalog.h"
 
 namespace fotomill {
 
@@ -26,6 +24,7 @@ constexpr const char* kEnglish = "en";
 struct {
   std::string language = kEnglish;
   bool translated = false;
+  MessageCatalog catalog;
 } state;
 
 constexpr struct {
@@ -44,12 +43,15 @@ std::string CatalogFolder() {
   return platform::JoinFolder(platform::FolderOf(program), "share/locale");
 }
 
+std::string CatalogPath(const std::string& folder, const std::string& code) {
+  return platform::JoinFolder(folder, code + "/LC_MESSAGES/" + kDomain + ".mo");
+}
+
 bool HasCatalog(const std::string& folder, const std::string& code) {
   const bool plain = !code.empty() && std::ranges::all_of(code, [](char c) {
     return IsLetter(c) || c == '_' || c == '@';
   });
-  return plain && platform::FileExists(
-                      platform::JoinFolder(folder, code + "/LC_MESSAGES/" + kDomain + ".mo"));
+  return plain && platform::FileExists(CatalogPath(folder, code));
 }
 
 std::string Variable(const char* name) {
@@ -84,15 +86,6 @@ std::string ChooseLanguage(std::string_view wanted, const std::string& folder) {
   return kEnglish;
 }
 
-// gettext translates only if the locale for messages is not "C". The locale of the language itself
-// need not be installed.
-void SetMessageLocale() {
-  const char* locale = std::setlocale(LC_MESSAGES, "");
-  if (locale == nullptr || std::string_view(locale) == "C" || std::string_view(locale) == "POSIX") {
-    (void)std::setlocale(LC_MESSAGES, "C.UTF-8");
-  }
-}
-
 // `text` with %1, %2, ... replaced. Numbers without an argument are kept.
 std::string Filled(std::string_view text, std::span<const TextArgument> arguments) {
   std::string result;
@@ -112,9 +105,8 @@ std::string Filled(std::string_view text, std::span<const TextArgument> argument
 // The plural form for a count, with %1 replaced by `digits`.
 std::string FilledCount(const char* one, const char* many, uint64_t count, std::string digits,
                         std::initializer_list<TextArgument> arguments) {
-  const char* const english = count == 1 ? one : many;
-  const char* const text =
-      state.translated ? dngettext(kDomain, one, many, static_cast<unsigned long>(count)) : english;
+  const char* text = state.translated ? state.catalog.FindPlural(one, count) : nullptr;
+  if (text == nullptr) text = count == 1 ? one : many;
   std::vector<TextArgument> all{std::move(digits)};
   all.insert(all.end(), arguments);
   return Filled(text, all);
@@ -125,14 +117,11 @@ std::string FilledCount(const char* one, const char* many, uint64_t count, std::
 bool StartTexts(const std::string& code) {
   const std::string folder = CatalogFolder();
   state.language = ChooseLanguage(code.empty() ? LanguagesOfSystem() : code, folder);
-  state.translated = state.language != kEnglish;
+  state.translated =
+      state.language != kEnglish && state.catalog.Load(CatalogPath(folder, state.language));
+  if (!state.translated) state.language = kEnglish;
   // toolkits read it, too
   if (state.translated || !code.empty()) platform::SetVariable("LANGUAGE", state.language);
-  if (state.translated) {
-    SetMessageLocale();
-    (void)bindtextdomain(kDomain, folder.c_str());
-    (void)bind_textdomain_codeset(kDomain, "UTF-8");
-  }
   return state.translated || code.empty() || code.starts_with(kEnglish);
 }
 
@@ -154,7 +143,9 @@ std::vector<Language> Languages() {
 }
 
 const char* Tr(const char* text) {
-  return state.translated && *text != '\0' ? dgettext(kDomain, text) : text;
+  const char* const translation =
+      state.translated && *text != '\0' ? state.catalog.Find(text) : nullptr;
+  return translation != nullptr ? translation : text;
 }
 
 std::string ThousandsText(uint64_t number) {
@@ -184,7 +175,6 @@ std::string DecimalText(double number, int digits) {
 }
 
 std::string Tr(std::string_view text) { return Tr(std::string(text).c_str()); }
-
 
 std::string TrArguments(const char* text, std::initializer_list<TextArgument> arguments) {
   return Filled(Tr(text), std::span(arguments.begin(), arguments.size()));
