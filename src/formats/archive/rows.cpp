@@ -10,8 +10,8 @@ namespace {
 
 using namespace std::string_view_literals;
 
-constexpr Signature kRarSignatures[] = {{0, "Rar!\x1A\7"sv, "a RAR archive"}};
-constexpr Signature kZipSignatures[] = {{0, "PK\3\4"sv, "a ZIP archive"}};
+constexpr Signature kRarSignatures[] = {{0, "Rar!\x1A\7"sv, TrLater("a RAR archive")}};
+constexpr Signature kZipSignatures[] = {{0, "PK\3\4"sv, TrLater("a ZIP archive")}};
 
 std::string LibraryVersion() { return HasArchiveLibrary() ? "present" : "missing"; }
 constexpr FormatLibrary kLibraries[] = {
