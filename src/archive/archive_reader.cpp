@@ -205,6 +205,12 @@ ArchiveLimits archiveLimits;
 
 bool HasArchiveLibrary() { return LibArchive().Whole(); }
 
+std::string ArchiveLibraryVersion() {
+  if (!HasArchiveLibrary()) return "missing";
+  const std::string_view text = LibArchive().version_string();  // "libarchive 3.6.2"
+  return std::string(text.substr(text.rfind(' ') + 1));
+}
+
 ArchiveEnd ListArchive(const ArchiveSource& source, std::vector<ArchiveEntry>& entries) {
   entries.clear();
   uint64_t fileSize = 0;

@@ -62,8 +62,9 @@ ArchiveEnd ReadArchive(const ArchiveSource& source, std::span<const ArchiveEntry
 std::string_view TroubleText(ArchiveTrouble trouble);
 std::string_view RefusalText(EntryRefusal refusal);
 
-// Whether libarchive is installed, and its version.
+// Whether libarchive is installed, and its version, "missing" without it.
 bool HasArchiveLibrary();
+std::string ArchiveLibraryVersion();
 
 // The task for the worker process, a row of the program's task table.
 bool ReadArchiveApart(const platform::ApartCall& call);

@@ -82,6 +82,7 @@ constexpr Row kRows[] = {
     {"libwebp", "webp sharpyuv", "BSD-3-Clause", "2010 Google Inc.", nullptr},
     {"libjxr", nullptr, "BSD-2-Clause", "Microsoft Corp.", nullptr},
     {"LibRaw", nullptr, "LGPL-2.1-only OR CDDL-1.0", "2008-2024 LibRaw LLC", nullptr},
+    {"libarchive", nullptr, "BSD-2-Clause", "2003-2018 Tim Kientzle", nullptr},
     {"lcms2", "lcms2", "MIT", "1998-2023 Marti Maria Saguer", TrLater("color profiles")},
     {"pugixml", "pugixml", "MIT", "2006-2023 Arseny Kapoulkine", TrLater("GPX tracks")},
     {"FreeType", "freetype", "FTL OR GPL-2.0-only", "1996-2024 David Turner, Robert Wilhelm and Werner Lemberg", TrLater("outlines of letters"), nullptr, kFreeTypeVersion},

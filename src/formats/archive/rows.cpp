@@ -13,9 +13,8 @@ using namespace std::string_view_literals;
 constexpr Signature kRarSignatures[] = {{0, "Rar!\x1A\7"sv, TrLater("a RAR archive")}};
 constexpr Signature kZipSignatures[] = {{0, "PK\3\4"sv, TrLater("a ZIP archive")}};
 
-std::string LibraryVersion() { return HasArchiveLibrary() ? "present" : "missing"; }
 constexpr FormatLibrary kLibraries[] = {
-    {"libarchive", LibraryVersion, TrLater("ZIP and RAR archives, loaded when needed")}};
+    {"libarchive", ArchiveLibraryVersion, TrLater("ZIP and RAR archives, loaded when needed")}};
 
 constexpr uint32_t kFlags =
     FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE;
