@@ -16,9 +16,9 @@ struct BareOutput {
   bool asSource = false;      // encode with the quality of the source
 };
 
-// Makes the file for an unmodified picture read from `picture.fileName`, if the format
-// supports it. `upright`: turn the picture by EXIF orientation, but only if that is
-// lossless.
+// Makes the file for an unmodified picture read from
+// `picture.fileName`, if the format supports it. `upright`: turn
+// the picture by EXIF orientation, but only if that is lossless.
 BareOutput MakeBareOutput(const PictureRecord& picture, bool upright);
 
 }  // namespace fotomill

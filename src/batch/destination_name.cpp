@@ -110,8 +110,8 @@ DestinationAnswer Replace(Destination& destination, const OverwritePolicy& polic
   return DestinationAnswer::Write;
 }
 
-// Shows the overwrite prompt until a name is settled. A typed name that is taken as well is
-// numbered if both files are to be kept, and asked about again otherwise.
+// Shows the overwrite prompt until the name is settled. If the entered name exists as well, numbers
+// it if both files are to be kept; otherwise asks again.
 DestinationAnswer AskAboutCollision(Destination& destination, const std::string& source,
                                     BatchJob& job, const TakenTest& taken,
                                     const VariantMaker& variant, const PictureRecord* picture) {

@@ -15,10 +15,10 @@
 
 namespace fotomill {
 
-// The extension of an output, without dot: the format's extension in lowercase, with letters
-// cased by `style`: 0 like the letter at that position in the source's extension, 1 upper, 2
-// lower. Positions beyond the source's extension, or where either has no letter, are not
-// changed.
+// The extension of an output, without dot: the format's extension in
+// lowercase, with letters cased by `style`: 0 like the letter at that
+// position in the source's extension, 1 upper, 2 lower. Positions beyond
+// the source's extension, or where either has no letter, are not changed.
 std::string CasedExtension(std::string_view formatExtension, std::string_view sourceExtension,
                            int32_t style);
 
@@ -54,16 +54,16 @@ std::optional<std::string> CompletedDestination(const std::string& destination,
 // The decision on an output's name.
 struct Destination {
   std::string path = {};
-  bool replace = false;    // a file of that name is to be replaced
-  bool recycle = false;    // and goes to the recycle bin
-  bool asked = false;      // because the user said so for this very file
-  std::string password = {};  // empty: none
-  bool elsewhere = false;  // the user chose another folder, which is not created
-  bool taken = false;      // the name was not free
-  std::string shared = {};  // the path before it was numbered, where another file of the run has it
-  VariantSearch search = VariantSearch::Found;  // anything else: skipped because no name was found
-  int32_t formatIndex = kNoFormat;  // of the output; none: the job's
-  std::string extension = {};       // of the output, as the format has it; empty: the job's
+  bool replace = false;    // replace the existing file
+  bool recycle = false;    // and move it to the trash
+  bool asked = false;      // explicitly confirmed for this file
+  std::string password = {};  // empty: no password
+  bool elsewhere = false;  // the user chose another folder; it is not created
+  bool taken = false;      // a file of that name existed
+  std::string shared = {};  // the path before numbering, if another file of the run has it
+  VariantSearch search = VariantSearch::Found;  // otherwise skipped, as no name was found
+  int32_t formatIndex = kNoFormat;  // of the output; kNoFormat: the job's
+  std::string extension = {};       // of the output, as spelled by the format; empty: the job's
 };
 
 // The "path" of outputs to the clipboard, and the hint for a file for which no numbered variant was
@@ -90,11 +90,11 @@ DestinationAnswer MakeDestinationName(Destination& destination, const std::strin
 // or ErrorCreatingFile (existence cannot be determined).
 void SayNoName(const Destination& destination, FileOutcome& outcome);
 
-// Says why an output is numbered: the path was free, but another file of the run has it.
+// Explains why an output is numbered: the path was free, but another file of the run has it.
 RecordedText SharedNameNote(const std::string& path);
 
-// Adds to an outcome's note which attributes of the replaced file the new one does not have; takes
-// them from the platform.
+// Adds a note about attributes of the replaced file that could not be copied to the new one, as
+// reported by the platform.
 void NoteLostAttributes(FileOutcome& outcome);
 
 // Whether the user is asked about existing files.

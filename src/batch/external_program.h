@@ -10,8 +10,8 @@
 
 namespace fotomill {
 
-// Callbacks of a window while an external program runs, on the calling
-// thread.
+// Callbacks of a window while an external
+// program runs, on the calling thread.
 class ExternalProgramHost {
  public:
   virtual ~ExternalProgramHost() = default;
@@ -19,9 +19,9 @@ class ExternalProgramHost {
   virtual std::vector<std::string> CommandFor(const std::string& file);
   // Shows a message box.
   virtual void ShowMessage(std::string_view text) = 0;
-  virtual void LeaveClipboardChain() {}  // the window stops watching the clipboard
-  virtual void JoinClipboardChain() {}   // and watches it again
-  virtual void TakeFocus() {}            // redraws itself and takes the focus back
+  virtual void LeaveClipboardChain() {}  // stop watching the clipboard
+  virtual void JoinClipboardChain() {}   // resume watching it
+  virtual void TakeFocus() {}            // redraw and take the focus back
 };
 
 // Flag: do not wait for the program to exit.
@@ -33,13 +33,13 @@ inline constexpr std::string_view kNoExternalProgram = TrLater(
     "Fotomill Formats document "
     "for more information about the format in question.");
 
-// Opens a file with the host's program for it, by default the one that the system has registered,
-// and waits until that has ended unless kDoNotWait is set. UnsupportedFunction, after a message, if
-// there is none or it cannot be started.
+// Opens a file with the host's program, by default the registered one, and waits for it to exit
+// unless kDoNotWait is set. UnsupportedFunction, after showing a message, if there is none or it
+// cannot be started.
 Status OpenWithExternalProgram(ExternalProgramHost& host, const std::string& file, uint32_t flags);
 
-// Whether a file is opened with an external program: by its name it is a sound, a video or another
-// medium that plays in time, and this build does not read it.
+// Whether to open a file with an external program: its name is that of a sound, a video or similar,
+// and this build cannot read it.
 bool NeedsExternalProgram(std::string_view fileName);
 
 }  // namespace fotomill

@@ -33,7 +33,7 @@ struct OverwritePolicy {
   bool skip = false;     // skip the file without asking
 };
 
-// The functions that put something in front of the names of their outputs: the Prefix keys.
+// Functions with a prefix for output names: the Prefix keys.
 enum class PrefixedFunction {
   Annotate,
   Catalog,
@@ -49,24 +49,24 @@ enum class PrefixedFunction {
 };
 inline constexpr size_t kPrefixedFunctionCount = 11;
 
-// How outputs get their names.
+// Options for naming outputs.
 struct NamingOptions {
   int32_t extensionCase = 0;  // ExtensionCaseStyle
   bool askName = false;       // PromptForDestName
-  bool skipNames = false;     // files whose name would be asked are left out: the user said so
-  bool beside = false;        // DestForceSourceDir: every output is beside its source
+  bool skipNames = false;     // the user chose to skip all files that need a name
+  bool beside = false;        // DestForceSourceDir: write every output beside its source
   bool askPassword = false;   // PasswordProtect
   // WarnDestinationWrite: ask about the format before writing anything
   bool confirmFormat = true;
   int32_t firstVariant = 1, lastVariant = INT32_MAX;
-  // What they put there, by number of the function; blanks belong to it.
+  // By number of the function; including blanks.
   std::array<FixedText<32>, kPrefixedFunctionCount> prefixes = {};
 
   std::string_view PrefixOf(PrefixedFunction function) const {
     return prefixes[static_cast<size_t>(function)].view();
   }
-  // The same by the number under which files go into the history; empty for functions that put
-  // nothing there.
+  // The same by the number of the function in the file history; empty for functions without a
+  // prefix.
   std::string_view PrefixOf(FileFunction function) const;
 };
 

@@ -49,7 +49,7 @@ OverwritePolicy OverwritePolicyFromSettings() {
           .previews = settings.OverwritePromptPreviews != 0};
 }
 
-// A prefix as FilenameUnderbars wants it: without underbars, one blank is where they were.
+// Applies FilenameUnderbars to a prefix: if off, replaces underscores with single blanks.
 std::string WithUnderbars(std::string_view prefix) {
   std::string text(prefix);
   if (settings.FilenameUnderbars != 0 || text.find('_') == std::string::npos) return text;

@@ -8,9 +8,9 @@ namespace fotomill {
 // Creates jobs from the settings; the only part of the batch code that accesses them. Main thread
 // only.
 
-// A job with the current policies, names and options. Later changes to the settings do
-// not affect it; changes made by the user during the job are saved with
-// StoreRemembered.
+// A job with the current policies, names and options. Later
+// changes to the settings do not affect it; changes made by
+// the user during the job are saved with StoreRemembered.
 BatchJob NewBatchJob();
 // The current keys of the progress box.
 ProgressSettings ProgressSettingsFromSettings();

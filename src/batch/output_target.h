@@ -21,8 +21,8 @@ struct BatchOutput {
   std::string extension = {};  // as spelled by the format
   // absolute, or relative to the job's destination folder, else to the source's
   std::string folder = {};
-  // The name without folder and extension. `picture` is the final one, or null if not
-  // needed.
+  // The name without folder and extension. `picture`
+  // is the final one, or null if not needed.
   std::function<std::string(const std::string& source, const PictureRecord* picture)> name = {};
   bool nameNeedsPicture = false;
   int32_t quality = 0;     // 1 to 100, for lossy formats; 0: use settings

@@ -11,30 +11,30 @@ namespace fotomill {
 struct BatchJob;
 struct FileOutcome;
 
-// What a batch works on, in whatever order files are finished: `done` of `count` files are.
+// The progress of a batch; files may finish in any order: `done` of `count` are.
 struct ProgressWork {
   uint32_t done = 0, count = 0;
   uint32_t inWork = 0;
-  std::string file;  // in work for the longest time; empty when none is
+  std::string file;  // running for the longest time; may be empty
 };
 
-// Receives the reports of a batch. Front ends implement it. Every call comes from the thread that
-// runs the batch, which waits for it to return: a window copies what it needs to its own thread.
-// Arguments are valid during the call.
+// Receives the progress of a batch; implemented by front ends. Called on the thread that runs the
+// batch, which waits for the call to return: windows must copy data to their own thread. Arguments
+// are valid only during the call.
 class ProgressBox {
  public:
   virtual ~ProgressBox() = default;
-  // A batch starts; the model is empty. Return false if no box can be shown, to cancel the
-  // batch.
+  // A batch starts; the model is empty. Return false
+  // if no box can be shown, to cancel the batch.
   virtual bool Open(const ProgressModel& model) = 0;
   // A line was added to the list; `outcome` is null for lines that are not about a file.
   virtual void ShowLine(const ProgressLine& line, const FileOutcome* outcome) = 0;
   virtual void ShowStatus(const std::string& status) = 0;  // replaces the status line
   // `done` of `count` files are finished.
   virtual void ShowProgress(uint32_t done, uint32_t count) { (void)done, (void)count; }
-  // What is in work: when the batch begins, and several times a second while it waits.
+  // The current work: when the batch starts, and several times a second while it waits.
   virtual void ShowWork(const ProgressWork& work) { (void)work; }
-  // Called several times a second while the batch waits, to redraw times.
+  // Called several times a second while the batch waits, to update times.
   virtual void Tick() {}
   // Returns false to end the batch like Abort, if output is no longer possible.
   virtual bool GoesOn() { return true; }
@@ -57,12 +57,12 @@ void ReportFile(BatchJob& job, std::string_view text, uint32_t index, uint32_t c
 void ReportOutcome(BatchJob& job, const FileOutcome& outcome, uint32_t index, uint32_t count);
 // Sets the job's status line, also in its box, if any.
 void SetStatus(BatchJob& job, std::string_view text);
-// Adds the closing lines and closes the box, or leaves it open, depending on
-// CloseProgressWhenDone.
+// Adds the closing lines and closes the box, or
+// leaves it open, depending on CloseProgressWhenDone.
 void FinishProgress(BatchJob& job);
 
-// A line of the list: "SOURCE -> DESTINATION" with ": NOTE" behind it if there is one, or
-// "SOURCE: MESSAGE" followed by the hint.
+// A list line: "SOURCE -> DESTINATION", followed by ": NOTE" if there is one, or "SOURCE: MESSAGE"
+// followed by the hint.
 std::string FileLine(const FileOutcome& outcome);
 
 }  // namespace fotomill

@@ -30,7 +30,7 @@ void ProgressModel::Finish(bool errors, bool summary, const ProgressSettings& bo
     AddLine({CountLine(files_), {}});
     selected_ = static_cast<int32_t>(lines_.size()) - 1;
   }
-  status_ = CountLine(files_);  // no file is being processed any more
+  status_ = CountLine(files_);  // no file is being processed now
   if (!errors && box.closeWhenDone) return Close();
   scrollBar_ = closeLive_ = true;
   abortLive_ = false;

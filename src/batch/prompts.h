@@ -70,28 +70,28 @@ struct NameQuestion {
   std::string problem;    // as above
 };
 
-// What the user decided about the name of an output.
+// The user's decision about the name of an output.
 struct NameAnswer {
-  bool ok = false;        // false: this file is skipped
+  bool ok = false;        // false: skip this file
   std::string name = {};  // a path; its extension is replaced
-  bool skipRest = false;  // not ok, and so for every name of this batch
+  bool skipRest = false;  // if not ok: skip all files in this batch that need a name
 };
 
-// What a batch asks its user. Faces implement it; every call comes from the thread that called the
-// batch, blocks until there is an answer, and comes in the order of the selection.
+// Prompts during a batch, implemented by front ends. Called on the thread that runs the batch, in
+// selection order; each call blocks until there is an answer.
 class Prompts {
  public:
   virtual ~Prompts() = default;
-  // The name of an output.
+  // Asks for the name of an output.
   virtual NameAnswer AskDestinationName(const NameQuestion& question) = 0;
-  // What is to become of an output whose name is taken.
+  // Asks what to do about an existing output.
   virtual OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) = 0;
   // Asks for a password to protect an output; nullopt skips the file.
   virtual std::optional<std::string> AskPassword(const std::string& path) = 0;
   // "Write files to the PNG format?" False cancels the batch.
   virtual bool ConfirmFormat(const std::string& question) = 0;
-  // Asks whether to create a missing destination folder. False cancels the
-  // batch.
+  // Asks whether to create a missing destination
+  // folder. False cancels the batch.
   virtual bool ConfirmNewFolder(const std::string& folder) = 0;
 };
 

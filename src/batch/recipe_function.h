@@ -13,10 +13,10 @@ namespace fotomill {
 using FormatLookup = std::function<std::string(const std::string& extension, int32_t& formatIndex,
                                                std::string& format)>;
 
-// Sets up a batch to run a recipe: the common steps once per file, then each output. Sets
-// `transform`, `outputs` and `autoOrient`; set the other fields before. `copyrightHolder` is
-// for the macro %N. Empty on success, else what is wrong with the recipe's formats, as a
-// sentence.
+// Sets up a batch to run a recipe: the common steps once per file, then
+// each output. Sets `transform`, `outputs` and `autoOrient`; set the
+// other fields before. `copyrightHolder` is for the macro %N. Empty on
+// success, else what is wrong with the recipe's formats, as a sentence.
 std::string SetRecipe(std::shared_ptr<const Recipe> recipe, const std::string& copyrightHolder,
                       const BatchJob& job, const FormatLookup& lookup, BatchFunction& function);
 

@@ -21,7 +21,7 @@ ReportedRun::ReportedRun(std::span<const BatchFile> files, BatchJob& job, Task t
             .goesOn = [this] { return !ended_ && !stop_.Asked(); },
             .tick = [this] { Tick(); }}) {}
 
-// A file while it is in work, however the work ends.
+// Marks a file as being processed during its lifetime.
 class ReportedRun::AtWork {
  public:
   AtWork(ReportedRun& run, size_t file) : run_(run), file_(file) {
@@ -52,7 +52,7 @@ uint32_t ReportedRun::CoreJobs() { return platform::CoreCount(); }
 Status ReportedRun::Work(size_t file) {
   const FolderScope folder(files_[file].name);
   const AtWork atWork(*this, file);
-  if (std::this_thread::get_id() == caller_) ShowWork();  // it is not going to tick meanwhile
+  if (std::this_thread::get_id() == caller_) ShowWork();  // the caller will not tick meanwhile
   outcomes_[file] = task_.process(file);
   return Status::Ok;
 }

@@ -25,8 +25,8 @@ class ReportedRun {
  public:
   // How to process and record files.
   struct Task {
-    // On any thread: returns an outcome per output of the file; none if canceled by
-    // Abort.
+    // On any thread: returns an outcome per output
+    // of the file; none if canceled by Abort.
     std::function<std::vector<FileOutcome>(size_t file)> process;
     FileFunction history = FileFunction::Convert;
     bool dryRun = false;
@@ -59,8 +59,8 @@ class ReportedRun {
   std::vector<std::vector<FileOutcome>> outcomes_;
   std::atomic<bool> ended_{false};
   const std::thread::id caller_ = std::this_thread::get_id();
-  std::mutex workMutex_;     // over what follows
-  std::set<size_t> inWork_;  // the first one was begun first
+  std::mutex workMutex_;     // guards the following members
+  std::set<size_t> inWork_;  // in order of their start
   uint32_t done_ = 0;
   OrderedRun run_;
 };

@@ -442,7 +442,7 @@ class Batch {
     };
     DestinationAnswer answer =
         MakeDestinationName(destination, source, {}, job_, taken, variant, &picture);
-    // a question that was answered by ending the batch
+    // the user ended the batch at the prompt
     cancelled = answer == DestinationAnswer::Skip && job_.stop.Token().Asked();
     const std::lock_guard lock(mutex_);
     // Outputs of a run never replace each other, unless confirmed for this file.

@@ -23,8 +23,8 @@ struct BatchFile {
   std::string hint;  // printed after that error message
 };
 
-// All pages: into one file if the format supports several, else into numbered
-// files.
+// All pages: into one file if the format
+// supports several, else into numbered files.
 inline constexpr int32_t kAllPages = -1;
 
 // How to process each file of a selection.

@@ -128,7 +128,7 @@ Outcome Exchange(const FileStep& step) {
     return Tr("It was changed since, so it was left alone.");
   PreviousFile now;
   if (!now.Keep(step.from)) return Tr("There is not enough disk space to keep the current file.");
-  DeleteThumbnailFile(step.from);  // it may be younger than what comes back
+  DeleteThumbnailFile(step.from);  // it may be newer than the restored file
   Outcome outcome = CopyFile(step.previous->Path(), step.from, platform::Existing::Replace);
   if (!outcome.empty()) return outcome;
   step.previous->Swap(now);
@@ -172,7 +172,7 @@ Outcome UndoStep(FileOperationKind kind, const FileStep& step) {
   return Restore(step.from);
 }
 
-// What a step that was done, or undone with `back`, means for the thumbnails.
+// How a completed step, or with `back` an undone one, affects thumbnails.
 PictureChange ChangeBy(FileOperationKind kind, const FileStep& step, bool back) {
   switch (kind) {
     case FileOperationKind::Rename:
@@ -186,11 +186,11 @@ PictureChange ChangeBy(FileOperationKind kind, const FileStep& step, bool back) 
   return {step.from};
 }
 
-// Thumbnail files at once, since a file that has come may be older than what is there under its
-// name; the databases at the end.
+// Thumbnail files must be handled immediately, since the new picture may be older than an existing
+// thumbnail file of its name; databases at the end.
 void SettleThumbnailFile(FileOperationKind kind, const PictureChange& change) {
   if (!change.to.empty()) return FollowThumbnailFile(change.path, change.to);
-  if (kind == FileOperationKind::Turn) return;  // it was deleted before
+  if (kind == FileOperationKind::Turn) return;  // already deleted
   if (platform::ExistenceOf(change.path) == platform::Existence::No)
     return DeleteThumbnailFile(change.path);
   DeleteMisleadingThumbnailFile(change.path);

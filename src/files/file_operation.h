@@ -50,11 +50,11 @@ struct FileOperationResult {
   std::string note = {};  // a remark about the completed steps, a sentence
 };
 
-// Settings for an operation: the range for numbered names of copies, and the
-// prefix of duplicates.
+// Settings for an operation: the range for numbered
+// names of copies, and the prefix of duplicates.
 struct FileOperationOptions {
   int64_t firstVariant = 1, lastVariant = INT32_MAX;
-  // of a copy in the same folder; if empty, a number is added instead
+  // of a copy in the same folder; if empty, adds a number instead
   std::string duplicatePrefix = {};
 };
 
@@ -84,8 +84,8 @@ FileOperationResult Revert(const FileOperation& operation,
 FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
                                   const FileOperationProgress& progress = {});
 
-// What the file history is to know of an operation that was done, or undone with `back`: what a
-// file was renamed or moved to, copied and turned files, and what is gone.
+// Uses to record in the file history after an operation, or with `back` after undoing it: new paths
+// of renamed and moved files, copied and turned files, and removed ones.
 std::vector<FileUse> UsesOf(const FileOperation& operation, bool back = false);
 
 // "rename of 12 files", "move of beach.jpg"
@@ -95,10 +95,10 @@ std::string FileOperationName(const FileOperation& operation);
 class UndoList {
  public:
   explicit UndoList(size_t most) : most_(most) {}  // keeps at most that many operations
-  // Changes that number; the oldest operations beyond it are dropped.
+  // Changes the limit, dropping the oldest operations beyond it.
   void SetLimit(size_t most);
-  // Adds an operation and clears the redo list. Operations without steps are
-  // ignored.
+  // Adds an operation and clears the redo list.
+  // Operations without steps are ignored.
   void Add(FileOperation operation);
   bool CanUndo() const { return !done_.empty(); }    // there is an operation to undo
   bool CanRedo() const { return !undone_.empty(); }  // there is an operation to redo

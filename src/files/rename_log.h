@@ -22,12 +22,12 @@ struct RenameHistory {
   std::optional<uint32_t> number;
 };
 
-// Log of the last run's renames, for undo: "FMWRenameUndo.dat" in the data folder. For
-// each file the old path, a NUL, the new path, a NUL; a record with an empty old path
-// has a number instead of the new path. An incomplete record at the end is ignored.
-// Renames are logged before they are done, so that none is lost; readers check which
-// files really have the new name. Concurrent runs share one log, which is locked during
-// each rename.
+// Log of the last run's renames, for undo: "FMWRenameUndo.dat" in the data
+// folder. For each file the old path, a NUL, the new path, a NUL; a record
+// with an empty old path has a number instead of the new path. An incomplete
+// record at the end is ignored. Renames are logged before they are done, so
+// that none is lost; readers check which files really have the new name.
+// Concurrent runs share one log, which is locked during each rename.
 class RenameLog {
  public:
   explicit RenameLog(std::optional<uint32_t> number = {}) : number_(number) {}
@@ -37,8 +37,8 @@ class RenameLog {
   bool Intend(const RenamedFile& file);
   // Records whether the file was renamed.
   void Settle(bool renamed);
-  // Locks the log, if there is one, for the lifetime of this object. False if locking
-  // fails.
+  // Locks the log, if there is one, for the lifetime
+  // of this object. False if locking fails.
   bool LockForUndo();
 
  private:

@@ -37,11 +37,11 @@ struct JpegTurnResult {
   RecordedText obstacle;  // why the pixels were not turned, a sentence
 };
 
-// Losslessly turns a JPEG picture. If the pixels cannot be turned, the orientation is set
-// instead. EXIF, XMP, all other segments and data after the picture are kept; sizes and
-// thumbnail in EXIF are turned with the pixels. `made` is empty for Nothing. Statuses of
-// reading; UnsuitableImage (13), with the obstacle, if neither pixels nor orientation can be
-// changed.
+// Losslessly turns a JPEG picture. If the pixels cannot be turned, the
+// orientation is set instead. EXIF, XMP, all other segments and data after
+// the picture are kept; sizes and thumbnail in EXIF are turned with the
+// pixels. `made` is empty for Nothing. Statuses of reading; UnsuitableImage
+// (13), with the obstacle, if neither pixels nor orientation can be changed.
 Status MakeTurnedJpeg(std::span<const uint8_t> file, const JpegTurnRequest& request,
                       std::vector<uint8_t>& made, JpegTurnResult& result);
 

@@ -41,7 +41,7 @@ bool TakeAngle(std::string_view& text, GpsAngle& angle) {
   return std::isfinite(angle.seconds);
 }
 
-// With a point in every language.
+// With a point, regardless of language.
 std::string PlainDecimal(double number) {
   char text[32];
   const auto [end, error] =

@@ -18,12 +18,12 @@ struct EngineOptions {
   FaceOptions faces = {};  // for operations that detect faces
 };
 
-// Applies steps in order. Consecutive point operations are fused into one pass, with identical
-// results. Afterwards the size in EXIF is updated, and the EXIF thumbnail is dropped if anything
-// changed. EmptyImage (31) if there is no picture or nothing is left of it,
-// MemoryAllocationError (6) if the result is too large, FunctionCancelled (4) if `work.goesOn`
-// returns false, else the status of the operation. On failure, some steps may already have been
-// applied.
+// Applies steps in order. Consecutive point operations are fused into one pass,
+// with identical results. Afterwards the size in EXIF is updated, and the EXIF
+// thumbnail is dropped if anything changed. EmptyImage (31) if there is no
+// picture or nothing is left of it, MemoryAllocationError (6) if the result is
+// too large, FunctionCancelled (4) if `work.goesOn` returns false, else the
+// status of the operation. On failure, some steps may already have been applied.
 Status ApplySteps(PictureRecord& picture, std::span<const Step> steps,
                   const EngineOptions& options);
 

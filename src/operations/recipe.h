@@ -78,16 +78,16 @@ using KeyValues = std::function<std::string(std::string_view key)>;
 // Parses a recipe. Sets `recipe` only if there are no mistakes.
 std::vector<Mistake> ReadRecipe(std::string_view text, const KeyValues& keys, Recipe& recipe);
 
-// Formats a recipe; parsing the result gives the same recipe. Default values are
-// omitted.
+// Formats a recipe; parsing the result gives
+// the same recipe. Default values are omitted.
 std::string PrintRecipe(const Recipe& recipe);
 std::string PrintStep(const Step& step);  // formats one step
 
 // A step with all parameters at their defaults. Required parameters are unset; set them before
 // running the step.
 Step DefaultStep(const Operation& operation, const KeyValues& keys);
-// Sets a parameter of a step, for dialogs. Empty on success, else what is wrong, as from
-// ReadValue.
+// Sets a parameter of a step, for dialogs. Empty on
+// success, else what is wrong, as from ReadValue.
 RecordedText SetArgument(Step& step, std::string_view parameter, std::string_view text);
 // The default of a parameter in recipe syntax: from its key, else its preset; nullopt if there is
 // none.

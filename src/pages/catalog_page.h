@@ -13,8 +13,8 @@ namespace fotomill {
 // Page numbers are below this; no further page can be written.
 inline constexpr uint32_t kLastCatalogPage = 10000000;
 
-// "Catalog_00001.jpg": prefix, number with at least five digits, extension in
-// lowercase.
+// "Catalog_00001.jpg": prefix, number with at
+// least five digits, extension in lowercase.
 std::string CatalogPageName(std::string_view prefix, uint32_t number, std::string_view extension);
 
 // Options for writing a page.

@@ -17,8 +17,8 @@ RewrittenFile EditExifFile(const std::string& source, const std::string& destina
 
 // Which metadata to remove.
 struct StripRequest {
-  uint32_t kept = 0;        // what stays: kKeep bits
-  bool placesOnly = false;  // everything stays but where the picture was taken
+  uint32_t kept = 0;        // what to keep: kKeep flags
+  bool placesOnly = false;  // remove only the position
 };
 // Removes metadata. The new file is read back; the note names what is left in it.
 RewrittenFile StripFile(const std::string& source, const std::string& destination,

@@ -20,8 +20,8 @@ struct RewriteFunction {
   const char* unchanged = "";
   const char* listedTwice = "";
   FileFunction history = FileFunction::Transform;  // function recorded in the file history
-  // replace each file; otherwise write it to the job's destination folder under the same
-  // name
+  // replace each file; otherwise write it to the
+  // job's destination folder under the same name
   bool inPlace = false;
   std::string out = {};   // not empty: the full output path for a selection of one file
   bool keepTree = false;  // recreate the folders of the selection there

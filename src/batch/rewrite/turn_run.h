@@ -13,8 +13,8 @@ namespace fotomill {
 // How to process the files of a selection that are turned.
 struct TurnFunction {
   TurnRequest request;
-  // replace each file; otherwise write it to the job's destination folder under the same
-  // name
+  // replace each file; otherwise write it to the
+  // job's destination folder under the same name
   bool inPlace = false;
   std::string out = {};   // not empty: the full output path for a selection of one file
   bool keepTree = false;  // recreate the folders of the selection there

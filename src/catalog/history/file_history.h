@@ -65,8 +65,8 @@ int32_t FileFunctionOfName(std::string_view name);
 // Use the file's creation time, or the current time.
 inline constexpr int32_t kOwnTime = -1;
 
-// Whether a path can be stored in the file: 1 to 260 bytes without tab, line end or
-// NUL.
+// Whether a path can be stored in the file: 1
+// to 260 bytes without tab, line end or NUL.
 bool FitsFileHistory(std::string_view path);
 
 // Adds an entry, or updates function and access time of the entry with that path, then sorts and

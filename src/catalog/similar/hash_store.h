@@ -40,9 +40,9 @@ struct HashRecord {
 //      116    4  0
 //      120       absolute path
 //
-// The last record of a path applies. Reading stops at the first record that is incomplete or
-// has a wrong checksum, as left by an interrupted program. Several programs may write
-// concurrently.
+// The last record of a path applies. Reading stops at the first
+// record that is incomplete or has a wrong checksum, as left by an
+// interrupted program. Several programs may write concurrently.
 inline constexpr std::string_view kHashStoreName = "Fotomill.hashes";
 
 // A store. Not thread-safe.

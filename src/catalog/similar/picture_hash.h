@@ -12,10 +12,10 @@ namespace fotomill {
 // A 64-bit perceptual hash: the hashes of similar pictures differ in few bits, regardless of size,
 // format, compression and brightness.
 //
-// The picture is scaled to 32 x 32 pixels and converted to luma. Each bit is set if one of the
-// 8 x 8 lowest frequencies of the discrete cosine transform is above their median. Source:
-// C. Zauner, "Implementation and Benchmarking of Perceptual Image Hash Functions" (2010),
-// section 3.2.1.
+// The picture is scaled to 32 x 32 pixels and converted to luma. Each bit
+// is set if one of the 8 x 8 lowest frequencies of the discrete cosine
+// transform is above their median. Source: C. Zauner, "Implementation and
+// Benchmarking of Perceptual Image Hash Functions" (2010), section 3.2.1.
 using PictureHash = uint64_t;
 
 // The hashes of a picture unchanged, mirrored horizontally, mirrored vertically and rotated by 180

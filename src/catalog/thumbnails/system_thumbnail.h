@@ -17,9 +17,9 @@ namespace fotomill {
 // The URI of an absolute path, escaped according to RFC 2396.
 std::string FileUri(std::string_view path);
 
-// Loads the system's thumbnail of a picture, from the first of the folders "large", "x-large" and
-// "xx-large" (256, 512 and 1024 pixels) suitable for `side` pixels. Null if there is no valid
-// one.
+// Loads the system's thumbnail of a picture, from the first of the
+// folders "large", "x-large" and "xx-large" (256, 512 and 1024
+// pixels) suitable for `side` pixels. Null if there is no valid one.
 PicturePointer ReadSystemPicture(const std::string& picturePath, int32_t side);
 
 // Loads the system's thumbnail into a large record. False, with `record` unchanged, if there is no

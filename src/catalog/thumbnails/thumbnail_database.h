@@ -121,8 +121,8 @@ class ThumbnailDatabase {
   // Opens a database; with `create`, creates an empty one if it is missing. With `hidden`, new
   // files are hidden, also later.
   Opened OpenThumbnailDatabase(const std::string& path, bool create, bool hidden = true);
-  // Opens a database for lookups. It may be read-only, but then cannot be
-  // changed.
+  // Opens a database for lookups. It may be
+  // read-only, but then cannot be changed.
   Opened OpenToRead(const std::string& path, bool hidden = true);
   // Whether a database is open and can be changed.
   bool IsOpenForChanges() const { return file_.IsOpen() && !readOnly_; }

@@ -26,9 +26,9 @@ bool ReadThumbnailFile(ThumbnailRecord& record, const std::string& path);
 // contains a complete record.
 bool ReadThumbnailForPicture(const std::string& picturePath, ThumbnailRecord& record);
 
-// Signs a record and writes it, atomically replacing an existing file or link, even if hidden
-// or protected; hides the file with `hidden`. False, with the old file unchanged, if writing
-// fails.
+// Signs a record and writes it, atomically replacing an existing
+// file or link, even if hidden or protected; hides the file with
+// `hidden`. False, with the old file unchanged, if writing fails.
 bool WriteThumbnailFile(ThumbnailRecord& record, const std::string& path, bool hidden);
 // Creates a record with MakeBlendedThumbnailRecord and writes the thumbnail file of a picture,
 // keeping its attributes.
@@ -41,9 +41,9 @@ bool WriteThumbnailForPicture(const std::string& picturePath, const PictureRecor
 Status MakeThumbnailOfFile(const std::string& picturePath, const ThumbnailOptions& options,
                            ThumbnailRecord& record, Status* shortfall = nullptr);
 
-// Thumbnail files in a folder without a picture in `names`, ignoring case: regular files,
-// no links, no names starting with "."; in byte order. nullopt if the folder cannot be
-// read.
+// Thumbnail files in a folder without a picture in `names`,
+// ignoring case: regular files, no links, no names starting with
+// "."; in byte order. nullopt if the folder cannot be read.
 std::optional<std::vector<std::string>> OrphanThumbnails(const std::string& folder,
                                                          const std::vector<std::string>& names);
 

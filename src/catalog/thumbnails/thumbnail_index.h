@@ -30,8 +30,8 @@ namespace fotomill {
 //                    cells: hash of a record, and record + 1, or 0, 0; ordered by record,
 //                    starting in block hash x n / 2^32
 //
-// So a record is found by reading a single block, and blocks of different states are never
-// mixed.
+// So a record is found by reading a single block,
+// and blocks of different states are never mixed.
 class ThumbnailIndex {
  public:
   // The state of a database file for which an index was made.

@@ -24,9 +24,9 @@ struct PictureRecord;
 // ~     264    3 x side^2   pixels: blue, green, red, bottom row first, no padding; side 96 or
 // 176
 //
-// The picture is centered, with offsets rounded down, on the background color. Small records with
-// versions below 2 contain 96 x 96 indices into ThumbnailPalette() instead, in the same row
-// order.
+// The picture is centered, with offsets rounded down, on the
+// background color. Small records with versions below 2 contain 96 x
+// 96 indices into ThumbnailPalette() instead, in the same row order.
 inline constexpr size_t kThumbnailHeaderSize = 264;
 inline constexpr int16_t kThumbnailVersion = 512;  // of new records
 inline constexpr int32_t kSmallThumbnailSide = 96;  // pixels
@@ -92,8 +92,8 @@ void ExpandOldRecord(ThumbnailRecord& record);
 // no pixels or memory runs out.
 bool MakeThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture,
                          const ThumbnailOptions& options);
-// The same with the quick scaler; alpha is blended with `background`, rounding down each
-// product.
+// The same with the quick scaler; alpha is blended
+// with `background`, rounding down each product.
 bool MakeBlendedThumbnailRecord(ThumbnailRecord& record, const PictureRecord& picture,
                                 Color background);
 // A large record: larger pictures are scaled down with the filtered scaler, smaller ones keep their

@@ -10,10 +10,10 @@
 
 namespace fotomill {
 
-// Thread-safe access to the thumbnail databases of the program. The last one used stays open,
-// since its index makes lookups fast; new records are collected, since every append waits for the
-// disk. No errors are reported: if a database cannot be read or written, thumbnails are just made
-// again.
+// Thread-safe access to the thumbnail databases of the program. The last
+// one used stays open, since its index makes lookups fast; new records are
+// collected, since every append waits for the disk. No errors are reported:
+// if a database cannot be read or written, thumbnails are just made again.
 class ThumbnailStore {
  public:
   // As ThumbnailDatabase::Find, for a path on its current volume; false without a database.

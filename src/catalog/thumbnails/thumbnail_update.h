@@ -12,9 +12,9 @@ namespace fotomill {
 template <int32_t side> struct SquareThumbnailRecord;
 using ThumbnailRecord = SquareThumbnailRecord<96>;
 
-// Maintains thumbnails after a browser has listed a folder: creates in-memory
-// records, removes orphaned thumbnail files, and offers to create missing
-// ones.
+// Maintains thumbnails after a browser has listed a
+// folder: creates in-memory records, removes orphaned
+// thumbnail files, and offers to create missing ones.
 
 // Settings for that; see the keys.
 struct ThumbnailUpdateOptions {

@@ -84,7 +84,7 @@ Adding MakeRecord(const SelectedFile& file, const ThumbnailOptions& options) {
     adding.hint = Tr("The path is longer than 260 characters.");
     return adding;
   }
-  adding.record->stamp = PictureStampOf(adding.record->path);  // before it is read
+  adding.record->stamp = PictureStampOf(adding.record->path);  // before reading it
   adding.status = MakeThumbnailOfFile(file.name, options, adding.record->thumbnail);
   if (adding.status != Status::Ok) adding.hint = OpenHint(file.name, adding.status);
   adding.record->volume = VolumeKeyFor(adding.record->path);

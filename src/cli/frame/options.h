@@ -24,8 +24,8 @@ CLI::Option* AddFlag(CLI::App& app, const char* names, bool& value, const char* 
 // Any text.
 CLI::Option* AddText(CLI::App& app, const char* names, std::string& value, const char* shownAs,
                      const char* help);
-// A name; must not be empty, which is most often caused by an unset variable in a
-// script.
+// A name; must not be empty, which is most often
+// caused by an unset variable in a script.
 CLI::Option* AddName(CLI::App& app, const char* names, std::string& value, const char* shownAs,
                      const char* help);
 // One of several words.

@@ -54,8 +54,8 @@ class ResultOutput {
   void Element(const Json& element);
   // Counts a processed file for the summary.
   void CountFile();
-  // Prints the message for a failed file, "NAME: MESSAGE", with the hint, if any, and counts
-  // it.
+  // Prints the message for a failed file, "NAME:
+  // MESSAGE", with the hint, if any, and counts it.
   void Failure(std::string_view name, Status status, std::string_view hint = {});
   // Reports a processed file: a result line, "FILE" or "FILE -> DESTINATION", or an element {file,
   // destination, status, message}. Counts it.

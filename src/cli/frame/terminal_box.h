@@ -8,8 +8,8 @@ namespace fotomill::cli {
 // Progress box of the command line: prints results and messages via ResultOutput.
 class TerminalBox : public ProgressBox {
  public:
-  // `verbose` also prints notes, `tellReplaced` also the names of replaced
-  // files.
+  // `verbose` also prints notes, `tellReplaced`
+  // also the names of replaced files.
   TerminalBox(ResultOutput& output, bool verbose, bool tellReplaced)
       : output_(output), verbose_(verbose), tellReplaced_(tellReplaced) {
     output_.KeepGoing();

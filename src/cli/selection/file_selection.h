@@ -38,8 +38,8 @@ struct Selection {
 // Whether "-" is among the names.
 bool NamesInput(const CommandContext& context);
 
-// Declares the FILE... names and the options that select files. Set `options.takesInput`
-// first.
+// Declares the FILE... names and the options that
+// select files. Set `options.takesInput` first.
 void AddSelection(CLI::App& app, SelectionOptions& options, CommandContext& context);
 
 // Selects the files of a command line: given files in their order; for a folder, its readable files

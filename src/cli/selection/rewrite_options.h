@@ -29,8 +29,8 @@ void AddRewriteOptions(CLI::App& app, RewriteOptions& options);
 // The function for these options; the command sets `rewrite` and the texts.
 RewriteFunction RewriteFunctionOf(const RewriteOptions& options);
 
-// Checks the options and selects files. nullopt, after printing a message, for a usage
-// error.
+// Checks the options and selects files. nullopt,
+// after printing a message, for a usage error.
 std::optional<Selection> SelectForRewrite(RewriteOptions& options, const CommandContext& context);
 
 // Runs `start`, which starts a batch for the selection, with a job set up from the options; returns

@@ -7,8 +7,8 @@
 
 namespace fotomill {
 
-// EXIF dates and times have no time zone: seconds since 1970-01-01 by the camera's
-// clock.
+// EXIF dates and times have no time zone: seconds
+// since 1970-01-01 by the camera's clock.
 
 // "2024:05:31 14:03:00"; the date may also have hyphens, and a T before the time. None if malformed
 // or not a calendar day.

@@ -7,12 +7,12 @@
 
 namespace fotomill {
 
-// Parses user input for a tag: the displayed text of a value, or the plain value. Words of the
-// tag's list (case-insensitive) or their numbers; rationals as "1/250" or "2.8"; several
-// numbers separated by spaces, commas or colons; latitudes and longitudes also in decimal
-// degrees; dates as "2024:05:31 14:03:00", also with hyphens or a T. The entry's values are
-// little-endian. False, with the reason as a sentence, for tags that cannot be edited and for
-// invalid values.
+// Parses user input for a tag: the displayed text of a value, or the plain value.
+// Words of the tag's list (case-insensitive) or their numbers; rationals as "1/250"
+// or "2.8"; several numbers separated by spaces, commas or colons; latitudes and
+// longitudes also in decimal degrees; dates as "2024:05:31 14:03:00", also with
+// hyphens or a T. The entry's values are little-endian. False, with the reason as a
+// sentence, for tags that cannot be edited and for invalid values.
 bool ParseExifInput(uint16_t tag, std::string_view text, ExifEntry& entry, std::string& reason);
 
 // The directory that the standard assigns to a tag.

@@ -23,8 +23,8 @@ enum class MetadataForm : uint8_t {
 };
 MetadataForm MetadataFormOf(std::span<const uint8_t> file);
 
-// The EXIF entries of a file, values in its byte order; empty if there are none that can be
-// read.
+// The EXIF entries of a file, values in its byte
+// order; empty if there are none that can be read.
 ExifDirectories GatherPictureExif(std::span<const uint8_t> file);
 
 // The first value of an entry as text, without trailing spaces and NULs; empty for other types.

@@ -40,13 +40,13 @@ std::span<const KeptName> KeptNames();
 Status StripPicture(std::span<const uint8_t> file, uint32_t kept, FilePieces& made,
                     std::string& reason);
 
-// Removes positions: the EXIF GPS directory, also in embedded pictures, and the positions
-// in XMP. All other bytes stay the same, at the same offsets. Statuses and reason as
-// above.
+// Removes positions: the EXIF GPS directory, also in embedded
+// pictures, and the positions in XMP. All other bytes stay the
+// same, at the same offsets. Statuses and reason as above.
 Status StripPlaces(std::span<const uint8_t> file, FilePieces& made, std::string& reason);
 
-// Short untranslated names of the metadata in a file: "orientation", "color profile", "EXIF",
-// ...
+// Short untranslated names of the metadata in a
+// file: "orientation", "color profile", "EXIF", ...
 std::vector<const char*> MetadataLeft(std::span<const uint8_t> file);
 
 }  // namespace fotomill

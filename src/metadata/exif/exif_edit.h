@@ -11,8 +11,8 @@ namespace fotomill {
 // start with the byte order; a block without TIFF header, or too damaged for the edit, is left
 // unchanged.
 
-// Orientation of the picture, 1 to 8; 1 if missing or
-// invalid.
+// Orientation of the picture, 1 to 8; 1
+// if missing or invalid.
 int32_t ExifOrientation(std::span<const uint8_t> block);
 
 // Properties of the new picture; 0: keep the old value.
@@ -35,10 +35,10 @@ void SetExifPictureFacts(std::span<uint8_t> block, const ExifPictureFacts& facts
 // trailing zeros off the block.
 void DropExifThumbnail(std::vector<uint8_t>& block);
 
-// Replaces the thumbnail, if any, by the JPEG stream `thumbnail`, with a new second directory
-// at the end of the block. False, with the thumbnail removed, if there is no first directory
-// to chain it to or if the block would exceed `most` bytes (a JPEG segment has room for
-// 65527).
+// Replaces the thumbnail, if any, by the JPEG stream `thumbnail`, with a
+// new second directory at the end of the block. False, with the thumbnail
+// removed, if there is no first directory to chain it to or if the block
+// would exceed `most` bytes (a JPEG segment has room for 65527).
 [[nodiscard]] bool ReplaceExifThumbnail(std::vector<uint8_t>& block,
                                         std::span<const uint8_t> thumbnail, uint64_t most);
 

@@ -14,13 +14,13 @@ namespace {
 constexpr uint16_t kLatitude = 0x0002, kLongitude = 0x0004, kDestinationLatitude = 0x0014,
                    kDestinationLongitude = 0x0016;
 
-// Degrees, minutes and seconds as one number without sign; none if they are no angle.
+// Degrees, minutes and seconds as one unsigned number; none if invalid.
 std::optional<double> AngleOf(const ExifValue& value) {
   if (value.type != kExifRational || value.count != 3) return std::nullopt;
   double parts[3];
   for (uint64_t i = 0; i < 3; ++i) {
     const uint32_t divisor = value.bytes.U32(8 * i + 4);
-    // seconds, and minutes with decimals before them, may be left out
+    // seconds are optional, and so are minutes if degrees have decimals
     if (divisor == 0 && i == 0) return std::nullopt;
     parts[i] = divisor == 0 ? 0 : static_cast<double>(value.bytes.U32(8 * i)) / divisor;
   }

@@ -6,16 +6,16 @@
 
 namespace fotomill {
 
-// A place in decimal degrees, negative in the south and the west.
+// A position in decimal degrees, negative for south and west.
 struct ExifPlace {
   double latitude = 0, longitude = 0;
 };
 
-// The places that the GPS directory of an EXIF block tells; none where an angle or its hemisphere
-// is missing or impossible. Source: CIPA DC-008-2012, section 4.6.6.
+// The positions in the GPS directory of an EXIF block; none if an angle or its hemisphere is
+// missing or invalid. Source: CIPA DC-008-2012, section 4.6.6.
 struct ExifPlaces {
   std::optional<ExifPlace> taken;        // where the picture was taken
-  std::optional<ExifPlace> destination;  // what it shows
+  std::optional<ExifPlace> destination;  // the position shown
 };
 ExifPlaces FindExifPlaces(std::span<const uint8_t> block);
 

@@ -28,8 +28,8 @@ class ExifSource {
   Status Open(const char* path);
   // Starts with the byte order; valid as long as the source.
   std::span<const uint8_t> Block() const { return block_; }
-  // False if another program truncated the file meanwhile; the block may contain zeros
-  // then.
+  // False if another program truncated the file
+  // meanwhile; the block may contain zeros then.
   bool Intact() const { return file_.Intact(); }
 
  private:

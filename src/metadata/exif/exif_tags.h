@@ -21,8 +21,8 @@ inline constexpr uint16_t kExifSRational = 10;  // two SLONGs
 // Bytes per value as the editor counts them: 2 for SHORT, 4 for the long types, 8 for rationals, 1
 // for all others, regardless of TIFF.
 uint32_t ExifTypeSize(uint16_t type);
-// The label shown if `ExifShowTypes` is set, such as "[SHORT]". Types are clamped to 1 to
-// 10.
+// The label shown if `ExifShowTypes` is set, such
+// as "[SHORT]". Types are clamped to 1 to 10.
 std::string_view ExifTypeLabel(uint16_t type);
 
 // How the value of a tag is displayed, beyond its type.
@@ -80,9 +80,9 @@ struct ExifTag {
 // Index for "not in the dictionary".
 inline constexpr int32_t kNoExifTag = -1;
 
-// The dictionary, in the order of the editor's list; each tag occurs once. Source: CIPA
-// DC-008-2012, "Exchangeable image file format for digital still cameras: Exif Version
-// 2.3".
+// The dictionary, in the order of the editor's list; each tag
+// occurs once. Source: CIPA DC-008-2012, "Exchangeable image
+// file format for digital still cameras: Exif Version 2.3".
 std::span<const ExifTag> ExifTags();
 // Row of a tag, by number alone: GPS tags do not clash with others. Null, or kNoExifTag, if not
 // found.
@@ -90,8 +90,8 @@ const ExifTag* FindExifTag(uint16_t tag);
 int32_t ExifTagIndex(uint16_t tag);
 // The display name; "Unknown" if the tag has no row.
 std::string_view ExifTagName(uint16_t tag);
-// A copy of the row; for a tag without one, a plain row with the tag and the name
-// "Unknown".
+// A copy of the row; for a tag without one, a
+// plain row with the tag and the name "Unknown".
 ExifTag CopyExifTag(uint16_t tag);
 // The editor's limits, both 0: none; edit class, 0 for a tag without a row.
 struct ExifRange {

@@ -25,11 +25,11 @@ struct ExifValue {
 ExifValue ReadExifValue(std::span<const uint8_t> block, const ExifBytes& numbers,
                         const ExifField& field);
 
-// Formats a value: by the rule of its dictionary row (null for tags without one), else by type.
-// Numbers are separated by spaces, 16 at most, then " ..."; ASCII ends at the first NUL. nullopt
-// (not an empty text) for values without text: unknown types, no values, opaque data. The result
-// is in the block, in a word list, or in `buffer`, and is valid until the next call with that
-// buffer.
+// Formats a value: by the rule of its dictionary row (null for tags without
+// one), else by type. Numbers are separated by spaces, 16 at most, then " ...";
+// ASCII ends at the first NUL. nullopt (not an empty text) for values without
+// text: unknown types, no values, opaque data. The result is in the block, in a
+// word list, or in `buffer`, and is valid until the next call with that buffer.
 std::optional<std::string_view> ExifValueText(const ExifValue& value, const ExifTag* row,
                                               std::string& buffer);
 
@@ -40,9 +40,9 @@ std::optional<std::string_view> ExifValueText(const ExifValue& value, const Exif
 bool DecodeUserComment(std::span<const uint8_t> data, uint32_t count, size_t most,
                        std::string_view& text);
 
-// A copy of an entry's values for the editor, which keeps one per line. SHORT values take
-// 32-bit slots: the two bytes of the file, then two zero bytes; all others are as in the
-// block.
+// A copy of an entry's values for the editor, which keeps one
+// per line. SHORT values take 32-bit slots: the two bytes of the
+// file, then two zero bytes; all others are as in the block.
 struct ExifRawValue {
   bool bigEndian = false;  // "MM"
   uint16_t tag = 0;

@@ -8,8 +8,8 @@
 
 namespace fotomill {
 
-// One line of the walk. Valid only until the sink returns; use CopyExifValue to keep the
-// value.
+// One line of the walk. Valid only until the sink
+// returns; use CopyExifValue to keep the value.
 struct ExifLine {
   const ExifValue& value;
   std::string_view name;  // of the tag; else "Unknown (50341)"
@@ -37,12 +37,12 @@ struct ExifFindings {
   bool cutShort = false;
 };
 
-// Walks an EXIF block: the chain of directories from the header, then the EXIF and GPS
-// directories they point to, each once. Ends at an empty or already visited directory and
-// at the limits on directories, entries and text. Lines go to `sink` (may be null), only
-// those of directory `only` if it is a number. False, without any line, if the block does
-// not have the magic number 42. Source: TIFF 6.0, section 2; CIPA DC-008-2012, section
-// 4.6.
+// Walks an EXIF block: the chain of directories from the header, then the EXIF
+// and GPS directories they point to, each once. Ends at an empty or already
+// visited directory and at the limits on directories, entries and text. Lines
+// go to `sink` (may be null), only those of directory `only` if it is a
+// number. False, without any line, if the block does not have the magic number
+// 42. Source: TIFF 6.0, section 2; CIPA DC-008-2012, section 4.6.
 bool WalkExif(std::span<const uint8_t> block, ExifSink* sink, ExifFindings* findings = nullptr,
               int32_t only = kAllExifDirectories);
 

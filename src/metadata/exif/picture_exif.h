@@ -15,8 +15,8 @@ Status TurnPicture(PictureRecord& picture, Orientation turn);
 // Turns a picture by its EXIF orientation; no change if it is upright or has no block.
 Status TurnUpright(PictureRecord& picture);
 
-// Updates the EXIF block before the picture is written: sets the picture
-// size.
+// Updates the EXIF block before the picture
+// is written: sets the picture size.
 void RefreshExif(PictureRecord& picture);
 
 }  // namespace fotomill

@@ -5,8 +5,8 @@
 
 namespace fotomill {
 
-// Overwrites every tiff:Orientation (1 to 8) in an XMP packet, attributes and elements. Adds
-// none.
+// Overwrites every tiff:Orientation (1 to 8) in an
+// XMP packet, attributes and elements. Adds none.
 void SetXmpOrientation(std::span<uint8_t> packet, int32_t orientation);
 
 // Overwrites the position properties (EXIF schema, names beginning with GPS) with spaces; the

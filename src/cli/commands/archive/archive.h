@@ -4,7 +4,7 @@
 
 namespace fotomill::cli {
 
-// "archive": ZIP and RAR archives. `create` writes ZIP.
+// Commands "archive ...": ZIP and RAR archives; `create` writes ZIP.
 void SetUpArchiveList(CLI::App& app, CommandContext& context);
 void SetUpArchiveTest(CLI::App& app, CommandContext& context);
 void SetUpArchiveExtract(CLI::App& app, CommandContext& context);

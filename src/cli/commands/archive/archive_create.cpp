@@ -30,14 +30,14 @@ struct CreateOptions {
   bool dryRun = false;
 };
 
-// A file to be archived.
+// A file to add.
 struct Member {
-  std::string path, name;  // on disk, and in the archive
+  std::string path, name;  // on disk; in the archive
   Status status = Status::Ok;
   std::string hint = {};
 };
 
-// Collects the files of the command line; folders with everything below them, except behind links.
+// Collects the files of the command line; folders recursively, without following links.
 class Members {
  public:
   explicit Members(const std::string& archive) : archive_(platform::AbsolutePath(archive)) {}
@@ -76,7 +76,7 @@ class Members {
       Add(thumbnail);
   }
   void Add(const std::string& path) {
-    if (!paths_.insert(path).second) return;  // named twice
+    if (!paths_.insert(path).second) return;  // given twice
     const std::string stored = settings.ArchivePreservePaths != 0
                                    ? StoredEntryName(path)
                                    : std::string(platform::FileNameOf(path));
@@ -96,7 +96,7 @@ class Members {
   std::set<std::string> paths_, names_;
 };
 
-// What to do with an existing archive: false to leave it, with a note.
+// Decides about an existing archive; false, after printing a note, to keep it.
 bool SettleArchive(const std::string& overwrite, const CommandContext& context,
                    ResultOutput& output, std::string& path, platform::Existing& existing) {
   existing = platform::Existing::Refuse;
@@ -122,7 +122,7 @@ bool SettleArchive(const std::string& overwrite, const CommandContext& context,
   return false;
 }
 
-// Adds the files that can be added, and names those that cannot. Anything but Ok ends the archive.
+// Adds files, and reports those that cannot be added. Anything but Ok cancels the archive.
 Status AddMembers(const std::vector<Member>& members, ZipWriter& zip, ResultOutput& output,
                   std::vector<const Member*>& added) {
   for (const Member& member : members) {
@@ -147,7 +147,7 @@ Status WriteArchive(const std::string& path, platform::Existing existing,
   RETURN_IF_BAD(zip.Create(path, password));
   std::vector<const Member*> added;
   RETURN_IF_BAD(AddMembers(members, zip, output, added));
-  if (added.empty()) return Status::Ok;  // each has its message
+  if (added.empty()) return Status::Ok;  // each one was reported
   if (zip.Finish(existing) != platform::CommitResult::Done) return Status::ErrorWritingFile;
   for (const Member* member : added) output.FileDone(member->path, member->name);
   return Status::Ok;

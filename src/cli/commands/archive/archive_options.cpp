@@ -12,7 +12,7 @@ namespace fotomill::cli {
 std::string ReadPassword(const PasswordOptions& options, std::string& password) {
   if (options.file.empty()) return {};
   std::string contents;
-  // a line end more than the password
+  // the password and a line end
   const auto read = platform::ReadListFile(options.file, kLongestPassword + 2, contents);
   if (read != platform::ReadResult::Done && read != platform::ReadResult::TooLarge)
     return WithReason(Tr("\"%1\" cannot be read.", options.file));

@@ -31,7 +31,7 @@ struct ReadingOptions {
   bool dryRun = false;
 };
 
-// An archive that a command reads, with the entries that were asked for.
+// An archive to read, and the requested entries.
 struct OpenArchive {
   ArchiveSource source;
   std::vector<ArchiveEntry> entries;
@@ -59,8 +59,8 @@ bool Matches(std::string_view name, std::string_view asked) {
   return name == asked || IsBelow(name, asked) || (pattern && MatchesFilter(name, asked));
 }
 
-// Marks the entries that the command line names, all without names. A name that matches nothing is
-// a failed file.
+// Marks the entries given on the command line; all if there are none. A name without match is
+// reported as a failed file.
 void MarkWanted(const CommandContext& context, OpenArchive& archive, ResultOutput& output) {
   const auto& names = context.names.values;
   archive.wanted.assign(archive.entries.size(), names.size() == 1);
@@ -74,7 +74,7 @@ void MarkWanted(const CommandContext& context, OpenArchive& archive, ResultOutpu
   }
 }
 
-// Lists the archive. What can be listed of a damaged one is taken, after a message.
+// Lists the archive. If it is damaged, reports that and uses the readable entries.
 void Open(const CommandContext& context, ResultOutput& output, OpenArchive& archive) {
   archive.source.path = context.names.values[0];
   const ArchiveEnd end = ListArchive(archive.source, archive.entries);
@@ -83,7 +83,7 @@ void Open(const CommandContext& context, ResultOutput& output, OpenArchive& arch
   if (end.status == Status::Ok || !archive.entries.empty()) MarkWanted(context, archive, output);
 }
 
-// Asks for the password if there is none, an entry needs it, and the user is there.
+// Asks for the password if an entry needs it, none was given, and prompting is possible.
 void AskPasswordIfNeeded(const CommandContext& context, ResultOutput& output,
                          OpenArchive& archive) {
   bool needed = false;
@@ -131,7 +131,7 @@ int RunList(const ReadingOptions& options, const CommandContext& context) {
   return output.Failed() ? kExitFailed : kExitOk;
 }
 
-// Reports the wanted entries that are not extracted.
+// Reports the requested entries that cannot be extracted.
 void ReportRefused(const OpenArchive& archive, ResultOutput& output) {
   for (size_t i = 0; i < archive.wanted.size(); ++i) {
     const ArchiveEntry& entry = archive.entries[i];
@@ -140,7 +140,7 @@ void ReportRefused(const OpenArchive& archive, ResultOutput& output) {
   }
 }
 
-// Reports the end of the whole archive, unless an entry's message said the same.
+// Reports the status of the whole archive, unless an entry's message said the same.
 void ReportEnd(const OpenArchive& archive, const ArchiveEnd& end, uint64_t failuresBefore,
                ResultOutput& output) {
   if (end.status != Status::Ok && output.Failures() == failuresBefore)
@@ -190,7 +190,7 @@ int RunTest(const ReadingOptions& options, const CommandContext& context) {
   return output.Finish();
 }
 
-// Decides where entries go, by the options.
+// Chooses the destinations of entries, according to the options.
 class Places {
  public:
   Places(const ReadingOptions& options, const CommandContext& context, const OpenArchive& archive,

@@ -110,7 +110,7 @@ class BatchThread::Questions : public Prompts {
       : batch_(batch), thumbnails_(thumbnails) {}
   OverwriteAnswer AskOverwrite(const OverwriteQuestion& question) override {
     const auto make = [&] { return MakeOverwritePreview(question, kPreviewSide, thumbnails_); };
-    // what is going to be shown is made here, and what the user asks for then by the window
+    // enabled previews are made here; if enabled later, by the window
     OverwritePreview preview;
     if (question.checks.previews) preview = make();
     const OverwritePreviewMaker maker =

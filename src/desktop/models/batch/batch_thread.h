@@ -26,7 +26,7 @@ struct OverwritePreview {
 
 using OverwritePreviewMaker = std::function<OverwritePreview()>;
 
-// What a batch tells and asks its windows. Every call comes on the window's thread.
+// The windows of a batch. Always called on the window's thread.
 class BatchWindows {
  public:
   virtual ~BatchWindows() = default;
@@ -37,11 +37,11 @@ class BatchWindows {
   // Shows which file is being processed.
   virtual void BatchStatus(const std::string& status) = 0;
   virtual void BatchWork(const ProgressWork& work) = 0;
-  // The end: the box stays open to be read, or goes.
+  // The batch has ended: the box stays open, or closes.
   virtual void BatchStaysOpen(const ProgressModel& model) = 0;
   virtual void BatchCloses() = 0;
-  // The name of an output is taken. The batch waits for the answer. `makePreview` may be called on
-  // any thread until then, and takes as long as it takes.
+  // An output exists. The batch waits for the answer; until then, `makePreview` may be called on
+  // any thread. It may take long.
   virtual OverwriteAnswer AskOverwrite(const OverwriteQuestion& question,
                                        const OverwritePreviewMaker& makePreview) = 0;
   virtual NameAnswer AskDestinationName(const NameQuestion& question) = 0;
@@ -53,9 +53,9 @@ class BatchWindows {
   virtual void BatchEnded(Status status, const BatchJob& job) = 0;
 };
 
-// Runs a batch in the background; reports and prompts go to the windows with `post`, which must
-// run its argument on the window's thread, in order. The batch waits until a prompt is
-// answered.
+// Runs a batch in the background; reports and prompts go to the
+// windows with `post`, which must run its argument on the window's
+// thread, in order. The batch waits until a prompt is answered.
 class BatchThread {
  public:
   using Post = std::function<void(std::function<void()>)>;
@@ -68,11 +68,11 @@ class BatchThread {
   BatchThread(const BatchThread&) = delete;
   BatchThread& operator=(const BatchThread&) = delete;
 
-  // Starts RunBatch; must not be called while running. Sets `job.box` and
-  // `job.prompts`.
+  // Starts RunBatch; must not be called while
+  // running. Sets `job.box` and `job.prompts`.
   void Start(std::vector<BatchFile> files, BatchFunction function, BatchJob job);
-  // Any other work that reports to a box: `work` receives the job, with box and prompts
-  // set.
+  // Any other work that reports to a box: `work`
+  // receives the job, with box and prompts set.
   using Work = std::function<Status(BatchJob& job)>;
   void StartWork(BatchJob job, Work work);
   // Stops the batch after the current files.
@@ -96,8 +96,8 @@ class BatchThread {
   BackgroundTask task_;   // must be last: it uses the other members
 };
 
-// Previews of the existing file and of the new picture, which may be
-// missing.
+// Previews of the existing file and of
+// the new picture, which may be missing.
 OverwritePreview MakeOverwritePreview(const OverwriteQuestion& question, int32_t side,
                                       const ThumbnailOptions& options);
 

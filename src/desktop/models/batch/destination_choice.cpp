@@ -38,14 +38,13 @@ std::string ExistingFolder(std::string folder) {
   return folder;
 }
 
-// The number of a format in LastFormatSelected: its row, or one behind all rows for plug-in
-// formats.
+// A format's number in LastFormatSelected: its row; for plug-in formats, a number after all rows.
 int32_t NumberOf(const std::vector<DestinationFormat>& formats, size_t place) {
   if (formats[place].row != kSpareRow) return formats[place].row;
   return formatCount + static_cast<int32_t>(place);
 }
 
-// The outputs of a function get a comment, whatever else happens to the pictures.
+// Sets the comment of all outputs, in addition to other changes.
 void AddComment(const std::string& comment, BatchFunction& function) {
   if (comment.empty()) return;
   function.transform = [comment, change = function.transform](PictureRecord& picture) {
@@ -155,7 +154,7 @@ BatchFunction FunctionFor(const DestinationChoice& choice, const BatchJob& job) 
   if (!choice.step.empty() && ReadRecipe(choice.step, KeyTextInForce, *recipe).empty()) {
     function.history = FunctionOfFamily(recipe->First()->family);
     const FormatLookup none = [](const std::string&, int32_t&, std::string&) {
-      return std::string();  // the step names no format
+      return std::string();  // steps never name a format
     };
     (void)SetRecipe(recipe, std::string(settings.ExifCopyrightHolder.view()), job, none, function);
   }

@@ -17,8 +17,8 @@ struct DestinationFormat {
 };
 // All writable formats in registry order, plug-in formats last.
 std::vector<DestinationFormat> DestinationFormats();
-// Which of these formats, at least one, the step begins with: the last one used
-// (LastFormatSelected), or DefaultFileExtension if UseDefaultDestFormat is on or none was used yet.
+// The initial format of the step, given at least one: the last one used (LastFormatSelected), or
+// DefaultFileExtension if UseDefaultDestFormat is on or none was used yet.
 size_t FirstFormat(const std::vector<DestinationFormat>& formats);
 
 // The user's choices in the destination dialog.
@@ -28,20 +28,20 @@ struct DestinationChoice {
   bool reduce = true;  // reduce colors if the format supports fewer
   bool autoOrient = true;
   bool keepMetadata = true;
-  std::string comment = {};  // of all outputs; empty: each has that of its source
-  std::string step = {};     // of a recipe: applied to every picture; empty: none
+  std::string comment = {};  // of all outputs; empty: keep the source's comment
+  std::string step = {};     // a recipe step applied to every picture; empty: none
 };
 
-// The folders to offer, the last used first; `shown`, the folder of the browser, is the built-in
-// choice.
+// Recently used folders, latest first; `shown`,
+// the browser's folder, is the built-in choice.
 std::vector<std::string> RecentDestinations(const std::string& shown);
-// Keeps a choice for the next time: format, folder or none. DefaultFileExtension stays as it is.
+// Saves a choice for the next time: format and folder. Does not change DefaultFileExtension.
 void KeepChoice(const DestinationChoice& choice, const std::string& shown);
 
-// What the destination step asks for at a time.
+// The contents of one window of the destination step.
 enum class DestinationPart { Format, Folder, Both };
-// The parts to ask for, one after the other: both at once with DestinationWindowCombined; without
-// PromptForDestination no folder.
+// The parts to show, in order: both together with DestinationWindowCombined; no folder without
+// PromptForDestination.
 std::vector<DestinationPart> DestinationParts();
 
 // What is wrong with a choice, a sentence; empty if valid.

@@ -4,12 +4,12 @@
 
 namespace fotomill::desktop {
 
-// The field of the name prompt, which shows an output's name without its extension: that is the
-// format's, and is told beside the field.
+// The field of the name prompt shows an output's name without its extension, which is that of the
+// format and is shown beside the field.
 
-// What the field shows of a path: the name alone for a file of `folder`, folder and name otherwise.
+// The field's text for a path: only the name for a file in `folder`, otherwise folder and name.
 std::string NameInField(const std::string& path, const std::string& folder);
-// The path that a text of the field means. The extension may have been typed as well.
+// The path for the field's text, which may include the extension.
 std::string PathOfField(const std::string& text, const std::string& extension);
 
 }  // namespace fotomill::desktop

@@ -7,17 +7,17 @@
 
 namespace fotomill::desktop {
 
-// What the line below a progress box's list is made of.
+// Data for the status line of a progress box.
 struct ProgressFacts {
-  std::string status;  // the batch's own text, for batches that do not tell their work
+  std::string status;  // text of batches that do not report their work
   ProgressWork work = {};
-  double seconds = 0;     // since the batch began
+  double seconds = 0;     // since the start of the batch
   bool stopping = false;  // after Abort
   bool ended = false;
-  size_t waiting = 0;  // batches behind this one
+  size_t waiting = 0;  // number of queued batches
 };
-// "Processing file 3 of 12, 8 s left: beach.jpg"; what Abort waits for; the batch's text at the
-// end.
+// "Processing file 3 of 12, 8 s left: beach.jpg"; after Abort, what is still running; at the end,
+// the batch's text.
 std::string ProgressStatusLine(const ProgressFacts& facts);
 
 }  // namespace fotomill::desktop

@@ -38,7 +38,7 @@ class BrowserModel {
   void SetFacts(size_t item, const FolderItem& facts) { items_[item] = facts; }
   void UpdateOrder();  // sorts by current facts, keeping the selection
 
-  // Only lines whose name matches are shown; others are no longer selected.
+  // Shows only lines whose name matches; others are deselected.
   void SetFilter(const std::string& filter);
   const std::string& Filter() const { return filter_; }  // empty: show everything
 
@@ -91,8 +91,8 @@ class BrowserModel {
   std::string filter_;
   std::vector<FolderItem> items_;     // as listed
   std::vector<uint32_t> order_;       // all items in sorted order
-  std::vector<uint32_t> lines_;       // those that pass the filter
-  Selection selection_;               // over the lines
+  std::vector<uint32_t> lines_;       // items that pass the filter
+  Selection selection_;               // of lines
 };
 
 // Formats a size, translated: "740 bytes", "18.2 MB"; by choice::SizeMode.

@@ -9,8 +9,8 @@ namespace fotomill::desktop {
 // The visited folders of a tab, oldest first, and the current position.
 class FolderTrail {
  public:
-  // Goes to a new folder, discarding those ahead, and the oldest ones if there are too
-  // many.
+  // Goes to a new folder, discarding those ahead,
+  // and the oldest ones if there are too many.
   void Go(const std::string& folder);
   // Whether there is a folder `steps` back (negative) or ahead.
   bool CanStep(int steps) const {

@@ -15,8 +15,8 @@ struct Crumb {
   bool operator==(const Crumb&) const = default;
 };
 
-// The folders in an absolute path, from the root to the folder
-// itself.
+// The folders in an absolute path, from
+// the root to the folder itself.
 std::vector<Crumb> CrumbsOf(const std::string& folder);
 
 // Completions of a typed path, given the names in its folder: full paths in the same order, but

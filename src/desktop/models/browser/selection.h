@@ -16,12 +16,12 @@ class Selection {
  public:
   // A list of `count` lines, none selected.
   void Reset(size_t count);
-  // Replaces the list: `selected` for each line, focus and anchor (kNoLine:
-  // none).
+  // Replaces the list: `selected` for each
+  // line, focus and anchor (kNoLine: none).
   void Assign(std::vector<bool> selected, size_t focus, size_t anchor);
 
-  // Number of lines and of selected lines; focus and anchor may be
-  // kNoLine.
+  // Number of lines and of selected lines;
+  // focus and anchor may be kNoLine.
   size_t Count() const { return selected_.size(); }
   size_t SelectedCount() const { return selectedCount_; }  // at most Count
   // False beyond the last line.

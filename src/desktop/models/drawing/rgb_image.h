@@ -14,8 +14,8 @@ struct PictureRecord;
 
 namespace fotomill::desktop {
 
-// Pixels for windows: red, green, blue, top row first, no padding. Can be created on any
-// thread.
+// Pixels for windows: red, green, blue, top row
+// first, no padding. Can be created on any thread.
 struct RgbImage {
   int32_t width = 0, height = 0;
   std::vector<uint8_t> bytes;

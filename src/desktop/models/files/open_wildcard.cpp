@@ -12,7 +12,7 @@ std::string OpenWildcard() {
   std::string wildcard;
   for (const FilterPair& pair : OpenFileFilter()) {
     std::string description = Tr(pair.description);
-    std::ranges::replace(description, '|', ' ');  // a plug-in may have any text
+    std::ranges::replace(description, '|', ' ');  // the separator may occur in plug-in texts
     wildcard += (wildcard.empty() ? "" : "|") + description + "|" + pair.patterns + ";" +
                 LowerCase(pair.patterns);
   }

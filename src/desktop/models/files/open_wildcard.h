@@ -4,8 +4,8 @@
 
 namespace fotomill::desktop {
 
-// The open-file filter as file dialogs take it: descriptions and patterns, divided by "|". Patterns
-// match extensions in upper and in lower case.
+// The filter for open-file dialogs: descriptions and patterns, separated by "|". Patterns match
+// extensions in uppercase and lowercase.
 std::string OpenWildcard();
 
 }  // namespace fotomill::desktop

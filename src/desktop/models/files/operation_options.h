@@ -4,7 +4,7 @@
 
 namespace fotomill::desktop {
 
-// NumberedVariantMin, NumberedVariantMax and PrefixDuplicate, as they are now.
+// From the current NumberedVariantMin, NumberedVariantMax and PrefixDuplicate.
 FileOperationOptions FileOperationOptionsFromSettings();
 // How many operations can be undone: UndoLevels.
 size_t UndoLimitFromSettings();

@@ -12,8 +12,8 @@ namespace fotomill::desktop {
 std::string UriOf(std::string_view path);  // of an absolute path
 // For the type text/uri-list: lines end with CR LF.
 std::string UriList(std::span<const std::string> paths);
-// The absolute paths in a list. Comments, files of other hosts and other kinds of URIs are
-// ignored.
+// The absolute paths in a list. Comments, files of
+// other hosts and other kinds of URIs are ignored.
 std::vector<std::string> PathsOfUriList(std::string_view list);
 
 }  // namespace fotomill::desktop

@@ -40,8 +40,8 @@ class FileHistoryList {
   int32_t SortColumn() const { return column_; }
   bool Reversed() const { return reversed_; }
 
-  // Rows from 0 in display order; cell texts as displayed, with formatted dates and
-  // sizes.
+  // Rows from 0 in display order; cell texts as
+  // displayed, with formatted dates and sizes.
   size_t Count() const { return rows_.size(); }
   const HistoryRow& Row(size_t row) const { return rows_[row]; }
   std::string Cell(size_t row, size_t column) const;

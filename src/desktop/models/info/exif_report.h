@@ -21,21 +21,21 @@ struct ExifRow {
   std::string text;
 };
 
-// How a report is written.
+// Options of a report.
 struct ExifReportOptions {
   ExifTextOptions text = {};
-  std::optional<ExifPlace> home = {};  // distances are from here; none: they are not told
+  std::optional<ExifPlace> home = {};  // start of distances; none: no distances
   choice::DistanceUnit unit = choice::kMiles;
 };
-// The keys ExifShowTypes, ExifDefaultLocation and ExifDistinceUnits. For the main thread.
+// From the keys ExifShowTypes, ExifDefaultLocation and ExifDistinceUnits. Main thread only.
 ExifReportOptions ExifReportOptionsFromSettings();
 
-// The EXIF of one picture file as the viewer shows it.
+// The EXIF of a file, for the viewer.
 struct ExifReport {
   Status status = Status::Ok;
   // an error message if not everything can be shown; else empty
   std::string problem;
-  // those of the block, then what its GPS directory means: places, and how far they are
+  // the entries, then places and distances from the GPS directory
   std::vector<ExifRow> rows;
   // all lines as text, for copying, saving and printing
   std::string text;
@@ -43,7 +43,7 @@ struct ExifReport {
   std::vector<uint8_t> thumbnailBytes;  // as stored: a JPEG stream
 };
 
-// Reads and walks a file's EXIF block. Takes as long as the disk takes; any thread may call it.
+// Reads a file's EXIF block. May take long; any thread.
 ExifReport ReadExifReport(const std::string& path, const ExifReportOptions& options);
 
 }  // namespace fotomill::desktop

@@ -96,8 +96,8 @@ void AddPictureFacts(const PictureRecord& picture, const InfoOptions& options, F
   general.lines.push_back({Tr("Image data"), BytesText(picture.imageBytes)});
 }
 
-// Where a detail line of the form "Name: value" has its colon; npos in others, such as the cards of
-// an astronomical picture, whose values may hold colons.
+// Position of the colon in a detail line "Name: value"; npos for others, such as FITS cards, whose
+// values may contain colons.
 size_t ColonBehindLabel(std::string_view line) {
   const size_t colon = line.find(": ");
   if (colon == std::string_view::npos || colon == 0) return std::string_view::npos;
@@ -105,7 +105,7 @@ size_t ColonBehindLabel(std::string_view line) {
   return name.find_first_of("=\"'") == std::string_view::npos ? colon : std::string_view::npos;
 }
 
-// The lines that the codec tells. Those of the form "Name: value" are divided.
+// The lines from the codec, split if of the form "Name: value".
 InfoSection DetailsOf(const PictureRecord& picture) {
   InfoSection section{Tr(kDetailsTitle), {}};
   for (size_t i = 0; i < picture.detailLines.Count(); ++i) {
@@ -133,8 +133,7 @@ void AddExif(const std::string& path, const InfoOptions& options, FileInfo& info
   }
 }
 
-// How a value differs: every different one with the number of files that have it, the most frequent
-// first.
+// The distinct values with the number of files each, most frequent first.
 std::string SpreadOf(const std::map<std::string, size_t>& counts) {
   constexpr size_t kMost = 4;
   std::vector<std::pair<std::string, size_t>> values(counts.begin(), counts.end());

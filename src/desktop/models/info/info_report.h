@@ -45,8 +45,8 @@ struct FileInfo {
 // Reads a file's header and collects its facts; any thread.
 FileInfo ReadFileInfo(const std::string& path, const InfoOptions& options);
 
-// A summary of several files: totals, common values, and differing
-// ones.
+// A summary of several files: totals,
+// common values, and differing ones.
 std::vector<InfoSection> SummaryOf(std::span<const FileInfo> files);
 
 // Formats sections as text: titles, with indented lines "label: value".

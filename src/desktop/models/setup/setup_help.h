@@ -7,8 +7,8 @@
 
 namespace fotomill::desktop {
 
-// Documentation pages built into the program; docs/user/settings.md is in
-// settings/key_help.h.
+// Documentation pages built into the program;
+// docs/user/settings.md is in settings/key_help.h.
 extern const std::string_view kConfigurationPage;  // docs/user/configuration.md
 extern const std::string_view kDesktopPage;        // docs/user/desktop.md, the manual
 extern const std::string_view kFormatsPage;        // docs/user/formats.md
@@ -20,18 +20,18 @@ struct HelpText {
 };
 // The topic of the whole manual.
 inline constexpr std::string_view kManual = "desktop";
-// The topic of the page about formats, with the format list of Setup.
+// The topic of the formats page, for the format list in Setup.
 inline constexpr std::string_view kFormatsTopic = "formats";
-// The entry of a key, the part of the manual for a topic that a Help button names, or one of the
-// pages above; for anything else the page about the configuration as a whole.
+// The entry of a key, the part of the manual for a topic of a Help button, or one of the pages
+// above; for anything else, the configuration page.
 HelpText HelpOn(std::string_view topic);
 // Whether a key has an entry.
 bool HasHelpEntry(std::string_view key);
 
-// The numbers that a key takes, "0 to 100"; empty if it takes any.
+// The numbers a key accepts, "0 to 100"; empty if any.
 std::string LimitsText(const KeyRow& row);
-// The tip of a key's control: the first paragraph of its help, which is in English and left out in
-// other languages, and its name.
+// Tooltip of a key's control: the first paragraph of its help, if the language is English, and its
+// name.
 std::string ControlTip(const KeyRow& row);
 
 }  // namespace fotomill::desktop

@@ -6,8 +6,8 @@
 
 namespace fotomill::desktop {
 
-// The folders of recently closed tabs, at most TabHistoryMax, also of earlier
-// runs.
+// The folders of recently closed tabs, at
+// most TabHistoryMax, also of earlier runs.
 class ClosedTabs {
  public:
   // Loads the list of earlier runs. Add appends a folder and saves the list.

@@ -20,8 +20,8 @@ class Favorites {
   [[nodiscard]] bool Add(const std::string& folder);
   // False if the file cannot be written.
   [[nodiscard]] bool Remove(const std::string& folder);
-  // After a folder was renamed: updates it and its subfolders. True if any favorite was
-  // affected.
+  // After a folder was renamed: updates it and its
+  // subfolders. True if any favorite was affected.
   bool FollowRename(const std::string& from, const std::string& to);
 
  private:

@@ -15,9 +15,9 @@ struct ToolbarButton {
   bool operator==(const ToolbarButton&) const = default;
 };
 
-// Parses the order of buttons: one name per line, "-" before hidden
-// ones. Names not in `known` are ignored; missing ones are appended,
-// visible.
+// Parses the order of buttons: one name per line,
+// "-" before hidden ones. Names not in `known` are
+// ignored; missing ones are appended, visible.
 std::vector<ToolbarButton> ParseToolbar(std::string_view text, std::span<const std::string> known);
 
 // The user's choice, stored in the file "FMWToolbar.txt" in the data folder.

@@ -40,18 +40,18 @@ struct Thumbnail {
 // Shared between cache and windows; immutable.
 using ThumbnailPointer = std::shared_ptr<const Thumbnail>;
 
-// Loads a thumbnail: from LookUpThumbnail, drawn in view size; on dense screens from the
-// system's thumbnails, if allowed; else from the picture. The picture's facts are the
-// same in each case. May take long; called by workers. A stand-in request decodes no
-// picture: it returns the proper thumbnail if available, else the embedded one, else
-// null.
+// Loads a thumbnail: from LookUpThumbnail, drawn in view size; on dense
+// screens from the system's thumbnails, if allowed; else from the
+// picture. The picture's facts are the same in each case. May take long;
+// called by workers. A stand-in request decodes no picture: it returns
+// the proper thumbnail if available, else the embedded one, else null.
 ThumbnailPointer LoadThumbnail(const ThumbnailRequest& request);
 
 // Whether files of a format (a row of the registry) can have an embedded thumbnail.
 bool MayHoldThumbnail(int32_t format);
 
-// Writes records collected for databases; LoadThumbnail also does so from time to
-// time.
+// Writes records collected for databases;
+// LoadThumbnail also does so from time to time.
 void KeepThumbnailRecords();
 
 // Creates a picture's thumbnail record and writes its thumbnail file.

@@ -64,8 +64,8 @@ class ThumbnailCache {
   explicit ThumbnailCache(uint64_t capacity) : capacity_(capacity) {}  // bytes
   // Null if not cached, or cached for another state of the file or another size.
   ThumbnailPointer Find(const ThumbnailRequest& request);
-  // Any thumbnail of a path, regardless of state and size, to show until the right one is
-  // loaded.
+  // Any thumbnail of a path, regardless of state and
+  // size, to show until the right one is loaded.
   ThumbnailPointer FindAny(const std::string& path) const;
   // Adds or replaces the thumbnail of a path; may drop the least recently used ones.
   void Put(const ThumbnailRequest& request, ThumbnailPointer thumbnail);

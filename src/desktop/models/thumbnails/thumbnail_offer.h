@@ -28,8 +28,8 @@ class ThumbnailOffer : public std::enable_shared_from_this<ThumbnailOffer> {
   };
   static constexpr double kSilentSeconds = 0.5;  // delay before reporting progress of the search
 
-  // Starts the search. The object lives until its thread has ended, regardless of other
-  // references.
+  // Starts the search. The object lives until its
+  // thread has ended, regardless of other references.
   static std::shared_ptr<ThumbnailOffer> Start(ThumbnailBrowser browser, Events events,
                                                double silentSeconds = kSilentSeconds);
 

@@ -11,8 +11,8 @@
 
 namespace fotomill::desktop {
 
-// Compacts a thumbnail database on its own thread, for a window that shows the
-// progress.
+// Compacts a thumbnail database on its own
+// thread, for a window that shows the progress.
 class DatabaseCompaction : private ProgressSink {
  public:
   // Starts immediately; `purge` also drops thumbnails of missing pictures; with `hidden` the new
@@ -49,9 +49,9 @@ class DatabaseCompaction : private ProgressSink {
 // "1,234 records, 35.1 MB", or why it cannot be compacted.
 std::string DescribeDatabase(const std::string& path);
 
-// Orphaned thumbnail files in a folder, with `below` also in
-// subfolders. Skips optical drives and unreadable folders. Ends early
-// if stopped.
+// Orphaned thumbnail files in a folder, with
+// `below` also in subfolders. Skips optical drives
+// and unreadable folders. Ends early if stopped.
 std::vector<std::string> FindOrphanThumbnails(const std::string& folder, bool below,
                                               const StopToken& stop);
 // Deletes the files; returns those that could not be deleted.

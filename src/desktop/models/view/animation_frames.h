@@ -16,8 +16,8 @@ namespace fotomill::desktop {
 // bytes; otherwise those around the current one, decoding them again in each loop.
 class AnimationFrames {
  public:
-  // `wake` is called on a pool thread when the file was opened, or a frame was decoded or
-  // failed.
+  // `wake` is called on a pool thread when the file
+  // was opened, or a frame was decoded or failed.
   AnimationFrames(ViewRequest request, uint64_t capacity, std::function<void()> wake);
   ~AnimationFrames();
   AnimationFrames(const AnimationFrames&) = delete;
@@ -31,13 +31,13 @@ class AnimationFrames {
   int32_t DelayMs(size_t frame) const;  // duration of a frame; 0 if there is none
   int32_t Rounds() const;               // loop count, 0: endless
 
-  // Sets the frame on the screen; the following ones are decoded next. Initially the first
-  // one.
+  // Sets the frame on the screen; the following
+  // ones are decoded next. Initially the first one.
   void Want(size_t frame);
   // A frame if it is decoded, fitted to any window size.
   ViewPicturePointer Find(size_t frame) const;
-  // From now on, makes frames for a window of this size; those in memory are made
-  // again.
+  // From now on, makes frames for a window of
+  // this size; those in memory are made again.
   void Fit(int32_t width, int32_t height);
 
  private:

@@ -25,8 +25,8 @@ class AnimationPlayer {
   // The size that frames are decoded for, in pixels.
   void Fit(int32_t width, int32_t height) { frames_.Fit(width, height); }
 
-  // The frame to show at this time; null if not decoded yet. If called early, the current
-  // one.
+  // The frame to show at this time; null if not
+  // decoded yet. If called early, the current one.
   ViewPicturePointer At(double now);
   // Seconds until the next frame; negative if At does not advance by itself: paused, at the end, or
   // waiting for a frame.

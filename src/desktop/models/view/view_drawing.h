@@ -7,8 +7,8 @@
 
 namespace fotomill::desktop {
 
-// Pixels to draw, 24 bits, and their alpha plane, empty if all are
-// opaque.
+// Pixels to draw, 24 bits, and their
+// alpha plane, empty if all are opaque.
 struct ViewSource {
   const PackedImage& image;
   const PackedImage& alpha;

@@ -47,7 +47,7 @@ const ColorTransform& TransformOf(const std::vector<uint8_t>& profile) {
   return *transform;
 }
 
-// Hands on how far a file is, not too often.
+// Forwards decoding progress, at a limited rate.
 class ProgressReports : public ProgressSink {
  public:
   ProgressReports(const ViewLoader::Progress& report, const std::string& path)
@@ -61,7 +61,7 @@ class ProgressReports : public ProgressSink {
   }
 
  private:
-  static constexpr double kSeconds = 0.1;  // between two reports, and before the first
+  static constexpr double kSeconds = 0.1;  // between reports, and before the first one
 
   const ViewLoader::Progress& report_;
   const std::string& path_;

@@ -31,8 +31,8 @@ struct ViewLook {
 // requesting the first picture.
 void SetScreenProfile(std::vector<uint8_t> profile);
 
-// A picture for a view window: a page of a file, and the size of the window to
-// fit.
+// A picture for a view window: a page of a
+// file, and the size of the window to fit.
 struct ViewRequest {
   std::string path;
   int32_t page = 0;
@@ -57,7 +57,7 @@ struct ViewPicture {
   ViewRequest request;
   platform::FileFacts facts;  // of the file when it was read
   Status status = Status::Ok;
-  std::string problem;             // why there is no picture, for people; empty if Ok
+  std::string problem;             // error message; empty if Ok
   PicturePointer picture;          // null unless Ok
   // scaled to fit the request's window; empty if the picture is smaller
   ViewPixels fitted;
@@ -81,26 +81,26 @@ Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixe
 
 // Prepares a decoded picture for the request in `view`. Statuses of PrepareForDisplay.
 Status PrepareView(PicturePointer picture, ViewPicture& view);
-// Decodes and prepares a picture; never null, its status tells a failure. Any thread.
+// Decodes and prepares a picture; never null, its status may be a failure. Any thread.
 ViewPicturePointer LoadViewPicture(const ViewRequest& request, ProgressSink* progress = nullptr);
-// A turned copy of a picture that was loaded; null if there is no memory for it.
+// A turned copy of a loaded picture; null if out of memory.
 ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn);
 
 // Decodes pictures ahead in the background, and caches requested ones up to a number of bytes.
 class ViewLoader {
  public:
-  // How far a file is decoded, in percent, a few times a second at most.
+  // Decoding progress of a file, in percent, at most a few times a second.
   using Progress = std::function<void(const std::string& path, int percent)>;
-  // `wake` is called on a thread of the pool whenever a wanted picture is there, `progress` on the
-  // way to it.
+  // `wake` is called on a pool thread when a requested picture is ready, `progress` while decoding
+  // it.
   ViewLoader(uint64_t capacity, std::function<void()> wake, Progress progress = {});
-  ~ViewLoader() = default;  // waits for the picture that is decoded
+  ~ViewLoader() = default;  // waits for the running decode
   ViewLoader(const ViewLoader&) = delete;
   ViewLoader& operator=(const ViewLoader&) = delete;
 
-  // Sets the requested pictures, most urgent first. All others are
-  // dropped; those beyond the capacity are not decoded, except for the
-  // first one.
+  // Sets the requested pictures, most urgent first.
+  // All others are dropped; those beyond the capacity
+  // are not decoded, except for the first one.
   void Want(std::vector<ViewRequest> requests);
   // The picture for a request if it is loaded, fitted to any window size.
   ViewPicturePointer Find(const ViewRequest& request) const;

@@ -4,8 +4,8 @@
 
 namespace fotomill::desktop {
 
-// How the scale follows the window: fit the picture, fit its width, fill the window, or
-// fixed.
+// How the scale follows the window: fit the picture,
+// fit its width, fill the window, or fixed.
 enum class ZoomMode { Fit, FitWidth, Fill, Free };
 
 // Zoom and position relative to picture and window, to apply them to another picture.

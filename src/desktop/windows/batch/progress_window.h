@@ -32,8 +32,8 @@ class ProgressWindow : public wxFrame {
   };
   ProgressWindow(wxWindow* frame, ThumbnailService& thumbnails, Events events);
 
-  // Adds a line. `source` is the file of the line, for its thumbnail; may be
-  // empty.
+  // Adds a line. `source` is the file of the
+  // line, for its thumbnail; may be empty.
   void AddLine(const ProgressLine& line, const std::string& source);
   void SetStatus(const std::string& status);
   void SetWork(const ProgressWork& work);

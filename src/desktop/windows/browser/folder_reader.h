@@ -13,8 +13,8 @@ namespace fotomill::desktop {
 // Items with their index in the original list.
 using PlacedItems = std::vector<std::pair<size_t, FolderItem>>;
 
-// Reads a browser's folder in the background: its contents, and facts from the files'
-// headers.
+// Reads a browser's folder in the background: its
+// contents, and facts from the files' headers.
 class FolderReader {
  public:
   // Called on the window's thread, never after the reader is destroyed.
@@ -31,8 +31,8 @@ class FolderReader {
   void List(const std::string& folder, bool namesFirst);
   // Whether a listing is in progress.
   bool Listing() const { return listing_.Started(); }
-  // Reads the headers of items; results are delivered in batches. Stopped by the next
-  // listing.
+  // Reads the headers of items; results are delivered
+  // in batches. Stopped by the next listing.
   void ReadFacts(const std::string& folder, PlacedItems wanted);
   // Whether headers are being read.
   bool ReadingFacts() const { return facts_.Started(); }

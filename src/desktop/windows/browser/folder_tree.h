@@ -52,8 +52,8 @@ class FolderTree : public wxTreeCtrl {
   // Expands further toward the followed folder, as far as folders have been read.
   void FollowOn();
   wxTreeItemId FindChild(const wxTreeItemId& item, const std::string& folder) const;
-  // The item closest to a folder, starting at the top-level folder that contains
-  // it.
+  // The item closest to a folder, starting at
+  // the top-level folder that contains it.
   wxTreeItemId NearestItem(const std::string& folder) const;
   void ShowMenu(const wxTreeItemId& item, const wxPoint& point);
   void AskForName(const std::string& folder);

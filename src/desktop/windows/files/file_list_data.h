@@ -8,8 +8,8 @@
 
 namespace fotomill::desktop {
 
-// Files for clipboard and drag and drop. Unlike in the toolkit's class, names may be any
-// bytes.
+// Files for clipboard and drag and drop. Unlike
+// in the toolkit's class, names may be any bytes.
 class FileListData : public wxCustomDataObject {
  public:
   explicit FileListData(std::span<const std::string> paths = {});

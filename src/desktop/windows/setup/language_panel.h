@@ -14,8 +14,8 @@ class LanguagePanel : public wxPanel {
  public:
   explicit LanguagePanel(wxWindow* parent);
 
-  // Stores the choice. On the first change, a message says when it takes
-  // effect.
+  // Stores the choice. On the first change,
+  // a message says when it takes effect.
   void Store();
 
  private:

@@ -13,9 +13,9 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// A page of settings: a box per group, with a labeled control for each key, and marks
-// for keys that differ from their defaults. The caller binds the controls to the
-// settings.
+// A page of settings: a box per group, with a labeled control
+// for each key, and marks for keys that differ from their
+// defaults. The caller binds the controls to the settings.
 class SettingsPanel : public wxScrolledWindow {
  public:
   // `changed` is called after the user has changed a control. `above` is shown above the groups, if

@@ -15,8 +15,8 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
-// All settings: list of pages on the left, search field above, controls of one page on the
-// right.
+// All settings: list of pages on the left, search
+// field above, controls of one page on the right.
 class SetupBox : public wxDialog {
  public:
   // `applied` is called after settings have been changed and saved.

@@ -20,9 +20,9 @@ enum class Needs {
   ClosedTab,
 };
 
-// A command of the frame: menu item, toolbar button, keys, and function. To add a window, add a
-// row in commands.cpp. Menus and toolbar use the order of the rows; a row without text is a
-// separator.
+// A command of the frame: menu item, toolbar button, keys, and
+// function. To add a window, add a row in commands.cpp. Menus and
+// toolbar use the order of the rows; a row without text is a separator.
 struct Command {
   const char* menu;              // "&File"; all texts are in English
   const char* text;              // with mnemonic; null for a separator

@@ -6,8 +6,8 @@ namespace fotomill::desktop {
 
 class Shell;
 
-// Saves and restores the frame's size and tabs. Tabs can also be saved as named
-// sets.
+// Saves and restores the frame's size and
+// tabs. Tabs can also be saved as named sets.
 class FrameSession {
  public:
   explicit FrameSession(Shell& shell) : shell_(shell) {}
@@ -16,8 +16,8 @@ class FrameSession {
   void RestorePlace();
   // Opens the tabs of the last run, if enabled. False if there are none.
   bool RestoreTabs();
-  // Saves the tabs, or none, and the frame's size to the current set. False if that
-  // failed.
+  // Saves the tabs, or none, and the frame's size
+  // to the current set. False if that failed.
   [[nodiscard]] bool Keep(bool withTabs);
 
   // Asks for a name; the tabs are saved under it from then on.

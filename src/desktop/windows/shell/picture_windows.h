@@ -18,8 +18,8 @@ class PictureWindows {
  public:
   explicit PictureWindows(Shell& shell) : shell_(shell) {}
 
-  // Opens a view window for a file, with `list` as its neighbors. Deletes itself when
-  // closed.
+  // Opens a view window for a file, with `list`
+  // as its neighbors. Deletes itself when closed.
   ViewFrame& View(const std::vector<std::string>& list, const std::string& file);
   // Opens a view window for a file of the current browser: among the selected files if there are
   // several, else all shown ones. Sounds and videos are opened with their own program.

@@ -17,8 +17,8 @@ namespace fotomill::desktop {
 // background thread. The window chooses the picture.
 class ViewCanvas : public wxWindow {
  public:
-  // Callbacks to the window. Keys, right clicks and pointer movements are events of the
-  // canvas.
+  // Callbacks to the window. Keys, right clicks and
+  // pointer movements are events of the canvas.
   struct Events {
     std::function<void()> resized;           // pictures need another size
     std::function<void()> changed;           // another picture or zoom
@@ -40,8 +40,8 @@ class ViewCanvas : public wxWindow {
   // Shows an image as a stand-in for a picture of `width` by `height` until that is loaded.
   void ShowStandIn(PackedImage image, int32_t width, int32_t height);
   const ViewPicturePointer& Picture() const { return picture_; }  // null before the first one
-  // The next picture is a different one: resets zoom and position, unless ViewModeKeepZoom is
-  // on.
+  // The next picture is a different one: resets zoom
+  // and position, unless ViewModeKeepZoom is on.
   void StartAfresh();
   // Text lines on top of the picture; may be empty.
   void SetOverlay(const std::vector<std::string>& lines);

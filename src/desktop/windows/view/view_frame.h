@@ -18,8 +18,8 @@ class AnimationBar;
 class Shell;
 class ViewAnimation;
 
-// A view window: shows one picture at a time, and decodes its neighbors in the list
-// ahead.
+// A view window: shows one picture at a time,
+// and decodes its neighbors in the list ahead.
 class ViewFrame : public wxFrame {
  public:
   // Opens `file`; `list` contains it and its neighbors.
@@ -49,8 +49,8 @@ class ViewFrame : public wxFrame {
   void FilesChanged();
   // Calls `shown` once, when the first picture is shown or the window is closed.
   void WhenShown(std::function<void()> shown);
-  // Replaces the list of neighbors. False, with no change, if it does not contain the current
-  // file.
+  // Replaces the list of neighbors. False, with no
+  // change, if it does not contain the current file.
   bool UseList(const std::vector<std::string>& list);
   size_t LastPlace() const { return list_.size() - 1; }  // index in the list, from 0
   ViewCanvas& Canvas() { return *canvas_; }              // for zooming and moving

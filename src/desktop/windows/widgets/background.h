@@ -9,13 +9,13 @@
 
 namespace fotomill::desktop {
 
-// Background work for a window. When destroyed, stops running work and waits for
-// it.
+// Background work for a window. When destroyed,
+// stops running work and waits for it.
 class Background {
  public:
-  // Runs `work` in the background, then `done` on the window's thread, unless stopped: with
-  // MemoryAllocationError if the work ran out of memory, otherwise Ok. Stops running work
-  // first.
+  // Runs `work` in the background, then `done` on the window's
+  // thread, unless stopped: with MemoryAllocationError if the work
+  // ran out of memory, otherwise Ok. Stops running work first.
   void Start(wxEvtHandler& window, std::function<void(const StopToken& stop)> work,
              std::function<void(Status)> done) {
     Stop();

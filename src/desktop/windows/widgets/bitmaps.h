@@ -13,8 +13,8 @@ namespace fotomill::desktop {
 // image.
 wxBitmap BitmapOf(const RgbImage& image, double scale = 1);
 
-// A symbol by name, in the system's text color, 16 by 16 or any multiple. Empty if
-// unknown.
+// A symbol by name, in the system's text color,
+// 16 by 16 or any multiple. Empty if unknown.
 wxBitmapBundle Symbol(std::string_view name, int side = 16);
 
 }  // namespace fotomill::desktop

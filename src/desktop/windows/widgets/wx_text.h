@@ -22,8 +22,8 @@ inline std::string Utf8(const wxString& text) {
   return std::string(bytes.data(), bytes.length());
 }
 
-// A translated text, as from Tr and TrCount; arguments may also be
-// wxStrings.
+// A translated text, as from Tr and
+// TrCount; arguments may also be wxStrings.
 inline wxString Label(const char* text) { return wxString::FromUTF8(Tr(text)); }
 inline TextArgument LabelArgument(const wxString& text) { return Utf8(text); }
 template <typename Argument>
