@@ -8,15 +8,15 @@
 
 namespace fotomill {
 
-// What a program and its worker process share while the worker reads an archive. The worker fills
-// the block of an ArchiveExchange with records, tells the number of its bytes, and waits until
-// `taken` counts one more. A record is a RecordHead and `size` bytes:
+// Protocol between the program and the worker process that reads an archive. The worker fills the
+// block of an ArchiveExchange with records, sends the number of bytes, and waits until `taken` is
+// incremented. A record is a RecordHead and `size` bytes:
 //
 //   Entry   a RawEntry, then the name
 //   Data    bytes of the entry
 //   EndEntry, End   an ArchiveEnd, of the entry or of the archive
 
-// The worker's orders, in its request; the password's bytes follow.
+// The request to the worker; the password's bytes follow.
 struct ExchangeRequest {
   uint32_t mostEntries = 0;
   uint32_t data = 0;      // 0: headers only
@@ -33,7 +33,7 @@ inline constexpr uint32_t kMostWanted = 1'000'000;  // entries
 
 struct ArchiveExchange {
   std::atomic<uint32_t> taken{0};
-  uint8_t wanted[kMostWanted / 8] = {};  // a bit an entry, lowest first: its data are sent
+  uint8_t wanted[kMostWanted / 8] = {};  // one bit per entry, lowest first: send its data
   alignas(8) uint8_t block[kExchangeBlock] = {};
 };
 static_assert(std::atomic<uint32_t>::is_always_lock_free);

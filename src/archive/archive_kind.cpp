@@ -11,7 +11,7 @@ namespace {
 
 using namespace std::string_view_literals;
 
-// End of central directory: 22 bytes and a comment of at most 65,535.
+// End of central directory: 22 bytes and a comment of up to 65,535.
 constexpr uint64_t kEndSize = 22, kLongestComment = 65535;
 constexpr std::string_view kEnd = "PK\5\6"sv;
 constexpr uint16_t kSeeZip64 = 0xFFFF;
@@ -23,7 +23,7 @@ constexpr uint16_t kVolume4 = 0x0001, kLocked4 = 0x0080;
 constexpr uint64_t kMainHeader5 = 1, kEncryptionHeader5 = 4;
 constexpr uint64_t kExtraArea5 = 0x0001, kDataArea5 = 0x0002, kVolume5 = 0x0001;
 
-// A RAR 5 number: 7 bits a byte, lowest first, the top bit says that more follow.
+// A RAR 5 number: 7 bits per byte, lowest first; the top bit means that more follow.
 uint64_t Number5(ByteReader& bytes) {
   uint64_t value = 0;
   for (unsigned shift = 0; shift < 63; shift += 7) {

@@ -7,7 +7,7 @@
 
 namespace fotomill {
 
-// The functions of libarchive that the program uses, without their prefix "archive_".
+// The libarchive functions used, without their prefix "archive_".
 // clang-format off
 #define ARCHIVE_FUNCTIONS(FUNCTION) \
   FUNCTION(version_string) FUNCTION(error_string) FUNCTION(read_new) FUNCTION(read_free) \
@@ -25,10 +25,10 @@ namespace fotomill {
   FUNCTION(entry_set_mtime) FUNCTION(entry_set_filetype) FUNCTION(entry_set_perm)
 // clang-format on
 
-// libarchive, loaded when first needed: most runs of the program touch no archive.
+// libarchive, loaded on first use, as most runs do not need it.
 struct ArchiveLibrary {
   ArchiveLibrary();
-  bool Whole() const;  // whether it is installed, with all of these functions
+  bool Whole() const;  // installed, with all of these functions
 
   platform::SharedLibrary library;
 #define FUNCTION(name) decltype(::archive_##name)* name = nullptr;

@@ -1,6 +1,6 @@
-// Archives come from anywhere and are read by a library in C, so that happens in a worker process:
-// a crash costs the archive, not the program, and the worker can write no files. What the worker
-// sends is checked here like the contents of a file.
+// Archives are untrusted and read by a C library, so this is done in a worker process: a crash
+// affects the archive, not the program, and the worker cannot write files. Data from the worker is
+// validated like the contents of a file.
 #include "archive/archive_reader.h"
 
 #include <algorithm>
@@ -22,15 +22,15 @@ namespace fotomill {
 
 namespace {
 
-// CPU time; damaged data may keep the library busy
+// CPU time, as damaged data may keep the library busy
 constexpr unsigned kSecondsAtLeast = 60;
 constexpr uint64_t kBytesPerSecond = 1 << 20;  // of the archive
 
-// Takes the records of a worker.
+// Parses the records from a worker.
 class Records {
  public:
   virtual ~Records() = default;
-  // False ends the worker.
+  // Return false to end the worker.
   virtual bool Entry(const RawEntry& entry, std::string_view name) = 0;
   virtual bool Data(std::span<const uint8_t> bytes) = 0;
   virtual bool EndEntry(const ArchiveEnd& end) = 0;
@@ -46,7 +46,7 @@ class Records {
     }
     return true;
   }
-  bool ended = false;  // the worker has sent the archive's end
+  bool ended = false;  // the end of the archive was received
   ArchiveEnd archiveEnd;
 
  private:
@@ -112,7 +112,7 @@ ArchiveEnd Run(const ArchiveSource& source, bool data, uint64_t fileSize, Exchan
   return {Status::DamagedFile};
 }
 
-// Checks that the file can be opened, and makes the block.
+// Checks that the file can be opened, and creates the block.
 ArchiveEnd Prepare(const ArchiveSource& source, uint64_t& fileSize, ExchangeBlock& block) {
   platform::FileView file;
   if (!file.OpenHead(source.path.c_str(), 1)) return {Status::FileOpenError};
@@ -182,7 +182,7 @@ class Unpacker final : public Records {
     receiver_.End(next_ - 1, status_ != Status::Ok ? ArchiveEnd{status_} : end);
     return true;
   }
-  // What is left open when the worker has ended.
+  // Ends what is still open when the worker has exited.
   void Close(const ArchiveEnd& end) {
     if (std::exchange(open_, false)) receiver_.End(next_ - 1, end);
   }

@@ -12,7 +12,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr size_t kBlock = 64 * 1024;  // bytes read at once
+constexpr size_t kBlock = 64 * 1024;  // bytes per read
 
 struct Closer {
   void operator()(archive* a) const { LibArchive().read_free(a); }
@@ -32,7 +32,7 @@ class Walk {
       library.read_support_format_rar(reader.get());
       library.read_support_format_rar5(reader.get());
     } else {
-      // by the central directory, as other programs do
+      // uses the central directory, like other programs
       library.read_support_format_zip_seekable(reader.get());
     }
     if (!password.empty()) library.read_add_passphrase(reader.get(), password.c_str());
@@ -67,7 +67,7 @@ class Walk {
   }
 
   ArchiveEnd PassData(archive* reader, const RawEntry& raw) {
-    // the library would hand out the encrypted bytes
+    // the library would return encrypted bytes
     if (rar_ && raw.encrypted) return {Status::InvalidPassword, ArchiveTrouble::LockedRar};
     const bool empty = raw.sizeKnown && raw.size == 0;
     while (!empty) {
@@ -80,7 +80,7 @@ class Walk {
     return {};
   }
 
-  // The library tells most errors apart by their texts only.
+  // The library distinguishes most errors only by their texts.
   ArchiveEnd ErrorOf(archive* reader, bool encrypted) const {
     const char* const text = LibArchive().error_string(reader);
     const std::string_view error = text == nullptr ? "" : text;
@@ -92,8 +92,7 @@ class Walk {
                   : ArchiveEnd{Status::UnsupportedFormat, ArchiveTrouble::Method};
     }
     if (says("nsupported")) return {Status::UnsupportedFormat, ArchiveTrouble::Method};
-    // The old encryption detects only most of the wrong passwords by itself; with others the
-    // data do not unpack.
+    // The old encryption does not detect all wrong passwords; with the others, decompression fails.
     if (says("assphrase") || (encrypted && !passwordFits_))
       return {Status::InvalidPassword,
               hasPassword_ ? ArchiveTrouble::WrongPassword : ArchiveTrouble::NeedsPassword};
@@ -103,7 +102,7 @@ class Walk {
 
   const bool rar_, hasPassword_;
   ArchiveSink& sink_;
-  bool passwordFits_ = false;  // it has opened an entry
+  bool passwordFits_ = false;  // it has decrypted an entry
   std::array<uint8_t, kBlock> block_{};
 };
 

@@ -1,4 +1,4 @@
-// The side of the worker process; see archive_exchange.h.
+// The worker process; see archive_exchange.h.
 #include <algorithm>
 #include <chrono>
 #include <cstring>
@@ -20,7 +20,7 @@ class Sender final : public ArchiveSink {
       : exchange_(exchange), call_(call), data_(data) {}
 
   bool Entry(const RawEntry& entry, std::string_view name) override {
-    // a byte more than allowed shows that it is too long
+    // one byte more than allowed shows that it is too long
     name = name.substr(0, kLongestEntryName + 1);
     Put(RecordHead::Entry, {reinterpret_cast<const uint8_t*>(&entry), sizeof entry},
         {reinterpret_cast<const uint8_t*>(name.data()), name.size()});

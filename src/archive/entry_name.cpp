@@ -12,7 +12,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr size_t kLongestPart = 255;  // bytes, as file systems have it
+constexpr size_t kLongestPart = 255;  // limit of file systems, in bytes
 
 // The upper half of code page 437, from 0x80 (Unicode, mapping table CP437.TXT).
 constexpr std::u32string_view kCodePage437 =
@@ -21,7 +21,7 @@ constexpr std::u32string_view kCodePage437 =
     U"αßΓπΣσµτΦΘΩδ∞φε∩≡±≥≤⌠⌡÷≈°∙·√ⁿ²■\u00a0";
 static_assert(kCodePage437.size() == 128);
 
-// All of its characters are in the basic plane.
+// All characters are in the basic multilingual plane.
 void AppendUtf8(std::string& text, char32_t c) {
   if (c < 0x800) {
     text += static_cast<char>(0xC0 | c >> 6);

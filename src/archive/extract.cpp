@@ -11,7 +11,7 @@ namespace {
 
 class Extractor final : public EntryReceiver {
  public:
-  using Places = std::vector<ExtractPlace>;  // one an entry
+  using Places = std::vector<ExtractPlace>;  // one per entry
   Extractor(std::span<const ArchiveEntry> entries, const Places& places, const ExtractJob& job)
       : entries_(entries), places_(places), job_(job) {}
 

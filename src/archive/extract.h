@@ -11,27 +11,27 @@
 
 namespace fotomill {
 
-// Where an entry goes.
+// Destination of an entry.
 struct ExtractPlace {
   std::string path;
   platform::Existing existing = platform::Existing::Refuse;
-  // Called right before the file gets its name, to move the existing one out of the way; false
-  // keeps it.
+  // Called right before the file gets its name, to move an existing one out of the way; return
+  // false to keep that.
   std::function<bool()> makeWay = {};
 };
 
-// How entries are extracted.
+// Options for extracting entries.
 struct ExtractJob {
-  // The place of an entry; nullopt skips it. Asked for all entries before the first is extracted.
+  // Destination of an entry; nullopt skips it. Called for all entries before any extraction.
   std::function<std::optional<ExtractPlace>(const ArchiveEntry&)> place;
-  // After each wanted entry that was not skipped, with where it went.
+  // Called after each requested entry that was not skipped, with its destination.
   std::function<void(const ArchiveEntry&, const std::string& path, const ArchiveEnd&)> done;
-  bool keepTimes = true;  // files get the entries' modification times
+  bool keepTimes = true;  // set modification times from the entries
 };
 
-// Extracts the files whose place in `wanted` is true; refused entries and folders are left out.
-// Missing folders are created. A file appears under its name when it is complete and its checksum
-// was verified. Statuses of ReadArchive; entries' also ErrorCreatingFile and ErrorWritingFile.
+// Extracts the files marked in `wanted`, except refused entries and folders. Creates missing
+// folders. A file appears under its name when it is complete and its checksum has been verified.
+// Statuses of ReadArchive; for entries also ErrorCreatingFile and ErrorWritingFile.
 ArchiveEnd ExtractArchive(const ArchiveSource& source, std::span<const ArchiveEntry> entries,
                           std::vector<bool> wanted, const ExtractJob& job);
 

@@ -22,7 +22,7 @@ constexpr std::string_view kCompressed[] = {
     "wdp", "webm", "webp", "wmv",  "xlsx", "xz",   "zip", "zst"};
 static_assert(std::ranges::is_sorted(kCompressed));
 
-constexpr size_t kBlock = 1 << 20;  // bytes written at once
+constexpr size_t kBlock = 1 << 20;  // bytes per write
 constexpr int kPermissions = 0644;
 
 struct EntryCloser {
@@ -41,7 +41,7 @@ struct ZipWriter::State {
   ~State() {
     if (zip != nullptr) LibArchive().write_free(zip);
   }
-  platform::OutputFile file;  // outlives the library's state, which may write when it is freed
+  platform::OutputFile file;  // must outlive the library's state, which may write when freed
   archive* zip = nullptr;
   bool failed = false;
 };
@@ -86,7 +86,7 @@ Status ZipWriter::Add(const std::string& path, const std::string& name, const St
   library.entry_set_perm(entry.get(), kPermissions);
   library.entry_set_size(entry.get(), static_cast<la_int64_t>(file.FileSize()));
   library.entry_set_mtime(entry.get(), platform::FactsOf(path).modified, 0);
-  state_->failed = true;  // until it is complete
+  state_->failed = true;  // until complete
   if (IsStoredUnpacked(name)) {
     library.write_zip_set_compression_store(state_->zip);
   } else {

@@ -9,9 +9,9 @@
 
 namespace fotomill {
 
-// Writes a ZIP archive by libarchive: deflated, files of compressed formats stored; with a password
-// all contents are encrypted with AES-256 (WinZip's AE-2), names are not. The archive appears under
-// its name when it is complete.
+// Writes a ZIP archive with libarchive: files are deflated, or stored if their format is
+// compressed; with a password, all contents (not names) are encrypted with AES-256 (WinZip's AE-2).
+// The archive appears under its name when it is complete.
 class ZipWriter {
  public:
   ZipWriter();
@@ -19,14 +19,14 @@ class ZipWriter {
   ZipWriter(const ZipWriter&) = delete;
   ZipWriter& operator=(const ZipWriter&) = delete;
 
-  // Begins the archive. ErrorCreatingFile, FeatureDisabled without the library or without its
-  // encryption, InvalidPassword for one over 1,024 bytes or with a NUL.
+  // Starts the archive. ErrorCreatingFile; FeatureDisabled without the library or its encryption;
+  // InvalidPassword for more than 1,024 bytes or a NUL.
   Status Create(const std::string& path, const std::string& password);
-  // Adds a file under that name with its modification time. FileOpenError, FileReadError if it
-  // changed meanwhile, ErrorWritingFile, FunctionCancelled if `stop` was requested. After any but
-  // Ok and FileOpenError the archive cannot be finished.
+  // Adds a file with its modification time. FileOpenError; FileReadError if it was modified
+  // meanwhile, ErrorWritingFile, FunctionCancelled if `stop` was requested. After errors other than
+  // FileOpenError the archive cannot be finished.
   Status Add(const std::string& path, const std::string& name, const StopToken& stop);
-  // Gives the archive its name. Anything but Done leaves no archive.
+  // Commits the archive under its name. Anything but Done leaves no file.
   platform::CommitResult Finish(platform::Existing existing);
 
  private:
@@ -34,7 +34,7 @@ class ZipWriter {
   std::unique_ptr<State> state_;
 };
 
-// Whether a file of that name is stored as it is, since its format is compressed already.
+// Whether to store a file uncompressed, as its format is already compressed.
 bool IsStoredUnpacked(const std::string& name);
 
 }  // namespace fotomill

@@ -15,7 +15,7 @@ namespace fotomill {
 
 namespace {
 
-constexpr size_t kShortExtension = 3;  // longer extensions match by their first characters
+constexpr size_t kShortExtension = 3;  // longer extensions match by their first three characters
 
 // Visits the rows of all families, in order.
 template <typename Visit>
@@ -29,8 +29,8 @@ void ForEachRow(Visit visit) {
   }
 }
 
-// The row for an extension without its dot: an exact match, else one with the same first three
-// characters. Null if there is none.
+// The row for an extension without dot: an exact match, else one with the same first three
+// characters. Null if not found.
 const FormatEntry* RowOfExtension(std::string_view extension) {
   const FormatEntry *exact = nullptr, *similar = nullptr;
   ForEachRow([&](const FormatEntry& row) {
@@ -58,8 +58,8 @@ bool Takes(const FormatEntry& row, const ReadRequest& request) {
   return IsInnerRow(row) && picture != nullptr && row.info(*picture, request) == Status::Ok;
 }
 
-// The row that accepts the file, trying the longest matching signature first. Null if
-// there is none.
+// The row that accepts the file, trying the longest matching signature first. Null if there is
+// none.
 const FormatEntry* RowOfContents(std::span<const uint8_t> bytes, const ReadRequest& request) {
   std::vector<std::pair<size_t, const FormatEntry*>> fitting;
   ForEachRow([&](const FormatEntry& row) {
@@ -91,7 +91,7 @@ bool IsInnerRow(const FormatEntry& row) {
 Status CreateInnerFile(const ReadRequest& request, InnerFile& inner) {
   const FormatEntry* const named = InnerRowOfName(inner.name);
   if (named != nullptr && IsWrapper(*named)) return Status::UnsupportedFormat;
-  // Some codecs select variants by extension, so the file gets its row's.
+  // Some codecs select variants by extension, so use the row's extension.
   std::string ending(named == nullptr ? "" : ".");
   if (named != nullptr) ending += LowerCase(named->extension.view());
   if (!inner.file.Create(ending)) return Status::ErrorCreatingFile;

@@ -8,27 +8,27 @@
 
 namespace fotomill {
 
-// A picture file inside another file, on disk for its own row.
+// A picture file inside another file, in a temporary file for its own codec.
 struct InnerFile {
-  std::string name;  // as the outer file has it
+  std::string name;  // as stored in the outer file
   platform::TemporaryFile file;
   ReadRequest request = {};
   const FormatEntry* row = nullptr;
 };
 
 // The row of a built-in format for a name's extension: an exact match, else one with the same first
-// three characters. Null if there is none.
+// three characters. Null if not found.
 const FormatEntry* InnerRowOfName(std::string_view name);
-// Whether a row's files contain other files, so that it reads nothing inside another one.
+// Whether files of a row contain other files; those cannot be nested.
 bool IsWrapper(const FormatEntry& row);
-// Whether such a file can be read here.
+// Whether such a file can be an inner file.
 bool IsInnerRow(const FormatEntry& row);
 
-// Creates the temporary file for `inner.name`, empty. UnsupportedFormat for a wrapper,
+// Creates the empty temporary file for `inner.name`. UnsupportedFormat for a wrapper,
 // ErrorCreatingFile.
 Status CreateInnerFile(const ReadRequest& request, InnerFile& inner);
-// Finds its row once it is written, by its name or, if that fails, by its contents. FileOpenError,
-// UnsupportedFormat if no row can read it.
+// After writing the file, finds its row by name or, if that fails, by contents. FileOpenError,
+// UnsupportedFormat if no format can read it.
 Status FindInnerRow(InnerFile& inner);
 
 }  // namespace fotomill

@@ -2,7 +2,7 @@
 
 namespace fotomill::platform {
 
-// For its lifetime, C libraries on this thread treat names as UTF-8, whatever the user's locale.
+// While it exists, C libraries on this thread treat names as UTF-8, regardless of the locale.
 class Utf8Locale {
  public:
   Utf8Locale();

@@ -1,5 +1,5 @@
-// Pictures in archives: the page's entry is unpacked to a temporary file, which is then read by its
-// own row. The archive itself is read in a worker process; see archive/archive_reader.h.
+// Pictures in archives: a page's entry is unpacked to a temporary file, which is read by its own
+// format. The archive is read in a worker process; see archive/archive_reader.h.
 #include "formats/archive/archive_picture.h"
 
 #include <algorithm>
@@ -18,7 +18,7 @@ namespace fotomill {
 
 namespace {
 
-// Hidden files, and the folder of file attributes that macOS adds.
+// Hidden files, and the folder with file attributes added by macOS.
 bool IsHiddenEntry(std::string_view name) {
   return name.starts_with('.') || name.find("/.") != std::string_view::npos ||
          name.starts_with("__MACOSX/");
@@ -30,7 +30,7 @@ bool IsPicture(const ArchiveEntry& entry) {
   return row != nullptr && IsInnerRow(*row) && row->extension.view() != "TXT";
 }
 
-// The pictures' places among the entries, in natural order.
+// Indices of the entries that are pictures, in natural order.
 std::vector<size_t> PicturesOf(const std::vector<ArchiveEntry>& entries) {
   std::vector<size_t> pictures;
   for (size_t i = 0; i < entries.size(); ++i) {
@@ -42,7 +42,7 @@ std::vector<size_t> PicturesOf(const std::vector<ArchiveEntry>& entries) {
   return pictures;
 }
 
-// Writes the entry to the temporary file. No more than a codec could use.
+// Writes the entry to the temporary file, limited to what codecs can use.
 class Unpacked final : public EntryReceiver {
  public:
   explicit Unpacked(const std::string& path) : path_(path) {}
@@ -68,7 +68,7 @@ class Unpacked final : public EntryReceiver {
   uint64_t size_ = 0;
 };
 
-// Unpacks a page and finds its row.
+// Unpacks a page and finds its format.
 Status Unpack(const ReadRequest& request, int32_t& pages, InnerFile& inner) {
   const ArchiveSource source = {.path = request.fileName, .stop = request.stop};
   std::vector<ArchiveEntry> entries;
@@ -116,10 +116,10 @@ Status ArchivePictureRead(PictureRecord& picture, const ReadRequest& request) {
   InnerFile inner;
   int32_t pages = 0;
   if (const Status status = Unpack(request, pages, inner); status != Status::Ok) {
-    const ProgressScope progress(picture);  // otherwise the inner row has one
+    const ProgressScope progress(picture);  // otherwise the inner format has one
     return status;
   }
-  // each page is a file with facts of its own
+  // each page is a separate file
   RETURN_IF_BAD(inner.row->info(picture, inner.request));
   if ((inner.row->flags & FMT_RENDERED) == 0)
     RETURN_IF_BAD(inner.row->read(picture, inner.request));
