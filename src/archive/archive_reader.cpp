@@ -35,7 +35,7 @@ class Records {
   virtual bool Data(std::span<const uint8_t> bytes) = 0;
   virtual bool EndEntry(const ArchiveEnd& end) = 0;
 
-  // All records of a block.
+  // Parses all records in a block.
   bool Take(std::span<const uint8_t> block) {
     ByteReader bytes(block);
     while (bytes.Left() > 0) {

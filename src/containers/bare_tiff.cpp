@@ -98,7 +98,7 @@ class BareTiff {
     return number;
   }
   void Keep(uint64_t at, uint64_t size) { kept_.push_back({at, at + size}); }
-  // As far as the file goes: a directory may end with it, without a link.
+  // Limited to the file: a directory may end with it, without a link.
   void Drop(uint64_t at, uint64_t size) {
     dropped_.push_back({at, std::min<uint64_t>(at + size, file_.size())});
   }

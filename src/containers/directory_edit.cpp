@@ -375,7 +375,7 @@ class Editor {
   std::vector<Range> used_;
   uint64_t mappedNext_ = 0, mappedEntries_ = 0, pieces_ = 0;
   bool pointsBeyond_ = false;  // something refers to data past the end
-  bool shared_ = false;        // a directory is reached twice: nothing is changed in place
+  bool shared_ = false;        // a directory is reached twice: do not edit in place
 };
 
 }  // namespace

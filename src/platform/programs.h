@@ -17,8 +17,8 @@ struct Program {
 // The programs registered for a file by its name, the user's default first; without those that need
 // a terminal.
 std::vector<Program> ProgramsFor(const std::string& file);
-// The commands that open files, given by absolute paths, with a program, as argument vectors: one
-// for all files when it takes several, else one each. Empty when the program is gone.
+// The commands to open files, given by absolute paths, with a program, as argument vectors: one for
+// all files if it accepts several, else one per file. Empty if the program no longer exists.
 std::vector<std::vector<std::string>> CommandsFor(const Program& program,
                                                   const std::vector<std::string>& files);
 

@@ -66,8 +66,8 @@ struct ApartOrder {
   const char* task;  // its name in the table
   std::span<const uint8_t> request = {};
   std::span<const uint8_t> input = {};
-  // A regular file as the input, for files too large to copy; empty: `input`. The process can only
-  // read it, and a file that is truncated meanwhile breaks the task.
+  // A regular file as input, if it is too large to copy; empty: use `input`. Read-only for the
+  // process; if the file is truncated meanwhile, the task fails.
   std::string inputFile = {};
   SharedBlock& reply;
   // CPU time; the wall-clock limit is ten times this

@@ -54,7 +54,7 @@ std::string_view TakeLine(std::string_view& text) {
 bool IsReserved(std::string_view entry) { return entry == kDefaultEntry; }
 bool IsReserved(const RecentFile& file) { return IsReserved(file.path); }
 
-// Drops the last entries beyond `most`; the reserved one is not counted and stays.
+// Drops the last entries beyond `most`, not counting the reserved one, which is kept.
 template <typename Entry>
 void Limit(std::vector<Entry>& entries, size_t most) {
   std::vector<Entry> kept;
@@ -154,7 +154,7 @@ std::vector<std::string> OfferedEntries(HistoryList list, std::string_view built
   std::vector<std::string> entries = LoadHistoryList(list);
   if (std::ranges::find(entries, kDefaultEntry) == entries.end())
     entries.emplace_back(kDefaultEntry);
-  std::erase(entries, builtIn);  // it is offered once, where the reserved entry is
+  std::erase(entries, builtIn);  // offered only once, at the reserved entry's position
   std::ranges::replace(entries, std::string(kDefaultEntry), std::string(builtIn));
   std::erase(entries, "");
   return entries;

@@ -11,8 +11,8 @@ namespace fotomill {
 // line. A key limits the length of each. Changes are merged with those of other processes and
 // written atomically.
 
-// The entry, also used as the value of several text keys, for the built-in choice. It does not
-// count toward the length of a list and is never pushed out.
+// The entry for the built-in choice; also used as a value of several text keys. It does not count
+// toward the length of a list and is never dropped.
 inline constexpr std::string_view kDefaultEntry = "~~~DEFAULT~~~";
 
 // Each list with its file, the key for its length, and its contents.
@@ -26,8 +26,8 @@ enum class HistoryList {
 
 // The valid entries. Empty if the list is missing or cannot be read.
 std::vector<std::string> LoadHistoryList(HistoryList list);
-// The entries to offer, with `builtIn` in place of kDefaultEntry, or last if the list does not have
-// it. An empty `builtIn` is not offered.
+// The entries to offer, with kDefaultEntry replaced by `builtIn`, which comes last if the list has
+// no such entry. An empty `builtIn` is not offered.
 std::vector<std::string> OfferedEntries(HistoryList list, std::string_view builtIn);
 // Moves or adds an entry to the top. False if it cannot be stored in a line (it is empty, over 260
 // bytes or contains a line break or NUL) or the list cannot be written; the list is then unchanged.

@@ -14,17 +14,17 @@ struct CarryOver {
   std::vector<std::string> failed;  // could not be copied; may be retried
 };
 
-// Imports the data folder of the previous major version: copies its configuration file, under its
+// Imports the data folder of the previous major version: copies its configuration file, under the
 // new name, and the files of `kCarriedFiles`. Existing files are never overwritten, the old ones
-// stay in place, and each file is copied completely or not at all. Both folders may be the same.
-// Creates the new folder if there is something to copy.
+// are kept, and each file is copied completely or not at all. Both folders may be the same. Creates
+// the new folder if there is something to copy.
 CarryOver CarryOverDataFolder(const std::string& previous, const std::string& current);
 
-// The same for the data folder itself, which both versions share, if it has the previous version's
-// configuration file and none of this version; nullopt otherwise. To be called before the
-// configuration is loaded.
+// The same for the data folder if both versions share it and it has only the previous
+// version's configuration file; nullopt otherwise. Call before loading the
+// configuration.
 std::optional<CarryOver> CarryOverAtFirstStart();
-// The note about it for the user, a sentence.
+// A note about it for the user, a sentence.
 std::string CarryOverText(const CarryOver& carried);
 
 // The files to import; patterns are separated by semicolons.

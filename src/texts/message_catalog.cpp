@@ -18,10 +18,10 @@ namespace {
 //    4  4  revision; the major one, in the upper half, is 0
 //    8  4  number of messages
 //   12  4  offset of the table of messages: length and offset of each, sorted
-//   16  4  offset of the table of translations, alike
+//   16  4  offset of the table of translations, same layout
 //
-// Strings end in a zero byte that their length leaves out. A message with a plural is both forms
-// with a zero byte between. The empty message has the header.
+// Strings are NUL-terminated; the NUL is not counted in their length. A message with a plural
+// consists of both forms, separated by a NUL. The empty message is the header.
 constexpr uint32_t kMagic = 0x950412DE, kSwappedMagic = 0xDE120495;
 constexpr uint64_t kMostBytes = 64 << 20;
 
@@ -42,7 +42,7 @@ class PluralFormula {
     std::string_view sign;
     int level;  // higher binds tighter
   };
-  // Longer signs first.
+  // Longer operators first.
   static constexpr auto kOperators = std::to_array<Operator>({{"||", 1},
                                                               {"&&", 2},
                                                               {"==", 3},

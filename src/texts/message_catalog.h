@@ -7,8 +7,8 @@
 
 namespace fotomill {
 
-// The translated messages of one language, from a compiled catalog (.mo). The system's own reader
-// is not used: it depends on the locale, and on systems with only C.UTF-8 it translates nothing.
+// The translated messages of a language, from a compiled catalog (.mo). The system's reader is not
+// used, as it depends on the locale, and translates nothing on systems with only C.UTF-8.
 //
 // Source of the format and of plural formulas: GNU gettext manual, "The Format of GNU MO Files"
 // and "Additional functions for plural forms".
@@ -20,18 +20,18 @@ class MessageCatalog {
 
   // Reads a catalog; false if the file cannot be read or is damaged. Replaces earlier messages.
   bool Load(const std::string& path);
-  // The same from the bytes of a file.
+  // Parses a catalog in memory.
   bool Parse(std::string bytes);
 
-  // The translation of a message, zero-terminated and owned by the catalog. Null if there is none.
+  // The translation of a message, NUL-terminated and owned by the catalog. Null if there is none.
   const char* Find(std::string_view message) const;
-  // The form for a count of the message with the given singular. Null if there is none.
+  // The plural form for a count, of the message with this singular. Null if there is none.
   const char* FindPlural(std::string_view singular, uint64_t count) const;
 
  private:
   struct Message {
     std::string_view key;          // the message, or its singular form
-    std::string_view translation;  // all forms, separated by zero bytes
+    std::string_view translation;  // all forms, separated by NULs
   };
 
   std::string bytes_;

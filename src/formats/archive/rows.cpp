@@ -19,7 +19,7 @@ constexpr FormatLibrary kLibraries[] = {
 constexpr uint32_t kFlags =
     FMT_BITMAP | FMT_MULTI | FMT_PAGES | FMT_CONTAINER | FMT_LAYERED | FMT_SECONDARY | FMT_ARCHIVE;
 
-// The library is not loaded before an archive is opened, which would slow down every start.
+// Do not load the library before an archive is opened; that would slow down startup.
 int32_t Ready() { return 1; }
 
 constexpr FormatEntry Row(std::string_view extension, std::string_view description,

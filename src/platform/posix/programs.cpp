@@ -18,7 +18,7 @@ struct Releaser {
 template <typename T>
 using Owned = std::unique_ptr<T, Releaser>;
 
-// The words of an entry's Exec line, with their field codes.
+// The words of an entry's Exec line, including field codes.
 std::vector<std::string> ExecWords(GDesktopAppInfo* info) {
   const char* const line = g_app_info_get_commandline(G_APP_INFO(info));
   int count = 0;
@@ -29,8 +29,8 @@ std::vector<std::string> ExecWords(GDesktopAppInfo* info) {
   return words;
 }
 
-// A word with its field codes replaced, as the Desktop Entry Specification says. URLs are given as
-// paths, which programs that take URLs accept as well.
+// Expands the field codes in a word, according to the Desktop Entry Specification. URLs are passed
+// as paths, which programs accept as well.
 std::string ExpandWord(const std::string& word, const Program& program, const std::string& file) {
   std::string expanded;
   for (size_t i = 0; i < word.size(); ++i) {
@@ -43,7 +43,7 @@ std::string ExpandWord(const std::string& word, const Program& program, const st
       case 'f':
       case 'u': expanded += file; break;
       case 'c': expanded += program.name; break;
-      default: break;  // icon, entry file and codes no longer in use
+      default: break;  // icon, entry file and deprecated codes
     }
   }
   return expanded;

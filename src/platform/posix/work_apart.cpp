@@ -267,14 +267,14 @@ bool StartProcess(Process& process) {
   return started;
 }
 
-// The input of a process: a copy in memory, or an open file. A handle of -1: there is none.
+// The input of a process: a copy in memory, or an open file. Handle -1: none.
 struct Input {
   SharedBlock block;
   Handle file;
   uint64_t size = 0;
   intptr_t SystemHandle() const { return file.IsOpen() ? file.Number() : block.SystemHandle(); }
 
-  // False if memory runs out, or the file is not a regular one that can be read.
+  // False if memory runs out, or if it is not a readable regular file.
   bool Take(const ApartOrder& order) {
     if (!order.inputFile.empty()) {
       file.Reset(open(order.inputFile.c_str(), O_RDONLY | O_CLOEXEC | O_NONBLOCK));

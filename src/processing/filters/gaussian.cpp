@@ -303,7 +303,7 @@ Status FilterPicture(PictureRecord& picture, double sigma, const GaussianPlace& 
     if (!block.Allocate(rows.Stride() * sizeof(int16_t))) return Status::MemoryAllocationError;
     int16_t* samples = block.Items<int16_t>().data();
     for (int32_t y = first; y < end; ++y) {
-      if (!work.GoesOn()) return Status::FunctionCancelled;  // a band of a wide blur takes long
+      if (!work.GoesOn()) return Status::FunctionCancelled;  // bands of a wide blur take long
       rows.Row(y, samples);
       if (finish) finish(y, samples);
       if (plan.alpha != nullptr) {

@@ -85,7 +85,7 @@ class BatchThread::Box : public ProgressBox {
     work_ = work;
     batch_.PostToWindows([&windows = batch_.windows_, work] { windows.BatchWork(work); });
   }
-  // What is reported follows what is done; batches without work to tell report only that.
+  // Never decreases progress; batches that do not report their work only call this.
   void ShowProgress(uint32_t done, uint32_t count) override {
     work_.done = std::max(work_.done, done);
     work_.count = count;
