@@ -154,7 +154,18 @@ TEST_F(ArchiveReader, WritesAllOrNothing) {
   EXPECT_GT(faults, 2);
 }
 
-// The same for extracting.
+TEST_F(ArchiveReader, FinishesNoArchiveWithPartOfAFile) {
+  WriteText(folder.Path("a"), "contents");
+  const StopSource stop;
+  stop.Stop();
+  ZipWriter zip;
+  ASSERT_EQ(zip.Create(folder.Path("x.zip"), ""), Status::Ok);
+  EXPECT_EQ(zip.Add(folder.Path("a"), "a", stop.Token()), Status::FunctionCancelled);
+  EXPECT_EQ(zip.Finish(platform::Existing::Refuse), platform::CommitResult::Failed);
+  EXPECT_FALSE(platform::FileExists(folder.Path("x.zip")));
+}
+
+// Extracting is all or nothing as well.
 TEST_F(ArchiveReader, ExtractsAllOrNothing) {
   const ArchiveSource source = {Archive(folder, {std::string(300'000, 'x')})};
   const std::string target = folder.Path("out");
