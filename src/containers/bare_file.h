@@ -32,7 +32,8 @@ Status MakeBarePng(std::span<const uint8_t> file, std::vector<uint8_t>& bare);
 Status MakeBareWebp(std::span<const uint8_t> file, std::vector<uint8_t>& bare);
 // Directories and values keep their offsets, and removed ones are overwritten with zeros; the file
 // is truncated after the last byte in use. The orientation is kept, as it is part of the picture's
-// own directory. Also for HD Photo.
+// own directory. Also for HD Photo. UnsuitableImage (13) for camera raw pictures, which cannot be
+// decoded without their metadata.
 Status MakeBareTiff(std::span<const uint8_t> file, std::vector<uint8_t>& bare);
 
 // As above, with options; a JPEG file as parts of the old one, which must outlive them.

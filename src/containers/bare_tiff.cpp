@@ -2,6 +2,7 @@
 // place, and whatever is no longer referenced is zeroed.
 // Source: Adobe, "TIFF Revision 6.0" (1992); the libtiff project, "The BigTIFF Design".
 #include <algorithm>
+#include <string_view>
 #include <unordered_set>
 
 #include "containers/bare_file.h"
@@ -35,6 +36,9 @@ constexpr uint32_t kFirstJpegTables = 519, kLastJpegTables = 521;
 constexpr uint64_t kMostJpegTable = 16 + 256;
 constexpr uint32_t kExif = 34665, kGps = 34853, kInteroperability = 40965;
 constexpr uint8_t kTypeBytes[] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8, 4, 8, 4, 0, 0, 8, 8, 8};
+// Camera raw files need private tags and the maker note to be decoded.
+constexpr uint32_t kPhotometric = 262, kDngVersion = 50706;
+constexpr std::string_view kCr2 = "CR";
 constexpr int32_t kDeepest = 4;            // nesting depth of directories
 constexpr uint64_t kMostPieces = 1 << 23;  // strips and tiles of all pages
 
@@ -73,6 +77,8 @@ class BareTiff {
     const bool hdPhoto = version == 0x01BC && !bigEndian_;
     if (version != 42 && version != 43 && !hdPhoto) return Status::DamagedFile;
     wide_ = version == 43;
+    if (ByteReader(file_.subspan(std::min<size_t>(8, file_.size()))).Match(kCr2))
+      return Status::UnsuitableImage;
     bare_.assign(file_.begin(), file_.end());
     const uint64_t first = wide_ ? 8 : 4;
     Keep(0, first + Word());
@@ -141,6 +147,8 @@ class BareTiff {
   Status TakeDirectory(uint64_t at, int32_t depth) {
     std::vector<Entry> entries;
     RETURN_IF_BAD(ReadEntries(at, entries));
+    if (std::ranges::any_of(entries, [&](const Entry& entry) { return IsRaw(entry); }))
+      return Status::UnsuitableImage;
     if (!Holds(next_, Word())) return Status::FileReadError;
     const uint64_t end = next_, following = Number(next_, Word());
     uint64_t target = at + CountBytes();  // where the next kept entry goes
@@ -163,6 +171,14 @@ class BareTiff {
     RETURN_IF_BAD(TakeSubDirectories(entries, depth));
     next_ = end;
     return Status::Ok;
+  }
+
+  bool IsRaw(const Entry& entry) const {
+    constexpr uint64_t kColorFilters = 32803, kLinearRaw = 34892;
+    if (entry.tag == kDngVersion) return true;
+    if (entry.tag != kPhotometric || entry.count != 1 || entry.outside) return false;
+    const uint64_t kind = NumberOf(entry, 0);
+    return kind == kColorFilters || kind == kLinearRaw;
   }
 
   void PutNumber(uint64_t at, uint64_t number, uint64_t size) {
@@ -225,6 +241,8 @@ class BareTiff {
     for (const Entry& entry : entries) {
       if (entry.tag != kSubDirectories || entry.size == 0) continue;
       if (depth >= kDeepest) return Status::DamagedFile;
+      pieces_ += entry.count;
+      if (pieces_ > kMostPieces) return Status::DamagedFile;
       for (uint64_t i = 0; i < entry.count; ++i)
         RETURN_IF_BAD(TakeChain(NumberOf(entry, i), depth + 1));
     }

@@ -3,6 +3,7 @@
 #include "containers/directory_edit.h"
 
 #include <algorithm>
+#include <iterator>
 #include <unordered_set>
 
 #include "core/limits.h"
@@ -30,6 +31,7 @@ constexpr struct {
 
 struct Range {
   uint64_t begin, end;
+  auto operator<=>(const Range&) const = default;
 };
 
 struct Entry {
@@ -57,10 +59,7 @@ class Editor {
   Status Run(std::span<const DirectoryChange> changes) {
     edit_ = {};
     if (!ReadHeader()) return Damaged();
-    for (uint64_t at = Number(firstAt_, Word()); at != 0;) {
-      if (!Map(at, 0)) break;
-      at = mappedNext_;
-    }
+    MapAll();
     Directory first;
     if (!ReadDirectory(Number(firstAt_, Word()), first)) return Damaged();
     RETURN_IF_BAD(EditSub(kExifPointer, ExifPlace::Exif, changes, first));
@@ -72,16 +71,30 @@ class Editor {
       const uint64_t at = Place(first, true);
       if (at != first.at) Patch(firstAt_, Bytes(at, Word()));
     }
+    RETURN_IF_BAD(ClearFurther(changes, first.at));
+    EraseReleased();
     std::ranges::sort(edit_.patches, {}, &DirectoryEdit::Patch::at);
+    // directories that lead to each other
+    const auto overlap = [](const DirectoryEdit::Patch& a, const DirectoryEdit::Patch& b) {
+      return a.at + a.bytes.size() > b.at;
+    };
+    if (std::ranges::adjacent_find(edit_.patches, overlap) != edit_.patches.end()) return Damaged();
     return CheckGrowth();
   }
 
-  DirectoryValue Find(uint16_t tag) {
-    Directory first;
-    if (!ReadHeader() || !ReadDirectory(Number(firstAt_, Word()), first)) return {};
-    const auto found = std::ranges::find(first.entries, tag, &Entry::tag);
-    if (found == first.entries.end() || !Holds(found->value, found->size)) return {};
-    return {found->type, file_.subspan(found->value, found->size)};
+  std::vector<DirectoryValue> FindAll(uint16_t tag) {
+    std::vector<DirectoryValue> values;
+    if (!ReadHeader()) return values;
+    MapAll();
+    for (const uint64_t at : visited_) {
+      Directory directory;
+      if (!ReadDirectory(at, directory)) continue;
+      for (const Entry& entry : directory.entries) {
+        if (entry.tag == tag && Holds(entry.value, entry.size))
+          values.push_back({entry.type, file_.subspan(entry.value, entry.size)});
+      }
+    }
+    return values;
   }
 
  private:
@@ -164,6 +177,16 @@ class Editor {
     return entry;
   }
 
+  void MapAll() {
+    for (uint64_t at = Number(firstAt_, Word()); at != 0 && Map(at, 0);) at = mappedNext_;
+    for (const Range& range : used_) {
+      begins_.push_back(range.begin);
+      ends_.push_back(range.end);
+    }
+    std::ranges::sort(begins_);
+    std::ranges::sort(ends_);
+  }
+
   // Records the ranges of the file used by a directory and its subdirectories. False if it was
   // already visited, or is not entirely within the file.
   bool Map(uint64_t at, int32_t depth) {
@@ -176,6 +199,7 @@ class Editor {
     used_.push_back({at, directory.oldEnd});
     for (const Entry& entry : directory.entries) {
       if (entry.outside) Use(entry.value, entry.size);
+      if (entry.tag == kGpsPointer) withGps_.push_back(at);
       MapBelow(entry, depth);
     }
     for (const auto& tags : kDataTags) MapData(directory, tags.offsets, tags.sizes);
@@ -187,7 +211,7 @@ class Editor {
     const bool leads = entry.tag == kExifPointer || entry.tag == kGpsPointer ||
                        entry.tag == kInteroperabilityPointer || entry.tag == kSubDirectories;
     if (!leads || depth >= kDeepest || entry.size == 0 || !Holds(entry.value, entry.size)) return;
-    for (uint64_t i = 0; i < entry.count; ++i) {
+    for (uint64_t i = 0; i < entry.count && pieces_ < kMostPieces; ++i, ++pieces_) {
       uint64_t at = NumberOf(entry, i);
       // subdirectories of a page may be chained; others are not
       while (at != 0 && Map(at, depth + 1)) at = entry.tag == kSubDirectories ? mappedNext_ : 0;
@@ -220,23 +244,37 @@ class Editor {
 
   // Whether a range has only one user.
   bool Exclusive(const Range& range) const {
-    const auto overlaps = [&](const Range& other) {
-      return other.begin < range.end && range.begin < other.end;
-    };
-    return !shared_ && range.end <= file_.size() && pieces_ < kMostPieces &&
-           std::ranges::count_if(used_, overlaps) == 1;
+    const auto begun = std::ranges::lower_bound(begins_, range.end) - begins_.begin();
+    const auto ended = std::ranges::upper_bound(ends_, range.begin) - ends_.begin();
+    return !shared_ && range.end <= file_.size() && pieces_ < kMostPieces && begun - ended == 1;
   }
 
   void Patch(uint64_t at, std::vector<uint8_t> bytes) {
     edit_.patches.push_back({at, std::move(bytes)});
   }
-  void Erase(const Range& range) {
-    if (range.begin < range.end && Exclusive(range))
-      Patch(range.begin, std::vector<uint8_t>(range.end - range.begin));
-  }
-  void EraseValue(const Entry& entry) {
+  void ReleaseValue(const Entry& entry) {
     if (entry.outside && Holds(entry.value, entry.size))
-      Erase({entry.value, entry.value + entry.size});
+      released_.push_back({entry.value, entry.value + entry.size});
+  }
+  // Zeroes the released ranges, except for bytes that something else still uses.
+  void EraseReleased() {
+    if (shared_ || pieces_ >= kMostPieces) return;
+    std::ranges::sort(used_);
+    std::ranges::sort(released_);
+    std::vector<Range> kept;
+    std::ranges::set_difference(used_, released_, std::back_inserter(kept));
+    auto next = kept.begin();
+    uint64_t at = 0, keptEnd = 0;
+    for (const Range& range : released_) {
+      at = std::max(at, range.begin);
+      while (at < range.end) {
+        for (; next != kept.end() && next->begin <= at; ++next)
+          keptEnd = std::max(keptEnd, next->end);
+        const uint64_t end = next == kept.end() ? range.end : std::min(range.end, next->begin);
+        if (keptEnd <= at) Patch(at, std::vector<uint8_t>(end - at));
+        at = std::max(keptEnd, end);
+      }
+    }
   }
 
   // Appends bytes at an even offset, which is returned.
@@ -253,10 +291,19 @@ class Editor {
     if (!change.entry) {
       const auto goes = [&](const Entry& entry) { return change.all || entry.tag == change.tag; };
       for (const Entry& entry : entries) {
-        if (goes(entry)) EraseValue(entry);
+        if (goes(entry)) ReleaseValue(entry);
       }
       directory.dirty = std::erase_if(entries, goes) > 0 || directory.dirty;
       return;
+    }
+    if (found != entries.end()) {
+      // damaged directories have some twice
+      const auto again =
+          std::stable_partition(std::next(found), entries.end(),
+                                [&](const Entry& entry) { return entry.tag != change.tag; });
+      std::for_each(again, entries.end(), [&](const Entry& entry) { ReleaseValue(entry); });
+      directory.dirty = directory.dirty || again != entries.end();
+      entries.erase(again, entries.end());
     }
     std::vector<uint8_t> values = change.entry->value;
     if (bigEndian_) SwapExifNumbers(change.entry->type, values);
@@ -283,7 +330,7 @@ class Editor {
       values.resize(target.size);
       Patch(target.value, std::move(values));
     } else {
-      EraseValue(target);
+      ReleaseValue(target);
       if (values.size() > Word()) values = Bytes(Append(values), Word());
       values.resize(Word());
       target.field = std::move(values);
@@ -314,7 +361,7 @@ class Editor {
   uint64_t Place(const Directory& directory, bool needed) {
     const Range old{directory.at, directory.oldEnd};
     if (directory.entries.empty() && !needed) {
-      Erase(old);
+      released_.push_back(old);
       return 0;
     }
     std::vector<uint8_t> bytes = Laid(directory);
@@ -323,7 +370,7 @@ class Editor {
       Patch(old.begin, std::move(bytes));
       return directory.at;
     }
-    if (directory.at != 0) Erase(old);
+    if (directory.at != 0) released_.push_back(old);
     return Append(bytes);
   }
 
@@ -353,6 +400,29 @@ class Editor {
     return Status::Ok;
   }
 
+  // Removes the GPS directories of pages and thumbnails after the first directory, if all of its
+  // own go.
+  Status ClearFurther(std::span<const DirectoryChange> changes, uint64_t firstAt) {
+    const auto clears = [](const DirectoryChange& change) {
+      return change.all && change.place == ExifPlace::Gps;
+    };
+    const auto change = std::ranges::find_if(changes, clears);
+    if (change == changes.end()) return Status::Ok;
+    std::ranges::sort(withGps_);
+    const auto again = std::ranges::unique(withGps_);
+    withGps_.erase(again.begin(), again.end());
+    for (const uint64_t at : withGps_) {
+      if (at == firstAt) continue;
+      Directory page;
+      if (!ReadDirectory(at, page)) return Damaged();
+      RETURN_IF_BAD(EditSub(kGpsPointer, ExifPlace::Gps, {&*change, 1}, page));
+      if (!page.dirty || Place(page, true) == at) continue;
+      reason_ = Tr("The place shares its bytes with other values.");
+      return Status::UnsuitableImage;
+    }
+    return Status::Ok;
+  }
+
   Status CheckGrowth() {
     if (edit_.tail.empty()) return Status::Ok;
     if (pointsBeyond_) {
@@ -372,7 +442,10 @@ class Editor {
   bool bigEndian_ = false, wide_ = false;
   uint64_t firstAt_ = 4;  // position of the first directory's offset
   std::unordered_set<uint64_t> visited_;
-  std::vector<Range> used_;
+  std::vector<Range> used_;              // one for each user of some bytes
+  std::vector<uint64_t> begins_, ends_;  // of the used ranges, each sorted
+  std::vector<Range> released_;          // used so far, by what was removed or moved
+  std::vector<uint64_t> withGps_;        // directories that lead to a GPS directory
   uint64_t mappedNext_ = 0, mappedEntries_ = 0, pieces_ = 0;
   bool pointsBeyond_ = false;  // something refers to data past the end
   bool shared_ = false;        // a directory is reached twice: do not edit in place
@@ -393,10 +466,10 @@ Status EditDirectories(std::span<const uint8_t> file, std::span<const DirectoryC
   return Editor(file, edit, reason).Run(changes);
 }
 
-DirectoryValue FindDirectoryValue(std::span<const uint8_t> file, uint16_t tag) {
+std::vector<DirectoryValue> FindDirectoryValues(std::span<const uint8_t> file, uint16_t tag) {
   DirectoryEdit edit;
   std::string reason;
-  return Editor(file, edit, reason).Find(tag);
+  return Editor(file, edit, reason).FindAll(tag);
 }
 
 void AddEdited(std::span<const uint8_t> file, DirectoryEdit edit, FilePieces& pieces) {

@@ -27,7 +27,8 @@ struct DirectoryChange {
   ExifPlace place = ExifPlace::First;
   uint16_t tag = 0;
   std::optional<ExifEntry> entry = {};  // none: remove the tag
-  bool all = false;                     // remove the whole directory, ignoring the tag
+  // remove the whole directory, ignoring the tag; GPS: those of all pages
+  bool all = false;
 };
 
 // The resulting changes to the file.
@@ -51,13 +52,13 @@ Status EditDirectories(std::span<const uint8_t> file, std::span<const DirectoryC
 void AddEdited(std::span<const uint8_t> file, DirectoryEdit edit, FilePieces& pieces);
 std::vector<uint8_t> EditedBlock(std::span<const uint8_t> block, DirectoryEdit edit);
 
-// The values of an entry in a structure's first directory, as stored; empty if it does not exist or
-// is beyond the end of the file.
+// The values of the entries with a tag in all directories, as stored, in no particular order. Those
+// beyond the end of the file are left out.
 struct DirectoryValue {
   uint16_t type = 0;
   std::span<const uint8_t> bytes = {};
 };
-DirectoryValue FindDirectoryValue(std::span<const uint8_t> file, uint16_t tag);
+std::vector<DirectoryValue> FindDirectoryValues(std::span<const uint8_t> file, uint16_t tag);
 
 // Swaps the byte order of the numbers in values of a type.
 void SwapExifNumbers(uint16_t type, std::span<uint8_t> values);

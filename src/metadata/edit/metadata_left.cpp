@@ -126,13 +126,11 @@ void LookIntoDirectory(std::span<const uint8_t> file, Found& found) {
   constexpr struct {
     uint16_t tag;
     const char* name;
-  } kTags[] = {{700, kXmpName},
-               {33723, kIptcName},
-               {34377, kIptcName},
-               {34675, kProfileName},
-               {0xBC02, kOrientationName}};
+  } kTags[] = {{700, kXmpName},       {33723, kIptcName},         {34377, kIptcName},
+               {34675, kProfileName}, {0xBC02, kOrientationName}, {0x8769, kExifName},
+               {0x8825, kGpsName}};
   for (const auto& tag : kTags) {
-    if (!FindDirectoryValue(file, tag.tag).bytes.empty()) found.Add(tag.name);
+    if (!FindDirectoryValues(file, tag.tag).empty()) found.Add(tag.name);
   }
 }
 

@@ -84,7 +84,10 @@ Status StripDirectories(std::span<const uint8_t> file, MetadataForm form,
                         const BareOptions& options, uint32_t kept, FilePieces& made,
                         std::string& reason) {
   std::vector<uint8_t> bare;
-  RETURN_IF_BAD(MakeBareTiff(file, options, bare));
+  const Status status = MakeBareTiff(file, options, bare);
+  if (status == Status::UnsuitableImage)
+    reason = Tr("A camera raw picture cannot be decoded without its metadata.");
+  RETURN_IF_BAD(status);
   const auto view = made.Own(std::move(bare));
   DirectoryEdit edit;
   RETURN_IF_BAD(EditDirectories(view, KeptEntries(file, form, kept), edit, reason));
@@ -113,7 +116,15 @@ Status ErasePlacesBehind(std::span<const uint8_t> file, uint64_t from,
     const uint16_t length = bytes.Be16();
     ++at;
     if (!application || length < 22) continue;
-    if (bytes.Match("http://ns.adobe.com/")) BlankPlaces(file, bytes.Peek(length - 22u), patches);
+    const auto offset = [&](std::span<const uint8_t> part) {
+      return static_cast<uint64_t>(part.data() - file.data());
+    };
+    if (bytes.Match("http://ns.adobe.com/")) {
+      const auto packet = bytes.Peek(std::min<uint64_t>(length - 22u, bytes.Left()));
+      BlankPlaces(file, packet, patches);
+      if (!packet.empty()) at = offset(packet) + packet.size();
+      continue;
+    }
     if (!bytes.Match(kExifHead)) continue;
     const auto block = bytes.Peek(length - 8u);
     DirectoryEdit edit;
@@ -123,8 +134,9 @@ Status ErasePlacesBehind(std::span<const uint8_t> file, uint64_t from,
       reason = Tr("The place shares its bytes with other values.");
       return Status::UnsuitableImage;
     }
-    const auto base = static_cast<uint64_t>(block.data() - file.data());
-    for (auto& patch : edit.patches) patches.push_back({base + patch.at, std::move(patch.bytes)});
+    for (auto& patch : edit.patches)
+      patches.push_back({offset(block) + patch.at, std::move(patch.bytes)});
+    at = offset(block) + block.size();
   }
   reason.clear();
   return Status::Ok;
@@ -161,8 +173,20 @@ Status StripFilePlaces(std::span<const uint8_t> file, FilePieces& made, std::str
   DirectoryEdit edit;
   const DirectoryChange change{.place = ExifPlace::Gps, .all = true};
   RETURN_IF_BAD(EditDirectories(file, {&change, 1}, edit, reason));
-  const DirectoryValue xmp = FindDirectoryValue(file, kXmpTag);
-  if (!xmp.bytes.empty()) BlankPlaces(file, xmp.bytes, edit.patches);
+  if (!edit.tail.empty()) {
+    reason = Tr("The place shares its bytes with other values.");
+    return Status::UnsuitableImage;
+  }
+  std::vector<DirectoryValue> packets = FindDirectoryValues(file, kXmpTag);
+  // pages may share one
+  std::ranges::sort(packets, {}, [](const DirectoryValue& xmp) { return xmp.bytes.data(); });
+  uint64_t end = 0;
+  for (const DirectoryValue& xmp : packets) {
+    const auto at = static_cast<uint64_t>(xmp.bytes.data() - file.data());
+    if (xmp.bytes.empty() || at < end) continue;
+    BlankPlaces(file, xmp.bytes, edit.patches);
+    end = at + xmp.bytes.size();
+  }
   std::ranges::sort(edit.patches, {}, &DirectoryEdit::Patch::at);
   AddEdited(file, std::move(edit), made);
   return Status::Ok;

@@ -10,6 +10,7 @@
 #include <string_view>
 
 #include "containers/walked_bytes.h"
+#include "core/text.h"
 
 namespace fotomill {
 
@@ -51,13 +52,20 @@ void SetXmpOrientation(std::span<uint8_t> packet, int32_t orientation) {
   }
 }
 
+// Whatever the prefix: drones have names of their own beside those of EXIF.
 bool BlankXmpPlaces(std::span<uint8_t> packet) {
-  constexpr std::string_view kPlace = "exif:GPS";
+  constexpr std::string_view kPlace = ":gps", kBlanks = " \t\r\n";
   const std::string_view text = TextOf(packet);
+  const auto same = [](char a, char b) { return LowerCase(a) == b; };
   bool found = false;
-  for (size_t at = 0; (at = text.find(kPlace, at)) != std::string_view::npos;) {
-    const size_t name = at;
-    at = text.find_first_of("= \t\r\n/>", at);
+  for (size_t at = 0;;) {
+    const auto match = std::search(text.begin() + static_cast<ptrdiff_t>(at), text.end(),
+                                   kPlace.begin(), kPlace.end(), same);
+    if (match == text.end()) break;
+    const auto colon = static_cast<size_t>(match - text.begin());
+    const size_t before = text.substr(0, colon).find_last_of("<>/=\"' \t\r\n");
+    const size_t name = before == std::string_view::npos ? 0 : before + 1;
+    at = text.find_first_of("<>=\"' \t\r\n/", colon);
     if (at == std::string_view::npos) break;
     const std::string tag(text.substr(name, at - name));
     size_t begin = name, end = 0;
@@ -71,8 +79,12 @@ bool BlankXmpPlaces(std::span<uint8_t> packet) {
       if (last == std::string_view::npos) break;
       end = last + 1;
     } else {
-      const size_t quote = text.find_first_of("\"'", at);
-      if (quote == std::string_view::npos) break;
+      const size_t equals = text.find_first_not_of(kBlanks, at);
+      // only a text, or the declaration of a prefix
+      if (equals == std::string_view::npos || text[equals] != '=') continue;
+      if (tag.starts_with("xmlns:")) continue;
+      const size_t quote = text.find_first_not_of(kBlanks, equals + 1);
+      if (quote == std::string_view::npos || (text[quote] != '"' && text[quote] != '\'')) continue;
       const size_t last = text.find(text[quote], quote + 1);
       if (last == std::string_view::npos) break;
       end = last + 1;
