@@ -265,6 +265,20 @@ TEST_F(FileHistory, EntriesFollowTheirFiles) {
   EXPECT_EQ(update({viewed("a", 3), move("a", "x"), move("x", "y")}), 3u);
   EXPECT_THAT(Stored(),
               ElementsAre("y 11 0", "d/e 0 -5", "c 0 -10", "h/e 0 -30", "h/f/g 0 -40"));
+  // Renamed within a folder that was renamed before, and within one that came in its place.
+  EXPECT_EQ(update({viewed("k/v", 50), viewed("k/w", 60)}), 2u);
+  settings.FileHistoryFunctions = ~(1 << 16) & 0xfffff;
+  std::filesystem::rename(path("k"), path("m"));
+  std::filesystem::rename(path("m/v"), path("m/u"));
+  for (const char* file : {"k/w", "d2/w"}) File(file);
+  const auto moved = [&](const std::string& from, const std::string& to) {
+    return FileUse{.path = path(to), .function = FileFunction::FileTime, .from = path(from)};
+  };
+  EXPECT_EQ(update({moved("k", "m"), moved("m/v", "m/u"), moved("k/w", "d2/w")}), 0u);
+  EXPECT_THAT(Stored(), ElementsAre("y 11 0", "d/e 0 -5", "c 0 -10", "h/e 0 -30", "h/f/g 0 -40",
+                                    "m/u 0 -50", "m/w 0 -60"));
+  std::filesystem::remove_all(path("m"));
+  settings.FileHistoryFunctions = 0xfffff;
   // A file that has vanished counts as removed, whoever asks; so does all that was in a folder.
   std::filesystem::remove(path("c"));
   std::filesystem::remove_all(path("h"));

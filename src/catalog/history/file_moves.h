@@ -1,9 +1,9 @@
 #pragma once
 
+#include <map>
 #include <optional>
 #include <string>
 #include <string_view>
-#include <unordered_map>
 
 namespace fotomill {
 
@@ -20,8 +20,11 @@ class FileMoves {
   std::optional<std::string> PathNow(std::string_view path) const;
 
  private:
+  // Removes and returns what is known of the files in a folder.
+  std::map<std::string, std::string> TakeWithin(const std::string& folder);
+
   // by original path; empty: removed
-  std::unordered_map<std::string, std::string> now_;
+  std::map<std::string, std::string> now_;
 };
 
 }  // namespace fotomill
