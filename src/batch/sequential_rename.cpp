@@ -89,6 +89,13 @@ FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules,
                       RenamedFiles& files, BatchJob& job) {
   FileOutcome outcome{.source = file.name, .status = file.status, .hint = file.hint};
   if (outcome.status == Status::Ok &&
+      WentWithPicture(platform::AbsolutePath(file.name), job.changes)) {
+    outcome.destination = file.name;
+    outcome.skipped = true;
+    outcome.hint = Tr("skipped: it was renamed with its picture.");
+    return outcome;
+  }
+  if (outcome.status == Status::Ok &&
       (!files.Exists(file.name) || !platform::IsRegularFile(file.name))) {
     outcome.status = Status::FileOpenError;
   }

@@ -84,46 +84,46 @@ bool SameVolume(const std::string& a, const std::string& b) {
 }
 
 Outcome MoveOne(const std::string& from, const std::string& to) {
-  if (!platform::FileExists(from)) return kGone;
+  if (!platform::FileExists(from)) return Tr(kGone);
   const platform::Existence existence = platform::ExistenceOf(to);
   if (existence == platform::Existence::Unknown) return WithReason(Tr("It could not be renamed."));
   if (existence == platform::Existence::Yes && from != to) {
     const platform::FileFacts a = platform::FactsOf(from), b = platform::FactsOf(to);
     // a name that differs only in case
     const bool same = a.identity == b.identity && a.device == b.device;
-    if (!same) return kTaken;
+    if (!same) return Tr(kTaken);
   }
   if (to.starts_with(platform::JoinFolder(from, "")))
     return Tr("A folder cannot be moved into itself.");
   const platform::CommitResult result = platform::RenameFile(from, to, platform::Existing::Refuse);
   if (result == platform::CommitResult::Done) return {};
-  if (result == platform::CommitResult::Taken) return kTaken;
+  if (result == platform::CommitResult::Taken) return Tr(kTaken);
   if (SameVolume(from, to)) return WithReason(Tr("It could not be renamed."));
   // Across volumes a move is copy and delete; a partial copy is deleted if copying fails.
   Outcome outcome = CopyTree(from, to, 0);
   if (!outcome.empty()) {
-    if (outcome != kTaken) (void)DeleteTree(to, 0);
+    if (outcome != Tr(kTaken)) (void)DeleteTree(to, 0);
     return outcome;
   }
   return DeleteTree(from, 0);
 }
 
 Outcome TrashOne(const std::string& path) {
-  if (!platform::FileExists(path)) return kGone;
+  if (!platform::FileExists(path)) return Tr(kGone);
   return platform::MoveToTrash(path)
              ? Outcome()
              : Outcome(Tr("There is no trash on this volume; Shift+Delete deletes permanently."));
 }
 
 Outcome Restore(const std::string& path) {
-  if (platform::FileExists(path)) return kTaken;
+  if (platform::FileExists(path)) return Tr(kTaken);
   return platform::RestoreFromTrash(path) ? Outcome()
                                           : Outcome(Tr("It is no longer in the trash."));
 }
 
 // Restores the previous contents and keeps the current ones in their place.
 Outcome Exchange(const FileStep& step) {
-  if (!platform::FileExists(step.from)) return kGone;
+  if (!platform::FileExists(step.from)) return Tr(kGone);
   if (step.previous->HasChanged(step.from))
     return Tr("It was changed since, so it was left alone.");
   PreviousFile now;
@@ -152,7 +152,7 @@ Outcome DoStep(FileOperationKind kind, const FileStep& step) {
 Outcome RemoveCopy(const FileStep& step) {
   const platform::FileFacts copy = platform::FactsOf(step.to),
                             original = platform::FactsOf(step.from);
-  if (copy.kind == platform::FileKind::Missing) return kGone;
+  if (copy.kind == platform::FileKind::Missing) return Tr(kGone);
   const bool changed = copy.kind == platform::FileKind::Regular &&
                        original.kind == platform::FileKind::Regular &&
                        (copy.size != original.size || copy.modified != original.modified);
@@ -236,7 +236,7 @@ FileOperationResult CarryOut(const FileOperation& operation,
       result.done.steps.push_back(operation.steps[i]);
       changes.push_back(ChangeBy(operation.kind, operation.steps[i], false));
       SettleThumbnailFile(operation.kind, changes.back());
-    } else {
+    } else if (!WentWithPicture(operation.steps[i].from, changes)) {
       result.failures.push_back({operation.steps[i].from, outcome});
     }
   }
@@ -271,7 +271,7 @@ FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
     if (progress && !progress(i, paths.size())) break;
     const Outcome outcome = DeleteTree(paths[i], 0);
     if (!outcome.empty()) {
-      result.failures.push_back({paths[i], outcome});
+      if (!WentWithPicture(paths[i], changes)) result.failures.push_back({paths[i], outcome});
       continue;
     }
     result.done.steps.push_back({paths[i], {}});

@@ -232,6 +232,12 @@ TEST_F(Rename, ThumbnailsFollow) {
   EXPECT_EQ(thumbnails(), "a.THN");
   ASSERT_EQ(undo.uses.size(), 1u);
   EXPECT_EQ(undo.uses[0].from, folder_.Path("p/PICTURE0001.jpg"));
+  // All files of the folder, in either order.
+  const BatchJob behind = RunAsSet({"a.jpg", "a.THN"});
+  EXPECT_FALSE(behind.errors);
+  EXPECT_EQ(thumbnails(), std::filesystem::exists(folder_.Path("p/PICTURE0002.jpg"))
+                              ? "PICTURE0002.THN"
+                              : "PICTURE0001.THN");
 }
 
 // Renames are logged first: a run that is killed in between has either lost nothing or not started.

@@ -157,6 +157,30 @@ TEST_F(PictureChanges, ThumbnailFilesFollowOrGo) {
   EXPECT_TRUE(Exists("q/a.THN")) << "it is older than the picture, so it misleads nobody";
   DeleteThumbnailFile(folder_.Path("q/a.bmp"));
   EXPECT_FALSE(Exists("q/a.THN"));
+  // Thumbnail files that are named themselves are nobody's thumbnail.
+  PutThumbnail("q/mine.bmp", 5);
+  move("q/mine.THN", "q/my own.THN");
+  EXPECT_TRUE(Exists("q/my own.THN"));
+  DeleteMisleadingThumbnailFile(folder_.Path("q/my own.THN"));
+  DeleteThumbnailFile(folder_.Path("q/my own.THN"));
+  EXPECT_TRUE(Exists("q/my own.THN"));
+}
+
+TEST_F(PictureChanges, TellWhichThumbnailFilesWentWithTheirPictures) {
+  const PictureChange changes[] = {{folder_.Path("p/a.bmp"), folder_.Path("q/z.bmp")},
+                                   {folder_.Path("p/b.bmp")}};
+  const auto went = [&](const char* name) { return WentWithPicture(folder_.Path(name), changes); };
+  EXPECT_TRUE(went("p/a.THN") && went("p/b.THN"));
+  EXPECT_FALSE(went("p/c.THN") || went("p/a.bmp") || went("q/z.THN"));
+  PutThumbnail("p/a.bmp", 5);
+  EXPECT_FALSE(went("p/a.THN")) << "it is still there";
+}
+
+TEST_F(PictureChanges, AreKeptBesideAPathThatDoesNotFit) {
+  Keep("p/new.bmp", ThumbnailDatabasePath({}));
+  Keep("p/" + std::string(260, 'x') + ".bmp", ThumbnailDatabasePath({}));
+  SharedThumbnailStore().Close();
+  EXPECT_THAT(Global(), testing::Contains("p/new.bmp"));
 }
 
 }  // namespace

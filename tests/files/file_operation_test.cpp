@@ -8,6 +8,7 @@
 #include "platform/files.h"
 #include "support/files.h"
 #include "support/scoped_environment.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 namespace {
@@ -118,6 +119,20 @@ TEST_F(FileOperationTest, ThumbnailsFollowOrGo) {
   SetDataFolder(dataBefore);
 }
 
+TEST_F(FileOperationTest, ThumbnailFilesMayBeAmongTheFiles) {
+  ThumbnailRecord record;
+  for (const FileOperationKind kind : {FileOperationKind::Trash, FileOperationKind::Move}) {
+    for (const char* name : {"a.png", "alone.png"})
+      ASSERT_TRUE(WriteThumbnailFile(record, ThumbnailPathFor(From(name)), true));
+    const FileOperationResult result = CarryOut(PlanFileOperation(
+        kind, {From("a.png"), From("a.THN"), From("alone.THN")}, folder_.Path("to")));
+    EXPECT_THAT(result.failures, IsEmpty());
+    EXPECT_THAT(Names("from"), ElementsAre("b.png", "sub"));
+    ASSERT_THAT(Revert(result.done).failures, IsEmpty());
+    EXPECT_TRUE(platform::FileExists(From("a.png")) && platform::FileExists(From("alone.THN")));
+  }
+}
+
 TEST_F(FileOperationTest, TellsTheHistoryWhatWasUsed) {
   const struct {
     const char* name;
@@ -161,6 +176,13 @@ TEST_F(FileOperationTest, NothingIsEverReplaced) {
     EXPECT_EQ(result.failures.at(0).reason, "A file of that name already exists.");
   }
   EXPECT_EQ(ReadText(To("a.png")) + ReadText(To("a [1].png")) + ReadText(From("a.png")), "therecame meanwhilea.png");
+  if (StartTexts("de")) {
+    for (const FileOperationKind kind : {FileOperationKind::Move, FileOperationKind::Copy}) {
+      EXPECT_EQ(CarryOut({kind, plan.steps}).failures.at(0).reason,
+                "Eine Datei dieses Namens ist schon vorhanden.");
+    }
+  }
+  (void)StartTexts("en");
   // Undoing a move whose old name was taken meanwhile keeps both files.
   const FileOperationResult moved =
       CarryOut(PlanFileOperation(FileOperationKind::Move, {From("b.png")}, folder_.Path("to")));

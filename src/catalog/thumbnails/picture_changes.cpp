@@ -1,5 +1,6 @@
 #include "catalog/thumbnails/picture_changes.h"
 
+#include <algorithm>
 #include <map>
 #include <vector>
 
@@ -7,6 +8,8 @@
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "catalog/thumbnails/thumbnail_store.h"
 #include "core/data_folder.h"
+#include "core/text.h"
+#include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
@@ -34,8 +37,15 @@ bool IsThumbnailFile(const std::string& path) {
   return !platform::FactsOf(path).link && ReadThumbnailFile(record, path);
 }
 
-void DeleteIfThumbnailFile(const std::string& path) {
-  if (IsThumbnailFile(path)) (void)platform::DeleteFile(path);
+// Whether a path has the name of a thumbnail file, which has no thumbnail file of its own.
+bool HasThumbnailName(const std::string& path) {
+  return EqualIgnoringCase(platform::SplitPath(path).extension, kThumbnailExtension);
+}
+
+// Deletes the thumbnail file of a picture.
+void DeleteFileOf(const std::string& picture) {
+  const std::string file = ThumbnailPathFor(picture);
+  if (!HasThumbnailName(picture) && IsThumbnailFile(file)) (void)platform::DeleteFile(file);
 }
 
 }  // namespace
@@ -64,7 +74,8 @@ void MarkChangedRecords(std::span<const PictureChange> changes) {
 
 void FollowThumbnailFile(const std::string& from, const std::string& to) {
   const std::string old = ThumbnailPathFor(from), wanted = ThumbnailPathFor(to);
-  if (old == wanted || platform::IsFolder(to)) return;
+  if (old == wanted || HasThumbnailName(from) || HasThumbnailName(to) || platform::IsFolder(to))
+    return;
   const bool follows = IsThumbnailFile(old);
   if (!follows) return DeleteMisleadingThumbnailFile(to);
   if (platform::RenameFile(old, wanted, platform::Existing::Refuse) == platform::CommitResult::Done)
@@ -74,14 +85,23 @@ void FollowThumbnailFile(const std::string& from, const std::string& to) {
   DeleteMisleadingThumbnailFile(to);
 }
 
-void DeleteThumbnailFile(const std::string& path) { DeleteIfThumbnailFile(ThumbnailPathFor(path)); }
+bool WentWithPicture(const std::string& path, std::span<const PictureChange> changes) {
+  if (!HasThumbnailName(path) || platform::ExistenceOf(path) != platform::Existence::No)
+    return false;
+  // Files are usually in the order of their names, so the picture is one of the last.
+  return std::any_of(changes.rbegin(), changes.rend(), [&](const PictureChange& change) {
+    return ThumbnailPathFor(change.path) == path;
+  });
+}
+
+void DeleteThumbnailFile(const std::string& path) { DeleteFileOf(path); }
 
 void DeleteMisleadingThumbnailFile(const std::string& path) {
   const std::string file = ThumbnailPathFor(path);
   const platform::FileFacts facts = platform::FactsOf(file), picture = platform::FactsOf(path);
   if (facts.kind == platform::FileKind::Regular && picture.kind == platform::FileKind::Regular &&
       facts.modified >= picture.modified)
-    DeleteIfThumbnailFile(file);
+    DeleteFileOf(path);
 }
 
 }  // namespace fotomill

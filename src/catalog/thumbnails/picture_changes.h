@@ -21,10 +21,13 @@ void MarkChangedRecords(std::span<const PictureChange> changes);
 
 // Handles the thumbnail file of a picture; call right after renaming or moving the picture: it is
 // renamed along, or deleted if the new name already has one. Does nothing for folders, as they
-// contain their thumbnail files.
+// contain their thumbnail files, and for thumbnail files themselves.
 void FollowThumbnailFile(const std::string& from, const std::string& to);
+// Whether `path` is that of a thumbnail file that no longer exists because it was renamed or
+// deleted along with the picture of one of these changes.
+bool WentWithPicture(const std::string& path, std::span<const PictureChange> changes);
 // Deletes the thumbnail file of a picture that was removed or will be replaced. Links, and files
-// that only have the name of a thumbnail file, are kept.
+// that only have the name of a thumbnail file, are kept. Does nothing for thumbnail files.
 void DeleteThumbnailFile(const std::string& path);
 // The same for an existing picture, if the thumbnail file looks current but is not.
 void DeleteMisleadingThumbnailFile(const std::string& path);

@@ -68,10 +68,12 @@ PictureStamp PictureStampOf(int64_t modified, uint64_t size);
 // The current state of a file; unknown if it is not a regular file.
 PictureStamp PictureStampOf(const std::string& path);
 
+inline constexpr size_t kLongestDatabasePath = 260;  // bytes
+
 // A record in memory.
 struct DatabaseRecord {
   ThumbnailRecord thumbnail;
-  std::string path;    // at most 260 bytes
+  std::string path;    // at most kLongestDatabasePath
   std::string volume;  // likewise
   bool deleted = false;
   PictureStamp stamp = {};  // state of the picture when the thumbnail was made

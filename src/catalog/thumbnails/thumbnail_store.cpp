@@ -13,6 +13,7 @@ bool ThumbnailStore::Find(const std::string& database, const std::string& path,
 }
 
 void ThumbnailStore::Add(const std::string& database, DatabaseRecord record, bool hidden) {
+  if (record.path.size() > kLongestDatabasePath) return;  // it would fail the whole append
   const std::lock_guard lock(mutex_);
   if (database != newPath_ || new_.size() >= kGathered) Append();
   newPath_ = database;

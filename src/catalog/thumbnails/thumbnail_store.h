@@ -20,7 +20,7 @@ class ThumbnailStore {
   bool Find(const std::string& database, const std::string& path, const PictureStamp& stamp,
             ThumbnailRecord& thumbnail);
   // Adds a record to a database, which is created if missing, and hidden with `hidden`. Earlier
-  // records of the same path and volume are marked as deleted.
+  // records of the same path and volume are marked as deleted. Ignored if the path is too long.
   void Add(const std::string& database, DatabaseRecord record, bool hidden);
   // Appends the collected records.
   void Flush();

@@ -122,7 +122,7 @@ bool OfferThumbnailUpdate(ThumbnailBrowser& browser, ThumbnailUpdateFace& face) 
 bool IsCompactionDue(const ThumbnailBrowser& browser) {
   const int64_t interval = int64_t{std::max(browser.options.compactionDays, 0)} * 86400;
   return browser.compacts && browser.options.compacts &&
-         LastOrphanRemoval(browser.folder) + interval < platform::Now();
+         LastOrphanRemoval(browser.folder) < platform::Now() - interval;
 }
 
 bool RemoveOrphanThumbnails(const ThumbnailBrowser& browser) {
