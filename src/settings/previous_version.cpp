@@ -89,7 +89,15 @@ std::optional<CarryOver> CarryOverAtFirstStart() {
   if (current.empty() || platform::FileExists(current) ||
       !platform::IsRegularFile(platform::JoinFolder(DataFolder(), kPreviousConfigurationFile)))
     return std::nullopt;
-  return CarryOverDataFolder(DataFolder(), DataFolder());
+  CarryOver carried = CarryOverDataFolder(DataFolder(), DataFolder());
+  const auto lists = [](const std::vector<std::string>& names) {
+    return std::ranges::find(names, kPreviousConfigurationFile) != names.end();
+  };
+  if (lists(carried.kept)) return std::nullopt;  // another process was faster
+  // where the folder could not be listed
+  if (!lists(carried.copied) && !lists(carried.failed))
+    carried.failed.emplace_back(kPreviousConfigurationFile);
+  return carried;
 }
 
 std::string CarryOverText(const CarryOver& carried) {

@@ -1,5 +1,7 @@
 #include <gtest/gtest.h>
 
+#include <filesystem>
+
 #include "core/data_folder.h"
 #include "platform/files.h"
 #include "settings/folder_override.h"
@@ -190,6 +192,27 @@ TEST_F(DataFilesTest, FirstStartTakesThePreviousVersionsSettingsOnce) {
   CarryOver failed;
   failed.failed = {"Fotomill Professional 10.ini"};
   EXPECT_NE(CarryOverText(failed).find("could not be copied"), std::string::npos);
+}
+
+TEST_F(DataFilesTest, AFirstStartThatCopiesNothingDoesNotSayThatItDid) {
+  ASSERT_TRUE(platform::MakeFolders(DataFolder()));
+  test::WriteText(DataFile("Fotomill Professional 10.ini"), "[Fotomill]\n");
+  const std::string current = DataFile("Fotomill Professional 11.ini");
+  // a name that is taken, though not by a file that can be read
+  std::filesystem::create_symlink("nowhere", current);
+  EXPECT_FALSE(CarryOverAtFirstStart());
+  std::filesystem::remove(current);
+  const int64_t faults = test::ForEachFault([&] {
+    const auto carried = CarryOverAtFirstStart();
+    const int64_t countdown = platform::faultCountdown.exchange(0);
+    const bool copied = platform::FileExists(current);
+    if (carried) {
+      EXPECT_EQ(CarryOverText(*carried).find("could not be copied") == std::string::npos, copied);
+    }
+    std::filesystem::remove(current);
+    platform::faultCountdown = countdown;
+  });
+  EXPECT_GT(faults, 1);
 }
 
 TEST_F(DataFilesTest, CarryOverIsAtomic) {
