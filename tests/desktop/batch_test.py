@@ -70,6 +70,15 @@ def convert_and_collide(folder):
         desktop.key("ctrl+z")
         desktop.wait(r"files Undo output of one.bmp done=1")
         assert sorted(path.name for path in out.iterdir()) == ["one.png", "two.png"]
+        # Skip all answers for the other files, too.
+        start_convert(desktop)
+        confirm(desktop)
+        desktop.wait(r"prompt overwrite .*one.png")
+        desktop.focus("^Overwrite File$")
+        desktop.key("alt+l")
+        desktop.wait(r"batch-line .*one.bmp.*skipped")
+        desktop.wait(r"batch-line .*two.bmp.*skipped")
+        desktop.wait(r"batch ended status=0")
 
 
 def destination_step(folder):

@@ -116,8 +116,8 @@ class BatchThread::Questions : public Prompts {
     const OverwritePreviewMaker maker =
         question.checks.previews ? OverwritePreviewMaker([&] { return preview; }) : make;
     OverwriteAnswer answer;
-    answer.skipRest =
-        !batch_.AskWindow([&] { answer = batch_.windows_.AskOverwrite(question, maker); });
+    if (!batch_.AskWindow([&] { answer = batch_.windows_.AskOverwrite(question, maker); }))
+      answer.skipRest = true;
     return answer;
   }
   NameAnswer AskDestinationName(const NameQuestion& question) override {
