@@ -38,8 +38,14 @@ TEST(NameField, KeepsTheExtensionApart) {
   const struct {
     const char *text, *path;
   } rows[] = {
-      {"photo", "photo.png"}, {"my.photo", "my.photo.png"}, {"photo.PNG", "photo.PNG"}, {"", ""}};
-  for (const auto& row : rows) EXPECT_EQ(PathOfField(row.text, "png"), row.path);
+      {"photo", "/p/out/photo.png"},     {"my.photo", "/p/out/my.photo.png"},
+      {"photo.PNG", "/p/out/photo.PNG"}, {"sub/photo", "/p/out/sub/photo.png"},
+      {"/q/photo", "/q/photo.png"},      {"", ""},
+  };
+  for (const auto& row : rows)
+    EXPECT_EQ(PathOfField(row.text, "png", "/p/out/old.png"), row.path) << row.text;
+  // "scan.png.jpg" becomes "scan.png.png" unless the user says otherwise
+  EXPECT_EQ(PathOfField("scan.png", "png", "/p/out/scan.png.png"), "/p/out/scan.png.png");
 }
 
 }  // namespace

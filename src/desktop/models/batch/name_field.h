@@ -9,7 +9,9 @@ namespace fotomill::desktop {
 
 // The field's text for a path: only the name for a file in `folder`, otherwise folder and name.
 std::string NameInField(const std::string& path, const std::string& folder);
-// The path for the field's text, which may include the extension.
-std::string PathOfField(const std::string& text, const std::string& extension);
+// The path for the field's text, which may include the extension. It is relative to the folder of
+// `offered`, the path that the field showed first.
+std::string PathOfField(const std::string& text, const std::string& extension,
+                        const std::string& offered);
 
 }  // namespace fotomill::desktop

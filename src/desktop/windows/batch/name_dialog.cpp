@@ -73,13 +73,13 @@ void NameDialog::Browse() {
   wxFileDialog dialog(this, GetTitle(), wxString::FromUTF8(folder_),
                       wxString::FromUTF8(base) + dotted, "*" + dotted + "|*" + dotted, wxFD_SAVE);
   if (dialog.ShowModal() != wxID_OK) return;
-  const std::string path = PathOfField(Utf8(dialog.GetPath()), question_.extension);
+  const std::string path = PathOfField(Utf8(dialog.GetPath()), question_.extension, question_.path);
   name_->SetValue(wxString::FromUTF8(NameInField(path, folder_)));
 }
 
 NameAnswer NameDialog::Answer() const {
   return {.ok = GetReturnCode() == wxID_OK,
-          .name = PathOfField(Utf8(name_->GetValue()), question_.extension),
+          .name = PathOfField(Utf8(name_->GetValue()), question_.extension, question_.path),
           .skipRest = skipRest_};
 }
 
