@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <atomic>
 #include <future>
+#include <map>
 
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "core/data_folder.h"
@@ -19,9 +20,11 @@
 #include "files/previous_file.h"
 #include "platform/files.h"
 #include "registry/registry.h"
+#include "settings/settings.h"
 #include "support/bitmaps.h"
 #include "support/files.h"
 #include "support/scoped_environment.h"
+#include "support/scoped_settings.h"
 
 namespace fotomill::desktop {
 namespace {
@@ -201,6 +204,24 @@ TEST(OpenWildcard, HasAllPicturesFirstAndExtensionsInBothCases) {
   EXPECT_NE(wildcard.find("|(BMP) Windows bitmap|*.BMP;*.bmp|"), std::string::npos);
   EXPECT_EQ(std::ranges::count(wildcard, '|'),
             static_cast<ptrdiff_t>(2 * OpenFileFilter().size() - 1));
+}
+
+TEST(OpenWildcard, BeginsWithAFilterThatIsThere) {
+  const test::ScopedSettings keep;
+  const auto count = static_cast<int32_t>(OpenFileFilter().size());
+  for (const auto& [kept, first] : std::map<int32_t, int>{
+           {-1, 0}, {0, 0}, {count - 1, count - 1}, {count, 0}, {INT32_MAX, 0}}) {
+    settings.OpenFilterIndex = kept;
+    EXPECT_EQ(FirstOpenFilter(), first) << kept;
+  }
+}
+
+TEST(OperationOptions, DuplicatesHaveThePrefixAsItIsSet) {
+  const test::ScopedSettings keep;
+  settings.PrefixDuplicate = std::string_view("Copy_of_");
+  EXPECT_EQ(FileOperationOptionsFromSettings().duplicatePrefix, "Copy_of_");
+  settings.FilenameUnderbars = 0;
+  EXPECT_EQ(FileOperationOptionsFromSettings().duplicatePrefix, "Copy of ");
 }
 
 }  // namespace

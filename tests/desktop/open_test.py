@@ -73,6 +73,26 @@ def media_and_recent_files(folder):
         assert f"OpenPath={pictures}\n" in text, text
 
 
+def many_programs_at_once(folder):
+    """Too many to be waited for: each would keep a thread from the rest of the program."""
+    pictures = folder / "pictures"
+    pictures.mkdir()
+    for number in range(17):
+        (pictures / f"{number}.wav").write_bytes(b"RIFF")
+    register_player(folder / "home", folder / "player", folder / "played")
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"browser .*lines=17 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "shift+F10")
+        desktop.wait(r"programs Player;")
+        desktop.settle()
+        desktop.key("Up", "Right", "Return")
+        desktop.wait(r"open-with Player$")
+        for _ in range(17):
+            ended = desktop.wait(r"external-program ended")
+            assert "raised" not in ended, ended
+
+
 def override_that_appears(folder):
     pictures = folder / "pictures"
     make_pictures(pictures, ["a.bmp"])
@@ -112,4 +132,4 @@ def loading_is_told(folder):
             assert told == (wanted == "1"), desktop.log_text()
 
 
-run(media_and_recent_files, override_that_appears, loading_is_told)
+run(media_and_recent_files, many_programs_at_once, override_that_appears, loading_is_told)

@@ -4,6 +4,7 @@
 
 #include "core/text.h"
 #include "registry/registry.h"
+#include "settings/settings.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -17,6 +18,11 @@ std::string OpenWildcard() {
                 LowerCase(pair.patterns);
   }
   return wildcard;
+}
+
+int FirstOpenFilter() {
+  const int32_t kept = settings.OpenFilterIndex;
+  return kept >= 0 && static_cast<size_t>(kept) < OpenFileFilter().size() ? kept : 0;
 }
 
 }  // namespace fotomill::desktop

@@ -2,14 +2,16 @@
 
 #include <algorithm>
 
+#include "batch/new_job.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
 
 FileOperationOptions FileOperationOptionsFromSettings() {
-  return {.firstVariant = settings.NumberedVariantMin,
-          .lastVariant = settings.NumberedVariantMax,
-          .duplicatePrefix = std::string(settings.PrefixDuplicate.view())};
+  return {
+      .firstVariant = settings.NumberedVariantMin,
+      .lastVariant = settings.NumberedVariantMax,
+      .duplicatePrefix = std::string(NewBatchJob().naming.PrefixOf(PrefixedFunction::Duplicate))};
 }
 
 size_t UndoLimitFromSettings() {

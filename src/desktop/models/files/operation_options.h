@@ -4,7 +4,7 @@
 
 namespace fotomill::desktop {
 
-// From the current NumberedVariantMin, NumberedVariantMax and PrefixDuplicate.
+// From the current NumberedVariantMin, NumberedVariantMax, PrefixDuplicate and FilenameUnderbars.
 FileOperationOptions FileOperationOptionsFromSettings();
 // How many operations can be undone: UndoLevels.
 size_t UndoLimitFromSettings();

@@ -3,7 +3,6 @@
 #include <wx/filedlg.h>
 #include <wx/frame.h>
 
-#include <algorithm>
 #include <string>
 
 #include "desktop/models/files/open_wildcard.h"
@@ -21,7 +20,7 @@ void AskAndOpenFile(Shell& shell) {
   const std::string folder = platform::IsFolder(last) ? last : shell.Tabs().CurrentFolder();
   wxFileDialog dialog(&shell.Window(), Label("Open picture"), wxString::FromUTF8(folder), "",
                       wxString::FromUTF8(OpenWildcard()), wxFD_OPEN | wxFD_FILE_MUST_EXIST);
-  dialog.SetFilterIndex(std::max(settings.OpenFilterIndex, 0));
+  dialog.SetFilterIndex(FirstOpenFilter());
   LogEvent("prompt", "open");
   if (dialog.ShowModal() != wxID_OK) return;
   settings.OpenPath.AssignCut(Utf8(dialog.GetDirectory()));

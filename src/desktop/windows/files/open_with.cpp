@@ -22,6 +22,8 @@ namespace fotomill::desktop {
 
 namespace {
 
+// Waiting for a program takes a thread of the pool, which other work needs, too.
+constexpr size_t kMostWaitedFor = 16;
 constexpr double kHandOverSeconds = 2;  // earlier exit: passed on to another process
 
 // Runs the chosen command, or else the registered program. Reports to the window's thread as long
@@ -65,16 +67,17 @@ class Host : public ExternalProgramHost {
 
 }  // namespace
 
-void ExternalPrograms::Start(const std::string& file, std::vector<std::string> command) {
+void ExternalPrograms::Start(const std::string& file, std::vector<std::string> command,
+                             uint32_t flags) {
   LogEvent("external-program", "starts for " + file);
   const auto host = std::make_shared<Host>(shell_, stop_.Token(), std::move(command));
-  const auto run = [host, file] { (void)OpenWithExternalProgram(*host, file, 0); };
+  const auto run = [host, file, flags] { (void)OpenWithExternalProgram(*host, file, flags); };
   if (!RunLoose(run)) host->ShowMessage(kNoExternalProgram);
 }
 
 void ExternalPrograms::Open(const std::string& file) {
   const std::vector<platform::Program> programs = platform::ProgramsFor(file);
-  if (programs.empty()) return Start(file, {});
+  if (programs.empty()) return Start(file, {}, 0);
   OpenWith(programs.front(), {file});
 }
 
@@ -82,8 +85,9 @@ void ExternalPrograms::OpenWith(const platform::Program& program,
                                 const std::vector<std::string>& files) {
   LogEvent("open-with", program.name);
   std::vector<std::vector<std::string>> commands = platform::CommandsFor(program, files);
-  if (commands.empty()) return Start(files.front(), {});
-  for (size_t i = 0; i < commands.size(); ++i) Start(files[i], std::move(commands[i]));
+  if (commands.empty()) return Start(files.front(), {}, 0);
+  const uint32_t flags = commands.size() > kMostWaitedFor ? kDoNotWait : 0;
+  for (size_t i = 0; i < commands.size(); ++i) Start(files[i], std::move(commands[i]), flags);
 }
 
 wxMenu* NewOpenWithMenu(Shell& shell, const std::vector<std::string>& files) {

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <cstdint>
 #include <string>
 #include <vector>
 
@@ -14,6 +15,7 @@ class Shell;
 
 // Opens files with other programs, which run in parallel. When one exits, reloads the folders and
 // raises the window, unless the program only passed the file to another process.
+// Does not wait when many are started at once.
 class ExternalPrograms {
  public:
   explicit ExternalPrograms(Shell& shell) : shell_(shell) {}
@@ -27,7 +29,7 @@ class ExternalPrograms {
   void OpenWith(const platform::Program& program, const std::vector<std::string>& files);
 
  private:
-  void Start(const std::string& file, std::vector<std::string> command);
+  void Start(const std::string& file, std::vector<std::string> command, uint32_t flags);
 
   Shell& shell_;
   const StopSource stop_;
