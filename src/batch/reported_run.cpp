@@ -80,9 +80,9 @@ void ReportedRun::Deliver(size_t file, Status status) {
     });
   if (outcomes.empty()) return;
   job_.source.AssignCut(outcomes[0].source);
+  // An output whose time could not be set was written, too; one that was not has no destination.
   const auto isWritten = [&](const FileOutcome& outcome) {
-    return outcome.status == Status::Ok && !outcome.destination.empty() && !outcome.skipped &&
-           !task_.dryRun;
+    return !outcome.destination.empty() && !outcome.skipped && !task_.dryRun;
   };
   if (std::ranges::any_of(outcomes, isWritten)) {
     NoteUse(outcomes[0].source);

@@ -415,6 +415,9 @@ def pictures(place):
             ]
         ),
     )
+    place.files("roll/p1.bmp")
+    place.files("roll/notes.zip", contents=make.zip_bytes([("readme.txt", b"text")]))
+    check(place.run("verify", "roll")[0], 0, "archives in a folder are read only when named")
     facts = json.loads(place.run("info", "mixed.zip", "--json")[1])[0]
     check(
         (facts["status"], facts["format"], facts["width"], facts["pages"]),

@@ -130,9 +130,14 @@ class Selector {
     }
   }
 
+  // Archives are read only when named: most have no pictures.
+  static bool IsPicture(int32_t format) {
+    return format != kNoFormat && CanRead(FormatRow(format)) &&
+           (FormatRow(format).flags & FMT_ARCHIVE) == 0;
+  }
+
   void AddFile(const std::string& path, const std::string& below, bool hidden) {
-    const int32_t format = FindFormatByName(path);
-    if (format == kNoFormat || !CanRead(FormatRow(format))) {
+    if (!IsPicture(FindFormatByName(path))) {
       if (!hidden) leftOut_.Add(path);
     } else if (hidden) {
       leftOut_.AddHidden();
