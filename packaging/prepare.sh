@@ -57,7 +57,7 @@ EnsurePackages() {
   local -a missing apt
   local wanted
   if ! command -v dpkg-query >/dev/null; then
-    Say "not a Debian or Ubuntu system; needed are the likes of:" $(PackagesOf "$@")
+    Say "not a Debian or Ubuntu system; install the equivalents of:" $(PackagesOf "$@")
     return 0
   fi
   mapfile -t missing < <(MissingPackages "$@")

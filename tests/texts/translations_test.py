@@ -94,7 +94,7 @@ def check_results():
                "Es sind Fehler aufgetreten", "Eine Datei wurde verarbeitet, 1 fehlgeschlagen.")
         status, _, message = run(["--lang", "tlh", "help"])
         expect("unknown language", f"{status} {message}",
-               '2 fotomill: There is no translation "tlh"; there are: en, de.')
+               '2 fotomill: There is no translation "tlh"; available: en, de.')
         if json.loads(run(["--lang", "de", "info", "--json",
                            missing])[1])[0]["message"] != "File open error.":
             faults.append("a message in JSON was translated")

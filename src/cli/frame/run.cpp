@@ -145,7 +145,7 @@ std::string WantedLanguage(const Arguments& arguments) {
 int RefuseLanguage(const std::string& code, const Io& io) {
   std::string list;
   for (const Language& language : Languages()) list += (list.empty() ? "" : ", ") + language.code;
-  return Complain(io, Tr("There is no translation \"%1\"; there are: %2.", code, list));
+  return Complain(io, Tr("There is no translation \"%1\"; available: %2.", code, list));
 }
 
 // Prints the version; its options may come before or after --version.

@@ -176,7 +176,7 @@ std::optional<uint32_t> ParseKept(const std::string& list, const CommandContext&
     const std::string_view name = rest.substr(0, rest.find(','));
     const auto found = std::ranges::find(KeptNames(), name, &KeptName::name);
     if (found == KeptNames().end()) {
-      (void)UsageError(context, Tr("--keep: \"%1\" is none of orientation, profile, copyright, "
+      (void)UsageError(context, Tr("--keep: \"%1\" is not one of orientation, profile, copyright, "
                                    "exif, gps, xmp, iptc, comments.",
                                    name) +
                                     NearestNameHint(name, names));
