@@ -14,7 +14,7 @@
 
 #include "batch/job.h"
 #include "core/workers/ordered_run.h"
-#include "batch/run.h"
+#include "batch/batch_file.h"
 
 namespace fotomill {
 

@@ -7,24 +7,14 @@
 #include <string>
 #include <vector>
 
+#include "batch/batch_file.h"
 #include "batch/fit_picture.h"
 #include "batch/job.h"
 #include "batch/output_target.h"
 
 namespace fotomill {
 
-// A file of the selection.
-struct BatchFile {
-  std::string name;
-  // subfolder relative to the given folder, "" or "a/b": to recreate the tree
-  std::string below;
-  // a known error; the file is reported but not opened
-  Status status = Status::Ok;
-  std::string hint;  // printed after that error message
-};
-
-// All pages: into one file if the format
-// supports several, else into numbered files.
+// All pages: into one file if the format supports several, else into numbered files.
 inline constexpr int32_t kAllPages = -1;
 
 // How to process each file of a selection.

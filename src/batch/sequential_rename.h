@@ -9,7 +9,7 @@
 #include <vector>
 
 #include "batch/job.h"
-#include "batch/run.h"
+#include "batch/batch_file.h"
 #include "files/rename_log.h"
 #include "platform/files.h"
 

@@ -6,7 +6,8 @@
 #include <string>
 
 #include "batch/rewrite/rewrite_file.h"
-#include "batch/run.h"
+#include "batch/batch_file.h"
+#include "batch/job.h"
 
 namespace fotomill {
 

@@ -12,6 +12,7 @@
 #include "cli/frame/result_output.h"
 #include "cli/frame/used_files.h"
 #include "cli/selection/file_selection.h"
+#include "core/fixed_text.h"
 #include "core/workers/folder_scope.h"
 #include "core/workers/ordered_run.h"
 #include "platform/files.h"

@@ -3,7 +3,7 @@
 #include <string>
 #include <vector>
 
-#include "batch/run.h"
+#include "batch/batch_file.h"
 
 namespace fotomill::cli {
 

@@ -5,7 +5,7 @@
 #include <string>
 #include <vector>
 
-#include "batch/run.h"
+#include "batch/batch_file.h"
 #include "cli/frame/command.h"
 #include "cli/selection/standard_input.h"
 

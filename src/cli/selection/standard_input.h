@@ -5,7 +5,7 @@
 #include <span>
 #include <string>
 
-#include "batch/run.h"
+#include "batch/batch_file.h"
 #include "cli/frame/io.h"
 #include "platform/output_file.h"
 #include "platform/temporary_folder.h"

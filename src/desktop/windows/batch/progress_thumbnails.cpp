@@ -5,6 +5,7 @@
 
 #include "core/choice_lists.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/browser/thumbnail_service.h"
 #include "platform/files.h"
 #include "settings/job_options.h"
 

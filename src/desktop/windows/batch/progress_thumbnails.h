@@ -7,9 +7,11 @@
 #include <unordered_set>
 #include <vector>
 
-#include "desktop/windows/browser/thumbnail_service.h"
+#include "desktop/models/thumbnails/thumbnail_loader.h"
 
 namespace fotomill::desktop {
+
+class ThumbnailService;
 
 // Thumbnails for a progress box: those loaded by the browser, and others loaded in the background
 // when their rows are drawn.
