@@ -6,6 +6,10 @@
 # static linking fails, shared libraries are used.
 find_package(PkgConfig REQUIRED)
 pkg_check_modules(IMAGES REQUIRED libtiff-4 libwebp libjpeg libpng lcms2 freetype2 fribidi libdeflate zlib pugixml)
+# Debian 13's lcms2 names its plug-ins. They are GPL-3.0 and not used here.
+foreach(list IMAGES_LIBRARIES IMAGES_LINK_LIBRARIES IMAGES_STATIC_LIBRARIES)
+  list(FILTER ${list} EXCLUDE REGEX "lcms2_(fast_float|threaded)")
+endforeach()
 # Headers only: both are loaded when text is first drawn.
 pkg_check_modules(TEXTS REQUIRED harfbuzz fontconfig)
 set(image_include_folders ${IMAGES_INCLUDE_DIRS} ${TEXTS_INCLUDE_DIRS})

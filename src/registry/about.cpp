@@ -87,6 +87,7 @@ constexpr Row kRows[] = {
     {"pugixml", "pugixml", "MIT", "2006-2023 Arseny Kapoulkine", TrLater("GPX tracks")},
     {"FreeType", "freetype", "FTL OR GPL-2.0-only", "1996-2024 David Turner, Robert Wilhelm and Werner Lemberg", TrLater("outlines of letters"), nullptr, kFreeTypeVersion},
     {"Brotli", "brotlidec brotlicommon", "MIT", "2009-2015 the Brotli Authors", TrLater("compressed fonts")},
+    {"bzip2", "bz2", "bzip2-1.0.6", "1996-2019 Julian Seward", TrLater("compressed fonts")},
     {"FriBidi", "fribidi", "LGPL-2.1-or-later", "2001-2015 Behdad Esfahbod and others", TrLater("texts from right to left")},
     {"HarfBuzz", nullptr, "MIT-Modern-Variant", "2010-2024 Google, Inc., Behdad Esfahbod and others", TrLater("shaping text, loaded when needed"), FindHarfBuzz},
     {"fontconfig", nullptr, "HPND-sell-variant", "2001-2003 Keith Packard and others", TrLater("finding fonts, loaded when needed"), FindFontconfig},

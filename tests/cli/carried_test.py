@@ -390,8 +390,6 @@ def salvages(folder):
                           ("runs.tga", {"compression": "tga_rle"})):
         whole.save(folder / name, **options)
     # TIFF that starts with its directory, as written by scanners
-    subprocess.run(["convert", folder / "cut.bmp", "-define", "tiff:rows-per-strip=8", "-compress",
-                    "None", folder / "behind.tif"], check=False, stderr=subprocess.DEVNULL)
     strips_ = b"".join(whole.crop((0, y, 200, y + 8)).tobytes() for y in range(0, 160, 8))
     entries = [(256, 4, 1, 200), (257, 4, 1, 160), (258, 3, 1, 8), (259, 3, 1, 1), (262, 3, 1, 2),
                (273, 4, 20, 300), (277, 3, 1, 3), (278, 4, 1, 8), (279, 4, 20, 400)]
