@@ -536,10 +536,13 @@ def animations(folder):
                     check([d for _, d in after] == delays,
                           f"{what}: delays {[d for _, d in after]}")
                     once = 0 if source == "gif" else 1
-                    wanted = loop if to != "gif" or loop == 0 else loop - once
+                    loops = loop if to != "gif" or loop == 0 else loop - once
                     played = 0 if plays == 0 else plays
-                    check(played in (wanted, loop, loop + 1, loop - 1), f"{what}: played {plays}")
-                    worst = max(far(a, b) for (a, _), b in zip(after, before))
+                    check(played in (loops, loop, loop + 1, loop - 1), f"{what}: played {plays}")
+                    # Versions of Pillow write other colors, or read GIF frames that are cleared
+                    # differently: our frames equal what was drawn or what Pillow reads.
+                    worst = min(max(far(a, b) for (a, _), b in zip(after, wanted))
+                                for wanted in (frames, before))
                     check(worst == 0, f"{what}: frames differ by {worst}")
     # round trips keep the number of loops
     for loop in (0, 2, 5):
