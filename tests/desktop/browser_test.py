@@ -239,7 +239,8 @@ def play_animation(folder):
     (folder / "home/.config/gtk-3.0/settings.ini").write_text("[Settings]\ngtk-enable-animations=0\n")
     with Desktop(folder, pictures / "a.gif") as desktop:
         desktop.wait(r"view-frame frame 1 of 5, paused")
-        # the frame is behind the picture, and would take the focus
+        # The frame is behind the picture and would take the focus. It may be painted first.
+        desktop.seen = 0
         desktop.wait(r"painted-files")
         desktop.focus("View")
         desktop.key("space")
