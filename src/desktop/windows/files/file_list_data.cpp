@@ -4,8 +4,9 @@
 
 namespace fotomill::desktop {
 
+// The format "text/uri-list". Newer toolkits do not recognize it by that name.
 FileListData::FileListData(std::span<const std::string> paths)
-    : wxCustomDataObject(wxDataFormat("text/uri-list")) {
+    : wxCustomDataObject(wxDataFormat(wxDF_FILENAME)) {
   const std::string list = UriList(paths);
   if (!list.empty()) SetData(list.size(), list.data());
 }
