@@ -6,7 +6,6 @@
 #include <wx/listbox.h>
 #include <wx/msgdlg.h>
 #include <wx/settings.h>
-#include <wx/simplebook.h>
 #include <wx/sizer.h>
 #include <wx/srchctrl.h>
 #include <wx/stattext.h>
@@ -84,14 +83,12 @@ SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage fi
   list_->SetName(Label("Pages"));
   title_ = new wxStaticText(this, wxID_ANY, Label(TitleOf(first)));
   title_->SetFont(title_->GetFont().Bold().Scaled(1.3f));
-  BuildPages();
-
   auto* left = new wxBoxSizer(wxVERTICAL);
   left->Add(search_, wxSizerFlags().Expand());
   left->Add(list_, wxSizerFlags(1).Expand().Border(wxTOP, gap));
   auto* right = new wxBoxSizer(wxVERTICAL);
   right->Add(title_, wxSizerFlags().Border(wxLEFT, FromDIP(8)));
-  right->Add(book_, wxSizerFlags(1).Expand());
+  BuildPages(*right);
   auto* middle = new wxBoxSizer(wxHORIZONTAL);
   middle->Add(left, wxSizerFlags().Expand().Border(wxALL, gap));
   middle->Add(right, wxSizerFlags(1).Expand().Border(wxTOP | wxRIGHT | wxBOTTOM, gap));
@@ -102,7 +99,7 @@ SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage fi
   SetMinSize(FromDIP(wxSize(760, 420)));
 
   FillSetupDialog(controls_, destinations_);
-  // Wide enough for the longest choice on any page, in any language.
+  // Wide enough for the longest choice on any page, in any language: all are shown still.
   const int pages =
       ClientToWindowSize(column->CalcMin()).x + wxSystemSettings::GetMetric(wxSYS_VSCROLL_X, this);
   SetSize(std::max(TextWidth(*this, 980), pages), TextWidth(*this, 680));
@@ -131,8 +128,9 @@ SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage fi
 
 // --- pages ---
 
-void SetupBox::BuildPages() {
-  book_ = new wxSimplebook(this);
+// One panel below the other, of which one at a time is shown. (A wxSimplebook takes the keyboard
+// from the search field when it turns a page.)
+void SetupBox::BuildPages(wxSizer& column) {
   for (size_t page = 0; page < kSetupPageCount; ++page) {
     std::function<wxWindow*(wxWindow*)> above;
     if (static_cast<SetupPage>(page) == SetupPage::Formats) {
@@ -144,8 +142,8 @@ void SetupBox::BuildPages() {
       };
     }
     auto* panel = new SettingsPanel(
-        book_, ItemsOf(static_cast<SetupPage>(page)), [this] { ControlChanged(); }, above);
-    book_->AddPage(panel, Label(TitleOf(static_cast<SetupPage>(page))));
+        this, ItemsOf(static_cast<SetupPage>(page)), [this] { ControlChanged(); }, above);
+    column.Add(panel, wxSizerFlags(1).Expand());
     panels_.push_back(panel);
   }
 }
@@ -190,7 +188,8 @@ void SetupBox::ChooseLine(bool focus) {
 
 void SetupBox::ShowPage(SetupPage page) {
   page_ = page;
-  book_->SetSelection(static_cast<size_t>(page));
+  for (SettingsPanel* panel : panels_) panel->Show(panel == &Panel());
+  Layout();
   title_->SetLabel(Label(TitleOf(page)));
   if (!searching_) list_->SetSelection(static_cast<int>(page));
   LogEvent("setup",

@@ -10,7 +10,6 @@
 
 class wxListBox;
 class wxSearchCtrl;
-class wxSimplebook;
 class wxStaticText;
 
 namespace fotomill::desktop {
@@ -23,7 +22,7 @@ class SetupBox : public wxDialog {
   SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage first = SetupPage::Browsing);
 
  private:
-  void BuildPages();
+  void BuildPages(wxSizer& column);
   wxSizer* BuildButtons();
   void ShowPages();             // fills the list: all pages, or search results
   void ChooseLine(bool focus);  // shows the selected item
@@ -48,7 +47,6 @@ class SetupBox : public wxDialog {
   wxSearchCtrl* search_ = nullptr;
   wxListBox* list_ = nullptr;
   wxStaticText* title_ = nullptr;
-  wxSimplebook* book_ = nullptr;
 };
 
 // A dialog for a few settings with OK and Cancel: options of a format, or of the file history. True
