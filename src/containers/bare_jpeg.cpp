@@ -1,5 +1,4 @@
 #include <algorithm>
-#include <cstring>
 
 #include "containers/bare_file.h"
 #include "containers/jpeg_segments.h"
@@ -11,7 +10,7 @@ namespace {
 
 constexpr uint8_t kApp0 = 0xE0, kApp1 = 0xE1, kApp2 = 0xE2, kApp13 = 0xED, kApp14 = 0xEE,
                   kApp15 = 0xEF, kComment = 0xFE;
-constexpr uint8_t kEnd = 0xD9, kFirstRestart = 0xD0, kLastRestart = 0xD7, kPrefix = 0xFF;
+constexpr uint8_t kEnd = 0xD9, kPrefix = 0xFF;
 constexpr std::string_view kJfif("JFIF\0", 5), kProfile("ICC_PROFILE\0", 12), kAdobe("Adobe", 5),
     kPhotoshop("Photoshop 3.0\0", 14);
 constexpr size_t kJfifSize = 14;  // without a thumbnail, whose size is in the last two bytes
@@ -89,22 +88,12 @@ void AppendIptc(const JpegSegment& segment, FilePieces& bare) {
 // Copies from the first scan to the end of the picture, without the comments between scans unless
 // texts are kept.
 Status AppendScans(std::span<const uint8_t> file, size_t scan, bool texts, FilePieces& bare) {
-  size_t copied = scan, at = scan;
-  while (true) {
-    const void* found =
-        at < file.size() ? std::memchr(&file[at], kPrefix, file.size() - at) : nullptr;
-    if (found == nullptr) break;
-    at = static_cast<size_t>(static_cast<const uint8_t*>(found) - file.data());
-    if (at + 1 >= file.size()) break;
+  size_t copied = scan;
+  for (size_t at = scan; (at = NextScanMarker(file, at)) < file.size();) {
     const uint8_t marker = file[at + 1];
     if (marker == kEnd) {
       bare.Keep(file.subspan(copied, at + 2 - copied));
       return Status::Ok;
-    }
-    const bool data = marker == 0 || (marker >= kFirstRestart && marker <= kLastRestart);
-    if (data || marker == kPrefix) {
-      at += marker == kPrefix ? 1 : 2;
-      continue;
     }
     if (at + 4 > file.size()) break;
     const size_t length = size_t{file[at + 2]} << 8 | file[at + 3];

@@ -6,6 +6,7 @@
 #include <unordered_set>
 
 #include "containers/bare_file.h"
+#include "containers/directory_bytes.h"
 #include "core/byte_reader.h"
 #include "core/limits.h"
 
@@ -35,7 +36,6 @@ constexpr uint32_t kSubDirectories = 330, kJpegOffset = 513, kJpegSize = 514;
 constexpr uint32_t kFirstJpegTables = 519, kLastJpegTables = 521;
 constexpr uint64_t kMostJpegTable = 16 + 256;
 constexpr uint32_t kExif = 34665, kGps = 34853, kInteroperability = 40965;
-constexpr uint8_t kTypeBytes[] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8, 4, 8, 4, 0, 0, 8, 8, 8};
 // Camera raw files need private tags and the maker note to be decoded.
 constexpr uint32_t kPhotometric = 262, kDngVersion = 50706;
 constexpr std::string_view kCr2 = "CR";
@@ -64,45 +64,23 @@ struct Entry {
   bool outside = false;          // outside the entry
 };
 
-class BareTiff {
+class BareTiff : DirectoryBytes {
  public:
   BareTiff(std::span<const uint8_t> file, const BareOptions& options, std::vector<uint8_t>& bare)
-      : file_(file), options_(options), bare_(bare) {}
+      : DirectoryBytes(file), options_(options), bare_(bare) {}
 
   Status Make() {
-    ByteReader head(file_);
-    bigEndian_ = head.Match("MM");
-    if (!bigEndian_ && !head.Match("II")) return Status::DamagedFile;
-    const uint64_t version = Number(2, 2);
-    const bool hdPhoto = version == 0x01BC && !bigEndian_;
-    if (version != 42 && version != 43 && !hdPhoto) return Status::DamagedFile;
-    wide_ = version == 43;
+    if (!ReadOrder()) return Status::DamagedFile;
     if (ByteReader(file_.subspan(std::min<size_t>(8, file_.size()))).Match(kCr2))
       return Status::UnsuitableImage;
     bare_.assign(file_.begin(), file_.end());
-    const uint64_t first = wide_ ? 8 : 4;
-    Keep(0, first + Word());
-    RETURN_IF_BAD(TakeChain(Number(first, Word()), 0));
+    Keep(0, FirstAt() + Word());
+    RETURN_IF_BAD(TakeChain(Number(FirstAt(), Word()), 0));
     Erase();
     return Status::Ok;
   }
 
  private:
-  uint64_t Word() const { return wide_ ? 8 : 4; }
-  uint64_t EntryBytes() const { return wide_ ? 20 : 12; }
-  uint64_t CountBytes() const { return wide_ ? 8 : 2; }
-
-  bool Holds(uint64_t at, uint64_t size) const {
-    return at <= file_.size() && size <= file_.size() - at;
-  }
-  // An integer at an offset; 0 beyond the end of the file.
-  uint64_t Number(uint64_t at, uint64_t size) const {
-    uint64_t number = 0;
-    if (!Holds(at, size)) return 0;
-    for (uint64_t i = 0; i < size; ++i)
-      number = number << 8 | file_[at + (bigEndian_ ? i : size - 1 - i)];
-    return number;
-  }
   void Keep(uint64_t at, uint64_t size) { kept_.push_back({at, at + size}); }
   // Limited to the file: a directory may end with it, without a link.
   void Drop(uint64_t at, uint64_t size) {
@@ -133,7 +111,7 @@ class BareTiff {
       entry.type = static_cast<uint32_t>(Number(entry.start + 2, 2));
       entry.count = Number(entry.start + 4, Word());
       entry.value = entry.start + 4 + Word();
-      const uint64_t each = entry.type < std::size(kTypeBytes) ? kTypeBytes[entry.type] : 0;
+      const uint64_t each = DirectoryValueBytes(entry.type);
       if (each != 0 && entry.count > file_.size() / each) return Status::DamagedFile;
       entry.size = each * entry.count;
       entry.outside = entry.size > Word();
@@ -182,8 +160,7 @@ class BareTiff {
   }
 
   void PutNumber(uint64_t at, uint64_t number, uint64_t size) {
-    for (uint64_t i = 0; i < size; ++i)
-      bare_[at + (bigEndian_ ? size - 1 - i : i)] = static_cast<uint8_t>(number >> 8 * i);
+    Store(number, std::span(bare_).subspan(at, size));
   }
 
   // Drops an entry with its values and the directory it points to.
@@ -200,8 +177,7 @@ class BareTiff {
   }
 
   uint64_t NumberOf(const Entry& entry, uint64_t i) const {
-    const uint64_t each = kTypeBytes[entry.type];
-    return each > 8 ? 0 : Number(entry.value + i * each, each);
+    return Element(entry.value, entry.type, i);
   }
 
   // Marks the strips and tiles as used. Those beyond the end of the file are ignored.
@@ -279,10 +255,8 @@ class BareTiff {
     if (!kept_.empty() && kept_.back().end < bare_.size()) bare_.resize(kept_.back().end);
   }
 
-  const std::span<const uint8_t> file_;
   const BareOptions& options_;
   std::vector<uint8_t>& bare_;
-  bool bigEndian_ = false, wide_ = false;
   uint64_t next_ = 0;    // offset after the entries of the last directory
   uint64_t read_ = 0;    // entries so far
   uint64_t pieces_ = 0;  // strips and tiles so far

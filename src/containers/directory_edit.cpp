@@ -6,6 +6,7 @@
 #include <iterator>
 #include <unordered_set>
 
+#include "containers/directory_bytes.h"
 #include "core/limits.h"
 #include "texts/texts.h"
 
@@ -19,9 +20,6 @@ constexpr uint16_t kFirstHdpData = 0xBCC0;
 constexpr uint16_t kLong = 4, kLong8 = 16;
 constexpr int32_t kDeepest = 4;            // nesting depth of directories
 constexpr uint64_t kMostPieces = 1 << 23;  // strips and tiles of all pages
-// Size of a value, and of the numbers in it, by type.
-constexpr uint8_t kTypeBytes[] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8, 4, 8, 4, 0, 0, 8, 8, 8};
-constexpr uint8_t kNumberBytes[] = {0, 1, 1, 2, 4, 4, 1, 1, 2, 4, 4, 4, 8, 4, 0, 0, 8, 8, 8};
 
 // Pairs of entries with offsets and sizes of data; 0: unknown size, to the end of the file.
 constexpr struct {
@@ -51,17 +49,17 @@ struct Directory {
   bool dirty = false;
 };
 
-class Editor {
+class Editor : DirectoryBytes {
  public:
   Editor(std::span<const uint8_t> file, DirectoryEdit& edit, std::string& reason)
-      : file_(file), edit_(edit), reason_(reason) {}
+      : DirectoryBytes(file), edit_(edit), reason_(reason) {}
 
   Status Run(std::span<const DirectoryChange> changes) {
     edit_ = {};
     if (!ReadHeader()) return Damaged();
     MapAll();
     Directory first;
-    if (!ReadDirectory(Number(firstAt_, Word()), first)) return Damaged();
+    if (!ReadDirectory(Number(FirstAt(), Word()), first)) return Damaged();
     RETURN_IF_BAD(EditSub(kExifPointer, ExifPlace::Exif, changes, first));
     RETURN_IF_BAD(EditSub(kGpsPointer, ExifPlace::Gps, changes, first));
     for (const DirectoryChange& change : changes) {
@@ -69,7 +67,7 @@ class Editor {
     }
     if (first.dirty) {
       const uint64_t at = Place(first, true);
-      if (at != first.at) Patch(firstAt_, Bytes(at, Word()));
+      if (at != first.at) Patch(FirstAt(), Bytes(at, Word()));
     }
     RETURN_IF_BAD(ClearFurther(changes, first.at));
     EraseReleased();
@@ -98,51 +96,24 @@ class Editor {
   }
 
  private:
-  uint64_t Word() const { return wide_ ? 8 : 4; }
-  uint64_t CountBytes() const { return wide_ ? 8 : 2; }
-  uint64_t EntryBytes() const { return wide_ ? 20 : 12; }
-
   Status Damaged() {
     reason_ = Tr("The directories of its EXIF are damaged.");
     return Status::DamagedFile;
   }
 
   bool ReadHeader() {
-    constexpr uint64_t kClassic = 42, kBig = 43, kHdPhoto = 0x01BC;
-    if (file_.size() < 8 || file_[0] != file_[1] || (file_[0] != 'I' && file_[0] != 'M'))
-      return false;
-    bigEndian_ = file_[0] == 'M';
-    const uint64_t version = Number(2, 2);
-    wide_ = version == kBig;
-    firstAt_ = wide_ ? 8 : 4;
-    used_.push_back({0, firstAt_ + Word()});
-    return version == kClassic || (version == kBig && Number(4, 2) == 8) ||
-           (version == kHdPhoto && !bigEndian_);
+    if (file_.size() < 8 || !ReadOrder()) return false;
+    used_.push_back({0, FirstAt() + Word()});
+    return !wide_ || Number(4, 2) == 8;
   }
 
-  bool Holds(uint64_t at, uint64_t size) const {
-    return at <= file_.size() && size <= file_.size() - at;
-  }
-  uint64_t Number(uint64_t at, uint64_t size) const {
-    uint64_t number = 0;
-    if (!Holds(at, size)) return 0;
-    for (uint64_t i = 0; i < size; ++i)
-      number = number << 8 | file_[at + (bigEndian_ ? i : size - 1 - i)];
-    return number;
-  }
   std::vector<uint8_t> Bytes(uint64_t number, uint64_t size) const {
     std::vector<uint8_t> bytes(size);
-    for (uint64_t i = 0; i < size; ++i)
-      bytes[bigEndian_ ? size - 1 - i : i] = static_cast<uint8_t>(number >> 8 * i);
+    Store(number, bytes);
     return bytes;
   }
-  static uint64_t BytesOf(uint64_t type) {
-    return type < std::size(kTypeBytes) ? kTypeBytes[type] : 0;
-  }
-  // Element `i` of an entry's values, 0 if it is beyond the end of the file.
   uint64_t NumberOf(const Entry& entry, uint64_t i) const {
-    const uint64_t each = BytesOf(entry.type);
-    return each == 0 ? 0 : Number(entry.value + i * each, each);
+    return Element(entry.value, entry.type, i);
   }
 
   // False if it is not entirely within the file.
@@ -169,7 +140,7 @@ class Editor {
     entry.value = at + 4 + Word();
     const auto field = file_.subspan(entry.value, Word());
     entry.field.assign(field.begin(), field.end());
-    const uint64_t each = BytesOf(entry.type);
+    const uint64_t each = DirectoryValueBytes(entry.type);
     // impossible count
     entry.size = each == 0 || entry.count > UINT64_MAX / 16 ? 0 : each * entry.count;
     entry.outside = entry.size > Word();
@@ -178,7 +149,7 @@ class Editor {
   }
 
   void MapAll() {
-    for (uint64_t at = Number(firstAt_, Word()); at != 0 && Map(at, 0);) at = mappedNext_;
+    for (uint64_t at = Number(FirstAt(), Word()); at != 0 && Map(at, 0);) at = mappedNext_;
     for (const Range& range : used_) {
       begins_.push_back(range.begin);
       ends_.push_back(range.end);
@@ -392,7 +363,8 @@ class Editor {
     DirectoryChange change{.tag = pointerTag};
     if (at != 0) {
       const uint16_t type = at > UINT32_MAX ? kLong8 : kLong;
-      change.entry = ExifEntry{pointerTag, type, 1, std::vector<uint8_t>(kTypeBytes[type])};
+      change.entry =
+          ExifEntry{pointerTag, type, 1, std::vector<uint8_t>(DirectoryValueBytes(type))};
       for (size_t i = 0; i < change.entry->value.size(); ++i)
         change.entry->value[i] = static_cast<uint8_t>(at >> 8 * i);
     }
@@ -436,11 +408,8 @@ class Editor {
     return Status::Ok;
   }
 
-  const std::span<const uint8_t> file_;
   DirectoryEdit& edit_;
   std::string& reason_;
-  bool bigEndian_ = false, wide_ = false;
-  uint64_t firstAt_ = 4;  // position of the first directory's offset
   std::unordered_set<uint64_t> visited_;
   std::vector<Range> used_;              // one for each user of some bytes
   std::vector<uint64_t> begins_, ends_;  // of the used ranges, each sorted
@@ -454,7 +423,7 @@ class Editor {
 }  // namespace
 
 void SwapExifNumbers(uint16_t type, std::span<uint8_t> values) {
-  const size_t unit = type < std::size(kNumberBytes) ? kNumberBytes[type] : 1;
+  const size_t unit = DirectoryUnitBytes(type);
   if (unit < 2) return;
   for (size_t i = 0; i + unit <= values.size(); i += unit)
     std::reverse(values.begin() + static_cast<ptrdiff_t>(i),

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <iterator>
 
+#include "containers/directory_bytes.h"
 #include "core/byte_reader.h"
 #include "core/limits.h"
 
@@ -14,9 +15,6 @@ constexpr uint16_t kExifPointer = 0x8769, kGpsPointer = 0x8825, kInteroperabilit
                    kOrientation = 0x0112;
 constexpr uint16_t kShort = 3, kLong = 4;
 constexpr uint16_t kMostTypes = 13;
-// unit of byte swapping
-constexpr uint8_t kUnitBytes[kMostTypes + 1] = {0, 1, 1, 2, 4, 4, 1, 1, 2, 4, 4, 4, 8, 4};
-constexpr uint8_t kValueBytes[kMostTypes + 1] = {0, 1, 1, 2, 4, 8, 1, 1, 2, 4, 8, 4, 8, 4};
 
 // Tags of IFD0 that describe the picture: author, date and camera; orientation; ratings; titles.
 constexpr uint16_t kDescriptive[] = {0x010D, 0x010E, 0x010F, 0x0110, kOrientation, 0x0131,
@@ -66,7 +64,8 @@ class DirectoryReader {
       return;
     }
     if (entry.type == 0 || entry.type > kMostTypes || count > bytesLeft_) return;
-    const uint64_t size = count * kValueBytes[entry.type], at = size <= inside ? place : value;
+    const uint64_t size = count * DirectoryValueBytes(entry.type),
+                   at = size <= inside ? place : value;
     if (size > bytesLeft_ || at > file_.size() || size > file_.size() - at) return;
     const auto values = file_.subspan(at, size);
     entry.count = static_cast<uint32_t>(count);
@@ -134,7 +133,7 @@ class DirectoryWriter {
       bytes_.push_back(static_cast<uint8_t>(value >> 8 * (bigEndian_ ? count - 1 - i : i)));
   }
   void Values(const ExifEntry& entry) {
-    const size_t unit = swapped_ ? kUnitBytes[entry.type] : 1;
+    const size_t unit = swapped_ ? DirectoryUnitBytes(entry.type) : 1;
     for (size_t i = 0; i + unit <= entry.value.size(); i += unit) {
       for (size_t k = unit; k > 0; --k) bytes_.push_back(entry.value[i + k - 1]);
     }

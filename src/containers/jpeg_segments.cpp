@@ -8,6 +8,7 @@
 #include "containers/jpeg_segments.h"
 
 #include <algorithm>
+#include <cstring>
 
 #include "core/byte_reader.h"
 
@@ -139,6 +140,21 @@ bool JpegWalk::End(Status outcome) {
   ended_ = true;
   outcome_ = outcome;
   return false;
+}
+
+size_t NextScanMarker(std::span<const uint8_t> file, size_t at) {
+  constexpr uint8_t kPrefix = 0xFF, kFirstRestart = 0xD0, kLastRestart = 0xD7;
+  while (at < file.size()) {
+    const void* const found = std::memchr(&file[at], kPrefix, file.size() - at);
+    if (found == nullptr) break;
+    at = static_cast<size_t>(static_cast<const uint8_t*>(found) - file.data());
+    if (at + 1 >= file.size()) break;
+    const uint8_t marker = file[at + 1];
+    const bool data = marker == 0 || (marker >= kFirstRestart && marker <= kLastRestart);
+    if (!data && marker != kPrefix) return at;
+    at += data ? 2 : 1;
+  }
+  return file.size();
 }
 
 JpegSegment SegmentAt(std::span<const uint8_t> file, const JpegPlace& place) {

@@ -55,6 +55,10 @@ class JpegWalk {
   Status outcome_ = Status::Ok;
 };
 
+// The offset of the next marker at or after `at` in scan data, past coded bytes, restart markers
+// and fill bytes; the size of the file if there is none. T.81, section B.1.1.
+size_t NextScanMarker(std::span<const uint8_t> file, size_t at);
+
 // The header of a JPEG file: the segments before the first scan. All spans point into the file.
 struct JpegSegment {
   uint8_t marker = 0;
