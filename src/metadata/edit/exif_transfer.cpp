@@ -9,6 +9,23 @@
 
 namespace fotomill {
 
+ExifChanges TakenEntries(const ExifDirectories& from,
+                         const std::function<bool(const ExifEntry&, ExifPlace)>& isWanted) {
+  ExifChanges changes;
+  const auto take = [&](const ExifDirectory& directory, ExifPlace place) {
+    for (const ExifEntry& entry : directory) {
+      if (!isWanted(entry, place)) continue;
+      DirectoryChange change{place, entry.tag, entry};
+      if (from.bigEndian) SwapExifNumbers(entry.type, change.entry->value);
+      changes.push_back(std::move(change));
+    }
+  };
+  take(from.first, ExifPlace::First);
+  take(from.exif, ExifPlace::Exif);
+  take(from.gps, ExifPlace::Gps);
+  return changes;
+}
+
 ExifChanges ShiftedTimes(const ExifDirectories& old, int64_t seconds, std::string& reason) {
   constexpr uint16_t kTimes[] = {0x0132, 0x9003, 0x9004};
   ExifChanges changes;
@@ -32,23 +49,12 @@ ExifChanges CopiedEntries(const ExifDirectories& from) {
   // orientation, resolution; maker notes, sound file; color space, size
   constexpr uint16_t kOwn[] = {0x0112, 0x011a, 0x011b, 0x0128, 0x927c,
                                0xa001, 0xa002, 0xa003, 0xa004, 0xa420};
-  ExifChanges changes;
-  const auto take = [&](const ExifDirectory& directory, ExifPlace place) {
-    for (const ExifEntry& entry : directory) {
-      const bool own = std::ranges::find(kOwn, entry.tag) != std::end(kOwn);
-      const uint8_t editClass = ExifEditClass(entry.tag);
-      if (own || editClass == kExifOpaque ||
-          (editClass == kExifStructural && place != ExifPlace::Gps))
-        continue;
-      DirectoryChange change{place, entry.tag, entry};
-      if (from.bigEndian) SwapExifNumbers(entry.type, change.entry->value);
-      changes.push_back(std::move(change));
-    }
-  };
-  take(from.first, ExifPlace::First);
-  take(from.exif, ExifPlace::Exif);
-  take(from.gps, ExifPlace::Gps);
-  return changes;
+  return TakenEntries(from, [&](const ExifEntry& entry, ExifPlace place) {
+    const bool own = std::ranges::find(kOwn, entry.tag) != std::end(kOwn);
+    const uint8_t editClass = ExifEditClass(entry.tag);
+    return !own && editClass != kExifOpaque &&
+           (editClass != kExifStructural || place == ExifPlace::Gps);
+  });
 }
 
 }  // namespace fotomill

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstdint>
+#include <functional>
 #include <string>
 
 #include "metadata/edit/picture_edit.h"
@@ -8,6 +9,10 @@
 namespace fotomill {
 
 // Changes computed from a file's entries; for EditPictureExif.
+
+// Changes that write the wanted entries of a file into another one, in little endian.
+ExifChanges TakenEntries(const ExifDirectories& from,
+                         const std::function<bool(const ExifEntry&, ExifPlace)>& isWanted);
 
 // Shifts all dates and times of the camera's clock. Sets a reason if there are none, or if a result
 // is not a valid date.

@@ -1,5 +1,4 @@
 #include <algorithm>
-#include <cstring>
 
 #include "containers/jpeg_segments.h"
 #include "containers/png_chunks.h"
@@ -52,17 +51,13 @@ class Found {
 };
 
 // The end of the picture: after the first EOI outside of segments.
-uint64_t EndOfJpeg(std::span<const uint8_t> file, uint64_t at) {
-  for (;;) {
-    const void* found = at < file.size() ? std::memchr(&file[at], 0xFF, file.size() - at) : nullptr;
-    if (found == nullptr) return file.size();
-    at = static_cast<uint64_t>(static_cast<const uint8_t*>(found) - file.data());
-    ByteReader bytes(file.subspan(at + 1));
-    const uint8_t marker = bytes.U8();
-    if (marker == 0xD9) return at + 2;
-    const bool alone = marker == 0 || marker == 0xFF || (marker >= 0xD0 && marker <= 0xD7);
-    at += marker == 0xFF ? 1 : alone ? 2 : 2 + std::max<uint64_t>(bytes.Be16(), 2);
+size_t EndOfJpeg(std::span<const uint8_t> file, size_t at) {
+  while ((at = NextScanMarker(file, at)) < file.size()) {
+    if (file[at + 1] == 0xD9) return at + 2;
+    ByteReader bytes(file.subspan(at + 2));
+    at += 2 + std::max<size_t>(bytes.Be16(), 2);
   }
+  return file.size();
 }
 
 void LookIntoJpeg(std::span<const uint8_t> file, Found& found) {

@@ -8,6 +8,7 @@
 #include "containers/metadata_rewrite.h"
 #include "containers/png_chunks.h"
 #include "core/byte_reader.h"
+#include "metadata/edit/exif_transfer.h"
 #include "metadata/edit/picture_edit.h"
 #include "metadata/xmp/xmp_edit.h"
 #include "texts/texts.h"
@@ -40,23 +41,12 @@ bool IsKept(const ExifEntry& entry, ExifPlace place, uint32_t kept) {
 
 // The entries to keep in the new file.
 ExifChanges KeptEntries(std::span<const uint8_t> file, MetadataForm form, uint32_t kept) {
-  const ExifDirectories old = GatherPictureExif(file);
-  ExifChanges changes;
-  const auto take = [&](const ExifDirectory& directory, ExifPlace place) {
-    for (const ExifEntry& entry : directory) {
-      // in TIFF and HD Photo, MakeBareTiff keeps the orientation
-      const bool own = entry.tag == kOrientation && form != MetadataForm::Jpeg &&
-                       form != MetadataForm::Png && form != MetadataForm::Webp;
-      if (own || !IsKept(entry, place, kept)) continue;
-      DirectoryChange change{place, entry.tag, entry};
-      if (old.bigEndian) SwapExifNumbers(entry.type, change.entry->value);
-      changes.push_back(std::move(change));
-    }
-  };
-  take(old.first, ExifPlace::First);
-  take(old.exif, ExifPlace::Exif);
-  take(old.gps, ExifPlace::Gps);
-  return changes;
+  return TakenEntries(GatherPictureExif(file), [&](const ExifEntry& entry, ExifPlace place) {
+    // in TIFF and HD Photo, MakeBareTiff keeps the orientation
+    const bool own = entry.tag == kOrientation && form != MetadataForm::Jpeg &&
+                     form != MetadataForm::Png && form != MetadataForm::Webp;
+    return !own && IsKept(entry, place, kept);
+  });
 }
 
 std::vector<uint8_t> XmpOf(std::span<const uint8_t> file, MetadataForm form) {
