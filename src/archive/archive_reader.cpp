@@ -241,7 +241,7 @@ std::string_view TroubleText(ArchiveTrouble trouble) {
   switch (trouble) {
     case ArchiveTrouble::None: break;
     case ArchiveTrouble::NeedsPassword: return TrLater("It is encrypted and needs a password.");
-    case ArchiveTrouble::WrongPassword: return TrLater("The password does not fit.");
+    case ArchiveTrouble::WrongPassword: return TrLater("The password is wrong.");
     case ArchiveTrouble::LockedRar:
       return TrLater("Encrypted RAR archives cannot be read, with or without the password.");
     case ArchiveTrouble::Volume:

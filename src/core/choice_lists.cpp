@@ -109,10 +109,10 @@ CHOICES(kHistorySortChoices,
     CHOICE("Path",      kColumnPath));
 CHOICES(kDistanceUnitChoices,
     CHOICE("Miles",      kMiles),
-    CHOICE("Kilometers", kKilometres));
+    CHOICE("Kilometers", kKilometers));
 CHOICES(kLengthUnitChoices,
     CHOICE("Inches",      kInches),
-    CHOICE("Centimeters", kCentimetres),
+    CHOICE("Centimeters", kCentimeters),
     CHOICE("Pixels",      kPixels));
 CHOICES(kBevelChoices,
     CHOICE("Sunken", kBevelSunken),

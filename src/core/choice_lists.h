@@ -99,9 +99,9 @@ enum HistoryColumn : int32_t {
   kColumnPath = 6,
 };
 // ExifDistinceUnits.
-enum DistanceUnit : int32_t { kMiles = 0, kKilometres = 1 };
+enum DistanceUnit : int32_t { kMiles = 0, kKilometers = 1 };
 // InfoUnits, MattUnits, PrintWorkshopUnits.
-enum LengthUnit : int32_t { kInches = 0, kCentimetres = 1, kPixels = 2 };
+enum LengthUnit : int32_t { kInches = 0, kCentimeters = 1, kPixels = 2 };
 // MattBevelType: bevel of a matte's inner edge.
 enum MattBevel : int32_t { kBevelSunken = 0, kBevelRaised = 1, kBevelNone = 2 };
 // DetailSizeMode: how file sizes are shown.

@@ -8,8 +8,6 @@ namespace fotomill {
 
 namespace {
 
-bool IsDigit(char c) { return c >= '0' && c <= '9'; }
-
 // The run of digits at `from`, without leading zeros; advances `from` past it.
 std::string_view TakeNumber(std::string_view text, size_t& from) {
   size_t end = from;

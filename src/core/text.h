@@ -15,6 +15,7 @@ constexpr char UpperCase(char c) {
 }
 // A to Z and a to z only.
 constexpr bool IsLetter(char c) { return LowerCase(c) >= 'a' && LowerCase(c) <= 'z'; }
+constexpr bool IsDigit(char c) { return c >= '0' && c <= '9'; }
 std::string LowerCase(std::string_view text);  // ASCII only
 std::string UpperCase(std::string_view text);  // ASCII only
 

@@ -31,7 +31,7 @@ int32_t PackedImage::PixelAt(int32_t x, int32_t y) const {
 
 Status CheckPackedSize(int32_t width, int32_t height, int32_t bitsPerPixel) {
   if (width < 1 || height < 1) return Status::DamagedFile;
-  const int32_t bits = NormalisedDepth(bitsPerPixel);
+  const int32_t bits = NormalizedDepth(bitsPerPixel);
   // cannot overflow 64 bits: a stride is below 2^34
   const uint64_t rowBytes = RowStride(width, bits) * static_cast<uint64_t>(height);
   const uint64_t headBytes = PackedImage::kHeaderSize + (bits == 24 ? 0 : uint64_t{4} << bits);
@@ -50,7 +50,7 @@ Status NewPackedImage(int32_t width, int32_t height, const Palette* palette, int
   PackedImage made;
   made.width_ = width;
   made.height_ = height;
-  made.bits_ = NormalisedDepth(bitsPerPixel);
+  made.bits_ = NormalizedDepth(bitsPerPixel);
   made.stride_ = RowStride(width, made.bits_);
   const uint64_t rowBytes = made.stride_ * static_cast<uint64_t>(height);
   const uint64_t size = made.RowsOffset() + rowBytes;

@@ -10,7 +10,7 @@
 namespace fotomill {
 
 // The in-memory depth of a picture of `bitsPerPixel`: 1, 4 (from 2), 8 (from 5) or 24 bits.
-constexpr int32_t NormalisedDepth(int32_t bitsPerPixel) {
+constexpr int32_t NormalizedDepth(int32_t bitsPerPixel) {
   if (bitsPerPixel == 1) return 1;
   if (bitsPerPixel >= 2 && bitsPerPixel <= 4) return 4;
   if (bitsPerPixel >= 5 && bitsPerPixel <= 8) return 8;
@@ -96,14 +96,14 @@ Status CheckPackedSize(int32_t width, int32_t height, int32_t bitsPerPixel);
 
 // Bytes of the rows of such a picture, without the header.
 constexpr uint64_t PackedRowBytes(int32_t width, int32_t height, int32_t bitsPerPixel) {
-  return RowStride(width, NormalisedDepth(bitsPerPixel)) * static_cast<uint64_t>(height);
+  return RowStride(width, NormalizedDepth(bitsPerPixel)) * static_cast<uint64_t>(height);
 }
 // Checks the peak memory needed for one file against the limit: MemoryAllocationError (6) if it is
 // exceeded. Codecs call it with what the header implies, their library's memory included, before
 // allocating anything.
 Status CheckFileMemory(uint64_t bytes);
 
-// Allocates a picture at the normalised depth of `bitsPerPixel`, its color table filled from
+// Allocates a picture at the normalized depth of `bitsPerPixel`, its color table filled from
 // `palette` (zero if null) and its rows zero; with Fill::Unset the rows are uninitialized, for
 // callers that write every byte of them, padding included. DamagedFile if width or height is
 // below 1, MemoryAllocationError if the block exceeds the limit or cannot be allocated; `image`

@@ -90,7 +90,7 @@ void PackIndices(const uint8_t* indices, int32_t width, int32_t bits, uint8_t* p
 
 Status PromoteImage(const PackedImage& image, int32_t bits, PackedImage& promoted) {
   promoted.Free();
-  if (NormalisedDepth(bits) <= image.Bits()) return Status::UnsuitableImage;
+  if (NormalizedDepth(bits) <= image.Bits()) return Status::UnsuitableImage;
   PackedImage made;
   RETURN_IF_BAD(NewPackedImage(image.Width(), image.Height(), nullptr, bits, made));
   const int32_t width = image.Width();
@@ -117,7 +117,7 @@ Status PromoteImage(const PackedImage& image, int32_t bits, PackedImage& promote
 }
 
 Status PromotePicture(PictureRecord& picture, int32_t bits) {
-  if (picture.image.Empty() || NormalisedDepth(bits) <= picture.image.Bits()) return Status::Ok;
+  if (picture.image.Empty() || NormalizedDepth(bits) <= picture.image.Bits()) return Status::Ok;
   PackedImage promoted;
   RETURN_IF_BAD(PromoteImage(picture.image, bits, promoted));
   const int32_t firstNew = promoted.Bits() == 24 ? 256 : picture.image.Colors();

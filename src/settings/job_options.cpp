@@ -80,7 +80,7 @@ ReduceOptions ReduceOptionsFromSettings() {
 ExifTextOptions ExifTextOptionsFromSettings() { return {.showTypes = settings.ExifShowTypes != 0}; }
 
 choice::DistanceUnit DistanceUnitFromSettings() {
-  return settings.ExifDistinceUnits == 0 ? choice::kMiles : choice::kKilometres;
+  return settings.ExifDistinceUnits == 0 ? choice::kMiles : choice::kKilometers;
 }
 
 bool GpsLocationFromSettings(GpsLocation& location) {

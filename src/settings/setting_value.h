@@ -23,8 +23,8 @@ enum class ValueFault {
   Internal,    // set by the program only
 };
 
-// The source of a value. A person is told about every fault; a file's values are used as
-// far as possible.
+// The source of a value. Faults in what a person enters are reported; a file's values are used
+// as far as possible.
 enum class ValueSource { Person, File };
 
 // A parsed value and its fault, if any.

@@ -6,6 +6,7 @@
 #include <utility>
 
 #include "core/byte_reader.h"
+#include "core/text.h"
 #include "platform/files.h"
 
 namespace fotomill {
@@ -24,8 +25,6 @@ namespace {
 // consists of both forms, separated by a NUL. The empty message is the header.
 constexpr uint32_t kMagic = 0x950412DE, kSwappedMagic = 0xDE120495;
 constexpr uint64_t kMostBytes = 64 << 20;
-
-bool IsDigit(char c) { return c >= '0' && c <= '9'; }
 
 class PluralFormula {
  public:

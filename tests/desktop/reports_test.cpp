@@ -151,7 +151,7 @@ std::string ValueOf(const std::vector<InfoSection>& sections, const std::string&
 
 TEST_F(Reports, InfoOfOneAndOfSeveral) {
   settings.InfoResolution = 75;
-  settings.InfoUnits = choice::kCentimetres;
+  settings.InfoUnits = choice::kCentimeters;
   const FileInfo one = ReadFileInfo(Sample("one.bmp"), InfoOptionsFromSettings());
   EXPECT_EQ(one.status, Status::Ok);
   EXPECT_EQ(ValueOf(one.sections, "General", "Dimensions"), "150 x 112 pixels");

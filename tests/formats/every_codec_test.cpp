@@ -166,7 +166,7 @@ TEST(EveryCodec, ReadsBackWhatItWrote) {
         EXPECT_GE(sink.steps, 35);
         EXPECT_EQ(described->width, back->image.Width());
         EXPECT_EQ(described->height, back->image.Height());
-        EXPECT_EQ(NormalisedDepth(described->bitsPerPixel), back->image.Bits());
+        EXPECT_EQ(NormalizedDepth(described->bitsPerPixel), back->image.Bits());
         if (KeepsOf(row) != Keeps::Nothing) {
           EXPECT_EQ(picture->image.Width(), back->image.Width());
           EXPECT_EQ(picture->image.Height(), back->image.Height());

@@ -26,9 +26,9 @@ TEST(Gps, ReadsLocations) {
 }
 
 TEST(Gps, MeasuresDistances) {
-  EXPECT_NEAR(GpsDistance(60, 179.5, 60, -179.5, choice::kKilometres), 55.56, 0.01) << "across the date line";
-  EXPECT_EQ(GpsDistance(45.33, -79.22, 45.33, -79.22, choice::kKilometres), 0);
-  EXPECT_NEAR(GpsDistance(78.6, -104, -78.6, 76, choice::kKilometres), 20002.5, 0.1) << "opposite places";
+  EXPECT_NEAR(GpsDistance(60, 179.5, 60, -179.5, choice::kKilometers), 55.56, 0.01) << "across the date line";
+  EXPECT_EQ(GpsDistance(45.33, -79.22, 45.33, -79.22, choice::kKilometers), 0);
+  EXPECT_NEAR(GpsDistance(78.6, -104, -78.6, 76, choice::kKilometers), 20002.5, 0.1) << "opposite places";
 }
 
 TEST(Gps, PlacesAreReadable) {

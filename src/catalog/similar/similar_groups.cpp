@@ -11,7 +11,7 @@ namespace fotomill {
 namespace {
 
 constexpr size_t kParts = 4, kPartBits = 16, kPartValues = size_t{1} << kPartBits;
-// For larger distances, so many bits may differ per part that comparing all pairs is as fast.
+// Up to this distance, searching by parts beats comparing all pairs.
 constexpr int32_t kMostByParts = 15;
 constexpr size_t kAskedEvery = 256;
 

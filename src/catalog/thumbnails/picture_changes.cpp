@@ -42,12 +42,6 @@ bool HasThumbnailName(const std::string& path) {
   return EqualIgnoringCase(platform::SplitPath(path).extension, kThumbnailExtension);
 }
 
-// Deletes the thumbnail file of a picture.
-void DeleteFileOf(const std::string& picture) {
-  const std::string file = ThumbnailPathFor(picture);
-  if (!HasThumbnailName(picture) && IsThumbnailFile(file)) (void)platform::DeleteFile(file);
-}
-
 }  // namespace
 
 void MarkChangedRecords(std::span<const PictureChange> changes) {
@@ -94,14 +88,17 @@ bool WentWithPicture(const std::string& path, std::span<const PictureChange> cha
   });
 }
 
-void DeleteThumbnailFile(const std::string& path) { DeleteFileOf(path); }
+void DeleteThumbnailFile(const std::string& path) {
+  const std::string file = ThumbnailPathFor(path);
+  if (!HasThumbnailName(path) && IsThumbnailFile(file)) (void)platform::DeleteFile(file);
+}
 
 void DeleteMisleadingThumbnailFile(const std::string& path) {
   const std::string file = ThumbnailPathFor(path);
   const platform::FileFacts facts = platform::FactsOf(file), picture = platform::FactsOf(path);
   if (facts.kind == platform::FileKind::Regular && picture.kind == platform::FileKind::Regular &&
       facts.modified >= picture.modified)
-    DeleteFileOf(path);
+    DeleteThumbnailFile(path);
 }
 
 }  // namespace fotomill

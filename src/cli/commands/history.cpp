@@ -7,8 +7,8 @@
 #include "catalog/history/file_history.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
+#include "cli/frame/shown_text.h"
 #include "core/whole_number.h"
-#include "platform/clock.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "settings/job_options.h"
@@ -40,14 +40,6 @@ int Complain(const CommandContext& context, const char* message) {
   output.Note((path.empty() ? "fotomill" : output.ShownMessage(path)) + ": " +
               WithReason(Tr(message)));
   return kExitFailed;
-}
-
-std::string TimeText(int64_t seconds) {
-  const platform::LocalTime time = platform::LocalTimeOf(seconds);
-  char text[40];
-  std::snprintf(text, sizeof text, "%04d-%02d-%02d %02d:%02d:%02d", time.year, time.month, time.day,
-                time.hour, time.minute, time.second);
-  return text;
 }
 
 int RunList(const HistoryOptions& options, const CommandContext& context) {

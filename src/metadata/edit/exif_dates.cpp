@@ -4,11 +4,11 @@
 #include <chrono>
 #include <cstdio>
 
+#include "core/text.h"
+
 namespace fotomill {
 
 namespace {
-
-bool IsDigit(char c) { return c >= '0' && c <= '9'; }
 
 // Parses exactly `count` digits.
 bool TakeDigits(std::string_view& text, size_t count, int& number) {

@@ -47,8 +47,6 @@ void PutUtf16(std::string_view text, std::vector<uint8_t>& bytes) {
   }
 }
 
-bool IsDigit(char c) { return c >= '0' && c <= '9'; }
-
 // A number as entered, unrounded.
 struct Fraction {
   int64_t numerator = 0, denominator = 1;

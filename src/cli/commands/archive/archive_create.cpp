@@ -83,7 +83,7 @@ class Members {
     Member member = {path, ReadableEntryName(stored)};
     if (!IsSafeEntryName(member.name)) {
       member.status = Status::InvalidDestination;
-      member.hint = Tr("Archives take no such names.");
+      member.hint = Tr("Archives cannot hold such names.");
     } else if (!names_.insert(member.name).second) {
       member.status = Status::InvalidDestination;
       member.hint = Tr("Another file has the same name in the archive.");

@@ -1,5 +1,4 @@
 #include <algorithm>
-#include <cstdio>
 #include <memory>
 #include <set>
 #include <string>
@@ -11,9 +10,9 @@
 #include "cli/commands/archive/archive_options.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
+#include "cli/frame/shown_text.h"
 #include "cli/frame/terminal_prompts.h"
 #include "core/natural_order.h"
-#include "platform/clock.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
@@ -92,14 +91,6 @@ void AskPasswordIfNeeded(const CommandContext& context, ResultOutput& output,
   if (!needed || !archive.source.password.empty() || !context.MayAsk()) return;
   TerminalPrompts prompts(context, output);
   archive.source.password = prompts.AskPassword(archive.source.path).value_or("");
-}
-
-std::string TimeText(int64_t seconds) {
-  const platform::LocalTime time = platform::LocalTimeOf(seconds);
-  char text[40];
-  std::snprintf(text, sizeof text, "%04d-%02d-%02d %02d:%02d:%02d", time.year, time.month, time.day,
-                time.hour, time.minute, time.second);
-  return text;
 }
 
 void PutEntry(const ArchiveEntry& entry, ResultOutput& output) {

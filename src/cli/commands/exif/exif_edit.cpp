@@ -287,8 +287,8 @@ void SetUpExifShift(CLI::App& app, CommandContext& context) {
           "The same as an option, for times that are subtracted: --by=-1:30:00");
   AddRewriteOptions(app, options->rewrite);
   SetFooter(app,
-            "Moves the date and time that a picture was taken, digitized and changed, as the "
-            "camera's clock had them.",
+            "Shifts the dates and times when a picture was taken, digitized and changed. They are "
+            "in the time of the camera's clock.",
             "fotomill exif shift holiday --in-place +1:30:00");
   context.run = [options, &context] {
     const auto shift =
@@ -323,8 +323,9 @@ void SetUpExifStrip(CLI::App& app, CommandContext& context) {
   auto options = std::make_shared<StripOptions>();
   AddSelection(app, options->rewrite.selection, context);
   CLI::Option* keep = AddName(app, "--keep", options->keep, "LIST",
-                              "What stays, with commas: orientation, profile, copyright, exif, "
-                              "gps, xmp, iptc, comments; or none (default: orientation,profile)");
+                              "Metadata to keep, separated by commas: orientation, profile, "
+                              "copyright, exif, gps, xmp, iptc, comments; or none "
+                              "(default: orientation,profile)");
   CLI::Option* gpsOnly = AddFlag(app, "--gps-only", options->gpsOnly,
                                  "Remove only where the picture was taken, in EXIF and XMP");
   Exclude(gpsOnly, keep);

@@ -45,7 +45,7 @@ std::string PrintSize(const PictureRecord& picture, const InfoOptions& options) 
   std::string text;
   switch (options.units) {
     case choice::kPixels: return {};
-    case choice::kCentimetres:
+    case choice::kCentimeters:
       text = Tr("%1 x %2 centimeters", DecimalText(picture.width / x * 2.54, 2),
                 DecimalText(picture.height / y * 2.54, 2));
       break;

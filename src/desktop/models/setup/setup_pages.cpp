@@ -24,7 +24,7 @@ constexpr SetupItem Item(SetupPage page, const char* group, KeyNumber key, const
 constexpr SetupItem kItems[] = {
     Item(Browsing,   TrLater("Start"),              RememberOpenWindows,            "Reopen the tabs of the last session"),
     Item(Browsing,   TrLater("Start"),              ShowStartupWindow,              "Show a startup window"),
-    Item(Browsing,   TrLater("Start"),              LogoDelay,                      "Milliseconds that it is shown"),
+    Item(Browsing,   TrLater("Start"),              LogoDelay,                      "Display time in milliseconds"),
     Item(Browsing,   TrLater("Text sizes"),         NormalTextFontSize,             "Lists and reports; 10 is the size of the system"),
     Item(Browsing,   TrLater("Text sizes"),         SmallTextFontSize,              "Notes; 8 is the size of the system"),
     Item(Browsing,   TrLater("Text sizes"),         NormalThumbFontSize,            "Names below thumbnails; 8 is the size of the system"),

@@ -242,7 +242,7 @@ void ConvertSelection(Shell& shell) { RunWithDestination(shell, Label("Convert")
 void ResizeSelection(Shell& shell) {
   const std::vector<NamedSize> sizes = NamedSizes();
   if (sizes.empty()) {
-    wxMessageBox(Label("Setup has no size as WIDTH,HEIGHT."), Label("Resize"),
+    wxMessageBox(Label("No size is set. Enter one as WIDTH,HEIGHT in Setup."), Label("Resize"),
                  wxOK | wxICON_INFORMATION, &shell.Window());
     return;
   }
