@@ -95,6 +95,14 @@ class Editor : DirectoryBytes {
     return values;
   }
 
+  DirectoryValue FindFirst(uint16_t tag) {
+    Directory first;
+    if (!ReadHeader() || !ReadDirectory(Number(FirstAt(), Word()), first)) return {};
+    const auto entry = std::ranges::find(first.entries, tag, &Entry::tag);
+    if (entry == first.entries.end() || !Holds(entry->value, entry->size)) return {};
+    return {entry->type, file_.subspan(entry->value, entry->size)};
+  }
+
  private:
   Status Damaged() {
     reason_ = Tr("The directories of its EXIF are damaged.");
@@ -439,6 +447,12 @@ std::vector<DirectoryValue> FindDirectoryValues(std::span<const uint8_t> file, u
   DirectoryEdit edit;
   std::string reason;
   return Editor(file, edit, reason).FindAll(tag);
+}
+
+DirectoryValue FirstDirectoryValue(std::span<const uint8_t> file, uint16_t tag) {
+  DirectoryEdit edit;
+  std::string reason;
+  return Editor(file, edit, reason).FindFirst(tag);
 }
 
 void AddEdited(std::span<const uint8_t> file, DirectoryEdit edit, FilePieces& pieces) {

@@ -59,6 +59,8 @@ struct DirectoryValue {
   std::span<const uint8_t> bytes = {};
 };
 std::vector<DirectoryValue> FindDirectoryValues(std::span<const uint8_t> file, uint16_t tag);
+// As above, in the first directory; empty if it does not have the tag.
+DirectoryValue FirstDirectoryValue(std::span<const uint8_t> file, uint16_t tag);
 
 // Swaps the byte order of the numbers in values of a type.
 void SwapExifNumbers(uint16_t type, std::span<uint8_t> values);

@@ -6,6 +6,7 @@
 #include "catalog/thumbnails/thumbnail_update.h"
 #include "metadata/exif/exif_text.h"
 #include "metadata/gps.h"
+#include "metadata/tags/picture_tags.h"
 #include "picture/encode_options.h"
 #include "picture/read_request.h"
 #include "processing/faces/face_options.h"
@@ -129,6 +130,11 @@ ThumbnailUpdateOptions ThumbnailUpdateOptionsFromSettings() {
 void StoreThumbnailUpdate(const ThumbnailUpdateOptions& options) {
   settings.UpdateThumbnailsOptions = options.choice;
   if (!options.offers) settings.UpdateThumbnailsFlag = 0;
+}
+
+TagSources TagSourcesFromSettings() {
+  return {.commentFolder = std::string(settings.FileCommentPath.view()),
+          .commentExtension = std::string(settings.TextCommentExtension.view())};
 }
 
 bool WritesCommentsFromSettings() { return settings.WriteFileComments != 0; }

@@ -11,6 +11,7 @@ struct HistoryOptions;
 struct ReadOptions;
 struct ReduceOptions;
 struct FaceOptions;
+struct TagSources;
 struct ThumbnailOptions;
 struct ThumbnailUpdateOptions;
 
@@ -42,6 +43,8 @@ ThumbnailUpdateOptions ThumbnailUpdateOptionsFromSettings();  // the keys named 
 // Stores the user's choice about updating thumbnails.
 void StoreThumbnailUpdate(const ThumbnailUpdateOptions& options);
 
+// FileCommentPath and TextCommentExtension.
+TagSources TagSourcesFromSettings();
 // WriteFileComments.
 bool WritesCommentsFromSettings();
 

@@ -6,11 +6,13 @@
 #include "batch/picture_failure.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
+#include "cli/frame/tag_json.h"
 #include "cli/selection/file_selection.h"
 #include "core/shown_text.h"
 #include "core/text.h"
 #include "core/utf8.h"
 #include "metadata/edit/gps_place.h"
+#include "metadata/tags/tag_lines.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
 #include "texts/texts.h"
@@ -42,7 +44,7 @@ void AddFrames(const PictureRecord& picture, Json& facts) {
   facts["rounds"] = animation->Rounds();
 }
 
-Json FactsAsJson(const PictureRecord& picture) {
+Json FactsAsJson(const PictureRecord& picture, const PictureTags& tags) {
   const FormatEntry& row = FormatRow(picture.formatIndex);
   Json facts;
   facts["format"] = row.extension.view();
@@ -67,6 +69,7 @@ Json FactsAsJson(const PictureRecord& picture) {
                          {"longitude", place->longitude},
                          {"link", MapLink(*place)}};
   }
+  if (Json object = TagsAsJson(tags); !object.empty()) facts["tags"] = std::move(object);
   return facts;
 }
 
@@ -78,7 +81,7 @@ void AddFact(std::string& text, std::string_view label, std::string_view value) 
 }
 
 // All lines of one file as one text.
-std::string FactsAsText(const PictureRecord& picture) {
+std::string FactsAsText(const PictureRecord& picture, const PictureTags& tags) {
   const FormatEntry& row = FormatRow(picture.formatIndex);
   std::string text;
   AddFact(text, Tr("Format"), row.description.view());
@@ -101,6 +104,7 @@ std::string FactsAsText(const PictureRecord& picture) {
     std::snprintf(degrees, sizeof degrees, "%.5f, %.5f  ", place->latitude, place->longitude);
     AddFact(text, Tr("Location"), degrees + MapLink(*place));
   }
+  for (const TagLine& line : TagLines(tags)) AddFact(text, Tr(line.label), line.text);
   AddFact(text, Tr("File size"), TrCount("%1 byte", "%1 bytes", picture.fileSize));
   AddFact(text, Tr("Image data"), TrCount("%1 byte", "%1 bytes", picture.imageBytes));
   for (size_t i = 0; i < picture.detailLines.Count(); ++i) {
@@ -110,24 +114,26 @@ std::string FactsAsText(const PictureRecord& picture) {
   return text;
 }
 
-Status GatherFacts(const SelectedFile& file, PicturePointer& picture) {
+Status GatherFacts(const SelectedFile& file, PicturePointer& picture, PictureTags& tags) {
   if (file.status != Status::Ok) return file.status;
   RETURN_IF_BAD(LoadPictureInfo({.fileName = file.name, .options = ReadOptionsFromSettings()}, picture));
   const FormatEntry& row = FormatRow(picture->formatIndex);
   if (row.details != nullptr) RETURN_IF_BAD(row.details(*picture));
+  (void)ReadPictureTags(file.name, TagSourcesFromSettings(), tags);  // the file could be read
   return Status::Ok;
 }
 
 void ReportFile(const SelectedFile& file, ResultOutput& output) {
   PicturePointer picture;
-  const Status status = GatherFacts(file, picture);
+  PictureTags tags;
+  const Status status = GatherFacts(file, picture, tags);
   const std::string hint =
       status == Status::Ok || !file.hint.empty() ? file.hint : OpenHint(file.name, status);
   if (output.IsJson()) {
     Json element;
     PutName(element, "file", output.NameOf(file.name));
     PutStatus(element, status);
-    if (status == Status::Ok) element.update(FactsAsJson(*picture));
+    if (status == Status::Ok) element.update(FactsAsJson(*picture, tags));
     if (status == Status::Ok ? OpenedByContents(*picture) : file.status == Status::Ok) {
       const std::string_view looksLike = LooksLike(file.name, FindFormatByName(file.name));
       if (!looksLike.empty()) element["looksLike"] = looksLike;
@@ -139,7 +145,7 @@ void ReportFile(const SelectedFile& file, ResultOutput& output) {
     return;
   }
   output.CountFile();
-  if (!output.IsJson()) output.Line(output.Shown(file.name) + "\n" + FactsAsText(*picture));
+  if (!output.IsJson()) output.Line(output.Shown(file.name) + "\n" + FactsAsText(*picture, tags));
 }
 
 int RunInfo(const InfoOptions& options, const CommandContext& context) {

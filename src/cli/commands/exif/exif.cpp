@@ -6,11 +6,14 @@
 
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
+#include "cli/frame/tag_json.h"
 #include "cli/selection/file_selection.h"
 #include "cli/selection/output_place.h"
+#include "core/shown_text.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_text.h"
 #include "metadata/gps.h"
+#include "metadata/tags/tag_lines.h"
 #include "platform/files.h"
 #include "platform/held_file.h"
 #include "platform/output_file.h"
@@ -151,6 +154,25 @@ class ExifRun {
   int Finish() { return output_.Finish(); }
 
  private:
+  static PictureTags TagsOf(const SelectedFile& file) {
+    PictureTags tags;
+    TagSources sources = TagSourcesFromSettings();
+    sources.exif = false;
+    (void)ReadPictureTags(file.name, sources, tags);  // the file could be read
+    return tags;
+  }
+  // Titles, keywords and the like of XMP and IPTC, below the EXIF.
+  void AddTags(const SelectedFile& file) {
+    const std::vector<TagLine> lines = TagLines(TagsOf(file));
+    if (!lines.empty()) text_.append(Tr(kTagsHeading)).append("\n");
+    for (const TagLine& line : lines)
+      text_.append("    ")
+          .append(Tr(line.label))
+          .append("\t")
+          .append(EscapeControls(line.text))
+          .append("\n");
+  }
+
   Outcome ReportJson(const SelectedFile& file) {
     JsonLines lines;
     Json element;
@@ -158,6 +180,10 @@ class ExifRun {
     PutName(element, "file", output_.NameOf(file.name));
     PutStatus(element, outcome.status);
     element["directories"] = lines.Take();
+    if (outcome.status == Status::Ok) {
+      Json tags = TagsAsJson(TagsOf(file));
+      if (!tags.empty()) element["tags"] = std::move(tags);
+    }
     output_.Element(element);
     return outcome;
   }
@@ -168,10 +194,10 @@ class ExifRun {
     Outcome outcome = WalkFile(file, options_, lines_, stream_);
     if (outcome.status == Status::Ok && !lines_.Complete())
       outcome.status = Status::MemoryAllocationError;
-    if (lines_.Text().empty()) return outcome;
-    text_.clear();
-    if (named) text_.append(output_.Shown(file.name)).append("\n");
-    text_ += lines_.Text();
+    text_ = lines_.Text();
+    if (outcome.status == Status::Ok) AddTags(file);
+    if (text_.empty()) return outcome;
+    if (named) text_.insert(0, output_.Shown(file.name) + "\n");
     text_.pop_back();  // added by Line
     output_.Line(text_);
     return outcome;
@@ -229,7 +255,7 @@ void SetUpExif(CLI::App& app, CommandContext& context) {
   AddSelection(app, options->selection, context);
   AddFlag(app, "--json", options->json,
           "Print a JSON array of {file, status, message, directories: [{label, entries: [{tag, "
-          "name, type, count, text}]}]}");
+          "name, type, count, text}]}], tags}");
   AddName(app, "--thumbnail", options->thumbnail, "OUT|-",
           "Extract the embedded thumbnail to this file, unchanged; - is standard output");
   AddChoice(app, "--overwrite", options->overwrite, "HOW",

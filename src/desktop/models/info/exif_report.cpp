@@ -5,6 +5,7 @@
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_tags.h"
 #include "metadata/gps.h"
+#include "metadata/tags/tag_lines.h"
 #include "settings/job_options.h"
 #include "texts/status_text.h"
 #include "texts/texts.h"
@@ -77,11 +78,23 @@ void AddPlaces(const ExifPlaces& places, const ExifReportOptions& options, ExifR
            report);
 }
 
+void AddTags(const std::string& path, const TagSources& sources, ExifReport& report) {
+  PictureTags tags;
+  (void)ReadPictureTags(path, sources, tags);  // the file could be read
+  const std::vector<TagLine> lines = TagLines(tags);
+  if (lines.empty()) return;
+  report.rows.push_back({true, 0, Tr(kTagsHeading), {}});
+  report.text.append(Tr(kTagsHeading)).append("\n");
+  for (const TagLine& line : lines) AddRow(line.label, EscapeControls(line.text), report);
+}
+
 }  // namespace
 
 ExifReportOptions ExifReportOptionsFromSettings() {
   ExifReportOptions options{.text = ExifTextOptionsFromSettings(),
-                            .unit = DistanceUnitFromSettings()};
+                            .unit = DistanceUnitFromSettings(),
+                            .tags = TagSourcesFromSettings()};
+  options.tags.exif = false;
   GpsLocation home;
   if (GpsLocationFromSettings(home))
     options.home = ExifPlace{GpsDegrees(home.latitude), GpsDegrees(home.longitude)};
@@ -97,7 +110,8 @@ ExifReport ReadExifReport(const std::string& path, const ExifReportOptions& opti
     return report;
   }
   if (source.Block().empty()) {
-    report.problem = Tr("This file has no EXIF.");
+    AddTags(path, options.tags, report);
+    if (report.rows.empty()) report.problem = Tr("This file has no EXIF.");
     return report;
   }
   Gather gather(report, options.text);
@@ -109,6 +123,7 @@ ExifReport ReadExifReport(const std::string& path, const ExifReportOptions& opti
   }
   gather.Finish();
   AddPlaces(FindExifPlaces(source.Block()), options, report);
+  AddTags(path, options.tags, report);
   ReadThumbnail(ExifThumbnail(source.Block(), findings), report);
   if (!source.Intact()) {
     report.status = Status::FileReadError;

@@ -10,6 +10,7 @@
 #include "desktop/models/drawing/rgb_image.h"
 #include "metadata/exif/exif_places.h"
 #include "metadata/exif/exif_text.h"
+#include "metadata/tags/picture_tags.h"
 
 namespace fotomill::desktop {
 
@@ -26,8 +27,10 @@ struct ExifReportOptions {
   ExifTextOptions text = {};
   std::optional<ExifPlace> home = {};  // start of distances; none: no distances
   choice::DistanceUnit unit = choice::kMiles;
+  TagSources tags = {.exif = false};
 };
-// From the keys ExifShowTypes, ExifDefaultLocation and ExifDistinceUnits. Main thread only.
+// From the keys ExifShowTypes, ExifDefaultLocation, ExifDistinceUnits, FileCommentPath and
+// TextCommentExtension. Main thread only.
 ExifReportOptions ExifReportOptionsFromSettings();
 
 // The EXIF of a file, for the viewer.
@@ -35,7 +38,7 @@ struct ExifReport {
   Status status = Status::Ok;
   // an error message if not everything can be shown; else empty
   std::string problem;
-  // the entries, then places and distances from the GPS directory
+  // the entries, places and distances from the GPS directory, titles and keywords
   std::vector<ExifRow> rows;
   // all lines as text, for copying, saving and printing
   std::string text;

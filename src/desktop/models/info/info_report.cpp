@@ -124,9 +124,13 @@ InfoSection DetailsOf(const PictureRecord& picture) {
 }
 
 void AddExif(const std::string& path, const InfoOptions& options, FileInfo& info) {
+  constexpr std::string_view kDirectory = "DIRECTORY ";
   for (ExifRow& row : ReadExifReport(path, options.exif).rows) {
     if (row.heading) {
-      info.sections.push_back({"EXIF: " + row.name.substr(row.name.find(' ') + 1), {}});
+      info.sections.push_back({row.name.starts_with(kDirectory)
+                                   ? "EXIF: " + row.name.substr(kDirectory.size())
+                                   : row.name,
+                               {}});
     } else {
       info.sections.back().lines.push_back({std::move(row.name), std::move(row.text)});
     }
