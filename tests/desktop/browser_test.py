@@ -247,6 +247,40 @@ def play_animation(folder):
         desktop.wait(r"view-frame frame 2 of 5$")
 
 
+def side_pane(folder):
+    """Follows the focus, and comes back with its width."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, NAMES)
+    (pictures / "broken.gif").write_bytes(b"GIF89a and no more")
+    (pictures / "sub").mkdir()
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"browser tabs=1 lines=6 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "Right", "F3")
+        desktop.wait(r"side-pane shown")
+        desktop.wait(r"side .*/a1.bmp preview=\d\d+x\d\d+$")
+        desktop.key("Right")
+        desktop.wait(r"side .*/a2.png preview=\d\d+x\d\d+$")
+        desktop.screenshot("side-pane")
+        desktop.key("End")
+        desktop.wait(r"side .*/broken.gif preview=0x0 remark=\S+")
+        desktop.screenshot("side-pane-broken")
+        desktop.key("Home")
+        desktop.wait(r"side .*/sub preview=0x0$")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"side-pane shown")
+        desktop.wait(r"side .*/sub ")
+        desktop.focus("Fotomill Professional")
+        desktop.key("F3")
+        desktop.wait(r"side-pane hidden")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+    text = (folder / "data/Fotomill Professional 11.ini").read_text()
+    assert "SidePaneEnable=0\n" in text, text
+
+
 def later_starts(folder):
     pictures, other = folder / "pictures", folder / "other"
     make_pictures(pictures, NAMES)
@@ -299,4 +333,4 @@ def later_starts(folder):
         assert later.wait(30) == 0
 
 
-run(open_select_view, compare, play_animation, later_starts)
+run(open_select_view, side_pane, compare, play_animation, later_starts)

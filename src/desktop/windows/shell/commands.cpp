@@ -14,6 +14,7 @@
 #include "desktop/windows/shell/function_toolbar.h"
 #include "desktop/windows/shell/picture_windows.h"
 #include "desktop/windows/shell/shell.h"
+#include "desktop/windows/shell/side_pane.h"
 #include "desktop/windows/shell/tool_windows.h"
 #include "texts/texts.h"
 
@@ -39,6 +40,7 @@ bool Has(Shell& shell) {
   return browser != nullptr && browser->Model().Modes().*mode == value;
 }
 bool HasFolders(Shell& shell) { return shell.Folders().Shown(); }
+bool HasSide(Shell& shell) { return shell.Side().Shown(); }
 
 template <int32_t mode>
 void ThumbnailsFrom(Shell& shell) {
@@ -99,6 +101,7 @@ void PreviousTab(Shell& shell) { shell.Tabs().Step(-1); }
 void ChooseToolbar(Shell& shell) { shell.Toolbar().Choose(); }
 void Quit(Shell& shell) { shell.Window().Close(); }
 void ToggleFolders(Shell& shell) { shell.Folders().Show(!shell.Folders().Shown()); }
+void ToggleSide(Shell& shell) { shell.Side().Show(!shell.Side().Shown()); }
 void ReadFoldersAgain(Shell& shell) { shell.FilesChanged(); }
 void ToggleFavorite(Shell& shell) {
   shell.Folders().ToggleFavorite(shell.Tabs().CurrentFolder());
@@ -177,6 +180,7 @@ constexpr Command kCommands[] = {
     {kView, nullptr},
     {kView, TrLater("Detai&ls columns..."), "",      TrLater("Chooses the columns of the Details view."), Needs::Nothing, OfBrowser<&BrowserPage::ChooseColumns>},
     {kView, TrLater("&Folders"),            "F9",           TrLater("Shows or hides the folder tree."), Needs::Nothing, ToggleFolders, nullptr, false, HasFolders},
+    {kView, TrLater("Side &pane"),          "F3",           TrLater("Shows or hides a preview and the facts of the focused picture."), Needs::Nothing, ToggleSide, nullptr, false, HasSide},
     {kView, TrLater("&Refresh"),            "F5",           TrLater("Reloads the folders."), Needs::Nothing, ReadFoldersAgain},
 
     {kGo, TrLater("&Back"),                 "Alt+Left",     TrLater("Goes back to the previous folder."), Needs::Nothing, OfBrowser<&BrowserPage::GoBack>},

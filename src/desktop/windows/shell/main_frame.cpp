@@ -16,6 +16,7 @@
 #include "desktop/windows/shell/frame_session.h"
 #include "desktop/windows/shell/function_toolbar.h"
 #include "desktop/windows/shell/picture_windows.h"
+#include "desktop/windows/shell/side_pane.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -44,9 +45,11 @@ MainFrame::MainFrame()
   menus_ = std::make_unique<FrameMenus>(*this);
   toolbar_ = std::make_unique<FunctionToolbar>(*this);
   folders_ = std::make_unique<FolderPane>(*this);
-  tabs_ = std::make_unique<BrowserTabs>(folders_->Parent(), *this, *menus_,
+  side_ = std::make_unique<SidePane>(*this, folders_->Parent());
+  tabs_ = std::make_unique<BrowserTabs>(side_->Parent(), *this, *menus_,
                                         [this] { BrowserChanged(); });
-  folders_->PlaceBeside(tabs_->Window());
+  side_->PlaceBeside(tabs_->Window());
+  folders_->PlaceBeside(*side_->Parent());
   session_ = std::make_unique<FrameSession>(*this);
   pictures_ = std::make_unique<PictureWindows>(*this);
   CreateStatusBar(kFieldCount);
@@ -110,6 +113,7 @@ void MainFrame::BrowserChanged() {
   SetStatusText(Shown(model.CountText()), kCountField);
   pictures_->OfferList(browser);
   folders_->Follow(model.Folder());
+  side_->Follow(model);
 }
 
 void MainFrame::FilesChanged() {
@@ -141,6 +145,7 @@ void MainFrame::OnClose(wxCloseEvent& event) {
     if (dialog.ShowModal() != wxID_OK) return event.Veto();
   }
   folders_->KeepWidth();
+  side_->KeepWidth();
   (void)session_->Keep(settings.RememberOpenWindows != 0);
   (void)SaveConfiguration();
   uses_->End();

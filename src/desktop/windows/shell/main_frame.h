@@ -27,6 +27,7 @@ class MainFrame : public wxFrame, public Shell {
   wxFrame& Window() override { return *this; }
   BrowserTabs& Tabs() override { return *tabs_; }
   FolderPane& Folders() override { return *folders_; }
+  SidePane& Side() override { return *side_; }
   PictureWindows& Pictures() override { return *pictures_; }
   FileActions& Files() override { return *files_; }
   BatchRunner& Batches() override { return *batches_; }
@@ -52,6 +53,7 @@ class MainFrame : public wxFrame, public Shell {
   std::unique_ptr<FrameMenus> menus_;
   std::unique_ptr<FunctionToolbar> toolbar_;
   std::unique_ptr<FolderPane> folders_;
+  std::unique_ptr<SidePane> side_;
   std::unique_ptr<BrowserTabs> tabs_;
   std::unique_ptr<FrameSession> session_;
   std::unique_ptr<PictureWindows> pictures_;

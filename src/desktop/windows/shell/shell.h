@@ -14,6 +14,7 @@ class FolderPane;
 class FrameSession;
 class FunctionToolbar;
 class PictureWindows;
+class SidePane;
 class ThumbnailService;
 class UseRecorder;
 
@@ -29,6 +30,7 @@ class Shell {
 
   virtual BrowserTabs& Tabs() = 0;         // the browsers, and the current selection
   virtual FolderPane& Folders() = 0;       // the folder tree with the favorites
+  virtual SidePane& Side() = 0;            // preview and facts of the focused file
   virtual PictureWindows& Pictures() = 0;  // view and compare windows
   virtual FileActions& Files() = 0;        // renaming, copying, moving, deleting; undo
   virtual BatchRunner& Batches() = 0;      // functions on multiple files
