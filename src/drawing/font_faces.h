@@ -37,6 +37,8 @@ class FontFaces {
   FT_Face Outlines(size_t face) const { return faces_[face].outlines; }
   hb_font_t* Shaper(size_t face) const { return faces_[face].shaper; }  // of the same face and size
 
+  const FontFile& FileOf(size_t face) const { return files_->At(faces_[face].file); }
+
   // The first face that has all of the characters, else the first that has the first of them, else
   // the family's own.
   size_t FaceFor(std::span<const char32_t> characters);

@@ -9,9 +9,6 @@
 
 namespace fotomill {
 
-// Alignment of the lines in a block.
-enum class TextAlign : int32_t { Left, Center, Right };
-
 // Layout of a text. All lengths are in pixels.
 struct TextLayout {
   double width = 0;        // maximum line width; 0: break only at line feeds

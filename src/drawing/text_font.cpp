@@ -57,12 +57,13 @@ std::string TextFont::Fitted(std::string_view text, int32_t width) {
   return fitted;
 }
 
-Status TextFont::DrawCentered(PackedImage& image, const Rectangle& band, std::string_view text,
-                              Color color) {
+Status TextFont::DrawIn(PackedImage& image, const Rectangle& band, TextAlign align,
+                        std::string_view text, Color color) {
   const TextLine line = Shape(text);
   PackedImage mask;
   RETURN_IF_BAD(NewAlphaPlane(band.width, band.height, mask));
-  const int32_t start = (band.width - ((line.width + 63) >> 6)) / 2;
+  const int32_t room = band.width - ((line.width + 63) >> 6);
+  const int32_t start = align == TextAlign::Left ? 0 : align == TextAlign::Center ? room / 2 : room;
   RETURN_IF_BAD(
       Draw(line, {.x = static_cast<double>(start), .y = std::floor(Ascent())}, mask));
   const Backdrop ink{static_cast<uint8_t>(color >> 16), static_cast<uint8_t>(color >> 8),

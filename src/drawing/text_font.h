@@ -47,10 +47,12 @@ class TextFont {
   // Adds a line to a mask, see DrawLine.
   Status Draw(const TextLine& line, const LinePlace& place, PackedImage& mask,
               const Work& work = {}) const;
-  // Draws one line onto a 24-bit image: centered horizontally in `band`, at its top, anti-aliased
-  // and clipped to the band. MemoryAllocationError.
-  Status DrawCentered(PackedImage& image, const Rectangle& band, std::string_view text,
-                      Color color);
+  // Draws one line onto a 24-bit image: at the top of `band`, anti-aliased and clipped to it.
+  // MemoryAllocationError.
+  Status DrawIn(PackedImage& image, const Rectangle& band, TextAlign align, std::string_view text,
+                Color color);
+  // The fonts behind it, for outputs that embed them.
+  FontFaces& Faces() { return *fonts_; }
 
  private:
   std::unique_ptr<FontFaces> fonts_;

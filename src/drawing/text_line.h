@@ -6,12 +6,17 @@
 
 namespace fotomill {
 
+// Alignment of lines of text.
+enum class TextAlign : int32_t { Left, Center, Right };
+
 // A glyph in a line of text, or a box for a character without a glyph.
 struct PlacedGlyph {
   static constexpr int32_t kBox = -1;
   int32_t face = 0;      // index of the font, or kBox
   uint32_t glyph = 0;    // glyph index in that font
   int32_t x = 0, y = 0;  // origin relative to the start of the baseline: 64ths of a pixel, y upward
+  // the first character of the paragraph that it belongs to; glyphs of a cluster share it
+  uint32_t character = 0;
 };
 
 // A line of text, with its glyphs in visual order from left to right.

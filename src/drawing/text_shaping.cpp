@@ -152,15 +152,16 @@ class Shaper {
     const hb_glyph_info_t* const glyphs = shaping_.hb_buffer_get_glyph_infos(buffer, &count);
     const hb_glyph_position_t* const places =
         shaping_.hb_buffer_get_glyph_positions(buffer, &count);
-    for (unsigned i = 0; i < count; ++i) Put(run.face, glyphs[i].codepoint, places[i]);
+    for (unsigned i = 0; i < count; ++i) Put(run.face, glyphs[i], places[i]);
   }
 
-  void Put(size_t face, uint32_t glyph, const hb_glyph_position_t& place) {
+  void Put(size_t face, const hb_glyph_info_t& info, const hb_glyph_position_t& place) {
+    const uint32_t glyph = info.codepoint;
     const bool box = glyph == 0;
     const int32_t advance =
         box ? static_cast<int32_t>(fonts_.Em() * kBoxAdvance * kFraction) : place.x_advance;
     line_.glyphs.push_back({box ? PlacedGlyph::kBox : static_cast<int32_t>(face), glyph,
-                            pen_ + place.x_offset, place.y_offset});
+                            pen_ + place.x_offset, place.y_offset, info.cluster});
     pen_ += advance == 0 ? 0 : advance + spacing_;
   }
 

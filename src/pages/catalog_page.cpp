@@ -11,7 +11,10 @@
 #include "core/text.h"
 #include "core/workers/folder_scope.h"
 #include "core/workers/ordered_run.h"
+#include "drawing/text_font.h"
 #include "metadata/exif/picture_exif.h"
+#include "pages/model/placing.h"
+#include "pages/raster/raster_page.h"
 #include "platform/clock.h"
 #include "platform/existence.h"
 #include "platform/files.h"
@@ -35,13 +38,12 @@ constexpr uint64_t kBytesAhead = uint64_t{64} << 20;
 
 // The path of the next unused page number. ErrorWritingFile if there is no number left,
 // ErrorCreatingFile if existence cannot be determined.
-Status NextPageName(BatchJob& job, std::string& path) {
+Status NextPageName(BatchJob& job, const std::string& prefix, std::string& path) {
   platform::Existence existence;
   do {
     if (++job.catalogPage >= kLastCatalogPage) return Status::ErrorWritingFile;
     path = platform::JoinFolder(job.destinationFolder,
-                                CatalogPageName(job.naming.PrefixOf(FileFunction::Catalog),
-                                                job.catalogPage, ExtensionOfFormat(job)));
+                                CatalogPageName(prefix, job.catalogPage, ExtensionOfFormat(job)));
     existence = platform::ExistenceOf(path);
     if (existence == platform::Existence::Unknown) return Status::ErrorCreatingFile;
   } while (existence == platform::Existence::Yes);
@@ -67,10 +69,14 @@ class ContactSheet {
         options_(options),
         job_(job),
         stop_(job.stop.Token()),
+        layout_(LayoutOf(options.look, options.fontName)),
+        raster_(kCatalogDpi),
         cells_(files.size()) {}
 
-  Status OpenFont() {
-    return options_.look.names ? font_.OpenForLine(options_.fontName, kCaptionHeight) : Status::Ok;
+  // Whether there is a font for the names.
+  Status CheckFont() const {
+    TextFont font;
+    return layout_.names ? font.OpenForLine(layout_.font, kCaptionHeight) : Status::Ok;
   }
 
   void Run() {
@@ -93,7 +99,8 @@ class ContactSheet {
   // A picture scaled for its cell.
   struct Cell {
     FileOutcome outcome;
-    PackedImage image;
+    PagePicture facts;
+    RasterPicture picture;  // in the first cell of a page
   };
 
   Status Work(size_t i) {
@@ -101,11 +108,12 @@ class ContactSheet {
     cells_[i] = std::make_unique<Cell>();
     Cell& cell = *cells_[i];
     cell.outcome = {.source = files_[i].name, .status = files_[i].status, .hint = files_[i].hint};
-    if (cell.outcome.status == Status::Ok) Draw(cell.outcome, cell.image);
+    if (cell.outcome.status == Status::Ok) Draw(cell);
     return Status::Ok;
   }
 
-  void Draw(FileOutcome& outcome, PackedImage& image) const {
+  void Draw(Cell& cell) const {
+    FileOutcome& outcome = cell.outcome;
     const ReadRequest request{
         .fileName = outcome.source,
         .thumbnailSide = std::max({options_.look.cellWidth, options_.look.cellHeight,
@@ -115,16 +123,22 @@ class ContactSheet {
     PicturePointer picture;
     outcome.status = LoadPictureInfo(request, picture);
     if (outcome.status == Status::Ok && !options_.page.dryRun)
-      outcome.status = DrawPicture(request, *picture, image);
+      outcome.status = DrawPicture(request, *picture, cell);
     if (outcome.status != Status::Ok) outcome.hint = OpenHint(outcome.source, outcome.status);
   }
 
-  Status DrawPicture(const ReadRequest& request, PictureRecord& picture, PackedImage& image) const {
+  Status DrawPicture(const ReadRequest& request, PictureRecord& picture, Cell& cell) const {
     RETURN_IF_BAD(ReadPicture(request, picture));
     if (options_.upright) RETURN_IF_BAD(TurnUpright(picture));
     if (options_.onFaces)
       RETURN_IF_BAD(FrameOnFaces(picture, job_.faces, true, [this] { return !stop_.Asked(); }));
-    return MakeCellImage(picture, options_.look, image);
+    cell.facts.width = picture.width;
+    cell.facts.height = picture.height;
+    const PictureItem place =
+        PlacePicture(cell.facts, ContactArea(layout_, 0), PictureFit::Inside, false);
+    const Rectangle page = PageSize(options_.look);
+    return PrepareRasterPicture(place, {page.width, page.height}, kCatalogDpi, picture,
+                                cell.picture);
   }
 
   void Deliver(size_t i, Status status) {
@@ -140,20 +154,38 @@ class ContactSheet {
     Tick();
   }
 
-  Status PutCell(const Cell& cell) {
+  Status PutCell(Cell& cell) {
     if (page_ == nullptr) RETURN_IF_BAD(NewPage());
-    if (!cell.image.Empty()) {
-      RETURN_IF_BAD(DrawCell(options_.look, drawn_, cell.image,
-                             platform::FileNameOf(cell.outcome.source), &font_, page_->image));
-    }
+    if (!cell.picture.image.Empty()) RETURN_IF_BAD(DrawCell(cell));
     ++drawn_;
+    return Status::Ok;
+  }
+
+  Status DrawCell(Cell& cell) {
+    const Rectangle first = CellPlace(options_.look, 0), place = CellPlace(options_.look, drawn_);
+    cell.picture.area.x += place.x - first.x;
+    cell.picture.area.y += place.y - first.y;
+    cell.facts.name = platform::FileNameOf(cell.outcome.source);
+    std::vector<PageItem> items;
+    AddContactCell(layout_, drawn_, cell.facts, items);
+    for (const PageItem& item : items) {
+      if (std::holds_alternative<PictureItem>(item)) {
+        raster_.Draw(cell.picture);
+      } else {
+        RETURN_IF_BAD(raster_.Draw(item));
+      }
+    }
     return Status::Ok;
   }
 
   Status NewPage() {
     PicturePointer page = NewPictureRecord(job_.read.alphaBackground);
     if (page == nullptr) return Status::MemoryAllocationError;
-    if (!options_.page.dryRun) RETURN_IF_BAD(NewCatalogPage(options_.look, page->image));
+    if (!options_.page.dryRun) {
+      RETURN_IF_BAD(raster_.Begin({.width = layout_.pageWidth,
+                                   .height = layout_.pageHeight,
+                                   .background = layout_.background}));
+    }
     const Rectangle size = PageSize(options_.look);
     page->width = size.width;
     page->height = size.height;
@@ -167,7 +199,10 @@ class ContactSheet {
     Status status = Status::Ok;
     std::string path;
     const uint32_t writeAborts = job_.writeAborts;
-    if (page_ != nullptr) status = WriteCatalogPage(*page_, options_.page, job_, path);
+    if (page_ != nullptr) {
+      page_->image = std::move(raster_.Image());
+      status = WriteCatalogPage(*page_, options_.page, job_, path);
+    }
     const bool noName = job_.writeAborts != writeAborts;
     for (FileOutcome& outcome : waiting_) {
       if (outcome.status == Status::Ok) {
@@ -209,11 +244,12 @@ class ContactSheet {
   const ContactSheetOptions& options_;
   BatchJob& job_;
   const StopToken stop_;
+  const ContactLayout layout_;
+  RasterPages raster_;                        // the pixels of the page being filled
   std::vector<std::unique_ptr<Cell>> cells_;  // finished, not yet on a page
-  TextFont font_;
-  PicturePointer page_;               // the page being filled
-  int32_t drawn_ = 0;                 // cells on it
-  std::vector<FileOutcome> waiting_;  // files on a page not yet written
+  PicturePointer page_;                       // its record
+  int32_t drawn_ = 0;                         // cells on it
+  std::vector<FileOutcome> waiting_;          // files on a page not yet written
   uint32_t reported_ = 0;
   std::atomic<bool> ended_{false};
 };
@@ -228,7 +264,11 @@ Status WriteNextPage(PictureRecord& page, const CatalogPageOptions& options, Bat
                                job.stop.Token());
   };
   std::string name;
-  const Status named = NextPageName(job, name);
+  const Status named =
+      NextPageName(job,
+                   options.prefix.empty() ? std::string(job.naming.PrefixOf(FileFunction::Catalog))
+                                          : options.prefix,
+                   name);
   path = name;
   RETURN_IF_BAD(named);
   Destination destination;
@@ -281,7 +321,7 @@ Status RunContactSheet(std::span<const BatchFile> files, const ContactSheetOptio
                        BatchJob& job) {
   job.extension = ExtensionOfFormat(job);
   ContactSheet sheet(files, options, job);
-  RETURN_IF_BAD(sheet.OpenFont());
+  RETURN_IF_BAD(sheet.CheckFont());
   if (!options.page.dryRun && !IsDestinationWanted(job, true)) return Status::FunctionCancelled;
   if (!OpenProgressBox(job)) return Status::FunctionCancelled;
   sheet.Run();

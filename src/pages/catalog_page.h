@@ -6,7 +6,7 @@
 
 #include "batch/job.h"
 #include "batch/run.h"
-#include "pages/catalog_drawing.h"
+#include "pages/catalog_look.h"
 
 namespace fotomill {
 
@@ -21,6 +21,7 @@ std::string CatalogPageName(std::string_view prefix, uint32_t number, std::strin
 struct CatalogPageOptions {
   bool reduce = false;  // reduce the colors of the page if the format supports fewer
   bool dryRun = false;
+  std::string prefix = {};  // of the name; empty: the job's for catalogs
 };
 
 // Writes a page under the first free name in the job's destination folder and stores its path. Ok;

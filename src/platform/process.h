@@ -1,5 +1,6 @@
 #pragma once
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -12,6 +13,10 @@ std::vector<std::string> ProgramFor(const std::string& file);
 // blocks until it exits; otherwise it is detached from this program's
 // terminal input, output and Ctrl-C. False if it cannot be started.
 [[nodiscard]] bool RunProgram(const std::vector<std::string>& arguments, bool wait);
+
+// Starts a program as above, waits for it, and returns its exit status; nullopt if it could not be
+// started or was killed.
+[[nodiscard]] std::optional<int> RunAndWait(const std::vector<std::string>& arguments);
 
 // Opens the null device for closed standard streams;
 // otherwise a file opened later would take the place of one

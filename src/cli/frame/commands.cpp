@@ -14,6 +14,7 @@
 #include "cli/commands/info.h"
 #include "cli/commands/match.h"
 #include "cli/commands/operations.h"
+#include "cli/commands/pages/pages.h"
 #include "cli/commands/plugins.h"
 #include "cli/commands/recipe.h"
 #include "cli/commands/rename.h"
@@ -40,6 +41,10 @@ constexpr Command kCommands[] = {
     {"recipe check", TrLater("check recipes for mistakes"),                             Needs::Settings, SetUpRecipeCheck},
     {"rename",  TrLater("rename files in sequence: a base name and a number"),          Needs::Formats,  SetUpRename},
     {"contact-sheet", TrLater("arrange pictures on pages, with their names"),           Needs::Formats,  SetUpContactSheet},
+    {"pages contact", TrLater("put many pictures on pages of paper, with their names"),  Needs::Formats,  SetUpPagesContact},
+    {"pages photo",   TrLater("put photo prints of exact sizes on as few sheets as possible"), Needs::Formats, SetUpPagesPhoto},
+    {"pages print",   TrLater("put each picture on a page of its own"),                 Needs::Formats,  SetUpPagesPrint},
+    {"pages papers",  TrLater("list papers and print sizes"),                           Needs::Settings, SetUpPagesPapers},
     {"turn",    TrLater("rotate or flip pictures, JPEG losslessly"),                    Needs::Formats,  SetUpTurn},
     {"info",    TrLater("show size, depth and other facts without decoding pictures"),  Needs::Formats,  SetUpInfo},
     {"formats", TrLater("list the formats and what this build can do with them"),       Needs::Formats,  SetUpFormats},

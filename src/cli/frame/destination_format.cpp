@@ -34,6 +34,8 @@ int32_t RowOfExtension(std::string_view extension) {
 }
 
 std::string UnknownFormat(const std::string& extension) {
+  if (EqualIgnoringCase(extension, "pdf"))
+    return Tr("PDF is not a picture format; \"fotomill pages print\" writes PDF files.");
   std::vector<std::string> known;
   for (int32_t i = 0; i < formatCount; ++i) {
     if (CanWrite(FormatRow(i))) known.push_back(LowerCase(FormatRow(i).extension));

@@ -98,20 +98,30 @@ std::vector<std::string> ProgramFor(const std::string& file) {
   return {std::move(opener), AbsolutePath(file)};
 }
 
-bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
-  if (arguments.empty() || FaultDue()) return false;
+namespace {
+
+// The process of a started program; 0 if it cannot be started.
+pid_t Start(const std::vector<std::string>& arguments, bool detached) {
+  if (arguments.empty() || FaultDue()) return 0;
   const std::string program = FindProgram(arguments[0]);
-  if (program.empty()) return false;
+  if (program.empty()) return 0;
   std::vector<char*> vector;
   for (const std::string& argument : arguments)
     vector.push_back(const_cast<char*>(argument.c_str()));
   vector.push_back(nullptr);
   SpawnSettings settings;
-  if (!wait) settings.Detach();
+  if (detached) settings.Detach();
   pid_t child;
-  if (posix_spawn(&child, program.c_str(), &settings.actions, &settings.attributes, vector.data(),
-                  environ) != 0)
-    return false;
+  const int error = posix_spawn(&child, program.c_str(), &settings.actions, &settings.attributes,
+                                vector.data(), environ);
+  return error == 0 ? child : 0;
+}
+
+}  // namespace
+
+bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
+  const pid_t child = Start(arguments, !wait);
+  if (child == 0) return false;
   if (wait) {
     WaitFor(child);
     return true;
@@ -121,6 +131,13 @@ bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
   } catch (const std::system_error&) {
   }
   return true;
+}
+
+std::optional<int> RunAndWait(const std::vector<std::string>& arguments) {
+  const pid_t child = Start(arguments, false);
+  if (child == 0) return std::nullopt;
+  const int status = WaitFor(child);
+  return WIFEXITED(status) ? std::optional(WEXITSTATUS(status)) : std::nullopt;
 }
 
 void FillStandardStreams() {

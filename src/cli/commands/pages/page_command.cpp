@@ -1,0 +1,302 @@
+#include "cli/commands/pages/page_command.h"
+
+#include <algorithm>
+#include <charconv>
+#include <memory>
+
+#include "batch/new_job.h"
+#include "cli/frame/destination_format.h"
+#include "cli/frame/options.h"
+#include "cli/frame/result_output.h"
+#include "cli/frame/terminal_box.h"
+#include "cli/frame/terminal_prompts.h"
+#include "core/text.h"
+#include "pages/catalog_page.h"
+#include "platform/existence.h"
+#include "platform/files.h"
+#include "platform/folders.h"
+#include "platform/paths.h"
+#include "platform/process.h"
+#include "platform/temporary_file.h"
+#include "settings/job_options.h"
+#include "settings/settings.h"
+#include "texts/status_text.h"
+#include "texts/system_reason.h"
+#include "texts/texts.h"
+
+namespace fotomill::cli {
+
+namespace {
+
+constexpr int32_t kMostCells = 100, kMostDpi = 2400;
+constexpr const char* kNoFont = TrLater(
+    "Text needs a font, fontconfig and HarfBuzz: packages fonts-dejavu-core, libfontconfig1 and "
+    "libharfbuzz-subset0.");
+
+bool IsPdf(std::string_view name) { return EqualIgnoringCase(name, "pdf"); }
+
+// What is wrong with the options for the output; empty if nothing is.
+std::string OutputProblem(const PageCommandOptions& options) {
+  const int outputs = !options.out.empty() + !options.to.empty() + !options.printer.empty();
+  if (outputs == 0)
+    return Tr("Name the output: --out FILE.pdf, --to EXT --dest DIR, or --printer NAME.");
+  if (outputs > 1) return Tr("Only one of --out, --to and --printer can be given.");
+  if (options.to.empty() != options.dest.empty()) return Tr("--to and --dest go together.");
+  if (!options.out.empty() && !IsPdf(platform::ExtensionOf(options.out)))
+    return Tr(
+        "--out takes the name of a PDF file. For pictures of the pages, use --to EXT --dest DIR.");
+  if (!options.dest.empty() && platform::ExistenceOf(options.dest) == platform::Existence::Yes &&
+      !platform::IsFolder(options.dest))
+    return Tr("\"%1\" is not a folder.", options.dest);
+  return {};
+}
+
+class PageWriter {
+ public:
+  PageWriter(const PageCommandOptions& options, PageCommand command, BatchJob& job,
+             const CommandContext& context)
+      : options_(options),
+        command_(std::move(command)),
+        job_(job),
+        context_(context),
+        output_(context, options.json) {}
+
+  int Run(const Selection& selection) {
+    files_ = selection.files;
+    output_.CloseWith(selection.leftOut);
+    output_.KeepGoing();
+    PageRun run(
+        files_, command_.run,
+        {.progress = [this](size_t done, size_t total) { output_.ShowProgress(done, total); },
+         .goesOn = [this] { return output_.GoesOn(); },
+         .tick = [this] { output_.Tick(); }});
+    if (!run.Open()) return output_.Finish();
+    destinations_.resize(run.Pages().size());
+    Status status = Status::Ok;
+    if (run.Pages().empty()) {
+      if (std::ranges::all_of(run.Outcomes(),
+                              [](const PageOutcome& o) { return o.status == Status::Ok; }))
+        output_.Message(Tr("There is nothing to put on pages."));
+    } else if (options_.to.empty()) {
+      status = options_.printer.empty() ? WriteDocument(run, options_.out) : Print(run);
+    } else if (IsPdf(options_.to)) {
+      status = WriteNumbered(run);
+    } else {
+      status = WritePages(run);
+    }
+    if (status == Status::FunctionCancelled) return output_.Finish();
+    return Report(run, status);
+  }
+
+ private:
+  Status WriteDocument(PageRun& run, const std::string& path) {
+    std::ranges::fill(destinations_, path);
+    const bool replace = options_.overwrite == "replace";
+    if (!replace && platform::ExistenceOf(path) != platform::Existence::No) {
+      hint_ = Tr("\"%1\" exists; --overwrite replace replaces it.", path);
+      return Status::ErrorCreatingFile;
+    }
+    if (options_.dryRun) return Status::Ok;
+    const std::string folder = platform::FolderOf(path);
+    if (!folder.empty() && !platform::MakeFolders(folder)) {
+      hint_ = WithReason(Tr("\"%1\" cannot be created.", path));
+      return Status::ErrorCreatingFile;
+    }
+    const Status status =
+        run.WritePdf(path, replace ? platform::Existing::Replace : platform::Existing::Refuse);
+    Explain(status, path);
+    return status;
+  }
+
+  void Explain(Status status, const std::string& path) {
+    if (status == Status::ErrorCreatingFile)
+      hint_ = WithReason(Tr("\"%1\" cannot be created.", path));
+    if (status == Status::ErrorWritingFile) hint_ = ReasonSentence();
+    if (status == Status::ResourceError) hint_ = Tr(kNoFont);
+  }
+
+  // A document under the first free number.
+  Status WriteNumbered(PageRun& run) {
+    for (uint32_t number = 1; number < kLastCatalogPage; ++number) {
+      const std::string path = platform::JoinFolder(
+          options_.dest, CatalogPageName(command_.prefix, number, options_.to));
+      if (platform::ExistenceOf(path) == platform::Existence::No) return WriteDocument(run, path);
+    }
+    return Status::ErrorCreatingFile;
+  }
+
+  Status Print(PageRun& run) {
+    std::ranges::fill(destinations_, options_.printer);
+    if (options_.dryRun) return Status::Ok;
+    platform::TemporaryFile file;
+    if (!file.Create(".pdf")) return Status::ErrorCreatingFile;
+    const Status status = run.WritePdf(file.Path(), platform::Existing::Replace);
+    Explain(status, file.Path());
+    if (status != Status::Ok || run.Pages().empty()) return status;
+    output_.MakeWay();
+    const auto result = platform::RunAndWait(
+        {"lp", "-s", "-d", options_.printer, "-t", command_.run.title, "--", file.Path()});
+    if (result == 0) return Status::Ok;
+    hint_ = result ? Tr("Printer \"%1\" did not take the pages.", options_.printer)
+                   : Tr("The print command \"lp\" was not found; it comes with CUPS (package "
+                        "cups-client).");
+    return Status::ResourceError;
+  }
+
+  Status WritePages(PageRun& run) {
+    const double dpi = options_.dpi > 0 ? options_.dpi : command_.usualDpi;
+    for (size_t i = 0; i < run.Pages().size(); ++i) {
+      PicturePointer page = NewPictureRecord();
+      if (page == nullptr) return Status::MemoryAllocationError;
+      if (!options_.dryRun) {
+        const Status drawn = run.DrawPage(i, dpi, page->image);
+        if (drawn == Status::ResourceError) hint_ = Tr(kNoFont);
+        RETURN_IF_BAD(drawn);
+        page->width = page->image.Width();
+        page->height = page->image.Height();
+      }
+      page->bitsPerPixel = 24;
+      page->metadata.dpiX = page->metadata.dpiY = dpi;
+      const CatalogPageOptions write{.dryRun = options_.dryRun, .prefix = command_.prefix};
+      const Status status = WriteCatalogPage(*page, write, job_, destinations_[i]);
+      Explain(status, destinations_[i]);
+      RETURN_IF_BAD(status);
+    }
+    return Status::Ok;
+  }
+
+  int Report(const PageRun& run, Status status) {
+    if (status != Status::Ok) {
+      const std::string name = destinations_.empty() ? options_.out : destinations_.front();
+      output_.Failure(name, status, hint_);
+    }
+    const auto outcomes = run.Outcomes();
+    for (size_t i = 0; i < files_.size(); ++i) {
+      const PageOutcome& outcome = outcomes[i];
+      if (outcome.status != Status::Ok) {
+        output_.FileFailed(files_[i].name, outcome.status, outcome.hint);
+      } else if (status == Status::Ok) {
+        Done(files_[i].name, outcome);
+      }
+    }
+    return output_.Finish();
+  }
+
+  void Done(const std::string& name, const PageOutcome& outcome) {
+    const std::string destination =
+        outcome.page > 0 ? destinations_[static_cast<size_t>(outcome.page) - 1] : std::string();
+    if (!output_.IsJson()) return output_.FileDone(name, destination);
+    output_.CountFile();
+    Json element;
+    PutName(element, "file", name);
+    PutName(element, "destination", destination);
+    element["page"] = outcome.page;
+    PutStatus(element, Status::Ok);
+    output_.Element(element);
+  }
+
+  const PageCommandOptions& options_;
+  const PageCommand command_;
+  BatchJob& job_;
+  const CommandContext& context_;
+  ResultOutput output_;
+  std::vector<SelectedFile> files_;
+  std::vector<std::string> destinations_;  // by page
+  std::string hint_;
+};
+
+}  // namespace
+
+void AddPageOptions(CLI::App& app, PageCommandOptions& options, CommandContext& context) {
+  AddSelection(app, options.selection, context);
+  AddName(app, "-o,--out", options.out, "FILE.pdf", "Write one PDF file");
+  AddName(app, "-t,--to", options.to, "EXT", "Write a picture of each page, by extension");
+  AddName(app, "-d,--dest", options.dest, "DIR", "Folder for --to, created if needed");
+  AddName(app, "--printer", options.printer, "NAME", "Print on a printer of the system (lp)");
+  AddText(app, "--paper", options.paper, "SIZE",
+          "Paper: a name listed by \"pages papers\", or WxH such as 210x297mm (default: A4)");
+  AddFlag(app, "--landscape", options.landscape, "Turn the paper");
+  AddText(app, "--margin", options.margin, "LENGTH", "Margin on all sides, such as 10mm or 0.5in");
+  AddNumber(app, "--dpi", options.dpi, "N", 10, kMostDpi,
+            "Pixels per inch of pages with --to; in PDF, the most that pictures have");
+  AddNumber(app, "--brightness", options.brightness, "N", -100, 100,
+            "Brighten or darken the pictures");
+  AddNumber(app, "--contrast", options.contrast, "N", -100, 100,
+            "Change the contrast of the pictures");
+  AddChoice(app, "--overwrite", options.overwrite, "HOW",
+            "If --out exists: refuse (default) or replace", {"refuse", "replace"});
+  AddNumber(app, "-j,--jobs", options.jobs, "N", 0, INT32_MAX,
+            "Number of parallel jobs (default: 0, one per core)");
+  AddFlag(app, "-n,--dry-run", options.dryRun, "Only show what would be done");
+  AddFlag(app, "--json", options.json,
+          "Print a JSON array of {file, destination, page, status, message}");
+}
+
+std::string ReadPageSetup(const PageCommandOptions& options, double margin, PageSetup& setup) {
+  const auto paper = ParseSize(options.paper, Papers());
+  if (!paper) {
+    return Tr("\"%1\" is not a paper size; \"fotomill pages papers\" lists them.", options.paper);
+  }
+  setup.paper = options.landscape ? paper->Turned() : *paper;
+  setup.margin = margin;
+  if (!options.margin.empty()) {
+    const auto given = ParseLength(options.margin);
+    if (!given) return Tr("\"%1\" is not a length such as 10mm, 1cm or 0.5in.", options.margin);
+    setup.margin = *given;
+  }
+  constexpr double kLeastRoom = 5;
+  if (std::min(setup.paper.width, setup.paper.height) - 2 * setup.margin < kLeastRoom)
+    return Tr("The margins leave no room on the paper.");
+  return {};
+}
+
+bool ReadGrid(const std::string& text, int32_t& columns, int32_t& rows) {
+  const char* const end = text.data() + text.size();
+  const auto first = std::from_chars(text.data(), end, columns);
+  if (first.ec != std::errc() || first.ptr == end || (*first.ptr | 0x20) != 'x') return false;
+  const auto second = std::from_chars(first.ptr + 1, end, rows);
+  const auto fits = [](int32_t count) { return count >= 1 && count <= kMostCells; };
+  return second.ec == std::errc() && second.ptr == end && fits(columns) && fits(rows);
+}
+
+std::optional<Color> ReadColor(std::string_view text) {
+  uint32_t value = 0;
+  if (text.starts_with('#')) text.remove_prefix(1);
+  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), value, 16);
+  if (text.size() != 6 || error != std::errc() || end != text.data() + text.size())
+    return std::nullopt;
+  return (value & 0xFF) << 16 | (value & 0xFF00) | value >> 16;
+}
+
+int RunPages(const PageCommandOptions& options, PageCommand command,
+             const CommandContext& context) {
+  if (const std::string wrong = OutputProblem(options); !wrong.empty())
+    return UsageError(context, wrong);
+  BatchJob job = NewBatchJob();
+  job.remember = nullptr;
+  if (!options.to.empty() && !IsPdf(options.to)) {
+    if (const std::string wrong = ReadDestinationFormat(options.to, job); !wrong.empty())
+      return UsageError(context, wrong);
+  }
+  const auto selection = SelectFiles(options.selection, context);
+  if (!selection) return kExitUsage;
+  job.destinationFolder = options.dest;
+  job.naming.beside = false;
+  PageRunOptions& run = command.run;
+  run.reading.upright = settings.ExifAdjustOrientation != 0;
+  run.reading.read = job.read;
+  run.reading.brightness = options.brightness;
+  run.reading.contrast = options.contrast;
+  if (options.dpi > 0) run.dpi = options.dpi;
+  run.jobs = static_cast<uint32_t>(options.jobs);
+  run.copyrightHolder = settings.ExifCopyrightHolder.view();
+  if (run.title.empty()) {
+    run.title = options.out.empty() ? std::string("Fotomill")
+                                    : std::string(platform::SplitPath(options.out).base);
+  }
+  const int status = PageWriter(options, std::move(command), job, context).Run(*selection);
+  const int kept = FinishBatch(job, context);
+  return status != kExitOk ? status : kept;
+}
+
+}  // namespace fotomill::cli
