@@ -19,6 +19,9 @@ namespace fotomill {
 struct MetadataBlocks {
   std::optional<std::vector<uint8_t>> exif = {};  // starting at the byte order
   std::optional<std::vector<uint8_t>> xmp = {};   // the packet
+  // JPEG: the resources of the first APP13 segment with Photoshop's data; PNG: the data of the zTXt
+  // chunk that replaces the first "Raw profile type" of IPTC. Not added, and ignored elsewhere.
+  std::optional<std::vector<uint8_t>> iptc = {};
 };
 
 // The blocks of a file; empty if missing. Views into the file.

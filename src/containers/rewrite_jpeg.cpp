@@ -5,13 +5,14 @@
 
 #include "containers/jpeg_segments.h"
 #include "containers/metadata_rewrite.h"
+#include "containers/photoshop_resources.h"
 #include "texts/texts.h"
 
 namespace fotomill {
 
 namespace {
 
-constexpr uint8_t kApp0 = 0xE0, kApp1 = 0xE1, kApp2 = 0xE2;
+constexpr uint8_t kApp0 = 0xE0, kApp1 = 0xE1, kApp2 = 0xE2, kApp13 = 0xED;
 constexpr std::string_view kMpf("MPF\0", 4), kExifName("Exif", 4);
 
 // As lenient as readers: the two bytes after the name are ignored.
@@ -22,12 +23,16 @@ bool IsExif(const JpegSegment& segment) {
 bool IsXmp(const JpegSegment& segment) {
   return segment.marker == kApp1 && segment.Starts(kXmpHead);
 }
+bool IsPhotoshop(const JpegSegment& segment) {
+  return segment.marker == kApp13 && segment.Starts(kPhotoshopHead);
+}
 
-std::vector<uint8_t> Segment(std::span<const uint8_t> head, std::span<const uint8_t> block) {
+std::vector<uint8_t> Segment(uint8_t marker, std::span<const uint8_t> head,
+                             std::span<const uint8_t> block) {
   const size_t length = 2 + head.size() + block.size();
   std::vector<uint8_t> bytes(2 + length);
   bytes[0] = 0xFF;
-  bytes[1] = kApp1;
+  bytes[1] = marker;
   bytes[2] = static_cast<uint8_t>(length >> 8);
   bytes[3] = static_cast<uint8_t>(length);
   std::ranges::copy(block, std::ranges::copy(head, bytes.begin() + 4).out);
@@ -55,7 +60,8 @@ class JpegRewrite {
         made_(made),
         reason_(reason),
         wanted_{{blocks.exif, kExifHead, kMostExif, IsExif},
-                {blocks.xmp, kXmpHead, kMostXmp, IsXmp}} {}
+                {blocks.xmp, kXmpHead, kMostXmp, IsXmp},
+                {blocks.iptc, kPhotoshopHead, kMostSegment - kPhotoshopHead.size(), IsPhotoshop}} {}
 
   Status Run() {
     JpegHead head;
@@ -71,7 +77,7 @@ class JpegRewrite {
     made_.Clear();
     made_.Keep(file_.first(2));
     for (const JpegSegment& segment : head.segments) RETURN_IF_BAD(Add(segment));
-    AddNew();
+    AddNew(false);
     made_.Keep(file_.subspan(head.scan));
     return Status::Ok;
   }
@@ -83,9 +89,12 @@ class JpegRewrite {
   }
 
   Status Add(const JpegSegment& segment) {
-    // new ones follow JFIF and precede everything else
-    if (segment.marker != kApp0) AddNew();
     const bool mpf = segment.marker == kApp2 && segment.Starts(kMpf);
+    // New ones follow JFIF, XMP also EXIF, whose place in the file then stays; they precede
+    // everything else.
+    if (segment.marker != kApp0)
+      AddNew(wanted_[0].there && (!exifSeen_ || IsExif(segment)) && !mpf);
+    exifSeen_ = exifSeen_ || IsExif(segment);
     mpfSeen_ = mpfSeen_ || mpf;
     for (Wanted& wanted : wanted_) {
       if (wanted.block && wanted.is(segment)) return Replace(segment, wanted);
@@ -116,15 +125,18 @@ class JpegRewrite {
       made_.Add(*wanted.block);
     } else {
       made_.Keep(segment.whole.first(prefix - 4));
-      made_.Add(Segment(segment.data.first(headSize), *wanted.block));
+      made_.Add(Segment(segment.marker, segment.data.first(headSize), *wanted.block));
     }
     return Status::Ok;
   }
 
-  void AddNew() {
+  // `exifFollows`: not what belongs after it.
+  void AddNew(bool exifFollows) {
     for (Wanted& wanted : wanted_) {
-      if (wanted.done || wanted.there || !wanted.block || wanted.block->empty()) continue;
-      made_.Add(Segment(BytesOf(wanted.head), *wanted.block));
+      if (exifFollows && wanted.is != IsExif) continue;
+      const bool none = !wanted.block || wanted.block->empty() || wanted.is == IsPhotoshop;
+      if (wanted.done || wanted.there || none) continue;
+      made_.Add(Segment(kApp1, BytesOf(wanted.head), *wanted.block));
       wanted.done = true;
     }
   }
@@ -132,8 +144,8 @@ class JpegRewrite {
   const std::span<const uint8_t> file_;
   FilePieces& made_;
   std::string& reason_;
-  Wanted wanted_[2];
-  bool splitExif_ = false;
+  Wanted wanted_[3];
+  bool splitExif_ = false, exifSeen_ = false;
   bool mpfSeen_ = false;  // an index with offsets relative to itself
 };
 

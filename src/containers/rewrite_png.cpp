@@ -1,10 +1,12 @@
 // EXIF is stored in an eXIf chunk, XMP in an iTXt chunk with the keyword "XML:com.adobe.xmp",
-// without compression, language or translated keyword.
+// without compression, language or translated keyword. Older programs store the same in text chunks
+// with the keyword "Raw profile type NAME".
 // Source: W3C, "Portable Network Graphics (PNG) Specification (Third Edition)", 2025, sections
 // 11.3.2.6 and 11.3.3.4; XMP specification part 3, section 1.1.5.
 #include <zlib.h>
 
 #include <algorithm>
+#include <functional>
 
 #include "containers/metadata_rewrite.h"
 #include "containers/png_chunks.h"
@@ -15,6 +17,8 @@ namespace {
 
 constexpr std::string_view kExif = "eXIf", kText = "iTXt";
 constexpr std::string_view kXmpHead("XML:com.adobe.xmp\0\0\0\0\0", 22);
+constexpr std::string_view kXmpKeyword("XML:com.adobe.xmp\0", 18);
+constexpr std::string_view kRawXmp("Raw profile type xmp\0", 21);
 
 bool StartsWith(std::span<const uint8_t> bytes, std::string_view text) {
   return bytes.size() >= text.size() && TextOf(bytes.first(text.size())) == text;
@@ -34,13 +38,25 @@ std::vector<uint8_t> Chunk(std::string_view type, std::string_view head,
   return bytes;
 }
 
+bool IsText(const PngPlace& chunk) {
+  return chunk.type == kText || chunk.type == "tEXt" || chunk.type == "zTXt";
+}
+// In any of its forms, also compressed.
+bool IsXmp(const PngPlace& chunk, std::span<const uint8_t> data) {
+  if (chunk.type == kText && StartsWith(data, kXmpKeyword)) return true;
+  return IsText(chunk) && StartsWith(data, kRawXmp);
+}
+
 // One kind of block to be written.
 struct Wanted {
   const std::optional<std::vector<uint8_t>>& block;
-  std::string_view type, head;
+  // whether an old chunk is of this kind
+  std::function<bool(const PngPlace& chunk, std::span<const uint8_t> data)> is;
+  std::string_view type, head;  // of the new chunk
+  bool adds = true;             // if there is none
   bool there = false, done = false;
   bool Is(const PngPlace& chunk, std::span<const uint8_t> file) const {
-    return chunk.type == type && StartsWith(file.subspan(chunk.data, chunk.size), head);
+    return is(chunk, file.subspan(chunk.data, chunk.size));
   }
 };
 
@@ -61,7 +77,17 @@ Status FindPngMetadata(std::span<const uint8_t> file, MetadataViews& views) {
 
 Status RewritePng(std::span<const uint8_t> file, const MetadataBlocks& blocks, FilePieces& made,
                   std::string&) {
-  Wanted wanted[] = {{blocks.exif, kExif, {}}, {blocks.xmp, kText, kXmpHead}};
+  std::string_view keyword;  // of the text with IPTC
+  if (blocks.iptc) keyword = TextOf(*blocks.iptc).substr(0, TextOf(*blocks.iptc).find('\0') + 1);
+  const auto isExif = [](const PngPlace& chunk, std::span<const uint8_t>) {
+    return chunk.type == kExif;
+  };
+  const auto isIptc = [keyword](const PngPlace& chunk, std::span<const uint8_t> data) {
+    return IsText(chunk) && !keyword.empty() && StartsWith(data, keyword);
+  };
+  Wanted wanted[] = {{blocks.exif, isExif, kExif, {}},
+                     {blocks.xmp, IsXmp, kText, kXmpHead},
+                     {blocks.iptc, isIptc, "zTXt", {}, false}};
   made.Clear();
   uint64_t end = kPngSignature.size();
   {
@@ -84,7 +110,7 @@ Status RewritePng(std::span<const uint8_t> file, const MetadataBlocks& blocks, F
     Wanted* replaced = nullptr;
     for (Wanted& one : wanted) {
       if (!one.block) continue;
-      if (pixels && !one.there) add(one);
+      if (pixels && !one.there && one.adds) add(one);
       if (one.Is(chunk, file)) replaced = &one;
     }
     if (replaced != nullptr) {

@@ -161,7 +161,8 @@ class WebpRewrite {
     const bool last =
         IsPixels(part.name) && (i + 1 == parts_.size() || !IsPixels(parts_[i + 1].name));
     for (Wanted& wanted : wanted_) {
-      if (last && !wanted.there) Put(wanted, {});
+      const bool afterExif = wanted.flag == kXmpFlag && wanted_[0].there;
+      if (last && !wanted.there && !afterExif) Put(wanted, {});
     }
   }
 

@@ -123,14 +123,19 @@ Outcome Restore(const std::string& path) {
 
 // Restores the previous contents and keeps the current ones in their place.
 Outcome Exchange(const FileStep& step) {
-  if (!platform::FileExists(step.from)) return Tr(kGone);
+  const bool there = platform::FileExists(step.from);
   if (step.previous->HasChanged(step.from))
-    return Tr("It was changed since, so it was left alone.");
+    return there ? Tr("It was changed since, so it was left alone.") : Tr(kGone);
   PreviousFile now;
   if (!now.Keep(step.from)) return Tr("There is not enough disk space to keep the current file.");
   DeleteThumbnailFile(step.from);  // it may be newer than the restored file
-  Outcome outcome = CopyFile(step.previous->Path(), step.from, platform::Existing::Replace);
-  if (!outcome.empty()) return outcome;
+  if (step.previous->Path().empty()) {
+    if (!platform::DeleteFile(step.from)) return WithReason(Tr("It could not be deleted."));
+  } else {
+    Outcome outcome = CopyFile(step.previous->Path(), step.from,
+                               there ? platform::Existing::Replace : platform::Existing::Refuse);
+    if (!outcome.empty()) return outcome;
+  }
   step.previous->Swap(now);
   step.previous->Replaced(step.from);
   return {};
@@ -142,7 +147,8 @@ Outcome DoStep(FileOperationKind kind, const FileStep& step) {
     case FileOperationKind::Move: return MoveOne(step.from, step.to);
     case FileOperationKind::Copy: return CopyTree(step.from, step.to, 0);
     case FileOperationKind::Create: return Restore(step.to);
-    case FileOperationKind::Turn: return Exchange(step);
+    case FileOperationKind::Turn:
+    case FileOperationKind::Tag: return Exchange(step);
     case FileOperationKind::Trash: break;
   }
   return TrashOne(step.from);
@@ -166,7 +172,8 @@ Outcome UndoStep(FileOperationKind kind, const FileStep& step) {
     case FileOperationKind::Move: return MoveOne(step.to, step.from);
     case FileOperationKind::Copy: return RemoveCopy(step);
     case FileOperationKind::Create: return TrashOne(step.to);
-    case FileOperationKind::Turn: return Exchange(step);
+    case FileOperationKind::Turn:
+    case FileOperationKind::Tag: return Exchange(step);
     case FileOperationKind::Trash: break;
   }
   return Restore(step.from);
@@ -181,6 +188,7 @@ PictureChange ChangeBy(FileOperationKind kind, const FileStep& step, bool back) 
     case FileOperationKind::Copy:
     case FileOperationKind::Create: return {step.to};
     case FileOperationKind::Turn:
+    case FileOperationKind::Tag:
     case FileOperationKind::Trash: break;
   }
   return {step.from};
@@ -190,7 +198,7 @@ PictureChange ChangeBy(FileOperationKind kind, const FileStep& step, bool back) 
 // thumbnail file of its name; databases at the end.
 void SettleThumbnailFile(FileOperationKind kind, const PictureChange& change) {
   if (!change.to.empty()) return FollowThumbnailFile(change.path, change.to);
-  if (kind == FileOperationKind::Turn) return;  // already deleted
+  if (kind == FileOperationKind::Turn || kind == FileOperationKind::Tag) return;  // already deleted
   if (platform::ExistenceOf(change.path) == platform::Existence::No)
     return DeleteThumbnailFile(change.path);
   DeleteMisleadingThumbnailFile(change.path);
@@ -306,6 +314,7 @@ std::vector<FileUse> UsesOf(const FileOperation& operation, bool back) {
         if (back) gone(step.to);
         break;
       case FileOperationKind::Turn:
+      case FileOperationKind::Tag:
         if (!back) use(step.from, FileFunction::Transform);
         break;
       case FileOperationKind::Trash:
@@ -337,6 +346,8 @@ std::string FileOperationName(const FileOperation& operation) {
     case FileOperationKind::Turn:
       return named(TrLater("rotation of %1"),
                    TrCount("rotation of %1 file", "rotation of %1 files", count));
+    case FileOperationKind::Tag:
+      return named(TrLater("tags of %1"), TrCount("tags of %1 file", "tags of %1 files", count));
     case FileOperationKind::Trash: break;
   }
   return named(TrLater("deletion of %1"),

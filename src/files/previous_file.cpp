@@ -5,6 +5,7 @@
 #include "core/data_folder.h"
 #include "core/whole_number.h"
 #include "platform/clock.h"
+#include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
@@ -26,7 +27,10 @@ std::vector<platform::FolderEntry> EntriesOf(const std::string& folder) {
 
 }  // namespace
 
-bool PreviousFile::Keep(const std::string& path) { return kept_.Keep(path, KeptFolder()); }
+bool PreviousFile::Keep(const std::string& path) {
+  kept_.Delete();
+  return platform::ExistenceOf(path) == platform::Existence::No || kept_.Keep(path, KeptFolder());
+}
 
 bool PreviousFile::HasChanged(const std::string& path) const {
   return !(platform::StampOf(path) == replaced_);
@@ -47,9 +51,9 @@ void PreviousFiles::Replaced(const std::string& path) {
   replaced_.insert(kept_.extract(kept));
 }
 
-FileOperation PreviousFiles::Operation() {
+FileOperation PreviousFiles::Operation(FileOperationKind kind) {
   const std::lock_guard lock(mutex_);
-  FileOperation operation{FileOperationKind::Turn, {}};
+  FileOperation operation{kind, {}};
   for (auto& [path, file] : replaced_) operation.steps.push_back({path, {}, std::move(file)});
   replaced_.clear();
   kept_.clear();

@@ -15,14 +15,15 @@ namespace fotomill {
 // be undone.
 class PreviousFile {
  public:
-  // Saves the current contents. False if there is not enough disk space.
+  // Saves the current contents, or remembers that there is no file. False if there is not enough
+  // disk space.
   [[nodiscard]] bool Keep(const std::string& path);
   // To be called after replacing the file; remembers its new state.
   void Replaced(const std::string& path) { replaced_ = platform::StampOf(path); }
   // Whether the file was modified since it was replaced.
   bool HasChanged(const std::string& path) const;
   void Swap(PreviousFile& other) { kept_.Swap(other.kept_); }
-  const std::string& Path() const { return kept_.Path(); }
+  const std::string& Path() const { return kept_.Path(); }  // empty: there was no file
 
  private:
   platform::TemporaryFile kept_;
@@ -38,7 +39,7 @@ class PreviousFiles {
   // programs.
   void Replaced(const std::string& path);
   // An operation with all replaced files, ordered by path; ownership moves to the caller.
-  FileOperation Operation();
+  FileOperation Operation(FileOperationKind kind = FileOperationKind::Turn);
 
  private:
   std::mutex mutex_;

@@ -2,6 +2,7 @@
 
 #include <utility>
 
+#include "batch/picture_failure.h"
 #include "core/byte_writer.h"
 #include "platform/output_file.h"
 #include "texts/system_reason.h"
@@ -19,6 +20,17 @@ Status FileRewrite::Begin() {
   stamp_ = source_ == destination_ && !request_.dryRun ? held_.Stamp() : platform::StampOf(source_);
   if (request_.keepTime) time_ = platform::ModificationTime(source_);
   return Status::Ok;
+}
+
+Status FileRewrite::Make(const FileMaker& maker, FilePieces& made, platform::FileView& file) {
+  if (!file.Open(source_)) return Fail(Status::FileOpenError, ReasonSentence());
+  bool changed = false;
+  std::string reason;
+  if (const Status status = maker(file.Bytes(), made, changed, reason); status != Status::Ok)
+    return Fail(status, reason.empty() ? OpenHint(source_, status) : std::move(reason));
+  if (!file.Intact()) return Status::FileReadError;
+  const auto whole = file.Bytes();
+  return changed ? Write(made.Parts(), false) : Write({&whole, 1}, true);
 }
 
 Status FileRewrite::Write(std::span<const std::span<const uint8_t>> parts, bool same) {

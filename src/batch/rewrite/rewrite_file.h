@@ -1,12 +1,15 @@
 #pragma once
 
+#include <functional>
 #include <optional>
 #include <span>
 #include <string>
 
+#include "containers/file_pieces.h"
 #include "core/status.h"
 #include "core/workers/stop_token.h"
 #include "picture/write_options.h"
+#include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/held_file.h"
 #include "texts/texts.h"
@@ -26,7 +29,16 @@ struct RewriteRequest {
   bool keepTime = false;  // keep the modification time
   bool dryRun = false;    // write nothing; same result as a run
   StopToken stop = {};    // cancels with FunctionCancelled (4)
+  // Called before and after files other than the destination are written, which may not exist
+  // before; if the first returns false, they are not.
+  std::function<bool(const std::string& path)> keepPrevious = {};
+  std::function<void(const std::string& path)> replaced = {};
 };
+
+// Makes a new file from the bytes of an old one; `changed` is false if they are identical. `reason`
+// has details of a failure, as a sentence.
+using FileMaker = std::function<Status(std::span<const uint8_t> file, FilePieces& made,
+                                       bool& changed, std::string& reason)>;
 
 // Writes a file made from another one, or replaces that. The old file is kept until the new one is
 // complete, or if another program modifies it meanwhile.
@@ -40,6 +52,9 @@ class FileRewrite {
   // Call before reading the source; records its current state. ErrorCreatingFile (10) if it cannot
   // be held.
   Status Begin();
+  // Opens the source, makes the new file and writes it; call Begin first. Both stay open as long as
+  // the caller's arguments.
+  Status Make(const FileMaker& maker, FilePieces& made, platform::FileView& file);
   // Writes the new file from its parts; `same` says that they are the old file. An unchanged file
   // is copied, unless source and destination are the same. Sets `changed` and the hint of the
   // result.

@@ -121,6 +121,18 @@ class RewriteBatch {
     }
   }
 
+  // `kept` becomes false if a file could not be kept for undo.
+  RewriteRequest RequestFor(bool& kept) const {
+    RewriteRequest request{function_.keepTimes, function_.dryRun, job_.stop.Token()};
+    if (!function_.inPlace) return request;
+    request.replaced = function_.replaced;
+    if (function_.keepPrevious)
+      request.keepPrevious = [&](const std::string& path) {
+        return kept = function_.keepPrevious(path);
+      };
+    return request;
+  }
+
   void Rewrite(FileOutcome& outcome) const {
     const std::string folder(platform::SplitPath(outcome.destination).folder);
     WriteOptions options{.encode = job_.encode};
@@ -139,7 +151,7 @@ class RewriteBatch {
               .hint = WithReason(Tr("The folder \"%1\" does not exist.", folder))};
     } else {
       made = function_.rewrite(outcome.source, outcome.destination,
-                               {function_.keepTimes, function_.dryRun, job_.stop.Token()}, options);
+                               RequestFor(kept), options);
     }
     if (made.changed && function_.inPlace && function_.replaced) function_.replaced(outcome.source);
     outcome.status = made.status;

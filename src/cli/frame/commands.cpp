@@ -19,6 +19,7 @@
 #include "cli/commands/recipe.h"
 #include "cli/commands/rename.h"
 #include "cli/commands/similar.h"
+#include "cli/commands/tag.h"
 #include "cli/commands/tdb.h"
 #include "cli/commands/thumbs.h"
 #include "cli/commands/turn.h"
@@ -46,6 +47,7 @@ constexpr Command kCommands[] = {
     {"pages print",   TrLater("put each picture on a page of its own"),                 Needs::Formats,  SetUpPagesPrint},
     {"pages papers",  TrLater("list papers and print sizes"),                           Needs::Settings, SetUpPagesPapers},
     {"turn",    TrLater("rotate or flip pictures, JPEG losslessly"),                    Needs::Formats,  SetUpTurn},
+    {"tag",     TrLater("set keywords, ratings, labels and comments"),                   Needs::Formats,  SetUpTag},
     {"info",    TrLater("show size, depth and other facts without decoding pictures"),  Needs::Formats,  SetUpInfo},
     {"formats", TrLater("list the formats and what this build can do with them"),       Needs::Formats,  SetUpFormats},
     {"match",   TrLater("show which format a file name selects, without opening it"),   Needs::Formats,  SetUpMatch},

@@ -31,30 +31,38 @@ class Finder {
     JpegHead head;
     (void)ParseJpegHead(file_, head);  // segments before damage count
     blocks_.xmp = head.Xmp();
-    blocks_.exif = ParseExifBlock(head.Exif());
+    blocks_.exifBlock = head.Exif();
+    blocks_.exif = ParseExifBlock(blocks_.exifBlock);
     std::vector<std::span<const uint8_t>> resources;
     for (const JpegSegment& segment : head.segments) {
       if (segment.marker == kApp13 && segment.Starts(kPhotoshopHead))
         resources.push_back(segment.data.subspan(kPhotoshopHead.size()));
       if (segment.marker == kComment && blocks_.comment.empty()) TakeComment(segment.data);
     }
-    if (!resources.empty()) Photoshop(Joined(resources));
+    if (!resources.empty()) {
+      Photoshop(Joined(resources));
+      blocks_.resources = resources.front();
+    }
     ReadXmp();
     if (blocks_.xmpTags.extended.empty()) return;
-    blocks_.hasExtension = true;
-    (void)ReadXmpTags(JoinExtendedXmp(head, blocks_.xmpTags.extended), blocks_.xmpTags);
+    blocks_.extension = Own(JoinExtendedXmp(head, blocks_.xmpTags.extended));
+    (void)ReadXmpTags(blocks_.extension, blocks_.xmpTags);
   }
 
   void Png() {
     constexpr int kMostTexts = 64;  // that are read, and maybe inflated
     int texts = 0;
+    bool standardXmp = false;  // which wins over a profile
     PngChunks chunks(file_);
     for (PngChunk chunk; chunks.Next(chunk);) {
-      if (chunk.type == "eXIf" && blocks_.exif.Empty()) blocks_.exif = ParseExifBlock(chunk.data);
+      if (chunk.type == "eXIf" && blocks_.exifBlock.empty()) {
+        blocks_.exifBlock = chunk.data;
+        blocks_.exif = ParseExifBlock(chunk.data);
+      }
       if (chunk.type != "tEXt" && chunk.type != "zTXt" && chunk.type != "iTXt") continue;
       const std::string_view keyword = PngTextKeyword(chunk);
       const bool comment = keyword == "Comment" && blocks_.comment.empty();
-      const bool xmp = keyword == "XML:com.adobe.xmp" && blocks_.xmp.empty();
+      const bool xmp = keyword == "XML:com.adobe.xmp" && !standardXmp;
       const PngRawProfile profile = PngRawProfileOf(keyword);
       const bool wanted = (profile == PngRawProfile::Xmp && blocks_.xmp.empty()) ||
                           (profile == PngRawProfile::Iptc && blocks_.iptc.empty()) ||
@@ -62,7 +70,8 @@ class Finder {
       if ((!comment && !xmp && !wanted) || texts++ >= kMostTexts) continue;
       if (comment) TakeComment(PngTextOf(chunk, limits.pngTextBytes));
       if (xmp) blocks_.xmp = Own(PngTextOf(chunk, limits.pngTextBytes));
-      if (wanted) PngProfile(profile, Own(ReadPngRawProfile(chunk)));
+      standardXmp = standardXmp || xmp;
+      if (wanted) PngProfile(profile, keyword, Own(ReadPngRawProfile(chunk)));
     }
     ReadXmp();
   }
@@ -71,6 +80,7 @@ class Finder {
     MetadataViews views;
     if (FindWebpMetadata(file_, views) != Status::Ok) return;
     blocks_.xmp = views.xmp;
+    blocks_.exifBlock = views.exif;
     blocks_.exif = ParseExifBlock(views.exif);
     ReadXmp();
   }
@@ -104,7 +114,7 @@ class Finder {
     blocks_.iptc = FindPhotoshopResource(resources, kIptcResource);
     blocks_.iptcDigest = FindPhotoshopResource(resources, kIptcDigestResource);
   }
-  void PngProfile(PngRawProfile kind, std::span<const uint8_t> data) {
+  void PngProfile(PngRawProfile kind, std::string_view keyword, std::span<const uint8_t> data) {
     if (kind == PngRawProfile::Xmp) blocks_.xmp = data;
     if (kind == PngRawProfile::Exif) {
       const bool headed = ByteReader(data).Match(kExifHead);
@@ -112,7 +122,9 @@ class Finder {
     }
     if (kind != PngRawProfile::Iptc) return;
     Photoshop(data);  // usually with the resources around it
+    if (!blocks_.iptc.empty()) blocks_.resources = data;
     if (blocks_.iptc.empty()) blocks_.iptc = data;
+    blocks_.iptcKeyword = keyword;
   }
   void ReadXmp() {
     if (!blocks_.xmp.empty())

@@ -114,6 +114,11 @@ class Editor {
     rdf_ = PrefixOf(elements_[graph_].name);
     for (size_t i = 0; i < elements_.size(); ++i) {
       if (std::ranges::binary_search(descriptions_, elements_[i].parent)) properties_.push_back(i);
+      // values that are elsewhere; XMP does not allow it, and readers differ
+      const auto refers = [](const XmlAttribute& attribute) {
+        return LocalOf(attribute.name) == "nodeID";
+      };
+      if (std::ranges::any_of(elements_[i].attributes, refers)) return false;
     }
     return !rdf_.empty();
   }
@@ -139,14 +144,16 @@ class Editor {
     if (std::ranges::any_of(change.values, [](const std::string& v) { return !IsUtf8(v); }))
       return false;
     bool written = change.values.empty();
+    bool adds = change.adds;
     for (const Place& place : Find(change)) {
+      adds = true;  // at the latest where it was
       if (written || !Replace(place, change)) {
         Remove(place);
       } else {
         written = true;
       }
     }
-    if (!written) added_.push_back(&change);
+    if (!written && adds) added_.push_back(&change);
     return true;
   }
 

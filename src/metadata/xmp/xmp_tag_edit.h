@@ -23,6 +23,7 @@ struct XmpChange {
   std::string_view uri, prefix, name;  // the prefix for a packet that has none for the namespace
   XmpForm form = XmpForm::Text;
   std::vector<std::string> values = {};  // UTF-8; none: the property is removed
+  bool adds = true;                      // if the packet does not have the property
 };
 
 // Makes a new packet with these properties set; an empty packet is started anew. All other bytes
