@@ -281,6 +281,54 @@ def side_pane(folder):
     assert "SidePaneEnable=0\n" in text, text
 
 
+def view_window(folder):
+    """One window is reused; its bar; full screen; notes about files."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, NAMES)
+    whole = (pictures / "a10.jpg").read_bytes()
+    (pictures / "c-cut.jpg").write_bytes(whole[:len(whole) * 2 // 3])
+    (pictures / "d-wrong.gif").write_bytes((pictures / "a2.png").read_bytes())
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"browser tabs=1 lines=6 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "Return")
+        desktop.wait(r"view place=1/6 .*a1.bmp")
+        window = desktop.focus("View$")
+        desktop.wait(r"view-painted .*a1.bmp", again=True)
+        desktop.xdotool("mousemove", "--window", window, 400, 300)
+        desktop.xdotool("mousemove", "--window", window, 405, 305)
+        desktop.wait(r"view-bar shown")
+        desktop.screenshot("view-bar")
+        desktop.wait(r"view-bar hidden")
+        desktop.focus("Fotomill Professional")
+        desktop.key("End", "Return")
+        desktop.wait(r"view place=6/6 .*d-wrong.gif")
+        desktop.wait(r"view-note .*")
+        assert desktop.log_text().count("view-window") == 1, desktop.log_text()
+        desktop.focus("View$")
+        desktop.screenshot("view-note")
+        desktop.key("p")
+        desktop.wait(r"view place=5/6 .*status=0 .*c-cut.jpg")
+        desktop.wait(r"view-note The file is damaged or incomplete")
+        desktop.screenshot("view-damaged")
+        desktop.key("F11")
+        desktop.settle()
+        desktop.xdotool("mousemove", 640, 400)
+        desktop.xdotool("mousemove", 645, 405)
+        desktop.wait(r"view-bar shown")
+        desktop.screenshot("view-full-screen")
+        desktop.key("Escape")
+        desktop.settle()
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "ctrl+Return")
+        desktop.wait(r"view place=1/6 .*a1.bmp")
+        desktop.focus("a1.bmp - View$")
+        # The menus run the same commands: the last picture.
+        desktop.key("alt+g", "l")
+        desktop.wait(r"view place=6/6 .*d-wrong.gif")
+        assert desktop.log_text().count("view-window another") == 1, desktop.log_text()
+
+
 def later_starts(folder):
     pictures, other = folder / "pictures", folder / "other"
     make_pictures(pictures, NAMES)
@@ -333,4 +381,4 @@ def later_starts(folder):
         assert later.wait(30) == 0
 
 
-run(open_select_view, side_pane, compare, play_animation, later_starts)
+run(open_select_view, side_pane, view_window, compare, play_animation, later_starts)

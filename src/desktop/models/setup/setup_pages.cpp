@@ -76,6 +76,8 @@ constexpr SetupItem kItems[] = {
     Item(Viewing,    TrLater("Animations"),         AnimationViewModeToolbar,       "Show buttons below animations"),
     Item(Viewing,    TrLater("Window"),             ShowProgressWhenViewing,        "Show how far a picture is loaded"),
     Item(Viewing,    TrLater("Window"),             ViewModeBackground,             "Background color"),
+    Item(Viewing,    TrLater("Window"),             ViewModeFullScreenBackground,   "Background color in full screen"),
+    Item(Viewing,    TrLater("Window"),             ViewModeFilmStrip,              "Show a film strip in the bar over the picture"),
     Item(Viewing,    TrLater("Window"),             MaximizeViewWindow,             "Open view windows maximized"),
     Item(Viewing,    TrLater("Window"),             RightClickMenuInView,           "Right click opens a menu"),
     Item(Viewing,    TrLater("Window"),             PromptDeleteFromView,           "Ask before a picture is moved to the trash"),

@@ -12,6 +12,7 @@
 #include "core/choice_lists.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_walk.h"
+#include "platform/files.h"
 #include "processing/faces/face_finder.h"
 #include "processing/geometry/scale.h"
 #include "registry/registry.h"
@@ -151,7 +152,13 @@ Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
 
 }  // namespace
 
-ThumbnailPointer LoadThumbnail(const ThumbnailRequest& request) {
+ThumbnailPointer LoadThumbnail(const ThumbnailRequest& asked) {
+  ThumbnailRequest request = asked;
+  if (request.modified == 0 && request.size == 0) {
+    const platform::FileFacts facts = platform::FactsOf(request.path);
+    request.modified = facts.modified;
+    request.size = facts.size;
+  }
   auto thumbnail = std::make_shared<Thumbnail>();
   if (ReadReady(request, *thumbnail)) {
     ReadFacts(request, *thumbnail);

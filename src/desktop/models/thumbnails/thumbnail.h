@@ -14,7 +14,7 @@ namespace fotomill::desktop {
 // one.
 struct ThumbnailRequest {
   std::string path;
-  int64_t modified = 0;
+  int64_t modified = 0;  // both 0: not known yet, LoadThumbnail finds out
   uint64_t size = 0;
   int32_t side = 96;     // of the square in which it must fit, in pixels
   int32_t mode = 0;      // choice::ThumbnailMode: where records are stored

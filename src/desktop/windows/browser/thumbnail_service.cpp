@@ -17,6 +17,29 @@ ThumbnailService::~ThumbnailService() {
   loader_.reset();  // before the handler of its events is destroyed
 }
 
+void ThumbnailService::Want(std::vector<ThumbnailRequest> requests) {
+  ofBrowser_ = std::move(requests);
+  WantBoth();
+}
+
+void ThumbnailService::WantForStrip(const void* owner, std::vector<ThumbnailRequest> requests,
+                                    std::function<void()> came) {
+  stripOwner_ = owner;
+  stripCame_ = std::move(came);
+  ofStrip_ = std::move(requests);
+  WantBoth();
+}
+
+void ThumbnailService::EndStrip(const void* owner) {
+  if (owner == stripOwner_) WantForStrip(nullptr, {}, nullptr);
+}
+
+void ThumbnailService::WantBoth() {
+  std::vector<ThumbnailRequest> requests = ofStrip_;
+  requests.insert(requests.end(), ofBrowser_.begin(), ofBrowser_.end());
+  loader_->Want(std::move(requests));
+}
+
 void ThumbnailService::FetchResults() {
   const std::vector<ThumbnailLoader::Result> results = loader_->FetchResults();
   for (const ThumbnailLoader::Result& result : results) {
@@ -24,7 +47,12 @@ void ThumbnailService::FetchResults() {
     const bool late = result.request.standIn && cache_.FindAny(result.request.path) != nullptr;
     if (result.thumbnail != nullptr && !late) cache_.Put(result.request, result.thumbnail);
   }
-  if (listener_ && !results.empty()) listener_(results);
+  if (results.empty()) return;
+  const auto isDone = [&](const ThumbnailRequest& request) {
+    return cache_.FindAny(request.path) != nullptr;
+  };
+  if (std::erase_if(ofStrip_, isDone) > 0 && stripCame_) stripCame_();
+  if (listener_) listener_(results);
 }
 
 }  // namespace fotomill::desktop

@@ -24,7 +24,12 @@ class ThumbnailService : public wxEvtHandler {
   ThumbnailPointer Find(const ThumbnailRequest& request) { return cache_.Find(request); }
   ThumbnailPointer FindAny(const std::string& path) const { return cache_.FindAny(path); }
   // Replaces all requests, as only one browser is active.
-  void Want(std::vector<ThumbnailRequest> requests) { loader_->Want(std::move(requests)); }
+  void Want(std::vector<ThumbnailRequest> requests);
+  // The same for the film strip of a view window, before those of the browser; `came` is called
+  // when some are loaded. Another owner replaces them; an owner that is destroyed must end them.
+  void WantForStrip(const void* owner, std::vector<ThumbnailRequest> requests,
+                    std::function<void()> came);
+  void EndStrip(const void* owner);
   void SetListener(Listener listener) { listener_ = std::move(listener); }
   void Clear() { cache_.Clear(); }
   size_t Pending() const { return loader_->Pending(); }
@@ -32,8 +37,12 @@ class ThumbnailService : public wxEvtHandler {
 
  private:
   void FetchResults();
+  void WantBoth();
 
   ThumbnailCache cache_;
+  std::vector<ThumbnailRequest> ofBrowser_, ofStrip_;
+  const void* stripOwner_ = nullptr;
+  std::function<void()> stripCame_;
   Listener listener_;
   std::unique_ptr<ThumbnailLoader> loader_;
 };

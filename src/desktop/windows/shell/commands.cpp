@@ -113,9 +113,10 @@ void Larger(Shell& shell) {
 void Smaller(Shell& shell) {
   if (BrowserPage* browser = shell.Tabs().Front()) browser->ChangeSize(-1);
 }
+template <bool another>
 void View(Shell& shell) {
   const std::vector<std::string> files = shell.Tabs().SelectedFiles();
-  if (!files.empty()) shell.Pictures().ViewFromBrowser(files.front());
+  if (!files.empty()) shell.Pictures().ViewFromBrowser(files.front(), another);
 }
 
 constexpr const char* kFile = TrLater("&File");
@@ -193,7 +194,8 @@ constexpr Command kCommands[] = {
     {kGo, TrLater("&Next tab"),             "Ctrl+PageDown", TrLater("Switches to the next tab."), Needs::Nothing, NextTab, nullptr, false, nullptr, "Ctrl+Tab"},
     {kGo, TrLater("Pre&vious tab"),         "Ctrl+PageUp",  TrLater("Switches to the previous tab."), Needs::Nothing, PreviousTab, nullptr, false, nullptr, "Ctrl+Shift+Tab"},
 
-    {kFunctions, TrLater("&View"),          "Ctrl+Return",  TrLater("Shows the focused picture in a view window."), Needs::Files, View, "view", true},
+    {kFunctions, TrLater("&View"),          "",             TrLater("Shows the focused picture in the view window."), Needs::Files, View<false>, "view", true},
+    {kFunctions, TrLater("View in another &window"), "Ctrl+Return", TrLater("Shows the focused picture in a view window of its own."), Needs::Files, View<true>},
     {kFunctions, TrLater("Com&pare"),       "Ctrl+Shift+Return", TrLater("Shows two to four selected pictures side by side."), Needs::Few, CompareSelection, nullptr, true},
     {kFunctions, TrLater("&Convert..."),    "Ctrl+E",       TrLater("Converts the selected pictures to another format."), Needs::Files, ConvertSelection, "convert", true},
     {kFunctions, TrLater("Re&size..."),     "Ctrl+Shift+E", TrLater("Resizes the selected pictures to one of the sizes in Setup."), Needs::Files, ResizeSelection, nullptr, true},

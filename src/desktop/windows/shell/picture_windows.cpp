@@ -1,6 +1,7 @@
 #include "desktop/windows/shell/picture_windows.h"
 
 #include "batch/external_program.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/compare/compare_frame.h"
 #include "desktop/windows/files/open_with.h"
 #include "desktop/windows/shell/browser_tabs.h"
@@ -8,18 +9,31 @@
 
 namespace fotomill::desktop {
 
-ViewFrame& PictureWindows::View(const std::vector<std::string>& list, const std::string& file) {
+ViewFrame& PictureWindows::View(const std::vector<std::string>& list, const std::string& file,
+                                bool another) {
+  if (!another && lastUsed_ != nullptr && !lastUsed_->IsBeingDeleted()) {
+    lastUsed_->ShowList(list, file);
+    if (lastUsed_->IsIconized()) lastUsed_->Iconize(false);
+    lastUsed_->Raise();
+    return *lastUsed_;
+  }
   auto* view = new ViewFrame(shell_, list, file);
+  view->Bind(wxEVT_ACTIVATE, [this, view](wxActivateEvent& event) {
+    if (event.GetActive()) lastUsed_ = view;
+    event.Skip();
+  });
+  lastUsed_ = view;
   view->Show();
+  LogEvent("view-window", another ? "another" : "new");
   return *view;
 }
 
-void PictureWindows::ViewFromBrowser(const std::string& path) {
+void PictureWindows::ViewFromBrowser(const std::string& path, bool another) {
   const BrowserPage* browser = shell_.Tabs().Front();
   if (browser == nullptr) return;
   if (NeedsExternalProgram(path)) return shell_.Programs().Open(path);
   const std::vector<std::string> selected = browser->Model().FilesForFunction();
-  View(selected.size() > 1 ? selected : browser->Model().ShownFiles(), path);
+  View(selected.size() > 1 ? selected : browser->Model().ShownFiles(), path, another);
 }
 
 void PictureWindows::ViewBeforeFolder(const std::string& path, std::function<void()> showFolder) {

@@ -18,12 +18,13 @@ class PictureWindows {
  public:
   explicit PictureWindows(Shell& shell) : shell_(shell) {}
 
-  // Opens a view window for a file, with `list`
-  // as its neighbors. Deletes itself when closed.
-  ViewFrame& View(const std::vector<std::string>& list, const std::string& file);
-  // Opens a view window for a file of the current browser: among the selected files if there are
-  // several, else all shown ones. Sounds and videos are opened with their own program.
-  void ViewFromBrowser(const std::string& path);
+  // Shows a file with `list` as its neighbors in the view window used last, or in a new one if
+  // there is none or `another` is set. It deletes itself when closed.
+  ViewFrame& View(const std::vector<std::string>& list, const std::string& file,
+                  bool another = false);
+  // Shows a file of the current browser: among the selected files if there are several, else all
+  // shown ones. Sounds and videos are opened with their own program.
+  void ViewFromBrowser(const std::string& path, bool another = false);
   // Opens a view window for a file whose folder is not listed yet. `showFolder` is called when the
   // picture is on the screen; the picture keeps the focus, and gets its neighbors after that folder
   // is listed.
@@ -35,6 +36,7 @@ class PictureWindows {
 
  private:
   Shell& shell_;
+  wxWeakRef<ViewFrame> lastUsed_;
   wxWeakRef<ViewFrame> wantsList_;  // waiting for the listing of its folder
 };
 

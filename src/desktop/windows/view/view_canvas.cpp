@@ -1,5 +1,6 @@
 #include "desktop/windows/view/view_canvas.h"
 
+#include <wx/control.h>
 #include <wx/dcclient.h>
 #include <wx/settings.h>
 
@@ -27,14 +28,15 @@ constexpr int kSquareSide = 8;        // of the checkerboard
 constexpr Color kLightSquares[] = {0xffffff, 0xcccccc};
 constexpr Color kDarkSquares[] = {0x666666, 0x444444};
 
-wxColour ColorOf(int32_t color) {
+wxColour ColorOf(Color color) {
   return {static_cast<unsigned char>(color), static_cast<unsigned char>(color >> 8),
           static_cast<unsigned char>(color >> 16)};
 }
 
 }  // namespace
 
-ViewCanvas::ViewCanvas(wxWindow* parent, Events events) : events_(std::move(events)) {
+ViewCanvas::ViewCanvas(wxWindow* parent, Events events)
+    : events_(std::move(events)), around_(static_cast<Color>(settings.ViewModeBackground)) {
   SetBackgroundStyle(wxBG_STYLE_PAINT);
   Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxWANTS_CHARS | wxBORDER_NONE,
          Label("Picture"));
@@ -66,13 +68,13 @@ void ViewCanvas::ShowFrame(ViewPicturePointer frame, bool plays) {
   picture_ = std::move(frame);
   scaled_.reset();
   transform_.SetPicture(picture_->picture->image.Width(), picture_->picture->image.Height());
-  Refresh();
+  Redraw();
 }
 
 void ViewCanvas::ShowStandIn(PackedImage image, int32_t width, int32_t height) {
   standIn_ = std::move(image);
   transform_.SetPicture(width, height);
-  Refresh();
+  Redraw();
 }
 
 void ViewCanvas::StartAfresh() {
@@ -84,7 +86,19 @@ void ViewCanvas::SetOverlay(const std::vector<std::string>& lines) {
   for (const std::string& line : lines) text += (text.empty() ? "" : "\n") + Shown(line);
   if (text == overlay_) return;
   overlay_ = text;
+  Redraw();
+}
+
+void ViewCanvas::SetNote(const wxString& note) {
+  if (note == note_) return;
+  note_ = note;
   Refresh();
+}
+
+void ViewCanvas::SetAround(Color color) {
+  if (color == around_) return;
+  around_ = color;
+  Redraw();
 }
 
 // --- zoom ---
@@ -134,7 +148,7 @@ void ViewCanvas::UserZoomed() {
 }
 
 void ViewCanvas::UserPanned() {
-  Refresh();
+  Redraw();
   if (events_.placed) events_.placed();
 }
 
@@ -147,14 +161,14 @@ void ViewCanvas::TransformChanged() {
     if (!exact) scaler_->Request(picture_, transform_.ShownWidth(), transform_.ShownHeight());
   }
   events_.changed();
-  Refresh();
+  Redraw();
 }
 
 void ViewCanvas::ScaledCame() {
   std::unique_ptr<ViewScaler::Scaled> scaled = scaler_->Fetch();
   if (scaled == nullptr || scaled->picture != picture_) return;
   scaled_ = std::move(scaled);
-  Refresh();
+  Redraw();
 }
 
 ViewSource ViewCanvas::BestSource() const {
@@ -188,10 +202,22 @@ void ViewCanvas::Paint() {
     PaintPicture(dc);
   }
   if (!overlay_.empty()) PaintOverlay(dc);
+  if (!note_.empty()) PaintNote(dc);
+  if (events_.decorate) events_.decorate(dc);
   if (standIn_.Empty() && Showable()) events_.painted();
 }
 
+void ViewCanvas::Redraw() {
+  drawn_ = wxNullBitmap;
+  Refresh();
+}
+
 void ViewCanvas::PaintPicture(wxDC& dc) {
+  if (!drawn_.IsOk()) drawn_ = DrawnPicture();
+  dc.DrawBitmap(drawn_, 0, 0);
+}
+
+wxBitmap ViewCanvas::DrawnPicture() const {
   const wxSize size = DeviceSize();
   RgbImage pixels;
   pixels.width = size.x;
@@ -202,11 +228,11 @@ void ViewCanvas::PaintPicture(wxDC& dc) {
   const PackedImage opaque;
   const ViewSource source = standIn_.Empty() ? BestSource() : ViewSource{standIn_, opaque};
   DrawView(source, transform_, BackdropHere(), smooth, pixels);
-  dc.DrawBitmap(BitmapOf(pixels, GetContentScaleFactor()), 0, 0);
+  return BitmapOf(pixels, GetContentScaleFactor());
 }
 
 Backdrop ViewCanvas::BackdropHere() const {
-  Backdrop backdrop{.around = static_cast<Color>(settings.ViewModeBackground)};
+  Backdrop backdrop{.around = around_};
   const bool dark = wxSystemSettings::GetAppearance().IsDark();
   backdrop.squares = settings.ViewModeCheckerboard != 0;
   std::ranges::copy(dark ? kDarkSquares : kLightSquares, backdrop.square);
@@ -216,7 +242,7 @@ Backdrop ViewCanvas::BackdropHere() const {
 }
 
 void ViewCanvas::PaintMessage(wxDC& dc) const {
-  const wxColour around = ColorOf(settings.ViewModeBackground);
+  const wxColour around = ColorOf(around_);
   dc.SetBackground(wxBrush(around));
   dc.Clear();
   if (picture_ == nullptr) return;
@@ -234,6 +260,20 @@ void ViewCanvas::PaintOverlay(wxDC& dc) const {
   dc.DrawRoundedRectangle(wxPoint(FromDIP(12), FromDIP(12)), extent, FromDIP(6));
   dc.SetTextForeground(*wxWHITE);
   dc.DrawText(overlay_, FromDIP(22), FromDIP(17));
+}
+
+// Dark on yellow, in the middle of the upper edge.
+void ViewCanvas::PaintNote(wxDC& dc) const {
+  const int gap = FromDIP(10);
+  const wxString text =
+      wxControl::Ellipsize(note_, dc, wxELLIPSIZE_END, GetClientSize().x - 6 * gap);
+  const wxSize extent = dc.GetTextExtent(text) + wxSize(2 * gap, gap);
+  const wxPoint corner((GetClientSize().x - extent.x) / 2, gap);
+  dc.SetPen(*wxTRANSPARENT_PEN);
+  dc.SetBrush(wxBrush(wxColour(0xff, 0xe0, 0x82)));
+  dc.DrawRoundedRectangle(corner, extent, FromDIP(6));
+  dc.SetTextForeground(*wxBLACK);
+  dc.DrawText(text, corner.x + gap, corner.y + gap / 2);
 }
 
 // --- mouse ---

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <wx/bitmap.h>
 #include <wx/window.h>
 
 #include <functional>
@@ -24,6 +25,8 @@ class ViewCanvas : public wxWindow {
     std::function<void()> changed;           // another picture or zoom
     std::function<void()> painted;           // a picture, not its stand-in
     std::function<void()> placed = nullptr;  // zoomed or moved by the user
+    // draws on top of the picture
+    std::function<void(wxDC& dc)> decorate = nullptr;
   };
 
   // The callbacks are called on the window's thread while the canvas exists.
@@ -45,6 +48,10 @@ class ViewCanvas : public wxWindow {
   void StartAfresh();
   // Text lines on top of the picture; may be empty.
   void SetOverlay(const std::vector<std::string>& lines);
+  // A remark about the picture at the top of the window; may be empty.
+  void SetNote(const wxString& note);
+  // The color around the picture; ViewModeBackground at first.
+  void SetAround(Color color);
 
   // Zooms around the center of the window by a step, to actual size, or to a mode.
   void ZoomIn() { ZoomBy(ViewTransform::kStep); }
@@ -76,8 +83,11 @@ class ViewCanvas : public wxWindow {
   void OnPaint(wxPaintEvent&);
   void Paint();
   void PaintPicture(wxDC& dc);
+  wxBitmap DrawnPicture() const;
+  void Redraw();
   void PaintMessage(wxDC& dc) const;
   void PaintOverlay(wxDC& dc) const;
+  void PaintNote(wxDC& dc) const;
   void ZoomBy(double factor);
   void TransformChanged();
   void UserZoomed();
@@ -92,7 +102,9 @@ class ViewCanvas : public wxWindow {
   PackedImage standIn_;  // shown until the picture is loaded; else empty
   std::unique_ptr<ViewScaler::Scaled> scaled_;
   ViewTransform transform_;
-  wxString overlay_;
+  wxString overlay_, note_;
+  Color around_;
+  wxBitmap drawn_;  // the picture as last painted
   wxPoint drag_;
   std::unique_ptr<ViewScaler> scaler_;
 };

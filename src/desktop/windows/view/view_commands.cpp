@@ -75,7 +75,13 @@ constexpr KeyCommand<ViewFrame> kCommands[] = {
 };
 // clang-format on
 
+constexpr MenuGroup kMenus[] = {{TrLater("&File"), 5}, {TrLater("Pict&ure"), 4},
+                                {TrLater("&Zoom"), 1}, {TrLater("&View"), 3},
+                                {TrLater("&Go"), 0},   {TrLater("&Pages"), 2}};
+
 }  // namespace
+
+std::span<const MenuGroup> ViewMenus() { return kMenus; }
 
 std::span<const KeyCommand<ViewFrame>> ViewCommands() { return kCommands; }
 

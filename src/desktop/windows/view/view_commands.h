@@ -6,6 +6,8 @@ namespace fotomill::desktop {
 
 class ViewFrame;
 
+// The menus of a view window: groups of commands between separators.
+std::span<const MenuGroup> ViewMenus();
 // The commands of a view window.
 std::span<const KeyCommand<ViewFrame>> ViewCommands();
 

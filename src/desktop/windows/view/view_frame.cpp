@@ -17,6 +17,7 @@
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/view/animation_bar.h"
+#include "desktop/windows/view/overlay_bar.h"
 #include "desktop/windows/view/view_animation.h"
 #include "desktop/windows/view/view_commands.h"
 #include "desktop/windows/widgets/bitmaps.h"
@@ -35,6 +36,7 @@ namespace {
 
 constexpr uint64_t kAheadBytes = 768ull * 1024 * 1024;  // for decoded pictures
 constexpr int kPointerMs = 2000;
+constexpr int kNoteMs = 6000;
 
 }  // namespace
 
@@ -42,24 +44,17 @@ ViewFrame::ViewFrame(Shell& shell, const std::vector<std::string>& list, const s
     : wxFrame(&shell.Window(), wxID_ANY, Label("View"), wxDefaultPosition, wxDefaultSize,
               wxDEFAULT_FRAME_STYLE, "FotomillProfessionalView"),
       shell_(shell),
-      list_(list),
       pointerTimer_(this),
       slideshow_({.busy = [this] { return animation_->MustFinish(); },
                   .show = [this](size_t place) { GoTo(place); }}) {
-  place_ = static_cast<size_t>(std::find(list_.begin(), list_.end(), file) - list_.begin());
-  if (place_ == list_.size()) {
-    list_ = {file};
-    place_ = 0;
-  }
+  TakeList(list, file);
   SetSize(shell.Window().GetSize());
   loader_ = std::make_unique<ViewLoader>(
       kAheadBytes, [this] { CallAfter([this] { PictureCame(); }); },
       [this](const std::string& path, int percent) {
         CallAfter([this, path, percent] { ShowProgress(path, percent); });
       });
-  canvas_ = new ViewCanvas(this, {.resized = [this] { Resized(); },
-                                  .changed = [this] { ViewChanged(); },
-                                  .painted = [this] { LogPaint(); }});
+  BuildCanvas();
   bar_ = new AnimationBar(this,
                           {.toggle = [this] { PlayOrNext(), canvas_->SetFocus(); },
                            .step = [this](int frames) { StepFrame(frames), canvas_->SetFocus(); }});
@@ -72,32 +67,68 @@ ViewFrame::ViewFrame(Shell& shell, const std::vector<std::string>& list, const s
   column->Add(canvas_, wxSizerFlags(1).Expand());
   column->Add(bar_, wxSizerFlags().Expand());
   SetSizer(column);
+  BuildMenus();
   CreateStatusBar();
   canvas_->SetFocus();
+  Bind(
+      wxEVT_TIMER,
+      [this](wxTimerEvent&) {
+        if (IsFullScreen() && !overlayBar_->Holds()) canvas_->SetCursor(wxCursor(wxCURSOR_BLANK));
+      },
+      pointerTimer_.GetId());
+  noteTimer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) { canvas_->SetNote({}); });
+  if (settings.MaximizeViewWindow != 0) Maximize();
+  ShowPlace();
+}
+
+void ViewFrame::BuildMenus() { SetMenuBar(NewCommandBar(ViewCommands(), ViewMenus(), *this)); }
+
+void ViewFrame::BuildCanvas() {
+  canvas_ = new ViewCanvas(this, {.resized = [this] { Resized(); },
+                                  .changed = [this] { ViewChanged(); },
+                                  .painted = [this] { LogPaint(); },
+                                  .decorate =
+                                      [this](wxDC& dc) {
+                                        if (overlayBar_ != nullptr) overlayBar_->Draw(dc);
+                                      }});
   canvas_->Bind(wxEVT_KEY_DOWN, &ViewFrame::OnKey, this);
   canvas_->Bind(wxEVT_RIGHT_DOWN, [this](wxMouseEvent& event) { ShowMenu(event.GetPosition()); });
   canvas_->Bind(wxEVT_MOTION, [this](wxMouseEvent& event) {
     HidePointerLater();
     event.Skip();
   });
-  Bind(
-      wxEVT_TIMER,
-      [this](wxTimerEvent&) {
-        if (IsFullScreen()) canvas_->SetCursor(wxCursor(wxCURSOR_BLANK));
-      },
-      pointerTimer_.GetId());
-  if (settings.MaximizeViewWindow != 0) Maximize();
-  ShowPlace();
+  // Its handlers of mouse events come before those of the canvas.
+  overlayBar_ = std::make_unique<OverlayBar>(
+      *canvas_, shell_.Thumbnails(),
+      OverlayBar::Events{
+          .run = [this](const OverlayBar::Command& command) { command.run(*this); },
+          .show = [this](size_t place) { GoTo(place); }});
 }
 
 ViewFrame::~ViewFrame() {
   // Their threads call back into this window.
   animation_.reset();
   loader_.reset();
+  overlayBar_.reset();
   if (shown_) shell_.Window().CallAfter(shown_);
 }
 
 // --- choosing pictures ---
+
+void ViewFrame::TakeList(const std::vector<std::string>& list, const std::string& file) {
+  list_ = list;
+  place_ = static_cast<size_t>(std::ranges::find(list_, file) - list_.begin());
+  if (place_ < list_.size()) return;
+  list_ = {file};
+  place_ = 0;
+}
+
+void ViewFrame::ShowList(const std::vector<std::string>& list, const std::string& file) {
+  slideshow_.Stop();
+  TakeList(list, file);
+  StartAfresh();
+  canvas_->SetFocus();
+}
 
 ViewRequest ViewFrame::RequestOf(size_t place) const {
   const wxSize size = canvas_->DeviceSize();
@@ -158,6 +189,7 @@ bool ViewFrame::AskForPicture() {
   loadedPercent_ = 0;
   keyTime_ = platform::MonotonicSeconds();
   WantPictures();
+  canvas_->SetNote({});
   ViewPicturePointer ready = loader_->Find(RequestOf(place_));
   if (ready != nullptr && ready->HasChanged()) {
     loader_->Forget(list_[place_]);
@@ -223,10 +255,24 @@ void ViewFrame::ShowPicture(ViewPicturePointer picture) {
                        " file=" + list_[place_]);
   if (picture->picture != nullptr) shell_.Uses().Note({FileUse{list_[place_], FileFunction::View}});
   loaded_ = std::move(picture);
+  ShowNote();
   ShowTurned();
   animation_->Begin(loaded_);
   slideshow_.ShownAt(place_, list_.size());
   if (shown_) shell_.Window().CallAfter(std::exchange(shown_, nullptr));
+}
+
+// What is wrong with the file, for a while.
+void ViewFrame::ShowNote() {
+  std::string note;
+  if (loaded_->picture != nullptr) {
+    note = MisnamedRemark(*loaded_->picture);
+    if (loaded_->picture->shortfall != Status::Ok)
+      note = Tr("The file is damaged or incomplete; part of the picture is missing.");
+  }
+  if (!note.empty()) LogEvent("view-note", note);
+  canvas_->SetNote(Shown(note));
+  noteTimer_.StartOnce(kNoteMs);
 }
 
 void ViewFrame::WhenShown(std::function<void()> shown) {
@@ -324,10 +370,13 @@ void ViewFrame::ViewChanged() {
   // Do not announce a number that changes many times per second.
   if (!animation_->Playing()) ReportToScreenReader(*canvas_, name, Shown(line));
   canvas_->SetOverlay(overlay_ ? OverlayLines() : std::vector<std::string>());
+  overlayBar_->SetFiles(list_, place_);
 }
 
 void ViewFrame::ToggleFullScreen() {
   ShowFullScreen(!IsFullScreen());
+  canvas_->SetAround(static_cast<Color>(IsFullScreen() ? settings.ViewModeFullScreenBackground
+                                                       : settings.ViewModeBackground));
   animation_->HideBar(IsFullScreen());
   HidePointerLater();
 }

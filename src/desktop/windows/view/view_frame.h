@@ -15,6 +15,7 @@
 namespace fotomill::desktop {
 
 class AnimationBar;
+class OverlayBar;
 class Shell;
 class ViewAnimation;
 
@@ -26,6 +27,8 @@ class ViewFrame : public wxFrame {
   ViewFrame(Shell& shell, const std::vector<std::string>& list, const std::string& file);
   ~ViewFrame() override;
 
+  // Shows another file among other neighbors.
+  void ShowList(const std::vector<std::string>& list, const std::string& file);
   // Commands of keys and menu.
   void Step(int files);
   void GoTo(size_t place);  // index in the list, from 0
@@ -70,6 +73,10 @@ class ViewFrame : public wxFrame {
   std::string StatusLine() const;
   std::vector<std::string> OverlayLines() const;
   void HidePointerLater();
+  void TakeList(const std::vector<std::string>& list, const std::string& file);
+  void BuildCanvas();
+  void BuildMenus();
+  void ShowNote();
   void OnKey(wxKeyEvent& event);
   void ShowMenu(const wxPoint& place);
   void LogPaint();
@@ -89,9 +96,10 @@ class ViewFrame : public wxFrame {
   bool overlay_ = false;
   std::function<void()> shown_;
   std::string painted_;  // last logged text
-  wxTimer pointerTimer_;
+  wxTimer pointerTimer_, noteTimer_;
   ViewCanvas* canvas_ = nullptr;
   AnimationBar* bar_ = nullptr;
+  std::unique_ptr<OverlayBar> overlayBar_;
   std::unique_ptr<ViewAnimation> animation_;
   ViewSlideshow slideshow_;
   std::unique_ptr<ViewLoader> loader_;

@@ -42,6 +42,16 @@ constexpr SymbolShape kSymbols[] = {
     {"previous", "<path d='M12 3 L5 8 L12 13 Z M3.5 3 V13'/>"},
     {"next", "<path d='M4 3 L11 8 L4 13 Z M12.5 3 V13'/>"},
     {"play", "<path d='M4.5 2.5 L12.5 8 L4.5 13.5 Z' fill='COLOR'/>"},
+    {"zoom-in", "<circle cx='7' cy='7' r='4.7'/><path d='M10.5 10.5 L14 14 M4.8 7 H9.2 M7 4.8 V9.2'/>"},
+    {"zoom-out", "<circle cx='7' cy='7' r='4.7'/><path d='M10.5 10.5 L14 14 M4.8 7 H9.2'/>"},
+    {"fit", "<path d='M2 5 V2 H5 M11 2 H14 V5 M14 11 V14 H11 M5 14 H2 V11 M4.8 6 H11.2 V10 H4.8 Z'/>"},
+    {"actual", "<path d='M2.5 5.5 L4.5 4 V12 M10.5 5.5 L12.5 4 V12 M8.3 6.4 V6.6 M8.3 10 V10.2'/>"},
+    {"rotate-left", "<path d='M4.2 4.6 A5.2 5.2 0 1 1 2.9 9.2 M4 1.6 V4.9 H7.3'/>"},
+    {"rotate-right", "<path d='M11.8 4.6 A5.2 5.2 0 1 0 13.1 9.2 M12 1.6 V4.9 H8.7'/>"},
+    {"flip-across", "<path d='M8 2 V14 M6 4.5 L2 11.5 H6 Z M10 4.5 L14 11.5 H10 Z'/>"},
+    {"flip-down", "<path d='M2 8 H14 M4.5 6 L11.5 2 V6 Z M4.5 10 L11.5 14 V10 Z'/>"},
+    {"full-screen", "<path d='M2 6 V2 H6 M10 2 H14 V6 M14 10 V14 H10 M6 14 H2 V10'/>"},
+    {"close", "<path d='M3.5 3.5 L12.5 12.5 M12.5 3.5 L3.5 12.5'/>"},
     {"pause", "<path d='M5 3 V13 M11 3 V13' stroke-width='2.6'/>"},
 };
 
@@ -72,13 +82,17 @@ wxBitmap BitmapOf(const RgbImage& image, double scale) {
 }
 
 wxBitmapBundle Symbol(std::string_view name, int side) {
+  return Symbol(name, side, wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT));
+}
+
+wxBitmapBundle Symbol(std::string_view name, int side, const wxColour& color) {
   for (const SymbolShape& symbol : kSymbols) {
     if (symbol.name != name) continue;
     std::string svg = std::string(
                           "<svg xmlns='http://www.w3.org/2000/svg' width='16' height='16' viewBox='0 0 16 16'><g fill='none' "
                           "stroke='COLOR' stroke-width='1.3' stroke-linecap='round' stroke-linejoin='round'>") +
                       symbol.shape + "</g></svg>";
-    ReplaceAll(svg, "COLOR", HexColor(wxSystemSettings::GetColour(wxSYS_COLOUR_WINDOWTEXT)));
+    ReplaceAll(svg, "COLOR", HexColor(color));
     return wxBitmapBundle::FromSVG(svg.c_str(), wxSize(side, side));
   }
   return {};

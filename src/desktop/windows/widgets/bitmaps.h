@@ -16,5 +16,6 @@ wxBitmap BitmapOf(const RgbImage& image, double scale = 1);
 // A symbol by name, in the system's text color,
 // 16 by 16 or any multiple. Empty if unknown.
 wxBitmapBundle Symbol(std::string_view name, int side = 16);
+wxBitmapBundle Symbol(std::string_view name, int side, const wxColour& color);  // in another color
 
 }  // namespace fotomill::desktop

@@ -1,5 +1,6 @@
 #pragma once
 
+#include <wx/accel.h>
 #include <wx/menu.h>
 
 #include <algorithm>
@@ -56,6 +57,51 @@ void ShowCommandMenu(std::span<const KeyCommand<Window>> commands, Window& windo
         wxEVT_MENU, [&window, run = command.run](wxCommandEvent&) { run(window); }, id);
   }
   owner.PopupMenu(&menu, place);
+}
+
+// A menu of a menu bar: the commands of a group, which separators delimit, counted from 0.
+struct MenuGroup {
+  const char* title;
+  size_t group;
+};
+
+// The text of a menu item. Keys that the toolkit understands also run the command when the menu bar
+// is visible; others are only displayed.
+template <typename Window>
+wxString MenuTextOf(const KeyCommand<Window>& command) {
+  wxAcceleratorEntry key;
+  const bool known = key.FromString(wxString("\t") + command.shownKey);
+  return Label(command.text) + (known ? "\t" : "    ") + command.shownKey;
+}
+
+// A menu bar with the commands of `window`, which must outlive it.
+template <typename Window>
+wxMenuBar* NewCommandBar(std::span<const KeyCommand<Window>> commands,
+                         std::span<const MenuGroup> groups, Window& window) {
+  auto* const bar = new wxMenuBar;
+  for (const MenuGroup& row : groups) {
+    auto* const menu = new wxMenu;
+    size_t group = 0;
+    for (const KeyCommand<Window>& command : commands) {
+      if (command.text == nullptr) ++group;
+      if (command.text == nullptr || group != row.group) continue;
+      const bool checkable = command.checked != nullptr;
+      wxMenuItem* const item = menu->Append(wxID_ANY, MenuTextOf(command), wxEmptyString,
+                                            checkable ? wxITEM_CHECK : wxITEM_NORMAL);
+      window.Bind(
+          wxEVT_MENU, [&window, run = command.run](wxCommandEvent&) { run(window); },
+          item->GetId());
+      if (!checkable) continue;
+      window.Bind(
+          wxEVT_UPDATE_UI,
+          [&window, checked = command.checked](wxUpdateUIEvent& event) {
+            event.Check(checked(window));
+          },
+          item->GetId());
+    }
+    bar->Append(menu, Label(row.title));
+  }
+  return bar;
 }
 
 // Converts member functions to commands: of the window, or of its focused canvas.
