@@ -185,6 +185,42 @@ def test_photo(work):
     run("pages", "photo", work / "wide.jpg", "--size", "30x40cm", "--out", work / "x.pdf", status=2)
 
 
+def test_large(work):
+    """Posters, solids and catalogs, as drawn."""
+    pdf = work / "poster.pdf"
+    run("pages", "poster", work / "wide.jpg", "--size", "60x40cm", "--out", pdf)
+    check(sizes(pdf), [(210.0, 297.0)] * 9, "eight sheets and the sketch")
+    check(len({row[10] for row in image_list(pdf)}), 1, "embedded once")
+    text = judge("pdftotext", pdf, "-")
+    check("Sheet 6 of 8 (row 2, column 2)" in text, True, "sheet numbers")
+    check("wide.jpg: 60.0 x 40.0 cm on 8 sheets" in text, True, "the sketch's title")
+    # the picture's red grows evenly over the sheets: column 2 begins 180 mm to the right
+    judge("pdftoppm", "-r", 127, "-f", 2, "-l", 2, "-singlefile", pdf, work / "second")
+    with Image.open(work / "second.ppm") as sheet:
+        red = sheet.convert("RGB").getpixel((5 * 60, 5 * 100))[0]
+    near(red, (180 + 50) / 600 * 255, 2, "what is on the second sheet")
+
+    pdf = work / "cube.pdf"
+    run("pages", "cube", work / "wide.jpg", "--size", "5cm", "--out", pdf,
+        "--set", "PrintDodecDashedLines=0")
+    left, top, right, bottom = painted(pdf)
+    near(right - left, 150.2, 0.15, "width of a cube's net")
+    near(bottom - top, 210.2, 0.15, "height of a cube's net")
+    run("pages", "cube", work / "wide.jpg", "--size", "8cm", "--out", work / "x.pdf", status=2)
+    pdf = work / "dodecahedron.pdf"
+    run("pages", "dodecahedron", work / "wide.jpg", work / "photo.png", "--out", pdf)
+    check(len(image_list(pdf)), 12, "faces")
+
+    pdf = work / "catalog.pdf"
+    run("pages", "catalog", work / "wide.jpg", work / "palette.png", "--out", pdf, "--footer",
+        "P. %P", "--details", "%W by %H")
+    text = judge("pdftotext", pdf, "-")
+    for words in ("P. 1", "600 by 400", "palette.png"):
+        check(words in text, True, f"{words} in a catalog")
+    check(pdf.read_bytes().count(b"/URI (file://"), 2, "links")
+    run("pages", "catalog", work / "wide.jpg", "--out", pdf, "--footer", "%Q", status=2)
+
+
 def test_outputs(work):
     """What is refused, and printing."""
     for arguments in ((), ("--out", "a.png"), ("--out", "a.pdf", "--printer", "x"),
@@ -254,7 +290,8 @@ def main():
     with tempfile.TemporaryDirectory() as name:
         work = Path(name)
         make_pictures(work)
-        for test in (test_print, test_pixels, test_contact, test_photo, test_outputs):
+        for test in (test_print, test_pixels, test_contact, test_photo, test_large,
+                     test_outputs):
             before = len(faults)
             test(work)
             for fault in faults[before:]:
