@@ -1,5 +1,5 @@
 #include "platform/work_apart.h"
-#include "registry/child_tasks.h"
+#include "plugins/child_tasks.h"
 #include "support/codec_target.h"
 
 #include <cstdlib>

@@ -28,8 +28,14 @@ install(FILES ${printed}/fish DESTINATION ${CMAKE_INSTALL_DATADIR}/fish/vendor_c
 # In lib, not an architecture-specific folder: the program searches ../lib/fotomill/plugin relative to itself.
 install(TARGETS FMWPL_pnm LIBRARY DESTINATION lib/fotomill/plugin COMPONENT plugins)
 
+install(TARGETS ${plugin_modules} LIBRARY DESTINATION lib/fotomill/plugin COMPONENT plugins)
+if(left_out_modules)
+  install(FILES ${CMAKE_BINARY_DIR}/plugin/left-out.txt DESTINATION lib/fotomill/plugin COMPONENT plugins)
+endif()
+
 # Examples for plug-in authors.
-install(FILES ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin.h ${PROJECT_SOURCE_DIR}/samples/plugin/pnm.c
+install(FILES ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin.h ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin_kit.h
+              ${PROJECT_SOURCE_DIR}/samples/plugin/pnm.c ${PROJECT_SOURCE_DIR}/plugins/qoi/qoi.c
         DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/fotomill/examples COMPONENT plugins)
 
 if(TARGET fotomill-faces)

@@ -15,6 +15,7 @@ inline constexpr std::string_view kTextLevels = "\xff.:-+|=%o#&XOB@";
 // the current ones once, with EncodeOptionsFromSettings. Numbers may be out of range:
 // writers clamp them.
 struct EncodeOptions {
+  int32_t quality = 0;  // set by SetQuality, for plug-ins: 1 to 100; 0: each format's setting
   bool preserveMetadata = true;  // PreserveEXIF: keep EXIF, XMP and comments
   int32_t resolution = 300;      // TiffResolution: dots per inch for pictures without a resolution
 
@@ -47,8 +48,8 @@ struct EncodeOptions {
   bool operator==(const EncodeOptions&) const = default;
 
   // Sets the quality, 1 to 100, of all lossy formats, and turns lossless modes off.
-  void SetQuality(int32_t quality) {
-    jpegQuality = webpQuality = quality;
+  void SetQuality(int32_t wanted) {
+    quality = jpegQuality = webpQuality = wanted;
     webpLossless = webpMixed = jpegAsSource = false;
   }
 };

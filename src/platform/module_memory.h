@@ -15,5 +15,7 @@ void UnlockModuleBlock(void* handle);  // the bytes may move afterwards
 void FreeModuleBlock(void* handle);  // invalidates the handle
 // A new block with a copy of `bytes`, null if memory runs out.
 void* NewModuleBlock(std::span<const uint8_t> bytes);
+// A new block of undefined contents, null if memory runs out.
+void* NewModuleMemory(uint64_t bytes);
 
 }  // namespace fotomill::platform

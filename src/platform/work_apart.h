@@ -61,6 +61,13 @@ enum class ApartResult {
   NotStarted,  // out of system resources, or the program does not call ServeApart
 };
 
+// What a worker process is for. Each kind has processes of its own.
+enum class ApartKind : uint8_t {
+  Own,           // the program's own code; cannot write files
+  Module,        // plug-in modules; cannot write files
+  ModuleWriter,  // plug-in modules that write a file
+};
+
 // A task with its input and limits.
 struct ApartOrder {
   const char* task;  // its name in the table
@@ -70,16 +77,18 @@ struct ApartOrder {
   // process; if the file is truncated meanwhile, the task fails.
   std::string inputFile = {};
   SharedBlock& reply;
-  // CPU time; the wall-clock limit is ten times this
+  // CPU time; the wall-clock limit is ten times this, unless `patience` is set
   unsigned seconds = 60;
+  unsigned patience = 0;  // wall-clock limit in seconds
+  ApartKind kind = ApartKind::Own;
   uint64_t memory = uint64_t{2} << 30;  // memory limit in bytes, besides input and reply
   std::function<bool()> goesOn = {};  // polled several times a second
 };
 
 // Runs work that may crash, such as a library that trusts its input, in a worker process.
-// The process sees nothing of this one but its input, cannot write files, and ends with
-// this one. `told` receives its numbers. After success the process is kept for further
-// tasks, until EndIdleProcesses.
+// The process sees nothing of this one but its input, cannot write files unless its kind
+// says so, and ends with this one. `told` receives its numbers. After success the process is kept
+// for further tasks, until EndIdleProcesses.
 ApartResult RunApart(const ApartOrder& order, const std::function<void(int32_t)>& told);
 
 // Ends the idle worker processes.

@@ -47,6 +47,12 @@ bool IsBadModule(const std::string& path) {
   return false;
 }
 
+void RecordBadModule(const std::string& path) {
+  const std::string line = BadModuleLine(path);
+  if (line.empty() || BadModuleFile().empty()) return;
+  (void)platform::WriteWholeFile(BadModuleFile(), RecordedText() + line + "\n");
+}
+
 bool ForgiveModule(const std::string& name) {
   const std::string recorded = RecordedText();
   std::string kept;

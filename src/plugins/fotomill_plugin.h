@@ -7,7 +7,9 @@
  * walks through a complete example.
  *
  * The program looks up eight functions by name. Three are required: PLUGIN11GetPluginParams,
- * PLUGIN11GetInfo and PLUGIN11ReadImage. The others are optional.
+ * PLUGIN11GetInfo and PLUGIN11ReadImage. The others are optional, and so are the PLUGIN12 functions
+ * at the end of this header, which a module may export as well: metadata, pages, reduced sizes,
+ * options. fotomill_plugin_kit.h has helpers for bitmaps and metadata blocks.
  *
  * Rules for every call:
  *  - Every block starts with its own size and the interface version, set by the program. Reject
@@ -16,8 +18,10 @@
  *    and later fields are shifted accordingly; the size field identifies the layout.
  *  - Texts are UTF-8 and NUL-terminated. File names are in the system's encoding.
  *  - Calls into a module are serialized, but may come from different threads.
- *  - A plug-in runs inside the program: if it crashes, so does the program. Validate everything
- *    read from files.
+ *  - A plug-in runs in a worker process with limited time and memory, which cannot write files
+ *    unless it is called to write one. If it crashes or hangs, only the file at hand fails.
+ *    Several worker processes may load the module at the same time. A module with
+ *    FMW_FORMAT_IN_PROGRAM runs inside the program instead: if it crashes, so does the program.
  */
 #ifndef FOTOMILL_PLUGIN_H
 #define FOTOMILL_PLUGIN_H
@@ -59,6 +63,13 @@ extern "C" {
 #define FMW_FORMAT_BITMAP 0x1
 #define FMW_FORMAT_MULTI 0x4       /* files may contain several pictures */
 #define FMW_FORMAT_ALPHA 0x2000000 /* the writer stores an alpha channel */
+/* For modules with PLUGIN12 functions: */
+#define FMW_FORMAT_FRAMES 0x400          /* the pictures of a file are frames of an animation */
+#define FMW_FORMAT_EXIF 0x4000000        /* the writer stores EXIF */
+#define FMW_FORMAT_XMP 0x8000000         /* the writer stores XMP */
+#define FMW_FORMAT_ICC 0x10000000        /* the writer stores a color profile */
+#define FMW_FORMAT_COMMENT 0x20000000    /* the writer stores a comment */
+#define FMW_FORMAT_IN_PROGRAM 0x40000000 /* runs inside the program, for windows of its own */
 
 /*
  * A memory block passed between program and plug-in: a movable global memory handle on Windows, a
@@ -175,6 +186,107 @@ typedef int32_t(FMW_CALL* FMW_GET_INFO)(FMW_PICTURE_INFO* info, const char* file
 typedef FMW_HANDLE(FMW_CALL* FMW_GET_COMMENT)(const char* fileName, int32_t* error, int32_t zero);
 /* PLUGIN11DoConfigure: opens the plug-in's settings dialog; 0 if it has none. */
 typedef int32_t(FMW_CALL* FMW_CONFIGURE_CALL)(FMW_CONFIGURE* block);
+
+/*
+ * The PLUGIN12 functions, all optional. A module that exports one of them still exports the three
+ * required PLUGIN11 functions, so that older programs can use it. The blocks below have 8-byte
+ * fields for counts of bytes and no padding.
+ */
+#define FMW_PLUGIN_VERSION_12 3073 /* 0x0C01 */
+#define FMW_OPTION_COUNT 16        /* options of a module at most */
+
+#pragma pack(push, 1)
+
+/* Passed to PLUGIN12ReadImage and PLUGIN12GetMetadata. */
+typedef struct FMW_READ_REQUEST {
+  int32_t size;    /* 0 */
+  int32_t version; /* 4: 3073 or later */
+  int32_t page;    /* 8: requested picture or frame, from 0 */
+  /* 12: above 0: a reduced picture is enough if its longer edge is at least this long, pixels. It
+   * need not be exact; a thumbnail or preview stored in the file is fine. */
+  int32_t wantedSide;
+  int32_t options[FMW_OPTION_COUNT]; /* 16: in the order of PLUGIN12GetOptions */
+  /* 80: memory for a result, contents undefined; 0 if there is not enough. Saves a copy. A block
+   * that is not returned after all is given back with `release`. */
+  FMW_HANDLE(FMW_CALL* allocate)(uint64_t bytes);
+  void(FMW_CALL* release)(FMW_HANDLE block);
+} FMW_READ_REQUEST;
+
+/* A block of bytes, allocated with malloc() by the module and freed by the program. */
+typedef struct FMW_BLOCK {
+  FMW_HANDLE data; /* 0: none */
+  uint64_t size;   /* bytes */
+} FMW_BLOCK;
+
+/* What 8 bits per sample cannot hold: bits of FMW_METADATA.lost. */
+#define FMW_LOST_DEPTH 1   /* more than 8 bits per sample */
+#define FMW_LOST_INKS 2    /* colors other than RGB, or extra channels */
+#define FMW_LOST_LAYERS 16 /* layers that were merged, or other pictures */
+
+/* Filled by PLUGIN12GetMetadata. The program clears it and sets size and version. */
+typedef struct FMW_METADATA {
+  int32_t size;     /*  0 */
+  int32_t version;  /*  4 */
+  int32_t pages;    /*  8: pictures or frames of the file, 0 as PLUGIN11GetInfo said */
+  int32_t rounds;   /* 12: times an animation plays, 0 for endless */
+  uint32_t lost;    /* 16: FMW_LOST_ bits */
+  FMW_BLOCK exif;   /* a TIFF structure, without "Exif\0\0"; orientation 1 if already applied */
+  FMW_BLOCK xmp;    /* an XMP packet */
+  FMW_BLOCK icc;    /* an ICC profile; none for sRGB */
+  FMW_BLOCK delays; /* an int32_t for each frame of an animation, milliseconds */
+} FMW_METADATA;
+
+/* Passed to PLUGIN12WriteImage. */
+typedef struct FMW_WRITE_REQUEST {
+  int32_t size;     /*  0 */
+  int32_t version;  /*  4 */
+  int32_t quality;  /*  8: 1 to 100, if the user asked for one; 0: the module's own */
+  int32_t lossless; /* 12: 1 if the user asked for lossless compression */
+  int32_t dpiX;     /* 16: pixels per inch, 0 if unknown */
+  int32_t dpiY;     /* 20 */
+  int32_t options[FMW_OPTION_COUNT]; /* 24: in the order of PLUGIN12GetOptions */
+  FMW_BLOCK exif, xmp, icc;          /* 88: owned by the program; empty if there is none */
+  const char* comment;               /* 0 if there is none */
+} FMW_WRITE_REQUEST;
+
+#pragma pack(pop)
+
+/* An option of a module, which the program shows in the module's options box and stores. */
+#define FMW_OPTION_SWITCH 0 /* 0 or 1 */
+#define FMW_OPTION_NUMBER 1 /* from `least` to `most` */
+#define FMW_OPTION_CHOICE 2 /* the number of a choice, from 0 */
+typedef struct FMW_OPTION {
+  const char* name;    /* letters and digits, as it is stored: "Quality" */
+  const char* label;   /* as it is shown, in English: "Quality, 1 to 100" */
+  int32_t kind;        /* FMW_OPTION_SWITCH, FMW_OPTION_NUMBER or FMW_OPTION_CHOICE */
+  int32_t least, most; /* of a number */
+  int32_t standard;    /* its value unless the user sets another one */
+  const char* choices; /* of a choice, separated by ";": "small;medium;large" */
+} FMW_OPTION;
+
+/* PLUGIN12GetLibraries: the libraries that the module uses, a line for each: name, version, SPDX
+ * license, separated by tabs. 0 or an empty text if there are none. */
+typedef const char*(FMW_CALL* FMW_GET_LIBRARIES)(void);
+/* PLUGIN12GetOptions: the module's options, valid as long as it is loaded. */
+typedef const FMW_OPTION*(FMW_CALL* FMW_GET_OPTIONS)(int32_t* count);
+/* PLUGIN12GetMetadata: called after PLUGIN11GetInfo, in the same way. A failure is no failure of
+ * the file; its metadata are left out. */
+typedef int32_t(FMW_CALL* FMW_GET_METADATA)(FMW_METADATA* metadata, const char* fileName,
+                                            const FMW_READ_REQUEST* request, int32_t* error,
+                                            const FMW_HOST_SERVICES* services);
+/* PLUGIN12ReadImage: called instead of PLUGIN11ReadImage. */
+typedef FMW_HANDLE(FMW_CALL* FMW_READ_IMAGE_12)(const char* fileName,
+                                                const FMW_READ_REQUEST* request, int32_t* error,
+                                                const FMW_HOST_SERVICES* services);
+/* PLUGIN12WriteImage: called instead of PLUGIN11WriteImage, under the same rules. */
+typedef int32_t(FMW_CALL* FMW_WRITE_IMAGE_12)(const char* fileName, FMW_HANDLE bitmap,
+                                              const FMW_WRITE_REQUEST* request, int32_t* error,
+                                              const FMW_HOST_SERVICES* services);
+/* PLUGIN12Transcode: stores the compressed picture of a file in the other format without decoding
+ * it, so that nothing is lost; the extensions tell the formats. FMW_ERROR_UNSUPPORTED or
+ * FMW_ERROR_FORMAT for files that it cannot do this with. */
+typedef int32_t(FMW_CALL* FMW_TRANSCODE)(const char* source, const char* destination,
+                                         int32_t* error, const FMW_HOST_SERVICES* services);
 
 #ifdef __cplusplus
 }

@@ -2,10 +2,8 @@
 
 #include <algorithm>
 #include <cstring>
-#include <vector>
 
 #include "core/byte_reader.h"
-#include "platform/module_memory.h"
 
 namespace fotomill {
 
@@ -90,11 +88,22 @@ Status TakeModuleBitmap(std::span<const uint8_t> block, PackedImage& image, Pack
   return Status::Ok;
 }
 
-void* NewModuleBitmap(const PackedImage& image, const PackedImage& alpha) {
-  if (alpha.Empty() || image.Bits() != 24) return platform::NewModuleBlock(image.Bytes());
-  const auto width = static_cast<size_t>(image.Width());
-  std::vector<uint8_t> block(PackedImage::kHeaderSize +
-                             4 * width * static_cast<size_t>(image.Height()));
+uint64_t LargestModuleBitmap(int32_t width, int32_t height) {
+  constexpr uint64_t kMostColors = 256, kLargestHeader = 256;
+  return kLargestHeader + 4 * kMostColors + RowStride(width, 32) * static_cast<uint64_t>(height);
+}
+
+uint64_t ModuleBitmapSize(const PackedImage& image, const PackedImage& alpha) {
+  if (alpha.Empty() || image.Bits() != 24) return image.Bytes().size();
+  return PackedImage::kHeaderSize +
+         4 * static_cast<uint64_t>(image.Width()) * static_cast<uint64_t>(image.Height());
+}
+
+void PutModuleBitmap(const PackedImage& image, const PackedImage& alpha, std::span<uint8_t> block) {
+  if (alpha.Empty() || image.Bits() != 24) {
+    std::ranges::copy(image.Bytes(), block.begin());
+    return;
+  }
   std::copy_n(image.Bytes().begin(), PackedImage::kHeaderSize, block.begin());
   block[14] = 32;
   const auto rowBytes = static_cast<uint32_t>(block.size() - PackedImage::kHeaderSize);
@@ -102,12 +111,11 @@ void* NewModuleBitmap(const PackedImage& image, const PackedImage& alpha) {
   uint8_t* pixel = block.data() + PackedImage::kHeaderSize;
   for (int32_t r = 0; r < image.Height(); ++r) {
     const auto colors = image.StoredRow(r), values = alpha.StoredRow(r);
-    for (size_t x = 0; x < width; ++x, pixel += 4) {
+    for (size_t x = 0; x < static_cast<size_t>(image.Width()); ++x, pixel += 4) {
       std::memcpy(pixel, &colors[3 * x], 3);
       pixel[3] = values[x];
     }
   }
-  return platform::NewModuleBlock(block);
 }
 
 }  // namespace fotomill

@@ -16,8 +16,13 @@ namespace fotomill {
 Status TakeModuleBitmap(std::span<const uint8_t> block, PackedImage& image, PackedImage& alpha,
                         Palette& palette);
 
-// The reverse: a new module block with the packed bitmap of a picture, 32 bits if there is an alpha
-// plane. The caller frees it with platform::FreeModuleBlock. Null if memory runs out.
-void* NewModuleBitmap(const PackedImage& image, const PackedImage& alpha);
+// The largest block that a module may return for a picture of that size, which CheckPackedSize has
+// allowed.
+uint64_t LargestModuleBitmap(int32_t width, int32_t height);
+
+// The reverse: the packed bitmap of a picture for a module, 32 bits if there is an alpha plane. Its
+// size, and the bitmap itself in a block of that size.
+uint64_t ModuleBitmapSize(const PackedImage& image, const PackedImage& alpha);
+void PutModuleBitmap(const PackedImage& image, const PackedImage& alpha, std::span<uint8_t> block);
 
 }  // namespace fotomill

@@ -1,7 +1,7 @@
 #include "plugins/plugin_bridge.h"
 
 #include <algorithm>
-#include <cstddef>
+#include <cstring>
 #include <string>
 #include <vector>
 
@@ -10,7 +10,10 @@
 #include "platform/module_memory.h"
 #include "platform/paths.h"
 #include "platform/temporary_folder.h"
+#include "plugins/carried_configuration.h"
+#include "plugins/module_apart.h"
 #include "plugins/module_call.h"
+#include "plugins/plugin_animation.h"
 #include "plugins/plugin_bitmap.h"
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
@@ -20,90 +23,61 @@ namespace fotomill {
 namespace {
 
 // The settings table passed to modules.
-const FMW_CONFIG_ENTRY* configuration = nullptr;
-int32_t configurationCount = 0;
+std::span<const FMW_CONFIG_ENTRY> configuration;
 
-// The picture of the call running on this thread; the progress callbacks have no argument to
-// identify it.
-thread_local PictureRecord* currentPicture = nullptr;
-// Its read options, also used for pictures that the module loads meanwhile.
-thread_local const ReadOptions* currentOptions = nullptr;
-
-ReadOptions CurrentOptions() { return currentOptions == nullptr ? ReadOptions() : *currentOptions; }
-
-FMW_HANDLE FMW_CALL HostLoadPicture(const char* fileName, int32_t* error) {
-  const platform::OwnCode ownCode;
-  PicturePointer picture;
-  Status status = fileName == nullptr
-                      ? Status::FileOpenError
-                      : LoadPicture({.fileName = fileName, .options = CurrentOptions()}, picture);
-  void* block = status == Status::Ok ? platform::NewModuleBlock(picture->image.Bytes()) : nullptr;
-  if (status == Status::Ok && block == nullptr) status = Status::MemoryAllocationError;
-  if (error != nullptr) *error = StatusNumber(status);
-  return block;
-}
-void FMW_CALL HostFreePicture(FMW_HANDLE bitmap) { platform::FreeModuleBlock(bitmap); }
-ProgressSink* CurrentProgress() {
-  return currentPicture == nullptr ? nullptr : currentPicture->progress;
-}
-void FMW_CALL HostProgressBegin() {
-  if (ProgressSink* progress = CurrentProgress()) progress->Begin();
-}
-void FMW_CALL HostProgressStep(int32_t done, int32_t total) {
-  if (ProgressSink* progress = CurrentProgress()) progress->Step(done, total);
-}
-void FMW_CALL HostProgressEnd() {
-  if (ProgressSink* progress = CurrentProgress()) progress->End();
-}
-void FMW_CALL HostSetStatus(const char* text) {
-  if (ProgressSink* progress = CurrentProgress(); progress != nullptr && text != nullptr)
-    progress->SetText(text);
-}
-
-// One call into a module for a picture: sets the picture's name and holds the service block.
-class PictureCall {
+// Passes what a module reports on to the picture's progress.
+class PictureListener final : public ModuleListener {
  public:
-  PictureCall(const PluginEntry& entry, PictureRecord& picture,
-              const ReadOptions* options = nullptr)
-      : call_(std::string(entry.path.view()), ModuleStage::Working),
-        before_(currentPicture),
-        optionsBefore_(currentOptions) {
-    currentPicture = &picture;
-    currentOptions = options;
-    services_.size = sizeof services_;
-    services_.version = FMW_PLUGIN_VERSION;
-    std::copy_n("RXaR", 4, services_.mark);
-    services_.loadPicture = HostLoadPicture;
-    services_.freePicture = HostFreePicture;
-    services_.progressBegin = HostProgressBegin;
-    services_.progressStep = HostProgressStep;
-    services_.progressEnd = HostProgressEnd;
-    services_.setStatus = HostSetStatus;
-    services_.configuration = configuration;
-    services_.configurationCount = configurationCount;
+  explicit PictureListener(const PictureRecord& picture, const ReadOptions& options = {})
+      : progress_(picture.progress), options_(options) {}
+  void Begin() override {
+    if (progress_ != nullptr) progress_->Begin();
   }
-  ~PictureCall() {
-    currentPicture = before_;
-    currentOptions = optionsBefore_;
+  void Step(int32_t done, int32_t total) override {
+    if (progress_ != nullptr) progress_->Step(done, total);
   }
-  PictureCall(const PictureCall&) = delete;
-  PictureCall& operator=(const PictureCall&) = delete;
-  FMW_HOST_SERVICES* Services() { return &services_; }
+  void End() override {
+    if (progress_ != nullptr) progress_->End();
+  }
+  void SetText(const char* text) override {
+    if (progress_ != nullptr) progress_->SetText(text);
+  }
+  ReadOptions Options() const override { return options_; }
 
  private:
-  ModuleCall call_;
-  PictureRecord* before_;
-  const ReadOptions* optionsBefore_;
-  FMW_HOST_SERVICES services_ = {};
+  ProgressSink* progress_;
+  const ReadOptions& options_;
 };
 
-// Converts a module's error number to a status. A failure without a number is still a failure.
-Status ModuleError(int32_t error) {
-  return error == 0 ? Status::DamagedFile : static_cast<Status>(error);
+std::string PathOf(const PluginFormat& format) { return std::string(format.entry.path.view()); }
+
+ModuleOptionValues OptionsOf(const PluginFormat& format) {
+  return OptionValuesOf(std::string(platform::FileNameOf(format.entry.path.view())), *format.facts);
 }
 
-std::string CommentText(const PictureRecord& picture) {
-  return {picture.comment.begin(), picture.comment.end()};
+ModuleQuestion QuestionOf(const PluginFormat& format, const ReadRequest& request) {
+  ModuleQuestion question;
+  question.fileName = request.fileName;
+  question.page = request.page;
+  // A reduced picture is at least twice as large as it is shown.
+  question.wantedSide = std::min(request.thumbnailSide, INT32_MAX / 2) * 2;
+  question.options = OptionsOf(format);
+  return question;
+}
+
+Status Describe(const PluginFormat& format, const ModuleQuestion& question,
+                const PictureRecord& picture, const ReadOptions& options,
+                ModuleDescription& description) {
+  PictureListener listener(picture, options);
+  if (format.here != nullptr) {
+    const ModuleCall call(PathOf(format), ModuleStage::Working);
+    return DescribeHere(*format.here, question,
+                        {.listener = &listener, .configuration = configuration}, description);
+  }
+  const auto carried = CarriedConfiguration(configuration);
+  return DescribeApart(PathOf(format), question,
+                       {.listener = &listener, .configuration = carried, .stop = picture.stop},
+                       description);
 }
 
 Status TakeInfo(const FMW_PICTURE_INFO& info, PictureRecord& picture) {
@@ -129,28 +103,103 @@ Status TakeInfo(const FMW_PICTURE_INFO& info, PictureRecord& picture) {
   return Status::Ok;
 }
 
+// What modules may say about contents that a record cannot hold.
+constexpr uint8_t kModuleLost = kUnreadDepth | kUnreadInks | kUnreadLayers;
+static_assert(FMW_LOST_DEPTH == kUnreadDepth && FMW_LOST_INKS == kUnreadInks &&
+              FMW_LOST_LAYERS == kUnreadLayers);
+
+void TakeMetadata(ModuleDescription& description, PictureRecord& picture) {
+  if (description.pages > 0) picture.pageCount = std::min(description.pages, 1 << 20);
+  picture.unread = static_cast<uint8_t>(description.lost & kModuleLost);
+  picture.simplified = picture.unread != 0;
+  picture.metadata.exif = std::move(description.exif);
+  picture.metadata.xmp = std::move(description.xmp);
+  picture.metadata.icc = std::move(description.icc);
+  picture.comment = std::move(description.comment);
+}
+
 // The module that reads a file: by file name or, if no module claims the name, the one the registry
 // bound by content. Null if there is none.
-const PluginEntry* ReaderOf(std::string_view fileName) {
-  const PluginEntry* const named = FindPluginEntry(fileName);
+const PluginFormat* ReaderOf(std::string_view fileName) {
+  const PluginFormat* const named = PluginFormatOf(fileName);
   if (named != nullptr) return named;
   const std::string_view bound = FormatRow(kSpareRow).extension;
-  return bound.empty() ? nullptr : FindPluginEntry(std::string("x.").append(bound));
+  return bound.empty() ? nullptr : PluginFormatOf(std::string("x.").append(bound));
+}
+
+Status ReadInProgram(const PluginFormat& format, const ModuleQuestion& question,
+                     PictureRecord& picture, const ReadOptions& options) {
+  PictureListener listener(picture, options);
+  const ModuleSurroundings surroundings{.listener = &listener, .configuration = configuration};
+  const ModuleCall call(PathOf(format), ModuleStage::Working);
+  void* handle = nullptr;
+  RETURN_IF_BAD(ReadHere(*format.here, question, surroundings, handle));
+  const auto block = platform::LockModuleBlock(handle);
+  Status status = Status::MemoryAllocationError;
+  if (!block.empty()) {
+    status = TakeModuleBitmap(block, picture.image, picture.alpha, picture.palette);
+    platform::UnlockModuleBlock(handle);
+  }
+  FreeModuleResult(handle, surroundings);
+  return status;
+}
+
+Status ReadInWorker(const PluginFormat& format, const ModuleQuestion& question,
+                    PictureRecord& picture, const ReadOptions& options) {
+  PictureListener listener(picture, options);
+  const auto carried = CarriedConfiguration(configuration);
+  ApartBitmap bitmap;
+  RETURN_IF_BAD(ReadApart(PathOf(format), question, picture.width, picture.height,
+                          {.listener = &listener, .configuration = carried, .stop = picture.stop},
+                          bitmap));
+  return TakeModuleBitmap(bitmap.bytes, picture.image, picture.alpha, picture.palette);
+}
+
+// Sets the record's size and scale after a picture was decoded, perhaps smaller than it is.
+void TakeSize(bool mayBeReduced, PictureRecord& picture) {
+  const int32_t width = picture.image.Width(), height = picture.image.Height();
+  picture.bitsPerPixel = picture.image.Bits();
+  picture.reduction = 1;
+  if (!mayBeReduced || width >= picture.width || height >= picture.height) {
+    picture.width = width;
+    picture.height = height;
+    return;
+  }
+  picture.reduction = (picture.width + width - 1) / width;
 }
 
 // Has the module write the picture to `path`.
-Status CallWriter(const PluginEntry& entry, PictureRecord& picture, const std::string& path,
-                  bool withComment) {
-  const std::string comment = withComment ? CommentText(picture) : std::string();
-  void* bitmap = NewModuleBitmap(picture.image, picture.alpha);
-  if (bitmap == nullptr) return Status::MemoryAllocationError;
-  int32_t error = 0;
-  PictureCall call(entry, picture);
-  const int32_t written = entry.exports.writeImage(
-      path.c_str(), bitmap, comment.empty() ? nullptr : comment.c_str(), &error, call.Services());
-  platform::FreeModuleBlock(bitmap);
-  if (written != 0) return Status::Ok;
-  return error == 0 ? Status::ErrorWritingFile : static_cast<Status>(error);
+Status CallWriter(const PluginFormat& format, PictureRecord& picture, const std::string& path,
+                  const WriteOptions& options) {
+  const std::string comment =
+      options.comment ? std::string(picture.comment.begin(), picture.comment.end()) : "";
+  ModuleOutput output;
+  output.fileName = path;
+  output.quality = std::clamp(options.encode.quality, 0, 100);
+  output.lossless = options.lossless;
+  output.dpiX = static_cast<int32_t>(picture.metadata.dpiX);
+  output.dpiY = static_cast<int32_t>(picture.metadata.dpiY);
+  output.options = OptionsOf(format);
+  output.icc = picture.metadata.icc;
+  if (options.KeepsMetadata()) {
+    output.exif = picture.metadata.exif;
+    output.xmp = picture.metadata.xmp;
+  }
+  output.comment = comment.empty() ? nullptr : comment.c_str();
+  PictureListener listener(picture);
+  if (format.here == nullptr) {
+    const auto carried = CarriedConfiguration(configuration);
+    return WriteApart(PathOf(format), output, picture.image, picture.alpha,
+                      {.listener = &listener, .configuration = carried, .stop = picture.stop});
+  }
+  platform::MemoryBlock bitmap;
+  if (!bitmap.Allocate(static_cast<size_t>(ModuleBitmapSize(picture.image, picture.alpha)),
+                       platform::Fill::Unset))
+    return Status::MemoryAllocationError;
+  PutModuleBitmap(picture.image, picture.alpha, bitmap.Bytes());
+  output.bitmap = bitmap.Bytes();
+  const ModuleCall call(PathOf(format), ModuleStage::Working);
+  return WriteHere(*format.here, output, {.listener = &listener, .configuration = configuration});
 }
 
 // The path the module writes to: in a separate folder, but with the destination's file name,
@@ -166,116 +215,119 @@ std::string WorkingName(const std::string& folder, const std::string& destinatio
 }
 
 // Whether the module recognizes the file it has written. Write-only modules cannot tell and pass.
-bool ReadsBack(const PluginEntry& entry, const std::string& path) {
-  FMW_PICTURE_INFO info = {};
-  info.size = sizeof info;
-  info.version = FMW_PLUGIN_VERSION;
-  int32_t error = 0;
-  PictureRecord record;
-  PictureCall call(entry, record);
-  return entry.exports.getInfo(&info, path.c_str(), &error, call.Services()) != 0 ||
-         error == FMW_ERROR_UNSUPPORTED || error == FMW_ERROR_FORMAT;
+bool ReadsBack(const PluginFormat& format, const std::string& path) {
+  ModuleQuestion question;
+  question.fileName = path;
+  question.options = OptionsOf(format);
+  ModuleDescription description;
+  const Status status = Describe(format, question, {}, {}, description);
+  return status == Status::Ok || status == Status::UnsupportedFunction ||
+         status == Status::UnsupportedFormat;
 }
 
 // Flags that a module may set on its formats; all others are set by the program.
 constexpr uint32_t kModuleFlags = FMT_BITMAP | FMT_MULTI | FMT_ALPHA;
 constexpr uint32_t kMostBits = 24;  // of a picture without alpha
 
+// Metadata that the writer of the newer interface stores.
+uint8_t KeptMetadata(const PluginFormat& format) {
+  if (!format.facts->takesMetadata) return 0;
+  constexpr std::pair<uint32_t, uint8_t> kKinds[] = {{FMW_FORMAT_EXIF, kLostExif | kLostMakerNote},
+                                                     {FMW_FORMAT_XMP, kLostXmp},
+                                                     {FMW_FORMAT_ICC, kLostIcc},
+                                                     {FMW_FORMAT_COMMENT, kLostComment}};
+  uint32_t kept = 0;
+  for (const auto& [flag, bits] : kKinds) kept |= (format.entry.flags2 & flag) != 0 ? bits : 0u;
+  return static_cast<uint8_t>(kept);
+}
+
 }  // namespace
 
 Status PluginInfo(PictureRecord& picture, const ReadRequest& request) {
-  const PluginEntry* entry = ReaderOf(request.fileName);
-  if (entry == nullptr || entry->exports.getInfo == nullptr) return Status::UnsupportedFunction;
-  FMW_PICTURE_INFO info = {};
-  info.size = sizeof info;
-  info.version = FMW_PLUGIN_VERSION;
-  info.frame = request.page;
-  int32_t error = 0;
-  PictureCall call(*entry, picture, &request.options);
-  if (entry->exports.getInfo(&info, request.fileName.c_str(), &error, call.Services()) == 0)
-    return ModuleError(error);
+  const PluginFormat* format = ReaderOf(request.fileName);
+  if (format == nullptr) return Status::UnsupportedFunction;
+  ModuleDescription description;
+  RETURN_IF_BAD(
+      Describe(*format, QuestionOf(*format, request), picture, request.options, description));
   picture.fileSize = platform::FactsOf(request.fileName).size;
-  RETURN_IF_BAD(TakeInfo(info, picture));
-  (void)PluginComment(picture, request.fileName.c_str());  // a missing comment is not an error
+  RETURN_IF_BAD(TakeInfo(description.info, picture));
+  TakeMetadata(description, picture);
   return Status::Ok;
 }
 
 Status PluginRead(PictureRecord& picture, const ReadRequest& request) {
-  const PluginEntry* entry = ReaderOf(request.fileName);
-  if (entry == nullptr || entry->exports.readImage == nullptr) return Status::UnsupportedFunction;
-  const std::string comment = CommentText(picture);
-  int32_t error = 0;
-  PictureCall call(*entry, picture, &request.options);
-  call.Services()->comment = comment.empty() ? nullptr : comment.c_str();
-  void* handle = entry->exports.readImage(request.fileName.c_str(), &error, call.Services());
-  if (handle == nullptr) return ModuleError(error);
-  const auto block = platform::LockModuleBlock(handle);
-  Status status = Status::MemoryAllocationError;
-  if (!block.empty()) {
-    status = TakeModuleBitmap(block, picture.image, picture.alpha, picture.palette);
-    platform::UnlockModuleBlock(handle);
-  }
-  platform::FreeModuleBlock(handle);
-  RETURN_IF_BAD(status);
-  picture.width = picture.image.Width();
-  picture.height = picture.image.Height();
-  picture.bitsPerPixel = picture.image.Bits();
+  const PluginFormat* format = ReaderOf(request.fileName);
+  if (format == nullptr) return Status::UnsupportedFunction;
+  ModuleQuestion question = QuestionOf(*format, request);
+  question.comment.assign(picture.comment.begin(), picture.comment.end());
+  RETURN_IF_BAD(format->here != nullptr
+                    ? ReadInProgram(*format, question, picture, request.options)
+                    : ReadInWorker(*format, question, picture, request.options));
+  TakeSize(question.wantedSide > 0, picture);
   return Status::Ok;
 }
 
 Status PluginWrite(PictureRecord& picture, const WriteOptions& options) {
-  const PluginEntry* entry = FindPluginEntry(picture.fileName);
-  if (entry == nullptr || entry->exports.writeImage == nullptr) return Status::UnsupportedFunction;
+  const PluginFormat* format = PluginFormatOf(picture.fileName);
+  if (format == nullptr || !format->facts->writes) return Status::UnsupportedFunction;
   const std::string destination(picture.fileName.view());
   ByteWriter out;
   platform::TemporaryFolder folder;
   if (!out.Create(destination) || !folder.Create()) return Status::ErrorCreatingFile;
   const std::string working = WorkingName(folder.Path(), destination);
-  RETURN_IF_BAD(CallWriter(*entry, picture, working, options.comment));
-  if (!ReadsBack(*entry, working)) return Status::ErrorWritingFile;
+  RETURN_IF_BAD(CallWriter(*format, picture, working, options));
+  if (!ReadsBack(*format, working)) return Status::ErrorWritingFile;
   platform::FileView written;
   if (!written.Open(working) || written.Bytes().empty()) return Status::ErrorWritingFile;
   out.Bytes(written.Bytes());
   return written.Intact() ? CommitOutput(out, options) : Status::ErrorWritingFile;
 }
 
-Status PluginComment(PictureRecord& picture, const char* fileName) {
-  const PluginEntry* entry = ReaderOf(fileName);
-  if (entry == nullptr) return Status::UnsupportedFunction;
-  if (entry->exports.getComment == nullptr) return Status::Ok;
-  int32_t error = 0;
-  PictureCall call(*entry, picture);
-  void* handle = entry->exports.getComment(fileName, &error, 0);
-  if (handle == nullptr) return Status::Ok;
-  const auto block = platform::LockModuleBlock(handle);
-  if (!block.empty()) {
-    picture.comment.assign(block.begin(), std::find(block.begin(), block.end(), uint8_t{0}));
-    platform::UnlockModuleBlock(handle);
-  }
-  platform::FreeModuleBlock(handle);
-  return block.empty() ? Status::MemoryAllocationError : Status::Ok;
+Status DescribePluginFrames(const ReadRequest& request, PluginFrames& frames) {
+  const PluginFormat* format = ReaderOf(request.fileName);
+  if (format == nullptr) return Status::UnsupportedFunction;
+  const PicturePointer picture = NewPictureRecord(request.options.alphaBackground);
+  if (picture == nullptr) return Status::MemoryAllocationError;
+  ModuleDescription description;
+  RETURN_IF_BAD(
+      Describe(*format, QuestionOf(*format, request), *picture, request.options, description));
+  RETURN_IF_BAD(TakeInfo(description.info, *picture));
+  frames.width = picture->width;
+  frames.height = picture->height;
+  frames.rounds = std::max(description.rounds, 0);
+  frames.delays.resize(std::min(description.delays.size() / sizeof(int32_t), size_t{1} << 16));
+  std::memcpy(frames.delays.data(), description.delays.data(),
+              frames.delays.size() * sizeof(int32_t));
+  for (int32_t& delay : frames.delays) delay = std::max(delay, 0);
+  if (frames.delays.empty()) frames.delays.push_back(0);
+  return Status::Ok;
 }
 
 void InstallPluginConfiguration(const FMW_CONFIG_ENTRY* rows, int32_t count) {
-  configuration = rows;
-  configurationCount = count;
+  configuration = {rows, static_cast<size_t>(count)};
 }
 
 int32_t BindPluginFormat(std::string_view fileName) {
-  const PluginEntry* entry = FindPluginEntry(fileName);
-  if (entry == nullptr) return kNoFormat;
+  const PluginFormat* format = PluginFormatOf(fileName);
+  if (format == nullptr) return kNoFormat;
+  const PluginEntry& entry = format->entry;
   FormatEntry& row = FormatRow(kSpareRow);
   row.details = nullptr;
   row.info = PluginInfo;
   row.read = PluginRead;
   row.write = PluginWrite;
-  row.canRead = row.canWrite = true;
+  const bool frames = (entry.flags2 & FMW_FORMAT_FRAMES) != 0 && format->facts->hasMetadata;
+  row.animate = frames ? PluginAnimate : nullptr;
+  row.canRead = true;
+  row.canWrite = format->facts->writes;
   row.reserved = 0;
-  row.maxBits = std::min(entry->flags1, kMostBits);
-  row.extension = entry->extension;
-  row.description = entry->textB;
+  row.maxBits = std::min(entry.flags1, kMostBits);
+  row.extension = entry.extension;
+  row.description = entry.textB;
   row.enabled = 1;
-  row.flags = (entry->flags2 & kModuleFlags) | FMT_SPARE;
+  row.flags = (entry.flags2 & kModuleFlags) | FMT_SPARE | (frames ? FMT_FRAMES | FMT_TIMED : 0u);
+  row.keepsMetadata = KeptMetadata(*format);
+  row.whyNot = row.canWrite ? std::string_view() : kOnlyRead;
   return kSpareRow;
 }
 

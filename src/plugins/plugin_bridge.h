@@ -10,10 +10,11 @@ namespace fotomill {
 // Operations of the spare row while it is bound to a plug-in format. Each looks up the module by
 // file extension at call time, so that a picture can be converted from one plug-in format to
 // another although both use the spare row. UnsupportedFunction (5) if no module handles the
-// extension; a module's own error numbers are passed on.
+// extension; a module's own error numbers are passed on. A module that crashes or takes too long is
+// DamagedFile (2), in PluginWrite ErrorWritingFile (11).
 
-// Reads header facts and comment. A comment that cannot be read is left out. DamagedFile (2) if the
-// module returns impossible sizes or depths.
+// Reads header facts, metadata and comment. Metadata that cannot be read are left out. DamagedFile
+// (2) if the module returns impossible sizes or depths.
 Status PluginInfo(PictureRecord& picture, const ReadRequest& request);
 // Decodes into `image`, and into `alpha` for 32-bit bitmaps. DamagedFile (2) if the returned bitmap
 // does not match its header, MemoryAllocationError (6) if it cannot be locked or stored.
@@ -23,10 +24,6 @@ Status PluginRead(PictureRecord& picture, const ReadRequest& request);
 // without a file that it can read itself. A failed write leaves nothing behind. The comment is
 // written if the options say so.
 Status PluginWrite(PictureRecord& picture, const WriteOptions& options);
-
-// Reads the comment of a file into `picture.comment`. MemoryAllocationError (6) if the returned
-// text cannot be locked; Ok without a comment if the module returns none.
-Status PluginComment(PictureRecord& picture, const char* fileName);
 
 // Sets the configuration table that modules may access, in the ABI layout; not owned. Without this
 // call modules get none.

@@ -1,6 +1,7 @@
 // Connects the plug-in table to the registry: modules are loaded when the registry first
 // asks for them.
 
+#include <algorithm>
 #include <mutex>
 
 #include "core/text.h"
@@ -18,7 +19,7 @@ std::string pluginFolder;
 
 void ScanOnce() {
   const std::lock_guard lock(scanMutex);
-  if (!scanned) (void)ScanPlugins(pluginFolder);
+  if (!scanned) (void)ScanPlugins(pluginFolder, PluginScan::Cached);
   scanned = true;
 }
 
@@ -34,13 +35,31 @@ std::vector<PluginFormatFacts> ListForRegistry() {
     const PluginEntry& entry = PluginRow(i);
     // if two modules share an extension, the first one gets it
     if (i > 0 && EqualIgnoringCase(PluginRow(i - 1).extension, entry.extension)) continue;
-    formats.push_back(
-        {UpperCase(entry.extension.view()), std::string(entry.textB.view()), entry.flags1, entry.exports.writeImage != nullptr});
+    formats.push_back({UpperCase(entry.extension.view()), std::string(entry.textB.view()),
+                       entry.flags1, PluginFacts(i).writes});
   }
   return formats;
 }
 
-constexpr PluginSource kPluginSource = {BindForRegistry, ListForRegistry};
+// The lines of each module's list: name, version, license, separated by tabs.
+std::vector<PluginLibrary> LibrariesForRegistry() {
+  ScanOnce();
+  std::vector<PluginLibrary> libraries;
+  for (int32_t i = 0; i < PluginFormatCount(); ++i) {
+    for (std::string_view rest = PluginFacts(i).libraries; !rest.empty();) {
+      const std::string_view line = rest.substr(0, rest.find('\n'));
+      rest.remove_prefix(std::min(line.size() + 1, rest.size()));
+      const size_t tab = line.find('\t');
+      if (tab == std::string_view::npos) continue;
+      const std::string_view version = line.substr(tab + 1);
+      libraries.push_back(
+          {std::string(line.substr(0, tab)), std::string(version.substr(0, version.find('\t')))});
+    }
+  }
+  return libraries;
+}
+
+constexpr PluginSource kPluginSource = {BindForRegistry, ListForRegistry, LibrariesForRegistry};
 
 }  // namespace
 

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 #include <map>
-#include <type_traits>
 #include <utility>
 #include <vector>
 
@@ -13,22 +12,20 @@
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/shared_library.h"
+#include "platform/work_apart.h"
 #include "plugins/bad_modules.h"
+#include "plugins/facts_cache.h"
+#include "plugins/module_apart.h"
 #include "plugins/module_call.h"
+#include "plugins/plugin_bridge.h"
 #include "registry/registry.h"
 
 namespace fotomill {
 
 namespace {
 
-// An entry with the library handle that keeps its exports valid.
-struct LoadedEntry {
-  PluginEntry entry;
-  platform::SharedLibrary library;
-};
-
-std::vector<LoadedEntry>& Table() {
-  static std::vector<LoadedEntry> table;
+std::vector<PluginFormat>& Table() {
+  static std::vector<PluginFormat> table;
   return table;
 }
 
@@ -57,76 +54,76 @@ bool IsModuleName(std::string_view name) {
          LowerCase(name).find("_x64") == std::string::npos;
 }
 
-PluginExports LookUpExports(const platform::SharedLibrary& library) {
-  PluginExports exports;
-  exports.getVersion =
-      library.FunctionNamed<std::remove_pointer_t<FMW_GET_VERSION>>("PLUGIN11GetVersion");
-  exports.getCopyright =
-      library.FunctionNamed<std::remove_pointer_t<FMW_GET_COPYRIGHT>>("PLUGIN11GetCopyright");
-  exports.getParams =
-      library.FunctionNamed<std::remove_pointer_t<FMW_GET_PARAMS>>("PLUGIN11GetPluginParams");
-  exports.readImage =
-      library.FunctionNamed<std::remove_pointer_t<FMW_READ_IMAGE>>("PLUGIN11ReadImage");
-  exports.writeImage =
-      library.FunctionNamed<std::remove_pointer_t<FMW_WRITE_IMAGE>>("PLUGIN11WriteImage");
-  exports.getInfo = library.FunctionNamed<std::remove_pointer_t<FMW_GET_INFO>>("PLUGIN11GetInfo");
-  exports.getComment =
-      library.FunctionNamed<std::remove_pointer_t<FMW_GET_COMMENT>>("PLUGIN11GetComment");
-  exports.configure =
-      library.FunctionNamed<std::remove_pointer_t<FMW_CONFIGURE_CALL>>("PLUGIN11DoConfigure");
-  return exports;
+// Whether modules run in worker processes.
+bool apart = true;
+
+std::map<std::string, int32_t>& SetOptions() {
+  static std::map<std::string, int32_t> values;
+  return values;
 }
 
-// Texts from modules may lack the terminating NUL.
-template <size_t size>
-std::string_view TextOf(const char (&text)[size]) {
-  const std::string_view whole(text, size - 1);
-  return whole.substr(0, whole.find('\0'));
-}
-
-// Item `index` of a list separated by one or more ";", empty if out of range.
-std::string_view ListItem(std::string_view list, int32_t index) {
-  list.remove_prefix(std::min(list.find_first_not_of(';'), list.size()));
-  for (; index > 0; --index) {
-    const size_t end = list.find(';');
-    if (end == std::string_view::npos) return {};
-    list.remove_prefix(end);
-    list.remove_prefix(std::min(list.find_first_not_of(';'), list.size()));
+// Adds the formats of a module to the table.
+void AddFormats(const std::string& path, const std::shared_ptr<const ModuleFacts>& facts,
+                const std::shared_ptr<const LoadedModule>& here, std::vector<PluginFormat>& table) {
+  for (int32_t i = 0; i < kFormatsPerModule; ++i) {
+    const std::string_view extension = ListItem(facts->extensions, i);
+    PluginFormat format{{}, facts, here};
+    PluginEntry& entry = format.entry;
+    if (extension.empty() || !entry.path.Assign(path)) return;
+    entry.extension.AssignCut(extension);
+    entry.textA.AssignCut(facts->textA);
+    entry.textB.AssignCut(facts->textB);
+    entry.flags1 = facts->flags1;
+    entry.flags2 = facts->flags2 | FMT_SPARE;
+    if (here != nullptr) {
+      entry.module = here->library.Handle();
+      entry.exports = here->exports;
+    }
+    table.push_back(std::move(format));
   }
-  return list.substr(0, list.find(';'));
 }
 
-// Registers format number `index` of a module. False after the module's last format.
-bool RegisterFormat(const std::string& path, int32_t index, std::vector<LoadedEntry>& table) {
-  LoadedEntry loaded;
+// Loads a module into this process; null on failure.
+std::shared_ptr<const LoadedModule> LoadHere(const std::string& path, ModuleFacts& facts) {
+  auto module = std::make_shared<LoadedModule>();
   const ModuleCall call(path, ModuleStage::Loading);
-  if (!loaded.entry.path.Assign(path) || !loaded.library.Load(path)) {
-    Unloadable()[path] = loaded.library.Error();
-    return false;
+  facts = {};
+  if (LoadModule(path, *module, facts, Unloadable()[path])) {
+    Unloadable().erase(path);
+    return module;
   }
-  PluginEntry& entry = loaded.entry;
-  entry.exports = LookUpExports(loaded.library);
-  if (entry.exports.getParams == nullptr || entry.exports.readImage == nullptr ||
-      entry.exports.getInfo == nullptr) {
-    return false;
-  }
-  FMW_PLUGIN_PARAMS params = {};
-  params.size = sizeof params;
-  params.version = FMW_PLUGIN_VERSION;
-  if (entry.exports.getParams(&params, 0) == 0) return false;
-  const std::string_view extension = ListItem(TextOf(params.extensions), index);
-  if (extension.empty()) return false;
-  entry.extension.AssignCut(extension);
-  entry.textA.AssignCut(TextOf(params.textA));
-  entry.textB.AssignCut(TextOf(params.textB));
-  entry.module = loaded.library.Handle();
-  entry.flags1 = params.flags1;
-  entry.flags2 = params.flags2 | FMT_SPARE;
-  table.push_back(std::move(loaded));
-  return true;
+  return nullptr;
 }
 
-bool ComesBefore(const LoadedEntry& a, const LoadedEntry& b) {
+// Asks a module in a worker process. A module that crashes is not asked again.
+bool AskApart(const std::string& path, FactsCache& cache, bool cached, ModuleFacts& facts) {
+  if (cached && cache.Find(path, facts)) return true;
+  std::string error;
+  switch (AskFactsApart(path, facts, error)) {
+    case FactsResult::Known: cache.Put(path, facts); return true;
+    case FactsResult::Crashed:
+      RecordBadModule(path);
+      Unloadable()[path] = Tr("it crashed when it was loaded");
+      return false;
+    case FactsResult::Declined:
+    case FactsResult::Unasked: Unloadable()[path] = error; return false;
+  }
+  return false;
+}
+
+void RegisterModule(const std::string& path, FactsCache& cache, bool cached,
+                    std::vector<PluginFormat>& table) {
+  ModuleFacts facts;
+  std::shared_ptr<const LoadedModule> here;
+  if (apart && !AskApart(path, cache, cached, facts)) return;
+  if (!apart || (facts.flags2 & FMW_FORMAT_IN_PROGRAM) != 0) {
+    here = LoadHere(path, facts);
+    if (here == nullptr) return;
+  }
+  AddFormats(path, std::make_shared<const ModuleFacts>(std::move(facts)), here, table);
+}
+
+bool ComesBefore(const PluginFormat& a, const PluginFormat& b) {
   const std::string left = LowerCase(a.entry.extension.view()),
                     right = LowerCase(b.entry.extension.view());
   return left != right ? left < right : a.entry.path.view() < b.entry.path.view();
@@ -143,21 +140,23 @@ std::vector<std::string> PluginFolders() {
   return folders;
 }
 
-int32_t ScanPlugins(const std::string& folder) {
+int32_t ScanPlugins(const std::string& folder, PluginScan scan) {
   UnloadPlugins();
   Unloadable().clear();
-  std::vector<LoadedEntry> table;
+  if (scan == PluginScan::Fresh) platform::EndIdleProcesses();  // they keep modules loaded
+  FactsCache cache;
+  std::vector<PluginFormat> table;
   for (const PluginModule& module : PluginModules(folder)) {
     if (!module.on) continue;
     const std::string path = platform::JoinFolder(module.folder, module.name);
     if (IsBadModule(path)) {
-      Unloadable()[path] = Tr("it crashed the program when it was loaded");
+      Unloadable()[path] = Tr("it crashed when it was loaded");
       continue;
     }
-    int32_t registered = 0;
-    while (registered < kFormatsPerModule && RegisterFormat(path, registered, table)) ++registered;
+    RegisterModule(path, cache, scan == PluginScan::Cached, table);
   }
-  std::stable_sort(table.begin(), table.end(), ComesBefore);
+  cache.Save();
+  std::ranges::stable_sort(table, ComesBefore);
   Table() = std::move(table);
   return PluginFormatCount();
 }
@@ -194,13 +193,43 @@ void UnloadPlugins() { Table().clear(); }
 
 int32_t PluginFormatCount() { return static_cast<int32_t>(Table().size()); }
 
+void RunModulesApart(bool on) { apart = on; }
+
+void UseModuleHere(const std::string& path, const LoadedModule& module, const ModuleFacts& facts) {
+  const auto known = [&path](const PluginFormat& format) {
+    return format.entry.path.view() == path;
+  };
+  if (std::ranges::any_of(Table(), known)) return;
+  static constexpr PluginSource kSource = {
+      [](std::string_view fileName, int32_t) { return BindPluginFormat(fileName); },
+      [] { return std::vector<PluginFormatFacts>(); }, [] { return std::vector<PluginLibrary>(); }};
+  InstallPluginSource(&kSource);
+  // not owned
+  const std::shared_ptr<const LoadedModule> here(std::shared_ptr<void>(), &module);
+  AddFormats(path, std::make_shared<const ModuleFacts>(facts), here, Table());
+}
+
 const PluginEntry& PluginRow(int32_t index) { return Table()[static_cast<size_t>(index)].entry; }
+
+const ModuleFacts& PluginFacts(int32_t index) { return *Table()[static_cast<size_t>(index)].facts; }
+
+void SetModuleOptions(std::map<std::string, int32_t> values) { SetOptions() = std::move(values); }
+
+ModuleOptionValues OptionValuesOf(const std::string& module, const ModuleFacts& facts) {
+  ModuleOptionValues values = {};
+  for (size_t i = 0; i < facts.options.size(); ++i) {
+    const ModuleOption& option = facts.options[i];
+    const auto set = SetOptions().find(module + "." + option.name);
+    values[i] = set == SetOptions().end() ? option.standard : option.Nearest(set->second);
+  }
+  return values;
+}
 
 bool PluginExtension(int32_t index, std::string& extension, uint32_t& flags1) {
   if (index < 0 || index >= PluginFormatCount()) return false;
   const PluginEntry& entry = PluginRow(index);
   extension = entry.extension.view();
-  flags1 = entry.exports.writeImage == nullptr ? 0 : entry.flags1;
+  flags1 = PluginFacts(index).writes ? entry.flags1 : 0;
   return true;
 }
 
@@ -216,28 +245,33 @@ bool PluginTextB(int32_t index, std::string& text) {
   return true;
 }
 
-const PluginEntry* FindPluginEntry(std::string_view fileName) {
+const PluginFormat* PluginFormatOf(std::string_view fileName) {
   const std::string_view extension = platform::ExtensionOf(fileName);
   if (extension.empty()) return nullptr;
-  for (const LoadedEntry& loaded : Table()) {
-    if (EqualIgnoringCase(loaded.entry.extension, extension)) return &loaded.entry;
+  for (const PluginFormat& format : Table()) {
+    if (EqualIgnoringCase(format.entry.extension, extension)) return &format;
   }
   return nullptr;
 }
 
 bool PluginCanHandle(std::string_view fileName) {
-  const PluginEntry* entry = FindPluginEntry(fileName);
-  return entry != nullptr && (entry->flags2 & FMW_FORMAT_MULTI) != 0;
+  const PluginFormat* format = PluginFormatOf(fileName);
+  return format != nullptr && (format->entry.flags2 & FMW_FORMAT_MULTI) != 0;
 }
 
 bool ConfigurePlugin(int32_t index) {
-  if (index < 0 || index >= PluginFormatCount() || PluginRow(index).exports.configure == nullptr)
-    return false;
-  const ModuleCall call(std::string(PluginRow(index).path.view()), ModuleStage::Working);
+  if (index < 0 || index >= PluginFormatCount() || !PluginFacts(index).hasDialog) return false;
+  const std::string path(PluginRow(index).path.view());
+  // A dialog needs the program's windows; the module is loaded as long as it is open.
+  std::shared_ptr<const LoadedModule> here = Table()[static_cast<size_t>(index)].here;
+  ModuleFacts facts;
+  if (here == nullptr) here = LoadHere(path, facts);
+  if (here == nullptr || here->exports.configure == nullptr) return false;
+  const ModuleCall call(path, ModuleStage::Working);
   FMW_CONFIGURE block = {};
   block.size = sizeof block;
   block.version = FMW_PLUGIN_VERSION;
-  return PluginRow(index).exports.configure(&block) != 0;
+  return here->exports.configure(&block) != 0;
 }
 
 std::string PluginHelpPage(int32_t index) {

@@ -82,6 +82,11 @@ constexpr Row kRows[] = {
     {"libwebp", "webp sharpyuv", "BSD-3-Clause", "2010 Google Inc.", nullptr},
     {"libjxr", nullptr, "BSD-2-Clause", "Microsoft Corp.", nullptr},
     {"LibRaw", nullptr, "LGPL-2.1-only OR CDDL-1.0", "2008-2024 LibRaw LLC", nullptr},
+    {"libavif", nullptr, "BSD-2-Clause", "2019 Joe Drago", TrLater("AVIF, in a plug-in")},
+    {"libheif", nullptr, "LGPL-3.0-or-later", "2017-2023 Dirk Farin and others", TrLater("HEIC, in a plug-in")},
+    {"libjxl", nullptr, "BSD-3-Clause", "the JPEG XL Project Authors", TrLater("JPEG XL, in a plug-in")},
+    {"OpenJPEG", nullptr, "BSD-2-Clause", "2002-2014 Universite catholique de Louvain and others", TrLater("JPEG 2000, in a plug-in")},
+    {"librsvg", nullptr, "LGPL-2.1-or-later", "the librsvg contributors", TrLater("SVG, in a plug-in")},
     {"libarchive", nullptr, "BSD-2-Clause", "2003-2018 Tim Kientzle", nullptr},
     {"lcms2", "lcms2", "MIT", "1998-2023 Marti Maria Saguer", TrLater("color profiles")},
     {"pugixml", "pugixml", "MIT", "2006-2023 Arseny Kapoulkine", TrLater("GPX tracks")},
@@ -128,7 +133,8 @@ bool HasWord(std::string_view list, std::string_view word) {
 // Combines a row with what the build, the codecs and the front end know about the library; false if
 // none of them does. Removes it from `linked`.
 bool Complete(const Row& row, std::vector<LinkedLibrary>& linked,
-              const std::vector<FormatLibrary>& ofFormats, std::span<const OwnLibrary> own,
+              const std::vector<FormatLibrary>& ofFormats,
+              const std::vector<PluginLibrary>& ofPlugins, std::span<const OwnLibrary> own,
               Library& library) {
   bool known = false;
   std::erase_if(linked, [&](const LinkedLibrary& one) {
@@ -152,6 +158,11 @@ bool Complete(const Row& row, std::vector<LinkedLibrary>& linked,
     library.purpose = codec.purpose;
     known = true;
   }
+  for (const PluginLibrary& one : ofPlugins) {
+    if (known || library.name != one.name) continue;
+    library.version = one.version;
+    known = true;
+  }
   for (const OwnLibrary& one : own) {
     if (library.name != one.name) continue;
     library.version = one.version;
@@ -166,10 +177,12 @@ bool Complete(const Row& row, std::vector<LinkedLibrary>& linked,
 std::vector<Library> LibrariesOf(std::span<const OwnLibrary> own) {
   std::vector<LinkedLibrary> linked = LinkedLibraries();
   const std::vector<FormatLibrary> ofFormats = LibrariesOfFormats();
+  const std::vector<PluginLibrary> ofPlugins = LibrariesOfPlugins();
   std::vector<Library> libraries;
   for (const Row& row : kRows) {
     Library library{row.name, {}, row.license, row.copyright, row.purpose, Linking::Loaded, true};
-    if (Complete(row, linked, ofFormats, own, library)) libraries.push_back(std::move(library));
+    if (Complete(row, linked, ofFormats, ofPlugins, own, library))
+      libraries.push_back(std::move(library));
   }
   for (const LinkedLibrary& one : linked) {  // those without a row above
     libraries.push_back({std::string(one.name), std::string(one.version), "", "",

@@ -40,7 +40,7 @@ bool IsRefusal(Status status) {
 // `open` receives a row's index and succeeds by returning Ok.
 template <class Open>
 Status OpenByNameOrContents(const ReadRequest& request, const Open& open) {
-  const int32_t named = FindFormatByName(request.fileName);
+  const int32_t named = FindReaderByName(request.fileName);
   const Status status = named == kNoFormat ? Status::UnsupportedFormat : open(named);
   const IdentifyOptions& identify = request.options.identify;
   if (!IsRefusal(status) || !identify.on || IsExcepted(request.fileName, identify.exceptions))
@@ -120,7 +120,7 @@ Status OpenAnimation(const ReadRequest& request, AnimationPointer& animation) {
 
 Status WritePicture(PictureRecord& picture, std::string_view destination,
                     const WriteOptions& options) {
-  return WritePictureAs(picture, destination, FindFormatByName(destination), options);
+  return WritePictureAs(picture, destination, FindWriterByName(destination), options);
 }
 
 Status WritePictureAs(PictureRecord& picture, std::string_view destination, int32_t formatIndex,

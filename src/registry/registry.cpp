@@ -50,6 +50,25 @@ int32_t FindFormatByName(std::string_view fileName, int32_t parameter) {
   return FindPluginFormat(fileName, parameter);
 }
 
+namespace {
+
+// The row of a name, unless it cannot do it and has another extension, and a plug-in has the
+// name's.
+int32_t FindWhoCan(std::string_view fileName, bool (*can)(const FormatEntry& row)) {
+  const int32_t named = FindFormatByName(fileName);
+  if (named == kNoFormat || named == kSpareRow || can(FormatRow(named)) ||
+      EqualIgnoringCase(FormatRow(named).extension, platform::ExtensionOf(fileName)))
+    return named;
+  const int32_t plugin = FindPluginFormat(fileName);
+  return plugin != kNoFormat && can(FormatRow(plugin)) ? plugin : named;
+}
+
+}  // namespace
+
+int32_t FindReaderByName(std::string_view fileName) { return FindWhoCan(fileName, CanRead); }
+
+int32_t FindWriterByName(std::string_view fileName) { return FindWhoCan(fileName, CanWrite); }
+
 void LetPluginsOverrideFormats(bool on) { pluginsOverride = on; }
 
 void InstallPluginSource(const PluginSource* source) { pluginSource = source; }
@@ -60,6 +79,10 @@ int32_t FindPluginFormat(std::string_view fileName, int32_t parameter) {
 
 std::vector<PluginFormatFacts> PluginFormats() {
   return pluginSource == nullptr ? std::vector<PluginFormatFacts>{} : pluginSource->list();
+}
+
+std::vector<PluginLibrary> LibrariesOfPlugins() {
+  return pluginSource == nullptr ? std::vector<PluginLibrary>{} : pluginSource->libraries();
 }
 
 std::string PluginDescription(const PluginFormatFacts& format) {

@@ -24,6 +24,11 @@ int32_t EnabledByDefault(int32_t index);
 // ignoring case; spare rows are skipped, as are disabled ones if plug-ins
 // override them. If no row matches, plug-ins are searched.
 int32_t FindFormatByName(std::string_view fileName, int32_t parameter = 0);
+// The rows that read and write a file of that name: as FindFormatByName, but a row that shares only
+// the name's first three characters and cannot do it here leaves it to a plug-in that has the whole
+// extension. "x.avif" names the row of AVI.
+int32_t FindReaderByName(std::string_view fileName);
+int32_t FindWriterByName(std::string_view fileName);
 // `AllowPluginFormatOverride`: plug-ins may handle
 // the extensions of disabled rows. Off by default.
 void LetPluginsOverrideFormats(bool on);
@@ -35,17 +40,24 @@ struct PluginFormatFacts {
   uint32_t maxBits = 0;   // maximum bits per pixel it can write
   bool canWrite = false;
 };
+// A library that a module uses.
+struct PluginLibrary {
+  std::string name, version;
+};
 // The plug-in loader's callbacks; installed once.
 struct PluginSource {
   // Binds the plug-in format for a file's extension to this thread's spare row: index or kNoFormat.
   int32_t (*bind)(std::string_view fileName, int32_t parameter);
   // The formats of all modules, sorted.
   std::vector<PluginFormatFacts> (*list)();
+  // The libraries of all modules.
+  std::vector<PluginLibrary> (*libraries)();
 };
 void InstallPluginSource(const PluginSource* source);  // not owned; null removes it
 // The plug-in fallback of FindFormatByName.
 int32_t FindPluginFormat(std::string_view fileName, int32_t parameter = 0);
 std::vector<PluginFormatFacts> PluginFormats();  // from the installed source; empty without one
+std::vector<PluginLibrary> LibrariesOfPlugins();  // as above
 // A plug-in format's name in lists: "(EXT) Plugin", followed by a blank and the module's text if it
 // has one.
 std::string PluginDescription(const PluginFormatFacts& format);

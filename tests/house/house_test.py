@@ -37,8 +37,9 @@ FLOORS = [
 FLOOR = {room: floor for floor, rooms in enumerate(FLOORS) for room in rooms}
 
 # System headers and macros are allowed only in a system's own folder. Files are accessed through
-# src/platform. The plug-in authors' header is standalone, so it may check the system.
-SYSTEM_HEADERS = {"src/plugins/fotomill_plugin.h"}
+# src/platform. The plug-in authors' headers are standalone, so they may check the system, and
+# modules may include nothing else of the program.
+SYSTEM_HEADERS = {"src/plugins/fotomill_plugin.h", "src/plugins/fotomill_plugin_kit.h"}
 SYSTEM_FOLDERS = {"src/platform/posix", "src/platform/windows"}
 SYSTEM_HEADER = re.compile(
     r"(sys|linux|net|netinet|arpa|asm)/.*|(unistd|fcntl|dirent|dlfcn|pthread|poll|pwd|grp|termios|"
@@ -78,7 +79,7 @@ def room_of(path):
 def include_breaches(path, line):
     """Violations in one include line of the file src/`path`."""
     match = INCLUDE.match(line)
-    if not match:
+    if not match or f"src/{path}" in SYSTEM_HEADERS:
         return
     quoted, target = match.group(1) == '"', match.group(2)
     own, other = room_of(path), room_of(target)
@@ -145,9 +146,9 @@ def width_breaches(name, lines):
 def breaches(project):
     """All violations in a project as (file, line, message)."""
     includes = {}
-    sources = [path for folder in ("src", "tests", "fuzz", "bench", "samples")
+    sources = [path for folder in ("src", "tests", "fuzz", "bench", "samples", "plugins")
                for path in sorted((project / folder).rglob("*"))
-               if path.suffix in {".cpp", ".h", ".def", ".py", ".sh"}]
+               if path.suffix in {".cpp", ".c", ".h", ".def", ".py", ".sh"}]
     if not sources:
         yield str(project), 1, "has no sources"
     for source in sources:
@@ -159,6 +160,11 @@ def breaches(project):
         if len(lines) > LONGEST_FILE:
             yield name, len(lines), f"longer than {LONGEST_FILE} lines"
         yield from width_breaches(name, lines)
+        if name.startswith("plugins/"):
+            for number, line in enumerate(lines, 1):
+                match = INCLUDE.match(line)
+                if match and match.group(1) == '"' and "/" in match.group(2):
+                    yield name, number, f"a module may not include {match.group(2)}"
         if not name.startswith("src/"):
             continue
         path = name[len("src/"):]
@@ -215,6 +221,8 @@ EXAMPLES = [
      '  .help = "' + 91 * "." + '",\n    {"' + 91 * "." + '"},\n', None),
     ("tests/wide.py", '"""' + 98 * "." + "\n" + '"""', "wider than"),
     ("src/core/common.h", "", "is a drawer"),
+    ("plugins/qoi/qoi.cpp", '#include "fotomill_plugin.h"\n#include "core/text.h"\n',
+     "a module may not include core/text.h"),
     ("src/attic/box.cpp", "", "no room"),
     ("src/desktop/models/list.cpp", "#include <wx/string.h>\n",
      "a model may not include wx/string.h"),

@@ -1,16 +1,15 @@
 #include "platform/work_apart.h"
 
 #include <gtest/gtest.h>
-#include <sys/wait.h>
 
 #include <algorithm>
-#include <cerrno>
 #include <string>
 #include <string_view>
 #include <vector>
 
 #include "platform/clock.h"
 #include "platform/files.h"
+#include "support/child.h"
 #include "support/faults.h"
 #include "support/files.h"
 
@@ -21,9 +20,6 @@ namespace {
 std::span<const uint8_t> Bytes(std::string_view text) {
   return {reinterpret_cast<const uint8_t*>(text.data()), text.size()};
 }
-
-// Whether this process has children, running or not yet reaped.
-bool HasChildren() { return waitpid(-1, nullptr, WNOHANG) >= 0 || errno != ECHILD; }
 
 TEST(WorkApart, ReturnsItsReplyAndStaysForTheNextTask) {
   std::vector<int32_t> processes;
@@ -40,9 +36,9 @@ TEST(WorkApart, ReturnsItsReplyAndStaysForTheNextTask) {
     processes.push_back(told[0]);
   }
   EXPECT_EQ(processes[0], processes[1]);
-  EXPECT_TRUE(HasChildren());
+  EXPECT_TRUE(test::HasChildren());
   EndIdleProcesses();
-  EXPECT_FALSE(HasChildren());
+  EXPECT_FALSE(test::HasChildren());
 }
 
 TEST(WorkApart, ReportsItsResult) {
@@ -72,7 +68,7 @@ TEST(WorkApart, ReportsItsResult) {
   }
   EXPECT_EQ(FactsOf(path).size, 0u);
   EndIdleProcesses();
-  EXPECT_FALSE(HasChildren());
+  EXPECT_FALSE(test::HasChildren());
 }
 
 TEST(WorkApart, EndsWhenCanceled) {
@@ -84,7 +80,7 @@ TEST(WorkApart, EndsWhenCanceled) {
                          }};
   EXPECT_EQ(RunApart(order, [](int32_t) {}), ApartResult::Stopped);
   EXPECT_LT(MonotonicSeconds(), begun + 1);
-  EXPECT_FALSE(HasChildren());
+  EXPECT_FALSE(test::HasChildren());
 }
 
 TEST(WorkApart, FailsToStartWithoutResources) {

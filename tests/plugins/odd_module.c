@@ -6,8 +6,13 @@
 #include <stdio.h>
 #include <stdlib.h>
 #include <string.h>
+#include <unistd.h>
 
 #include "fotomill_plugin.h"
+
+#if defined(GUEST_EXITS) || defined(GUEST_CRASHES)
+#define IN_PROGRAM
+#endif
 
 FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, int32_t zero) {
   (void)zero;
@@ -19,7 +24,11 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, i
   strcpy(params->extensions, "odd");
   params->flags1 = 24;
   params->flags2 = FMW_FORMAT_BITMAP;
-#if defined(ALL_FLAGS)
+#if defined(IN_PROGRAM)
+  params->flags2 |= FMW_FORMAT_IN_PROGRAM;
+#elif defined(METADATA)
+  params->flags2 |= FMW_FORMAT_MULTI | FMW_FORMAT_FRAMES | FMW_FORMAT_EXIF | FMW_FORMAT_ICC;
+#elif defined(ALL_FLAGS)
   params->flags1 = params->flags2 = 0xffffffff;
 #elif defined(GAPS_IN_LIST)
   strcpy(params->extensions, "abc;;def");
@@ -78,10 +87,22 @@ FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* 
                                                  const FMW_HOST_SERVICES* services) {
   static const uint8_t rowBytes[] = {255, 0, 0, 0, 0, 255, 0, 0};
   uint8_t* block = calloc(1, 48);
-#if defined(EXITS)
+#if defined(EXITS) || defined(GUEST_EXITS)
   if (strstr(fileName, "last") != 0) exit(0);
-#elif defined(CRASHES)
+#elif defined(CRASHES) || defined(GUEST_CRASHES)
   if (strstr(fileName, "last") != 0) raise(SIGSEGV);
+#elif defined(HANGS)
+  while (strstr(fileName, "last") != 0) pause();
+#elif defined(SPINS)
+  for (volatile int spun = 0; strstr(fileName, "last") != 0;) ++spun;
+#elif defined(EATS)
+  for (void* meal = block; strstr(fileName, "last") != 0;) {
+    meal = malloc(100000000);
+    memset(meal, 1, 100000000);
+  }
+#elif defined(LARGER)
+  free(block);
+  block = calloc(1, 40 + 900 * 900 * 4);
 #endif
   (void)fileName;
   (void)error;
@@ -101,7 +122,10 @@ FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* 
   block[12] = 1;
   block[14] = 24;
   memcpy(block + 40, rowBytes, 8);
-#if defined(SMALL_BLOCK)
+#if defined(LARGER) /* 900 x 900, and not 2 x 1 as said */
+  block[4] = block[8] = 900 & 255;
+  block[5] = block[9] = 900 >> 8;
+#elif defined(SMALL_BLOCK)
   block[6] = 1; /* 65538 pixels wide, in 48 bytes */
 #elif defined(WRONG_DEPTH)
   block[14] = 7;
@@ -111,6 +135,90 @@ FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* 
 #endif
   return block;
 }
+
+#if defined(METADATA)
+static const FMW_OPTION options[] = {
+    {"Level", "Level, 1 to 9", FMW_OPTION_NUMBER, 1, 9, 5, 0},
+    {"Kind", "Kind", FMW_OPTION_CHOICE, 0, 0, 7, "small;large"},
+};
+FMW_EXPORT const FMW_OPTION* FMW_CALL PLUGIN12GetOptions(int32_t* count) {
+  *count = 2;
+  return options;
+}
+FMW_EXPORT const char* FMW_CALL PLUGIN12GetLibraries(void) { return "libodd\t1.2\tMIT"; }
+
+static FMW_BLOCK Block(const char* text, uint64_t claimed) {
+  FMW_BLOCK block = {strdup(text), claimed};
+  return block;
+}
+
+/* Three frames; the profile is said to be larger than it is. */
+FMW_EXPORT int32_t FMW_CALL PLUGIN12GetMetadata(FMW_METADATA* metadata, const char* fileName,
+                                                const FMW_READ_REQUEST* request, int32_t* error,
+                                                const FMW_HOST_SERVICES* services) {
+  const int32_t delays[] = {100, -5, 300};
+  (void)fileName;
+  (void)error;
+  (void)services;
+  metadata->pages = 3;
+  metadata->rounds = 2;
+  metadata->lost = FMW_LOST_DEPTH | 0x80;
+  metadata->exif = Block("exif", 4);
+  metadata->xmp = Block("xmp", 3);
+  metadata->icc = Block("icc", 1000000000000);
+  metadata->delays.data = malloc(sizeof delays);
+  memcpy(metadata->delays.data, delays, sizeof delays);
+  metadata->delays.size = sizeof delays;
+  return request->size == (int32_t)sizeof *request;
+}
+
+/* One pixel: page, wanted side and first option. */
+FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN12ReadImage(const char* fileName,
+                                                 const FMW_READ_REQUEST* request, int32_t* error,
+                                                 const FMW_HOST_SERVICES* services) {
+  uint8_t* block = request->allocate(44);
+  (void)fileName;
+  (void)error;
+  (void)services;
+  memset(block, 0, 44);
+  block[0] = 40;
+  block[4] = block[8] = block[12] = 1;
+  block[14] = 24;
+  block[40] = (uint8_t)request->page;
+  block[41] = (uint8_t)request->wantedSide;
+  block[42] = (uint8_t)request->options[0];
+  return block;
+}
+
+/* Writes what it was given as text. */
+FMW_EXPORT int32_t FMW_CALL PLUGIN12WriteImage(const char* fileName, FMW_HANDLE bitmap,
+                                               const FMW_WRITE_REQUEST* request, int32_t* error,
+                                               const FMW_HOST_SERVICES* services) {
+  FILE* file = fopen(fileName, "wb");
+  (void)bitmap;
+  (void)error;
+  (void)services;
+  if (file == 0) return 0;
+  fprintf(file, "quality %d lossless %d options %d %d exif %.*s xmp %.*s icc %.*s comment %s",
+          request->quality, request->lossless, request->options[0], request->options[1],
+          (int)request->exif.size, (const char*)request->exif.data, (int)request->xmp.size,
+          (const char*)request->xmp.data, (int)request->icc.size, (const char*)request->icc.data,
+          request->comment == 0 ? "none" : request->comment);
+  fclose(file);
+  return 1;
+}
+
+FMW_EXPORT int32_t FMW_CALL PLUGIN12Transcode(const char* source, const char* destination,
+                                              int32_t* error, const FMW_HOST_SERVICES* services) {
+  FILE* file = fopen(destination, "wb");
+  (void)services;
+  if (file == 0) return 0;
+  fprintf(file, "from %s", strrchr(source, '/') + 1);
+  fclose(file);
+  *error = FMW_ERROR_FORMAT;
+  return strstr(source, "good") != 0;
+}
+#endif
 
 #if defined(EXITS_AT_ONCE)
 __attribute__((constructor)) static void Leave(void) { exit(0); }

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 
@@ -7,12 +8,16 @@
 #include "platform/fault.h"
 #include "platform/paths.h"
 #include "platform/process.h"
+#include "platform/work_apart.h"
+#include "plugins/bad_modules.h"
+#include "plugins/module_apart.h"
 #include "plugins/plugin_bridge.h"
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
 #include "settings/configuration.h"
 #include "settings/plugin_settings.h"
 #include "settings/settings.h"
+#include "support/child.h"
 #include "support/files.h"
 #include "support/scoped_settings.h"
 #include "texts/status_text.h"
@@ -28,6 +33,8 @@ class Plugins : public testing::Test {
   ~Plugins() override {
     InstallPluginSource(nullptr);
     UnloadPlugins();
+    RunModulesApart(true);
+    moduleLimits = {};
   }
   test::TemporaryFolder folder_;
   test::ScopedSettings settings_;
@@ -115,13 +122,137 @@ TEST_F(Plugins, ValidatesWhatModulesReturn) {
   };
   const std::string file = folder_.Path("x.odd");
   test::WriteText(file, "anything");
-  for (const Row& row : rows) {
-    SCOPED_TRACE(row.module);
-    EnablePlugins(OddFolder(row.module));
-    PicturePointer picture;
-    EXPECT_EQ(LoadPicture({.fileName = file}, picture), row.status);
-    EXPECT_EQ(picture != nullptr, row.status == Status::Ok);
+  for (const bool apart : {true, false}) {
+    RunModulesApart(apart);
+    for (const Row& row : rows) {
+      SCOPED_TRACE(row.module);
+      EnablePlugins(OddFolder(row.module));
+      PicturePointer picture;
+      EXPECT_EQ(LoadPicture({.fileName = file}, picture), row.status);
+      EXPECT_EQ(picture != nullptr, row.status == Status::Ok);
+    }
   }
+}
+
+// Neither the program nor the other files notice.
+TEST_F(Plugins, AModuleThatCrashesOrHangsCostsOneFile) {
+  for (const char* name : {"first.odd", "last.odd"}) test::WriteText(folder_.Path(name), "");
+  moduleLimits.readSeconds = 1;
+  moduleLimits.patience = 2;
+  moduleLimits.memory = uint64_t{400} << 20;
+  for (const char* module : {"CRASHES", "EXITS", "HANGS", "SPINS", "EATS"}) {
+    SCOPED_TRACE(module);
+    EnablePlugins(OddFolder(module));
+    PicturePointer picture;
+    EXPECT_EQ(LoadPicture({.fileName = folder_.Path("last.odd")}, picture), Status::DamagedFile);
+    EXPECT_EQ(picture, nullptr);
+    EXPECT_EQ(LoadPicture({.fileName = folder_.Path("first.odd")}, picture), Status::Ok);
+  }
+  EnablePlugins(OddFolder("LARGER"));
+  PicturePointer picture;
+  EXPECT_EQ(LoadPicture({.fileName = folder_.Path("last.odd")}, picture), Status::DamagedFile);
+  platform::EndIdleProcesses();
+  EXPECT_FALSE(test::HasChildren());
+}
+
+TEST_F(Plugins, AModuleThatCrashesWhenLoadedIsNotAskedAgain) {
+  SetDataFolder(folder_.Path());
+  const std::string module = OddFolder("EXITS_AT_ONCE") + "/FMWPL_odd.so";
+  EXPECT_EQ(ScanPlugins(OddFolder("EXITS_AT_ONCE")), 0);
+  EXPECT_EQ(WhyNotLoaded(module), "it crashed when it was loaded");
+  EXPECT_TRUE(IsBadModule(module));
+  EXPECT_TRUE(ForgiveModule("FMWPL_odd.so"));
+  EXPECT_FALSE(IsBadModule(module));
+  SetDataFolder({});
+}
+
+TEST_F(Plugins, StoppingEndsTheCall) {
+  test::WriteText(folder_.Path("last.odd"), "");
+  EnablePlugins(OddFolder("HANGS"));
+  PicturePointer picture;
+  ASSERT_EQ(LoadPictureInfo({.fileName = folder_.Path("last.odd")}, picture), Status::Ok);
+  StopSource source;
+  source.Stop();
+  EXPECT_EQ(ReadPicture({.fileName = folder_.Path("last.odd"), .stop = source.Token()}, *picture),
+            Status::FunctionCancelled);
+}
+
+TEST_F(Plugins, FactsAreKeptUntilTheModuleChanges) {
+  SetDataFolder(folder_.Path());
+  test::TemporaryFolder modules;
+  const std::string copy = modules.Path("FMWPL_odd.so");
+  std::filesystem::copy_file(OddFolder("METADATA") + "/FMWPL_odd.so", copy);
+  ASSERT_EQ(ScanPlugins(modules.Path(), PluginScan::Cached), 1);
+  const std::string kept = test::ReadText(folder_.Path("PluginFacts.txt"));
+  EXPECT_NE(kept.find("option=Kind|2|0|0|1|Kind|small|large\n"), std::string::npos) << kept;
+  // what is kept is used
+  std::string changed = kept;
+  changed.replace(changed.find("extensions=odd"), 14, "extensions=new");
+  test::WriteText(folder_.Path("PluginFacts.txt"), changed);
+  ASSERT_EQ(ScanPlugins(modules.Path(), PluginScan::Cached), 1);
+  EXPECT_EQ(PluginRow(0).extension.view(), "new");
+  EXPECT_EQ(PluginFacts(0).libraries, "libodd\t1.2\tMIT");
+  std::filesystem::last_write_time(copy, std::filesystem::file_time_type::clock::now());
+  ASSERT_EQ(ScanPlugins(modules.Path(), PluginScan::Cached), 1);
+  EXPECT_EQ(PluginRow(0).extension.view(), "odd");
+  for (const char* damaged : {"", "Plug-in facts 1\n[", "Plug-in facts 1\n[x]\nflags1=x\n"}) {
+    test::WriteText(folder_.Path("PluginFacts.txt"), damaged);
+    EXPECT_EQ(ScanPlugins(modules.Path(), PluginScan::Cached), 1);
+  }
+  SetDataFolder({});
+}
+
+TEST_F(Plugins, TheNewerInterfaceCarriesMetadataPagesAndOptions) {
+  test::WriteText(folder_.Path("x.odd"), "");
+  SetModuleOptions({{"FMWPL_odd.so.Level", 12}});
+  for (const bool apart : {true, false}) {
+    SCOPED_TRACE(apart);
+    RunModulesApart(apart);
+    EnablePlugins(OddFolder("METADATA"));
+    PicturePointer picture;
+    ASSERT_EQ(
+        LoadPicture({.fileName = folder_.Path("x.odd"), .page = 2, .thumbnailSide = 60}, picture),
+        Status::Ok);
+    const auto text = [](const std::vector<uint8_t>& bytes) {
+      return std::string(bytes.begin(), bytes.end());
+    };
+    EXPECT_EQ(picture->pageCount, 3);
+    EXPECT_EQ(text(picture->metadata.exif), "exif");
+    EXPECT_EQ(text(picture->metadata.xmp), "xmp");
+    EXPECT_EQ(text(picture->metadata.icc).substr(0, 4), std::string("icc\0", 4));
+    EXPECT_LT(picture->metadata.icc.size(), 100u) << "the module claims more than there is";
+    EXPECT_EQ(picture->unread, kUnreadDepth);
+    EXPECT_EQ(picture->image.PixelAt(0, 0), 9 << 16 | 120 << 8 | 2);
+    picture->metadata.icc = {'p'};
+    WriteOptions options;
+    options.encode.SetQuality(33);
+    ASSERT_EQ(WritePicture(*picture, folder_.Path("y.odd"), options), Status::Ok);
+    EXPECT_EQ(test::ReadText(folder_.Path("y.odd")),
+              "quality 33 lossless 0 options 9 1 exif exif xmp xmp icc p comment none");
+    EXPECT_EQ(picture->lostMetadata, kAllMetadata & ~(kLostExif | kLostMakerNote | kLostIcc));
+    options.keepMetadata = false;
+    ASSERT_EQ(WritePicture(*picture, folder_.Path("y.odd"), options), Status::Ok);
+    EXPECT_EQ(test::ReadText(folder_.Path("y.odd")),
+              "quality 33 lossless 0 options 9 1 exif  xmp  icc p comment none");
+    AnimationPointer animation;
+    ASSERT_EQ(OpenAnimation({.fileName = folder_.Path("x.odd")}, animation), Status::Ok);
+    EXPECT_EQ(animation->Delays(), (std::vector<int32_t>{100, 0, 300}));
+    EXPECT_EQ(animation->Rounds(), 2);
+    for (int32_t frame = 0; frame < 3; ++frame) {
+      ASSERT_EQ(animation->Next(), Status::Ok);
+      EXPECT_EQ(animation->Frame().image.PixelAt(0, 0) & 255, frame);
+      EXPECT_EQ(animation->Frame().alpha.PixelAt(0, 0), 255);
+    }
+    EXPECT_EQ(animation->Next(), Status::NoImages);
+  }
+  SetModuleOptions({});
+}
+
+TEST_F(Plugins, AModuleMayAskToRunInTheProgram) {
+  ASSERT_EQ(ScanPlugins(OddFolder("IN_PROGRAM")), 1);
+  EXPECT_NE(PluginRow(0).module, nullptr);
+  ASSERT_EQ(ScanPlugins(OddFolder("COMMENTS")), 1);
+  EXPECT_EQ(PluginRow(0).module, nullptr);
 }
 
 TEST_F(Plugins, AFailedWriteLeavesTheDestinationAlone) {
@@ -195,6 +326,9 @@ TEST_F(Plugins, InfoIncludesComments) {
   PicturePointer picture;
   ASSERT_EQ(LoadPictureInfo({.fileName = file}, picture), Status::Ok);
   EXPECT_EQ(std::string(picture->comment.begin(), picture->comment.end()), "said by the module");
+  RunModulesApart(false);
+  EnablePlugins(OddFolder("COMMENTS"));
+  ASSERT_EQ(LoadPictureInfo({.fileName = file}, picture), Status::Ok);
   bool withoutComment = false;
   for (int64_t n = 1; n < 100; ++n) {
     platform::faultCountdown = n;
@@ -330,9 +464,12 @@ TEST_F(Plugins, WrongExtensionsAreOpenedByContents) {
 TEST_F(Plugins, ListsShowPluginFormatsLast) {
   EnablePlugins(SAMPLE_MODULES);
   const auto filter = OpenFileFilter();
-  EXPECT_EQ(filter.back().description, "(PPM) Plugin Portable anymap");
-  EXPECT_EQ(filter.back().patterns, "*.PPM");
-  EXPECT_EQ(DestinationExtensions().back(), "ppm");
+  const auto last = std::ranges::find(filter, "*.PPM", &FilterPair::patterns);
+  ASSERT_NE(last, filter.end());
+  EXPECT_EQ(last->description, "(PPM) Plugin Portable anymap");
+  EXPECT_GT(last, std::ranges::find(filter, "*.ZIP", &FilterPair::patterns));
+  const auto extensions = DestinationExtensions();
+  EXPECT_GT(std::ranges::find(extensions, "ppm"), std::ranges::find(extensions, "xbm"));
   EXPECT_EQ(FindFormatByName("x.Pgm"), kSpareRow);
   EXPECT_EQ(FormatRow(kSpareRow).extension.view(), "pgm");
   EXPECT_EQ(FindFormatByName("x.ppm"), kSpareRow);

@@ -76,7 +76,8 @@ TEST(FindFormat, PlugInsAreSearchedAndListedLast) {
                                  [] {
                                    return std::vector<PluginFormatFacts>{
                                        {"HEIC", "", 24, false}, {"QOI", "Quite OK", 24, true}};
-                                 }};
+                                 },
+                                 [] { return std::vector<PluginLibrary>(); }};
   InstallPluginSource(&kSource);
   EXPECT_EQ(FindFormatByName("x.heic", 5), kSpareRow);
   EXPECT_EQ(FindFormatByName("x.heic", 4), kNoFormat);

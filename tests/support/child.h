@@ -3,6 +3,8 @@
 #include <sys/wait.h>
 #include <unistd.h>
 
+#include <cerrno>
+
 namespace fotomill::test {
 
 // Runs `body` in a child process and returns its wait status: exit
@@ -19,5 +21,8 @@ int InChild(Body body) noexcept {
   waitpid(child, &status, 0);
   return status;
 }
+
+// Whether this process has children, running or not yet reaped.
+inline bool HasChildren() { return waitpid(-1, nullptr, WNOHANG) >= 0 || errno != ECHILD; }
 
 }  // namespace fotomill::test

@@ -10,7 +10,7 @@
 #include <vector>
 
 #include "platform/work_apart.h"
-#include "registry/child_tasks.h"
+#include "plugins/child_tasks.h"
 
 namespace {
 

@@ -9,6 +9,7 @@
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "core/data_folder.h"
+#include "core/limits.h"
 #include "core/shown_text.h"
 #include "core/text.h"
 #include "core/utf8.h"
@@ -77,6 +78,23 @@ bool IsRegistered(const std::string& path) {
   return false;
 }
 
+// Modules that the build has left out for lack of a library: a file with a line NAME tab LIBRARIES
+// each, beside the modules.
+void ReportLeftOut(ResultOutput& output, const std::string& folder) {
+  std::string text;
+  if (platform::ReadWholeFile(platform::JoinFolder(folder, "left-out.txt"), limits.listFileBytes,
+                              text) != platform::ReadResult::Done)
+    return;
+  for (std::string_view rest = text; !rest.empty();) {
+    const std::string_view line = rest.substr(0, rest.find('\n'));
+    rest.remove_prefix(std::min(line.size() + 1, rest.size()));
+    const size_t tab = line.find('\t');
+    if (tab == std::string_view::npos) continue;
+    Report(output, "  " + EscapeControls(line.substr(0, tab)),
+           Tr("left out of this build: %1 not found", line.substr(tab + 1)));
+  }
+}
+
 // Lists the formats of each module, and modules without formats.
 void ReportPlugins(ResultOutput& output, bool enabled) {
   for (const std::string& folder : PluginFolders()) {
@@ -92,6 +110,7 @@ void ReportPlugins(ResultOutput& output, bool enabled) {
   }
   for (const auto& [path, list] : formats)
     Report(output, "  " + EscapeControls(platform::FileNameOf(path)), list);
+  for (const std::string& folder : PluginFolders()) ReportLeftOut(output, folder);
   for (const PluginModule& module : PluginModules()) {
     const std::string path = platform::JoinFolder(module.folder, module.name);
     if (!module.on) {

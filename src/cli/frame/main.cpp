@@ -7,7 +7,7 @@
 #include "platform/memory.h"
 #include "platform/process.h"
 #include "platform/work_apart.h"
-#include "registry/child_tasks.h"
+#include "plugins/child_tasks.h"
 #include "texts/texts.h"
 
 int main(int count, char** arguments) {

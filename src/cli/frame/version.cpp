@@ -2,6 +2,7 @@
 
 #include "cli/frame/libraries.h"
 #include "cli/frame/result_output.h"
+#include "plugins/plugin_table.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
@@ -51,6 +52,7 @@ std::string LicensesPage() {
 }  // namespace
 
 std::string VersionPage(const VersionOptions& options) {
+  EnablePlugins();  // they use libraries, too
   if (options.json) return JsonPage();
   std::string page = std::string(kProgramName) + " " + kProgramVersion + "\n";
   if (options.licenses) return page + Tr(kLicenseNote) + "\n" + LicensesPage();

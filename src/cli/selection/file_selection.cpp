@@ -137,7 +137,7 @@ class Selector {
   }
 
   void AddFile(const std::string& path, const std::string& below, bool hidden) {
-    if (!IsPicture(FindFormatByName(path))) {
+    if (!IsPicture(FindReaderByName(path))) {
       if (!hidden) leftOut_.Add(path);
     } else if (hidden) {
       leftOut_.AddHidden();

@@ -37,7 +37,7 @@ std::optional<size_t> ReadPiece(const Io& io, std::span<uint8_t> buffer) {
 // The extension of the most likely format that can be read; empty if none.
 std::string ExtensionOfContents(std::span<const uint8_t> head) {
   for (const std::string_view extension : IdentifySignature(head).extensions) {
-    const int32_t row = FindFormatByName("x." + std::string(extension));
+    const int32_t row = FindReaderByName("x." + std::string(extension));
     if (row != kNoFormat && CanRead(FormatRow(row))) return LowerCase(extension);
   }
   return {};

@@ -18,6 +18,10 @@ void UnlockModuleBlock(void*) {}
 
 void FreeModuleBlock(void* handle) { std::free(handle); }
 
+void* NewModuleMemory(uint64_t bytes) {
+  return FaultDue() || bytes > SIZE_MAX / 2 ? nullptr : std::malloc(static_cast<size_t>(bytes) + 1);
+}
+
 void* NewModuleBlock(std::span<const uint8_t> bytes) {
   void* block = FaultDue() ? nullptr : std::malloc(bytes.size() + 1);
   if (block != nullptr) std::memcpy(block, bytes.data(), bytes.size());

@@ -28,7 +28,8 @@
 #include "platform/posix/handle.h"
 #include "platform/process.h"
 
-// A worker process is this program started with the argument kServe and its parent's process id.
+// A worker process is this program started with the argument kServe, its parent's process id and
+// its kind.
 // Requests arrive on a socket, its only connection: an OrderHead, the request, and the handles of
 // input and reply. It answers with Words, the last of which carries the result. It exits when the
 // socket is closed.
@@ -44,6 +45,7 @@ constexpr int kSocket = 3;  // in the worker process
 constexpr int kPatienceMs = 100;
 constexpr int kClockFactor = 10;
 constexpr size_t kMostIdle = 16;  // processes
+constexpr rlim_t kMostWritten = rlim_t{4} << 30;  // bytes of a file that a module writes
 
 struct OrderHead {
   std::array<char, 32> task{};
@@ -61,13 +63,15 @@ bool servesItself = false;
 
 // --- in the worker process ---
 
-// No core dumps, no writing to files; ends with its parent.
-bool PrepareProcess(const char* parent) {
+std::string KindText(ApartKind kind) { return std::to_string(static_cast<int>(kind)); }
+
+// No core dumps, no writing to files unless it is a writer; ends with its parent.
+bool PrepareProcess(const char* parent, std::string_view kind) {
   prctl(PR_SET_PDEATHSIG, SIGKILL);
   if (std::to_string(getppid()) != parent) return false;
-  const rlimit none = {0, 0};
+  const rlimit none = {0, 0}, written = {kMostWritten, kMostWritten};
   setrlimit(RLIMIT_CORE, &none);
-  setrlimit(RLIMIT_FSIZE, &none);
+  setrlimit(RLIMIT_FSIZE, kind == KindText(ApartKind::ModuleWriter) ? &written : &none);
   // the parent decides when to stop
   for (const int number : {SIGINT, SIGTERM}) std::signal(number, SIG_IGN);
   return true;
@@ -193,6 +197,7 @@ int Serve(std::span<const ApartTask> tasks) {
 struct Process {
   pid_t id = -1;
   Handle socket;
+  ApartKind kind = ApartKind::Own;
 
   bool Lives() const {
     pollfd state = {socket.Number(), POLLIN, 0};
@@ -211,11 +216,13 @@ struct Process {
 class IdleProcesses {
  public:
   ~IdleProcesses() { EndAll(); }
-  bool Take(Process& process) {
+  // The one that was used last, since it has the most in memory.
+  bool Take(ApartKind kind, Process& process) {
     const std::lock_guard lock(mutex_);
-    while (!idle_.empty()) {
-      process = std::move(idle_.back());
-      idle_.pop_back();
+    for (size_t i = idle_.size(); i-- > 0;) {
+      if (idle_[i].kind != kind) continue;
+      process = std::move(idle_[i]);
+      idle_.erase(idle_.begin() + static_cast<ptrdiff_t>(i));
       if (process.Lives()) return true;
       process.End();
     }
@@ -242,8 +249,9 @@ class IdleProcesses {
 
 IdleProcesses idleProcesses;
 
-bool StartProcess(Process& process) {
+bool StartProcess(ApartKind kind, Process& process) {
   int ends[2];
+  process.kind = kind;
   if (FaultDue() || socketpair(AF_UNIX, SOCK_SEQPACKET | SOCK_CLOEXEC, 0, ends) != 0) return false;
   process.socket.Reset(ends[0]);
   const Handle other(ends[1]);
@@ -258,8 +266,8 @@ bool StartProcess(Process& process) {
   posix_spawn_file_actions_addclosefrom_np(&actions, kSocket + 1);
   posix_spawnattr_setflags(&attributes, POSIX_SPAWN_SETPGROUP);  // Ctrl-C goes to the parent only
   const std::string parent = std::to_string(getpid());
-  std::string name = "fotomill", serve = kServe, number = parent;
-  char* const arguments[] = {name.data(), serve.data(), number.data(), nullptr};
+  std::string name = "fotomill", serve = kServe, number = parent, what = KindText(kind);
+  char* const arguments[] = {name.data(), serve.data(), number.data(), what.data(), nullptr};
   const bool started =
       posix_spawn(&process.id, "/proc/self/exe", &actions, &attributes, arguments, environ) == 0;
   posix_spawn_file_actions_destroy(&actions);
@@ -322,7 +330,9 @@ bool SendOrder(const Process& process, const ApartOrder& order, const Input& inp
 
 ApartResult Await(const Process& process, const ApartOrder& order,
                   const std::function<void(int32_t)>& told) {
-  const double until = MonotonicSeconds() + double{kClockFactor} * order.seconds;
+  const double until =
+      MonotonicSeconds() +
+      (order.patience > 0 ? double{1} * order.patience : double{kClockFactor} * order.seconds);
   while (MonotonicSeconds() < until) {
     if (PendingExit() != 0 || (order.goesOn && !order.goesOn())) return ApartResult::Stopped;
     pollfd state = {process.socket.Number(), POLLIN, 0};
@@ -361,11 +371,11 @@ bool SharedBlock::Allocate(uint64_t size) {
 
 std::optional<int> ServeApart(int count, const char* const* arguments,
                               std::span<const ApartTask> tasks) {
-  if (count != 3 || std::string_view(arguments[1]) != kServe) {
+  if (count != 4 || std::string_view(arguments[1]) != kServe) {
     servesItself = true;
     return std::nullopt;
   }
-  return PrepareProcess(arguments[2]) ? Serve(tasks) : 1;
+  return PrepareProcess(arguments[2], arguments[3]) ? Serve(tasks) : 1;
 }
 
 ApartResult RunApart(const ApartOrder& order, const std::function<void(int32_t)>& told) {
@@ -373,7 +383,8 @@ ApartResult RunApart(const ApartOrder& order, const std::function<void(int32_t)>
   Input input;
   if (!input.Take(order)) return ApartResult::NotStarted;
   Process process;
-  if (!idleProcesses.Take(process) && !StartProcess(process)) return ApartResult::NotStarted;
+  if (!idleProcesses.Take(order.kind, process) && !StartProcess(order.kind, process))
+    return ApartResult::NotStarted;
   const ApartResult result =
       SendOrder(process, order, input) ? Await(process, order, told) : ApartResult::Broken;
   if (result == ApartResult::Done || result == ApartResult::Failed) {

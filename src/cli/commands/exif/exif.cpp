@@ -17,6 +17,7 @@
 #include "platform/files.h"
 #include "platform/held_file.h"
 #include "platform/output_file.h"
+#include "registry/registry.h"
 #include "settings/job_options.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
@@ -85,6 +86,15 @@ Outcome WriteThumbnail(std::span<const uint8_t> bytes, const ExifOptions& option
   return {Status::ErrorWritingFile, ReasonSentence(), path};
 }
 
+// The block of a file of a plug-in format, in `picture`; empty if it has none or has another
+// format.
+std::span<const uint8_t> BlockFromPlugin(const std::string& name, PicturePointer& picture) {
+  if (FindReaderByName(name) != kSpareRow ||
+      LoadPictureInfo({.fileName = name}, picture) != Status::Ok)
+    return {};
+  return picture->metadata.exif;
+}
+
 // Walks the EXIF of a file into `sink` and extracts its thumbnail if requested; `stream` is
 // standard output.
 Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink& sink,
@@ -93,7 +103,8 @@ Outcome WalkFile(const SelectedFile& file, const ExifOptions& options, ExifSink&
   ExifSource source;
   if (const Status status = source.Open(file.name.c_str()); status != Status::Ok)
     return {status, ReasonSentence(), {}};
-  const auto block = source.Block();
+  PicturePointer picture;
+  const auto block = source.Block().empty() ? BlockFromPlugin(file.name, picture) : source.Block();
   ExifFindings findings;
   if (!block.empty() && !WalkExif(block, &sink, &findings)) {
     return {Status::DamagedFile, Tr("The EXIF block has no valid header."), {}};

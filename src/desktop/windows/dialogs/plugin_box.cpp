@@ -113,8 +113,8 @@ void PluginBox::AddModule(const PluginModule& module) {
   for (int32_t row = 0; row < PluginFormatCount(); ++row) {
     const PluginEntry& entry = PluginRow(row);
     if (entry.path.view() != platform::JoinFolder(module.folder, module.name)) continue;
-    std::string can = entry.exports.writeImage != nullptr ? Tr("read and write") : Tr("read");
-    if (entry.exports.configure != nullptr) can.append(", ").append(Tr("settings"));
+    std::string can = PluginFacts(row).writes ? Tr("read and write") : Tr("read");
+    if (PluginFacts(row).hasDialog) can.append(", ").append(Tr("settings"));
     add(row, entry.extension, entry.textA, entry.textB, can);
     loaded = true;
   }

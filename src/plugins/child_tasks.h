@@ -6,7 +6,8 @@
 
 namespace fotomill {
 
-// Tasks that codecs run in child processes, from their rows, without duplicates.
+// All tasks of the program for worker processes: those that codecs name in their rows, the face
+// detector and the plug-in modules.
 std::vector<platform::ApartTask> ChildTasks();
 
 }  // namespace fotomill

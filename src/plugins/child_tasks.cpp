@@ -1,7 +1,8 @@
-#include "registry/child_tasks.h"
+#include "plugins/child_tasks.h"
 
 #include <algorithm>
 
+#include "plugins/module_apart.h"
 #include "processing/faces/face_finder.h"
 #include "registry/format_table.h"
 
@@ -15,7 +16,7 @@ std::vector<platform::ApartTask> ChildTasks() {
         found.push_back(row.childTask);
     }
   }
-  std::vector<platform::ApartTask> tasks = {{kFacesTask, FindFacesApart}};
+  std::vector<platform::ApartTask> tasks = {{kFacesTask, FindFacesApart}, kModuleTask};
   for (const platform::ApartTask* task : found) tasks.push_back(*task);
   return tasks;
 }
