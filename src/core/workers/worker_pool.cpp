@@ -5,6 +5,7 @@
 #include <utility>
 
 #include "core/workers/guarded.h"
+#include "platform/freed_memory.h"
 #include "platform/process.h"
 #include "platform/work_apart.h"
 
@@ -45,8 +46,12 @@ WorkerPool::~WorkerPool() {
 }
 
 WorkerPool& WorkerPool::Shared() {
+  const auto rest = [] {
+    platform::EndIdleProcesses();
+    platform::TrimFreedMemory();
+  };
   static WorkerPool* const pool =
-      std::make_unique<WorkerPool>(platform::CoreCount(), platform::EndIdleProcesses).release();
+      std::make_unique<WorkerPool>(platform::CoreCount(), rest).release();
   return *pool;
 }
 

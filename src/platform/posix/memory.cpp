@@ -4,11 +4,14 @@
 #include <sys/mman.h>
 
 #include <algorithm>
+#include <atomic>
+#include <chrono>
 #include <cstdlib>
 #include <cstring>
 #include <mutex>
 
 #include "platform/fault.h"
+#include "platform/freed_memory.h"
 
 #if defined(__SANITIZE_ADDRESS__)
 #define FOTOMILL_ADDRESS_SANITIZER 1
@@ -32,6 +35,13 @@ constexpr uint64_t kHugePage = uint64_t{2} << 20;
 constexpr uint64_t kSmallUnit = 64 * 1024;  // allocation unit of blocks below two huge pages
 constexpr size_t kPooledBlocks = 16;
 constexpr uint64_t kPooledBytes = uint64_t{512} << 20;
+// If freed memory is returned to the system:
+constexpr uint64_t kReturnedFrom = 256 * 1024;             // size of blocks that malloc maps
+constexpr uint64_t kPooledAtRest = uint64_t{16} << 20;     // left in the pool
+constexpr auto kTrimEvery = std::chrono::milliseconds(500);
+
+std::atomic<bool> returnsMemory{false};
+std::atomic<int64_t> trimmedAt{0};  // in units of kTrimEvery
 
 #ifdef FOTOMILL_ADDRESS_SANITIZER
 // The address sanitizer does not know mapped blocks: their accessible bytes are marked by hand, and
@@ -206,5 +216,23 @@ void KeepFreedMemory() {
 }
 
 void TrimMemoryPool() { ShrinkPool(0); }
+
+void ReturnFreedMemory() {
+  returnsMemory = true;
+#ifdef __GLIBC__
+  mallopt(M_ARENA_MAX, 2);
+  mallopt(M_MMAP_THRESHOLD, static_cast<int>(kReturnedFrom));
+  mallopt(M_TRIM_THRESHOLD, static_cast<int>(kReturnedFrom));
+#endif
+}
+
+void TrimFreedMemory() {
+  const int64_t now = std::chrono::steady_clock::now().time_since_epoch() / kTrimEvery;
+  if (!returnsMemory || trimmedAt.exchange(now) == now) return;
+  ShrinkPool(kPooledAtRest);
+#ifdef __GLIBC__
+  malloc_trim(0);
+#endif
+}
 
 }  // namespace fotomill::platform

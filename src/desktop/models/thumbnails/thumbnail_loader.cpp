@@ -94,6 +94,15 @@ void ThumbnailCache::Put(const ThumbnailRequest& request, ThumbnailPointer thumb
   bytes_ += thumbnail->Bytes();
   entries_.push_front({request, std::move(thumbnail)});
   places_[request.path] = entries_.begin();
+  Shrink();
+}
+
+void ThumbnailCache::SetCapacity(uint64_t capacity) {
+  capacity_ = capacity;
+  Shrink();
+}
+
+void ThumbnailCache::Shrink() {
   while (bytes_ > capacity_ && entries_.size() > 1) {
     bytes_ -= entries_.back().thumbnail->Bytes();
     places_.erase(entries_.back().request.path);

@@ -71,6 +71,9 @@ class ThumbnailCache {
   void Put(const ThumbnailRequest& request, ThumbnailPointer thumbnail);
   // Removes all thumbnails.
   void Clear();
+  // Changes the limit in bytes; may drop the least recently used ones.
+  void SetCapacity(uint64_t capacity);
+  uint64_t Capacity() const { return capacity_; }   // bytes
   uint64_t Bytes() const { return bytes_; }         // of all thumbnails
   size_t Count() const { return entries_.size(); }  // number of thumbnails
 
@@ -79,7 +82,9 @@ class ThumbnailCache {
     ThumbnailRequest request;
     ThumbnailPointer thumbnail;
   };
-  const uint64_t capacity_;
+  void Shrink();
+
+  uint64_t capacity_;
   uint64_t bytes_ = 0;
   std::list<Entry> entries_;  // most recently used first
   std::unordered_map<std::string, std::list<Entry>::iterator> places_;

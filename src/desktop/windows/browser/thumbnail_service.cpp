@@ -1,15 +1,17 @@
 #include "desktop/windows/browser/thumbnail_service.h"
 
+#include <algorithm>
+
 namespace fotomill::desktop {
 
 namespace {
 
-constexpr uint64_t kCacheBytes = 256ull * 1024 * 1024;
+constexpr uint64_t kUsualBytes = 24 * 1024 * 1024;  // about 1,000 thumbnails of 96 pixels
 
 }  // namespace
 
 ThumbnailService::ThumbnailService()
-    : cache_(kCacheBytes), loader_(std::make_unique<ThumbnailLoader>(ThumbnailsAtOnce(), [this] {
+    : cache_(kUsualBytes), loader_(std::make_unique<ThumbnailLoader>(ThumbnailsAtOnce(), [this] {
         CallAfter([this] { FetchResults(); });
       })) {}
 
@@ -38,6 +40,10 @@ void ThumbnailService::WantBoth() {
   std::vector<ThumbnailRequest> requests = ofStrip_;
   requests.insert(requests.end(), ofBrowser_.begin(), ofBrowser_.end());
   loader_->Want(std::move(requests));
+}
+
+void ThumbnailService::MakeRoomFor(uint64_t bytes) {
+  cache_.SetCapacity(std::max(bytes, kUsualBytes));
 }
 
 void ThumbnailService::FetchResults() {

@@ -33,7 +33,9 @@ class ThumbnailService : public wxEvtHandler {
   void SetListener(Listener listener) { listener_ = std::move(listener); }
   void Clear() { cache_.Clear(); }
   size_t Pending() const { return loader_->Pending(); }
-  uint64_t Bytes() const { return cache_.Bytes(); }
+  // Makes room for `bytes` of thumbnails, or for the usual number if that is more.
+  void MakeRoomFor(uint64_t bytes);
+  uint64_t Room() const { return cache_.Capacity(); }  // bytes of thumbnails
 
  private:
   void FetchResults();

@@ -28,6 +28,7 @@
 #include "files/previous_file.h"
 #include "platform/first_start.h"
 #include "platform/folders.h"
+#include "platform/freed_memory.h"
 #include "platform/process.h"
 #include "platform/work_apart.h"
 #include "plugins/child_tasks.h"
@@ -193,6 +194,7 @@ wxIMPLEMENT_APP_NO_MAIN(fotomill::desktop::App);
 int main(int count, char** arguments) {
   using namespace fotomill;
   if (const auto status = platform::ServeApart(count, arguments, ChildTasks())) return *status;
+  platform::ReturnFreedMemory();
   fotomill::desktop::KeepArguments(count, arguments);
   return wxEntry(count, arguments);
 }
