@@ -4,6 +4,7 @@
 #include <cstdio>
 #include <numeric>
 #include <unordered_map>
+#include <unordered_set>
 
 #include "core/choice_lists.h"
 #include "core/natural_order.h"
@@ -66,6 +67,7 @@ void BrowserModel::SetSort(int32_t sortMode, bool descending) {
 
 void BrowserModel::SetFolder(const std::string& folder) {
   folder_ = folder;
+  listed_ = false;
   filter_.clear();
   items_.clear();
   order_.clear();
@@ -94,6 +96,7 @@ void BrowserModel::SetItems(std::vector<FolderItem> items) {
     if (before.modified == items[i].modified && before.size == items[i].size) items[i] = before;
   }
   items_ = std::move(items);
+  listed_ = true;
   SortItems();
   BuildLines(selected, focus, anchor);
   if (focus == kNoLine && focusLine != kNoLine && !lines_.empty()) {
@@ -218,6 +221,17 @@ void BrowserModel::SelectMatching(std::string_view pattern, MatchMode mode) {
     if (matches || mode == MatchMode::Only)
       selection_.Set(line, matches && mode != MatchMode::Remove);
   }
+}
+
+void BrowserModel::SelectNames(const std::vector<std::string>& names) {
+  const std::unordered_set<std::string_view> wanted(names.begin(), names.end());
+  std::vector<bool> selected(lines_.size());
+  size_t first = kNoLine;
+  for (size_t line = 0; line < lines_.size(); ++line) {
+    selected[line] = wanted.contains(Line(line).name);
+    if (selected[line]) first = std::min(first, line);
+  }
+  selection_.Assign(std::move(selected), first, first);
 }
 
 void BrowserModel::SelectSameType() {

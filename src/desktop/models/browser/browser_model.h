@@ -30,6 +30,7 @@ class BrowserModel {
 
   // Changes the folder; empty until listed.
   void SetFolder(const std::string& folder);
+  bool Listed() const { return listed_; }  // the items of the folder were set
   // Sets the folder's items. Items of the same name stay selected and focused. If the focused item
   // is gone, the focus moves to the line in its place. Facts missing in the new items are kept from
   // the old ones.
@@ -72,6 +73,9 @@ class BrowserModel {
   std::vector<std::string> ShownFiles() const;
   // Among the shown lines; an empty pattern matches none.
   void SelectMatching(std::string_view pattern, MatchMode mode);
+  // Selects exactly the lines with these names and focuses the first; if none is shown, nothing is
+  // selected or focused.
+  void SelectNames(const std::vector<std::string>& names);
   void SelectSameType();  // selects only lines with the focused one's format
 
   // "312 files, 4 selected, 18.2 MB"
@@ -87,6 +91,7 @@ class BrowserModel {
   size_t ItemOrNone(size_t line) const { return line < lines_.size() ? lines_[line] : kNoLine; }
 
   std::string folder_;
+  bool listed_ = false;
   FolderView view_;
   std::string filter_;
   std::vector<FolderItem> items_;     // as listed

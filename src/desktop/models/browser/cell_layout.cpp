@@ -91,6 +91,11 @@ size_t CellLayout::Move(size_t line, Step step) const {
   return static_cast<size_t>(last);
 }
 
+bool CellLayout::Shows(size_t line, int64_t scroll) const {
+  const Rect cell = Cell(line);
+  return int64_t{cell.y} + cell.height > scroll && cell.y < scroll + windowHeight_;
+}
+
 int64_t CellLayout::ScrollToShow(size_t line, int64_t scroll) const {
   const Rect cell = Cell(line);
   if (cell.y - gap_ < scroll) return std::clamp<int64_t>(cell.y - gap_, 0, LargestScroll());

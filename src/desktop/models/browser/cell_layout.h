@@ -58,6 +58,8 @@ class CellLayout {
   std::vector<size_t> LinesIn(const Rect& band) const;
   // The line focused after a step; kNoLine counts as before the first line.
   size_t Move(size_t line, Step step) const;
+  // Whether at least a part of a cell is visible at scroll position `scroll`.
+  bool Shows(size_t line, int64_t scroll) const;
   // The scroll position closest to `scroll` at which a cell is fully visible.
   int64_t ScrollToShow(size_t line, int64_t scroll) const;
 

@@ -10,6 +10,8 @@
 #include "platform/paths.h"
 #include "registry/registry.h"
 #include "settings/job_options.h"
+#include "texts/system_reason.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -30,13 +32,27 @@ class FormatFinder {
   std::unordered_map<std::string, int32_t> rows_;
 };
 
+// Call after ListFolder has failed.
+FolderListing NotListed(const std::string& folder) {
+  const std::string unreadable = WithReason(Tr("The folder %1 cannot be read.", folder));
+  switch (platform::FactsOf(folder).kind) {
+    case platform::FileKind::Missing:
+      return {.state = FolderState::Missing, .problem = Tr("There is no folder %1.", folder)};
+    case platform::FileKind::Regular: return {.problem = Tr("%1 is not a folder.", folder)};
+    case platform::FileKind::Folder:
+    case platform::FileKind::Other: break;
+  }
+  return {.problem = unreadable};
+}
+
 }  // namespace
 
 FolderListing ListForBrowser(const std::string& folder, bool facts, const StopToken& stop) {
   FolderListing listing;
   const auto entries = platform::ListFolder(folder);
-  if (!entries) return listing;
-  listing.readable = true;
+  if (!entries) return NotListed(folder);
+  listing.state = FolderState::Listed;
+  listing.chosen = ModesForFolder(folder, listing.chosen);
   FormatFinder formats;
   for (const platform::FolderEntry& entry : *entries) {
     if (stop.Asked()) return listing;

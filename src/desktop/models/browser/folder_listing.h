@@ -5,6 +5,7 @@
 #include <vector>
 
 #include "core/workers/stop_token.h"
+#include "settings/folder_override.h"
 
 namespace fotomill::desktop {
 
@@ -22,10 +23,15 @@ struct FolderItem {
   bool operator==(const FolderItem&) const = default;
 };
 
-// The result of listing a folder; no items if it cannot be read.
+// Whether a folder could be listed. Missing only if it certainly does not exist.
+enum class FolderState { Listed, Missing, Unreadable };
+
+// The result of listing a folder; no items unless Listed.
 struct FolderListing {
-  bool readable = false;
-  std::vector<FolderItem> items;  // unsorted
+  FolderState state = FolderState::Unreadable;
+  std::string problem = {};                   // unless Listed: why not, in sentences
+  BrowserModes chosen = {-1, -1, -1};         // modes that the folder itself asks for; -1: none
+  std::vector<FolderItem> items = {};         // unsorted
 };
 
 // Lists what a browser shows: folders and files of known formats, without hidden ones and thumbnail

@@ -8,10 +8,12 @@
 #include <wx/textdlg.h>
 
 #include <algorithm>
+#include <utility>
 
 #include "core/choice_lists.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/browser/details_list.h"
+#include "desktop/windows/browser/folder_problem.h"
 #include "desktop/windows/browser/path_bar.h"
 #include "desktop/windows/browser/thumbnail_canvas.h"
 #include "desktop/windows/browser/update_bar.h"
@@ -20,6 +22,7 @@
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
@@ -29,6 +32,13 @@ namespace {
 enum View { kThumbnailView, kDetailsView };
 
 constexpr BrowserModes kNoModes{-1, -1, -1};
+constexpr int kPatienceMs = 1000;  // until the page says that it waits for a folder
+
+BrowserModes Chosen(const BrowserModes& chosen, const BrowserModes& otherwise) {
+  const auto either = [](int32_t mode, int32_t other) { return mode >= 0 ? mode : other; };
+  return {either(chosen.thumbnails, otherwise.thumbnails), either(chosen.view, otherwise.view),
+          either(chosen.sort, otherwise.sort)};
+}
 
 }  // namespace
 
@@ -58,10 +68,14 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
   BuildFilter();
   bar->Add(filter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
   BuildViews();
+  problem_ = new FolderProblem(this, [this] { GoUp(); });
+  late_.Bind(wxEVT_TIMER,
+             [this](wxTimerEvent&) { ShowProblem(Tr("Waiting for %1...", model_.Folder())); });
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   sizer->Add(bar, wxSizerFlags().Expand());
   offer_.Bar()->MoveBeforeInTabOrder(views_);
   sizer->Add(offer_.Bar(), wxSizerFlags().Expand());
+  sizer->Add(problem_, wxSizerFlags(1).Expand());
   sizer->Add(views_, wxSizerFlags(1).Expand());
   SetSizer(sizer);
   SetDropTarget(
@@ -123,66 +137,95 @@ void BrowserPage::GoUp() {
 
 void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus) {
   wantedFocus_ = focus;
+  closesIfMissing_ = false;
   if (folder == model_.Folder()) return Reload();
+  wantedNames_.reset();
   watch_.Watch({});
   offer_.Forget();
   model_.SetFolder(folder);
-  UseViewOf(folder);
+  UseView(kNoModes);
   filter_->ChangeValue("");
   path_->ShowFolder(folder);
   canvas_->ScrollTo(0);
+  ShowProblem({});
   ShowView();
   Reload();
   host_.BrowserChanged();
 }
 
-// The last view chosen for the folder, else the default one; settings of the folder itself take
-// precedence and persist.
-void BrowserPage::UseViewOf(const std::string& folder) {
-  override_ = ModesForFolder(folder, kNoModes);
-  const FolderView kept = host_.Views().Find(folder, base_);
+void BrowserPage::Restore(const std::string& folder, const std::string& focus, int64_t scroll) {
+  Open(folder, focus);
+  wantedScroll_ = scroll;
+  closesIfMissing_ = true;
+}
+
+// The last view chosen for the folder, else the default one; modes `chosen` by the folder itself
+// take precedence and persist.
+void BrowserPage::UseView(const BrowserModes& chosen) {
+  override_ = chosen;
+  const FolderView kept = host_.Views().Find(model_.Folder(), base_);
   FolderView view = kept;
-  view.modes = ModesForFolder(folder, kept.modes);
+  view.modes = Chosen(chosen, kept.modes);
   if (view != kept) base_ = view;
   model_.SetView(view);
 }
 
 void BrowserPage::Reload() {
-  TakeChangedOverride();
   reader_.List(model_.Folder(), model_.ItemCount() == 0);
-}
-
-// The user's choices apply until the folder's settings change.
-void BrowserPage::TakeChangedOverride() {
-  if (ModesForFolder(model_.Folder(), kNoModes) == override_) return;
-  UseViewOf(model_.Folder());
-  ShowView();
+  late_.StartOnce(kPatienceMs);
 }
 
 void BrowserPage::ShowListing(FolderListing listing, bool complete) {
+  late_.Stop();
   const size_t count = listing.items.size();
-  const bool readable = listing.readable;
+  const FolderState state = listing.state;
+  if (std::exchange(closesIfMissing_, false) && state == FolderState::Missing)
+    return host_.CloseBrowser(*this);
+  ShowProblem(listing.problem);
+  // The user's choices apply until the folder's own settings change.
+  const bool otherView = state == FolderState::Listed && listing.chosen != override_;
+  if (otherView) UseView(listing.chosen);
   model_.SetItems(std::move(listing.items));
   LogEvent(complete ? "listed" : "names", std::to_string(count) + " " + model_.Folder());
-  if (!wantedFocus_.empty()) {
-    const size_t line = model_.FindLine(wantedFocus_);
-    if (line != kNoLine) model_.Selected().SelectOnly(line);
-  }
-  if (model_.Selected().Focus() == kNoLine && model_.LineCount() > 0)
-    model_.Selected().MoveFocus(0, false, true);
-  ShowLines();
-  if (!ShowsDetails()) {
-    if (wantedScroll_ >= 0) canvas_->ScrollTo(wantedScroll_);
-    if (!wantedFocus_.empty()) canvas_->ShowLine(model_.Selected().Focus());
-  }
+  ShowWanted();
   if (complete) {
     watch_.Watch(model_.Folder());
     StartFacts();
-    if (readable) OfferThumbnails();
+    if (state == FolderState::Listed) OfferThumbnails();
     wantedFocus_.clear();
     wantedScroll_ = -1;
+    wantedNames_.reset();
   }
+  if (otherView) ShowView();
   host_.BrowserChanged();
+}
+
+// Shows the new lines, with the selection, focus and place waited for.
+void BrowserPage::ShowWanted() {
+  Selection& selected = model_.Selected();
+  if (wantedNames_) {
+    model_.SelectNames(*wantedNames_);
+  } else {
+    const size_t line = wantedFocus_.empty() ? kNoLine : model_.FindLine(wantedFocus_);
+    if (line != kNoLine) selected.SelectOnly(line);
+    if (selected.Focus() == kNoLine && model_.LineCount() > 0) selected.MoveFocus(0, false, true);
+  }
+  ShowLines();
+  const bool placed = wantedNames_ || !wantedFocus_.empty() || wantedScroll_ >= 0;
+  if (placed && !ShowsDetails()) canvas_->RestorePlace(wantedScroll_, selected.Focus());
+}
+
+// Shows why the folder cannot be listed instead of its files; empty: its files.
+void BrowserPage::ShowProblem(const std::string& problem) {
+  const bool shown = !problem.empty();
+  if (shown) LogEvent("folder-problem", problem);
+  const bool hadFocus = shown ? canvas_->HasFocus() : problem_->HasButtonFocus();
+  problem_->ShowText(Shown(problem));
+  if (problem_->IsShown() == shown) return;
+  problem_->Show(shown);
+  views_->Show(!shown);
+  Layout();
+  if (hadFocus) FocusList();
 }
 
 void BrowserPage::OfferThumbnails() {
@@ -318,6 +361,12 @@ void BrowserPage::FocusName(const std::string& name) {
   SelectionChanged();
 }
 
+void BrowserPage::SelectWhenListed(std::vector<std::string> names) {
+  wantedNames_ = std::move(names);
+  model_.SelectNames({});
+  SelectionChanged();
+}
+
 void BrowserPage::EditFocusedName() {
   const size_t focus = model_.Selected().Focus();
   if (focus == kNoLine) return;
@@ -366,7 +415,9 @@ void BrowserPage::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& res
 }
 
 void BrowserPage::FocusList() {
-  if (ShowsDetails()) {
+  if (problem_->IsShown()) {
+    problem_->FocusButton();
+  } else if (ShowsDetails()) {
     details_->SetFocus();
   } else {
     canvas_->SetFocus();
@@ -377,6 +428,9 @@ size_t BrowserPage::MissingThumbnails() const {
   return ShowsDetails() ? 0 : canvas_->MissingThumbnails();
 }
 int64_t BrowserPage::Scroll() const { return canvas_->Scroll(); }
+bool BrowserPage::FocusInSight() const {
+  return ShowsDetails() || canvas_->InSight(model_.Selected().Focus());
+}
 
 void BrowserPage::Activate(size_t line) {
   const FolderItem& item = model_.Line(line);

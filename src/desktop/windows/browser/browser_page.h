@@ -1,7 +1,9 @@
 #pragma once
 
 #include <wx/panel.h>
+#include <wx/timer.h>
 
+#include <optional>
 #include <string>
 #include <vector>
 
@@ -19,14 +21,18 @@ class wxSimplebook;
 namespace fotomill::desktop {
 
 class DetailsList;
+class FolderProblem;
 class PathBar;
 class ThumbnailCanvas;
+
+class BrowserPage;
 
 // What a browser needs from its frame.
 class BrowserHost {
  public:
   virtual ~BrowserHost() = default;
   virtual void BrowserChanged() = 0;     // folder, selection, modes or counts
+  virtual void CloseBrowser(BrowserPage& browser) = 0;  // its folder no longer exists
   virtual DetailColumns& Columns() = 0;  // of the details view in all browsers
   // Saves the view chosen for a folder.
   virtual void KeepView(const std::string& folder, const FolderView& view) = 0;
@@ -72,6 +78,9 @@ class BrowserPage : public wxPanel {
   void SelectionChanged();
   // Focuses the line with this name and scrolls it into view.
   void FocusName(const std::string& name);
+  // Selects exactly these names once the folder is listed again, and nothing until then. For
+  // commands that just changed the files.
+  void SelectWhenListed(std::vector<std::string> names);
   void EditFocusedName();  // in the list
   void EditPath();         // focuses the path and selects its text
   void OfferTrail();  // shows a menu of visited folders
@@ -86,8 +95,9 @@ class BrowserPage : public wxPanel {
   bool Listing() const { return reader_.Listing(); }  // the folder is being read
   size_t MissingThumbnails() const;                   // among the pictures shown
   int64_t Scroll() const;  // pixels
-  // Sets the scroll position to restore after listing.
-  void RestoreScroll(int64_t scroll) { wantedScroll_ = scroll; }
+  bool FocusInSight() const;  // the focused file is visible
+  // Opens the folder of a tab of the last session, which is closed again if it no longer exists.
+  void Restore(const std::string& folder, const std::string& focus, int64_t scroll);
   // Whether this browser offers to create missing thumbnails.
   bool AsksForThumbnails() const { return offer_.Asks(); }
   void SetAsksForThumbnails(bool asks) { offer_.SetAsks(asks); }
@@ -97,6 +107,8 @@ class BrowserPage : public wxPanel {
   void BuildViews();
   void ShowFolder(const std::string& folder, const std::string& focus);
   void ShowListing(FolderListing listing, bool complete);
+  void ShowWanted();
+  void ShowProblem(const std::string& problem);
   void OfferThumbnails();
   void StartFacts();
   void ShowFacts(const PlacedItems& found, bool last);
@@ -104,8 +116,7 @@ class BrowserPage : public wxPanel {
   bool ShowsDetails() const;
   void ShowView();
   void ShowLines();
-  void UseViewOf(const std::string& folder);
-  void TakeChangedOverride();
+  void UseView(const BrowserModes& chosen);
   void ShowAs(const FolderView& view);
   void ChooseView(const FolderView& view);
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
@@ -122,13 +133,17 @@ class BrowserPage : public wxPanel {
   FolderTrail trail_;
   std::string wantedFocus_;
   int64_t wantedScroll_ = -1;
+  std::optional<std::vector<std::string>> wantedNames_;  // to select
+  bool closesIfMissing_ = false;
   FolderReader reader_;
+  wxTimer late_;  // until the page says that the folder does not answer
   FolderWatch watch_;
   UpdateOffer offer_;
 
   PathBar* path_ = nullptr;
   wxSearchCtrl* filter_ = nullptr;
   wxSimplebook* views_ = nullptr;
+  FolderProblem* problem_ = nullptr;  // shown instead of the views
   ThumbnailCanvas* canvas_ = nullptr;
   DetailsList* details_ = nullptr;
 };

@@ -1,5 +1,7 @@
 #include "desktop/windows/browser/folder_reader.h"
 
+#include <memory>
+
 namespace fotomill::desktop {
 
 namespace {
@@ -13,13 +15,15 @@ void FolderReader::List(const std::string& folder, bool namesFirst) {
   listing_.Start(
       [this, folder, namesFirst](const StopToken& stop, const LooseWork::Report& report) {
         const auto send = [&](FolderListing listing, bool complete) {
-          report([this, listing = std::move(listing), complete]() mutable {
+          // Reports are copied on their way, which a large listing should not be.
+          const auto sent = std::make_shared<FolderListing>(std::move(listing));
+          report([this, sent, complete] {
             if (complete) listing_.Stop();
-            events_.listed(std::move(listing), complete);
+            events_.listed(std::move(*sent), complete);
           });
         };
         FolderListing listing = ListForBrowser(folder, false, stop);
-        if (namesFirst && !stop.Asked()) send(listing, false);
+        if (namesFirst && !stop.Asked()) send(FolderListing(listing), false);
         AddFacts(folder, listing, stop);
         if (!stop.Asked()) send(std::move(listing), true);
       },

@@ -14,7 +14,6 @@
 #include "desktop/windows/browser/folder_menu.h"
 #include "desktop/windows/widgets/bitmaps.h"
 #include "desktop/windows/widgets/wx_text.h"
-#include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 
@@ -156,12 +155,12 @@ void PathBar::ShowEdit(bool show) {
   Layout();
 }
 
+// Completes the name of a folder first. Whether the folder exists is found out by listing it.
 void PathBar::OpenTyped() {
-  if (!platform::IsFolder(FolderTyped(Utf8(edit_->GetValue())))) ShowCompletion(0);
-  const std::string folder = FolderTyped(Utf8(edit_->GetValue()));
-  if (!platform::IsFolder(folder)) return wxBell();
+  if (edit_->IsEmpty()) return;
+  ShowCompletion(0);
   ShowEdit(false);
-  events_.open(folder);
+  events_.open(FolderTyped(Utf8(edit_->GetValue())));
 }
 
 // Nearest first.

@@ -25,6 +25,7 @@ namespace {
 constexpr int kListWidth = 240;       // line width in the list of names
 constexpr double kTypingPause = 1.0;  // seconds until typing starts over
 constexpr size_t kPrecache = 256;     // thumbnails requested beyond nearby ones
+constexpr size_t kScreensKept = 4;    // of thumbnails in memory, however large they are
 
 bool OpensMenu(const wxKeyEvent& event) {
   const int key = event.GetKeyCode();
@@ -100,6 +101,7 @@ void ThumbnailCanvas::MeasureCells() {
 }
 
 void ThumbnailCanvas::ModelChanged() {
+  restored_.reset();
   FinishEdit(false);
   MeasureCells();
   scroll_ = std::clamp<int64_t>(scroll_, 0, layout_.LargestScroll());
@@ -141,21 +143,32 @@ void ThumbnailCanvas::WantThumbnails() {
   if (square_ > 0 && model_.LineCount() > 0) {
     const int height = GetClientSize().y;
     const CellLayout::Range visible = layout_.Visible(scroll_);
+    const size_t ahead = RoomAhead(visible);
     want(visible.first, visible.end);
     const std::vector<ThumbnailRequest> standIns = StandInsFor(visible);
-    const int64_t ahead =
-        direction_ > 0 ? scroll_ + height : std::max<int64_t>(scroll_ - height, 0);
-    const CellLayout::Range next = layout_.LinesBetween(ahead, ahead + height);
+    const int64_t top = direction_ > 0 ? scroll_ + height : std::max<int64_t>(scroll_ - height, 0);
+    const CellLayout::Range next = layout_.LinesBetween(top, top + height);
     if (direction_ > 0) want(std::max(next.first, visible.end), next.end);
     if (direction_ < 0) want(next.first, std::min(next.end, visible.first));
     if (settings.BrowserThumbnailPrecacheEnable != 0) {
-      for (size_t line = visible.end; line < model_.LineCount() && requests.size() < kPrecache;
-           ++line)
+      const size_t end = std::min(model_.LineCount(), visible.end + ahead);
+      for (size_t line = visible.end; line < end && requests.size() < kPrecache; ++line)
         want(line, line + 1);
     }
     requests.insert(requests.begin(), standIns.begin(), standIns.end());
   }
   thumbnails_.Want(std::move(requests));
+}
+
+// Makes room in memory for a few screens of thumbnails. Returns how many fit beyond the visible
+// ones; more would replace those just loaded.
+size_t ThumbnailCanvas::RoomAhead(const CellLayout::Range& visible) {
+  const double side = square_ * GetContentScaleFactor();
+  const auto bytes = static_cast<uint64_t>(side * side) * 3;
+  const size_t shown = visible.end - visible.first;
+  thumbnails_.MakeRoomFor(kScreensKept * shown * bytes);
+  const size_t room = static_cast<size_t>(thumbnails_.Room() / std::max<uint64_t>(bytes, 1));
+  return room > 2 * shown ? room - 2 * shown : 0;
 }
 
 std::vector<ThumbnailRequest> ThumbnailCanvas::StandInsFor(const CellLayout::Range& lines) const {
@@ -201,6 +214,21 @@ void ThumbnailCanvas::ShowLine(size_t line) {
   if (line != kNoLine) ScrollTo(layout_.ScrollToShow(line, scroll_));
 }
 
+bool ThumbnailCanvas::InSight(size_t line) const {
+  return line != kNoLine && layout_.Shows(line, scroll_);
+}
+
+void ThumbnailCanvas::RestorePlace(int64_t scroll, size_t line) {
+  restored_ = {scroll, line};
+  ShowRestored();
+}
+
+void ThumbnailCanvas::ShowRestored() {
+  const auto [scroll, line] = *restored_;
+  if (scroll >= 0) ScrollTo(scroll);
+  ShowLine(line);
+}
+
 void ThumbnailCanvas::ScrollTo(int64_t scroll) {
   scroll = std::clamp<int64_t>(scroll, 0, layout_.LargestScroll());
   if (scroll == scroll_) return;
@@ -214,9 +242,16 @@ void ThumbnailCanvas::ScrollTo(int64_t scroll) {
 
 // --- scrolling ---
 
+// Keeps the first visible file in place, and the focused one in sight if it was.
 void ThumbnailCanvas::OnSize(wxSizeEvent& event) {
+  const size_t focus = model_.Selected().Focus();
+  const bool seen = InSight(focus);
+  const size_t first = layout_.Visible(scroll_).first;
+  const int64_t below = scroll_ - layout_.Cell(first).y;
   layout_.SetWindow(GetClientSize().x, GetClientSize().y);
-  scroll_ = std::clamp<int64_t>(scroll_, 0, layout_.LargestScroll());
+  scroll_ = std::clamp<int64_t>(layout_.Cell(first).y + below, 0, layout_.LargestScroll());
+  if (seen) scroll_ = layout_.ScrollToShow(focus, scroll_);
+  if (restored_) ShowRestored();
   UpdateScrollbar();
   WantThumbnails();
   Refresh();
@@ -233,6 +268,7 @@ void ThumbnailCanvas::OnScroll(wxScrollWinEvent& event) {
   if (type == wxEVT_SCROLLWIN_LINEDOWN) target = scroll_ + layout_.RowHeight();
   if (type == wxEVT_SCROLLWIN_PAGEUP) target = scroll_ - page;
   if (type == wxEVT_SCROLLWIN_PAGEDOWN) target = scroll_ + page;
+  restored_.reset();
   ScrollTo(target);
 }
 
@@ -246,6 +282,7 @@ void ThumbnailCanvas::OnWheel(wxMouseEvent& event) {
   }
   const double step = ListsNames() ? 3.0 * layout_.RowHeight()
                                    : std::max(layout_.RowHeight() / 2.0, FromDIP(60) * 1.0);
+  restored_.reset();
   ScrollTo(scroll_ - std::lround(notches * step));
 }
 
@@ -263,6 +300,7 @@ void ThumbnailCanvas::ReportFocus() {
 }
 
 void ThumbnailCanvas::ReportSelection() {
+  restored_.reset();
   Refresh();
   ReportFocus();
   if (events_.selectionChanged) events_.selectionChanged();

@@ -46,6 +46,11 @@ class ThumbnailCanvas : public wxWindow {
   void ShowLine(size_t line);
   int64_t Scroll() const { return scroll_; }
   void ScrollTo(int64_t scroll);
+  // Scrolls to a position, unless negative, and to a line; and again whenever the window changes
+  // its size, until the user scrolls or selects. A new window gets its size in several steps.
+  void RestorePlace(int64_t scroll, size_t line);
+  // Whether at least a part of the line is visible; false for kNoLine.
+  bool InSight(size_t line) const;
   // Lets the user rename a file in place.
   void EditName(size_t line);
   // The number of visible thumbnails not loaded yet.
@@ -78,6 +83,9 @@ class ThumbnailCanvas : public wxWindow {
   const wxBitmap& BitmapOfThumbnail(const ThumbnailPointer& thumbnail);
   ThumbnailRequest RequestOf(size_t line) const;
   std::vector<ThumbnailRequest> StandInsFor(const CellLayout::Range& lines) const;
+  size_t RoomAhead(const CellLayout::Range& visible);
+  void ShowRestored();
+  void DropBitmaps();
   size_t LineAt(const wxPoint& point) const;
   void MoveFocus(Step step, const wxKeyEvent& event);
   void ReportFocus();
@@ -91,6 +99,11 @@ class ThumbnailCanvas : public wxWindow {
   const Events events_;
   CellLayout layout_;
   int64_t scroll_ = 0;
+  struct RestoredPlace {
+    int64_t scroll;
+    size_t line;
+  };
+  std::optional<RestoredPlace> restored_;
   int direction_ = 1;  // of scrolling; what is ahead is loaded first
   int square_ = 96;    // size of the picture in a cell, 0: none
   int textHeight_ = 16;
@@ -100,8 +113,10 @@ class ThumbnailCanvas : public wxWindow {
   struct Drawn {
     ThumbnailPointer thumbnail;
     wxBitmap bitmap;
+    uint64_t paint;  // in which it was last drawn
   };
   std::unordered_map<const Thumbnail*, Drawn> bitmaps_;
+  uint64_t paints_ = 0;
   struct DrawnPlaceholder {
     bool unreadable;
     int side;

@@ -20,7 +20,8 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr double kBitmapBytes = 96e6;  // cache of drawn bitmaps, besides the thumbnails
+constexpr double kBitmapBytes = 12e6;  // of bitmaps that are not on the screen
+constexpr double kPixelBytes = 11;     // of a bitmap: its own, and two copies of the toolkit
 constexpr size_t kMostCutNames = 5000;
 constexpr unsigned long kInkOnPaper = 0x3D3D90;  // for an extension on the sheet, 0xBBGGRR
 
@@ -54,14 +55,16 @@ void ThumbnailCanvas::Paint() {
   dc.SetBackground(wxBrush(looks.background));
   dc.Clear();
   dc.SetFont(GetFont());
-  if (model_.LineCount() == 0 && !model_.Folder().empty()) {
+  if (model_.LineCount() == 0 && model_.Listed()) {
     dc.SetTextForeground(looks.note);
     dc.DrawLabel(model_.Filter().empty() ? Label("There are no pictures in this folder.")
                                          : Label("No name matches the filter."),
                  wxRect(GetClientSize()), wxALIGN_CENTER);
   }
   const CellLayout::Range visible = layout_.Visible(scroll_);
+  ++paints_;
   for (size_t line = visible.first; line < visible.end; ++line) DrawCell(dc, line, looks);
+  DropBitmaps();
   if (banding_ && pressed_) {
     const wxRect band(
         wxPoint(std::min(pressed_->x, bandEnd_.x),
@@ -212,14 +215,19 @@ wxString ThumbnailCanvas::CutName(wxDC& dc, const std::string& name, int width) 
 }
 
 const wxBitmap& ThumbnailCanvas::BitmapOfThumbnail(const ThumbnailPointer& thumbnail) {
-  const auto found = bitmaps_.find(thumbnail.get());
-  if (found != bitmaps_.end()) return found->second.bitmap;
+  const auto [found, added] = bitmaps_.try_emplace(thumbnail.get(), Drawn{thumbnail, {}, 0});
+  Drawn& drawn = found->second;
+  if (added) drawn.bitmap = BitmapOf(thumbnail->pixels, GetContentScaleFactor());
+  drawn.paint = paints_;
+  return drawn.bitmap;
+}
+
+// Drops the bitmaps that were not drawn now, if they take much memory.
+void ThumbnailCanvas::DropBitmaps() {
+  const auto unused = [this](const auto& entry) { return entry.second.paint != paints_; };
   const double side = square_ * GetContentScaleFactor();
-  if (static_cast<double>(bitmaps_.size()) * side * side * 7 > kBitmapBytes) bitmaps_.clear();
-  return bitmaps_
-      .try_emplace(thumbnail.get(),
-                   Drawn{thumbnail, BitmapOf(thumbnail->pixels, GetContentScaleFactor())})
-      .first->second.bitmap;
+  const auto count = static_cast<double>(std::ranges::count_if(bitmaps_, unused));
+  if (count * side * side * kPixelBytes > kBitmapBytes) std::erase_if(bitmaps_, unused);
 }
 
 }  // namespace fotomill::desktop

@@ -115,8 +115,20 @@ void FileActions::Do(FileOperationKind kind, const std::vector<std::string>& pat
       },
       [this](FileOperationResult result) {
         Took(result.done, false);
+        SelectResults(result.done, false);
         undo_.Add(std::move(result.done));
       });
+}
+
+// Selects the files that an operation or its undo made, moved or changed. After an undo that
+// removed them, nothing is selected.
+void FileActions::SelectResults(const FileOperation& operation, bool back) {
+  const bool makes =
+      operation.kind == FileOperationKind::Copy || operation.kind == FileOperationKind::Create;
+  std::vector<std::string> paths;
+  for (const FileStep& step : operation.steps)
+    paths.push_back(step.to.empty() || (back && !makes) ? step.from : step.to);
+  if (operation.kind != FileOperationKind::Trash || back) shell_.Tabs().SelectWhenListed(paths);
 }
 
 void FileActions::Follow(const FileOperation& operation, bool back) {
@@ -196,17 +208,13 @@ void FileActions::Rename(const std::string& path, const std::string& name) {
 void FileActions::RenameAll(std::vector<FileStep> steps) {
   if (steps.empty()) return;
   FileOperation operation{FileOperationKind::Rename, std::move(steps)};
-  const std::string shown(platform::FileNameOf(operation.steps.front().to));
-  const bool one = operation.steps.size() == 1;
   Run(
       Tr("Rename"),
       [operation](const FileOperationProgress& progress) { return CarryOut(operation, progress); },
-      [this, one, shown](FileOperationResult result) {
-        const bool done = !result.done.steps.empty();
+      [this](FileOperationResult result) {
         Took(result.done, false);
+        SelectResults(result.done, false);
         undo_.Add(std::move(result.done));
-        if (BrowserPage* browser = shell_.Tabs().Front(); one && done && browser != nullptr)
-          browser->Open(browser->Model().Folder(), shown);
       });
 }
 
@@ -252,6 +260,7 @@ void FileActions::Undo() {
       [operation](const FileOperationProgress& progress) { return Revert(operation, progress); },
       [this](FileOperationResult result) {
         Took(result.done, true);
+        SelectResults(result.done, true);
         undo_.Undone(std::move(result.done));
       });
 }
@@ -264,6 +273,7 @@ void FileActions::Redo() {
       [operation](const FileOperationProgress& progress) { return CarryOut(operation, progress); },
       [this](FileOperationResult result) {
         Took(result.done, false);
+        SelectResults(result.done, false);
         undo_.Redone(std::move(result.done));
       });
 }

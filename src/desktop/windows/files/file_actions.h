@@ -69,6 +69,7 @@ class FileActions : public wxEvtHandler {
   void PastePicture(const std::string& folder);
   // Updates windows that show a renamed or moved folder.
   void Follow(const FileOperation& operation, bool back);
+  void SelectResults(const FileOperation& operation, bool back);
   // Updates those windows and the file history.
   void Took(const FileOperation& operation, bool back);
   void ReportFailures(const std::vector<FileOperationFailure>& failures);

@@ -2,6 +2,7 @@
 
 #include <wx/aui/auibook.h>
 #include <wx/frame.h>
+#include <wx/weakref.h>
 
 #include "desktop/models/shell/event_log.h"
 #include "desktop/models/shell/favorites.h"
@@ -88,6 +89,17 @@ void BrowserTabs::SelectFiles(const std::vector<std::string>& files) {
   browser->SelectionChanged();
 }
 
+void BrowserTabs::SelectWhenListed(const std::vector<std::string>& files) {
+  for (size_t tab = 0; tab < book_->GetPageCount(); ++tab) {
+    const std::string folder = platform::JoinFolder(PageAt(tab)->Model().Folder(), "");
+    std::vector<std::string> names;
+    for (const std::string& file : files) {
+      if (platform::SplitPath(file).folder == folder) names.emplace_back(platform::FileNameOf(file));
+    }
+    if (!names.empty()) PageAt(tab)->SelectWhenListed(std::move(names));
+  }
+}
+
 // --- tabs ---
 
 BrowserPage* BrowserTabs::Open(const std::string& folder) {
@@ -167,8 +179,7 @@ void BrowserTabs::Restore(const Session& session) {
     book_->AddPage(page, FolderLabel(tab.folder));
     book_->SetPageToolTip(book_->GetPageCount() - 1, Shown(tab.folder));
     page->SetAsksForThumbnails(tab.asksForThumbnails);
-    page->Open(tab.folder, tab.focus);
-    page->RestoreScroll(tab.scroll);
+    page->Restore(tab.folder, tab.focus, tab.scroll);
   }
   book_->SetSelection(first + session.tab);
   if (BrowserPage* browser = Front()) {
@@ -213,6 +224,20 @@ void BrowserTabs::BrowserChanged() {
   LogState();
 }
 
+// Later, as the browser is calling.
+void BrowserTabs::CloseBrowser(BrowserPage& browser) {
+  shell_.Window().CallAfter([this, weak = wxWeakRef<BrowserPage>(&browser)] {
+    const int tab = weak == nullptr ? wxNOT_FOUND : book_->GetPageIndex(weak);
+    if (tab == wxNOT_FOUND) return;
+    if (book_->GetPageCount() > 1) {
+      book_->DeletePage(static_cast<size_t>(tab));
+    } else {
+      weak->Open(platform::SpecialFolderPath(platform::SpecialFolder::Pictures));
+    }
+    BrowserChanged();
+  });
+}
+
 void BrowserTabs::KeepView(const std::string& folder, const FolderView& view) {
   views_.Keep(folder, view);
   viewsTimer_.StartOnce(kViewsMs);
@@ -243,7 +268,7 @@ void BrowserTabs::LogState() {
       " items=" + std::to_string(model.ItemCount()) + " selected=" + std::to_string(model.Selected().SelectedCount()) +
       " missing=" + std::to_string(browser->MissingThumbnails()) + " listing=" + std::to_string(browser->Listing()) +
       " view=" + std::to_string(model.Modes().view) + " sort=" + std::to_string(model.Modes().sort) +
-      " focus=" + (focus == kNoLine ? std::string("-") : model.Line(focus).name) + " folder=" + model.Folder();
+      " seen=" + std::to_string(browser->FocusInSight()) + " focus=" + (focus == kNoLine ? std::string("-") : model.Line(focus).name) + " folder=" + model.Folder();
   if (state == loggedState_) return;
   loggedState_ = state;
   LogEvent("browser", state);

@@ -41,6 +41,9 @@ class BrowserTabs : private BrowserHost {
   std::string CurrentFolder() const;  // of the current browser
   // Selects those files that the current browser shows.
   void SelectFiles(const std::vector<std::string>& files);
+  // Selects exactly these files in all browsers of their folders once those are listed again, and
+  // nothing until then. Call before FilesChanged.
+  void SelectWhenListed(const std::vector<std::string>& files);
 
   BrowserPage* Open(const std::string& folder);  // in a new tab, which becomes current
   // The tab with this folder, or a new one.
@@ -67,6 +70,7 @@ class BrowserTabs : private BrowserHost {
  private:
   // BrowserHost
   void BrowserChanged() override;
+  void CloseBrowser(BrowserPage& browser) override;
   DetailColumns& Columns() override { return columns_; }
   void KeepView(const std::string& folder, const FolderView& view) override;
   const FolderViews& Views() override { return views_; }

@@ -1,0 +1,135 @@
+#!/usr/bin/env python3
+"""What is selected and in sight after undo, at a start and after a resize; folders that cannot be
+shown."""
+import os
+import shutil
+
+from driven_desktop import PROJECT, Desktop, make_pictures, run
+
+QUIET = ["UpdateThumbnailsFlag=0"]
+
+
+def names(folder):
+    return sorted(path.name for path in folder.iterdir())
+
+
+def selection_after_undo(folder):
+    """Delete after an undo or redo takes the files that it concerned, and no other."""
+    pictures, other = folder / "pictures", folder / "other"
+    make_pictures(pictures, ["a.bmp", "b.bmp", "c.bmp", "d.bmp"])
+    other.mkdir()
+    with Desktop(folder, pictures, settings=QUIET) as desktop:
+        desktop.wait(r"lines=4 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "F2")
+        desktop.type("z")
+        desktop.key("Return")
+        desktop.wait(r"selected=1 .*listing=0 .*focus=z.bmp")
+        desktop.key("Home", "shift+Right", "Delete")
+        desktop.wait(r"files Deletion of 2 files done=2")
+        desktop.wait(r"lines=2 .*selected=1 .*listing=0 .*focus=d.bmp")
+        desktop.key("ctrl+z")
+        desktop.wait(r"lines=4 .*selected=2 .*listing=0 .*focus=b.bmp")
+        desktop.key("End", "ctrl+z")
+        desktop.wait(r"lines=4 .*selected=1 .*listing=0 .*focus=a.bmp")
+        desktop.key("End", "ctrl+y")
+        desktop.wait(r"lines=4 .*selected=1 .*listing=0 .*focus=z.bmp")
+        desktop.key("Home", "Delete")
+        desktop.wait(r"files Deletion of b.bmp done=1")
+        desktop.wait(r"lines=3 .*listing=0")
+        desktop.key("End", "ctrl+z")
+        desktop.wait(r"lines=4 .*selected=1 .*listing=0 .*focus=b.bmp")
+        # Without a selection, Delete would take the focused file.
+        desktop.key("Home", "ctrl+c", "ctrl+v")
+        desktop.wait(r"lines=5 .*selected=1 .*listing=0 .*focus=Duplicate of b.bmp")
+        desktop.key("ctrl+z")
+        desktop.wait(r"lines=4 .*selected=0 .*listing=0 .*focus=- ")
+        desktop.key("Delete", "Home")
+        desktop.wait(r"selected=1 .*focus=b.bmp")
+        assert names(pictures) == ["b.bmp", "c.bmp", "d.bmp", "z.bmp"], names(pictures)
+
+
+def place_at_a_start(folder):
+    """The list comes before the window has its size."""
+    pictures = folder / "a/b/c/pictures"
+    pictures.mkdir(parents=True)
+    for number in range(30):
+        (folder / f"a/other{number}").mkdir()
+    for number in range(400):
+        shutil.copy(PROJECT / "samples/bmp-true-color.bmp", pictures / f"{number:04}.bmp")
+    with Desktop(folder, pictures, settings=QUIET, size=(1600, 1000)) as desktop:
+        desktop.wait(r"lines=400 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", *["Page_Down"] * 7)
+        focus = desktop.wait(r"seen=1 focus=02..").split("focus=")[1].split()[0]
+        # Hiding the tree and another size keep the focused file in sight.
+        for change in ("F9", "F9", (700, 500), (1500, 900), (900, 600)):
+            if isinstance(change, str):
+                desktop.key(change)
+            else:
+                window = desktop.focus("Fotomill Professional")
+                desktop.xdotool("windowsize", window, *change)
+            desktop.settle()
+            desktop.key("ctrl+Left", "ctrl+Right", "ctrl+shift+a")
+            desktop.wait(rf"selected=0 .*seen=1 focus={focus}")
+            desktop.key("space")
+            desktop.wait(rf"selected=1 .*seen=1 focus={focus}")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+        assert "CRITICAL" not in desktop.output.read_text(), desktop.output.read_text()
+        desktop.arguments = []
+        for _ in range(3):
+            desktop.start()
+            desktop.wait(rf"lines=400 .*listing=0 .*focus={focus}")
+            desktop.focus("Fotomill Professional")
+            desktop.key("space")
+            desktop.wait(rf"selected=0 .*seen=1 focus={focus}")
+            desktop.key("space", "ctrl+q")
+            desktop.wait_end()
+            complaints = desktop.output.read_text()
+            assert not complaints, complaints
+
+
+def folders_that_cannot_be_shown(folder):
+    pictures, gone = folder / "pictures", folder / "gone"
+    make_pictures(pictures, ["a.bmp"])
+    gone.mkdir()
+    closed = pictures / "closed"
+    closed.mkdir()
+    with Desktop(folder, pictures, settings=QUIET) as desktop:
+        desktop.wait(r"lines=2 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        # A typed path: no folder, a file, and one that is there.
+        for typed, problem in ((folder / "none", "There is no folder .*none"),
+                               (pictures / "a.bmp", "a.bmp is not a folder")):
+            desktop.key("ctrl+l")
+            desktop.type(f"{typed}\n")
+            desktop.wait(f"folder-problem {problem}")
+            desktop.screenshot("folder-problem")
+            desktop.key("space")  # the button leads up
+            desktop.wait(rf"listing=0 .*folder={typed.parent}$")
+        desktop.key("ctrl+l")
+        desktop.type(f"{gone}\n")
+        desktop.wait(rf"lines=0 .*listing=0 .*folder={gone}$")
+        desktop.key("ctrl+t")
+        desktop.wait(r"tabs=2 ")
+        desktop.key("ctrl+l")
+        desktop.type(f"{pictures}\n")
+        desktop.wait(rf"lines=2 .*listing=0 .*folder={pictures}$")
+        if os.getuid() != 0:
+            closed.chmod(0)
+            desktop.key("Home", "Return")
+            desktop.wait("folder-problem .*closed cannot be read. Permission denied.")
+            closed.chmod(0o700)
+            desktop.key("space")
+            desktop.wait(rf"lines=2 .*listing=0 .*folder={pictures}$")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+        # The tab of a folder that is gone is closed.
+        gone.rmdir()
+        desktop.arguments = []
+        desktop.start()
+        desktop.wait(rf"tabs=1 .*listing=0 .*folder={pictures}$")
+
+
+run(selection_after_undo, place_at_a_start, folders_that_cannot_be_shown)
