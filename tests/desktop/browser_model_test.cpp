@@ -102,6 +102,21 @@ TEST(BrowserModel, FocusMovesToTheNextFileIfItsFileIsDeleted) {
   EXPECT_EQ(model.CountText(), "0 files");
 }
 
+TEST(BrowserModel, FocusSkipsAllDeletedFiles) {
+  BrowserModel model;
+  model.SetItems(Items({"a.png", "b.png", "c.png", "d.png", "e.png"}));
+  model.Selected().SelectOnly(1);
+  model.Selected().MoveFocus(2, true, false);
+  model.SetItems(Items({"a.png", "d.png", "e.png"}));
+  EXPECT_EQ(Shown(model), "a.png [d.png*] e.png");
+  // Exactly the named lines; without any, the next command has no file.
+  model.SelectNames({"e.png", "gone.png", "a.png"});
+  EXPECT_EQ(Shown(model), "[a.png*] d.png e.png*");
+  model.SelectNames({"gone.png"});
+  EXPECT_EQ(Shown(model), "a.png d.png e.png");
+  EXPECT_TRUE(model.PathsForFunction().empty());
+}
+
 TEST(BrowserModel, KeepsFactsOfUnchangedFiles) {
   BrowserModel model;
   model.SetItems(Items({"a.png"}));

@@ -192,8 +192,8 @@ def compare(folder):
         desktop.wait(r"compare pane=3/4 status=0 .*c.jpg")
         desktop.focus("Compare")
         desktop.key("Tab", "Tab", "Delete")
-        desktop.wait(r"compare-focus 3/3")
         desktop.wait(r"files Deletion of c.jpg done=1")
+        desktop.wait(r"compare-focus 3/3")
         if (pictures / "c.jpg").exists():
             raise Failure("c.jpg is still there")
         for name in ("d.gif", "b.png", "a.bmp"):  # closing the last pane closes the window

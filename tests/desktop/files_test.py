@@ -64,8 +64,8 @@ def rename_delete_undo_paste(folder):
         desktop.wait(r"view place=1/4 .*status=0 .*/a.bmp")
         desktop.focus("View$")
         desktop.key("Delete")
-        desktop.wait(r"view place=1/3 .*status=0 .*/b.bmp")
         desktop.wait(r"files Deletion of a.bmp done=1")
+        desktop.wait(r"view place=1/3 .*status=0 .*/b.bmp")
         assert names(pictures) == ["Duplicate of a.bmp", "Duplicate of b.bmp",
                                    "b.bmp"], names(pictures)
 

@@ -60,8 +60,9 @@ def place_at_a_start(folder):
     with Desktop(folder, pictures, settings=QUIET, size=(1600, 1000)) as desktop:
         desktop.wait(r"lines=400 .*listing=0")
         desktop.focus("Fotomill Professional")
-        desktop.key("Home", *["Page_Down"] * 7)
-        focus = desktop.wait(r"seen=1 focus=02..").split("focus=")[1].split()[0]
+        desktop.key("Home", *["Page_Down"] * 9)
+        focus = "0252.bmp"
+        desktop.wait(f"selected=1 .*seen=1 focus={focus}")
         # Hiding the tree and another size keep the focused file in sight.
         for change in ("F9", "F9", (700, 500), (1500, 900), (900, 600)):
             if isinstance(change, str):
@@ -70,10 +71,9 @@ def place_at_a_start(folder):
                 window = desktop.focus("Fotomill Professional")
                 desktop.xdotool("windowsize", window, *change)
             desktop.settle()
-            desktop.key("ctrl+Left", "ctrl+Right", "ctrl+shift+a")
-            desktop.wait(rf"selected=0 .*seen=1 focus={focus}")
-            desktop.key("space")
-            desktop.wait(rf"selected=1 .*seen=1 focus={focus}")
+            for selected in (0, 1):  # reported with what is in sight
+                desktop.key("space")
+                desktop.wait(rf"selected={selected} .*seen=1 focus={focus}")
         desktop.key("ctrl+q")
         desktop.wait_end()
         assert "CRITICAL" not in desktop.output.read_text(), desktop.output.read_text()
@@ -101,7 +101,7 @@ def folders_that_cannot_be_shown(folder):
         desktop.focus("Fotomill Professional")
         # A typed path: no folder, a file, and one that is there.
         for typed, problem in ((folder / "none", "There is no folder .*none"),
-                               (pictures / "a.bmp", "a.bmp is not a folder")):
+                               (pictures / "a.bmp", ".*a.bmp is not a folder")):
             desktop.key("ctrl+l")
             desktop.type(f"{typed}\n")
             desktop.wait(f"folder-problem {problem}")

@@ -424,6 +424,9 @@ TEST(ThumbnailCache, KeepsTheLatestWithinItsLimit) {
   EXPECT_NE(cache.FindAny("a"), nullptr);
   cache.Put(request("a", 2), picture());
   EXPECT_EQ(cache.Bytes(), 3 * picture()->Bytes());
+  cache.SetCapacity(picture()->Bytes());
+  EXPECT_EQ(cache.Count(), 1u);
+  EXPECT_NE(cache.Find(request("a", 2)), nullptr);
 }
 
 }  // namespace

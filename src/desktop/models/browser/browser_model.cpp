@@ -83,30 +83,40 @@ void BrowserModel::SetItems(std::vector<FolderItem> items) {
   const std::vector<bool> oldSelected = SelectedItems();
   const size_t oldFocus = ItemOrNone(selection_.Focus()),
                oldAnchor = ItemOrNone(selection_.Anchor());
-  const size_t focusLine = selection_.Focus();
+  const bool focused = selection_.Focus() != kNoLine;
   std::vector<bool> selected(items.size());
   size_t focus = kNoLine, anchor = kNoLine;
+  std::vector<size_t> newPlaces(items_.size(), kNoLine);
   for (size_t i = 0; i < items.size(); ++i) {
     const auto found = old.find(items[i].name);
     if (found == old.end()) continue;
     const FolderItem& before = items_[found->second];
+    newPlaces[found->second] = i;
     selected[i] = oldSelected[found->second];
     if (found->second == oldFocus) focus = i;
     if (found->second == oldAnchor) anchor = i;
     if (before.modified == items[i].modified && before.size == items[i].size) items[i] = before;
   }
+  const bool moves = focused && focus == kNoLine;
+  if (moves) focus = Nearest(newPlaces);
   items_ = std::move(items);
   listed_ = true;
   SortItems();
   BuildLines(selected, focus, anchor);
-  if (focus == kNoLine && focusLine != kNoLine && !lines_.empty()) {
-    const size_t line = std::min(focusLine, lines_.size() - 1);
-    if (selection_.SelectedCount() == 0) {
-      selection_.SelectOnly(line);
-    } else {
-      selection_.MoveFocus(line, false, true);
-    }
+  if (moves && selection_.SelectedCount() == 0 && selection_.Focus() != kNoLine)
+    selection_.SelectOnly(selection_.Focus());
+}
+
+// The new place of the first item from the focus on that is still there, else of the last before.
+size_t BrowserModel::Nearest(const std::vector<size_t>& newPlaces) const {
+  const size_t focus = selection_.Focus();
+  for (size_t line = focus; line < lines_.size(); ++line) {
+    if (newPlaces[lines_[line]] != kNoLine) return newPlaces[lines_[line]];
   }
+  for (size_t line = focus; line-- > 0;) {
+    if (newPlaces[lines_[line]] != kNoLine) return newPlaces[lines_[line]];
+  }
+  return kNoLine;
 }
 
 void BrowserModel::UpdateOrder() {

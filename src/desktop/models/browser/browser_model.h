@@ -32,8 +32,8 @@ class BrowserModel {
   void SetFolder(const std::string& folder);
   bool Listed() const { return listed_; }  // the items of the folder were set
   // Sets the folder's items. Items of the same name stay selected and focused. If the focused item
-  // is gone, the focus moves to the line in its place. Facts missing in the new items are kept from
-  // the old ones.
+  // is gone, the focus moves to the next line that is left. Facts missing in the new items are kept
+  // from the old ones.
   void SetItems(std::vector<FolderItem> items);
   // Sets facts read later; call UpdateOrder to sort again.
   void SetFacts(size_t item, const FolderItem& facts) { items_[item] = facts; }
@@ -85,6 +85,7 @@ class BrowserModel {
 
  private:
   struct Keep;
+  size_t Nearest(const std::vector<size_t>& newPlaces) const;
   void SortItems();
   void BuildLines(const std::vector<bool>& selectedItems, size_t focusItem, size_t anchorItem);
   std::vector<bool> SelectedItems() const;

@@ -29,9 +29,9 @@ enum class FolderState { Listed, Missing, Unreadable };
 // The result of listing a folder; no items unless Listed.
 struct FolderListing {
   FolderState state = FolderState::Unreadable;
-  std::string problem = {};                   // unless Listed: why not, in sentences
-  BrowserModes chosen = {-1, -1, -1};         // modes that the folder itself asks for; -1: none
-  std::vector<FolderItem> items = {};         // unsorted
+  std::string problem = {};            // unless Listed: why not, in sentences
+  BrowserModes chosen = {-1, -1, -1};  // modes that the folder itself asks for; -1: none
+  std::vector<FolderItem> items = {};  // unsorted
 };
 
 // Lists what a browser shows: folders and files of known formats, without hidden ones and thumbnail

@@ -97,16 +97,6 @@ Session LoadSession() {
       platform::ReadWholeFile(path, kLongestFile, text) != platform::ReadResult::Done)
     return {};
   Session session = ParseSession(text);
-  const size_t front = session.tab;
-  std::vector<SessionTab> there;
-  for (size_t tab = 0; tab < session.tabs.size(); ++tab) {
-    if (platform::IsFolder(session.tabs[tab].folder)) {
-      there.push_back(std::move(session.tabs[tab]));
-    } else if (tab < front) {
-      --session.tab;
-    }
-  }
-  session.tabs = std::move(there);
   session.tab = session.tabs.empty() ? 0 : std::min(session.tab, session.tabs.size() - 1);
   return session;
 }

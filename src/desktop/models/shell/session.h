@@ -43,7 +43,8 @@ Session ParseSession(std::string_view text);
 // Tabs whose folder cannot be stored are skipped.
 std::string SessionText(const Session& session);
 
-// The session of the last run, without tabs of missing folders. Empty if there is none.
+// The session of the last run, also with tabs of folders that no longer exist. Empty if there is
+// none.
 Session LoadSession();
 // False if it cannot be written.
 bool SaveSession(const Session& session);

@@ -153,12 +153,6 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
   host_.BrowserChanged();
 }
 
-void BrowserPage::Restore(const std::string& folder, const std::string& focus, int64_t scroll) {
-  Open(folder, focus);
-  wantedScroll_ = scroll;
-  closesIfMissing_ = true;
-}
-
 // The last view chosen for the folder, else the default one; modes `chosen` by the folder itself
 // take precedence and persist.
 void BrowserPage::UseView(const BrowserModes& chosen) {

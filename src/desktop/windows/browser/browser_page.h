@@ -96,8 +96,10 @@ class BrowserPage : public wxPanel {
   size_t MissingThumbnails() const;                   // among the pictures shown
   int64_t Scroll() const;  // pixels
   bool FocusInSight() const;  // the focused file is visible
-  // Opens the folder of a tab of the last session, which is closed again if it no longer exists.
-  void Restore(const std::string& folder, const std::string& focus, int64_t scroll);
+  // Sets the scroll position to restore after listing.
+  void RestoreScroll(int64_t scroll) { wantedScroll_ = scroll; }
+  // Call after Open: this browser is closed if the folder no longer exists.
+  void CloseIfMissing() { closesIfMissing_ = true; }
   // Whether this browser offers to create missing thumbnails.
   bool AsksForThumbnails() const { return offer_.Asks(); }
   void SetAsksForThumbnails(bool asks) { offer_.SetAsks(asks); }

@@ -23,7 +23,8 @@ void FolderReader::List(const std::string& folder, bool namesFirst) {
           });
         };
         FolderListing listing = ListForBrowser(folder, false, stop);
-        if (namesFirst && !stop.Asked()) send(FolderListing(listing), false);
+        if (namesFirst && listing.state == FolderState::Listed && !stop.Asked())
+          send(FolderListing(listing), false);
         AddFacts(folder, listing, stop);
         if (!stop.Asked()) send(std::move(listing), true);
       },

@@ -4,6 +4,7 @@
 #include <wx/settings.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
+#include <wx/weakref.h>
 
 #include <algorithm>
 #include <cmath>
@@ -79,8 +80,8 @@ CompareFrame::CompareFrame(Shell& shell, const std::vector<std::string>& files)
   SetSize(shell.Window().GetSize());
   for (const std::string& file : files) panes_.push_back(BuildPane(file));
   place_ = panes_.front().canvas->Place();
-  loader_ =
-      std::make_unique<ViewLoader>(kNoLimit, [this] { CallAfter([this] { PicturesCame(); }); });
+  loader_ = std::make_unique<ViewLoader>(
+      kNoLimit, [this, post = calls_.Poster()] { post([this] { PicturesCame(); }); });
   CreateStatusBar();
   ArrangePanes();
   panes_.front().canvas->SetFocus();
@@ -88,7 +89,7 @@ CompareFrame::CompareFrame(Shell& shell, const std::vector<std::string>& files)
   WantPictures();
 }
 
-CompareFrame::~CompareFrame() { loader_.reset(); }  // its thread calls back into this window
+CompareFrame::~CompareFrame() { DestroyInBackground(std::move(loader_)); }
 
 CompareFrame::Pane CompareFrame::BuildPane(const std::string& path) {
   auto* panel = new wxPanel(this);
@@ -158,12 +159,24 @@ void CompareFrame::PicturesCame() {
 }
 
 void CompareFrame::FilesChanged() {
+  std::vector<ViewPicturePointer> pictures;
   for (const Pane& pane : panes_) {
-    const ViewPicturePointer& shown = pane.canvas->Picture();
-    if (shown != nullptr && shown->HasChanged() && platform::IsRegularFile(pane.path))
-      loader_->Forget(pane.path);
+    if (pane.canvas->Picture() != nullptr) pictures.push_back(pane.canvas->Picture());
   }
-  WantPictures();
+  using Paths = std::vector<std::string>;
+  changes_.Ask<Paths>(
+      [pictures] {
+        Paths changed;
+        for (const ViewPicturePointer& picture : pictures) {
+          const std::string& path = picture->request.path;
+          if (picture->HasChanged() && platform::IsRegularFile(path)) changed.push_back(path);
+        }
+        return changed;
+      },
+      [this](const Paths& changed) {
+        for (const std::string& path : changed) loader_->Forget(path);
+        WantPictures();
+      });
 }
 
 void CompareFrame::ShowPicture(Pane& pane, ViewPicturePointer picture) {
@@ -251,10 +264,18 @@ void CompareFrame::ShowInfoWindow() {
 }
 
 void CompareFrame::DeleteFile() {
-  const Pane gone = panes_[focus_];
-  if (!shell_.Files().TrashFromView(this, gone.path)) return;
-  loader_->Forget(gone.path);
-  panes_.erase(panes_.begin() + static_cast<std::ptrdiff_t>(focus_));
+  const std::string path = panes_[focus_].path;
+  shell_.Files().TrashFromView(this, path, [self = wxWeakRef<CompareFrame>(this), path] {
+    if (self) self->FileGone(path);
+  });
+}
+
+void CompareFrame::FileGone(const std::string& path) {
+  const auto found = std::ranges::find(panes_, path, &Pane::path);
+  if (found == panes_.end()) return;
+  const Pane gone = *found;
+  loader_->Forget(path);
+  panes_.erase(found);
   gone.panel->Hide();
   // May be called from one of its events.
   CallAfter([panel = gone.panel] { panel->Destroy(); });

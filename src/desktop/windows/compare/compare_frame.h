@@ -8,6 +8,8 @@
 
 #include "desktop/models/view/view_picture.h"
 #include "desktop/windows/view/view_canvas.h"
+#include "desktop/windows/widgets/file_question.h"
+#include "desktop/windows/widgets/window_calls.h"
 
 class wxStaticText;
 
@@ -47,6 +49,7 @@ class CompareFrame : public wxFrame {
     wxStaticText* caption;
   };
 
+  void FileGone(const std::string& path);
   Pane BuildPane(const std::string& path);
   void ArrangePanes();
   size_t PaneOf(const ViewCanvas* canvas) const;
@@ -64,6 +67,8 @@ class CompareFrame : public wxFrame {
   size_t focus_ = 0;
   bool joined_ = true;
   ViewPlace place_;  // of all panes while joined
+  FileQuestion changes_;
+  const WindowCalls calls_;  // of the loader
   std::unique_ptr<ViewLoader> loader_;
 };
 

@@ -58,7 +58,11 @@ FileActions::FileActions(Shell& shell) : shell_(shell), undo_(UndoLimitFromSetti
 
 void FileActions::SettingsChanged() { undo_.SetLimit(UndoLimitFromSettings()); }
 
-void FileActions::Run(const std::string& what, Work work, Then then) {
+wxWindow* FileActions::ParentOf(const Asker& asker) const {
+  return asker.parent != nullptr ? asker.parent.get() : &shell_.Window();
+}
+
+void FileActions::Run(const std::string& what, Work work, Then then, const Asker& asker) {
   if (busy_) return shell_.Report(Tr("Please wait for the previous file operation."));
   busy_ = true;
   const auto result = std::make_shared<FileOperationResult>();
@@ -71,13 +75,16 @@ void FileActions::Run(const std::string& what, Work work, Then then) {
     });
     return Status::Ok;
   };
-  task_.Start(Lane::Blocking, run, [this, what, result, then = std::move(then)](Status status) {
-    if (status != Status::Ok) result->failures.push_back({what, StatusText(status)});
-    CallAfter([this, what, result, then] { Finished(what, std::move(*result), then); });
-  });
+  task_.Start(
+      Lane::Blocking, run, [this, what, result, asker, then = std::move(then)](Status status) {
+        if (status != Status::Ok) result->failures.push_back({what, StatusText(status)});
+        CallAfter(
+            [this, what, result, asker, then] { Finished(what, std::move(*result), then, asker); });
+      });
 }
 
-void FileActions::Finished(const std::string& what, FileOperationResult result, const Then& then) {
+void FileActions::Finished(const std::string& what, FileOperationResult result, const Then& then,
+                           const Asker& asker) {
   busy_ = false;
   const std::string done =
       result.failures.empty() ? what : Tr("%1, %2 failed", what, result.failures.size());
@@ -87,10 +94,11 @@ void FileActions::Finished(const std::string& what, FileOperationResult result, 
   const std::vector<FileOperationFailure> failures = result.failures;
   then(std::move(result));
   shell_.FilesChanged();
-  ReportFailures(failures);
+  ReportFailures(failures, ParentOf(asker));
 }
 
-void FileActions::ReportFailures(const std::vector<FileOperationFailure>& failures) {
+void FileActions::ReportFailures(const std::vector<FileOperationFailure>& failures,
+                                 wxWindow* parent) {
   if (failures.empty()) return;
   wxString text;
   for (size_t i = 0; i < std::min(failures.size(), kMostFailuresShown); ++i) {
@@ -98,7 +106,8 @@ void FileActions::ReportFailures(const std::vector<FileOperationFailure>& failur
   }
   if (failures.size() > kMostFailuresShown)
     text += LabelCount("and %1 more", "and %1 more", failures.size() - kMostFailuresShown);
-  wxMessageBox(text, Label("Some files failed"), wxOK | wxICON_WARNING, &shell_.Window());
+  LogEvent("prompt", "failures");
+  wxMessageBox(text, Label("Some files failed"), wxOK | wxICON_WARNING, parent);
 }
 
 void FileActions::Do(FileOperationKind kind, const std::vector<std::string>& paths,
@@ -143,44 +152,67 @@ void FileActions::Took(const FileOperation& operation, bool back) {
   shell_.Uses().Note(UsesOf(operation, back));
 }
 
-bool FileActions::Trash(const std::vector<std::string>& paths) {
-  if (!paths.empty() && !platform::HasTrash(paths.front())) return Delete(paths);
-  Do(FileOperationKind::Trash, paths, {});
-  return true;
+void FileActions::Trash(const std::vector<std::string>& paths) { Trash(paths, {}); }
+
+// Finds out in the background whether there is a trash, too.
+void FileActions::Trash(const std::vector<std::string>& paths, const Asker& asker) {
+  if (paths.empty()) return;
+  const auto noTrash = std::make_shared<bool>(false);
+  const FileOperation operation = PlanFileOperation(FileOperationKind::Trash, paths, {});
+  std::string what = FileOperationName(operation);
+  what[0] = static_cast<char>(what[0] - 'a' + 'A');
+  Run(
+      what,
+      [operation, noTrash](const FileOperationProgress& progress) {
+        const std::string& first = operation.steps.front().from;
+        *noTrash = platform::FileExists(first) && !platform::HasTrash(first);
+        return *noTrash ? FileOperationResult{{FileOperationKind::Trash, {}}, {}}
+                        : CarryOut(operation, progress);
+      },
+      [this, paths, asker, noTrash](FileOperationResult result) {
+        if (*noTrash) return CallAfter([this, paths, asker] { Delete(paths, asker, true); });
+        Took(result.done, false);
+        const bool all = result.done.steps.size() == paths.size();
+        undo_.Add(std::move(result.done));
+        if (all && asker.gone) asker.gone();
+      },
+      asker);
 }
 
-bool FileActions::TrashFromView(wxWindow* view, const std::string& path) {
-  if (busy_) {
-    wxBell();
-    return false;
-  }
+void FileActions::TrashFromView(wxWindow* view, const std::string& path,
+                                std::function<void()> gone) {
+  if (busy_) return wxBell();
   if (settings.PromptDeleteFromView != 0) {
     wxMessageDialog dialog(view, Label("Move %1 to the trash?", Shown(platform::FileNameOf(path))),
                            Label("Delete"), wxOK | wxCANCEL | wxICON_QUESTION);
-    dialog.SetOKLabel("&Delete");
-    if (dialog.ShowModal() != wxID_OK) return false;
+    dialog.SetOKLabel(Label("&Delete"));
+    if (dialog.ShowModal() != wxID_OK) return;
   }
-  return Trash({path});
+  Trash({path}, {view, std::move(gone)});
 }
 
-bool FileActions::Delete(const std::vector<std::string>& paths) {
-  if (paths.empty()) return false;
+void FileActions::Delete(const std::vector<std::string>& paths) { Delete(paths, {}, false); }
+
+void FileActions::Delete(const std::vector<std::string>& paths, const Asker& asker, bool noTrash) {
+  if (paths.empty()) return;
   const wxString what = paths.size() == 1 ? "\"" + Shown(platform::FileNameOf(paths.front())) + "\""
                                           : Shown(Count(paths.size()));
-  const wxString why = platform::HasTrash(paths.front())
-                           ? wxString()
-                           : Label("There is no trash for files of this folder.") + "\n";
-  wxMessageDialog dialog(&shell_.Window(),
+  const wxString why =
+      noTrash ? Label("There is no trash for files of this folder.") + "\n" : wxString();
+  wxMessageDialog dialog(ParentOf(asker),
                          why + Label("Delete %1 permanently? This cannot be undone.", what),
                          Label("Delete"), wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
-  dialog.SetOKLabel("&Delete");
+  dialog.SetOKLabel(Label("&Delete"));
   LogEvent("prompt", "delete");
-  if (dialog.ShowModal() != wxID_OK) return false;
+  if (dialog.ShowModal() != wxID_OK) return;
   Run(
       Tr("Permanent deletion"),
       [paths](const FileOperationProgress& progress) { return DeleteForGood(paths, progress); },
-      [this](FileOperationResult result) { Took(result.done, false); });
-  return true;
+      [this, asker, count = paths.size()](FileOperationResult result) {
+        Took(result.done, false);
+        if (asker.gone && result.done.steps.size() == count) asker.gone();
+      },
+      asker);
 }
 
 void FileActions::CopyTo(const std::vector<std::string>& paths, const std::string& folder) {

@@ -1,6 +1,8 @@
 #pragma once
 
 #include <wx/event.h>
+#include <wx/weakref.h>
+#include <wx/window.h>
 
 #include <functional>
 #include <string>
@@ -21,13 +23,13 @@ class FileActions : public wxEvtHandler {
   explicit FileActions(Shell& shell);  // must outlive this object
   ~FileActions() override = default;
 
-  // False if there is no trash and the user declined to delete permanently.
-  bool Trash(const std::vector<std::string>& paths);
-  // The same for a file shown in `view`; asks first, depending on PromptDeleteFromView. False if
-  // the user declined, or another operation is running.
-  bool TrashFromView(wxWindow* view, const std::string& path);
-  // Asks first. False if the user declined.
-  bool Delete(const std::vector<std::string>& paths);
+  // Where there is no trash, asks whether to delete permanently.
+  void Trash(const std::vector<std::string>& paths);
+  // The same for a file shown in `view`, the parent of questions and messages; asks first,
+  // depending on PromptDeleteFromView. `gone` is called when the file was deleted, also if it did
+  // not exist any more.
+  void TrashFromView(wxWindow* view, const std::string& path, std::function<void()> gone);
+  void Delete(const std::vector<std::string>& paths);  // permanently, after asking
   // Copies files and folders; adds a number if a name is taken.
   void CopyTo(const std::vector<std::string>& paths, const std::string& folder);
   // Moves files and folders; reports taken names and skips them.
@@ -63,16 +65,25 @@ class FileActions : public wxEvtHandler {
  private:
   using Work = std::function<FileOperationResult(const FileOperationProgress& progress)>;
   using Then = std::function<void(FileOperationResult result)>;
-  void Run(const std::string& what, Work work, Then then);
+  // An operation's windows, and what follows it.
+  struct Asker {
+    wxWeakRef<wxWindow> parent;  // of messages; null: the frame
+    std::function<void()> gone;  // called when all files of a deletion are gone
+  };
+  wxWindow* ParentOf(const Asker& asker) const;
+  void Run(const std::string& what, Work work, Then then, const Asker& asker = {});
+  void Trash(const std::vector<std::string>& paths, const Asker& asker);
+  void Delete(const std::vector<std::string>& paths, const Asker& asker, bool noTrash);
   void Do(FileOperationKind kind, const std::vector<std::string>& paths, const std::string& folder);
-  void Finished(const std::string& what, FileOperationResult result, const Then& then);
+  void Finished(const std::string& what, FileOperationResult result, const Then& then,
+                const Asker& asker);
   void PastePicture(const std::string& folder);
   // Updates windows that show a renamed or moved folder.
   void Follow(const FileOperation& operation, bool back);
   void SelectResults(const FileOperation& operation, bool back);
   // Updates those windows and the file history.
   void Took(const FileOperation& operation, bool back);
-  void ReportFailures(const std::vector<FileOperationFailure>& failures);
+  void ReportFailures(const std::vector<FileOperationFailure>& failures, wxWindow* parent);
 
   Shell& shell_;
   UndoList undo_;

@@ -10,14 +10,13 @@
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
-#include "platform/files.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
 
 void AskAndOpenFile(Shell& shell) {
   const std::string last(settings.OpenPath.view());
-  const std::string folder = platform::IsFolder(last) ? last : shell.Tabs().CurrentFolder();
+  const std::string folder = last.empty() ? shell.Tabs().CurrentFolder() : last;
   wxFileDialog dialog(&shell.Window(), Label("Open picture"), wxString::FromUTF8(folder), "",
                       wxString::FromUTF8(OpenWildcard()), wxFD_OPEN | wxFD_FILE_MUST_EXIST);
   dialog.SetFilterIndex(FirstOpenFilter());

@@ -94,7 +94,8 @@ void BrowserTabs::SelectWhenListed(const std::vector<std::string>& files) {
     const std::string folder = platform::JoinFolder(PageAt(tab)->Model().Folder(), "");
     std::vector<std::string> names;
     for (const std::string& file : files) {
-      if (platform::SplitPath(file).folder == folder) names.emplace_back(platform::FileNameOf(file));
+      if (platform::SplitPath(file).folder == folder)
+        names.emplace_back(platform::FileNameOf(file));
     }
     if (!names.empty()) PageAt(tab)->SelectWhenListed(std::move(names));
   }
@@ -132,8 +133,7 @@ void BrowserTabs::Close() {
 void BrowserTabs::Reopen() {
   const auto folder = closed_.Pop();
   if (!folder) return;
-  if (!platform::IsFolder(*folder)) return shell_.Report(Tr("%1 no longer exists.", *folder));
-  Open(*folder);
+  Open(*folder)->CloseIfMissing();
 }
 
 void BrowserTabs::Step(int step) {
@@ -179,7 +179,9 @@ void BrowserTabs::Restore(const Session& session) {
     book_->AddPage(page, FolderLabel(tab.folder));
     book_->SetPageToolTip(book_->GetPageCount() - 1, Shown(tab.folder));
     page->SetAsksForThumbnails(tab.asksForThumbnails);
-    page->Restore(tab.folder, tab.focus, tab.scroll);
+    page->Open(tab.folder, tab.focus);
+    page->RestoreScroll(tab.scroll);
+    page->CloseIfMissing();
   }
   book_->SetSelection(first + session.tab);
   if (BrowserPage* browser = Front()) {
@@ -229,6 +231,7 @@ void BrowserTabs::CloseBrowser(BrowserPage& browser) {
   shell_.Window().CallAfter([this, weak = wxWeakRef<BrowserPage>(&browser)] {
     const int tab = weak == nullptr ? wxNOT_FOUND : book_->GetPageIndex(weak);
     if (tab == wxNOT_FOUND) return;
+    shell_.Report(Tr("%1 no longer exists.", weak->Model().Folder()));
     if (book_->GetPageCount() > 1) {
       book_->DeletePage(static_cast<size_t>(tab));
     } else {
@@ -263,12 +266,17 @@ void BrowserTabs::LogState() {
   if (!EventLogOn() || browser == nullptr) return;
   const BrowserModel& model = browser->Model();
   const size_t focus = model.Selected().Focus();
-  std::string state =
-      "tabs=" + std::to_string(book_->GetPageCount()) + " lines=" + std::to_string(model.LineCount()) +
-      " items=" + std::to_string(model.ItemCount()) + " selected=" + std::to_string(model.Selected().SelectedCount()) +
-      " missing=" + std::to_string(browser->MissingThumbnails()) + " listing=" + std::to_string(browser->Listing()) +
-      " view=" + std::to_string(model.Modes().view) + " sort=" + std::to_string(model.Modes().sort) +
-      " seen=" + std::to_string(browser->FocusInSight()) + " focus=" + (focus == kNoLine ? std::string("-") : model.Line(focus).name) + " folder=" + model.Folder();
+  std::string state = "tabs=" + std::to_string(book_->GetPageCount()) +
+                      " lines=" + std::to_string(model.LineCount()) +
+                      " items=" + std::to_string(model.ItemCount()) +
+                      " selected=" + std::to_string(model.Selected().SelectedCount()) +
+                      " missing=" + std::to_string(browser->MissingThumbnails()) +
+                      " listing=" + std::to_string(browser->Listing()) +
+                      " view=" + std::to_string(model.Modes().view) +
+                      " sort=" + std::to_string(model.Modes().sort) +
+                      " seen=" + std::to_string(browser->FocusInSight()) +
+                      " focus=" + (focus == kNoLine ? std::string("-") : model.Line(focus).name) +
+                      " folder=" + model.Folder();
   if (state == loggedState_) return;
   loggedState_ = state;
   LogEvent("browser", state);

@@ -18,12 +18,21 @@
 
 namespace fotomill::desktop {
 
+namespace {
+
+constexpr int kLeastWidth = 400, kLeastHeight = 200;  // device-independent pixels
+
+}  // namespace
+
 void FrameSession::RestorePlace() {
   const Session session = LoadSession();
   wxFrame& frame = shell_.Window();
-  if (session.width > 0 && session.height > 0)
-    frame.SetSize(
-        frame.FromDIP(wxSize(std::max(session.width, 400), std::max(session.height, 300))));
+  // Of the client area: the toolkit would show a window of another size first and shrink it by the
+  // border that the window manager reports.
+  const bool known = session.width > 0 && session.height > 0;
+  frame.SetClientSize(known ? frame.FromDIP(wxSize(std::max(session.width, kLeastWidth),
+                                                   std::max(session.height, kLeastHeight)))
+                            : frame.GetClientSize());
   if (session.maximized) frame.Maximize();
   shell_.Tabs().SetColumns(session.columns);
   if (settings.RememberOpenWindows != 0) lastTabs_ = session;
@@ -44,7 +53,7 @@ bool FrameSession::Keep(bool withTabs) {
     session.width = last.width;
     session.height = last.height;
   } else {
-    const wxSize size = frame.ToDIP(frame.GetSize());
+    const wxSize size = frame.ToDIP(frame.GetClientSize());
     session.width = size.x;
     session.height = size.y;
   }

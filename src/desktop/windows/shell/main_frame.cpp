@@ -32,14 +32,15 @@ namespace fotomill::desktop {
 namespace {
 
 constexpr const char* kTitle = "Fotomill Professional";
+const wxSize kUsualSize(1180, 760), kLeastSize(400, 300);  // device-independent pixels
 enum StatusField { kCountField, kMessageField, kFieldCount };
 
 }  // namespace
 
 MainFrame::MainFrame()
-    : wxFrame(nullptr, wxID_ANY, kTitle, wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE,
-              "FotomillProfessional") {
-  SetSize(FromDIP(wxSize(1180, 760)));
+    : wxFrame(nullptr, wxID_ANY, kTitle, wxDefaultPosition, FromDIP(kUsualSize, nullptr),
+              wxDEFAULT_FRAME_STYLE, "FotomillProfessional") {
+  SetMinSize(FromDIP(kLeastSize));
   uses_ = std::make_unique<UseRecorder>();
   programs_ = std::make_unique<ExternalPrograms>(*this);
   menus_ = std::make_unique<FrameMenus>(*this);
@@ -56,6 +57,10 @@ MainFrame::MainFrame()
   const int widths[] = {-2, -3};
   SetStatusWidths(kFieldCount, widths);
   SetStatusBarPane(kMessageField);
+  GetStatusBar()->Bind(wxEVT_SIZE, [this](wxSizeEvent& event) {
+    CallAfter([this] { ShowCount(); });
+    event.Skip();
+  });
   files_ = std::make_unique<FileActions>(*this);
   batches_ = std::make_unique<BatchRunner>(*this);
   Bind(wxEVT_CLOSE_WINDOW, &MainFrame::OnClose, this);
@@ -67,6 +72,7 @@ MainFrame::MainFrame()
 }
 
 MainFrame::~MainFrame() {
+  questions_.clear();
   // Their threads call back into this window and its children.
   batches_.reset();
   files_.reset();
@@ -79,11 +85,25 @@ void MainFrame::ShowStartFolder(std::string folder, bool restore) {
   const bool restored = restore && session_->RestoreTabs();
   if (folder.empty() && (restored || tabs_->Front() != nullptr)) return;
   if (folder.empty()) folder = platform::SpecialFolderPath(platform::SpecialFolder::Pictures);
-  tabs_->Show(platform::IsFolder(folder) ? folder : platform::CurrentFolder());
+  tabs_->Show(folder.empty() ? platform::CurrentFolder() : folder);
 }
 
 void MainFrame::OpenStart(const std::string& path, bool restore) {
-  if (path.empty() || platform::IsFolder(path)) return ShowStartFolder(path, restore);
+  if (path.empty()) return ShowStartFolder({}, restore);
+  AskKind(path, [this, path, restore](platform::FileKind kind) { Open(path, kind, restore); });
+}
+
+// Asks what a path is; several questions may be pending.
+void MainFrame::AskKind(const std::string& path, std::function<void(platform::FileKind)> then) {
+  std::erase_if(questions_, [](const auto& question) { return !question->Pending(); });
+  questions_.push_back(std::make_unique<FileQuestion>());
+  questions_.back()->Ask<platform::FileKind>(
+      [path] { return platform::FactsOf(path).kind; }, std::move(then),
+      [this, path] { Report(Tr("Waiting for %1...", path)); }, platform::FileKind::Other);
+}
+
+void MainFrame::Open(const std::string& path, platform::FileKind kind, bool restore) {
+  if (kind == platform::FileKind::Folder) return ShowStartFolder(path, restore);
   NoteRecentFile(path);
   const std::string folder = platform::AbsolutePath(path + "/..");
   if (NeedsExternalProgram(path)) {
@@ -94,8 +114,10 @@ void MainFrame::OpenStart(const std::string& path, bool restore) {
 }
 
 void MainFrame::OpenPath(const std::string& path) {
-  if (!platform::FileExists(path)) return Report(Tr("%1 no longer exists.", path));
-  OpenStart(path, false);
+  AskKind(path, [this, path](platform::FileKind kind) {
+    if (kind == platform::FileKind::Missing) return Report(Tr("%1 no longer exists.", path));
+    Open(path, kind, false);
+  });
 }
 
 // Adds a file to the list of recent files, keeping the number of an entry from another version.
@@ -110,10 +132,18 @@ void MainFrame::BrowserChanged() {
   const BrowserModel& model = browser.Model();
   const wxString title = FolderLabel(model.Folder()) + " - " + kTitle;
   if (GetTitle() != title) SetTitle(title);
-  SetStatusText(Shown(model.CountText()), kCountField);
+  count_ = Shown(model.CountText());
+  ShowCount();
   pictures_->OfferList(browser);
   folders_->Follow(model.Folder());
   side_->Follow(model);
+}
+
+// The status bar cannot draw before it has a size.
+void MainFrame::ShowCount() {
+  wxRect field;
+  if (GetStatusBar()->GetFieldRect(kCountField, field) && field.width > 0)
+    SetStatusText(count_, kCountField);
 }
 
 void MainFrame::FilesChanged() {

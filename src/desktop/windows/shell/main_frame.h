@@ -2,11 +2,15 @@
 
 #include <wx/frame.h>
 
+#include <functional>
 #include <memory>
 #include <string>
+#include <vector>
 
 #include "desktop/windows/browser/thumbnail_service.h"
 #include "desktop/windows/shell/shell.h"
+#include "desktop/windows/widgets/file_question.h"
+#include "platform/files.h"
 
 namespace fotomill::desktop {
 
@@ -44,10 +48,14 @@ class MainFrame : public wxFrame, public Shell {
 
  private:
   void BrowserChanged();
+  void ShowCount();
+  void AskKind(const std::string& path, std::function<void(platform::FileKind)> then);
+  void Open(const std::string& path, platform::FileKind kind, bool restore);
   void ShowStartFolder(std::string folder, bool restore);
   void NoteRecentFile(const std::string& path);
   void OnClose(wxCloseEvent& event);
 
+  wxString count_;  // of the status bar
   ThumbnailService thumbnails_;
   std::unique_ptr<UseRecorder> uses_;
   std::unique_ptr<FrameMenus> menus_;
@@ -60,6 +68,7 @@ class MainFrame : public wxFrame, public Shell {
   std::unique_ptr<ExternalPrograms> programs_;
   std::unique_ptr<FileActions> files_;
   std::unique_ptr<BatchRunner> batches_;
+  std::vector<std::unique_ptr<FileQuestion>> questions_;
 };
 
 }  // namespace fotomill::desktop

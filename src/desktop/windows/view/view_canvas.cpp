@@ -40,7 +40,8 @@ ViewCanvas::ViewCanvas(wxWindow* parent, Events events)
   SetBackgroundStyle(wxBG_STYLE_PAINT);
   Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxWANTS_CHARS | wxBORDER_NONE,
          Label("Picture"));
-  scaler_ = std::make_unique<ViewScaler>([this] { CallAfter([this] { ScaledCame(); }); });
+  scaler_ = std::make_unique<ViewScaler>(
+      [this, post = calls_.Poster()] { post([this] { ScaledCame(); }); });
   transform_.SetModeFromKey(settings.DefaultViewZoom);
   Bind(wxEVT_PAINT, &ViewCanvas::OnPaint, this);
   Bind(wxEVT_SIZE, &ViewCanvas::OnSize, this);
@@ -52,7 +53,7 @@ ViewCanvas::ViewCanvas(wxWindow* parent, Events events)
   Bind(wxEVT_MOUSE_CAPTURE_LOST, [](wxMouseCaptureLostEvent&) {});
 }
 
-ViewCanvas::~ViewCanvas() { scaler_.reset(); }  // its thread calls back into this window
+ViewCanvas::~ViewCanvas() { DestroyInBackground(std::move(scaler_)); }
 
 void ViewCanvas::Show(ViewPicturePointer picture) {
   picture_ = std::move(picture);

@@ -11,6 +11,7 @@
 #include "desktop/models/view/view_drawing.h"
 #include "desktop/models/view/view_picture.h"
 #include "desktop/models/view/view_transform.h"
+#include "desktop/windows/widgets/window_calls.h"
 
 namespace fotomill::desktop {
 
@@ -106,6 +107,7 @@ class ViewCanvas : public wxWindow {
   Color around_;
   wxBitmap drawn_;  // the picture as last painted
   wxPoint drag_;
+  const WindowCalls calls_;  // of the scaler
   std::unique_ptr<ViewScaler> scaler_;
 };
 

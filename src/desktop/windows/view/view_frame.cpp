@@ -49,10 +49,11 @@ ViewFrame::ViewFrame(Shell& shell, const std::vector<std::string>& list, const s
                   .show = [this](size_t place) { GoTo(place); }}) {
   TakeList(list, file);
   SetSize(shell.Window().GetSize());
+  const WindowCalls::Post post = calls_.Poster();
   loader_ = std::make_unique<ViewLoader>(
-      kAheadBytes, [this] { CallAfter([this] { PictureCame(); }); },
-      [this](const std::string& path, int percent) {
-        CallAfter([this, path, percent] { ShowProgress(path, percent); });
+      kAheadBytes, [this, post] { post([this] { PictureCame(); }); },
+      [this, post](const std::string& path, int percent) {
+        post([this, path, percent] { ShowProgress(path, percent); });
       });
   BuildCanvas();
   bar_ = new AnimationBar(this,
@@ -106,9 +107,8 @@ void ViewFrame::BuildCanvas() {
 }
 
 ViewFrame::~ViewFrame() {
-  // Their threads call back into this window.
-  animation_.reset();
-  loader_.reset();
+  animation_.reset();  // before the windows that it uses
+  DestroyInBackground(std::move(loader_));
   overlayBar_.reset();
   if (shown_) shell_.Window().CallAfter(shown_);
 }
@@ -190,14 +190,26 @@ bool ViewFrame::AskForPicture() {
   keyTime_ = platform::MonotonicSeconds();
   WantPictures();
   canvas_->SetNote({});
-  ViewPicturePointer ready = loader_->Find(RequestOf(place_));
-  if (ready != nullptr && ready->HasChanged()) {
-    loader_->Forget(list_[place_]);
-    WantPictures();
-    ready = nullptr;
-  }
-  if (ready != nullptr) ShowPicture(ready);
-  return ready != nullptr;
+  const ViewPicturePointer ready = loader_->Find(RequestOf(place_));
+  if (ready == nullptr) return false;
+  ShowPicture(ready);
+  ReloadIfChanged();
+  return true;
+}
+
+// Whether the file of the picture shown has changed is asked in the background.
+void ViewFrame::ReloadIfChanged() {
+  if (loaded_ == nullptr || saving_) return;
+  changes_.Ask<bool>(
+      [picture = loaded_] {
+        return picture->HasChanged() && platform::IsRegularFile(picture->request.path);
+      },
+      [this, picture = loaded_](bool changed) {
+        if (!changed || saving_ || loaded_ != picture) return;
+        loader_->Forget(list_[place_]);
+        loaded_.reset();
+        StartAfresh();
+      });
 }
 
 // Shows the browser's thumbnail, if any, until the picture is loaded.
@@ -423,9 +435,14 @@ void ViewFrame::Leave() {
 
 void ViewFrame::DeleteFile() {
   const std::string path = list_[place_];
-  if (!shell_.Files().TrashFromView(this, path)) return;
+  shell_.Files().TrashFromView(this, path, [self = wxWeakRef<ViewFrame>(this), path] {
+    if (self) self->FileGone(path);
+  });
+}
+
+void ViewFrame::FileGone(const std::string& path) {
   loader_->Forget(path);
-  // A slideshow may have advanced while the user was asked.
+  // The user or a slideshow may have advanced meanwhile.
   const auto gone = std::ranges::find(list_, path);
   if (gone == list_.end()) return;
   const auto place = static_cast<size_t>(gone - list_.begin());
@@ -470,14 +487,7 @@ void ViewFrame::SaveTurned() {
                         : Label("Please wait for the previous file operation."));
 }
 
-void ViewFrame::FilesChanged() {
-  if (loaded_ == nullptr || saving_ || !loaded_->HasChanged() ||
-      !platform::IsRegularFile(list_[place_]))
-    return;
-  loader_->Forget(list_[place_]);
-  loaded_.reset();
-  StartAfresh();
-}
+void ViewFrame::FilesChanged() { ReloadIfChanged(); }
 
 void ViewFrame::Undo() {
   if (saving_) return wxBell();

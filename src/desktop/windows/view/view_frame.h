@@ -11,6 +11,8 @@
 #include "desktop/models/view/view_picture.h"
 #include "desktop/windows/view/view_canvas.h"
 #include "desktop/windows/view/view_slideshow.h"
+#include "desktop/windows/widgets/file_question.h"
+#include "desktop/windows/widgets/window_calls.h"
 
 namespace fotomill::desktop {
 
@@ -64,6 +66,8 @@ class ViewFrame : public wxFrame {
   void ShowStandIn();
   void WantPictures();
   void Resized();
+  void ReloadIfChanged();
+  void FileGone(const std::string& path);
   void PictureCame();
   void ShowProgress(const std::string& path, int percent);
   void ShowPicture(ViewPicturePointer picture);
@@ -102,6 +106,8 @@ class ViewFrame : public wxFrame {
   std::unique_ptr<OverlayBar> overlayBar_;
   std::unique_ptr<ViewAnimation> animation_;
   ViewSlideshow slideshow_;
+  FileQuestion changes_;
+  const WindowCalls calls_;  // of the loader
   std::unique_ptr<ViewLoader> loader_;
   int loadedPercent_ = 0;  // loading progress, if shown
 };
