@@ -75,7 +75,7 @@ Status ReadPictureReport(const SideOptions& options, const StopToken& stop, Side
 
 void CountFolder(const StopToken& stop, SideReport& report) {
   const FolderListing listing = ListForBrowser(report.path, false, stop);
-  if (!listing.readable) {
+  if (listing.state != FolderState::Listed) {
     report.remark = Tr("This folder cannot be read.");
     return;
   }
