@@ -148,7 +148,8 @@ Outcome DoStep(FileOperationKind kind, const FileStep& step) {
     case FileOperationKind::Copy: return CopyTree(step.from, step.to, 0);
     case FileOperationKind::Create: return Restore(step.to);
     case FileOperationKind::Turn:
-    case FileOperationKind::Tag: return Exchange(step);
+    case FileOperationKind::Tag:
+    case FileOperationKind::Change: return Exchange(step);
     case FileOperationKind::Trash: break;
   }
   return TrashOne(step.from);
@@ -173,7 +174,8 @@ Outcome UndoStep(FileOperationKind kind, const FileStep& step) {
     case FileOperationKind::Copy: return RemoveCopy(step);
     case FileOperationKind::Create: return TrashOne(step.to);
     case FileOperationKind::Turn:
-    case FileOperationKind::Tag: return Exchange(step);
+    case FileOperationKind::Tag:
+    case FileOperationKind::Change: return Exchange(step);
     case FileOperationKind::Trash: break;
   }
   return Restore(step.from);
@@ -189,6 +191,7 @@ PictureChange ChangeBy(FileOperationKind kind, const FileStep& step, bool back) 
     case FileOperationKind::Create: return {step.to};
     case FileOperationKind::Turn:
     case FileOperationKind::Tag:
+    case FileOperationKind::Change:
     case FileOperationKind::Trash: break;
   }
   return {step.from};
@@ -198,7 +201,9 @@ PictureChange ChangeBy(FileOperationKind kind, const FileStep& step, bool back) 
 // thumbnail file of its name; databases at the end.
 void SettleThumbnailFile(FileOperationKind kind, const PictureChange& change) {
   if (!change.to.empty()) return FollowThumbnailFile(change.path, change.to);
-  if (kind == FileOperationKind::Turn || kind == FileOperationKind::Tag) return;  // already deleted
+  const bool contents = kind == FileOperationKind::Turn || kind == FileOperationKind::Tag ||
+                        kind == FileOperationKind::Change;
+  if (contents) return;  // already deleted
   if (platform::ExistenceOf(change.path) == platform::Existence::No)
     return DeleteThumbnailFile(change.path);
   DeleteMisleadingThumbnailFile(change.path);
@@ -315,6 +320,7 @@ std::vector<FileUse> UsesOf(const FileOperation& operation, bool back) {
         break;
       case FileOperationKind::Turn:
       case FileOperationKind::Tag:
+      case FileOperationKind::Change:
         if (!back) use(step.from, FileFunction::Transform);
         break;
       case FileOperationKind::Trash:
@@ -348,6 +354,9 @@ std::string FileOperationName(const FileOperation& operation) {
                    TrCount("rotation of %1 file", "rotation of %1 files", count));
     case FileOperationKind::Tag:
       return named(TrLater("tags of %1"), TrCount("tags of %1 file", "tags of %1 files", count));
+    case FileOperationKind::Change:
+      return named(TrLater("change of %1"),
+                   TrCount("change of %1 file", "change of %1 files", count));
     case FileOperationKind::Trash: break;
   }
   return named(TrLater("deletion of %1"),

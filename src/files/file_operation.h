@@ -20,6 +20,7 @@ enum class FileOperationKind {
   Create,  // a function wrote `to` from `from`; no file was replaced
   Turn,    // the picture in `from` was rotated or flipped
   Tag,     // keywords, ratings and the like were changed in `from`, a picture or its sidecar
+  Change,  // the contents of `from` were changed
 };
 
 class PreviousFile;
@@ -27,8 +28,8 @@ class PreviousFile;
 // One file of an operation; absolute paths.
 struct FileStep {
   std::string from;
-  std::string to;                               // empty for Trash, Turn and Tag
-  // Turn, Tag: the previous contents; after Revert, those before the undo
+  std::string to;  // empty for Trash, Turn, Tag and Change
+  // Turn, Tag, Change: the previous contents; after Revert, those before the undo
   std::shared_ptr<PreviousFile> previous = {};
 };
 

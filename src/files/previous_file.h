@@ -33,15 +33,19 @@ class PreviousFile {
 // The previous files of one batch. Thread-safe.
 class PreviousFiles {
  public:
+  // `kind`: of the operation, Turn, Tag or Change.
+  explicit PreviousFiles(FileOperationKind kind = FileOperationKind::Turn) : kind_(kind) {}
   // Call before replacing a file. If false, do not replace it.
   [[nodiscard]] bool Keep(const std::string& path);
   // Call right after replacing a file passed to Keep; later changes are attributed to other
   // programs.
   void Replaced(const std::string& path);
   // An operation with all replaced files, ordered by path; ownership moves to the caller.
-  FileOperation Operation(FileOperationKind kind = FileOperationKind::Turn);
+  FileOperation Operation() { return Operation(kind_); }
+  FileOperation Operation(FileOperationKind kind);
 
  private:
+  const FileOperationKind kind_;
   std::mutex mutex_;
   std::map<std::string, std::shared_ptr<PreviousFile>> kept_, replaced_;
 };

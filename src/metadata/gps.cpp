@@ -41,14 +41,6 @@ bool TakeAngle(std::string_view& text, GpsAngle& angle) {
   return std::isfinite(angle.seconds);
 }
 
-// With a point, regardless of language.
-std::string PlainDecimal(double number) {
-  char text[32];
-  const auto [end, error] =
-      std::to_chars(text, text + sizeof text, number, std::chars_format::fixed, 5);
-  return error == std::errc{} ? std::string(text, end) : std::string();
-}
-
 }  // namespace
 
 bool ParseGpsLocation(std::string_view text, GpsLocation& location) {
@@ -76,6 +68,13 @@ double GpsDegrees(const GpsAngle& angle) {
   return sign * (angle.degrees + angle.minutes / 60.0 + angle.seconds / 3600.0);
 }
 
+std::string GpsDegreesText(double degrees) {
+  char text[32];
+  const auto [end, error] =
+      std::to_chars(text, text + sizeof text, degrees, std::chars_format::fixed, 5);
+  return error == std::errc{} ? std::string(text, end) : std::string();
+}
+
 std::string GpsPlaceText(double latitude, double longitude) {
   const auto angle = [](double degrees, const char* hemispheres) {
     const int64_t hundredths = std::llround(std::abs(degrees) * 360000);  // of seconds
@@ -85,8 +84,8 @@ std::string GpsPlaceText(double latitude, double longitude) {
                   hemispheres[degrees < 0 ? 1 : 0]);
     return std::string(text);
   };
-  return angle(latitude, "NS") + ", " + angle(longitude, "EW") + " (" + PlainDecimal(latitude) +
-         ", " + PlainDecimal(longitude) + ")";
+  return angle(latitude, "NS") + ", " + angle(longitude, "EW") + " (" + GpsDegreesText(latitude) +
+         ", " + GpsDegreesText(longitude) + ")";
 }
 
 double GpsDistance(double latitude1, double longitude1, double latitude2, double longitude2,

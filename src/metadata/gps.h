@@ -30,6 +30,9 @@ struct GpsLocation {
 // Decimal degrees, negative for "W" and "S" in either case.
 double GpsDegrees(const GpsAngle& angle);
 
+// Decimal degrees with five decimals and a point in every locale, as ParseGpsDegrees reads them.
+std::string GpsDegreesText(double degrees);
+
 // A position as text that maps also accept:
 // "45° 19' 48.00\" N, 79° 13' 12.00\" W (45.33000, -79.22000)".
 std::string GpsPlaceText(double latitude, double longitude);

@@ -38,7 +38,7 @@ TEST(Gps, PlacesAreReadable) {
 }
 
 // What a GPS directory says about the latitude; the longitude is 10 degrees east.
-std::optional<ExifPlace> PlaceTaken(const std::vector<uint32_t>& numbers, char hemisphere) {
+std::optional<ExifPosition> PlaceTaken(const std::vector<uint32_t>& numbers, char hemisphere) {
   BlockBuilder builder;
   const auto rationals = [&](const std::vector<uint32_t>& values) {
     std::vector<uint8_t> bytes;
@@ -76,7 +76,7 @@ TEST(Gps, FindsPlacesInBlocks) {
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
-    const std::optional<ExifPlace> place = PlaceTaken(row.numbers, row.hemisphere);
+    const std::optional<ExifPosition> place = PlaceTaken(row.numbers, row.hemisphere);
     ASSERT_EQ(place.has_value(), row.latitude.has_value());
     if (!place) continue;
     EXPECT_NEAR(place->latitude, *row.latitude, 1e-9);

@@ -136,6 +136,29 @@ CountRange CountsOf(const ExifTag& row) {
   }
 }
 
+struct CodedWord {
+  std::string_view word;
+  int32_t code;
+};
+
+// The items of a tag's word list that can be set, with their codes.
+std::vector<CodedWord> CodedWords(const ExifTag& row) {
+  // the word list has directions here, but the standard has units
+  if (row.tag == kDistanceReference) return {{"K", 'K'}, {"M", 'M'}, {"N", 'N'}};
+  const ExifWordList& list = *row.words;
+  const auto items = static_cast<int32_t>(std::ranges::count(list.words, ';')) + 1;
+  std::vector<CodedWord> words;
+  for (int32_t i = 0; i < items; ++i) {
+    const int32_t code = list.codes.empty() ? i
+                         : static_cast<size_t>(i) < list.codes.size()
+                             ? list.codes[static_cast<size_t>(i)]
+                             : -1;
+    if (code >= 0 && !(row.tag == kOrientation && code == 0))
+      words.push_back({ListItem(list.words, i), code});
+  }
+  return words;
+}
+
 class Input {
  public:
   Input(const ExifTag& row, std::string_view text, ExifEntry& entry, std::string& reason)
@@ -255,28 +278,14 @@ class Input {
 
   // An item of the tag's word list, or its number or letter.
   bool Word() {
-    const ExifWordList& list = *row_.words;
-    const bool letters = list.key == ExifWordKey::Letter;
-    const int32_t items = static_cast<int32_t>(std::ranges::count(list.words, ';')) + 1;
+    const bool letters = row_.words->key == ExifWordKey::Letter;
     std::string allowed;
-    for (int32_t i = 0; i < items; ++i) {
-      const std::string_view word = ListItem(list.words, i);
-      const int32_t code = list.codes.empty() ? i
-                           : static_cast<size_t>(i) < list.codes.size()
-                               ? list.codes[static_cast<size_t>(i)]
-                               : -1;
-      if (code < 0 || (row_.tag == kOrientation && code == 0)) continue;
-      if (row_.tag == kDistanceReference) continue;
-      allowed.append(allowed.empty() ? "" : ", ").append(word);
+    for (const CodedWord& item : CodedWords(row_)) {
+      allowed.append(allowed.empty() ? "" : ", ").append(item.word);
       const std::string number =
-          letters ? std::string(1, static_cast<char>(code)) : std::to_string(code);
-      if (EqualIgnoringCase(text_, word) || EqualIgnoringCase(text_, number)) return Code(code);
-    }
-    // the word list has directions here, but the standard has units
-    if (row_.tag == kDistanceReference) {
-      const char unit = UpperCase(text_[0]);
-      if (text_.size() == 1 && (unit == 'K' || unit == 'M' || unit == 'N')) return Code(unit);
-      allowed = "K, M, N";
+          letters ? std::string(1, static_cast<char>(item.code)) : std::to_string(item.code);
+      if (EqualIgnoringCase(text_, item.word) || EqualIgnoringCase(text_, number))
+        return Code(item.code);
     }
     return NotAllowed(Tr("one of: %1.", allowed));
   }
@@ -372,6 +381,14 @@ class Input {
 };
 
 }  // namespace
+
+std::vector<std::string_view> ExifInputWords(uint16_t tag) {
+  std::vector<std::string_view> words;
+  const ExifTag* row = FindExifTag(tag);
+  if (row == nullptr || row->rule != ExifRule::Words) return words;
+  for (const CodedWord& item : CodedWords(*row)) words.push_back(item.word);
+  return words;
+}
 
 ExifPlace PlaceOfExifTag(uint16_t tag) {
   constexpr uint16_t kLastGpsTag = 0x001f;

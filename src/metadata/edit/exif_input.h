@@ -2,6 +2,7 @@
 
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "containers/directory_edit.h"
 
@@ -14,6 +15,9 @@ namespace fotomill {
 // hyphens or a T. The entry's values are little-endian. False, with the reason as a
 // sentence, for tags that cannot be edited and for invalid values.
 bool ParseExifInput(uint16_t tag, std::string_view text, ExifEntry& entry, std::string& reason);
+
+// The words of a tag's list that can be set, in list order; empty for tags without a list.
+std::vector<std::string_view> ExifInputWords(uint16_t tag);
 
 // The directory that the standard assigns to a tag.
 ExifPlace PlaceOfExifTag(uint16_t tag);

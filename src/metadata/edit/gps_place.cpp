@@ -3,13 +3,13 @@
 
 #include <algorithm>
 #include <cmath>
-#include <cstdio>
 
 #include "core/text.h"
 #include "metadata/edit/exif_dates.h"
 #include "metadata/edit/exif_input.h"
 #include "metadata/exif/exif_tags.h"
 #include "metadata/gps.h"
+#include "texts/texts.h"
 
 namespace fotomill {
 
@@ -65,13 +65,19 @@ std::string_view Trimmed(std::string_view text) {
   return text.substr(0, text.find_last_not_of(kBlanks) + 1);
 }
 
-bool ParsePlace(std::string_view text, GpsPlace& place) {
-  GpsLocation location;
-  if (ParseGpsDegrees(text, place.latitude, place.longitude)) return true;
-  if (!ParseGpsLocation(text, location)) return false;
-  place.latitude = GpsDegrees(location.latitude);
-  place.longitude = GpsDegrees(location.longitude);
-  return std::abs(place.latitude) <= 90 && std::abs(place.longitude) <= 360;
+// Calls `take` with the number of each line, and its place, if valid, until that returns false.
+template <typename Take>
+void EachPlace(std::string_view list, const Take& take) {
+  for (size_t number = 1; !list.empty(); ++number) {
+    const size_t end = std::min(list.find('\n'), list.size());
+    const std::string_view line = Trimmed(list.substr(0, end));
+    list.remove_prefix(std::min(end + 1, list.size()));
+    if (line.empty() || line[0] == '#' || line[0] == ';') continue;
+    const size_t equals = line.rfind('=');
+    const bool named = equals != std::string_view::npos && equals > 0;
+    const auto place = named ? ParseGpsPlace(line.substr(equals + 1)) : std::nullopt;
+    if (!take(number, Trimmed(line.substr(0, named ? equals : 0)), place)) return;
+  }
 }
 
 }  // namespace
@@ -112,11 +118,10 @@ std::optional<GpsPlace> PlaceOf(const ExifDirectories& directories) {
 }
 
 std::string MapLink(const GpsPlace& place) {
-  char link[160];
-  std::snprintf(link, sizeof link,
-                "https://www.openstreetmap.org/?mlat=%.5f&mlon=%.5f#map=15/%.5f/%.5f",
-                place.latitude, place.longitude, place.latitude, place.longitude);
-  return link;
+  const std::string latitude = GpsDegreesText(place.latitude),
+                    longitude = GpsDegreesText(place.longitude);
+  return "https://www.openstreetmap.org/?mlat=" + latitude + "&mlon=" + longitude + "#map=15/" +
+         latitude + "/" + longitude;
 }
 
 std::optional<int64_t> TakenUtc(const ExifDirectories& directories, std::optional<int64_t> offset) {
@@ -133,22 +138,47 @@ std::optional<int64_t> TakenUtc(const ExifDirectories& directories, std::optiona
   return {};
 }
 
+ExifChanges TrackPlace(const GpsTrack& track, std::optional<int64_t> offset,
+                       const ExifDirectories& old, std::string& reason) {
+  const auto time = TakenUtc(old, offset);
+  const auto place = time ? track.At(*time) : std::nullopt;
+  if (!time) reason = Tr("It does not tell when it was taken.");
+  if (time && !place)
+    reason = Tr("The track has no point within %1 minutes of its time.", GpsTrack::kMostGap / 60);
+  return place ? PlaceEntries(*place) : ExifChanges();
+}
+
+std::optional<GpsPlace> ParseGpsPlace(std::string_view text) {
+  GpsPlace place;
+  GpsLocation location;
+  text = Trimmed(text);
+  if (ParseGpsDegrees(text, place.latitude, place.longitude)) return place;
+  if (!ParseGpsLocation(text, location)) return {};
+  place.latitude = GpsDegrees(location.latitude);
+  place.longitude = GpsDegrees(location.longitude);
+  if (std::abs(place.latitude) > 90 || std::abs(place.longitude) > 360) return {};
+  return place;
+}
+
 std::optional<GpsPlace> FindListedPlace(std::string_view list, std::string_view name,
                                         size_t& badLine) {
   badLine = 0;
-  for (size_t number = 1; !list.empty(); ++number) {
-    const size_t end = std::min(list.find('\n'), list.size());
-    const std::string_view line = Trimmed(list.substr(0, end));
-    list.remove_prefix(std::min(end + 1, list.size()));
-    if (line.empty() || line[0] == '#' || line[0] == ';') continue;
-    const size_t equals = line.rfind('=');
-    GpsPlace place;
-    const bool good = equals != std::string_view::npos && equals > 0 &&
-                      ParsePlace(Trimmed(line.substr(equals + 1)), place);
-    if (!good && badLine == 0) badLine = number;
-    if (good && EqualIgnoringCase(Trimmed(line.substr(0, equals)), Trimmed(name))) return place;
-  }
-  return {};
+  std::optional<GpsPlace> found;
+  EachPlace(list, [&](size_t number, std::string_view lineName, const auto& place) {
+    if (!place && badLine == 0) badLine = number;
+    if (place && EqualIgnoringCase(lineName, Trimmed(name))) found = place;
+    return !found;
+  });
+  return found;
+}
+
+std::vector<ListedPlace> ListedPlaces(std::string_view list) {
+  std::vector<ListedPlace> places;
+  EachPlace(list, [&](size_t, std::string_view name, const auto& place) {
+    if (place) places.push_back({std::string(name), *place});
+    return true;
+  });
+  return places;
 }
 
 }  // namespace fotomill

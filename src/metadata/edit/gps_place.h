@@ -51,11 +51,24 @@ class GpsTrack {
 // EXIF offset, if any. None for pictures without a time.
 std::optional<int64_t> TakenUtc(const ExifDirectories& directories, std::optional<int64_t> offset);
 
+// The changes for a file taken on a track; a reason if it has no time, or no point is close.
+ExifChanges TrackPlace(const GpsTrack& track, std::optional<int64_t> offset,
+                       const ExifDirectories& old, std::string& reason);
+
+// Parses a place: "LAT,LON" in decimal degrees, or "45,19,48.000,N,79,13,12.000,W".
+std::optional<GpsPlace> ParseGpsPlace(std::string_view text);
+
 // Looks up a place in a list with lines of the form NAME = LAT,LON, in decimal degrees or as
 // "45,19,48.000,N,79,13,12.000,W". Empty lines and lines starting with # or ; are ignored. Names
 // are case-insensitive. `badLine` is the number of the first invalid line before the match, counted
 // from 1; 0 if there is none.
 std::optional<GpsPlace> FindListedPlace(std::string_view list, std::string_view name,
                                         size_t& badLine);
+// All places of such a list, in its order; invalid lines are left out.
+struct ListedPlace {
+  std::string name;
+  GpsPlace place;
+};
+std::vector<ListedPlace> ListedPlaces(std::string_view list);
 
 }  // namespace fotomill

@@ -37,10 +37,10 @@ class PlaceFinder : public ExifSink {
       letters_[tag] = UpperCase(static_cast<char>(line.value.bytes.U8(0)));
     angles_[tag] = AngleOf(line.value);
   }
-  std::optional<ExifPlace> Place(uint16_t latitude, uint16_t longitude) const {
+  std::optional<ExifPosition> Place(uint16_t latitude, uint16_t longitude) const {
     const auto north = Signed(latitude, "NS", 90), east = Signed(longitude, "EW", 180);
     if (!north || !east) return std::nullopt;
-    return ExifPlace{*north, *east};
+    return ExifPosition{*north, *east};
   }
 
  private:

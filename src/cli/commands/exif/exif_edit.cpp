@@ -15,7 +15,7 @@
 #include "metadata/exif/exif_tags.h"
 #include "platform/existence.h"
 #include "platform/file_view.h"
-#include "settings/settings.h"
+#include "settings/exif_settings.h"
 #include "texts/name_hint.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
@@ -140,29 +140,6 @@ std::optional<int64_t> TakeShift(std::vector<std::string>& names) {
   const auto shift = ParseTimeShift(*found);
   names.erase(found);
   return shift;
-}
-
-// Changes for all Exif keys that are set; tags of empty keys are not changed. False, with a reason,
-// for a value that the tag does not allow.
-bool OwnerChanges(ExifChanges& changes, std::string& reason) {
-  const struct {
-    uint16_t tag;
-    const SettingText& value;
-  } keys[] = {{0x013b, settings.ExifPersonWhoCreatedImage}, {0x8298, settings.ExifCopyrightHolder},
-              {0xa430, settings.ExifCameraOwnerName},       {0x0131, settings.ExifSoftwareName},
-              {0x010f, settings.ExifEquipmentManufacturer}, {0x0110, settings.ExifEquipmentModel},
-              {0x010e, settings.ExifNewImageTitle}};
-  for (const auto& key : keys) {
-    if (key.value.view().empty()) continue;
-    ExifEntry entry;
-    if (!ParseExifInput(key.tag, key.value.view(), entry, reason)) return false;
-    changes.push_back({PlaceOfExifTag(key.tag), key.tag, std::move(entry)});
-  }
-  if (changes.empty())
-    reason =
-        Tr("No owner is configured; set ExifPersonWhoCreatedImage, ExifCopyrightHolder or another "
-           "of these keys.");
-  return reason.empty();
 }
 
 // Parses a list of names to flags; none, after printing a message, for an unknown name.

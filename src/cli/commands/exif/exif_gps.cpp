@@ -5,15 +5,11 @@
 
 #include "cli/commands/exif/exif_edit.h"
 #include "cli/frame/options.h"
-#include "core/data_folder.h"
-#include "core/limits.h"
 #include "metadata/edit/exif_dates.h"
 #include "metadata/edit/gps_place.h"
 #include "metadata/gps.h"
 #include "platform/file_view.h"
-#include "platform/files.h"
-#include "platform/paths.h"
-#include "settings/settings.h"
+#include "settings/exif_settings.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
 
@@ -26,26 +22,17 @@ struct GpsOptions {
   std::string gpx, offset, at, place;
 };
 
-// The path from ExifLocationsFile: a plain name is in the data folder.
-std::string LocationsPath() {
-  const std::string name(settings.ExifLocationsFile.view());
-  return platform::SplitPath(name).folder.empty() ? DataFile(name) : name;
-}
-
 // Looks up a place by name. Returns an error message, empty on success.
 std::string ReadListedPlace(const std::string& name, GpsPlace& place) {
-  const std::string path = LocationsPath();
-  platform::FileView file;
-  if (path.empty() || !file.Open(path) || file.FileSize() > limits.listFileBytes)
-    return WithReason(Tr("\"%1\" cannot be read.", path));
-  const auto bytes = file.Bytes();
-  const std::string list(bytes.begin(), bytes.end());
+  std::string list;
+  if (const std::string wrong = ReadLocations(list); !wrong.empty()) return wrong;
   size_t badLine = 0;
   const auto found = FindListedPlace(list, name, badLine);
   if (found) {
     place = *found;
     return {};
   }
+  const std::string path = LocationsPath();
   if (badLine != 0) return Tr("Line %1 of \"%2\" is not a place: NAME = LAT,LON.", badLine, path);
   return Tr("There is no place \"%1\" in \"%2\".", name, path);
 }
@@ -68,14 +55,8 @@ std::string MakeChanger(const GpsOptions& options, ExifChanger& changer) {
     return Tr("\"%1\" is not an offset such as +1:30:00.", options.offset);
   if (!options.gpx.empty()) {
     const auto track = std::make_shared<GpsTrack>();
-    changer = [track, offset](const ExifDirectories& old, std::string& reason) -> ExifChanges {
-      const auto time = TakenUtc(old, offset);
-      const auto place = time ? track->At(*time) : std::nullopt;
-      if (!time) reason = Tr("It does not tell when it was taken.");
-      if (time && !place)
-        reason =
-            Tr("The track has no point within %1 minutes of its time.", GpsTrack::kMostGap / 60);
-      return place ? PlaceEntries(*place) : ExifChanges();
+    changer = [track, offset](const ExifDirectories& old, std::string& reason) {
+      return TrackPlace(*track, offset, old, reason);
     };
     return ReadTrack(options.gpx, *track);
   }

@@ -57,7 +57,7 @@ void AddPlaces(const ExifPlaces& places, const ExifReportOptions& options, ExifR
   if (!places.taken && !places.destination) return;
   report.rows.push_back({true, 0, Tr("Places"), {}});
   report.text.append(Tr("Places")).append("\n");
-  const auto distance = [&](const ExifPlace& from, const ExifPlace& to) {
+  const auto distance = [&](const ExifPosition& from, const ExifPosition& to) {
     return DecimalText(
                GpsDistance(from.latitude, from.longitude, to.latitude, to.longitude, options.unit),
                1) +
@@ -97,7 +97,7 @@ ExifReportOptions ExifReportOptionsFromSettings() {
   options.tags.exif = false;
   GpsLocation home;
   if (GpsLocationFromSettings(home))
-    options.home = ExifPlace{GpsDegrees(home.latitude), GpsDegrees(home.longitude)};
+    options.home = ExifPosition{GpsDegrees(home.latitude), GpsDegrees(home.longitude)};
   return options;
 }
 

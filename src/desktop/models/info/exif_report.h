@@ -25,7 +25,7 @@ struct ExifRow {
 // Options of a report.
 struct ExifReportOptions {
   ExifTextOptions text = {};
-  std::optional<ExifPlace> home = {};  // start of distances; none: no distances
+  std::optional<ExifPosition> home = {};  // start of distances; none: no distances
   choice::DistanceUnit unit = choice::kMiles;
   TagSources tags = {.exif = false};
 };

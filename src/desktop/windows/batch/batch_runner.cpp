@@ -140,7 +140,8 @@ void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   LogEvent("batch", "ended status=" + std::to_string(StatusNumber(status)));
   shell_.Uses().Note(job.uses);
   // Outputs, but not renamed files.
-  if (job.formatIndex != kNoFormat) shell_.Files().NoteDone(std::exchange(written_, {}));
+  if (job.formatIndex != kNoFormat || previous_ != nullptr)
+    shell_.Files().NoteDone(std::exchange(written_, {}));
   if (previous_ != nullptr) shell_.Files().NoteDone(std::exchange(previous_, nullptr)->Operation());
   if (job.filesChanged) shell_.FilesChanged();
   if (!seen_ && settings.ProgressRaiseAppWindow != 0) RaiseProgram();

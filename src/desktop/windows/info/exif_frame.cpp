@@ -13,6 +13,7 @@
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/info/text_actions.h"
+#include "desktop/windows/metadata/exif_edit_frame.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/bitmaps.h"
 #include "desktop/windows/widgets/button_row.h"
@@ -51,15 +52,20 @@ ExifFrame::ExifFrame(Shell& shell, wxWindow* parent, const std::string& path)
 
   const RowButton rows[] = {
       {wxID_COPY, TrLater("&Copy value"), [this] { CopyText(SelectedValue()); }},
-      {wxID_SELECTALL, TrLater("Copy &all"), [this] { CopyText(wxString::FromUTF8(report_.text)); }},
-      {wxID_SAVEAS, TrLater("&Save as text..."), [this] { SaveTextAs(*this, "exif.txt", report_.text); }},
+      {wxID_SELECTALL, TrLater("Copy &all"),
+       [this] { CopyText(wxString::FromUTF8(report_.text)); }},
+      {wxID_SAVEAS, TrLater("&Save as text..."),
+       [this] { SaveTextAs(*this, "exif.txt", report_.text); }},
       {wxID_SAVE, TrLater("Save &thumbnail..."), [this] { SaveThumbnail(); }},
       {wxID_PRINT, TrLater("&Print..."), [this] { PrintText(*this, GetTitle(), report_.text); }},
+      {wxID_EDIT, TrLater("&Edit..."),
+       [this] { (new ExifEditFrame(shell_, GetParent(), {path_}))->Show(); }},
       {wxID_CLOSE, TrLater("C&lose"), [this] { Close(); }},
   };
   wxSizer* buttons = BuildButtonRow(*this, *panel, rows);
   // until the file has been read
-  for (const RowButton& row : rows) FindWindow(row.id)->Enable(row.id == wxID_CLOSE);
+  for (const RowButton& row : rows)
+    FindWindow(row.id)->Enable(row.id == wxID_CLOSE || row.id == wxID_EDIT);
   auto* column = new wxBoxSizer(wxVERTICAL);
   column->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
   column->Add(middle, wxSizerFlags(1).Expand().Border(wxALL, gap));

@@ -8,6 +8,8 @@
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/files/open_dialog.h"
 #include "desktop/windows/files/sequential_rename_dialog.h"
+#include "desktop/windows/metadata/exif_edit_frame.h"
+#include "desktop/windows/metadata/strip_dialog.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/folder_pane.h"
 #include "desktop/windows/shell/frame_session.h"
@@ -203,6 +205,8 @@ constexpr Command kCommands[] = {
     {kFunctions, TrLater("Rotate r&ight"),  "Ctrl+Alt+R",   TrLater("Rotates the selected files; JPEG losslessly."), Needs::Files, Turn<Orientation::QuarterRight>, nullptr, true},
     {kFunctions, TrLater("&Get info..."),   "Alt+Return",   TrLater("Shows information about the selected files."), Needs::Files, ShowInfo, "info", true},
     {kFunctions, TrLater("E&XIF..."),       "Alt+Shift+Return", TrLater("Shows the EXIF data of the focused picture."), Needs::Files, ShowExif, "exif", true},
+    {kFunctions, TrLater("Remove metada&ta..."), "Ctrl+Alt+M", TrLater("Removes EXIF, GPS, comments and other metadata from the selected files."), Needs::Files, StripSelection, nullptr, true},
+    {kFunctions, TrLater("Edit EXI&F..."),  "Ctrl+Alt+E",   TrLater("Changes EXIF values, times and places of the selected files."), Needs::Files, EditExifOfSelection, nullptr, true},
     {kFunctions, nullptr},
     {kFunctions, TrLater("C&opy to..."),    "F7",           TrLater("Copies the selected files to a folder."), Needs::Item, CopySelectionTo, "copy", true},
     {kFunctions, TrLater("&Move to..."),    "F6",           TrLater("Moves the selected files to a folder."), Needs::Item, MoveSelectionTo, "move", true},

@@ -4,6 +4,7 @@
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/compare/compare_frame.h"
 #include "desktop/windows/files/open_with.h"
+#include "desktop/windows/metadata/exif_edit_frame.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 
@@ -60,6 +61,7 @@ void PictureWindows::FilesChanged() {
     if (auto* view = dynamic_cast<ViewFrame*>(window)) view->FilesChanged();
     if (auto* compare = dynamic_cast<CompareFrame*>(window)) compare->FilesChanged();
   }
+  RefreshExifEditors();
 }
 
 }  // namespace fotomill::desktop

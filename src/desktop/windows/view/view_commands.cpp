@@ -60,6 +60,7 @@ constexpr KeyCommand<ViewFrame> kCommands[] = {
     {TrLater("Apply color pro&file"), "M",    {'M'},                           Switch<&Settings::ViewModeColorProfiles>, IsOn<&Settings::ViewModeColorProfiles>},
     {TrLater("Check&erboard behind transparency"), "B", {'B'},                   Switch<&Settings::ViewModeCheckerboard>, IsOn<&Settings::ViewModeCheckerboard>},
     {TrLater("G&et info..."),      "Alt+Enter", {},                              Of<&ViewFrame::ShowInfoWindow>},
+    {TrLater("Edit EXIF..."),      "E",         {'E'},                           Of<&ViewFrame::EditExif>},
     {nullptr, nullptr, {}, nullptr},
     {TrLater("Rotate &left"),      "L",         {'L'},                           Turn<Orientation::QuarterLeft>},
     {TrLater("Rotate &right"),     "R",         {'R'},                           Turn<Orientation::QuarterRight>},

@@ -14,6 +14,7 @@
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/info/info_frame.h"
+#include "desktop/windows/metadata/exif_edit_frame.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/view/animation_bar.h"
@@ -411,6 +412,8 @@ void ViewFrame::ChooseSlideshow() {
 }
 
 void ViewFrame::ShowInfoWindow() { (new InfoFrame(shell_, this, {list_[place_]}))->Show(); }
+
+void ViewFrame::EditExif() { (new ExifEditFrame(shell_, this, {list_[place_]}))->Show(); }
 
 void ViewFrame::ToggleOverlay() {
   overlay_ = !overlay_;

@@ -46,6 +46,7 @@ class ViewFrame : public wxFrame {
   void CopyPicture();  // to the clipboard, on the view background
   void DeleteFile();  // moves it to the trash and shows the next one
   void ShowInfoWindow();        // for the current file
+  void EditExif();              // of the current file
   void Turn(Orientation turn);  // turns the view only; nothing is written
   void SaveTurned();            // saves the file as displayed
   void Undo();                  // undoes turning the view, or else the last file operation

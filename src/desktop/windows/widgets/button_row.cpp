@@ -22,7 +22,8 @@ wxSizer* BuildButtonRow(wxFrame& frame, wxWindow& panel, std::span<const RowButt
     const bool closes = row.id == wxID_CLOSE;
     if (closes) buttons->AddStretchSpacer();
     auto* button = new wxButton(&panel, row.id, Label(row.label));
-    buttons->Add(button, wxSizerFlags().Border(wxRIGHT, closes ? 0 : frame.FromDIP(6)));
+    const bool last = &row == &rows.back();
+    buttons->Add(button, wxSizerFlags().Border(wxRIGHT, last ? 0 : frame.FromDIP(6)));
     const auto run = [button, action = row.run](wxCommandEvent&) {
       if (button->IsEnabled()) action();
     };

@@ -1,0 +1,77 @@
+#pragma once
+
+#include <wx/frame.h>
+
+#include <memory>
+#include <string>
+#include <vector>
+
+#include "desktop/models/metadata/exif_editor.h"
+#include "desktop/windows/widgets/background.h"
+
+class wxCheckBox;
+class wxDataViewListCtrl;
+class wxHyperlinkCtrl;
+class wxSearchCtrl;
+class wxSizer;
+class wxStaticText;
+
+namespace fotomill::desktop {
+
+class ExifValuePanel;
+class Shell;
+
+// The EXIF editor: changes values, times and place of one or several files, and writes them in the
+// background. Deletes itself when closed.
+class ExifEditFrame : public wxFrame {
+ public:
+  ExifEditFrame(Shell& shell, wxWindow* parent, std::vector<std::string> files);
+
+ private:
+  friend void RefreshExifEditors();
+  wxSizer* BuildSearch(wxWindow& panel);
+  wxSizer* BuildSide(wxWindow& panel);
+  wxSizer* BuildButtons(wxWindow& panel);
+  void Read();
+  void ReadIfChanged();
+  void FilesRead();
+  void ShowRows();
+  void UpdateRow(size_t place);
+  void ShowSelected();
+  void ShowPlace();
+  void UpdateControls();
+  void Entered(const std::string& text);
+  void ChangeSelected(void (ExifEditor::*change)(uint16_t tag));
+  void ShiftTimes();
+  void SetPlace();
+  void SetOwner();
+  void Write();
+  bool ConfirmWrite();
+  bool ConfirmAdding(bool& addNew);
+  void Written(bool errors);
+  void OnClose(wxCloseEvent& event);
+
+  Shell& shell_;
+  const std::vector<std::string> paths_;
+  std::vector<ExifFileTexts> read_;  // written by the background task
+  ExifEditor editor_;
+  std::vector<ExifEditRow> rows_;  // of the list
+  bool invalid_ = false;           // the value in the panel
+  bool writing_ = false;
+  wxStaticText* problem_ = nullptr;
+  wxSearchCtrl* search_ = nullptr;
+  wxCheckBox* all_ = nullptr;
+  wxDataViewListCtrl* list_ = nullptr;
+  ExifValuePanel* value_ = nullptr;
+  wxStaticText* place_ = nullptr;
+  wxHyperlinkCtrl* map_ = nullptr;
+  const std::shared_ptr<bool> alive_ = std::make_shared<bool>(true);
+  Background work_;  // must be last, so that it ends first
+};
+
+// The command: edits the frame's selected files.
+void EditExifOfSelection(Shell& shell);
+// Call after files were written: open editors show their new values.
+void RefreshExifEditors();
+
+}  // namespace fotomill::desktop

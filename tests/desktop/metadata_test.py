@@ -1,0 +1,226 @@
+#!/usr/bin/env python3
+"""Metadata in the real program: editing EXIF of several files, places, removal, undo."""
+import os
+import subprocess
+
+from driven_desktop import PROJECT, Desktop, make_pictures, run
+
+TRACK = """<gpx xmlns="http://www.topografix.com/GPX/1/1"><trk><trkseg>
+<trkpt lat="46.0" lon="11.0"><ele>200</ele><time>2024-05-31T12:00:00Z</time></trkpt>
+<trkpt lat="46.2" lon="11.4"><ele>300</ele><time>2024-05-31T12:20:00Z</time></trkpt>
+</trkseg></trk></gpx>"""
+
+
+def fotomill(*arguments):
+    program = os.environ.get("FOTOMILL", str(PROJECT / "build/release/fotomill"))
+    done = subprocess.run([program, *map(str, arguments)], capture_output=True, text=True)
+    assert done.returncode == 0, done.stderr
+    return done.stdout
+
+
+def exif_of(path):
+    return dict(line.strip().split("\t", 1) for line in fotomill("exif", path).splitlines()
+                if "\t" in line)
+
+
+def tagged(folder, names):
+    """Pictures with an artist each and the same time."""
+    make_pictures(folder, names)
+    for name in names:
+        fotomill("exif", "set", folder / name, f"Artist={name}", "Flash=16",
+                 "DateTimeOriginal=2024:05:31 14:10:00", "--in-place")
+
+
+def choose(desktop, name):
+    """Focuses the value of a tag."""
+    desktop.key("ctrl+f", "ctrl+a")
+    desktop.type(name)
+    desktop.key("Tab", "Tab")  # over the check box
+    desktop.settle()
+    desktop.key("alt+v")
+
+
+def edit_values(folder):
+    pictures = folder / "pictures"
+    tagged(pictures, ["one.jpg", "two.jpg"])
+    old = {path: path.read_bytes() for path in pictures.iterdir()}
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"lines=2 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "ctrl+alt+e")
+        desktop.wait(r"exif-edit files=2 rows=\d+")
+        desktop.focus("^Edit EXIF: 2 files$")
+        desktop.screenshot("exif-edit")
+        # A value of both files, a wrong one first; a tag that they do not have; a flash.
+        choose(desktop, "DateTime of original")
+        desktop.key("ctrl+a")
+        desktop.type("2024:02:30")
+        desktop.wait(r"exif-edit-value DateTime of original data: invalid")
+        desktop.key("ctrl+a")
+        desktop.type("2024:05:30 14:10:00")
+        desktop.wait(r"exif-edit-value DateTime of original data: 2024:05:30 14:10:00")
+        desktop.key("alt+a")
+        choose(desktop, "Image title")
+        desktop.type("At the lake")
+        desktop.wait(r"exif-edit-value Image title: At the lake")
+        choose(desktop, "Metering")
+        desktop.screenshot("exif-edit-words")
+        desktop.key("Home", "Down")
+        desktop.wait(r"exif-edit-value Metering mode: Average")
+        desktop.screenshot("exif-edit-changed")
+        desktop.key("ctrl+s")
+        desktop.wait(r"prompt exif Some files do not have all of these tags")
+        desktop.focus("^Edit EXIF$", native=True)
+        desktop.key("alt+a")
+        desktop.wait(r"prompt exif Write these values to 2 files")
+        desktop.screenshot("exif-confirm")
+        desktop.key("alt+w")
+        desktop.wait(r"batch ended status=0")
+        desktop.wait(r"exif-edit files=2")
+        for path in old:
+            exif = exif_of(path)
+            assert exif["Person who created the image"] == path.name
+            assert exif["DateTime of original data"] == "2024:05:30 14:10:00"
+            assert exif["Image title"] == "At the lake"
+            assert exif["Metering mode"] == "Average"
+            assert exif["Flash"].startswith("Fire: N")
+        # Undo gives the very files back, and the open editor shows it.
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo change of 2 files done=2")
+        desktop.wait(r"exif-edit files=2")
+        assert all(path.read_bytes() == data for path, data in old.items())
+        # Changes are not thrown away without a question.
+        desktop.focus("^Edit EXIF: 2 files$")
+        choose(desktop, "Image title")
+        desktop.type("x")
+        desktop.wait(r"exif-edit-value Image title: x")
+        desktop.key("Escape")
+        desktop.wait(r"prompt exif discard")
+
+
+def places(folder):
+    pictures = folder / "pictures"
+    tagged(pictures, ["one.jpg"])
+    (folder / "data").mkdir()
+    (folder / "data/Locations.gps").write_text("Home = 48.5,11.25\nLake = 45.5,-79.25\n")
+    (folder / "walk.gpx").write_text(TRACK)
+    quiet = ["ExifConfirmWrite=0", "ExifConfirmAddNew=0", "ExifCopyrightHolder=Ann Lee"]
+    with Desktop(folder, pictures, settings=quiet) as desktop:
+        desktop.wait(r"lines=1 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "ctrl+Return")
+        desktop.wait(r"view-shown|view ")
+        desktop.focus("one.jpg")
+        desktop.key("e")
+        desktop.wait(r"exif-edit files=1")
+        desktop.focus("^Edit EXIF: one.jpg$")
+
+        def place(*keys):
+            desktop.focus("^Edit EXIF: one.jpg$")
+            desktop.key("alt+p")
+            desktop.wait(r"prompt place")
+            desktop.focus("^Place$")
+            desktop.key(*keys)
+
+        def write():
+            desktop.wait(r"exif-edit place")
+            desktop.focus("^Edit EXIF: one.jpg$")
+            desktop.key("ctrl+s")
+            desktop.wait(r"batch ended status=0")
+            desktop.wait(r"exif-edit files=1")
+            return exif_of(pictures / "one.jpg")
+
+        # From the list: the default location, Home, Lake.
+        place("Down", "Down")
+        desktop.wait(r"place 45.* 30' 00.00\" N, 79")
+        desktop.screenshot("place")
+        desktop.key("alt+s")
+        desktop.focus("^Edit EXIF: one.jpg$")
+        desktop.key("alt+o")
+        exif = write()
+        assert exif["Latitude"].startswith("45.000 30.000"), exif
+        assert exif["East or West longitude"] == "West"
+        assert exif["Copyright holder"] == "Ann Lee"
+        # From a track; the camera was two hours ahead.
+        place("alt+g", "Tab")
+        desktop.type(str(folder / "walk.gpx"))
+        desktop.wait(r"place 0 of 1 file was taken on this track")
+        desktop.key("alt+a")
+        desktop.xdotool("type", "--delay", "20", "--", "-2:00")
+        desktop.wait(r"place 1 of 1 file was taken on this track")
+        desktop.screenshot("place-track")
+        desktop.key("alt+s")
+        exif = write()
+        assert exif["Latitude"].startswith("46.000 6.000 0.000"), exif
+        assert exif["Altitude"] == "250.000"
+        # None.
+        place("alt+r")
+        desktop.wait(r"place All GPS values are removed")
+        desktop.key("alt+s")
+        assert "Latitude" not in write()
+
+
+def strip(folder):
+    pictures, bare = folder / "pictures", folder / "bare"
+    tagged(pictures, ["one.jpg", "two.jpg"])
+    old = {path.name: path.read_bytes() for path in pictures.iterdir()}
+    (folder / "data").mkdir()
+    (folder / "data/FMWDestinationHistory.txt").write_text(f"{bare}\n")
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"lines=2 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "ctrl+alt+m")
+        desktop.wait(r"prompt strip")
+        desktop.wait(r"strip-preview .*one.jpg: EXIF; nothing")
+        desktop.wait(r"strip-preview .*two.jpg: EXIF; nothing")
+        desktop.focus("^Remove Metadata$")
+        desktop.key("alt+r")  # keeps creator and copyright
+        desktop.wait(r"strip-preview .*two.jpg: some EXIF tags; EXIF")
+        desktop.screenshot("strip")
+        desktop.key("alt+v")
+        desktop.wait(r"batch-line .*one.jpg")
+        desktop.wait(r"batch ended status=0")
+        desktop.wait(r"metadata-left .*two.jpg: EXIF")
+        desktop.focus("^Metadata Left$")
+        desktop.screenshot("metadata-left")
+        desktop.key("Escape")
+        for name in old:
+            exif = exif_of(pictures / name)
+            assert exif["Person who created the image"] == name and "Flash" not in exif
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo change of 2 files done=2")
+        assert all((pictures / name).read_bytes() == data for name, data in old.items())
+        # Copies, which undo takes away again.
+        desktop.key("ctrl+alt+m")
+        desktop.wait(r"prompt strip")
+        desktop.focus("^Remove Metadata$")
+        desktop.key("alt+n", "Tab", "Down", "alt+v")
+        desktop.wait(r"batch ended status=0")
+        desktop.wait(r"metadata-left .*bare/two.jpg: nothing")
+        desktop.focus("^Metadata Left$")
+        desktop.key("Escape")
+        assert all((pictures / name).read_bytes() == data for name, data in old.items())
+        assert sorted(path.name for path in bare.iterdir()) == ["one.jpg", "two.jpg"]
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo output of 2 files done=2")
+        assert not list(bare.iterdir())
+    # Without the prompt and the preview.
+    quiet = ["SecureEXIFPrompt=0", "SecureEXIFPreview=0"]
+    with Desktop(folder, pictures, settings=quiet) as desktop:
+        desktop.wait(r"lines=2 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "ctrl+alt+m")
+        desktop.wait(r"batch ended status=0")
+        assert exif_of(pictures / "one.jpg") == {}
+        assert (pictures / "two.jpg").read_bytes() == old["two.jpg"]
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo change of one.jpg done=1")
+        assert (pictures / "one.jpg").read_bytes() == old["one.jpg"]
+
+
+if __name__ == "__main__":
+    run(edit_values, places, strip)
