@@ -192,18 +192,18 @@ TEST(HashStore, StoresHashes) {
     ASSERT_TRUE(store.Save());
   }
   const HashStore store(path);
-  const HashRecord* const a = store.Find("/a", 11, 1000);
-  ASSERT_NE(a, nullptr);
+  const auto a = store.Find("/a", 11, 1000);
+  ASSERT_TRUE(a);
   EXPECT_EQ(a->digest, "00112233445566778899aabbccddeeff");
   EXPECT_EQ(a->hashes, RecordOf(11, 22).hashes);
   EXPECT_EQ(a->width, 7);
   EXPECT_TRUE(a->hasHashes);
-  ASSERT_NE(store.Find("/b", 55, 1000), nullptr);
+  ASSERT_TRUE(store.Find("/b", 55, 1000));
   EXPECT_EQ(store.Find("/b", 55, 1000)->digest, "");
-  EXPECT_EQ(store.Find("/b", 33, 1000), nullptr) << "of an older file";
-  EXPECT_EQ(store.Find("/a", 11, 1001), nullptr);
-  EXPECT_EQ(store.Find("/c", 11, 1000), nullptr);
-  EXPECT_EQ(store.Find("/fresh", 1, int64_t{1} << 40), nullptr);
+  EXPECT_FALSE(store.Find("/b", 33, 1000)) << "of an older file";
+  EXPECT_FALSE(store.Find("/a", 11, 1001));
+  EXPECT_FALSE(store.Find("/c", 11, 1000));
+  EXPECT_FALSE(store.Find("/fresh", 1, int64_t{1} << 40));
 }
 
 TEST(HashStore, SurvivesTruncation) {
@@ -219,23 +219,23 @@ TEST(HashStore, SurvivesTruncation) {
   for (size_t length = whole.size(); length < both.size(); length += 7) {
     WriteBytes(path, {both.begin(), both.begin() + static_cast<ptrdiff_t>(length)});
     HashStore store(path);
-    EXPECT_NE(store.Find("/a", 1, 1000), nullptr);
-    EXPECT_EQ(store.Find("/b", 2, 1000), nullptr);
+    EXPECT_TRUE(store.Find("/a", 1, 1000));
+    EXPECT_FALSE(store.Find("/b", 2, 1000));
     store.Put("/c", RecordOf(3, 3));
     ASSERT_TRUE(store.Save());
     const HashStore again(path);
-    EXPECT_NE(again.Find("/a", 1, 1000), nullptr);
-    EXPECT_NE(again.Find("/c", 3, 1000), nullptr);
+    EXPECT_TRUE(again.Find("/a", 1, 1000));
+    EXPECT_TRUE(again.Find("/c", 3, 1000));
   }
   for (size_t i = whole.size(); i < both.size(); i += 5) {
     auto damaged = both;
     damaged[i] ^= 0x40;
     WriteBytes(path, damaged);
-    EXPECT_EQ(HashStore(path).Find("/b", 2, 1000), nullptr) << i;
+    EXPECT_FALSE(HashStore(path).Find("/b", 2, 1000)) << i;
   }
 }
 
-TEST(HashStore, IsSharedAndRejectsForeignFiles) {
+TEST(HashStore, IsSharedAndKeepsForeignFiles) {
   const TemporaryFolder folder;
   const std::string path = folder.Path("store");
   HashStore one(path), two(path);
@@ -247,13 +247,15 @@ TEST(HashStore, IsSharedAndRejectsForeignFiles) {
   ASSERT_TRUE(one.Save());
   const HashStore all(path);
   for (const auto& [name, size] : {std::pair{"/one", 1u}, {"/two", 2u}, {"/three", 3u}})
-    EXPECT_NE(all.Find(name, size, 1000), nullptr) << name;
+    EXPECT_TRUE(all.Find(name, size, 1000)) << name;
 
   WriteText(folder.Path("letter"), "Dear Ada, this is no store at all.");
   HashStore letter(folder.Path("letter"));
+  EXPECT_EQ(letter.SetAside(), folder.Path("letter.damaged"));
+  EXPECT_EQ(ReadText(letter.SetAside()), "Dear Ada, this is no store at all.");
   letter.Put("/a", RecordOf(1, 1));
-  EXPECT_FALSE(letter.Save());
-  EXPECT_EQ(ReadText(folder.Path("letter")), "Dear Ada, this is no store at all.");
+  EXPECT_TRUE(letter.Save());
+  EXPECT_TRUE(HashStore(folder.Path("letter")).Find("/a", 1, 1000));
 }
 
 }  // namespace

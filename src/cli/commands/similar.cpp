@@ -62,6 +62,11 @@ class Search {
 
   int Run(const Selection& selection) {
     output_.CloseWith(selection.leftOut);
+    if (!store_.SetAside().empty()) {
+      output_.Note(Tr("\"%1\" was damaged; it is kept as \"%2\".",
+                      output_.ShownMessage(DataFile(kHashStoreName)),
+                      output_.ShownMessage(store_.SetAside())));
+    }
     std::set<std::string> seen;  // ignores repeated names
     for (const SelectedFile& file : selection.files) {
       if (!seen.insert(platform::AbsolutePath(file.name)).second) continue;
@@ -121,10 +126,10 @@ class Search {
   // Loads what the store knows. Must run on the calling thread, before the parallel work.
   void Recall(Candidate& candidate) const {
     const platform::FileFacts facts = platform::FactsOf(candidate.name);
-    const HashRecord* const known =
+    const auto known =
         store_.Find(platform::AbsolutePath(candidate.name), facts.size, facts.modified);
-    if (known != nullptr) candidate.record = *known;
-    candidate.known = known != nullptr && (options_.exact || known->hasHashes);
+    if (known) candidate.record = *known;
+    candidate.known = known && (options_.exact || known->hasHashes);
     candidate.record.size = facts.size;
     candidate.record.modified = facts.modified;
   }

@@ -7,7 +7,7 @@
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/selection/file_selection.h"
-#include "registry/registry.h"
+#include "registry/verify_picture.h"
 #include "settings/job_options.h"
 #include "texts/status_text.h"
 #include "texts/texts.h"
@@ -21,36 +21,6 @@ struct VerifyOptions {
   bool json = false;
 };
 
-// Decodes every frame of an animation.
-Status VerifyFrames(const std::string& name) {
-  AnimationPointer animation;
-  Status status =
-      OpenAnimation({.fileName = name, .options = ReadOptionsFromSettings()}, animation);
-  while (status == Status::Ok) status = animation->Next();
-  return status == Status::NoImages ? Status::Ok : status;
-}
-
-// Decodes every page of a file. A decoder's remark about an intact file becomes `note`.
-Status VerifyFile(const std::string& name, std::string& hint, std::string& note) {
-  PicturePointer picture;
-  ReadRequest request{.fileName = name, .options = ReadOptionsFromSettings()};
-  RETURN_IF_BAD(LoadPictureInfo(request, picture));
-  for (; request.page < picture->pageCount; ++request.page) {
-    RETURN_IF_BAD(ReadPicture(request, *picture));
-    if (!picture->warning.empty()) {  // displayable, but incomplete
-      hint = Tr(picture->warning.view());
-      return Status::DamagedFile;
-    }
-    if (note.empty()) note = picture->note.view();
-    if (picture->pageCount == 1) break;
-    const FormatEntry& row = FormatRow(picture->formatIndex);
-    if (row.animate != nullptr) return VerifyFrames(name);
-    // frames cannot be selected: each page is the same picture
-    if ((row.flags & FMT_ANIMATED) != 0) break;
-  }
-  return Status::Ok;
-}
-
 int RunVerify(const VerifyOptions& options, const CommandContext& context) {
   const auto selection = SelectFiles(options.selection, context);
   if (!selection) return kExitUsage;
@@ -60,8 +30,9 @@ int RunVerify(const VerifyOptions& options, const CommandContext& context) {
   for (const SelectedFile& file : selection->files) {
     if (!output.GoesOn()) break;
     std::string hint = file.hint, note;
-    const Status status =
-        file.status == Status::Ok ? VerifyFile(file.name, hint, note) : file.status;
+    const Status status = file.status == Status::Ok
+                              ? VerifyPicture(file.name, ReadOptionsFromSettings(), hint, note)
+                              : file.status;
     if (output.IsJson()) {
       Json element;
       PutName(element, "file", file.name);

@@ -9,6 +9,7 @@
 #include "cli/commands/exif/exif_edit.h"
 #include "cli/commands/exif/exif_gps.h"
 #include "cli/commands/faces.h"
+#include "cli/commands/find.h"
 #include "cli/commands/formats.h"
 #include "cli/commands/history.h"
 #include "cli/commands/info.h"
@@ -69,6 +70,7 @@ constexpr Command kCommands[] = {
     {"archive test",    TrLater("verify the checksums of a ZIP or RAR archive"),        Needs::Settings, SetUpArchiveTest},
     {"faces",   TrLater("find faces in pictures"),                                      Needs::Formats,  SetUpFaces},
     {"plugins", TrLater("list the plug-in formats"),                                    Needs::Settings, SetUpPlugins},
+    {"find",    TrLater("find pictures by name, keywords, date and other facts"),       Needs::Formats,  SetUpFind},
     {"similar", TrLater("find pictures that look alike"),                               Needs::Formats,  SetUpSimilar},
     {"verify",  TrLater("decode files completely to find damaged ones"),                Needs::Formats,  SetUpVerify},
     {"config list",  TrLater("list the configuration keys and their values"),           Needs::Settings, SetUpConfigList},

@@ -15,6 +15,7 @@
 #include "platform/folders.h"
 #include "platform/input.h"
 #include "platform/paths.h"
+#include "platform/process.h"
 #include "registry/registry.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
@@ -119,6 +120,7 @@ class Selector {
       });
     }
     for (const platform::FolderEntry& entry : *entries) {
+      if (platform::PendingExit() != 0) return;
       const std::string path = platform::JoinFolder(folder, entry.name);
       const bool hidden = !options_.hidden && platform::IsHidden(path);
       if (entry.kind == platform::FileKind::Folder) {

@@ -24,6 +24,8 @@ struct PictureTags {
   std::string sublocation, city, state, country, countryCode;
   int64_t taken = 0;   // by the camera's clock: 20040831223208; 0 if unknown
   std::string camera;  // maker and model
+
+  bool operator==(const PictureTags&) const = default;
 };
 
 // Where to look for tags, besides XMP, IPTC and a sidecar.

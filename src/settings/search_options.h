@@ -1,0 +1,16 @@
+#pragma once
+
+#include "catalog/search/picture_facts.h"
+#include "catalog/search/search_criteria.h"
+
+namespace fotomill {
+
+// The settings that the facts of a search depend on.
+FactsOptions FactsOptionsFromSettings();
+
+// The last search: PictureSearchMode (0: all criteria, 1: any), PictureSearchWildcardField and,
+// each if its Match key is on, PictureSearchCommentField, PictureSearchKeywordField (separated by
+// commas), PictureSearchMatchField and faces.
+SearchCriteria SearchCriteriaFromSettings();
+
+}  // namespace fotomill
