@@ -1,7 +1,7 @@
 #pragma once
 
 #include "batch/job.h"
-#include "batch/sequential_rename.h"
+#include "batch/rename/sequential_rename.h"
 
 namespace fotomill {
 

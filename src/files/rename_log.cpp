@@ -69,7 +69,10 @@ bool RenameLog::LockFile(bool create) {
   return false;
 }
 
-bool RenameLog::LockForUndo() { return DataFile(kLogName).empty() || LockFile(false); }
+bool RenameLog::LockForUndo() {
+  forUndo_ = true;
+  return DataFile(kLogName).empty() || LockFile(false);
+}
 
 // If the log was replaced by a shortened one meanwhile (`fresh` is false), appends to that.
 bool RenameLog::Begin(bool fresh) {
@@ -89,6 +92,7 @@ bool RenameLog::Append(const RenamedFile& file) {
 
 bool RenameLog::Intend(const RenamedFile& file) {
   if (failed_) return false;
+  if (forUndo_) return !file_.IsOpen() || Append(file);
   if (!file_.IsOpen()) {
     failed_ = !Begin(true);
   } else {
@@ -105,6 +109,7 @@ bool RenameLog::Intend(const RenamedFile& file) {
 void RenameLog::Settle(bool renamed) {
   if (failed_ || !locked_) return;
   if (!renamed) failed_ = !file_.Resize(before_);
+  if (forUndo_) return;
   file_.Unlock();
   locked_ = false;
 }

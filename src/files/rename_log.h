@@ -13,6 +13,8 @@ namespace fotomill {
 // A renamed file; absolute paths.
 struct RenamedFile {
   std::string from, to;
+
+  bool operator==(const RenamedFile&) const = default;
 };
 
 // The contents of the log. `number` is the first sequence number of the run, if sequence numbers
@@ -37,8 +39,8 @@ class RenameLog {
   bool Intend(const RenamedFile& file);
   // Records whether the file was renamed.
   void Settle(bool renamed);
-  // Locks the log, if there is one, for the lifetime
-  // of this object. False if locking fails.
+  // Locks the log, if there is one, for the lifetime of this object. Intend and Settle then append
+  // to it without unlocking. False if locking fails.
   bool LockForUndo();
 
  private:
@@ -50,6 +52,7 @@ class RenameLog {
   platform::StoreFile file_;
   uint64_t before_ = 0;  // size without the pending record
   bool failed_ = false, locked_ = false;
+  bool forUndo_ = false;
 };
 
 // nullopt if the log exists but cannot be read.

@@ -11,7 +11,7 @@
 namespace fotomill {
 
 // A macro in texts and output names. Date and time are those when the picture was taken, or else
-// the modification time of its file.
+// the modification time of its file. "%D{...}" formats the date with fields such as %Y and %m.
 struct MacroRow {
   char letter;
   bool early;           // known before opening the picture
@@ -38,6 +38,14 @@ std::string ExpandNameMacros(std::string_view text, const MacroFacts& facts,
 // What is wrong with the macros in a text, as the end of a sentence: "has an unknown macro %Q".
 // Empty if all are valid.
 RecordedText MacroProblem(std::string_view text);
+
+// Replaces the counter, "%c" or with leading zeros "%03c", by a number, in texts for several files.
+// Everything else is unchanged.
+std::string ExpandCounter(std::string_view text, int64_t number);
+
+// Whether the macros in a text need more of a picture than its EXIF block and its file: its size,
+// or its page.
+bool NeedsPictureSize(std::string_view text);
 
 // Whether a text can be expanded before the picture is decoded and processed, as it has no macros
 // about the picture.

@@ -1,4 +1,5 @@
-#include "batch/sequential_rename.h"
+#include "batch/rename/sequential_rename.h"
+#include "batch/rename/undo_rename.h"
 
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>

@@ -91,7 +91,7 @@ def found_facts(place):
             "camera": "Canon EOS 40D", "title": "", "description": "At the beach", "comment": "",
             "keywords": ["Sea", "Places/Rome"], "rating": 4, "label": "Red", "status": 0,
             "message": "Ok"}], "JSON")
-    for wrong in (["--rating", "x"], ["--taken", "2024-13"], ["--size", "5.."  "k"],
+    for wrong in (["--rating", "x"], ["--taken", "2024-13"], ["--size", "5..k"],
                   ["--format", "xyz"], ["--name", ""], ["--width", "9..1"]):
         check(place.run("find", "p", *wrong)[0], 2, f"{wrong}: refused")
 
@@ -126,7 +126,7 @@ def failures(place):
     (place.path / "p/secret.bmp").chmod(0)
     for attempt in ("first", "second"):
         status, out, err = place.run("find", "-r", "p", "none.bmp", "--width", "3")
-        check((status, names(out)), (1, ["a.bmp", "cut.bmp"]), f"{attempt}: readable ones are found")
+        check((status, names(out)), (1, ["a.bmp", "cut.bmp"]), f"{attempt}: readable files")
         lines = err.splitlines()
         for name in ("p/closed", "p/secret.bmp", "none.bmp"):
             check(sum(line.startswith(name + ":") for line in lines), 1, f"{attempt}: {name}")

@@ -22,7 +22,55 @@ ROWS = [
 ]
 
 
+# Files with their contents, pattern and options, new names with contents.
+PATTERNS = [
+    ("abc", ["%c"], {"1": "a", "2": "b", "3": "c"}),
+    ("abc", ["%03c-%F", "--start", "8", "--increment", "2"],
+     {"008-a": "a", "010-b": "b", "012-c": "c"}),
+    ("12", ["%c", "--reverse"], {"1": "2", "2": "1"}),
+    ("123", ["%c", "--reverse"], {"1": "3", "2": "2", "3": "1"}),
+    ("123", ["%c", "--start", "2"], {"2": "1", "3": "2", "4": "3"}),
+    ("a", [" %D{%Y} %F "], {"2020 a": "a"}),
+    ("a", ["%%%F %E{Model}"], {"%a": "a"}),
+]
+
+
+def patterns():
+    """Names by a pattern: files may exchange names, and undo restores them."""
+    for files, options, names in PATTERNS:
+        with Place() as place:
+            for name in files:
+                place.files(f"f/{name}.dat", contents=name.encode(), time=1_600_000_000 * 10**9)
+            listed = [f"f/{name}.dat" for name in files]
+            before = place.names("f")
+            _, dry, _ = place.run("rename", *listed, "--pattern", *options, "--dry-run")
+            check(place.names("f"), before, f"{options}: dry run")
+            status, out, _ = place.run("rename", *listed, "--pattern", *options)
+            check((status, out), (0, dry), f"{options}: result")
+            check({path.stem: path.read_text() for path in (place.path / "f").iterdir()}, names,
+                  f"{options}: names")
+            check(place.run("rename", "--undo")[0], 0, f"{options}: undo")
+            check({path.stem: path.read_text() for path in (place.path / "f").iterdir()},
+                  {name: name for name in files}, f"{options}: names again")
+    with Place() as place:
+        place.files("f/1.bmp", "f/2.bmp", "f/x.bmp")
+        (place.path / "f/2.bmp").write_bytes(b"keep")
+        status, _, err = place.run("rename", "f/1.bmp", "f/x.bmp", "none.bmp", "--pattern", "2")
+        check((status, place.names("f")), (1, ["1.bmp", "2.bmp", "x.bmp"]), "taken names")
+        check((place.path / "f/2.bmp").read_bytes(), b"keep", "no file is replaced")
+        check([name in err for name in ("f/1.bmp: ", "f/x.bmp: ", "none.bmp: ")], [True] * 3,
+              "each failure is reported")
+        status, out, _ = place.run("rename", "f/1.bmp", "f/x.bmp", "f/1.bmp", "--pattern", "same")
+        check((status, place.names("f"), out), (1, ["2.bmp", "same.bmp", "x.bmp"],
+                                                "f/1.bmp -> f/same.bmp\n"), "one name for two")
+        for options in (["a/b"], ["%Q"], [""], [" "], [".."], ["%D{%Q}"], ["%F", "--base", "x"],
+                        ["%F", "--undo"]):
+            check(place.run("rename", "f", "--pattern", *options)[0], 2, f"{options}: refused")
+        check(place.names("f"), ["2.bmp", "same.bmp", "x.bmp"], "nothing was renamed")
+
+
 def main():
+    patterns()
     for options, names, number in ROWS:
         with Place() as place:
             place.files("f/a.bmp", "f/b.bmp", "f/c.bmp")

@@ -86,6 +86,20 @@ TEST(Macros, AreExpandedAndSanitizedForNames) {
   const MacroFacts facts{.fileName = "/photos/a.b.jpg", .copyrightHolder = "Jo/Mo", .modified = 0};
   EXPECT_EQ(ExpandMacros("%F %N %Wx%H p%P %% %E{Model}.", facts, picture), "a.b Jo/Mo 30x20 p1 % .");
   EXPECT_EQ(ExpandNameMacros("%N/x", facts, picture), "Jo-Mo/x");
+  for (const auto& [form, same] : {std::pair{"%D{%Y-%m-%d}", "%D"},
+                                   {"%D{%F|%%}", "%D|%%"},
+                                   {"%D{%H:%M:%S}", "%T"},
+                                   {"%D{%T}", "%T"},
+                                   {"%D{%Y}", "%Y"}})
+    EXPECT_EQ(ExpandMacros(form, facts, picture), ExpandMacros(same, facts, picture));
+  EXPECT_EQ(ExpandNameMacros("%D{x:y/%%}", facts, picture), "x-y-%");
+  EXPECT_EQ(ExpandCounter("%c %03c %1c %%c %D{%c} %E{%c} %c", 7), "7 007 7 %%c %D{%c} %E{%c} 7");
+  EXPECT_EQ(ExpandCounter("%02c%123c%", 123), "123%123c%");
+  EXPECT_TRUE(NeedsPictureSize("%F%W"));
+  EXPECT_FALSE(NeedsPictureSize("%%W %D %E{Model}"));
+  for (const char* wrong : {"%D{}", "%D{%Q}", "%D{%Y", "%D{%}", "%c"})
+    EXPECT_FALSE(MacroProblem(wrong).empty()) << wrong;
+  EXPECT_TRUE(MacroProblem("%D{%Y-%m-%d_%H%M%S}").empty());
   EXPECT_TRUE(IsKnownEarly("%F-%N"));
   EXPECT_FALSE(IsKnownEarly("%F-%W"));
   EXPECT_EQ(MacroProblem("100%").english, "has an unknown macro %; %% is a percent sign");

@@ -6,7 +6,9 @@
 #include <string>
 
 #include "batch/new_job.h"
-#include "batch/sequential_rename.h"
+#include "batch/rename/pattern_rename.h"
+#include "batch/rename/sequential_rename.h"
+#include "batch/rename/undo_rename.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
 #include "cli/frame/terminal_box.h"
@@ -15,6 +17,7 @@
 #include "platform/folders.h"
 #include "settings/configuration.h"
 #include "settings/key_table.h"
+#include "settings/settings.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
 
@@ -24,6 +27,7 @@ namespace {
 
 struct RenameCommandOptions {
   SelectionOptions selection;
+  std::string pattern;    // empty: rename in sequence
   std::string base;       // empty: use settings
   int32_t start = -1;     // -1: use the default
   int32_t digits = 0;     // 0: use the default
@@ -63,9 +67,25 @@ SequentialRenameRules RulesOf(const RenameCommandOptions& options) {
   return rules;
 }
 
+PatternRenameOptions PatternOf(const RenameCommandOptions& options) {
+  return {.pattern = options.pattern,
+          .start = std::max(options.start, options.start < 0 ? 1 : 0),
+          .increment = std::max(options.increment, 1),
+          .copyrightHolder = std::string(settings.ExifCopyrightHolder),
+          .dryRun = options.dryRun};
+}
+
 int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& context) {
   if (!IsPlainName(options.base))
     return UsageError(context, Tr("The base name must be part of a file name, not a path."));
+  if (!options.pattern.empty()) {
+    const RecordedText problem = PatternProblem(options.pattern);
+    if (!problem.empty()) {
+      std::string message = Tr("The pattern \"%1\" %2", options.pattern, problem.shown);
+      if (!message.ends_with('.') && !message.ends_with('?')) message += '.';
+      return UsageError(context, message);
+    }
+  }
   const SelectionOptions& selection = options.selection;
   Selection chosen;
   if (!options.undo || !context.names.values.empty() || !selection.filesFrom.empty()) {
@@ -81,6 +101,8 @@ int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& 
   int status = kExitOk;
   if (options.undo) {
     status = RunUndo(options, chosen.files, output, job);
+  } else if (!options.pattern.empty()) {
+    RunPatternRename(chosen.files, PatternOf(options), job);
   } else {
     RenameOptions rename{.rules = RulesOf(options), .dryRun = options.dryRun};
     if (options.seed >= 0) rename.seed = static_cast<uint64_t>(options.seed);
@@ -96,21 +118,28 @@ void SetUpRename(CLI::App& app, CommandContext& context) {
   AddSelection(app, options->selection, context);
   CLI::Option* undo = AddFlag(app, "--undo", options->undo,
                               "Undo the last renaming, of all files or of the named ones");
-  Exclude(AddName(app, "--base", options->base, "NAME",
-                  "Base name (default: SequentialRenameBaseName); counts from --start"),
-          undo);
-  Exclude(AddNumber(app, "--start", options->start, "N", 0, INT32_MAX,
-                    "First number (default with --base: 1); the configured one is not changed"),
-          undo);
-  Exclude(AddNumber(app, "--increment", options->increment, "N", 1, INT32_MAX,
-                    "Step between numbers (default: SequentialRenameIncrement)"),
-          undo);
+  CLI::Option* pattern =
+      AddName(app, "--pattern", options->pattern, "TEXT",
+              "New names, without extension, as a text with macros: %F, %D, %03c, ...");
+  Exclude(pattern, undo);
+  CLI::Option* base = AddName(app, "--base", options->base, "NAME",
+                              "Base name (default: SequentialRenameBaseName); counts from --start");
   Exclude(
-      AddNumber(app, "--digits", options->digits, "N", 1, 10, "Digits of the numbers (default: 4)"),
+      AddNumber(
+          app, "--start", options->start, "N", 0, INT32_MAX,
+          "First number (default with --base or --pattern: 1); the configured one is not changed"),
       undo);
-  Exclude(AddNumber(app, "--seed", options->seed, "N", 0, INT32_MAX,
-                    "Seed of SequentialRenameRandom: the same seed, the same order"),
+  Exclude(AddNumber(app, "--increment", options->increment, "N", 1, INT32_MAX,
+                    "Step between numbers (default: SequentialRenameIncrement; with --pattern: 1)"),
           undo);
+  CLI::Option* digits =
+      AddNumber(app, "--digits", options->digits, "N", 1, 10, "Digits of the numbers (default: 4)");
+  CLI::Option* seed = AddNumber(app, "--seed", options->seed, "N", 0, INT32_MAX,
+                                "Seed of SequentialRenameRandom: the same seed, the same order");
+  for (CLI::Option* option : {base, digits, seed}) {
+    Exclude(option, undo);
+    Exclude(option, pattern);
+  }
   AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
   AddFlag(app, "--json", options->json,
           "Print a JSON array of {file, destination, status, message}");
@@ -119,8 +148,12 @@ void SetUpRename(CLI::App& app, CommandContext& context) {
             "BaseNumber, Increment,\n"
             "MaxAttempts, Sep, Hyphen, Prefix, Random, SkipCollide and Update. Without --base and "
             "--start, each run counts on from\n"
-            "the last one unless SequentialRenameUpdate is off.",
-            "fotomill rename photos --base holiday- --sort taken --dry-run");
+            "the last one unless SequentialRenameUpdate is off.\n"
+            "A pattern has the macros of captions (fotomill help names), %D{...} for the date in "
+            "another form, and %c for a\n"
+            "counter. Extensions are kept, existing files are never replaced, and files may "
+            "exchange names.",
+            "fotomill rename photos --pattern '%D{%Y-%m-%d} %03c %F' --sort taken --dry-run");
   context.run = [options, &context] { return RunRenameCommand(*options, context); };
 }
 

@@ -14,7 +14,7 @@
 
 #include "batch/new_job.h"
 #include "batch/progress_box.h"
-#include "batch/sequential_rename.h"
+#include "batch/rename/sequential_rename.h"
 #include "core/plain_name.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/batch/batch_runner.h"

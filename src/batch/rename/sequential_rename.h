@@ -8,10 +8,9 @@
 #include <string>
 #include <vector>
 
-#include "batch/job.h"
 #include "batch/batch_file.h"
-#include "files/rename_log.h"
-#include "platform/files.h"
+#include "batch/job.h"
+#include "batch/rename/renamed_files.h"
 
 namespace fotomill {
 
@@ -27,26 +26,6 @@ struct SequentialRenameRules {
   bool skipColliding = false;
   bool update = true;  // save the next number in the job
   bool random = false;
-};
-
-// Renames files, or pretends to in a dry run.
-class RenamedFiles {
- public:
-  // Renames are recorded in `log`, if not null, before they are done.
-  explicit RenamedFiles(bool dryRun, RenameLog* log = nullptr) : dryRun_(dryRun), log_(log) {}
-  // Whether a path exists, or would exist by now in a dry run.
-  bool Exists(const std::string& path) const;
-  // Renames without replacing: returns Taken if the new name exists. A dry run only records it.
-  platform::CommitResult Rename(const std::string& from, const std::string& to);
-  bool IsDryRun() const { return dryRun_; }
-  // Whether the last rename was logged.
-  bool IsNoted() const { return noted_; }
-
- private:
-  const bool dryRun_;
-  RenameLog* const log_;
-  bool noted_ = true;
-  std::set<std::string> gone_, there_;
 };
 
 // Formats a number with `digits` digits, zero-padded.
@@ -72,10 +51,5 @@ struct RenameOptions {
 // Renames a selection: opens the job's progress box, reports every file, closes the box. UndoRename
 // can undo it until the next run.
 void RunRename(std::span<const BatchFile> files, const RenameOptions& options, BatchJob& job);
-// Restores the old names of the last run, last file first; with `only`, just those absolute paths.
-// Files that cannot be restored can be retried. If all are restored, the next run starts with the
-// same number as the last one. False, with no change, if the log is unreadable or locked by another
-// program.
-bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job);
 
 }  // namespace fotomill

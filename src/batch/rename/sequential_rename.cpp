@@ -1,4 +1,4 @@
-#include "batch/sequential_rename.h"
+#include "batch/rename/sequential_rename.h"
 
 #include <algorithm>
 #include <numeric>
@@ -18,7 +18,6 @@ namespace fotomill {
 namespace {
 
 constexpr double kStoreInterval = 1;  // seconds between writes of the next number
-constexpr const char* kNotSafe = TrLater("It could not be recorded for --undo.");
 
 // Saves the first number of the next run in the job: a few times a second at most, and at the end.
 class NextNumber {
@@ -66,25 +65,6 @@ std::string RenameHint(const std::string& path, const SequentialRenameRules& rul
   return {};
 }
 
-// Whether a logged rename was done and can be undone. Killed runs may have logged a rename before
-// doing it, or may have undone one already.
-bool HasHappened(const RenamedFile& file) {
-  return platform::FileExists(file.to) || !platform::FileExists(file.from);
-}
-
-// Records a completed rename and renames the thumbnail file.
-void NoteRename(const std::string& from, const std::string& to, bool dryRun, BatchJob& job) {
-  job.filesChanged = true;
-  if (dryRun) return;
-  const std::string old = platform::AbsolutePath(from), now = platform::AbsolutePath(to);
-  job.uses.push_back({.path = now,
-                      .function = FileFunction::MoveAndCopy,
-                      .accessed = static_cast<int32_t>(platform::Now()),
-                      .from = old});
-  job.changes.push_back({old, now});
-  FollowThumbnailFile(old, now);
-}
-
 FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules,
                       RenamedFiles& files, BatchJob& job) {
   FileOutcome outcome{.source = file.name, .status = file.status, .hint = file.hint};
@@ -109,34 +89,12 @@ FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules,
     outcome.skipped = true;
     outcome.hint = Tr("skipped: the new name is not available.");
   } else if (!files.IsNoted()) {
-    outcome.note = TrRecorded(kNotSafe);
+    outcome.note = TrRecorded(kRenameNotNoted);
   }
   return outcome;
 }
 
 }  // namespace
-
-bool RenamedFiles::Exists(const std::string& path) const {
-  if (there_.contains(path)) return true;
-  return !gone_.contains(path) && platform::FileExists(path);
-}
-
-platform::CommitResult RenamedFiles::Rename(const std::string& from, const std::string& to) {
-  if (!dryRun_) {
-    noted_ =
-        log_ == nullptr || log_->Intend({platform::AbsolutePath(from), platform::AbsolutePath(to)});
-    const platform::CommitResult result =
-        platform::RenameFile(from, to, platform::Existing::Refuse);
-    if (log_ != nullptr) log_->Settle(result == platform::CommitResult::Done);
-    return result;
-  }
-  if (!platform::MayCreate(to)) return platform::CommitResult::Failed;
-  there_.erase(from);
-  gone_.insert(from);
-  gone_.erase(to);
-  there_.insert(to);
-  return platform::CommitResult::Done;
-}
 
 std::string NumberText(uint32_t number, int32_t digits) {
   const std::string text = std::to_string(number);
@@ -206,53 +164,6 @@ void RunRename(std::span<const BatchFile> files, const RenameOptions& options, B
   }
   MarkChangedRecords(std::exchange(job.changes, {}));
   FinishProgress(job);
-}
-
-bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
-  RenameLog lock;
-  if (!dryRun && !lock.LockForUndo()) return false;
-  const auto log = ReadRenameLog();
-  if (!log) return false;
-  RenameHistory remaining{.files = {}, .number = log->number};
-  std::vector<RenamedFile>& left = remaining.files;
-  std::vector<RenamedFile> wanted, failed;
-  for (const RenamedFile& file : log->files)
-    (only.empty() || only.contains(file.to) ? wanted : left).push_back(file);
-  if (!OpenProgressBox(job)) return true;
-  RenamedFiles files(dryRun);
-  const StopToken stop = job.stop.Token();
-  uint32_t done = 0;
-  const auto count = static_cast<uint32_t>(wanted.size());
-  for (; !wanted.empty() && !stop.Asked(); wanted.pop_back()) {
-    const RenamedFile& file = wanted.back();
-    if (!dryRun && !HasHappened(file)) continue;
-    FileOutcome outcome{.source = file.to, .destination = file.from};
-    if (!files.Exists(file.to)) {
-      outcome.status = Status::FileOpenError;
-      outcome.hint = Tr("The file does not exist.");
-    } else if (files.Exists(file.from) ||
-               files.Rename(file.to, file.from) != platform::CommitResult::Done) {
-      outcome.status = Status::RenameError;
-      outcome.hint = files.Exists(file.from) ? Tr("\"%1\" exists.", file.from) : ReasonSentence();
-    } else {
-      NoteRename(file.to, file.from, dryRun, job);
-    }
-    if (outcome.status != Status::Ok) failed.push_back(file);
-    ReportOutcome(job, outcome, done++, count);
-  }
-  left.insert(left.end(), wanted.begin(), wanted.end());
-  // in reverse, so that a retry starts with the last one
-  left.insert(left.end(), failed.rbegin(), failed.rend());
-  MarkChangedRecords(std::exchange(job.changes, {}));
-  if (!dryRun && !log->files.empty() && !WriteRenameLog(remaining)) {
-    job.errors = true;
-  }
-  if (!dryRun && left.empty() && log->number && job.remember) {
-    job.remember(Remembered::NextRenameNumber,
-                 static_cast<int32_t>(std::min<uint32_t>(*log->number, INT32_MAX)));
-  }
-  FinishProgress(job);
-  return true;
 }
 
 }  // namespace fotomill

@@ -1,0 +1,54 @@
+#pragma once
+
+#include <set>
+#include <span>
+#include <string>
+#include <vector>
+
+#include "batch/job.h"
+#include "files/rename_log.h"
+#include "platform/output_file.h"
+#include "texts/texts.h"
+
+namespace fotomill {
+
+// Renames files, or pretends to in a dry run.
+class RenamedFiles {
+ public:
+  // Renames are recorded in `log`, if not null, before they are done.
+  explicit RenamedFiles(bool dryRun, RenameLog* log = nullptr) : dryRun_(dryRun), log_(log) {}
+  // Whether a path exists, or would exist by now in a dry run.
+  bool Exists(const std::string& path) const;
+  // Renames without replacing: returns Taken if the new name exists. A dry run only records it.
+  platform::CommitResult Rename(const std::string& from, const std::string& to);
+  bool IsDryRun() const { return dryRun_; }
+  // Whether the last rename was logged.
+  bool IsNoted() const { return noted_; }
+
+ private:
+  const bool dryRun_;
+  RenameLog* const log_;
+  bool noted_ = true;
+  std::set<std::string> gone_, there_;
+};
+
+// The remark about a file that was renamed but cannot be undone.
+inline constexpr const char* kRenameNotNoted = TrLater("It could not be recorded for --undo.");
+
+// Records a completed rename in the job and renames the thumbnail file, except in a dry run.
+void NoteRename(const std::string& from, const std::string& to, bool dryRun, BatchJob& job);
+
+// The result of one of several renames.
+struct RenameAttempt {
+  bool reached = false;  // false: the job was stopped before
+  bool done = false;
+  bool noted = true;        // it can be undone
+  std::string reason = {};  // if it failed, a sentence
+};
+
+// Renames files whose new names may be old names of others; absolute paths, old ones different. No
+// existing file is replaced. Completed renames are recorded in the job. In the order of the list.
+std::vector<RenameAttempt> CarryOutRenames(std::span<const RenamedFile> wanted, RenamedFiles& files,
+                                           BatchJob& job);
+
+}  // namespace fotomill
