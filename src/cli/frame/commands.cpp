@@ -11,6 +11,7 @@
 #include "cli/commands/faces.h"
 #include "cli/commands/find.h"
 #include "cli/commands/formats.h"
+#include "cli/commands/gallery.h"
 #include "cli/commands/history.h"
 #include "cli/commands/info.h"
 #include "cli/commands/match.h"
@@ -51,6 +52,8 @@ constexpr Command kCommands[] = {
     {"pages cube",    TrLater("put pictures on the faces of a cube to cut out"),        Needs::Formats,  SetUpPagesCube},
     {"pages dodecahedron", TrLater("put pictures on the faces of a dodecahedron to cut out"), Needs::Formats, SetUpPagesDodecahedron},
     {"pages papers",  TrLater("list papers and print sizes"),                           Needs::Settings, SetUpPagesPapers},
+    {"gallery", TrLater("build a folder of web pages with pictures"),                   Needs::Formats,  SetUpGallery},
+    {"gallery theme", TrLater("write the files of the built-in gallery theme"),         Needs::Nothing,  SetUpGalleryTheme},
     {"turn",    TrLater("rotate or flip pictures, JPEG losslessly"),                    Needs::Formats,  SetUpTurn},
     {"tag",     TrLater("set keywords, ratings, labels and comments"),                   Needs::Formats,  SetUpTag},
     {"info",    TrLater("show size, depth and other facts without decoding pictures"),  Needs::Formats,  SetUpInfo},
