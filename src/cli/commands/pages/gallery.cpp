@@ -1,4 +1,4 @@
-#include "cli/commands/gallery.h"
+#include "cli/commands/pages/gallery.h"
 
 #include <algorithm>
 #include <charconv>
