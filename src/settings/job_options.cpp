@@ -4,11 +4,14 @@
 
 #include "catalog/history/file_history.h"
 #include "catalog/thumbnails/thumbnail_update.h"
+#include "files/file_time_change.h"
 #include "metadata/exif/exif_text.h"
 #include "metadata/gps.h"
 #include "metadata/tags/picture_tags.h"
 #include "picture/encode_options.h"
 #include "picture/read_request.h"
+#include "platform/clock.h"
+#include "platform/file_times.h"
 #include "processing/faces/face_options.h"
 #include "processing/palette/reduce.h"
 #include "settings/configuration.h"
@@ -135,6 +138,21 @@ void StoreThumbnailUpdate(const ThumbnailUpdateOptions& options) {
 TagSources TagSourcesFromSettings() {
   return {.commentFolder = std::string(settings.FileCommentPath.view()),
           .commentExtension = std::string(settings.TextCommentExtension.view())};
+}
+
+FileTimeRule FileTimeRuleFromSettings() {
+  platform::LocalTime time;
+  time.year = settings.FileTimeYear;
+  time.month = settings.FileTimeMonth;
+  time.day = settings.FileTimeDay;
+  time.hour = settings.FileTimeHour;
+  time.minute = settings.FileTimeMinute;
+  time.second = settings.FileTimeSecond;
+  const auto start = time.year > 0 ? platform::SecondsOfLocalTime(time) : std::nullopt;
+  return {.start = start.value_or(platform::Now()),
+          .increment = settings.FileTimeSequential != 0 ? settings.FileTimeIncrement : 0,
+          .setsAccess = settings.FileTimeUpdateAccess != 0,
+          .setsModification = settings.FileTimeUpdateWrite != 0};
 }
 
 bool WritesCommentsFromSettings() { return settings.WriteFileComments != 0; }

@@ -11,6 +11,7 @@ struct HistoryOptions;
 struct ReadOptions;
 struct ReduceOptions;
 struct FaceOptions;
+struct FileTimeRule;
 struct TagSources;
 struct ThumbnailOptions;
 struct ThumbnailUpdateOptions;
@@ -45,6 +46,9 @@ void StoreThumbnailUpdate(const ThumbnailUpdateOptions& options);
 
 // FileCommentPath and TextCommentExtension.
 TagSources TagSourcesFromSettings();
+// FileTimeYear to FileTimeSecond (now if the year is 0), FileTimeSequential, FileTimeIncrement,
+// FileTimeUpdateAccess and FileTimeUpdateWrite.
+FileTimeRule FileTimeRuleFromSettings();
 // WriteFileComments.
 bool WritesCommentsFromSettings();
 

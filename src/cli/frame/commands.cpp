@@ -9,7 +9,6 @@
 #include "cli/commands/exif/exif_edit.h"
 #include "cli/commands/exif/exif_gps.h"
 #include "cli/commands/faces.h"
-#include "cli/commands/find.h"
 #include "cli/commands/formats.h"
 #include "cli/commands/history.h"
 #include "cli/commands/info.h"
@@ -20,10 +19,12 @@
 #include "cli/commands/plugins.h"
 #include "cli/commands/recipe.h"
 #include "cli/commands/rename.h"
-#include "cli/commands/similar.h"
+#include "cli/commands/search/find.h"
+#include "cli/commands/search/similar.h"
 #include "cli/commands/tag.h"
 #include "cli/commands/tdb.h"
 #include "cli/commands/thumbs.h"
+#include "cli/commands/touch.h"
 #include "cli/commands/turn.h"
 #include "cli/commands/verify.h"
 #include "cli/completion/completion.h"
@@ -54,6 +55,7 @@ constexpr Command kCommands[] = {
     {"pages papers",  TrLater("list papers and print sizes"),                           Needs::Settings, SetUpPagesPapers},
     {"gallery", TrLater("build a folder of web pages with pictures"),                   Needs::Formats,  SetUpGallery},
     {"gallery theme", TrLater("write the files of the built-in gallery theme"),         Needs::Nothing,  SetUpGalleryTheme},
+    {"touch",   TrLater("set the times of files, such as when they were taken"),        Needs::Formats,  SetUpTouch},
     {"turn",    TrLater("rotate or flip pictures, JPEG losslessly"),                    Needs::Formats,  SetUpTurn},
     {"tag",     TrLater("set keywords, ratings, labels and comments"),                   Needs::Formats,  SetUpTag},
     {"info",    TrLater("show size, depth and other facts without decoding pictures"),  Needs::Formats,  SetUpInfo},

@@ -1,4 +1,4 @@
-#include "cli/commands/find.h"
+#include "cli/commands/search/find.h"
 
 #include <algorithm>
 #include <memory>

@@ -1,4 +1,4 @@
-#include "cli/commands/similar.h"
+#include "cli/commands/search/similar.h"
 
 #include <algorithm>
 #include <functional>
