@@ -230,6 +230,8 @@ typedef struct FMW_METADATA {
   int32_t pages;    /*  8: pictures or frames of the file, 0 as PLUGIN11GetInfo said */
   int32_t rounds;   /* 12: times an animation plays, 0 for endless */
   uint32_t lost;    /* 16: FMW_LOST_ bits */
+  int32_t width;    /* 20: the size with the options of the request, 0 as PLUGIN11GetInfo said */
+  int32_t height;   /* 24 */
   FMW_BLOCK exif;   /* a TIFF structure, without "Exif\0\0"; orientation 1 if already applied */
   FMW_BLOCK xmp;    /* an XMP packet */
   FMW_BLOCK icc;    /* an ICC profile; none for sRGB */

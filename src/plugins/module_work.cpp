@@ -135,6 +135,10 @@ void TakeMetadata(const LoadedModule& module, const ModuleQuestion& question, Ca
   TakeBlock(metadata.delays, taken.delays);
   if (done == 0) return;
   taken.info = description.info;
+  if (metadata.width > 0 && metadata.height > 0) {
+    taken.info.width = metadata.width;
+    taken.info.height = metadata.height;
+  }
   taken.pages = metadata.pages;
   taken.rounds = metadata.rounds;
   taken.lost = metadata.lost;

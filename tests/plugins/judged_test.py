@@ -11,7 +11,8 @@ from pathlib import Path
 PROJECT = Path(__file__).resolve().parents[2]
 FOTOMILL = os.environ["FOTOMILL"]
 CORPUS = os.environ.get("FOTOMILL_CORPUS")
-TOOLS = ["avifdec", "avifenc", "djxl", "cjxl", "heif-convert", "pngtopam", "exiftool"]
+TOOLS = ["avifdec", "avifenc", "djxl", "cjxl", "heif-convert", "opj_decompress", "opj_compress",
+         "dcraw_emu", "pngtopam", "exiftool"]
 missing = [tool for tool in TOOLS if not shutil.which(tool)]
 if missing:
     print("skipped: not installed: " + " ".join(missing))
@@ -55,6 +56,10 @@ def decode(path, png):
         return run("avifdec", "-d", "8", path, png)
     if kind == ".jxl":
         return run("djxl", path, png, "--bits_per_sample=8")
+    if kind in (".jp2", ".j2k"):
+        return run("opj_decompress", "-i", path, "-o", png)
+    if kind == ".svg":
+        return run("rsvg-convert", path, "-o", png)
     return run("heif-convert", path, png)
 
 
@@ -67,6 +72,14 @@ def compare(path, folder):
     check(f"{path.name}: another picture", expected is not None and pixels(ours) == expected)
 
 
+def data_folder(folder, *options):
+    """A data folder with options of modules."""
+    data = folder / "data"
+    data.mkdir(exist_ok=True)
+    (data / "Fotomill Professional 11.ini").write_text("\n".join(["[Plugins]", *options, ""]))
+    return data
+
+
 def test_writing(folder):
     """The tools read what we write, lossless formats exactly."""
     for name in SAMPLES:
@@ -74,20 +87,18 @@ def test_writing(folder):
         png = folder / (name + ".png")
         fotomill("convert", source, "--to", "png", "--out", png)
         for extension, options in [("avif", []), ("avif", ["--quality", "20"]), ("jxl", []),
-                                   ("jxl", ["--quality", "40"])]:
+                                   ("jxl", ["--quality", "40"]), ("jp2", []), ("j2k", []),
+                                   ("jp2", ["--quality", "30"])]:
             if extension not in EXTENSIONS:
                 continue
             written = folder / f"{name}{len(options)}.{extension}"
             result = fotomill("convert", source, "--to", extension, "--out", written, *options)
             check(f"{written.name}: {result.stderr}", result.returncode == 0)
             compare(written, folder)
-        if "jxl" in EXTENSIONS:
-            lossless = folder / (name + ".lossless.jxl")
-            (folder / "data").mkdir(exist_ok=True)
-            ini = folder / "data" / "Fotomill Professional 11.ini"
-            ini.write_text("[Plugins]\nFMWPL_jpegxl.so.Lossless=1\n")
-            fotomill("--data", folder / "data", "convert", source, "--to", "jxl",
-                     "--out", lossless)
+        data = data_folder(folder, "FMWPL_jpegxl.so.Lossless=1", "FMWPL_jpeg2000.so.Quality=100")
+        for extension in EXTENSIONS & {"jxl", "jp2"}:
+            lossless = folder / (name + ".lossless." + extension)
+            fotomill("--data", data, "convert", source, "--to", extension, "--out", lossless)
             back = folder / (lossless.name + ".png")
             decode(lossless, back)
             check(f"{lossless.name}: not without loss", pixels(back) == pixels(png))
@@ -138,7 +149,7 @@ def test_metadata(folder):
 
 def test_corpus(folder):
     unlike = {"hdr_pq_test.jxl", "pq_gradient.jxl"}  # the tool keeps the range of HDR pictures
-    for name in ("avif", "heic", "jxl"):
+    for name in ("avif", "heic", "jxl", "jp2", "svg"):
         for path in sorted((Path(CORPUS) / name).iterdir()):
             if path.name in unlike or name not in EXTENSIONS:
                 continue
@@ -148,7 +159,24 @@ def test_corpus(folder):
             (folder / "known.png").unlink(missing_ok=True)
 
 
-for test in [test_writing, test_reading, test_metadata] + ([test_corpus] if CORPUS else []):
+def test_raw(folder):
+    """Raw files are developed as by the library's program with the same options."""
+    if "nef" not in EXTENSIONS:
+        return
+    data = data_folder(folder, "FMWPL_raw.so.Picture=2")
+    for path in sorted((Path(CORPUS) / "raw").iterdir()):
+        ours, theirs = folder / "ours.ppm", folder / "theirs.ppm"
+        run("dcraw_emu", "-w", "-g", "2.4", "12.92", "-Z", theirs, path)
+        if theirs.exists() and theirs.stat().st_size > 0:
+            fotomill("--data", data, "convert", path, "--to", "ppm", "--out", ours)
+            check(f"{path.name}: another picture",
+                  ours.exists() and ours.read_bytes() == theirs.read_bytes())
+        for file in (ours, theirs):
+            file.unlink(missing_ok=True)
+
+
+for test in [test_writing, test_reading, test_metadata] + (
+        [test_corpus, test_raw] if CORPUS else []):
     with tempfile.TemporaryDirectory() as place:
         test(Path(place))
 print("\n".join(faults) if faults else f"the tools agree in {checked} cases")
