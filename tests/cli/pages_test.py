@@ -200,6 +200,9 @@ def test_large(work):
         red = sheet.convert("RGB").getpixel((5 * 60, 5 * 100))[0]
     near(red, (180 + 50) / 600 * 255, 2, "what is on the second sheet")
 
+    run("pages", "poster", work / "wide.jpg", "--size", "5000x5000", "--paper", "40x40mm",
+        "--out", work / "x.pdf", status=2)
+
     pdf = work / "cube.pdf"
     run("pages", "cube", work / "wide.jpg", "--size", "5cm", "--out", pdf,
         "--set", "PrintDodecDashedLines=0")

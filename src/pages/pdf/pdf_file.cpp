@@ -110,6 +110,8 @@ Status PdfFile::WriteDeflated(int32_t object, std::string_view entries,
 Status PdfFile::Finish(int32_t catalog, int32_t info, const std::string& id,
                        platform::Existing existing) {
   const uint64_t start = out_.Position();
+  constexpr uint64_t kMostBytes = 9'999'999'999;  // offsets have ten digits
+  if (start > kMostBytes) return Status::ErrorWritingFile;
   out_.Text(std::string("xref\n0 ") + std::to_string(offsets_.size() + 1) +
             "\n0000000000 65535 f \n");
   for (const uint64_t offset : offsets_) {

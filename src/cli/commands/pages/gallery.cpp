@@ -158,10 +158,10 @@ int RunGallery(const GalleryCommand& options, const CommandContext& context) {
   std::vector<GalleryOutcome> outcomes;
   std::string failed;
   const Status status = BuildGallery(selection->files, gallery, host, outcomes, failed);
-  if (status != Status::FunctionCancelled) {
+  if (status == Status::Ok)
     Report(*selection, outcomes, output);
-    if (status != Status::Ok) output.Failure(failed, status, ReasonSentence());
-  }
+  else if (status != Status::FunctionCancelled)
+    output.Failure(failed, status, ReasonSentence());
   return output.Finish();
 }
 

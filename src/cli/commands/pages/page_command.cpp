@@ -92,7 +92,7 @@ class PageWriter {
   Status WriteDocument(PageRun& run, const std::string& path) {
     std::ranges::fill(destinations_, path);
     const bool replace = options_.overwrite == "replace";
-    if (!replace && platform::ExistenceOf(path) != platform::Existence::No) {
+    if (!replace && platform::ExistenceOf(path) == platform::Existence::Yes) {
       hint_ = Tr("\"%1\" exists; --overwrite replace replaces it.", path);
       return Status::ErrorCreatingFile;
     }

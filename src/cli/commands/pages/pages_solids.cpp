@@ -23,6 +23,7 @@ struct CutoutCommand : PageCommandOptions {
 };
 
 constexpr double kMargin = 10, kOverlap = 10;
+constexpr double kMostSheets = 10000;
 constexpr double kLeastStep = 5;  // from sheet to sheet, in millimeters
 constexpr const char* kSheetLabel = TrLater("Sheet %1 of %2 (row %3, column %4)");
 constexpr const char* kSketchTitle = TrLater("%1: %2 x %3 cm on %4 sheets");
@@ -52,7 +53,9 @@ std::string ReadPoster(const PosterCommand& options, PosterOptions& poster) {
   }
   const double room = std::min(poster.paper.width, poster.paper.height) - 2 * poster.margin;
   if (room - poster.overlap < kLeastStep) return Tr("The overlap leaves no room on the sheets.");
-  return {};
+  const double step = room - poster.overlap;
+  const double sheets = (poster.size.width / step + 1) * (poster.size.height / step + 1);
+  return sheets > kMostSheets ? Tr("The poster would need too many sheets.") : std::string();
 }
 
 int RunPoster(const PosterCommand& options, const CommandContext& context) {
