@@ -4,6 +4,7 @@
 
 #include "core/data_folder.h"
 #include "core/limits.h"
+#include "core/plain_name.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "texts/name_hint.h"
@@ -108,6 +109,18 @@ std::string FindRecipe(const std::string& nameOrFile, std::string& text, std::st
   std::vector<std::string_view> names;
   for (const NamedRecipe& recipe : recipes) names.emplace_back(recipe.name);
   return Tr("There is no recipe \"%1\".", nameOrFile) + NearestNameHint(nameOrFile, names);
+}
+
+std::string RecipePath(const std::string& name) {
+  const std::string folder = FolderOfRecipes();
+  if (folder.empty() || name.empty() || !IsPlainName(name)) return {};
+  return platform::JoinFolder(folder, name + std::string(kEnding));
+}
+
+std::string SaveRecipe(const std::string& path, const std::string& text) {
+  if (platform::MakeFolders(platform::FolderOf(path)) && platform::WriteWholeFile(path, text))
+    return {};
+  return WithReason(Tr("\"%1\" cannot be created.", path));
 }
 
 }  // namespace fotomill

@@ -22,4 +22,11 @@ std::vector<NamedRecipe> ListRecipes();
 // is empty for built-in recipes.
 std::string FindRecipe(const std::string& nameOrFile, std::string& text, std::string& path);
 
+// The file of a recipe in the data folder; empty without a data folder, or if the name cannot be
+// that of a file.
+std::string RecipePath(const std::string& name);
+// Writes a recipe, replacing an older one; creates the folder if it is missing. Empty on success,
+// else what is wrong, as a sentence.
+std::string SaveRecipe(const std::string& path, const std::string& text);
+
 }  // namespace fotomill

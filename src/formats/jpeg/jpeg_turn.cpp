@@ -16,6 +16,7 @@
 
 #include "formats/jpeg/jpeg_library.h"
 #include "picture/packed_image.h"
+#include "processing/geometry/cut.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -45,6 +46,7 @@ struct BlockTurn {
 
 // The blocks of one component.
 struct Plane {
+  JDIMENSION left = 0, top = 0;              // in the old picture, where it is cropped
   JDIMENSION fromWidth = 0, fromHeight = 0;  // in the old picture, without trimmed edges
   JDIMENSION width = 0, height = 0;          // in the rotated picture
   int across = 1, down = 1;                  // sampling factors after rotation
@@ -69,6 +71,7 @@ struct JpegTurner {
   jpeg_progress_mgr monitor = {};  // of the writer, also canceled by the reader's token
   unsigned char* bytes = nullptr;
   unsigned long size = 0;
+  JDIMENSION left = 0, top = 0;      // in the old picture, where it is cropped
   JDIMENSION width = 0, height = 0;  // of the old picture, without trimmed edges
   std::array<Plane, MAX_COMPONENTS> planes;
 };
@@ -100,6 +103,25 @@ void Measure(JpegTurner& turner, Turn turn, bool trim, TurnedJpeg& turned) {
   turned.height = static_cast<int32_t>(turn.swap ? turner.width : turner.height);
 }
 
+// Determines which blocks a cropped picture keeps.
+void MeasureCrop(JpegTurner& turner, const Rectangle& area, TurnedJpeg& cropped) {
+  const jpeg_decompress_struct& old = turner.reader.info;
+  const Rectangle kept = Clipped(area, static_cast<int32_t>(old.image_width),
+                                 static_cast<int32_t>(old.image_height));
+  const auto pieceWidth = static_cast<int32_t>(PieceWidth(old)),
+             pieceHeight = static_cast<int32_t>(PieceHeight(old));
+  if (kept.width == 0 || kept.x % pieceWidth != 0 || kept.y % pieceHeight != 0) {
+    cropped.obstacle = TrRecorded(
+        "The edges do not lie between blocks of %1 x %2 pixels.", pieceWidth, pieceHeight);
+  }
+  turner.left = static_cast<JDIMENSION>(kept.x);
+  turner.top = static_cast<JDIMENSION>(kept.y);
+  turner.width = static_cast<JDIMENSION>(kept.width);
+  turner.height = static_cast<JDIMENSION>(kept.height);
+  cropped.width = kept.width;
+  cropped.height = kept.height;
+}
+
 // Computes the old and new block positions of each component.
 void LayOut(JpegTurner& turner, Turn turn) {
   const jpeg_decompress_struct& old = turner.reader.info;
@@ -112,6 +134,8 @@ void LayOut(JpegTurner& turner, Turn turn) {
     };
     plane.fromWidth = kept(turner.width, component.h_samp_factor, old.max_h_samp_factor);
     plane.fromHeight = kept(turner.height, component.v_samp_factor, old.max_v_samp_factor);
+    plane.left = kept(turner.left, component.h_samp_factor, old.max_h_samp_factor);
+    plane.top = kept(turner.top, component.v_samp_factor, old.max_v_samp_factor);
     plane.width = plane.fromWidth;
     plane.height = plane.fromHeight;
     plane.across = component.h_samp_factor;
@@ -194,9 +218,9 @@ void TurnBlocks(JpegTurner& turner, const Plane& plane, Turn turn, const BlockTu
   for (JDIMENSION y = 0; y < plane.height && !turner.reader.stop.Asked(); ++y) {
     JBLOCKROW target = toRow(y);
     if (!turn.swap) {
-      const JBLOCKROW row = fromRow(source(turn.flipY, y, plane.fromHeight));
+      const JBLOCKROW row = fromRow(plane.top + source(turn.flipY, y, plane.fromHeight));
       for (JDIMENSION x = 0; x < plane.width; ++x)
-        block.Apply(row[source(turn.flipX, x, plane.fromWidth)], target[x]);
+        block.Apply(row[plane.left + source(turn.flipX, x, plane.fromWidth)], target[x]);
       continue;
     }
     const JDIMENSION column = source(turn.flipX, y, plane.fromWidth);
@@ -236,16 +260,8 @@ Status WriteTurned(JpegTurner& turner, Turn turn) {
   return status == Status::MemoryAllocationError ? status : Status::UnsuitableImage;
 }
 
-}  // namespace
-
-Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool trim,
-                const StopToken& stop, TurnedJpeg& turned) {
-  turned = {};
-  const Turn turn = TurnOf(orientation);
-  JpegTurner turner;
-  turner.reader.stop = stop;
-  RETURN_IF_BAD(ReadJpegHeader(turner.reader, file));
-  Measure(turner, turn, trim, turned);
+// Rewrites the blocks that were measured.
+Status Rewrite(JpegTurner& turner, std::span<const uint8_t> file, Turn turn, TurnedJpeg& turned) {
   LayOut(turner, turn);
   // the old and the new coefficients
   const bool fits = CheckFileMemory(2 * JpegCoefficientBytes(turner.reader, true)) == Status::Ok;
@@ -257,6 +273,39 @@ Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool tri
   if (status == Status::Ok) turned.file.assign(turner.bytes, turner.bytes + turner.size);
   if (status != Status::UnsuitableImage) return status;
   turned.obstacle = TrRecorded("This kind of JPEG cannot be rewritten losslessly.");
+  return Status::Ok;
+}
+
+}  // namespace
+
+Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool trim,
+                const StopToken& stop, TurnedJpeg& turned) {
+  turned = {};
+  const Turn turn = TurnOf(orientation);
+  JpegTurner turner;
+  turner.reader.stop = stop;
+  RETURN_IF_BAD(ReadJpegHeader(turner.reader, file));
+  Measure(turner, turn, trim, turned);
+  return Rewrite(turner, file, turn, turned);
+}
+
+Status CropJpeg(std::span<const uint8_t> file, const Rectangle& area, const StopToken& stop,
+                TurnedJpeg& cropped) {
+  cropped = {};
+  JpegTurner turner;
+  turner.reader.stop = stop;
+  RETURN_IF_BAD(ReadJpegHeader(turner.reader, file));
+  MeasureCrop(turner, area, cropped);
+  return Rewrite(turner, file, TurnOf(Orientation::Upright), cropped);
+}
+
+Status ReadJpegGrid(std::span<const uint8_t> file, JpegGrid& grid) {
+  JpegReader reader;
+  RETURN_IF_BAD(ReadJpegHeader(reader, file));
+  grid.picture = {static_cast<int32_t>(reader.info.image_width),
+                  static_cast<int32_t>(reader.info.image_height)};
+  grid.block = {static_cast<int32_t>(PieceWidth(reader.info)),
+                static_cast<int32_t>(PieceHeight(reader.info))};
   return Status::Ok;
 }
 

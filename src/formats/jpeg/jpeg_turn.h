@@ -8,12 +8,14 @@
 
 #include "core/status.h"
 #include "core/workers/stop_token.h"
+#include "picture/rectangle.h"
 #include "processing/geometry/orient.h"
+#include "processing/geometry/scale.h"
 #include "texts/texts.h"
 
 namespace fotomill {
 
-// A JPEG picture rotated losslessly: its coefficients are rearranged without decoding.
+// A JPEG picture rotated or cropped losslessly: its coefficients are rearranged without decoding.
 struct TurnedJpeg {
   // a JPEG file without application segments and comments; empty if there is an obstacle
   std::vector<uint8_t> file;
@@ -31,5 +33,16 @@ struct TurnedJpeg {
 // if `stop` was requested.
 Status TurnJpeg(std::span<const uint8_t> file, Orientation orientation, bool trim,
                 const StopToken& stop, TurnedJpeg& turned);
+
+// Crops the picture of a JPEG file to `area`, in pixels as stored, clipped to the picture. Its left
+// and top edge must lie between blocks, else that is an obstacle. Statuses as above.
+Status CropJpeg(std::span<const uint8_t> file, const Rectangle& area, const StopToken& stop,
+                TurnedJpeg& cropped);
+// The size of a JPEG picture, and of the blocks between which it can be cropped, 8 or more pixels.
+struct JpegGrid {
+  Size picture{0, 0}, block{0, 0};
+};
+// Statuses of reading the header.
+Status ReadJpegGrid(std::span<const uint8_t> file, JpegGrid& grid);
 
 }  // namespace fotomill

@@ -44,6 +44,16 @@ int32_t NumberOf(const std::vector<DestinationFormat>& formats, size_t place) {
   return formatCount + static_cast<int32_t>(place);
 }
 
+// The formats of the outputs: those of the recipe, if each output has one, else the choice's own.
+std::vector<std::string> ExtensionsOf(const DestinationChoice& choice) {
+  if (!RecipeNamesFormats(choice.step)) return {choice.extension};
+  Recipe recipe;
+  (void)ReadRecipe(choice.step, KeyTextInForce, recipe);
+  std::vector<std::string> extensions;
+  for (const RecipeOutput& output : recipe.outputs) extensions.push_back(output.save.to);
+  return extensions;
+}
+
 // Sets the comment of all outputs, in addition to other changes.
 void AddComment(const std::string& comment, BatchFunction& function) {
   if (comment.empty()) return;
@@ -103,8 +113,10 @@ std::vector<DestinationPart> DestinationParts() {
 }
 
 std::string DestinationProblem(const DestinationChoice& choice) {
-  const int32_t row = RowOf(choice.extension);
-  if (row == kNoFormat || !CanWrite(FormatRow(row))) return Tr("The format cannot be written.");
+  for (const std::string& extension : ExtensionsOf(choice)) {
+    const int32_t row = RowOf(extension);
+    if (row == kNoFormat || !CanWrite(FormatRow(row))) return Tr("The format cannot be written.");
+  }
   if (choice.folder.empty()) return {};
   if (choice.folder.size() > PathText::Capacity())
     return Tr("The path of the folder is longer than 260 characters.");
@@ -135,10 +147,19 @@ DestinationOutlook OutlookOf(const DestinationChoice& choice,
   return outlook;
 }
 
+bool RecipeNamesFormats(const std::string& recipe) {
+  Recipe read;
+  return !recipe.empty() && ReadRecipe(recipe, KeyTextInForce, read).empty() &&
+         std::ranges::none_of(read.outputs,
+                              [](const RecipeOutput& output) { return output.save.to.empty(); });
+}
+
 BatchJob JobFor(const DestinationChoice& choice) {
   BatchJob job = NewBatchJob();
-  job.formatIndex = RowOf(choice.extension);
-  job.extension = UpperCase(choice.extension);
+  if (!RecipeNamesFormats(choice.step)) {
+    job.formatIndex = RowOf(choice.extension);
+    job.extension = UpperCase(choice.extension);
+  }
   job.destinationFolder = choice.folder;
   job.naming.beside = choice.folder.empty();
   if (!choice.comment.empty()) job.writeComments = true;
@@ -153,10 +174,12 @@ BatchFunction FunctionFor(const DestinationChoice& choice, const BatchJob& job) 
   auto recipe = std::make_shared<Recipe>();
   if (!choice.step.empty() && ReadRecipe(choice.step, KeyTextInForce, *recipe).empty()) {
     function.history = FunctionOfFamily(recipe->First()->family);
-    const FormatLookup none = [](const std::string&, int32_t&, std::string&) {
-      return std::string();  // steps never name a format
+    const FormatLookup lookup = [](const std::string& extension, int32_t& row, std::string& name) {
+      row = RowOf(extension);
+      name = UpperCase(extension);
+      return std::string();
     };
-    (void)SetRecipe(recipe, std::string(settings.ExifCopyrightHolder.view()), job, none, function);
+    (void)SetRecipe(recipe, std::string(settings.ExifCopyrightHolder.view()), job, lookup, function);
   }
   AddComment(choice.comment, function);
   return function;

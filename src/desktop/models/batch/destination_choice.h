@@ -29,7 +29,7 @@ struct DestinationChoice {
   bool autoOrient = true;
   bool keepMetadata = true;
   std::string comment = {};  // of all outputs; empty: keep the source's comment
-  std::string step = {};     // a recipe step applied to every picture; empty: none
+  std::string step = {};     // a recipe applied to every picture; empty: none
 };
 
 // Recently used folders, latest first; `shown`,
@@ -61,6 +61,9 @@ inline constexpr size_t kMostLookedUp = 500;
 // For a valid choice and at least one file.
 DestinationOutlook OutlookOf(const DestinationChoice& choice,
                              const std::vector<std::string>& files);
+
+// Whether each output of a recipe has a format; the choice's own is then not used.
+bool RecipeNamesFormats(const std::string& recipe);
 
 // A job for a valid choice, ignoring DestForceSourceDir.
 BatchJob JobFor(const DestinationChoice& choice);

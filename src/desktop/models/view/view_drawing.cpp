@@ -181,23 +181,28 @@ class RowsBehind {
 
 void DrawView(const ViewSource& source, const ViewTransform& transform, const Backdrop& backdrop,
               bool smooth, RgbImage& canvas) {
+  const Rectangle shown{transform.X(), transform.Y(), transform.ShownWidth(),
+                        transform.ShownHeight()};
+  const bool covered = shown.x <= 0 && shown.y <= 0 && shown.x + shown.width >= canvas.width &&
+                       shown.y + shown.height >= canvas.height;
+  if (!covered) canvas = FilledImage(canvas.width, canvas.height, backdrop.around);
+  DrawPart(source, shown, backdrop, smooth, canvas);
+}
+
+void DrawPart(const ViewSource& source, const Rectangle& shown, const Backdrop& backdrop,
+              bool smooth, RgbImage& canvas) {
   const PackedImage& image = source.image;
-  const int32_t x = transform.X(), y = transform.Y();
-  const int32_t left = std::max(x, 0), right = std::min(x + transform.ShownWidth(), canvas.width);
-  const int32_t top = std::max(y, 0), bottom = std::min(y + transform.ShownHeight(), canvas.height);
-  if (left > 0 || top > 0 || right < canvas.width || bottom < canvas.height) {
-    canvas = FilledImage(canvas.width, canvas.height, backdrop.around);
-  }
+  const int32_t left = std::max(shown.x, 0), right = std::min(shown.x + shown.width, canvas.width);
+  const int32_t top = std::max(shown.y, 0),
+                bottom = std::min(shown.y + shown.height, canvas.height);
   if (left >= right || top >= bottom || image.Empty() || image.Bits() != 24 || canvas.Empty())
     return;
-  const bool same =
-      image.Width() == transform.ShownWidth() && image.Height() == transform.ShownHeight();
+  const bool same = image.Width() == shown.width && image.Height() == shown.height;
   const bool between = smooth && !same;
   const bool opaque = source.alpha.Empty();
   const auto columns =
-      PositionsOf(left - x, right - left, transform.ShownWidth(), image.Width(), between);
-  const auto rows =
-      PositionsOf(top - y, bottom - top, transform.ShownHeight(), image.Height(), between);
+      PositionsOf(left - shown.x, right - left, shown.width, image.Width(), between);
+  const auto rows = PositionsOf(top - shown.y, bottom - top, shown.height, image.Height(), between);
   const RowsBehind behind(backdrop, left, opaque ? 0 : right - left);
   BetweenPixels pixels(source, columns);
   for (int32_t line = top; line < bottom; ++line) {
@@ -212,7 +217,7 @@ void DrawView(const ViewSource& source, const ViewTransform& transform, const Ba
     } else if (!opaque) {
       BlendNearest(bgr, source.alpha.Row(nearest).data(), columns, behind.Row(line), rgb);
     } else if (same) {
-      SwapColors(bgr + 3 * (left - x), static_cast<size_t>(right - left), rgb);
+      SwapColors(bgr + 3 * (left - shown.x), static_cast<size_t>(right - left), rgb);
     } else {
       DrawNearest(bgr, columns, rgb);
     }

@@ -4,6 +4,7 @@
 
 #include "desktop/models/drawing/rgb_image.h"
 #include "desktop/models/view/view_transform.h"
+#include "picture/rectangle.h"
 
 namespace fotomill::desktop {
 
@@ -27,6 +28,9 @@ struct Backdrop {
 // size is copied; others are sampled at the nearest pixel, or with `smooth` interpolated. The
 // checkerboard does not move with the picture.
 void DrawView(const ViewSource& source, const ViewTransform& transform, const Backdrop& backdrop,
+              bool smooth, RgbImage& canvas);
+// Draws a picture, or part of one, into the rectangle `shown` of the canvas; the rest is unchanged.
+void DrawPart(const ViewSource& source, const Rectangle& shown, const Backdrop& backdrop,
               bool smooth, RgbImage& canvas);
 
 }  // namespace fotomill::desktop

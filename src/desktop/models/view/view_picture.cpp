@@ -82,6 +82,10 @@ Status LoadInto(const ViewRequest& request, ViewPicture& view, ProgressSink* pro
 
 void SetScreenProfile(std::vector<uint8_t> profile) { screenProfile = std::move(profile); }
 
+void ToScreenColors(const std::vector<uint8_t>& icc, PackedImage& image) {
+  if (!icc.empty() || !screenProfile.empty()) (void)TransformOf(icc).Apply(image);
+}
+
 ViewLook ViewLook::FromSettings() {
   return {settings.ViewModeColorProfiles != 0, settings.ViewModeCheckerboard != 0};
 }
@@ -97,9 +101,7 @@ uint64_t ViewPicture::Bytes() const {
 Status PrepareView(PicturePointer picture, ViewPicture& view) {
   const ViewRequest& request = view.request;
   // Before compositing with the background, whose color is already for the screen.
-  const bool profiles = !picture->metadata.icc.empty() || !screenProfile.empty();
-  if (request.look.profiles && profiles)
-    (void)TransformOf(picture->metadata.icc).Apply(picture->image);
+  if (request.look.profiles) ToScreenColors(picture->metadata.icc, picture->image);
   if (request.look.keepAlpha) {
     RETURN_IF_BAD(PrepareWithAlpha(*picture));
   } else {

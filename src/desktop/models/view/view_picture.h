@@ -30,6 +30,8 @@ struct ViewLook {
 // Sets the screen's color profile for pictures made from now on; empty for sRGB. Call before
 // requesting the first picture.
 void SetScreenProfile(std::vector<uint8_t> profile);
+// Converts pixels with an ICC profile, empty for sRGB, to the screen's colors. Any thread.
+void ToScreenColors(const std::vector<uint8_t>& icc, PackedImage& image);
 
 // A picture for a view window: a page of a
 // file, and the size of the window to fit.

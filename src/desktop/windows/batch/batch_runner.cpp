@@ -36,13 +36,19 @@ BatchRunner::BatchRunner(Shell& shell) : shell_(shell) {
 BatchRunner::~BatchRunner() { thread_.reset(); }
 
 void BatchRunner::Run(std::vector<BatchFile> files, BatchFunction function, BatchJob job) {
-  Run(std::move(job), [files = std::move(files), function = std::move(function)](
-                          BatchJob& running) { return RunBatch(files, function, running); });
+  const auto run = [files = std::move(files), function = std::move(function)](BatchJob& running) {
+    return RunBatch(files, function, running);
+  };
+  Run({std::move(job), run, nullptr, true});
 }
 
 void BatchRunner::Run(BatchJob job, BatchThread::Work work,
                       std::shared_ptr<PreviousFiles> previous) {
-  waiting_.push_back({std::move(job), std::move(work), std::move(previous)});
+  Run({std::move(job), std::move(work), std::move(previous)});
+}
+
+void BatchRunner::Run(Waiting waiting) {
+  waiting_.push_back(std::move(waiting));
   if (!Running()) {
     StartNext();
   } else {
@@ -64,6 +70,7 @@ void BatchRunner::StartNext() {
   Waiting next = std::move(waiting_.front());
   waiting_.pop_front();
   previous_ = std::move(next.previous);
+  converts_ = next.converts;
   thread_->StartWork(std::move(next.job), std::move(next.work));
 }
 
@@ -140,8 +147,7 @@ void BatchRunner::BatchEnded(Status status, const BatchJob& job) {
   LogEvent("batch", "ended status=" + std::to_string(StatusNumber(status)));
   shell_.Uses().Note(job.uses);
   // Outputs, but not renamed files.
-  if (job.formatIndex != kNoFormat || previous_ != nullptr)
-    shell_.Files().NoteDone(std::exchange(written_, {}));
+  if (converts_ || previous_ != nullptr) shell_.Files().NoteDone(std::exchange(written_, {}));
   if (previous_ != nullptr) shell_.Files().NoteDone(std::exchange(previous_, nullptr)->Operation());
   if (job.filesChanged) shell_.FilesChanged();
   if (!seen_ && settings.ProgressRaiseAppWindow != 0) RaiseProgram();

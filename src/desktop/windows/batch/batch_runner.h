@@ -37,7 +37,9 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
     BatchJob job;
     BatchThread::Work work;
     std::shared_ptr<PreviousFiles> previous;
+    bool converts = false;  // writes outputs
   };
+  void Run(Waiting waiting);
   void StartNext();
   void ReportWaiting();
   void LeaveBox();
@@ -62,6 +64,7 @@ class BatchRunner : public wxEvtHandler, public BatchWindows {
   Shell& shell_;
   std::deque<Waiting> waiting_;
   ProgressWindow* box_ = nullptr;            // of the current or last batch
+  bool converts_ = false;                    // the current batch writes outputs
   bool seen_ = false;                        // the user saw its end
   size_t failed_ = 0;                        // in the current batch
   std::shared_ptr<PreviousFiles> previous_;  // of the current batch

@@ -25,12 +25,14 @@ namespace fotomill::desktop {
 
 DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
                                      const std::vector<std::string>& files,
-                                     std::vector<NamedSize> sizes)
+                                     std::vector<NamedSize> sizes, std::string recipe)
     : wxDialog(parent, wxID_ANY, verb, wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "DestinationBox"),
       files_(files),
       shownFolder_(platform::FolderOf(files_.front())),
-      sizes_(std::move(sizes)) {
+      sizes_(std::move(sizes)),
+      recipe_(std::move(recipe)),
+      ownFormats_(RecipeNamesFormats(recipe_)) {
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   BuildFormat();
   BuildOptions();
@@ -67,6 +69,9 @@ void DestinationDialog::BuildFormat() {
   formatSizer_ = new wxBoxSizer(wxVERTICAL);
   if (!sizes_.empty()) formatSizer_->Add(NewSizeRow(), Below());
   formatSizer_->Add(row, Below());
+  if (!ownFormats_) return;
+  format_->Disable();
+  format_->SetToolTip(Label("The recipe decides the format."));
 }
 
 wxSizer* DestinationDialog::NewSizeRow() {
@@ -154,7 +159,7 @@ void DestinationDialog::ShowPart(size_t part) {
   part_ = part;
   const bool format = parts_[part] != DestinationPart::Folder;
   GetSizer()->Show(formatSizer_, format, true);
-  orient_->Show(format && sizes_.empty());  // operations always do this
+  orient_->Show(format && sizes_.empty() && recipe_.empty());  // operations always do this
   GetSizer()->Show(folderSizer_, parts_[part] != DestinationPart::Format, true);
   ok_->SetLabel(part + 1 < parts_.size() ? Label("Nex&t") : okText_);
   UpdateControls();
@@ -166,6 +171,7 @@ void DestinationDialog::ShowPart(size_t part) {
 
 DestinationChoice DestinationDialog::Choice() const {
   DestinationChoice choice;
+  choice.step = recipe_;
   choice.extension = formats_[static_cast<size_t>(format_->GetSelection())].extension;
   if (into_->GetValue()) choice.folder = WholeFolder(Utf8(folder_->GetValue()), shownFolder_);
   choice.reduce = reduce_->GetValue();
@@ -181,7 +187,8 @@ void DestinationDialog::UpdateControls() {
   folder_->Enable(into_->GetValue());
   browse_->Enable(into_->GetValue());
   if (comment_ != nullptr) comment_->Enable(choice.keepMetadata);
-  options_->Show(parts_[part_] != DestinationPart::Folder && HasOverrideBox(choice.extension));
+  options_->Show(parts_[part_] != DestinationPart::Folder && HasOverrideBox(choice.extension) &&
+                 !ownFormats_);
   const std::string problem = DestinationProblem(choice);
   ok_->Enable(problem.empty() && (!into_->GetValue() || !choice.folder.empty()));
   const std::string outlook = problem.empty() ? OutlookText(choice) : problem;
@@ -192,6 +199,7 @@ void DestinationDialog::UpdateControls() {
 
 // "First: /photos/a.png (18.2 GB free), 3 outputs exist already"
 std::string DestinationDialog::OutlookText(const DestinationChoice& choice) const {
+  if (ownFormats_) return Tr("The recipe decides formats and names.");
   const DestinationOutlook outlook = OutlookOf(choice, files_);
   std::string text = Tr("First: %1", outlook.first);
   if (outlook.freeSpace > 0)

@@ -23,9 +23,10 @@ namespace fotomill::desktop {
 // folder is in the same window, in a second step, or not asked for (DestinationParts).
 class DestinationDialog : public wxDialog {
  public:
-  // `verb` is the label of OK: "Convert". With `sizes`, also resizes pictures to one of them.
+  // `verb` is the label of OK: "Convert". With `sizes`, also resizes pictures to one of them;
+  // `recipe` is applied to every picture. A recipe whose outputs have formats decides the format.
   DestinationDialog(wxWindow* parent, const wxString& verb, const std::vector<std::string>& files,
-                    std::vector<NamedSize> sizes = {});
+                    std::vector<NamedSize> sizes = {}, std::string recipe = {});
   DestinationChoice Choice() const;
 
  private:
@@ -53,6 +54,8 @@ class DestinationDialog : public wxDialog {
   wxSizer* formatSizer_ = nullptr;  // contains the controls of each part
   wxSizer* folderSizer_ = nullptr;
   const std::vector<NamedSize> sizes_;
+  const std::string recipe_;
+  const bool ownFormats_;      // the recipe decides the format
   wxChoice* size_ = nullptr;  // null without sizes
   wxChoice* format_ = nullptr;
   wxButton* options_ = nullptr;

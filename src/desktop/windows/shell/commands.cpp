@@ -5,6 +5,8 @@
 #include "desktop/windows/compare/compare_frame.h"
 #include "desktop/windows/dialogs/command_finder.h"
 #include "desktop/windows/dialogs/select_dialog.h"
+#include "desktop/windows/edit/crop_frame.h"
+#include "desktop/windows/edit/edit_frame.h"
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/files/open_dialog.h"
 #include "desktop/windows/files/sequential_rename_dialog.h"
@@ -92,6 +94,10 @@ void NewFolder(Shell& shell) { shell.Files().NewFolder(shell.Tabs().CurrentFolde
 template <Orientation turn>
 void Turn(Shell& shell) {
   TurnSelection(shell, turn);
+}
+template <Family family>
+void EditWith(Shell& shell) {
+  EditSelectionWith(shell, family);
 }
 void NewTab(Shell& shell) { shell.Tabs().Open(shell.Tabs().CurrentFolder()); }
 void CloseTab(Shell& shell) { shell.Tabs().Close(); }
@@ -201,6 +207,14 @@ constexpr Command kCommands[] = {
     {kFunctions, TrLater("Com&pare"),       "Ctrl+Shift+Return", TrLater("Shows two to four selected pictures side by side."), Needs::Few, CompareSelection, nullptr, true},
     {kFunctions, TrLater("&Convert..."),    "Ctrl+E",       TrLater("Converts the selected pictures to another format."), Needs::Files, ConvertSelection, "convert", true},
     {kFunctions, TrLater("Re&size..."),     "Ctrl+Shift+E", TrLater("Resizes the selected pictures to one of the sizes in Setup."), Needs::Files, ResizeSelection, nullptr, true},
+    {kFunctions, TrLater("Edit..."),        "F4",           TrLater("Applies any operations to the selected pictures, with a preview."), Needs::Files, EditSelection, nullptr, true},
+    {kFunctions, TrLater("Crop..."),        "Shift+F4",     TrLater("Crops the selected pictures, each with its own rectangle."), Needs::Files, CropSelection, "crop", true},
+    {kFunctions, TrLater("Effects..."),     "",             TrLater("Changes colors and brightness of the selected pictures."), Needs::Files, EditWith<Family::Effects>, "effects"},
+    {kFunctions, TrLater("Filter..."),      "",             TrLater("Blurs, sharpens or distorts the selected pictures."), Needs::Files, EditWith<Family::Filter>, "filter"},
+    {kFunctions, TrLater("Transform..."),   "",             TrLater("Resizes, rotates or straightens the selected pictures."), Needs::Files, EditWith<Family::Transform>, "transform"},
+    {kFunctions, TrLater("&Annotate..."),   "",             TrLater("Adds texts to the selected pictures."), Needs::Files, EditWith<Family::Annotate>, "annotate"},
+    {kFunctions, TrLater("&Watermark..."),  "",             TrLater("Puts a text or a picture on top of the selected pictures."), Needs::Files, EditWith<Family::Watermark>, "watermark"},
+    {kFunctions, TrLater("Matt..."),        "",             TrLater("Adds frames and borders to the selected pictures."), Needs::Files, EditWith<Family::Matt>, "matt"},
     {kFunctions, TrLater("Rotate &left"),   "Ctrl+Alt+L",   TrLater("Rotates the selected files; JPEG losslessly."), Needs::Files, Turn<Orientation::QuarterLeft>, nullptr, true},
     {kFunctions, TrLater("Rotate r&ight"),  "Ctrl+Alt+R",   TrLater("Rotates the selected files; JPEG losslessly."), Needs::Files, Turn<Orientation::QuarterRight>, nullptr, true},
     {kFunctions, TrLater("&Get info..."),   "Alt+Return",   TrLater("Shows information about the selected files."), Needs::Files, ShowInfo, "info", true},

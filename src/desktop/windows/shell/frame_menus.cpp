@@ -9,12 +9,14 @@
 #include <vector>
 
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/edit/apply_steps.h"
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/files/open_with.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/commands.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
+#include "operations/recipe_library.h"
 #include "settings/history_list.h"
 
 namespace fotomill::desktop {
@@ -24,6 +26,7 @@ namespace {
 constexpr size_t kFileMenu = 0, kRecentPlace = 1;  // index in the menu bar; index in that menu
 constexpr int kMostRecent = 1000;
 constexpr int kRecentId = kFirstCommandId + 1000;  // of the submenu; its items follow
+constexpr int kRecipesId = kFirstCommandId + 3000, kMostRecipes = 500;  // likewise
 
 // The menu text with its key, in wxWidgets syntax.
 wxString MenuText(const Command& command) {
@@ -37,6 +40,7 @@ wxString MenuText(const Command& command) {
 FrameMenus::FrameMenus(Shell& shell) : shell_(shell) {
   BuildBar();
   AddRecentFiles();
+  AddRecipes();
   BindSecondKeys();
   BindCommands();
 }
@@ -85,6 +89,39 @@ void FrameMenus::UpdateRecentFiles() {
   }
   shell_.Window().GetMenuBar()->Enable(kRecentId, !recentFiles_.empty());
   LogEvent("recent-files", std::to_string(recentFiles_.size()));
+}
+
+// The recipes of the library; they are listed each time the menu is opened.
+void FrameMenus::AddRecipes() {
+  recipes_ = new wxMenu;
+  wxMenuBar* const bar = shell_.Window().GetMenuBar();
+  wxMenu* const functions = bar->GetMenu(static_cast<size_t>(bar->FindMenu(Label("F&unctions"))));
+  functions->AppendSeparator();
+  functions->Append(kRecipesId, Label("Appl&y recipe"), recipes_,
+                    Label("Applies a recipe to the selected pictures and saves copies."));
+  shell_.Window().Bind(
+      wxEVT_MENU,
+      [this](wxCommandEvent& event) {
+        const auto place = static_cast<size_t>(event.GetId() - kRecipesId - 1);
+        if (place < recipeNames_.size()) RunRecipe(shell_, std::string(recipeNames_[place]));
+      },
+      kRecipesId + 1, kRecipesId + kMostRecipes);
+  shell_.Window().Bind(wxEVT_MENU_OPEN, [this, functions](wxMenuEvent& event) {
+    if (event.GetMenu() == functions) ListRecipesInMenu();
+    event.Skip();
+  });
+  ListRecipesInMenu();
+}
+
+void FrameMenus::ListRecipesInMenu() {
+  while (recipes_->GetMenuItemCount() > 0) recipes_->Destroy(recipes_->FindItemByPosition(0));
+  recipeNames_.clear();
+  for (const NamedRecipe& recipe : ListRecipes()) {
+    if (recipeNames_.size() == kMostRecipes) break;
+    recipeNames_.push_back(recipe.name);
+    recipes_->Append(kRecipesId + static_cast<int>(recipeNames_.size()),
+                     wxControl::EscapeMnemonics(Shown(recipe.name)));
+  }
 }
 
 void FrameMenus::BindSecondKeys() {

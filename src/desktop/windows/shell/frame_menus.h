@@ -28,11 +28,15 @@ class FrameMenus {
   void BindSecondKeys();
   void BindCommands();
   void AddRecentFiles();
+  void AddRecipes();
+  void ListRecipesInMenu();
   void Update(wxUpdateUIEvent& event);
 
   Shell& shell_;
   wxMenu* recent_ = nullptr;
   std::vector<std::string> recentFiles_;  // in menu order
+  wxMenu* recipes_ = nullptr;
+  std::vector<std::string> recipeNames_;  // in menu order
 };
 
 }  // namespace fotomill::desktop

@@ -10,6 +10,7 @@
 #include "core/choice_lists.h"
 #include "desktop/models/drawing/list_palette.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/view/canvas_backdrop.h"
 #include "desktop/windows/widgets/bitmaps.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/clock.h"
@@ -24,9 +25,6 @@ namespace {
 
 constexpr int kPanSteps = 8;          // per window size
 constexpr double kPlainPixelsAt = 2;  // from this zoom on, pixels are drawn as squares
-constexpr int kSquareSide = 8;        // of the checkerboard
-constexpr Color kLightSquares[] = {0xffffff, 0xcccccc};
-constexpr Color kDarkSquares[] = {0x666666, 0x444444};
 
 wxColour ColorOf(Color color) {
   return {static_cast<unsigned char>(color), static_cast<unsigned char>(color >> 8),
@@ -228,18 +226,10 @@ wxBitmap ViewCanvas::DrawnPicture() const {
                       ScaleFilterFromKey(settings.ResizeFilter) != ScaleFilter::Nearest;
   const PackedImage opaque;
   const ViewSource source = standIn_.Empty() ? BestSource() : ViewSource{standIn_, opaque};
-  DrawView(source, transform_, BackdropHere(), smooth, pixels);
+  Backdrop backdrop = BackdropFor(*this);
+  backdrop.around = around_;
+  DrawView(source, transform_, backdrop, smooth, pixels);
   return BitmapOf(pixels, GetContentScaleFactor());
-}
-
-Backdrop ViewCanvas::BackdropHere() const {
-  Backdrop backdrop{.around = around_};
-  const bool dark = wxSystemSettings::GetAppearance().IsDark();
-  backdrop.squares = settings.ViewModeCheckerboard != 0;
-  std::ranges::copy(dark ? kDarkSquares : kLightSquares, backdrop.square);
-  backdrop.side =
-      std::max(static_cast<int>(std::lround(FromDIP(kSquareSide) * GetContentScaleFactor())), 1);
-  return backdrop;
 }
 
 void ViewCanvas::PaintMessage(wxDC& dc) const {

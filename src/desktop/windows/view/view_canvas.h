@@ -96,7 +96,6 @@ class ViewCanvas : public wxWindow {
   void ScaledCame();
   bool Showable() const { return picture_ != nullptr && picture_->picture != nullptr; }
   ViewSource BestSource() const;
-  Backdrop BackdropHere() const;
 
   const Events events_;
   ViewPicturePointer picture_;

@@ -66,6 +66,8 @@ constexpr KeyCommand<ViewFrame> kCommands[] = {
     {TrLater("Rotate &right"),     "R",         {'R'},                           Turn<Orientation::QuarterRight>},
     {TrLater("Flip horizontally"), "H",       {'H'},                           Turn<Orientation::MirrorAcross>},
     {TrLater("Flip vertically"), "V",       {'V'},                           Turn<Orientation::MirrorDown>},
+    {TrLater("Crop..."),           "C",         {'C'},                           Of<&ViewFrame::CropPicture>},
+    {TrLater("Edit..."),           "F4",        {WXK_F4},                        Of<&ViewFrame::EditPicture>},
     {TrLater("Sa&ve rotated picture"), "Ctrl+S", {WXK_CONTROL_S},             Of<&ViewFrame::SaveTurned>},
     {TrLater("&Undo"),             "Ctrl+Z",    {WXK_CONTROL_Z},                 Of<&ViewFrame::Undo>},
     {TrLater("Redo"),              "Ctrl+Y",    {WXK_CONTROL_Y},                 Of<&ViewFrame::Redo>},

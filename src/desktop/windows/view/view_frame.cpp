@@ -11,6 +11,8 @@
 #include "core/text.h"
 #include "desktop/models/drawing/rgb_image.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/edit/crop_frame.h"
+#include "desktop/windows/edit/edit_frame.h"
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/info/info_frame.h"
@@ -412,6 +414,10 @@ void ViewFrame::ChooseSlideshow() {
 }
 
 void ViewFrame::ShowInfoWindow() { (new InfoFrame(shell_, this, {list_[place_]}))->Show(); }
+
+void ViewFrame::EditPicture() { (new EditFrame(shell_, {list_[place_]}, nullptr))->Show(); }
+
+void ViewFrame::CropPicture() { (new CropFrame(shell_, {list_[place_]}))->Show(); }
 
 void ViewFrame::EditExif() { (new ExifEditFrame(shell_, this, {list_[place_]}))->Show(); }
 

@@ -46,6 +46,8 @@ class ViewFrame : public wxFrame {
   void CopyPicture();  // to the clipboard, on the view background
   void DeleteFile();  // moves it to the trash and shows the next one
   void ShowInfoWindow();        // for the current file
+  void EditPicture();           // in an Edit window
+  void CropPicture();           // in a Crop window
   void EditExif();              // of the current file
   void Turn(Orientation turn);  // turns the view only; nothing is written
   void SaveTurned();            // saves the file as displayed

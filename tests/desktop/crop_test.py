@@ -1,0 +1,112 @@
+#!/usr/bin/env python3
+"""The Crop window of the real program: one picture, a whole selection, ratio and angle."""
+import struct
+
+from driven_desktop import Desktop, make_pictures, needs_manager, run
+from edit_test import applied
+
+SETTINGS = ["DestForceSourceDir=1", "DefaultFileExtension=png", "WarnDestinationWrite=0"]
+WIDTH, HEIGHT = 150, 112  # of the sample
+
+
+def size_of(bmp):
+    return struct.unpack("<2i", bmp.read_bytes()[18:26])
+
+
+def open_crop(desktop, count):
+    desktop.wait(rf"lines={count} .*missing=0 listing=0")
+    desktop.focus("Fotomill Professional")
+    desktop.key("ctrl+a", "shift+F4")
+    desktop.wait(rf"crop-picture 1/{count} {WIDTH}x{HEIGHT}")
+    desktop.focus("^Crop: ")
+
+
+def one_jpeg_without_loss(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.jpg"])
+    picture = pictures / "a.jpg"
+    before = picture.read_bytes()
+    with Desktop(folder, pictures, settings=SETTINGS) as desktop:
+        # From the view window, which then shows the new picture.
+        desktop.wait(r"lines=1 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "ctrl+Return")
+        desktop.wait(r"view-painted .*a.jpg")
+        desktop.focus("View$")
+        desktop.key("c")
+        desktop.wait(rf"crop-picture 1/1 {WIDTH}x{HEIGHT}")
+        desktop.focus("^Crop: ")
+        # Ctrl moves the lower right corner, Shift by ten; both edges of blocks stay.
+        desktop.key("ctrl+shift+Left", "ctrl+shift+Up", "ctrl+Left")
+        desktop.wait(rf"crop-area {WIDTH - 11}x{HEIGHT - 10}\+0\+0")
+        desktop.screenshot("crop-one")
+        desktop.key("Return", "Return")
+        desktop.wait(r"crop closed")
+        desktop.wait(r"batch-line .*Cropped losslessly")
+        desktop.wait(r"batch ended status=0")
+        desktop.wait(r"view-painted .*a.jpg")
+        assert len(picture.read_bytes()) < len(before)
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo change of a.jpg done=1")
+        assert picture.read_bytes() == before
+
+
+def through_a_selection(folder):
+    pictures = folder / "pictures"
+    names = ["a.bmp", "b.bmp", "c.bmp"]
+    make_pictures(pictures, names)
+    with Desktop(folder, pictures, settings=SETTINGS) as desktop:
+        open_crop(desktop, 3)
+        desktop.key("ctrl+shift+Left")
+        desktop.wait(rf"crop-area {WIDTH - 10}x{HEIGHT}\+0\+0")
+        desktop.key("Return")
+        # The next one has the same part suggested.
+        desktop.wait(r"crop-picture 2/3")
+        desktop.wait(rf"crop-area {WIDTH - 10}x{HEIGHT}\+0\+0")
+        desktop.key("Insert")
+        desktop.wait(r"crop-picture 3/3")
+        desktop.key("shift+Right")
+        desktop.wait(rf"crop-area {WIDTH - 10}x{HEIGHT}\+10\+0")
+        desktop.key("BackSpace")
+        desktop.wait(r"crop-picture 2/3")
+        desktop.key("Insert")
+        desktop.wait(r"crop-picture 3/3")
+        desktop.wait(rf"crop-area {WIDTH - 10}x{HEIGHT}\+10\+0")
+        desktop.key("Return", "Return")
+        desktop.wait(r"crop closed")
+        desktop.wait(r"batch ended status=0")
+        sizes = [size_of(pictures / name) for name in names]
+        assert sizes == [(WIDTH - 10, HEIGHT), (WIDTH, HEIGHT), (WIDTH - 10, HEIGHT)], sizes
+
+
+@needs_manager
+def copies_with_ratio_and_angle(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp"])
+    with Desktop(folder, pictures, settings=SETTINGS) as desktop:
+        open_crop(desktop, 1)
+        desktop.focus("^Crop properties$")
+        desktop.key("alt+r", "ctrl+a")
+        desktop.type("1:1")
+        desktop.wait(rf"crop-area {HEIGHT}x{HEIGHT}\+\d+\+0")
+        desktop.key("alt+a", "ctrl+a")
+        desktop.type("3")
+        desktop.key("Tab")
+        desktop.wait(r"crop-angle 3")
+        desktop.wait(r"crop-picture 1/1")
+        area = desktop.wait(r"crop-area ").split()[1]
+        desktop.screenshot("crop-properties")
+        desktop.focus("^Crop: ")
+        desktop.key("alt+s")
+        desktop.wait(r"prompt destination")
+        desktop.focus("^Save$")
+        desktop.key("Return")
+        desktop.wait(r"batch ended status=0")
+        made, = pictures.glob("*.png")
+        wanted = applied(pictures / "a.bmp", f"straighten 3; crop {area}", folder / "peer", "png")
+        assert made.read_bytes() == wanted
+
+
+if __name__ == "__main__":
+    run(one_jpeg_without_loss, through_a_selection, copies_with_ratio_and_angle)
