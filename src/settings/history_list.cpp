@@ -30,6 +30,7 @@ constexpr ListFile kLists[] = {
     {"FMWDestinationHistory.txt", &Settings::DestHistoryMax},
     {"FMWTabHistory.txt", &Settings::TabHistoryMax},
     {"FMWRenameHistory.txt", &Settings::EditListMaximum},
+    {"FMWArchiveHistory.txt", &Settings::ArchiveHistoryMax},
 };
 constexpr ListFile kRecentFiles{"FileMenuHistory.txt", &Settings::RecentFilesMaximum};
 

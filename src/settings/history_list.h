@@ -22,6 +22,7 @@ enum class HistoryList {
   Destination,  // "FMWDestinationHistory.txt", DestHistoryMax: output folders
   Tabs,         // "FMWTabHistory.txt", TabHistoryMax: folders of closed tabs
   RenameBases,  // "FMWRenameHistory.txt", EditListMaximum: base names of sequential renaming
+  Archives,     // "FMWArchiveHistory.txt", ArchiveHistoryMax: folders for extracted files
 };
 
 // The valid entries. Empty if the list is missing or cannot be read.

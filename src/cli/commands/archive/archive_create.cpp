@@ -1,11 +1,9 @@
 #include <memory>
-#include <set>
 #include <string>
 #include <vector>
 
-#include "archive/entry_name.h"
 #include "archive/zip_writer.h"
-#include "catalog/thumbnails/thumbnail_file.h"
+#include "batch/archive/archive_members.h"
 #include "cli/commands/archive/archive.h"
 #include "cli/commands/archive/archive_options.h"
 #include "cli/frame/options.h"
@@ -28,72 +26,6 @@ struct CreateOptions {
   std::string overwrite;
   bool json = false;
   bool dryRun = false;
-};
-
-// A file to add.
-struct Member {
-  std::string path, name;  // on disk; in the archive
-  Status status = Status::Ok;
-  std::string hint = {};
-};
-
-// Collects the files of the command line; folders recursively, without following links.
-class Members {
- public:
-  explicit Members(const std::string& archive) : archive_(platform::AbsolutePath(archive)) {}
-
-  void AddNamed(const std::string& path) {
-    const platform::FileKind kind = platform::FactsOf(path).kind;
-    if (kind == platform::FileKind::Folder) {
-      AddFolder(path);
-    } else if (kind == platform::FileKind::Regular) {
-      AddFile(path);
-    } else {
-      members_.push_back({path, path, Status::FileOpenError});
-    }
-  }
-  const std::vector<Member>& All() const { return members_; }
-
- private:
-  void AddFolder(const std::string& folder) {
-    const auto entries = platform::ListFolder(folder);
-    if (!entries) {
-      members_.push_back({folder, folder, Status::FileOpenError, WithReason("")});
-      return;
-    }
-    for (const platform::FolderEntry& entry : *entries) {
-      const std::string path = platform::JoinFolder(folder, entry.name);
-      if (entry.kind == platform::FileKind::Folder && !entry.link) AddFolder(path);
-      if (entry.kind == platform::FileKind::Regular) AddFile(path);
-    }
-  }
-  void AddFile(const std::string& path) {
-    if (platform::AbsolutePath(path) == archive_) return;
-    Add(path);
-    const std::string thumbnail = ThumbnailPathFor(path);
-    if (settings.ArchiveAddThumbnails != 0 && thumbnail != path &&
-        platform::IsRegularFile(thumbnail) && !paths_.contains(thumbnail))
-      Add(thumbnail);
-  }
-  void Add(const std::string& path) {
-    if (!paths_.insert(path).second) return;  // given twice
-    const std::string stored = settings.ArchivePreservePaths != 0
-                                   ? StoredEntryName(path)
-                                   : std::string(platform::FileNameOf(path));
-    Member member = {path, ReadableEntryName(stored)};
-    if (!IsSafeEntryName(member.name)) {
-      member.status = Status::InvalidDestination;
-      member.hint = Tr("Archives cannot hold such names.");
-    } else if (!names_.insert(member.name).second) {
-      member.status = Status::InvalidDestination;
-      member.hint = Tr("Another file has the same name in the archive.");
-    }
-    members_.push_back(std::move(member));
-  }
-
-  const std::string archive_;
-  std::vector<Member> members_;
-  std::set<std::string> paths_, names_;
 };
 
 // Decides about an existing archive; false, after printing a note, to keep it.
@@ -123,9 +55,9 @@ bool SettleArchive(const std::string& overwrite, const CommandContext& context,
 }
 
 // Adds files, and reports those that cannot be added. Anything but Ok cancels the archive.
-Status AddMembers(const std::vector<Member>& members, ZipWriter& zip, ResultOutput& output,
-                  std::vector<const Member*>& added) {
-  for (const Member& member : members) {
+Status AddMembers(const std::vector<ArchiveMember>& members, ZipWriter& zip, ResultOutput& output,
+                  std::vector<const ArchiveMember*>& added) {
+  for (const ArchiveMember& member : members) {
     output.ShowProgress(added.size(), members.size());
     Status status = member.status;
     if (status == Status::Ok) status = zip.Add(member.path, member.name, {});
@@ -141,15 +73,15 @@ Status AddMembers(const std::vector<Member>& members, ZipWriter& zip, ResultOutp
 }
 
 Status WriteArchive(const std::string& path, platform::Existing existing,
-                    const std::string& password, const std::vector<Member>& members,
+                    const std::string& password, const std::vector<ArchiveMember>& members,
                     ResultOutput& output) {
   ZipWriter zip;
   RETURN_IF_BAD(zip.Create(path, password));
-  std::vector<const Member*> added;
+  std::vector<const ArchiveMember*> added;
   RETURN_IF_BAD(AddMembers(members, zip, output, added));
   if (added.empty()) return Status::Ok;  // each one was reported
   if (zip.Finish(existing) != platform::CommitResult::Done) return Status::ErrorWritingFile;
-  for (const Member* member : added) output.FileDone(member->path, member->name);
+  for (const ArchiveMember* member : added) output.FileDone(member->path, member->name);
   return Status::Ok;
 }
 
@@ -167,11 +99,12 @@ int RunCreate(CreateOptions options, const CommandContext& context) {
   platform::Existing existing = platform::Existing::Refuse;
   if (options.dryRun && options.overwrite == "ask") options.overwrite = "keep-both";
   if (!SettleArchive(options.overwrite, context, output, path, existing)) return output.Finish();
-  Members members(path);
+  ArchiveMembers members(path, {.keepPaths = settings.ArchivePreservePaths != 0,
+                                .addThumbnails = settings.ArchiveAddThumbnails != 0});
   for (size_t i = 1; i < context.names.values.size(); ++i)
-    members.AddNamed(context.names.values[i]);
+    members.Add(context.names.values[i]);
   if (options.dryRun) {
-    for (const Member& member : members.All()) {
+    for (const ArchiveMember& member : members.All()) {
       if (member.status == Status::Ok) {
         output.FileDone(member.path, member.name);
       } else {

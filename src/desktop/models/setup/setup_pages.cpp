@@ -198,6 +198,16 @@ constexpr SetupItem kItems[] = {
     Item(Metadata,   TrLater("Places"),             ExifDistinceUnits,              "Unit of distances"),
     Item(Metadata,   TrLater("Get info"),           InfoUnits,                      "Unit of print sizes"),
     Item(Metadata,   TrLater("Get info"),           InfoResolution,                 "Assumed resolution for print sizes (dots per inch)"),
+    Item(Archives,   TrLater("Extracting"),         ArchivePreservePaths,           "Keep the folders of the archive"),
+    Item(Archives,   TrLater("Extracting"),         ArchivePreserveTimestamps,      "Keep file times"),
+    Item(Archives,   TrLater("Extracting"),         ArchivePromptOverwrite,         "Ask before a file is replaced"),
+    Item(Archives,   TrLater("Extracting"),         ArchiveHistoryMax,              "Folders to remember"),
+    Item(Archives,   TrLater("Creating archives"),  ArchiveAddThumbnails,           "Include thumbnail files"),
+    Item(Archives,   TrLater("Creating archives"),  ArchiveMaskPassword,            "Hide passwords while typing"),
+    Item(Archives,   TrLater("Archive manager"),    EscalatePicturelessZips,        "Open archives without pictures in the archive manager"),
+    Item(Archives,   TrLater("Archive manager"),    ArchivePromptExternal,          "Ask before a file is opened with another program"),
+    Item(Archives,   TrLater("Archive manager"),    ArchiveDateMode,                "Dates"),
+    Item(Archives,   TrLater("Archive manager"),    ArchiveListRuleEnable,          "Lines between rows"),
     Item(History,    TrLater("Remember"),           FileHistoryEnable,              "Record recently used files"),
     Item(History,    TrLater("Remember"),           FileHistoryFunctions,           "For these functions"),
     Item(History,    TrLater("Remember"),           FileHistoryWindowType,          "Limit by"),
@@ -217,8 +227,8 @@ constexpr SetupItem kItems[] = {
 constexpr const char* kTitles[] = {
     TrLater("Browsing"), TrLater("Thumbnails"), TrLater("Viewing"), TrLater("Batches"),
     TrLater("Saving"), TrLater("Format options"), TrLater("File names"), TrLater("Colors"),
-    TrLater("Captions and mattes"), TrLater("EXIF and info"), TrLater("File history"),
-    TrLater("Formats")};
+    TrLater("Captions and mattes"), TrLater("EXIF and info"), TrLater("Archives"),
+    TrLater("File history"), TrLater("Formats")};
 static_assert(std::size(kTitles) == kSetupPageCount);
 
 consteval bool EveryItemIsShownOnce() {

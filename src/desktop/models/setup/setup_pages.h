@@ -21,10 +21,11 @@ enum class SetupPage {
   Colors,
   Captions,
   Metadata,
+  Archives,
   History,
   Formats
 };
-inline constexpr size_t kSetupPageCount = 12;
+inline constexpr size_t kSetupPageCount = 13;
 // Title of a page, in English.
 const char* TitleOf(SetupPage page);
 

@@ -188,9 +188,11 @@ NameAnswer BatchRunner::AskDestinationName(const NameQuestion& question) {
 }
 
 std::optional<std::string> BatchRunner::AskPassword(const std::string& path) {
-  wxPasswordEntryDialog dialog(DialogParent(),
-                               Label("Password for %1:", Shown(platform::FileNameOf(path))),
-                               Label("Password"));
+  wxTextEntryDialog dialog(DialogParent(),
+                           Label("Password for %1:", Shown(platform::FileNameOf(path))),
+                           Label("Password"), "",
+                           wxTextEntryDialogStyle |
+                               (settings.ArchiveMaskPassword != 0 ? wxTE_PASSWORD : 0));
   LogEvent("prompt", "password " + path);
   if (dialog.ShowModal() != wxID_OK) return std::nullopt;
   return Utf8(dialog.GetValue());

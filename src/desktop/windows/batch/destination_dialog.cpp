@@ -13,6 +13,7 @@
 #include "core/choice_lists.h"
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/setup/override_box.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
@@ -29,7 +30,7 @@ DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
     : wxDialog(parent, wxID_ANY, verb, wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "DestinationBox"),
       files_(files),
-      shownFolder_(platform::FolderOf(files_.front())),
+      shownFolder_(FolderForResults(platform::FolderOf(files_.front()))),
       sizes_(std::move(sizes)),
       recipe_(std::move(recipe)),
       ownFormats_(RecipeNamesFormats(recipe_)) {
@@ -93,7 +94,10 @@ void DestinationDialog::BuildFolder() {
   beside_ = new wxRadioButton(this, wxID_ANY, Label("&Beside each picture"), wxDefaultPosition,
                               wxDefaultSize, wxRB_GROUP);
   into_ = new wxRadioButton(this, wxID_ANY, Label("&Into the folder"));
-  (settings.DestForceSourceDir != 0 ? beside_ : into_)->SetValue(true);
+  // the folder of an unpacked archive is temporary
+  const bool temporary = shownFolder_ != platform::FolderOf(files_.front());
+  beside_->Enable(!temporary);
+  (settings.DestForceSourceDir != 0 && !temporary ? beside_ : into_)->SetValue(true);
   folderSizer_->Add(beside_, Below());
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   folder_ = new wxComboBox(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(420, -1)), 0,

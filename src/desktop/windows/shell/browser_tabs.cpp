@@ -4,8 +4,10 @@
 #include <wx/frame.h>
 #include <wx/weakref.h>
 
+#include "desktop/models/archive/archive_listing.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/models/shell/favorites.h"
+#include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/shell/frame_menus.h"
 #include "desktop/windows/shell/picture_windows.h"
@@ -246,7 +248,10 @@ void BrowserTabs::KeepView(const std::string& folder, const FolderView& view) {
   viewsTimer_.StartOnce(kViewsMs);
 }
 
-void BrowserTabs::ViewFile(const std::string& path) { shell_.Pictures().ViewFromBrowser(path); }
+void BrowserTabs::ViewFile(const std::string& path) {
+  if (IsArchiveName(path)) return OpenArchiveFolder(shell_, path);
+  shell_.Pictures().ViewFromBrowser(path);
+}
 
 void BrowserTabs::ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) {
   if (onFile) menus_.ShowContextMenu(window, place);

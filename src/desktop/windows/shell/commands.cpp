@@ -1,6 +1,7 @@
 #include "desktop/windows/shell/commands.h"
 
 #include "core/choice_lists.h"
+#include "desktop/windows/archive/archive_frame.h"
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/compare/compare_frame.h"
 #include "desktop/windows/dialogs/command_finder.h"
@@ -225,11 +226,13 @@ constexpr Command kCommands[] = {
     {kFunctions, TrLater("C&opy to..."),    "F7",           TrLater("Copies the selected files to a folder."), Needs::Item, CopySelectionTo, "copy", true},
     {kFunctions, TrLater("&Move to..."),    "F6",           TrLater("Moves the selected files to a folder."), Needs::Item, MoveSelectionTo, "move", true},
     {kFunctions, TrLater("&Rename..."),     "Shift+F2",     TrLater("Renames the selected files in sequence."), Needs::Files, RenameSelectionSequentially, "rename"},
+    {kFunctions, TrLater("Create arc&hive..."), "Ctrl+Alt+Z",  TrLater("Archives the selected files and folders."), Needs::Item, ArchiveSelection, nullptr, true},
     {kFunctions, TrLater("&Delete"),        "Delete",       TrLater("Moves the selected files to the trash."), Needs::Item, TrashSelection, "trash", true},
     {kFunctions, TrLater("Delete perma&nently..."), "Shift+Delete", TrLater("Deletes the selected files; this cannot be undone."), Needs::Item, DeleteSelection},
 
     {kTools, TrLater("File &history..."),     "Ctrl+H",       TrLater("Lists recently used files."), Needs::Nothing, ShowFileHistory, "history"},
-    {kTools, TrLater("&Compact database..."), "",             TrLater("Removes deleted records from a thumbnail database."), Needs::Nothing, ShowCompaction},
+    {kTools, TrLater("&Archive manager..."),  "Ctrl+Alt+A",   TrLater("Lists the selected archive, extracts from it and adds to it."), Needs::Nothing, ManageArchive},
+    {kTools, TrLater("Compact &database..."), "",             TrLater("Removes deleted records from a thumbnail database."), Needs::Nothing, ShowCompaction},
     {kTools, TrLater("Clean up &thumbnails..."), "",          TrLater("Deletes thumbnail files without a picture."), Needs::Nothing, ShowCleanUp},
     {kTools, TrLater("&Plug-ins..."),         "",             TrLater("Lists the plug-in formats and opens their settings."), Needs::Nothing, ShowPlugins},
     {kTools, TrLater("Tool&bar..."),          "",             TrLater("Chooses the toolbar buttons and their order."), Needs::Nothing, ChooseToolbar},

@@ -1,0 +1,18 @@
+#pragma once
+
+#include <string>
+
+namespace fotomill::desktop {
+
+class Shell;
+
+// Shows an archive like a folder: unpacks it to a temporary folder in the background and opens that
+// in a tab. It is deleted when the program ends. With EscalatePicturelessZips, an archive without
+// pictures opens in the archive manager.
+void OpenArchiveFolder(Shell& shell, const std::string& archive);
+
+// The folder for results of functions on a folder: that of the archive, if the folder belongs to an
+// unpacked one, else the folder itself.
+std::string FolderForResults(const std::string& folder);
+
+}  // namespace fotomill::desktop

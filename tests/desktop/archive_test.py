@@ -1,0 +1,111 @@
+#!/usr/bin/env python3
+"""Archives in the real program: as folders, in the archive manager, created from a selection."""
+import zipfile
+
+from driven_desktop import Desktop, make_pictures, run
+
+
+def archive_of_pictures(folder, name="trip.zip"):
+    made = folder / "made"
+    make_pictures(made, ["one.png", "two.jpg"])
+    folder.joinpath("pictures").mkdir()
+    with zipfile.ZipFile(folder / "pictures" / name, "w", zipfile.ZIP_DEFLATED) as archive:
+        archive.write(made / "one.png", "one.png")
+        archive.write(made / "two.jpg", "sub/two.jpg")
+        archive.writestr("notes.txt", "notes " * 500)
+    return folder / "pictures"
+
+
+def archive_as_folder(folder):
+    pictures = archive_of_pictures(folder)
+    with Desktop(folder, pictures, settings=["WarnDestinationWrite=0"]) as desktop:
+        desktop.wait(r"lines=1 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "Return")
+        desktop.wait(r"archive-folder .*trip.zip$")
+        desktop.wait(r"browser tabs=2 .*missing=0 listing=0 .*/trip.zip")
+        desktop.screenshot("archive-folder")
+        # Convert out of it: next to the archive, not into the temporary folder.
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+f")
+        desktop.type("one")
+        desktop.key("Return")
+        desktop.wait(r"lines=1 ")
+        desktop.key("ctrl+a", "ctrl+e")
+        desktop.wait(r"prompt destination")
+        desktop.focus("^Convert$")
+        desktop.key("Return")
+        desktop.wait(rf"batch-line .*one.png -> {pictures}/one\.\w+")
+        desktop.wait(r"batch ended status=0")
+        assert any(path.stem == "one" for path in pictures.iterdir())
+
+
+def manager(folder):
+    pictures = archive_of_pictures(folder)
+    out = folder / "out"
+    (folder / "data").mkdir()
+    (folder / "data/FMWArchiveHistory.txt").write_text(f"{out}\n")
+    with Desktop(folder, pictures, settings=["ArchiveSortMode=100", "CloseProgressWhenDone=1"],
+                 ) as desktop:
+        desktop.wait(r"lines=1 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "ctrl+alt+a")
+        desktop.wait(r"archive rows=3 first=sub/two.jpg")
+        desktop.focus("^Archive: trip.zip$")
+        desktop.screenshot("archive-manager")
+        desktop.key("alt+t")
+        for name in ("one.png", "sub/two.jpg", "notes.txt"):
+            desktop.wait(rf"batch-line {name} -> intact")
+        desktop.wait(r"batch ended status=0")
+        desktop.focus("^Progress$")
+        desktop.key("Escape")
+        desktop.focus("^Archive: trip.zip$")
+        desktop.key("alt+e")
+        desktop.wait(r"prompt extract")
+        desktop.focus("^Extract$")
+        desktop.screenshot("archive-extract")
+        desktop.key("alt+e")
+        desktop.wait(rf"batch-line sub/two.jpg -> {out}/sub/two.jpg")
+        desktop.wait(r"batch ended status=0")
+        assert (out / "notes.txt").read_text() == "notes " * 500
+        # A second time, the files exist: the question is about the first, Escape skips it.
+        desktop.focus("^Archive: trip.zip$")
+        desktop.key("alt+e")
+        desktop.wait(r"prompt extract")
+        desktop.focus("^Extract$")
+        desktop.key("alt+e")
+        desktop.wait(r"prompt overwrite .*one.png")
+        desktop.focus("^Overwrite File$")
+        desktop.key("alt+l")  # skip all
+        desktop.wait(r"batch ended status=0")
+        # View the picture; a text is only opened after a question.
+        desktop.focus("^Archive: trip.zip$")
+        desktop.key("alt+v")
+        desktop.wait(r"archive-view .*two.jpg")
+        desktop.wait(r"view .*status=0 .*two.jpg")
+
+
+def create(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["one.png", "two.png"])
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"lines=2 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "ctrl+alt+z")
+        desktop.wait(r"prompt archive")
+        desktop.focus("^Create archive$")
+        desktop.key("alt+p")
+        desktop.type("secret")
+        desktop.key("alt+g")
+        desktop.type("secret")
+        desktop.screenshot("archive-create")
+        desktop.key("alt+v")
+        desktop.wait(r"batch-line .*one.png -> .*pictures.zip")
+        desktop.wait(r"batch ended status=0")
+        with zipfile.ZipFile(pictures / "pictures.zip") as archive:
+            assert archive.namelist() == ["one.png", "two.png"]
+            assert all(info.flag_bits & 1 for info in archive.infolist())
+
+
+if __name__ == "__main__":
+    run(archive_as_folder, manager, create)
