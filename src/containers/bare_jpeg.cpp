@@ -1,6 +1,7 @@
 #include <algorithm>
 
 #include "containers/bare_file.h"
+#include "containers/jpeg_extended_xmp.h"
 #include "containers/jpeg_segments.h"
 #include "core/byte_reader.h"
 
@@ -41,7 +42,8 @@ bool Belongs(const JpegSegment& segment, const BareOptions& options) {
   return !IsApplication(segment.marker) ||
          (options.profile && segment.marker == kApp2 && segment.Starts(kProfile)) ||
          (segment.marker == kApp14 && segment.Starts(kAdobe)) ||
-         (options.texts && segment.marker == kComment);
+         (options.texts && segment.marker == kComment) ||
+         (!options.newXmp.empty() && segment.Starts(kExtendedXmpHead));  // its second part
 }
 
 void AppendBlock(std::string_view head, std::span<const uint8_t> block, FilePieces& bare) {

@@ -16,13 +16,16 @@ constexpr std::string_view kPicture[] = {
 
 constexpr std::string_view kTexts[] = {"tEXt", "zTXt", "iTXt"};
 constexpr std::string_view kXmp = "XML:com.adobe.xmp", kRawProfile = "Raw profile type ";
+constexpr std::string_view kRawIptc("Raw profile type iptc\0", 22);
 
 bool Belongs(const PngPlace& chunk, std::span<const uint8_t> file, const BareOptions& options) {
   if (chunk.type == "iCCP" && !options.profile) return false;
   if (std::ranges::find(kPicture, chunk.type) != std::end(kPicture)) return true;
-  if (!options.texts || std::ranges::find(kTexts, chunk.type) == std::end(kTexts)) return false;
+  if (std::ranges::find(kTexts, chunk.type) == std::end(kTexts)) return false;
   ByteReader text(file.subspan(chunk.data, chunk.size));
-  return !text.Match(kXmp) && !text.Match(kRawProfile);  // metadata blocks stored as texts
+  if (options.iptc && text.Match(kRawIptc)) return true;
+  return options.texts && !text.Match(kXmp) &&
+         !text.Match(kRawProfile);  // metadata blocks stored as texts
 }
 
 }  // namespace

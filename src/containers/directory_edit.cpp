@@ -389,8 +389,7 @@ class Editor : DirectoryBytes {
     const auto change = std::ranges::find_if(changes, clears);
     if (change == changes.end()) return Status::Ok;
     std::ranges::sort(withGps_);
-    const auto again = std::ranges::unique(withGps_);
-    withGps_.erase(again.begin(), again.end());
+    withGps_.erase(std::unique(withGps_.begin(), withGps_.end()), withGps_.end());
     for (const uint64_t at : withGps_) {
       if (at == firstAt) continue;
       Directory page;

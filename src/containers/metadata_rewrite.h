@@ -4,6 +4,7 @@
 #include <optional>
 #include <span>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "containers/file_pieces.h"
@@ -39,6 +40,9 @@ Status RewriteJpeg(std::span<const uint8_t> file, const MetadataBlocks& blocks, 
 Status FindPngMetadata(std::span<const uint8_t> file, MetadataViews& views);
 Status RewritePng(std::span<const uint8_t> file, const MetadataBlocks& blocks, FilePieces& made,
                   std::string& reason);
+// A chunk of a PNG file, with its CRC; and the one for an XMP packet.
+std::vector<uint8_t> MakePngChunk(std::string_view type, std::span<const uint8_t> data);
+std::vector<uint8_t> MakePngXmpChunk(std::span<const uint8_t> packet);
 Status FindWebpMetadata(std::span<const uint8_t> file, MetadataViews& views);
 Status RewriteWebp(std::span<const uint8_t> file, const MetadataBlocks& blocks, FilePieces& made,
                    std::string& reason);

@@ -25,7 +25,7 @@ bool StartsWith(std::span<const uint8_t> bytes, std::string_view text) {
 }
 
 std::vector<uint8_t> Chunk(std::string_view type, std::string_view head,
-                           const std::vector<uint8_t>& block) {
+                           std::span<const uint8_t> block) {
   const size_t size = head.size() + block.size();
   std::vector<uint8_t> bytes(8 + size + 4);
   const auto put = [&](size_t at, uint64_t number) {
@@ -73,6 +73,13 @@ Status FindPngMetadata(std::span<const uint8_t> file, MetadataViews& views) {
       views.xmp = data.subspan(kXmpHead.size());
   }
   return walk.Outcome();
+}
+
+std::vector<uint8_t> MakePngChunk(std::string_view type, std::span<const uint8_t> data) {
+  return Chunk(type, {}, data);
+}
+std::vector<uint8_t> MakePngXmpChunk(std::span<const uint8_t> packet) {
+  return Chunk(kText, kXmpHead, packet);
 }
 
 Status RewritePng(std::span<const uint8_t> file, const MetadataBlocks& blocks, FilePieces& made,

@@ -7,6 +7,13 @@
 #include <string_view>
 
 #include "containers/directory_edit.h"
+#include "containers/jpeg_extended_xmp.h"
+#include "containers/metadata_rewrite.h"
+#include "containers/photoshop_resources.h"
+#include "containers/png_chunks.h"
+#include "core/md5.h"
+#include "core/text.h"
+#include "formats/png/png_raw_profile.h"
 #include "metadata/xmp/xmp_edit.h"
 
 namespace fotomill::test {
@@ -107,6 +114,9 @@ TEST(Strip, FindsPlacesInXmp) {
       {"<a xmlns:gps='u' b='exif:GPS c'/>", nullptr},
       {"<b>the exif:GPSLatitude of</b><a b='2'/>", nullptr},
       {"<a e:GPSx", nullptr},
+      {"<a xmlns:p='http://ns.adobe.com/photoshop/1.0/' p:City='C'><p:State>S</p:State></a>",
+       "<a xmlns:p='http://ns.adobe.com/photoshop/1.0/'           >                    </a>"},
+      {"<a xmlns:p='urn:other' p:City='C'/>", nullptr},
   };
   for (const auto& row : rows) {
     std::string packet = row.packet;
@@ -115,6 +125,123 @@ TEST(Strip, FindsPlacesInXmp) {
     EXPECT_EQ(std::string(bytes.begin(), bytes.end()),
               row.blanked != nullptr ? row.blanked : packet);
   }
+}
+
+std::string App(uint8_t marker, const std::string& data) {
+  const size_t size = 2 + data.size();
+  return std::string("\xFF") + static_cast<char>(marker) + static_cast<char>(size >> 8) +
+         static_cast<char>(size & 0xFF) + data;
+}
+std::string Md5(const std::string& text) {
+  std::string digest = Md5Text({reinterpret_cast<const uint8_t*>(text.data()), text.size()});
+  return UpperCase(digest);
+}
+std::string Extended(const std::string& digest, const std::string& packet, size_t from,
+                     size_t end) {
+  const auto number = [](uint32_t value) {
+    return std::string{0, 0, static_cast<char>(value >> 8), static_cast<char>(value)};
+  };
+  return App(0xE1, std::string(kExtendedXmpHead) + digest +
+                       number(static_cast<uint32_t>(packet.size())) +
+                       number(static_cast<uint32_t>(from)) + packet.substr(from, end - from));
+}
+
+TEST(Strip, SplitPacketsAreOne) {
+  const std::string packet = "<a e:GPSLatitude='PLACE' b='2'/>",
+                    blank = "<a                       b='2'/>";
+  const auto file = [](const std::string& content) {
+    const std::string digest = Md5(content);
+    return Jpeg(App(0xE1, std::string(kXmpHead) + "<x n:HasExtendedXMP='" + digest + "'/>") +
+                    Extended(digest, content, 12, content.size()) +
+                    Extended(digest, content, 0, 12),
+                "");
+  };
+  const Stripped stripped = Strip(file(packet), true);
+  EXPECT_EQ(stripped.status, Status::Ok) << stripped.reason;
+  EXPECT_EQ(stripped.bytes, file(blank));
+  // what is kept is complete
+  FilePieces made;
+  std::string reason;
+  const std::string text = file(packet);
+  const std::vector<uint8_t> bytes(text.begin(), text.end());
+  ASSERT_EQ(StripPicture(bytes, kKeepXmp, made, reason), Status::Ok);
+  EXPECT_TRUE(made.Are(bytes));
+}
+
+TEST(Strip, SplitExifIsOne) {
+  // a GPS directory whose only value is in the second segment
+  const std::string block = Block({0x8825, 4, 1, kBehind},
+                                  Directory({{0x0002, 2, 5, 60}}) + std::string(16, 'x') + "PLACE");
+  const std::string file = Jpeg(App(0xE1, std::string(kExifHead) + block.substr(0, 50)) +
+                                    App(0xE1, std::string(kExifHead) + block.substr(50)),
+                                "");
+  const Stripped stripped = Strip(file, true);
+  EXPECT_EQ(stripped.status, Status::Ok) << stripped.reason;
+  EXPECT_EQ(stripped.bytes.size(), file.size());
+  EXPECT_EQ(stripped.bytes.find("PLACE"), std::string::npos);
+}
+
+TEST(Strip, PlacesInIptcAreBlankAndDigestsRight) {
+  const auto file = [](const std::string& city, bool right) {
+    const std::string iptc = std::string("\x1C\2\x5A\0", 4) + "\5" + city;
+    const std::string data(iptc), digest = right ? Md5(iptc) : std::string(32, '0');
+    std::string bytes;
+    for (size_t i = 0; i < 32; i += 2)
+      bytes.push_back(static_cast<char>(std::stoi(digest.substr(i, 2), nullptr, 16)));
+    return Jpeg(App(0xED, std::string(kPhotoshopHead) + std::string("8BIM\4\4\0\0\0\0\0\x0A", 12) +
+                              data + std::string("8BIM\4\x25\0\0\0\0\0\x10", 12) + bytes),
+                "");
+  };
+  for (const bool right : {true, false})
+    EXPECT_EQ(Strip(file("PLACE", right), true).bytes, file("     ", right)) << right;
+}
+
+TEST(Strip, DoesNotPassOverOtherEncodings) {
+  const std::string packet("<\0a\0 \0e\0:\0G\0P\0S\0=\0'\0'\0/\0>\0", 26);
+  EXPECT_EQ(Strip(Jpeg(App(0xE1, std::string(kXmpHead) + packet), ""), true).status,
+            Status::UnsuitableImage);
+}
+
+std::string PngFile(
+    std::initializer_list<std::pair<std::string_view, std::vector<uint8_t>>> chunks) {
+  std::string file(kPngSignature);
+  for (const auto& [type, data] : chunks) {
+    const std::vector<uint8_t> chunk = MakePngChunk(type, data);
+    file.append(chunk.begin(), chunk.end());
+  }
+  return file;
+}
+
+TEST(Strip, RawProfilesOfPngFiles) {
+  const auto bytes = [](const std::string& text) {
+    return std::vector<uint8_t>(text.begin(), text.end());
+  };
+  const std::string xmp = "<a e:GPSLatitude='PLACE' b='2'/>", keyword = "Raw profile type ";
+  const std::string exif =
+      std::string(kExifHead) +
+      Block({0x8825, 4, 1, kBehind}, Directory({{0x0002, 2, 5, 44}}) + "PLACE");
+  const std::string iptc = std::string("\x1C\2\x5A\0\5", 5) + "PLACE";
+  const struct {
+    const char* name;
+    std::string content;
+  } rows[] = {{"exif", exif}, {"xmp", xmp}, {"iptc", iptc}, {"APP1", exif}};
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    const std::vector<uint8_t> old = MakePngRawProfile(keyword + row.name, bytes(row.content));
+    const Stripped stripped = Strip(PngFile({{"IHDR", {}}, {"zTXt", old}, {"IEND", {}}}), true);
+    ASSERT_EQ(stripped.status, Status::Ok) << stripped.reason;
+    const std::vector<uint8_t> made = bytes(stripped.bytes);
+    PngChunks chunks(made);
+    PngChunk chunk;
+    while (chunks.Next(chunk) && chunk.type != "zTXt") continue;
+    const std::vector<uint8_t> left = ReadPngRawProfile(chunk);
+    EXPECT_EQ(left.size(), row.content.size());
+    EXPECT_EQ(std::ranges::search(left, std::string_view("PLACE")).size(), 0u);
+    EXPECT_NE(left, bytes(row.content));
+  }
+  const std::vector<uint8_t> damaged = bytes(keyword + std::string("exif\0\0x", 7));
+  EXPECT_EQ(Strip(PngFile({{"IHDR", {}}, {"zTXt", damaged}, {"IEND", {}}}), true).status,
+            Status::UnsuitableImage);
 }
 
 TEST(Strip, DoubledTagsBecomeOne) {

@@ -102,7 +102,7 @@ TEST(XmpTagEdit, RefusesWhatItDoesNotUnderstand) {
   for (const std::string& packet :
        {std::string("<x"), std::string("<a/>"), Packet("") + Packet(""), std::string("\xFF\xFE<"),
         Packet(Description("", "<d:subject r:nodeID='a'/>")), "<!DOCTYPE x []>" + Packet(""),
-        Packet("<r:RDF/>"),
+        Packet("<r:RDF/>"), "<a>" + Packet("") + "</a>", Packet("<x xmlns:y='a&amp;b'/>"),
         std::string("<RDF xmlns='http://www.w3.org/1999/02/22-rdf-syntax-ns#'/>")})
     EXPECT_EQ(Edited(packet, kRating), "refused") << packet;
   const XmpChange bad = {xmp::kBasic, "xmp", "Label", XmpForm::Text, {"\xFF"}};

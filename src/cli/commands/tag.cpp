@@ -10,6 +10,7 @@
 #include "cli/selection/rewrite_options.h"
 #include "core/text.h"
 #include "core/utf8.h"
+#include "metadata/tags/tag_lines.h"
 #include "settings/job_options.h"
 #include "texts/texts.h"
 
@@ -25,19 +26,11 @@ struct TagOptions {
   bool sidecar = false;
 };
 
-// The keywords of a list, without blanks around them.
-std::vector<std::string> ListedKeywords(const std::vector<std::string>& lists) {
+// The keywords of several lists.
+std::vector<std::string> AllKeywords(const std::vector<std::string>& lists) {
   std::vector<std::string> keywords;
-  for (std::string_view rest : lists) {
-    for (bool more = true; more;) {
-      const size_t comma = rest.find(',');
-      std::string_view word = rest.substr(0, comma);
-      word.remove_prefix(std::min(word.find_first_not_of(' '), word.size()));
-      word = word.substr(0, word.find_last_not_of(' ') + 1);
-      if (!word.empty()) keywords.emplace_back(word);
-      more = comma != std::string_view::npos;
-      rest.remove_prefix(more ? comma + 1 : rest.size());
-    }
+  for (const std::string& list : lists) {
+    for (std::string& keyword : ListedKeywords(list)) keywords.push_back(std::move(keyword));
   }
   return keywords;
 }
@@ -60,9 +53,9 @@ std::string TakeChanges(const TagOptions& options, TagChanges& changes) {
     if (EqualIgnoringCase(options.label, name)) changes.label = name;
   }
   if (options.label == "none") changes.label = "";
-  if (!options.keywords.empty()) changes.keywords = ListedKeywords(options.keywords);
-  changes.addedKeywords = ListedKeywords(options.added);
-  changes.removedKeywords = ListedKeywords(options.removed);
+  if (!options.keywords.empty()) changes.keywords = AllKeywords(options.keywords);
+  changes.addedKeywords = AllKeywords(options.added);
+  changes.removedKeywords = AllKeywords(options.removed);
   if (options.comment.size() > 1) return Tr("%1 was given twice.", "--comment");
   if (!options.comment.empty()) changes.description = options.comment.front();
   if (changes.Empty())

@@ -4,6 +4,8 @@
 #include "containers/png_chunks.h"
 #include "containers/riff_chunks.h"
 #include "core/byte_reader.h"
+#include "formats/png/png_raw_profile.h"
+#include "formats/png/png_text.h"
 #include "metadata/edit/picture_edit.h"
 #include "metadata/edit/strip.h"
 #include "metadata/exif/exif_walk.h"
@@ -84,6 +86,18 @@ void LookIntoJpeg(std::span<const uint8_t> file, Found& found) {
   if (EndOfJpeg(file, head.scan) < file.size()) found.Add(kOtherName);
 }
 
+const char* NameOfText(std::string_view keyword) {
+  if (keyword == "XML:com.adobe.xmp") return kXmpName;
+  switch (PngRawProfileOf(keyword)) {
+    case PngRawProfile::Exif: return kExifName;
+    case PngRawProfile::Xmp: return kXmpName;
+    case PngRawProfile::Iptc: return kIptcName;
+    case PngRawProfile::Other: return kOtherName;
+    case PngRawProfile::None: break;
+  }
+  return kCommentsName;
+}
+
 void LookIntoPng(std::span<const uint8_t> file, Found& found) {
   // chunks starting with an uppercase letter belong to the picture; so do these
   constexpr std::string_view kPicture[] = {"tRNS", "cHRM", "gAMA", "sBIT", "sRGB", "cICP",
@@ -97,7 +111,7 @@ void LookIntoPng(std::span<const uint8_t> file, Found& found) {
     if (type == "eXIf") {
       found.AddBlock(chunk.data);
     } else if (text) {
-      found.Add(ByteReader(chunk.data).Match("XML:com.adobe.xmp") ? kXmpName : kCommentsName);
+      found.Add(NameOfText(PngTextKeyword(chunk)));
     } else {
       found.Add(type == "iCCP" ? kProfileName : type == "tIME" ? kTimeName : kOtherName);
     }

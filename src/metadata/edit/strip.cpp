@@ -10,7 +10,7 @@
 #include "core/byte_reader.h"
 #include "metadata/edit/exif_transfer.h"
 #include "metadata/edit/picture_edit.h"
-#include "metadata/xmp/xmp_edit.h"
+#include "metadata/tags/tag_blocks.h"
 #include "texts/texts.h"
 
 namespace fotomill {
@@ -18,7 +18,7 @@ namespace fotomill {
 namespace {
 
 constexpr uint16_t kOrientation = 0x0112, kArtist = 0x013b, kCopyright = 0x8298,
-                   kMakerNote = 0x927c, kXmpTag = 700;
+                   kMakerNote = 0x927c;
 
 constexpr KeptName kNames[] = {
     {"orientation", kKeepOrientation},
@@ -41,7 +41,10 @@ bool IsKept(const ExifEntry& entry, ExifPlace place, uint32_t kept) {
 
 // The entries to keep in the new file.
 ExifChanges KeptEntries(std::span<const uint8_t> file, MetadataForm form, uint32_t kept) {
-  return TakenEntries(GatherPictureExif(file), [&](const ExifEntry& entry, ExifPlace place) {
+  // in PNG files, EXIF may also be in a text
+  const ExifDirectories exif =
+      form == MetadataForm::Png ? FindTagBlocks(file).exif : GatherPictureExif(file);
+  return TakenEntries(exif, [&](const ExifEntry& entry, ExifPlace place) {
     // in TIFF and HD Photo, MakeBareTiff keeps the orientation
     const bool own = entry.tag == kOrientation && form != MetadataForm::Jpeg &&
                      form != MetadataForm::Png && form != MetadataForm::Webp;
@@ -51,9 +54,12 @@ ExifChanges KeptEntries(std::span<const uint8_t> file, MetadataForm form, uint32
 
 std::vector<uint8_t> XmpOf(std::span<const uint8_t> file, MetadataForm form) {
   MetadataViews views;
-  const Status status = form == MetadataForm::Jpeg  ? FindJpegMetadata(file, views)
-                        : form == MetadataForm::Png ? FindPngMetadata(file, views)
-                                                    : FindWebpMetadata(file, views);
+  if (form == MetadataForm::Png) {
+    const TagBlocks blocks = FindTagBlocks(file);
+    return {blocks.xmp.begin(), blocks.xmp.end()};
+  }
+  const Status status =
+      form == MetadataForm::Jpeg ? FindJpegMetadata(file, views) : FindWebpMetadata(file, views);
   if (status != Status::Ok) return {};
   return {views.xmp.begin(), views.xmp.end()};
 }
@@ -83,136 +89,6 @@ Status StripDirectories(std::span<const uint8_t> file, MetadataForm form,
   RETURN_IF_BAD(EditDirectories(view, KeptEntries(file, form, kept), edit, reason));
   AddEdited(view, std::move(edit), made);
   return Status::Ok;
-}
-
-void BlankPlaces(std::span<const uint8_t> file, std::span<const uint8_t> packet,
-                 std::vector<DirectoryEdit::Patch>& patches) {
-  std::vector<uint8_t> blanked(packet.begin(), packet.end());
-  if (BlankXmpPlaces(blanked))
-    patches.push_back({static_cast<uint64_t>(packet.data() - file.data()), std::move(blanked)});
-}
-
-// Finds GPS directories and XMP positions in all JPEG streams from `from` on. Patch offsets are
-// relative to `file`.
-Status ErasePlacesBehind(std::span<const uint8_t> file, uint64_t from,
-                         std::vector<DirectoryEdit::Patch>& patches, std::string& reason) {
-  const DirectoryChange change{.place = ExifPlace::Gps, .all = true};
-  for (uint64_t at = from; at + 10 < file.size();) {
-    const void* found = std::memchr(&file[at], 0xFF, file.size() - at - 10);
-    if (found == nullptr) break;
-    at = static_cast<uint64_t>(static_cast<const uint8_t*>(found) - file.data());
-    ByteReader bytes(file.subspan(at + 1));
-    const bool application = bytes.U8() == 0xE1;
-    const uint16_t length = bytes.Be16();
-    ++at;
-    if (!application || length < 22) continue;
-    const auto offset = [&](std::span<const uint8_t> part) {
-      return static_cast<uint64_t>(part.data() - file.data());
-    };
-    if (bytes.Match("http://ns.adobe.com/")) {
-      const auto packet = bytes.Peek(std::min<uint64_t>(length - 22u, bytes.Left()));
-      BlankPlaces(file, packet, patches);
-      if (!packet.empty()) at = offset(packet) + packet.size();
-      continue;
-    }
-    if (!bytes.Match(kExifHead)) continue;
-    const auto block = bytes.Peek(length - 8u);
-    DirectoryEdit edit;
-    // not an EXIF block after all
-    if (EditDirectories(block, {&change, 1}, edit, reason) != Status::Ok) continue;
-    if (!edit.tail.empty()) {
-      reason = Tr("The place shares its bytes with other values.");
-      return Status::UnsuitableImage;
-    }
-    for (auto& patch : edit.patches)
-      patches.push_back({offset(block) + patch.at, std::move(patch.bytes)});
-    at = offset(block) + block.size();
-  }
-  reason.clear();
-  return Status::Ok;
-}
-
-Status StripJpegPlaces(std::span<const uint8_t> file, FilePieces& made, std::string& reason) {
-  JpegHead head;
-  RETURN_IF_BAD(ParseJpegHead(file, head));
-  DirectoryEdit edit;
-  const DirectoryChange change{.place = ExifPlace::Gps, .all = true};
-  for (const JpegSegment& segment : head.segments) {
-    if (segment.marker != 0xE1) continue;
-    if (!segment.Starts("Exif")) {
-      BlankPlaces(file, segment.data, edit.patches);
-    } else if (segment.data.size() > kExifHead.size()) {
-      const auto block = segment.data.subspan(kExifHead.size());
-      DirectoryEdit own;
-      RETURN_IF_BAD(EditDirectories(block, {&change, 1}, own, reason));
-      if (!own.tail.empty()) {
-        reason = Tr("The place shares its bytes with other values.");
-        return Status::UnsuitableImage;
-      }
-      const auto base = static_cast<uint64_t>(block.data() - file.data());
-      for (auto& patch : own.patches)
-        edit.patches.push_back({base + patch.at, std::move(patch.bytes)});
-    }
-  }
-  RETURN_IF_BAD(ErasePlacesBehind(file, head.scan, edit.patches, reason));
-  AddEdited(file, std::move(edit), made);
-  return Status::Ok;
-}
-
-Status StripFilePlaces(std::span<const uint8_t> file, FilePieces& made, std::string& reason) {
-  DirectoryEdit edit;
-  const DirectoryChange change{.place = ExifPlace::Gps, .all = true};
-  RETURN_IF_BAD(EditDirectories(file, {&change, 1}, edit, reason));
-  if (!edit.tail.empty()) {
-    reason = Tr("The place shares its bytes with other values.");
-    return Status::UnsuitableImage;
-  }
-  std::vector<DirectoryValue> packets = FindDirectoryValues(file, kXmpTag);
-  // pages may share one
-  std::ranges::sort(packets, {}, [](const DirectoryValue& xmp) { return xmp.bytes.data(); });
-  uint64_t end = 0;
-  for (const DirectoryValue& xmp : packets) {
-    const auto at = static_cast<uint64_t>(xmp.bytes.data() - file.data());
-    if (xmp.bytes.empty() || at < end) continue;
-    BlankPlaces(file, xmp.bytes, edit.patches);
-    end = at + xmp.bytes.size();
-  }
-  std::ranges::sort(edit.patches, {}, &DirectoryEdit::Patch::at);
-  AddEdited(file, std::move(edit), made);
-  return Status::Ok;
-}
-
-// Whether a PNG file has EXIF or XMP in a compressed or hexadecimal text chunk.
-bool HasRawProfile(std::span<const uint8_t> file) {
-  PngChunks chunks(file);
-  for (PngChunk chunk; chunks.Next(chunk);) {
-    if (chunk.type != "tEXt" && chunk.type != "zTXt" && chunk.type != "iTXt") continue;
-    ByteReader text(chunk.data);
-    if (text.Match("Raw profile type ")) return true;
-    if (text.Match(std::string_view("XML:com.adobe.xmp\0\1", 19))) return true;
-  }
-  return false;
-}
-
-Status StripBlockPlaces(std::span<const uint8_t> file, MetadataForm form, FilePieces& made,
-                        std::string& reason) {
-  const bool png = form == MetadataForm::Png;
-  if (png && HasRawProfile(file)) {
-    reason = Tr("The file has metadata in a text chunk, which may tell the place.");
-    return Status::UnsuitableImage;
-  }
-  MetadataViews views;
-  RETURN_IF_BAD(png ? FindPngMetadata(file, views) : FindWebpMetadata(file, views));
-  MetadataBlocks blocks;
-  if (!views.exif.empty()) {
-    DirectoryEdit edit;
-    const DirectoryChange change{.place = ExifPlace::Gps, .all = true};
-    RETURN_IF_BAD(EditDirectories(views.exif, {&change, 1}, edit, reason));
-    if (!edit.Empty()) blocks.exif = EditedBlock(views.exif, std::move(edit));
-  }
-  std::vector<uint8_t> packet(views.xmp.begin(), views.xmp.end());
-  if (BlankXmpPlaces(packet)) blocks.xmp = std::move(packet);
-  return png ? RewritePng(file, blocks, made, reason) : RewriteWebp(file, blocks, made, reason);
 }
 
 }  // namespace
@@ -251,20 +127,6 @@ Status StripPicture(std::span<const uint8_t> file, uint32_t kept, FilePieces& ma
                     : RewriteWebp(view, blocks, made, reason));
   made.Append(std::move(pieces));  // `made` refers to them
   return Status::Ok;
-}
-
-Status StripPlaces(std::span<const uint8_t> file, FilePieces& made, std::string& reason) {
-  made.Clear();
-  switch (const MetadataForm form = MetadataFormOf(file)) {
-    case MetadataForm::Jpeg: return StripJpegPlaces(file, made, reason);
-    case MetadataForm::Png:
-    case MetadataForm::Webp: return StripBlockPlaces(file, form, made, reason);
-    case MetadataForm::Tiff:
-    case MetadataForm::HdPhoto: return StripFilePlaces(file, made, reason);
-    case MetadataForm::None: break;
-  }
-  reason = Tr("Metadata can be removed from JPEG, TIFF, PNG, WebP and HD Photo files.");
-  return Status::UnsupportedFormat;
 }
 
 }  // namespace fotomill

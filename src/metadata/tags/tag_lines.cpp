@@ -1,5 +1,7 @@
 #include "metadata/tags/tag_lines.h"
 
+#include <algorithm>
+
 #include "core/text.h"
 
 namespace fotomill {
@@ -32,6 +34,20 @@ std::string KeywordText(const PictureTags& tags) {
   for (const std::string& keyword : tags.keywords)
     text.append(text.empty() ? "" : ", ").append(keyword);
   return text;
+}
+
+std::vector<std::string> ListedKeywords(std::string_view text) {
+  std::vector<std::string> keywords;
+  for (bool more = true; more;) {
+    const size_t comma = text.find(',');
+    std::string_view word = text.substr(0, comma);
+    word.remove_prefix(std::min(word.find_first_not_of(" \t\r\n"), word.size()));
+    word = word.substr(0, word.find_last_not_of(" \t\r\n") + 1);
+    if (!word.empty()) keywords.emplace_back(word);
+    more = comma != std::string_view::npos;
+    text.remove_prefix(more ? comma + 1 : text.size());
+  }
+  return keywords;
 }
 
 std::string PlaceText(const PictureTags& tags) {

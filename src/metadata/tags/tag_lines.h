@@ -19,8 +19,10 @@ std::vector<TagLine> TagLines(const PictureTags& tags);
 // Heading for the lines in lists of all metadata.
 inline constexpr const char* kTagsHeading = TrLater("Titles and keywords");
 
-// A text in one line, separated by commas; of a place, the narrowest part first.
+// The keywords separated by commas; and those of such a text, without blanks around them.
 std::string KeywordText(const PictureTags& tags);
+std::vector<std::string> ListedKeywords(std::string_view text);
+// The narrowest part of the place first.
 std::string PlaceText(const PictureTags& tags);
 
 }  // namespace fotomill

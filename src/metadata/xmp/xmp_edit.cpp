@@ -6,11 +6,16 @@
 #include "metadata/xmp/xmp_edit.h"
 
 #include <algorithm>
+#include <map>
+#include <set>
 #include <string>
 #include <string_view>
+#include <vector>
 
 #include "containers/walked_bytes.h"
 #include "core/text.h"
+#include "metadata/xmp/xml_markup.h"
+#include "metadata/xmp/xmp_names.h"
 
 namespace fotomill {
 
@@ -38,22 +43,66 @@ size_t ValueBehind(std::span<const uint8_t> packet, size_t at) {
   return at;
 }
 
-}  // namespace
+// Properties with place names, at any depth.
+constexpr struct {
+  std::string_view uri, name;
+} kPlaceNames[] = {
+    {xmp::kPhotoshop, "City"},
+    {xmp::kPhotoshop, "State"},
+    {xmp::kPhotoshop, "Country"},
+    {xmp::kIptcCore, "Location"},
+    {xmp::kIptcCore, "CountryCode"},
+    {xmp::kIptcExtension, "LocationCreated"},
+    {xmp::kIptcExtension, "LocationShown"},
+};
 
-void SetXmpOrientation(std::span<uint8_t> packet, int32_t orientation) {
-  auto rest = packet.begin();
-  while ((rest = std::search(rest, packet.end(), kName.begin(), kName.end())) != packet.end()) {
-    rest += kName.size();
-    const size_t value = ValueBehind(packet, static_cast<size_t>(rest - packet.begin()));
-    const bool oneDigit = value + 1 < packet.size() && packet[value] >= '1' &&
-                          packet[value] <= '8' &&
-                          (packet[value + 1] < '0' || packet[value + 1] > '9');
-    if (oneDigit) packet[value] = static_cast<uint8_t>('0' + orientation);
+// Finds the names' namespaces; declarations may be anywhere, prefixes have one meaning in practice.
+bool IsPlaceName(std::string_view name,
+                 const std::multimap<std::string_view, std::string_view>& uris) {
+  const size_t colon = name.find(':');
+  const std::string_view local = name.substr(colon + 1);
+  const std::string_view prefix = colon == std::string_view::npos ? "" : name.substr(0, colon);
+  const auto [first, end] = uris.equal_range(prefix);
+  return std::any_of(first, end, [local](const auto& declared) {
+    return std::ranges::any_of(kPlaceNames, [&](const auto& row) {
+      return row.uri == declared.second && row.name == local;
+    });
+  });
+}
+
+bool BlankPlaceNames(std::span<uint8_t> packet) {
+  const std::string text(TextOf(packet));
+  std::vector<XmlElement> elements;
+  if (!ScanXml(text, elements)) return false;
+  std::set<std::pair<std::string_view, std::string_view>> declared;  // of the namespaces above
+  const auto declare = [&](std::string_view prefix, std::string_view uri) {
+    const auto isOne = [uri](const auto& row) { return row.uri == uri; };
+    if (std::ranges::any_of(kPlaceNames, isOne)) declared.emplace(prefix, uri);
+  };
+  for (const XmlElement& element : elements) {
+    for (const XmlAttribute& attribute : element.attributes) {
+      if (attribute.name == "xmlns") declare("", attribute.value);
+      if (attribute.name.starts_with("xmlns:")) declare(attribute.name.substr(6), attribute.value);
+    }
   }
+  const std::multimap<std::string_view, std::string_view> uris(declared.begin(), declared.end());
+  bool found = false;
+  const auto blank = [&](size_t begin, size_t end) {
+    std::fill(packet.begin() + static_cast<ptrdiff_t>(begin),
+              packet.begin() + static_cast<ptrdiff_t>(end), uint8_t{' '});
+    found = true;
+  };
+  for (const XmlElement& element : elements) {
+    if (IsPlaceName(element.name, uris)) blank(element.begin, element.end);
+    for (const XmlAttribute& attribute : element.attributes) {
+      if (IsPlaceName(attribute.name, uris)) blank(attribute.begin, attribute.end);
+    }
+  }
+  return found;
 }
 
 // Whatever the prefix: drones have names of their own beside those of EXIF.
-bool BlankXmpPlaces(std::span<uint8_t> packet) {
+bool BlankPositions(std::span<uint8_t> packet) {
   constexpr std::string_view kPlace = ":gps", kBlanks = " \t\r\n";
   const std::string_view text = TextOf(packet);
   const auto same = [](char a, char b) { return LowerCase(a) == b; };
@@ -95,6 +144,30 @@ bool BlankXmpPlaces(std::span<uint8_t> packet) {
     at = end;
   }
   return found;
+}
+
+}  // namespace
+
+void SetXmpOrientation(std::span<uint8_t> packet, int32_t orientation) {
+  auto rest = packet.begin();
+  while ((rest = std::search(rest, packet.end(), kName.begin(), kName.end())) != packet.end()) {
+    rest += kName.size();
+    const size_t value = ValueBehind(packet, static_cast<size_t>(rest - packet.begin()));
+    const bool oneDigit = value + 1 < packet.size() && packet[value] >= '1' &&
+                          packet[value] <= '8' &&
+                          (packet[value + 1] < '0' || packet[value + 1] > '9');
+    if (oneDigit) packet[value] = static_cast<uint8_t>('0' + orientation);
+  }
+}
+
+bool BlankXmpPlaces(std::span<uint8_t> packet) {
+  const bool names = BlankPlaceNames(packet);
+  return BlankPositions(packet) || names;
+}
+
+bool IsBlankableXmp(std::span<const uint8_t> packet) {
+  while (!packet.empty() && packet.back() == 0) packet = packet.first(packet.size() - 1);
+  return std::ranges::find(packet, uint8_t{0}) == packet.end();
 }
 
 }  // namespace fotomill

@@ -102,7 +102,9 @@ class Editor {
   bool FindGraph() {
     for (size_t i = 0; i < elements_.size(); ++i) {
       const bool graph = LocalOf(elements_[i].name) == "RDF" && namespaces_.UriOf(i) == xmp::kRdf;
-      if (graph && graph_ != XmlElement::kNoParent) return false;  // which one counts?
+      // which one counts?
+      if (graph && (graph_ != XmlElement::kNoParent || (i > 0 && elements_[i].parent != 0)))
+        return false;
       if (graph) graph_ = i;
       const bool inGraph =
           i > 0 && elements_[i].parent == graph_ && graph_ != XmlElement::kNoParent && !graph;
@@ -118,7 +120,14 @@ class Editor {
       const auto refers = [](const XmlAttribute& attribute) {
         return LocalOf(attribute.name) == "nodeID";
       };
-      if (std::ranges::any_of(elements_[i].attributes, refers)) return false;
+      // namespaces are compared as they are written
+      const auto hides = [](const XmlAttribute& attribute) {
+        return attribute.name.starts_with("xmlns") &&
+               attribute.value.find_first_of("&\t\r\n") != std::string_view::npos;
+      };
+      if (std::ranges::any_of(elements_[i].attributes, refers) ||
+          std::ranges::any_of(elements_[i].attributes, hides))
+        return false;
     }
     return !rdf_.empty();
   }
@@ -221,7 +230,8 @@ class Editor {
 
   // Removes descriptions that have no properties any more.
   void RemoveEmptied() {
-    for (const auto& [description, count] : removed_) {
+    for (const auto& removed : removed_) {
+      const size_t description = removed.first;
       const XmlElement& element = elements_[description];
       const auto properties =
           static_cast<size_t>(std::ranges::count_if(element.attributes,
@@ -233,7 +243,7 @@ class Editor {
                               std::ranges::count_if(properties_, [&](size_t i) {
                                 return elements_[i].parent == description;
                               }));
-      if (properties != count) continue;
+      if (properties != removed.second) continue;
       std::erase_if(replacements_, [&](const Replacement& one) {
         return one.begin >= element.begin && one.end <= element.end;
       });
@@ -333,12 +343,14 @@ void KeepSize(std::string& packet, size_t size) {
 Status EditXmp(std::span<const uint8_t> packet, std::span<const XmpChange> changes,
                std::vector<uint8_t>& made) {
   constexpr size_t kMostBytes = size_t{16} << 20;
+  while (!packet.empty() && packet.back() == 0) packet = packet.first(packet.size() - 1);
   const std::string_view text =
       packet.empty()
           ? kNewPacket
           : std::string_view(static_cast<const char*>(static_cast<const void*>(packet.data())),
                              packet.size());
-  if (text.size() > kMostBytes || !IsUtf8(text)) return Status::DamagedFile;
+  if (text.size() > kMostBytes || !IsUtf8(text) || text.find('\0') != std::string_view::npos)
+    return Status::DamagedFile;
   pugi::xml_document document;
   // the scanner finds positions; a real parser says whether the text is XML
   if (!document.load_buffer(text.data(), text.size(), pugi::parse_default, pugi::encoding_utf8))

@@ -304,7 +304,7 @@ void SetUpExifStrip(CLI::App& app, CommandContext& context) {
                               "copyright, exif, gps, xmp, iptc, comments; or none "
                               "(default: orientation,profile)");
   CLI::Option* gpsOnly = AddFlag(app, "--gps-only", options->gpsOnly,
-                                 "Remove only where the picture was taken, in EXIF and XMP");
+                                 "Remove only where the picture was taken, in EXIF, XMP and IPTC");
   Exclude(gpsOnly, keep);
   AddRewriteOptions(app, options->rewrite);
   SetFooter(app,
