@@ -281,6 +281,10 @@ def keep_sidecars():
             (data, True),
             "--sidecar leaves the picture alone",
         )
+        for comment in ("Beside", "Other"):
+            place.run("tag", "c.jpg", "--dest", comment, "--comment", comment)
+            copied = (place.path / comment / "c.jpg.xmp").read_text()
+            check(comment in copied, True, "the sidecar goes with the copy")
         place.run("tag", "c.jpg", "--in-place", "--comment", "Both")
         check(
             [tags(place.path / n)[n]["XMP-dc:Description"] for n in ("c.jpg", "c.jpg.xmp")],

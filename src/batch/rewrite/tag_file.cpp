@@ -138,8 +138,9 @@ class TagRewrite {
         return rewrite.Fail(Status::FileOpenError, ReasonSentence());
       std::vector<uint8_t> made;
       RETURN_IF_BAD(edit(file.Bytes(), made, written));
-      if (!written) return Status::Ok;
-      const std::span<const uint8_t> whole = made;
+      const bool copies = !written && !old.empty() && old != path;
+      if (!written && !copies) return Status::Ok;
+      const std::span<const uint8_t> whole = copies ? file.Bytes() : made;
       return rewrite.Write({&whole, 1}, false);
     }();
     Take(rewrite);
