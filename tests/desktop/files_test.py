@@ -124,6 +124,19 @@ def rename_in_sequence(folder):
         assert renamed == ["a.bmp", "b.bmp", "c.bmp"], renamed
         ini = (desktop.data / "Fotomill Professional 11.ini").read_text()
         assert "SequentialRenameBaseName=beach\n" in ini, ini
+        # By a pattern, with a preview from the files.
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "shift+F2")
+        desktop.wait(r"prompt sequential-rename")
+        desktop.focus("^Sequential Rename$")
+        desktop.key("alt+a", "ctrl+a")
+        desktop.type("%W x %H no %02c")
+        desktop.wait(r"rename-preview 3 failed=0")
+        desktop.screenshot("rename-pattern")
+        desktop.key("Return")
+        desktop.wait(r"batch ended")
+        found = names(pictures)
+        assert [name[-9:] for name in found] == [f"no {i:02}.bmp" for i in (1, 2, 3)], found
 
 
 def thumbnails_and_session(folder):
@@ -213,5 +226,41 @@ def turn_and_take_back(folder):
         desktop.key("Return")
 
 
-run(rename_delete_undo_paste, names_that_are_not_utf8, rename_in_sequence, thumbnails_and_session,
-    turn_and_take_back)
+def search_results_in_a_tab(folder):
+    """Found files of several folders in one tab, on which functions work."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["tree.bmp", "sea1.bmp"])
+    make_pictures(pictures / "deep/er", ["sea2.bmp", "hill.bmp"])
+    with Desktop(folder, pictures, settings=["UpdateThumbnailsFlag=0"]) as desktop:
+        desktop.wait(r"lines=3 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+shift+f")
+        desktop.wait(r"prompt search")
+        desktop.focus("Find pictures")
+        desktop.key("ctrl+a")
+        desktop.type("sea*")
+        desktop.screenshot("search")
+        desktop.key("Return")
+        desktop.wait(r"search found=2 examined=4$")
+        desktop.wait(r"tabs=2 lines=2 .*missing=0 listing=0 .*folder=.*pictures$")
+        desktop.focus("Find pictures")
+        desktop.key("Escape")
+        desktop.focus("Fotomill Professional")
+        desktop.screenshot("search-results")
+        desktop.key("Home", "F2")
+        desktop.type("ocean")
+        desktop.key("Return")
+        desktop.wait(r"files Rename done=1 failed=0")
+        desktop.wait(r"tabs=2 lines=2 .*listing=0 .*focus=deep/er/ocean.bmp")
+        assert (pictures / "deep/er/ocean.bmp").exists()
+        desktop.key("ctrl+a", "Delete")
+        desktop.wait(r"files Deletion of 2 files done=2")
+        desktop.wait(r"tabs=2 lines=0 ")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo deletion of 2 files done=2")
+        desktop.wait(r"tabs=2 lines=2 ")
+        assert (pictures / "sea1.bmp").exists()
+
+
+run(search_results_in_a_tab, rename_delete_undo_paste, names_that_are_not_utf8,
+    rename_in_sequence, thumbnails_and_session, turn_and_take_back)

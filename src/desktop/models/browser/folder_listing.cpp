@@ -69,6 +69,18 @@ FolderListing ListForBrowser(const std::string& folder, bool facts, const StopTo
   return listing;
 }
 
+FolderListing ListNames(const std::string& folder, const std::vector<std::string>& names,
+                        const StopToken& stop) {
+  FolderListing listing{.state = FolderState::Listed};
+  FormatFinder formats;
+  for (const std::string& name : names) {
+    if (stop.Asked()) return listing;
+    if (platform::IsRegularFile(platform::JoinFolder(folder, name)))
+      listing.items.push_back({.name = name, .format = formats.Find(name)});
+  }
+  return listing;
+}
+
 std::vector<std::string> SubfolderNames(const std::string& folder) {
   std::vector<std::string> names;
   for (const platform::FolderEntry& entry :

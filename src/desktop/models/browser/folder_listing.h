@@ -39,6 +39,10 @@ struct FolderListing {
 // what it has.
 FolderListing ListForBrowser(const std::string& folder, bool facts, const StopToken& stop);
 
+// Lists those of the named files that still exist; names are relative to the folder.
+FolderListing ListNames(const std::string& folder, const std::vector<std::string>& names,
+                        const StopToken& stop);
+
 // Names of the folders in a folder, without hidden ones, sorted.
 std::vector<std::string> SubfolderNames(const std::string& folder);
 

@@ -16,6 +16,7 @@ struct Topic {
 constexpr Topic kTopics[] = {
     {"OVERWRITE", "Overwriting"},
     {"RENAME", "Renaming in sequence"},
+    {"SEARCH", "Finding pictures"},
 };
 
 // The text between a third-level heading and the next heading; empty if not found.

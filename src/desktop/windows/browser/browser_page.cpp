@@ -124,6 +124,33 @@ void BrowserPage::Open(const std::string& folder, const std::string& focus) {
   ShowFolder(folder, focus);
 }
 
+void BrowserPage::ShowFound(const std::string& folder, const std::vector<std::string>& names,
+                            const FolderView& view) {
+  if (!found_ || folder != model_.Folder()) {
+    if (folder != model_.Folder()) trail_.Go(folder);
+    watch_.Watch({});
+    offer_.Forget();
+    model_.SetFolder(folder);
+    model_.SetView(view);
+    filter_->ChangeValue("");
+    path_->ShowFolder(folder);
+    canvas_->ScrollTo(0);
+    ShowProblem({});
+    ShowView();
+  }
+  found_ = names;
+  Reload();
+  host_.BrowserChanged();
+}
+
+void BrowserPage::FollowRename(const std::string& from, const std::string& to) {
+  if (!found_) return;
+  const std::string start = platform::JoinFolder(model_.Folder(), "");
+  for (std::string& name : *found_) {
+    if (start + name == from && to.starts_with(start)) name = to.substr(start.size());
+  }
+}
+
 void BrowserPage::StepAlongTrail(int steps) {
   if (!trail_.CanStep(steps)) return;
   const std::string left(platform::FileNameOf(model_.Folder()));
@@ -138,7 +165,8 @@ void BrowserPage::GoUp() {
 void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus) {
   wantedFocus_ = focus;
   closesIfMissing_ = false;
-  if (folder == model_.Folder()) return Reload();
+  const bool hadFound = std::exchange(found_, {}).has_value();
+  if (folder == model_.Folder() && !hadFound) return Reload();
   wantedNames_.reset();
   watch_.Watch({});
   offer_.Forget();
@@ -165,6 +193,7 @@ void BrowserPage::UseView(const BrowserModes& chosen) {
 }
 
 void BrowserPage::Reload() {
+  if (found_) return reader_.ListFound(model_.Folder(), *found_);
   reader_.List(model_.Folder(), model_.ItemCount() == 0);
   late_.StartOnce(kPatienceMs);
 }
@@ -177,15 +206,15 @@ void BrowserPage::ShowListing(FolderListing listing, bool complete) {
     return host_.CloseBrowser(*this);
   ShowProblem(listing.problem);
   // The user's choices apply until the folder's own settings change.
-  const bool otherView = state == FolderState::Listed && listing.chosen != override_;
+  const bool otherView = !found_ && state == FolderState::Listed && listing.chosen != override_;
   if (otherView) UseView(listing.chosen);
   model_.SetItems(std::move(listing.items));
   LogEvent(complete ? "listed" : "names", std::to_string(count) + " " + model_.Folder());
   ShowWanted();
   if (complete) {
-    watch_.Watch(model_.Folder());
+    if (!found_) watch_.Watch(model_.Folder());
     StartFacts();
-    if (state == FolderState::Listed) OfferThumbnails();
+    if (!found_ && state == FolderState::Listed) OfferThumbnails();
     wantedFocus_.clear();
     wantedScroll_ = -1;
     wantedNames_.reset();
@@ -309,7 +338,7 @@ void BrowserPage::ShowAs(const FolderView& view) {
 // The user's choice is saved for this folder, and used for folders without a saved view.
 void BrowserPage::ChooseView(const FolderView& view) {
   base_ = view;
-  host_.KeepView(model_.Folder(), view);
+  if (!found_) host_.KeepView(model_.Folder(), view);
   ShowAs(view);
 }
 
@@ -366,7 +395,7 @@ void BrowserPage::EditFocusedName() {
   if (focus == kNoLine) return;
   if (!ShowsDetails()) return canvas_->EditName(focus);
   wxTextEntryDialog dialog(this, Label("New name:"), Label("Rename"),
-                           Shown(model_.Line(focus).name));
+                           Shown(platform::FileNameOf(model_.Line(focus).name)));
   if (dialog.ShowModal() == wxID_OK)
     host_.RenameFile(model_.PathOfLine(focus), Utf8(dialog.GetValue()));
 }

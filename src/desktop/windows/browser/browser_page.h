@@ -57,6 +57,12 @@ class BrowserPage : public wxPanel {
 
   // Opens a folder; `focus` is the name to focus once it is listed.
   void Open(const std::string& folder, const std::string& focus = {});
+  // Shows only these files, by names relative to the folder, until a folder is opened.
+  void ShowFound(const std::string& folder, const std::vector<std::string>& names,
+                 const FolderView& view);
+  bool ShowsFound() const { return found_.has_value(); }
+  // Updates the names of found files after one was renamed; absolute paths.
+  void FollowRename(const std::string& from, const std::string& to);
   void Reload();  // reads the folder again, keeping the selection by name
   // Moves along the visited folders of this browser.
   void StepAlongTrail(int steps);
@@ -133,6 +139,7 @@ class BrowserPage : public wxPanel {
   FolderView base_;  // for folders without saved view
   BrowserModes override_;  // from the folder's own file; -1: none
   FolderTrail trail_;
+  std::optional<std::vector<std::string>> found_;  // the files to show; none: the folder
   std::string wantedFocus_;
   int64_t wantedScroll_ = -1;
   std::optional<std::vector<std::string>> wantedNames_;  // to select

@@ -34,6 +34,25 @@ void FolderReader::List(const std::string& folder, bool namesFirst) {
       });
 }
 
+void FolderReader::ListFound(const std::string& folder, std::vector<std::string> names) {
+  facts_.Stop();
+  listing_.Start(
+      [this, folder, names = std::move(names)](const StopToken& stop,
+                                               const LooseWork::Report& report) {
+        const auto sent = std::make_shared<FolderListing>(ListNames(folder, names, stop));
+        AddFacts(folder, *sent, stop);
+        if (stop.Asked()) return;
+        report([this, sent] {
+          listing_.Stop();
+          events_.listed(std::move(*sent), true);
+        });
+      },
+      [this] {
+        listing_.Stop();
+        events_.listed({}, true);
+      });
+}
+
 void FolderReader::ReadFacts(const std::string& folder, PlacedItems wanted) {
   facts_.Start(
       [this, folder, wanted = std::move(wanted)](const StopToken& stop,

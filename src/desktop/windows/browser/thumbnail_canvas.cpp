@@ -454,7 +454,7 @@ void ThumbnailCanvas::EditName(size_t line) {
   if (line >= model_.LineCount()) return;
   ShowLine(line);
   const Rect cell = layout_.Cell(line);
-  const std::string& name = model_.Line(line).name;
+  const std::string name(platform::FileNameOf(model_.Line(line).name));  // of a found file, too
   const int height = textHeight_ + FromDIP(12);
   const int top = static_cast<int>(cell.y - scroll_) + cell.height - height;
   editedLine_ = line;
@@ -485,8 +485,8 @@ void ThumbnailCanvas::FinishEdit(bool accept) {
   const size_t line = std::exchange(editedLine_, kNoLine);
   const std::string name = Utf8(editor->GetValue());
   const bool hadFocus = editor->HasFocus();
-  const bool changed =
-      line < model_.LineCount() && editor->IsModified() && name != model_.Line(line).name;
+  const bool changed = line < model_.LineCount() && editor->IsModified() &&
+                       name != platform::FileNameOf(model_.Line(line).name);
   editor->Hide();
   editor->Destroy();
   if (hadFocus) SetFocus();

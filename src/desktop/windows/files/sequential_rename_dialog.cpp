@@ -8,12 +8,14 @@
 #include <wx/sizer.h>
 #include <wx/spinctrl.h>
 #include <wx/stattext.h>
+#include <wx/textctrl.h>
 #include <wx/wrapsizer.h>
 
 #include <optional>
 
 #include "batch/new_job.h"
 #include "batch/progress_box.h"
+#include "batch/rename/pattern_rename.h"
 #include "batch/rename/sequential_rename.h"
 #include "core/plain_name.h"
 #include "desktop/models/shell/event_log.h"
@@ -23,6 +25,7 @@
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/loose_work.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "files/rename_log.h"
 #include "platform/paths.h"
@@ -37,6 +40,7 @@ namespace {
 
 constexpr size_t kMostPreviewed = 200;
 constexpr int kMostNumber = 32760, kMostIncrement = 1000;
+constexpr std::string_view kFirstPattern = "%D{%Y-%m-%d} %03c %F";
 
 std::string_view BuiltInBase() { return DefaultText(KeyOf(KeyNumber::SequentialRenameBaseName)); }
 
@@ -74,18 +78,31 @@ std::vector<BatchFile> BatchFiles(const std::vector<std::string>& files, size_t 
   return batch;
 }
 
+// What the user chose: names by a pattern, or in sequence.
+struct RenameChoice {
+  std::optional<PatternRenameOptions> pattern;
+  SequentialRenameRules rules;
+};
+
 class SequentialRenameDialog : public wxDialog {
  public:
   SequentialRenameDialog(wxWindow* parent, const std::vector<std::string>& files);
-  // The user's rules, also saved in the settings; nullopt, with nothing changed, if canceled.
-  std::optional<SequentialRenameRules> Ask();
+  // The user's choice, also saved in the settings; nullopt, with nothing changed, if canceled.
+  std::optional<RenameChoice> Ask();
 
  private:
+  void AddPattern(wxSizer& grid);
   SequentialRenameRules ReadControls() const;
+  PatternRenameOptions ReadPattern() const;
   void StoreControls() const;
+  wxString Problem() const;
   void UpdateControls();
+  void ShowPreview(const std::vector<FileOutcome>& outcomes);
 
   const std::vector<std::string>& files_;
+  LooseWork work_;  // the preview by a pattern reads the files
+  wxCheckBox* byPattern_ = nullptr;
+  wxTextCtrl* pattern_ = nullptr;
   wxComboBox* base_ = nullptr;
   wxSpinCtrl* number_ = nullptr;
   wxSpinCtrl* increment_ = nullptr;
@@ -121,6 +138,7 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent,
     control->Bind(wxEVT_SPINCTRL, [this](wxSpinEvent&) { UpdateControls(); });
     return control;
   };
+  AddPattern(*grid);
   label(Label("Base &number:"));
   number_ = spin(Label("Base number"), 0, kMostNumber, settings.SequentialRenameBaseNumber);
   label(Label("&Increment:"));
@@ -163,6 +181,32 @@ SequentialRenameDialog::SequentialRenameDialog(wxWindow* parent,
   base_->SetFocus();
 }
 
+void SequentialRenameDialog::AddPattern(wxSizer& grid) {
+  const std::string last(settings.RenamePrevious);
+  byPattern_ = new wxCheckBox(this, wxID_ANY, Label("By p&attern:"));
+  grid.Add(byPattern_, wxSizerFlags().CenterVertical());
+  pattern_ = new wxTextCtrl(this, wxID_ANY, Shown(last.empty() ? kFirstPattern : last));
+  pattern_->SetName(Label("Pattern"));
+  pattern_->SetToolTip(Label(
+      "%F is the old name, %D{%Y-%m-%d} the date when the picture was taken, %03c a counter"));
+  grid.Add(pattern_, wxSizerFlags().Expand());
+  byPattern_->Bind(wxEVT_CHECKBOX, [this](wxCommandEvent&) {
+    const bool on = byPattern_->GetValue();
+    number_->SetValue(on ? 1 : settings.SequentialRenameBaseNumber);
+    increment_->SetValue(on ? 1 : settings.SequentialRenameIncrement);
+    UpdateControls();
+    if (on) pattern_->SetFocus();
+  });
+  pattern_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateControls(); });
+}
+
+PatternRenameOptions SequentialRenameDialog::ReadPattern() const {
+  return {.pattern = Utf8(pattern_->GetValue()),
+          .start = number_->GetValue(),
+          .increment = increment_->GetValue(),
+          .copyrightHolder = std::string(settings.ExifCopyrightHolder)};
+}
+
 // Rules that are not in the dialog come from the settings.
 SequentialRenameRules SequentialRenameDialog::ReadControls() const {
   SequentialRenameRules rules = SequentialRenameRulesFromSettings();
@@ -179,6 +223,11 @@ SequentialRenameRules SequentialRenameDialog::ReadControls() const {
 }
 
 void SequentialRenameDialog::StoreControls() const {
+  if (byPattern_->GetValue()) {
+    settings.RenamePrevious.AssignCut(Utf8(pattern_->GetValue()));
+    (void)SaveConfiguration();
+    return;
+  }
   const bool named = !flags_[kPrefix]->GetValue();  // otherwise the base name is not used
   if (named) settings.SequentialRenameBaseName.AssignCut(Utf8(base_->GetValue()));
   settings.SequentialRenameBaseNumber = number_->GetValue();
@@ -190,24 +239,54 @@ void SequentialRenameDialog::StoreControls() const {
   (void)SaveConfiguration();
 }
 
+// What is wrong with the input, a sentence; empty if nothing.
+wxString SequentialRenameDialog::Problem() const {
+  if (byPattern_->GetValue()) {
+    const std::string pattern = Utf8(pattern_->GetValue());
+    const RecordedText problem = PatternProblem(pattern);
+    return problem.empty() ? wxString() : Label("The pattern \"%1\" %2", pattern, problem.shown);
+  }
+  const std::string base = Utf8(base_->GetValue());
+  const bool plain = flags_[kPrefix]->GetValue() || (IsPlainName(base) && !base.empty());
+  return plain ? wxString() : Label("The base name must be part of a file name, not a path.");
+}
+
 // Shows the new names a run would give; renames nothing.
 void SequentialRenameDialog::UpdateControls() {
-  const std::string base = Utf8(base_->GetValue());
+  const bool byPattern = byPattern_->GetValue();
+  pattern_->Enable(byPattern);
   // with the number first, every file keeps its own name after it
-  base_->Enable(!flags_[kPrefix]->GetValue());
-  const bool plain = flags_[kPrefix]->GetValue() || (IsPlainName(base) && !base.empty());
-  ok_->Enable(plain);
-  if (!plain)
-    return problem_->SetLabel(Label("The base name must be part of a file name, not a path."));
-  PreviewBox box;
-  BatchJob job;
-  job.box = &box;
+  base_->Enable(!byPattern && !flags_[kPrefix]->GetValue());
+  for (wxCheckBox* flag : flags_) flag->Enable(!byPattern);
+  const wxString problem = Problem();
+  ok_->Enable(problem.empty());
+  problem_->SetLabel(problem);
+  work_.Stop();
+  if (!problem.empty()) return;
   const std::vector<BatchFile> files = BatchFiles(files_, kMostPreviewed);
-  RunRename(files, {.rules = ReadControls(), .seed = 1, .dryRun = true}, job);
+  if (!byPattern) {
+    PreviewBox box;
+    BatchJob job;
+    job.box = &box;
+    RunRename(files, {.rules = ReadControls(), .seed = 1, .dryRun = true}, job);
+    return ShowPreview(box.outcomes);
+  }
+  PatternRenameOptions options = ReadPattern();
+  options.dryRun = true;
+  work_.Start([this, files, options](const StopToken&, const LooseWork::Report& report) {
+    PreviewBox box;
+    BatchJob job;
+    job.box = &box;
+    RunPatternRename(files, options, job);
+    report([this, outcomes = std::move(box.outcomes)] { ShowPreview(outcomes); });
+  });
+}
+
+void SequentialRenameDialog::ShowPreview(const std::vector<FileOutcome>& outcomes) {
   preview_->Freeze();
   preview_->DeleteAllItems();
   size_t failed = 0;
-  for (const FileOutcome& outcome : box.outcomes) {
+  for (const FileOutcome& outcome : outcomes) {
     const long row =
         preview_->InsertItem(preview_->GetItemCount(), Shown(platform::FileNameOf(outcome.source)));
     const bool bad = outcome.status != Status::Ok || outcome.skipped;
@@ -220,19 +299,25 @@ void SequentialRenameDialog::UpdateControls() {
   problem_->SetLabel(failed == 0 ? wxString()
                                  : LabelCount("%1 of the files shown cannot be renamed.",
                                               "%1 of the files shown cannot be renamed.", failed));
+  LogEvent("rename-preview", std::to_string(outcomes.size()) + " failed=" + std::to_string(failed));
 }
 
-std::optional<SequentialRenameRules> SequentialRenameDialog::Ask() {
+std::optional<RenameChoice> SequentialRenameDialog::Ask() {
   if (ShowModal() != wxID_OK) return std::nullopt;
   StoreControls();
-  return ReadControls();
+  RenameChoice choice{.pattern = {}, .rules = ReadControls()};
+  if (byPattern_->GetValue()) choice.pattern = ReadPattern();
+  return choice;
 }
 
-// Adds the renames of the last run to the frame's undo list.
+// Adds the renames of the last run to the frame's undo list. Tabs with found files follow them.
 void NoteRenames(Shell& shell) {
   FileOperation operation{FileOperationKind::Rename, {}};
-  for (const RenamedFile& file : ReadRenameLog().value_or(RenameHistory()).files)
+  const bool follows = shell.Tabs().FoundPage() != nullptr;
+  for (const RenamedFile& file : ReadRenameLog().value_or(RenameHistory()).files) {
     operation.steps.push_back({file.from, file.to});
+    if (follows) shell.FollowRename(file.from, file.to);
+  }
   shell.Files().NoteDone(std::move(operation));
 }
 
@@ -243,15 +328,18 @@ void RenameSelectionSequentially(Shell& shell) {
   if (files.empty()) return;
   SequentialRenameDialog dialog(&shell.Window(), files);
   LogEvent("prompt", "sequential-rename");
-  const std::optional<SequentialRenameRules> rules = dialog.Ask();
-  if (!rules) return;
-  const RenameOptions options{.rules = *rules};
-  shell.Batches().Run(
-      NewBatchJob(), [batch = BatchFiles(files, files.size()), options, &shell](BatchJob& running) {
-        RunRename(batch, options, running);
-        shell.Window().CallAfter([&shell] { NoteRenames(shell); });
-        return Status::Ok;
-      });
+  const std::optional<RenameChoice> choice = dialog.Ask();
+  if (!choice) return;
+  shell.Batches().Run(NewBatchJob(),
+                      [batch = BatchFiles(files, files.size()), choice, &shell](BatchJob& running) {
+                        if (choice->pattern) {
+                          RunPatternRename(batch, *choice->pattern, running);
+                        } else {
+                          RunRename(batch, {.rules = choice->rules}, running);
+                        }
+                        shell.Window().CallAfter([&shell] { NoteRenames(shell); });
+                        return Status::Ok;
+                      });
 }
 
 }  // namespace fotomill::desktop

@@ -118,11 +118,32 @@ BrowserPage* BrowserTabs::Open(const std::string& folder) {
 
 BrowserPage* BrowserTabs::Show(const std::string& folder) {
   for (size_t tab = 0; tab < book_->GetPageCount(); ++tab) {
-    if (PageAt(tab)->Model().Folder() != folder) continue;
+    if (PageAt(tab)->Model().Folder() != folder || PageAt(tab)->ShowsFound()) continue;
     book_->SetSelection(tab);
     return PageAt(tab);
   }
   return Open(folder);
+}
+
+BrowserPage* BrowserTabs::FoundPage() const {
+  for (size_t tab = 0; tab < book_->GetPageCount(); ++tab) {
+    if (PageAt(tab)->ShowsFound()) return PageAt(tab);
+  }
+  return nullptr;
+}
+
+BrowserPage* BrowserTabs::ShowFound(const std::string& folder,
+                                    const std::vector<std::string>& names, const FolderView& view,
+                                    BrowserPage* page) {
+  const int tab = page == nullptr ? wxNOT_FOUND : book_->GetPageIndex(page);
+  if (tab == wxNOT_FOUND) {
+    page = new BrowserPage(book_, *this, shell_.Thumbnails(), view);
+    book_->AddPage(page, Label("Found"), true);
+  } else if (book_->GetSelection() != tab) {
+    book_->SetSelection(static_cast<size_t>(tab));
+  }
+  page->ShowFound(folder, names, view);
+  return page;
 }
 
 void BrowserTabs::Close() {
@@ -168,6 +189,7 @@ void BrowserTabs::Reload() {
 void BrowserTabs::FollowRename(const std::string& from, const std::string& to) {
   for (size_t tab = 0; tab < book_->GetPageCount(); ++tab) {
     const std::string& folder = PageAt(tab)->Model().Folder();
+    PageAt(tab)->FollowRename(from, to);
     if (LiesIn(folder, from)) PageAt(tab)->Open(RenamedPath(folder, from, to));
   }
 }
@@ -206,6 +228,11 @@ void BrowserTabs::Keep(Session& session) {
   }
   session.columns = DetailColumnsText(columns_);
   for (size_t tab = 0; tab < book_->GetPageCount(); ++tab) {
+    // found files are not kept, unless no other tab is open
+    if (PageAt(tab)->ShowsFound() && book_->GetPageCount() > 1) {
+      if (tab <= session.tab && session.tab > 0) --session.tab;
+      continue;
+    }
     const BrowserModel& model = PageAt(tab)->Model();
     const size_t focus = model.Selected().Focus();
     session.tabs.push_back({model.Folder(), model.View(), PageAt(tab)->Scroll(),
@@ -222,7 +249,9 @@ void BrowserTabs::BrowserChanged() {
   if (browser == nullptr) return;
   const std::string& folder = browser->Model().Folder();
   const size_t tab = static_cast<size_t>(book_->GetSelection());
-  if (book_->GetPageText(tab) != FolderLabel(folder)) book_->SetPageText(tab, FolderLabel(folder));
+  const wxString label =
+      browser->ShowsFound() ? Label("Found in %1", FolderLabel(folder)) : FolderLabel(folder);
+  if (book_->GetPageText(tab) != label) book_->SetPageText(tab, label);
   if (book_->GetPageToolTip(tab) != Shown(folder)) book_->SetPageToolTip(tab, Shown(folder));
   changed_();
   LogState();

@@ -48,6 +48,12 @@ class BrowserTabs : private BrowserHost {
   BrowserPage* Open(const std::string& folder);  // in a new tab, which becomes current
   // The tab with this folder, or a new one.
   BrowserPage* Show(const std::string& folder);
+  // Shows found files, by names relative to the folder, in `page`, or if it is null in a new tab.
+  // The tab becomes current.
+  BrowserPage* ShowFound(const std::string& folder, const std::vector<std::string>& names,
+                         const FolderView& view, BrowserPage* page);
+  // A tab with found files; null if there is none.
+  BrowserPage* FoundPage() const;
   // Closes the current tab, unless it is the last one.
   void Close();
   bool HasClosed() const { return !closed_.Empty(); }  // a tab can be reopened

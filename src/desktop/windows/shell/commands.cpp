@@ -13,6 +13,7 @@
 #include "desktop/windows/files/sequential_rename_dialog.h"
 #include "desktop/windows/metadata/exif_edit_frame.h"
 #include "desktop/windows/metadata/strip_dialog.h"
+#include "desktop/windows/search/search_window.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/folder_pane.h"
 #include "desktop/windows/shell/frame_session.h"
@@ -166,6 +167,7 @@ constexpr Command kCommands[] = {
     {kEdit, TrLater("Select by p&attern..."), "Ctrl+S",     TrLater("Selects files by part of their name or by a pattern."), Needs::Nothing, SelectByPattern},
     {kEdit, TrLater("Select same t&ype"),   "",             TrLater("Selects all files of the focused file's type."), Needs::Item, SelectSameType},
     {kEdit, nullptr},
+    {kEdit, TrLater("Find pictur&es..."),   "Ctrl+Shift+F", TrLater("Finds pictures in folders by name, keywords, date and more."), Needs::Nothing, ShowSearch},
     {kEdit, TrLater("&Filter"),             "Ctrl+F",       TrLater("Shows only files whose names match."), Needs::Nothing, OfBrowser<&BrowserPage::EditFilter>},
 
     {kView, TrLater("&List"),               "Ctrl+1",       TrLater("Shows names only."), Needs::Nothing, ShowAs<choice::kViewList>, nullptr, false, Has<&BrowserModes::view, choice::kViewList>},
