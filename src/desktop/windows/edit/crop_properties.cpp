@@ -113,7 +113,7 @@ wxSizer* CropProperties::NewNumbers(wxWindow* panel) {
   for (int i = 0; i < 4; ++i) {
     grid->Add(new wxStaticText(panel, wxID_ANY, Label(kNames[i])), wxSizerFlags().CenterVertical());
     numbers_[i] = new wxSpinCtrl(panel, wxID_ANY, "", wxDefaultPosition,
-                                 wxSize(TextWidth(*this, FromDIP(124)), -1), wxSP_ARROW_KEYS,
+                                 wxSize(TextWidth(*this, FromDIP(150)), -1), wxSP_ARROW_KEYS,
                                  i < 2 ? 0 : 1, kMostPixels);
     numbers_[i]->SetName(wxControl::RemoveMnemonics(Label(kNames[i])).BeforeLast(':'));
     numbers_[i]->Bind(wxEVT_SPINCTRL, [this](wxSpinEvent&) { NumbersEntered(); });
@@ -132,7 +132,7 @@ wxSizer* CropProperties::NewAngleRow(wxWindow* panel) {
   row->Add(new wxStaticText(panel, wxID_ANY, Label("&Angle:")),
            wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(8)));
   angle_ = new wxSpinCtrlDouble(panel, wxID_ANY, "0", wxDefaultPosition,
-                                wxSize(TextWidth(*this, FromDIP(124)), -1), wxSP_ARROW_KEYS, -45,
+                                wxSize(TextWidth(*this, FromDIP(150)), -1), wxSP_ARROW_KEYS, -45,
                                 45, 0, 0.1);
   angle_->SetDigits(2);
   angle_->SetName(Label("Angle"));

@@ -121,7 +121,7 @@ wxSizer* ParameterPanel::NewNumber(const Parameter& parameter, Row& row) {
     line->Add(slider, wxSizerFlags(1).CenterVertical());
   }
   auto* field = new wxSpinCtrlDouble(this, wxID_ANY, "", wxDefaultPosition,
-                                     wxSize(TextWidth(*this, FromDIP(124)), -1), wxSP_ARROW_KEYS);
+                                     wxSize(TextWidth(*this, FromDIP(140)), -1), wxSP_ARROW_KEYS);
   field->SetRange(parameter.least, parameter.most);
   field->SetDigits(static_cast<unsigned>(DigitsOf(parameter)));
   field->SetIncrement(StepOf(parameter));
