@@ -147,6 +147,29 @@ def test_metadata(folder):
               (height, width))
 
 
+def test_transcoding(folder):
+    """JPEG files come back byte for byte, from our command and from the library's tool."""
+    if "jxl" not in EXTENSIONS:
+        return
+    jpeg, stored, again = folder / "a.jpg", folder / "a.jxl", folder / "again.jpg"
+    fotomill("convert", PROJECT / "samples/bmp-true-color.bmp", "--to", "jpg", "--out", jpeg)
+    check("transcode", fotomill("transcode", jpeg, "--to", "jxl").returncode == 0)
+    run("djxl", stored, again)
+    check("djxl restores another file", again.read_bytes() == jpeg.read_bytes())
+    before = stored.read_bytes()
+    result = fotomill("transcode", jpeg, "--to", "jxl")
+    check("an existing file is kept", result.returncode == 1 and b"--replace" in result.stderr and
+          stored.read_bytes() == before)
+    (folder / "back").mkdir()
+    fotomill("transcode", stored, "--to", "jpg", "--dest", folder / "back")
+    check("restored", (folder / "back/a.jpg").read_bytes() == jpeg.read_bytes())
+    fotomill("convert", jpeg, "--to", "jxl", "--out", folder / "pixels.jxl")
+    for path, to in [(folder / "pixels.jxl", "jpg"), (PROJECT / "samples/bmp-mono.bmp", "jxl")]:
+        result = fotomill("transcode", path, "--to", to, "--dest", folder / "none")
+        check(f"{path.name}: {result.stderr}", result.returncode == 1 and
+              not list((folder / "none").iterdir()))
+
+
 def test_corpus(folder):
     unlike = {"hdr_pq_test.jxl", "pq_gradient.jxl"}  # the tool keeps the range of HDR pictures
     for name in ("avif", "heic", "jxl", "jp2", "svg"):
@@ -175,7 +198,7 @@ def test_raw(folder):
             file.unlink(missing_ok=True)
 
 
-for test in [test_writing, test_reading, test_metadata] + (
+for test in [test_writing, test_reading, test_metadata, test_transcoding] + (
         [test_corpus, test_raw] if CORPUS else []):
     with tempfile.TemporaryDirectory() as place:
         test(Path(place))

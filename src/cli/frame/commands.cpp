@@ -25,6 +25,7 @@
 #include "cli/commands/tdb.h"
 #include "cli/commands/thumbs.h"
 #include "cli/commands/touch.h"
+#include "cli/commands/transcode.h"
 #include "cli/commands/turn.h"
 #include "cli/commands/verify.h"
 #include "cli/completion/completion.h"
@@ -57,6 +58,7 @@ constexpr Command kCommands[] = {
     {"gallery theme", TrLater("write the files of the built-in gallery theme"),         Needs::Nothing,  SetUpGalleryTheme},
     {"touch",   TrLater("set the times of files, such as when they were taken"),        Needs::Formats,  SetUpTouch},
     {"turn",    TrLater("rotate or flip pictures, JPEG losslessly"),                    Needs::Formats,  SetUpTurn},
+    {"transcode", TrLater("store JPEG files in JPEG XL and back, without loss"),        Needs::Formats,  SetUpTranscode},
     {"tag",     TrLater("set keywords, ratings, labels and comments"),                   Needs::Formats,  SetUpTag},
     {"info",    TrLater("show size, depth and other facts without decoding pictures"),  Needs::Formats,  SetUpInfo},
     {"formats", TrLater("list the formats and what this build can do with them"),       Needs::Formats,  SetUpFormats},
