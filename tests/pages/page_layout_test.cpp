@@ -191,6 +191,8 @@ TEST(PhotoPages, PrintsMeasureWhatTheySay) {
       const Box seen = BoundsOf(picture->clip);
       const double across = std::hypot(picture->across.x, picture->across.y),
                    down = std::hypot(picture->down.x, picture->down.y);
+      // turned, but never mirrored
+      EXPECT_GT(picture->across.x * picture->down.y - picture->across.y * picture->down.x, 0);
       const bool wide = picture->picture == 0;
       EXPECT_NEAR(across / down, wide ? 4.0 / 3 : 0.75, kClose);
       if (std::abs(std::max(seen.width, seen.height) - 150) < kClose) {

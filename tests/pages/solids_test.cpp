@@ -161,12 +161,16 @@ TEST(CutoutPages, FacesAreExactAndFit) {
   CutoutOptions options{.edge = 30, .note = "glue"};
   const std::vector<Page> pages = CutoutPages(options, nets, pictures);
   ASSERT_EQ(pages.size(), 2u);
-  for (const Page& page : pages) {
+  for (size_t half = 0; half < 2; ++half) {
+    const Page& page = pages[half];
     size_t faces = 0;
     for (const PageItem& item : page.items) {
       std::vector<Point> corners;
       if (const auto* const picture = std::get_if<PictureItem>(&item)) {
-        ++faces;
+        const Point up = nets[half].faces[faces++].up;
+        EXPECT_LT(picture->down.x * up.x + picture->down.y * up.y, 0);
+        EXPECT_NEAR(picture->across.x * up.x + picture->across.y * up.y, 0, kClose);
+        EXPECT_GT(picture->across.x * picture->down.y - picture->across.y * picture->down.x, 0);
         corners = picture->clip;
         for (size_t i = 0; i < 5; ++i) {
           const Point edge = corners[(i + 1) % 5] - corners[i];
