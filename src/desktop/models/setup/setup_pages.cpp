@@ -201,6 +201,7 @@ constexpr SetupItem kItems[] = {
     Item(Archives,   TrLater("Extracting"),         ArchivePreservePaths,           "Keep the folders of the archive"),
     Item(Archives,   TrLater("Extracting"),         ArchivePreserveTimestamps,      "Keep file times"),
     Item(Archives,   TrLater("Extracting"),         ArchivePromptOverwrite,         "Ask before a file is replaced"),
+    Item(Archives,   TrLater("Extracting"),         ArchiveExtractPath,             "Folder; empty: the folder of the archive"),
     Item(Archives,   TrLater("Extracting"),         ArchiveHistoryMax,              "Folders to remember"),
     Item(Archives,   TrLater("Creating archives"),  ArchiveAddThumbnails,           "Include thumbnail files"),
     Item(Archives,   TrLater("Creating archives"),  ArchiveMaskPassword,            "Hide passwords while typing"),
