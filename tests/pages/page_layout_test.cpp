@@ -191,6 +191,9 @@ TEST(PhotoPages, PrintsMeasureWhatTheySay) {
       const Box seen = BoundsOf(picture->clip);
       const double across = std::hypot(picture->across.x, picture->across.y),
                    down = std::hypot(picture->down.x, picture->down.y);
+      const Box whole = PlaceOf(*picture);
+      EXPECT_TRUE(whole.x < seen.x + kClose && whole.Right() > seen.Right() - kClose);
+      EXPECT_TRUE(whole.y < seen.y + kClose && whole.Bottom() > seen.Bottom() - kClose);
       // turned, but never mirrored
       EXPECT_GT(picture->across.x * picture->down.y - picture->across.y * picture->down.x, 0);
       const bool wide = picture->picture == 0;
