@@ -230,6 +230,7 @@ def search_results_in_a_tab(folder):
     """Found files of several folders in one tab, on which functions work."""
     pictures = folder / "pictures"
     make_pictures(pictures, ["tree.bmp", "sea1.bmp"])
+    (pictures / "deep").mkdir()
     make_pictures(pictures / "deep/er", ["sea2.bmp", "hill.bmp"])
     with Desktop(folder, pictures, settings=["UpdateThumbnailsFlag=0"]) as desktop:
         desktop.wait(r"lines=3 .*missing=0 listing=0")
@@ -251,7 +252,7 @@ def search_results_in_a_tab(folder):
         desktop.type("ocean")
         desktop.key("Return")
         desktop.wait(r"files Rename done=1 failed=0")
-        desktop.wait(r"tabs=2 lines=2 .*listing=0 .*focus=deep/er/ocean.bmp")
+        desktop.wait(r"tabs=2 lines=2 .*selected=1 .*listing=0 .*focus=deep/er/ocean.bmp")
         assert (pictures / "deep/er/ocean.bmp").exists()
         desktop.key("ctrl+a", "Delete")
         desktop.wait(r"files Deletion of 2 files done=2")

@@ -385,6 +385,12 @@ void BrowserPage::FocusName(const std::string& name) {
 }
 
 void BrowserPage::SelectWhenListed(std::vector<std::string> names) {
+  if (found_) {
+    std::erase_if(names, [this](const std::string& name) {
+      return std::ranges::find(*found_, name) == found_->end();
+    });
+    if (names.empty()) return;
+  }
   wantedNames_ = std::move(names);
   model_.SelectNames({});
   SelectionChanged();

@@ -96,8 +96,9 @@ void BrowserTabs::SelectWhenListed(const std::vector<std::string>& files) {
     const std::string folder = platform::JoinFolder(PageAt(tab)->Model().Folder(), "");
     std::vector<std::string> names;
     for (const std::string& file : files) {
-      if (platform::SplitPath(file).folder == folder)
-        names.emplace_back(platform::FileNameOf(file));
+      const bool shown = PageAt(tab)->ShowsFound() ? file.starts_with(folder)
+                                                   : platform::SplitPath(file).folder == folder;
+      if (shown) names.push_back(file.substr(folder.size()));
     }
     if (!names.empty()) PageAt(tab)->SelectWhenListed(std::move(names));
   }
