@@ -8,6 +8,7 @@
 #include <wx/textdlg.h>
 
 #include <algorithm>
+#include <unordered_set>
 #include <utility>
 
 #include "core/choice_lists.h"
@@ -386,9 +387,8 @@ void BrowserPage::FocusName(const std::string& name) {
 
 void BrowserPage::SelectWhenListed(std::vector<std::string> names) {
   if (found_) {
-    std::erase_if(names, [this](const std::string& name) {
-      return std::ranges::find(*found_, name) == found_->end();
-    });
+    const std::unordered_set<std::string> found(found_->begin(), found_->end());
+    std::erase_if(names, [&found](const std::string& name) { return !found.contains(name); });
     if (names.empty()) return;
   }
   wantedNames_ = std::move(names);
