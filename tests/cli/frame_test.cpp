@@ -65,7 +65,7 @@ TEST(Frame, ExitStatusesAndMessages) {
       {"licenses without version", {"--licenses"}, 2, "", "Unknown option \"--licenses\"."},
       {"help lists topics", {"help"}, 0, "\n  exit-status ", ""},
       {"topic of exit statuses", {"help", "exit-status"}, 0, "\n  130, 143  Stopped by SIGINT or SIGTERM.\n", ""},
-      {"topic of JSON", {"help", "json"}, 0, "\n  thumbs list      Print a JSON array of {file, thumbnail, status}\n", ""},
+      {"topic of JSON", {"help", "json"}, 0, "  Print a JSON array of {file, thumbnail, status}\n", ""},
       {"topic of recipes", {"help", "recipes"}, 0, "\n  annotate   caption, text\n", ""},
       {"topic of names", {"help", "names"}, 0, "\n  %E{Tag}  text of an EXIF tag", ""},
       {"topic that is not", {"help", "exit-statu"}, 2, "", "Did you mean \"exit-status\"?"},

@@ -49,7 +49,7 @@ COMMANDS = [
     ("config describe UndoLevels", 0, {"name": "UndoLevels", "used": True}),
     ("config path", 0, {"exists": False}),
     ("formats", 0, {"index": 0}),
-    ("plugins", 0, {"textA": "Portable anymap"}),
+    ("plugins", 0, {"canRead": True}),
     ("operations", 0, {}),
     ("match x.bmp", 0, {"index": 2}),
     ("rename a.bmp -n", 0, {}),

@@ -26,16 +26,16 @@ def left_out():
     with Place() as place:
         place.files("f/a.bmp", "f/.h.bmp", "f/._a.bmp", "f/.cache/x.bmp", "f/sub/c.bmp",
                     "f/sub/.d.bmp")
-        place.files("f/1.mov", "f/2.MOV", "f/sub/3.mov", "f/b.heic", "f/README", "f/.DS_Store",
+        place.files("f/1.mov", "f/2.MOV", "f/sub/3.mov", "f/b.mp4", "f/README", "f/.DS_Store",
                     "f/a.THN", "f/Fotomill.tdb",
                     contents=b"?")
         rows = [
             (["f"], ["f/a.bmp"],
-             "6 other files were left out: 2 .mov, 1 without extension, 1 .heic, 2 hidden"),
+             "6 other files were left out: 2 .mov, 1 without extension, 1 .mp4, 2 hidden"),
             (["f", "-r"], ["f/a.bmp", "f/sub/c.bmp"],
-             "8 other files were left out: 3 .mov, 1 without extension, 1 .heic, 3 hidden"),
+             "8 other files were left out: 3 .mov, 1 without extension, 1 .mp4, 3 hidden"),
             (["f", "--hidden"], ["f/._a.bmp", "f/.h.bmp", "f/a.bmp"],
-             "5 other files were left out: 2 .mov, 1 without extension, 1 .ds_store, 1 .heic"),
+             "5 other files were left out: 2 .mov, 1 without extension, 1 .ds_store, 1 .mp4"),
             (["f", "--hidden", "-r"],
              ["f/._a.bmp", "f/.cache/x.bmp", "f/.h.bmp", "f/a.bmp", "f/sub/.d.bmp", "f/sub/c.bmp"],
              None),

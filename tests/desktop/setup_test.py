@@ -132,4 +132,27 @@ def previous_version(folder):
         desktop.wait_end()
 
 
-run(setup_round_trip, info_exif_history, previous_version)
+def plugin_options(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp"])
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"browser .*lines=1 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+k")
+        desktop.wait(r"finder found=")
+        desktop.focus("Find command")
+        desktop.type("tools plug")
+        desktop.wait(r"finder found=1$")
+        desktop.key("Return")
+        desktop.focus("^Plug-ins$")
+        desktop.wait(r"plugins lines=")
+        desktop.key("Home", "Return")
+        desktop.focus("^Options of AVIF$")
+        desktop.screenshot("plugin-options")
+        desktop.key("Up", "Return")
+        desktop.wait(r"plugins FMWPL_avif\.so options")
+        text = (desktop.data / "Fotomill Professional 11.ini").read_text()
+        assert "[Plugins]\nFMWPL_avif.so." in text, text
+
+
+run(setup_round_trip, info_exif_history, previous_version, plugin_options)

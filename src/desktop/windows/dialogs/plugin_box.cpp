@@ -6,7 +6,10 @@
 #include <wx/sizer.h>
 #include <wx/stattext.h>
 
+#include <algorithm>
+
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/dialogs/module_options_box.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
@@ -25,13 +28,28 @@ namespace {
 
 constexpr const char* kTitle = TrLater("Plug-ins");
 
+// "libavif 0.11.1 (BSD-2-Clause), ..." from lines of name, version and license.
+std::string LibrariesText(std::string_view lines) {
+  std::string text;
+  while (!lines.empty()) {
+    std::string line(lines.substr(0, lines.find('\n')));
+    lines.remove_prefix(std::min(line.size() + 1, lines.size()));
+    const size_t first = line.find('\t'), second = line.rfind('\t');
+    if (first == std::string::npos || first == second) continue;
+    if (!text.empty()) text += ", ";
+    text.append(line, 0, first).append(" ").append(line, first + 1, second - first - 1);
+    text.append(" (").append(line, second + 1).append(")");
+  }
+  return text;
+}
+
 }  // namespace
 
 PluginBox::PluginBox(wxWindow* parent)
     : wxDialog(parent, wxID_ANY, Label(kTitle), wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "PluginBox") {
   const int gap = FromDIP(10);
-  list_ = new wxDataViewListCtrl(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(820, 220)),
+  list_ = new wxDataViewListCtrl(this, wxID_ANY, wxDefaultPosition, FromDIP(wxSize(940, 300)),
                                  wxDV_SINGLE | wxDV_ROW_LINES);
   list_->SetName(Label(kTitle));
   list_->AppendToggleColumn(Label("On"), wxDATAVIEW_CELL_ACTIVATABLE, FromDIP(50), wxALIGN_CENTER);
@@ -43,6 +61,8 @@ PluginBox::PluginBox(wxWindow* parent)
                                {TrLater("Plug-in"), 140},
                                {TrLater("Formats"), 200},
                                {TrLater("Supports"), 150},
+                               {TrLater("Version"), 60},
+                               {TrLater("Libraries and licenses"), 260},
                                {TrLater("Module"), 150}}) {
     list_->AppendTextColumn(Label(column.title), wxDATAVIEW_CELL_INERT,
                             TextWidth(*this, column.width));
@@ -70,8 +90,9 @@ PluginBox::PluginBox(wxWindow* parent)
   list_->Bind(wxEVT_DATAVIEW_ITEM_VALUE_CHANGED,
               [this](wxDataViewEvent& event) { Turn(list_->ItemToRow(event.GetItem())); });
   list_->Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
-    const int line = list_->GetSelectedRow();
-    if (event.GetKeyCode() != WXK_SPACE || line == wxNOT_FOUND) return event.Skip();
+    const int line = list_->GetSelectedRow(), key = event.GetKeyCode();
+    if (key == WXK_RETURN || key == WXK_NUMPAD_ENTER) return Configure();  // GTK would toggle
+    if (key != WXK_SPACE || line == wxNOT_FOUND) return event.Skip();
     list_->SetToggleValue(!list_->GetToggleValue(static_cast<unsigned>(line), 0),
                           static_cast<unsigned>(line), 0);
     Turn(line);
@@ -90,7 +111,10 @@ void PluginBox::FillList() {
     if (lines_[line].row >= 0 && lines_[line].row == settings.PluginConfigIndex)
       selected = static_cast<int>(line);
   }
-  if (selected != wxNOT_FOUND) list_->SetCurrentItem(list_->RowToItem(selected));
+  if (selected != wxNOT_FOUND) {
+    list_->SetCurrentItem(list_->RowToItem(selected));
+    list_->EnsureVisible(list_->RowToItem(selected));
+  }
   FindWindow(wxID_PREFERENCES)->Enable(PluginFormatCount() > 0);
   FindWindow(wxID_HELP)->Enable(PluginFormatCount() > 0);
   LogEvent("plugins", "lines=" + std::to_string(lines_.size()) +
@@ -100,11 +124,12 @@ void PluginBox::FillList() {
 // One line per format of a module; one for a module that is not loaded.
 void PluginBox::AddModule(const PluginModule& module) {
   const auto add = [&](int32_t row, std::string_view extension, std::string_view plugin,
-                       std::string_view formats, std::string_view can) {
+                       std::string_view formats, std::string_view can, std::string_view version,
+                       std::string_view libraries) {
     wxVector<wxVariant> cells;
     cells.push_back(module.on);
     for (const std::string_view cell :
-         {extension, plugin, formats, can, std::string_view(module.name)})
+         {extension, plugin, formats, can, version, libraries, std::string_view(module.name)})
       cells.push_back(Shown(cell));
     list_->AppendItem(cells);
     lines_.push_back({module.name, row});
@@ -114,11 +139,13 @@ void PluginBox::AddModule(const PluginModule& module) {
     const PluginEntry& entry = PluginRow(row);
     if (entry.path.view() != platform::JoinFolder(module.folder, module.name)) continue;
     std::string can = PluginFacts(row).writes ? Tr("read and write") : Tr("read");
-    if (PluginFacts(row).hasDialog) can.append(", ").append(Tr("settings"));
-    add(row, entry.extension, entry.textA, entry.textB, can);
+    const ModuleFacts& facts = PluginFacts(row);
+    if (facts.hasDialog || !facts.options.empty()) can.append(", ").append(Tr("settings"));
+    add(row, entry.extension, entry.textA, entry.textB, can, facts.version,
+        LibrariesText(facts.libraries));
     loaded = true;
   }
-  if (!loaded) add(-1, {}, {}, {}, module.on ? Tr("not usable here") : Tr("disabled"));
+  if (!loaded) add(-1, {}, {}, {}, module.on ? Tr("not usable here") : Tr("disabled"), {}, {});
 }
 
 void PluginBox::Turn(int line) {
@@ -141,8 +168,21 @@ void PluginBox::Configure() {
   const int line = list_->GetSelectedRow();
   if (line == wxNOT_FOUND) return;
   const int32_t row = lines_[static_cast<size_t>(line)].row;
+  if (row >= 0 && !PluginFacts(row).options.empty())
+    return ChangeOptions(lines_[static_cast<size_t>(line)].module, row);
   if (row < 0 || !ConfigurePluginRow(row))
     wxMessageBox(Label(kNothingToConfigure.data()), Label(kTitle), wxOK | wxICON_INFORMATION, this);
+}
+
+void PluginBox::ChangeOptions(const std::string& module, int32_t row) {
+  settings.PluginConfigIndex = row;
+  const ModuleFacts& facts = PluginFacts(row);
+  ModuleOptionsBox box(this, facts, OptionValuesOf(module, facts));
+  if (box.ShowModal() != wxID_OK) return;
+  const std::string_view problem =
+      SaveMessage(StorePluginOptions(module, facts.options, box.Values()));
+  if (!problem.empty()) wxMessageBox(Shown(problem), Label(kTitle), wxOK | wxICON_WARNING, this);
+  LogEvent("plugins", module + " options");
 }
 
 void PluginBox::OpenHelp() {

@@ -23,6 +23,7 @@ class PluginBox : public wxDialog {
   void AddModule(const PluginModule& module);
   void Turn(int line);
   void Configure();
+  void ChangeOptions(const std::string& module, int32_t row);
   void OpenHelp();
 
   wxDataViewListCtrl* list_ = nullptr;
