@@ -69,8 +69,75 @@ def patterns():
         check(place.names("f"), ["2.bmp", "same.bmp", "x.bmp"], "nothing was renamed")
 
 
+OF_NEF = """<x:xmpmeta xmlns:x="adobe:ns:meta/">
+ <rdf:RDF xmlns:rdf="http://www.w3.org/1999/02/22-rdf-syntax-ns#">
+  <rdf:Description rdf:about="" xmlns:photoshop="http://ns.adobe.com/photoshop/1.0/"
+    photoshop:SidecarForExtension="NEF"/>
+ </rdf:RDF>
+</x:xmpmeta>"""
+
+# Files with their contents, the arguments, new names with contents.
+SIDECARS = [
+    ("goes along", {"a.bmp": "a", "a.bmp.xmp": "A"}, ["a.bmp", "--pattern", "b"],
+     {"b.bmp": "a", "b.bmp.xmp": "A"}),
+    ("in sequence", {"a.bmp": "a", "a.xmp": "A"}, ["a.bmp", "--base", "b", "--digits", "1"],
+     {"b1.bmp": "a", "b1.xmp": "A"}),
+    ("both kinds", {"a.nef": "a", "a.xmp": "A", "a.nef.xmp": "B"}, ["a.nef", "--pattern", "b"],
+     {"b.nef": "a", "b.xmp": "A", "b.nef.xmp": "B"}),
+    ("exchanged", {"1.bmp": "1", "1.bmp.xmp": "A", "2.bmp": "2", "2.bmp.xmp": "B"},
+     ["1.bmp", "2.bmp", "--pattern", "%c", "--reverse"],
+     {"1.bmp": "2", "1.bmp.xmp": "B", "2.bmp": "1", "2.bmp.xmp": "A"}),
+    ("in a chain", {"1.bmp": "1", "1.bmp.xmp": "A", "2.bmp": "2", "2.bmp.xmp": "B"},
+     ["1.bmp", "2.bmp", "--pattern", "%c", "--start", "2"],
+     {"2.bmp": "1", "2.bmp.xmp": "A", "3.bmp": "2", "3.bmp.xmp": "B"}),
+    ("listed too", {"a.bmp": "a", "a.bmp.xmp": "A", "b.bmp": "b"},
+     ["a.bmp.xmp", "a.bmp", "b.bmp", "--pattern", "%c"],
+     {"1.bmp": "a", "1.bmp.xmp": "A", "2.bmp": "b"}),
+    ("listed too, the other kind", {"a.nef": "a", "a.xmp": "A"},
+     ["a.nef", "a.xmp", "--pattern", "b"], {"b.nef": "a", "b.xmp": "A"}),
+    ("shared with another", {"a.nef": "a", "a.jpg": "j", "a.xmp": "A"}, ["a.jpg", "--pattern", "b"],
+     {"a.nef": "a", "b.jpg": "j", "a.xmp": "A"}),
+    ("shared, both renamed", {"a.nef": "a", "a.jpg": "j", "a.xmp": "A"},
+     ["a.jpg", "a.nef", "--pattern", "b"], {"b.nef": "a", "b.jpg": "j", "b.xmp": "A"}),
+    ("named as its own", {"a.nef": "a", "a.jpg": "j", "a.xmp": OF_NEF},
+     ["a.nef", "--pattern", "b"], {"b.nef": "a", "a.jpg": "j", "b.xmp": OF_NEF}),
+    ("of the other", {"a.nef": "a", "a.jpg": "j", "a.xmp": OF_NEF},
+     ["a.jpg", "--pattern", "b"], {"a.nef": "a", "b.jpg": "j", "a.xmp": OF_NEF}),
+]
+
+
+def sidecars():
+    """Sidecars go along, and come back with undo."""
+    def contents(place):
+        return {path.name: path.read_text() for path in (place.path / "f").iterdir()}
+
+    for what, files, options, after in SIDECARS:
+        with Place() as place:
+            for name, text in files.items():
+                place.files(f"f/{name}", contents=text.encode())
+            listed = [f"f/{option}" if option in files else option for option in options]
+            _, dry, _ = place.run("rename", *listed, "--dry-run")
+            check(contents(place), files, f"{what}: dry run")
+            status, out, err = place.run("rename", *listed)
+            check((status, out, contents(place)), (0, dry, after), f"{what}: names {err}")
+            check(place.run("rename", "--undo")[0], 0, f"{what}: undo")
+            check(contents(place), files, f"{what}: names again")
+    files = {"a.bmp": "a", "a.bmp.xmp": "A", "b.bmp.xmp": "B", "c2.bmp.xmp": "C"}
+    with Place() as place:
+        for name, text in files.items():
+            place.files(f"f/{name}", contents=text.encode())
+        for dry in (["--dry-run"], []):
+            status, _, err = place.run("rename", "f/a.bmp", "--pattern", "b", *dry)
+            check((status, '"b.bmp.xmp" exists' in err), (1, True), f"taken by another's: {err}")
+        check(contents(place), files, "no sidecar is replaced")
+        place.run("rename", "f/a.bmp", "--base", "c", "--start", "2", "--digits", "1")
+        check(contents(place), {"b.bmp.xmp": "B", "c2.bmp.xmp": "C", "c3.bmp": "a",
+                                "c3.bmp.xmp": "A"}, "the next number is free")
+
+
 def main():
     patterns()
+    sidecars()
     for options, names, number in ROWS:
         with Place() as place:
             place.files("f/a.bmp", "f/b.bmp", "f/c.bmp")

@@ -77,6 +77,7 @@ class PatternRename {
 
   void TakeSources() {
     std::set<std::string> seen;
+    const std::set<std::string> sidecars = SidecarsOfListed(files_);
     for (size_t i = 0; i < files_.size(); ++i) {
       Candidate& candidate = candidates_[i];
       candidate.from = platform::AbsolutePath(files_[i].name);
@@ -90,6 +91,9 @@ class PatternRename {
       } else if (!seen.insert(candidate.from).second) {
         candidate.outcome.skipped = true;
         candidate.outcome.hint = Tr("skipped: it is listed twice.");
+      } else if (sidecars.contains(candidate.from)) {
+        candidate.outcome.skipped = true;
+        candidate.outcome.hint = Tr(kRenamedWithPicture);
       }
     }
   }
@@ -187,10 +191,11 @@ class PatternRename {
         outcome = {};  // not reported
       } else if (attempts[i].done) {
         if (!attempts[i].noted) outcome.note = TrRecorded(kRenameNotNoted);
-      } else if (WentWithPicture(owners[i]->from, job_.changes)) {
+      } else if (WentWithPicture(owners[i]->from, job_.changes) ||
+                 renamed.WentAlong(owners[i]->from)) {
         outcome.skipped = true;
         outcome.destination = outcome.source;
-        outcome.hint = Tr("skipped: it was renamed with its picture.");
+        outcome.hint = Tr(kRenamedWithPicture);
       } else {
         Refuse(*owners[i], attempts[i].reason);
       }

@@ -2,6 +2,8 @@
 
 #include "files/numbered_name.h"
 #include "files/rename_plan.h"
+#include "files/sidecar_moves.h"
+#include "metadata/tags/sidecar.h"
 #include "platform/clock.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -41,7 +43,7 @@ RenameAttempt CarryOutGroup(const RenameGroup& group, RenamedFiles& files, Batch
   for (const RenameStep& step : group) {
     const platform::CommitResult result = files.Rename(step.from, step.to);
     if (result == platform::CommitResult::Taken) {
-      attempt.reason = Tr("\"%1\" exists.", platform::FileNameOf(step.to));
+      attempt.reason = Tr("\"%1\" exists.", platform::FileNameOf(files.RefusedName()));
     } else if (result == platform::CommitResult::Failed) {
       attempt.reason = ReasonSentence();
     }
@@ -67,21 +69,77 @@ bool RenamedFiles::Exists(const std::string& path) const {
 }
 
 platform::CommitResult RenamedFiles::Rename(const std::string& from, const std::string& to) {
+  const std::vector<RenamedFile> sidecars = SidecarMoves(from, to);
+  for (const RenamedFile& sidecar : sidecars) {
+    // nor is a sidecar given to another picture
+    if (Exists(sidecar.to)) return Refused(sidecar.to, platform::CommitResult::Taken);
+  }
   if (!dryRun_) {
     noted_ =
         log_ == nullptr || log_->Intend({platform::AbsolutePath(from), platform::AbsolutePath(to)});
-    const platform::CommitResult result =
-        platform::RenameFile(from, to, platform::Existing::Refuse);
-    if (log_ != nullptr) log_->Settle(result == platform::CommitResult::Done);
-    return result;
   }
-  if (Exists(to)) return platform::CommitResult::Taken;
-  if (!platform::MayCreate(to)) return platform::CommitResult::Failed;
-  there_.erase(from);
-  gone_.insert(from);
-  gone_.erase(to);
-  there_.insert(to);
+  const platform::CommitResult result =
+      dryRun_ ? Pretend(from, to, sidecars) : RenameTogether(from, to, sidecars);
+  const bool done = result == platform::CommitResult::Done;
+  if (!dryRun_ && log_ != nullptr) log_->Settle(done);
+  for (const RenamedFile& sidecar : sidecars) {
+    if (done) sidecars_.insert(platform::AbsolutePath(sidecar.from));
+  }
+  return result;
+}
+
+platform::CommitResult RenamedFiles::Refused(const std::string& name,
+                                             platform::CommitResult result) {
+  refused_ = name;
+  return result;
+}
+
+// The picture first: if the program is ended before the sidecars follow, undo restores the pair.
+platform::CommitResult RenamedFiles::RenameTogether(const std::string& from, const std::string& to,
+                                                    std::span<const RenamedFile> sidecars) {
+  constexpr auto kRefuse = platform::Existing::Refuse;
+  constexpr auto kDone = platform::CommitResult::Done;
+  platform::CommitResult result = platform::RenameFile(from, to, kRefuse);
+  if (result != kDone) return Refused(to, result);
+  size_t done = 0;
+  while (done < sidecars.size() && result == kDone) {
+    result = platform::RenameFile(sidecars[done].from, sidecars[done].to, kRefuse);
+    if (result == kDone) ++done;
+  }
+  if (result == kDone) return result;
+  Refused(sidecars[done].to, result);
+  while (done > 0) {
+    --done;
+    (void)platform::RenameFile(sidecars[done].to, sidecars[done].from, kRefuse);
+  }
+  (void)platform::RenameFile(to, from, kRefuse);
+  return result;
+}
+
+platform::CommitResult RenamedFiles::Pretend(const std::string& from, const std::string& to,
+                                             std::span<const RenamedFile> sidecars) {
+  if (Exists(to)) return Refused(to, platform::CommitResult::Taken);
+  if (!platform::MayCreate(to)) return Refused(to, platform::CommitResult::Failed);
+  const auto move = [this](const std::string& old, const std::string& now) {
+    there_.erase(old);
+    gone_.insert(old);
+    gone_.erase(now);
+    there_.insert(now);
+  };
+  move(from, to);
+  for (const RenamedFile& sidecar : sidecars) move(sidecar.from, sidecar.to);
   return platform::CommitResult::Done;
+}
+
+bool RenamedFiles::WentAlong(const std::string& path) const {
+  return sidecars_.contains(path) && !Exists(path);
+}
+
+std::set<std::string> SidecarsOfListed(std::span<const BatchFile> files) {
+  std::set<std::string> sidecars;
+  for (const BatchFile& file : files)
+    sidecars.insert(SidecarNames(platform::AbsolutePath(file.name)).front());
+  return sidecars;
 }
 
 void NoteRename(const std::string& from, const std::string& to, bool dryRun, BatchJob& job) {

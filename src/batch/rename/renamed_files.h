@@ -5,6 +5,7 @@
 #include <string>
 #include <vector>
 
+#include "batch/batch_file.h"
 #include "batch/job.h"
 #include "files/rename_log.h"
 #include "platform/output_file.h"
@@ -19,21 +20,41 @@ class RenamedFiles {
   explicit RenamedFiles(bool dryRun, RenameLog* log = nullptr) : dryRun_(dryRun), log_(log) {}
   // Whether a path exists, or would exist by now in a dry run.
   bool Exists(const std::string& path) const;
-  // Renames without replacing: returns Taken if the new name exists. A dry run only records it.
+  // Renames without replacing: returns Taken if the new name exists. A dry run only records it. The
+  // sidecars of a picture go along, or nothing is renamed.
   platform::CommitResult Rename(const std::string& from, const std::string& to);
+  // After a failure: the new name that was not available, of the file or of a sidecar.
+  const std::string& RefusedName() const { return refused_; }
+  // Whether a file, given by its absolute path, was renamed as the sidecar of another.
+  bool WentAlong(const std::string& path) const;
   bool IsDryRun() const { return dryRun_; }
   // Whether the last rename was logged.
   bool IsNoted() const { return noted_; }
 
  private:
+  platform::CommitResult Refused(const std::string& name, platform::CommitResult result);
+  platform::CommitResult RenameTogether(const std::string& from, const std::string& to,
+                                        std::span<const RenamedFile> sidecars);
+  platform::CommitResult Pretend(const std::string& from, const std::string& to,
+                                 std::span<const RenamedFile> sidecars);
+
   const bool dryRun_;
   RenameLog* const log_;
   bool noted_ = true;
-  std::set<std::string> gone_, there_;
+  std::string refused_;
+  std::set<std::string> gone_, there_, sidecars_;
 };
 
 // The remark about a file that was renamed but cannot be undone.
 inline constexpr const char* kRenameNotNoted = TrLater("It could not be recorded for --undo.");
+
+// The names "photo.nef.xmp" for all files of a list, as absolute paths. Such a file in the same
+// list is renamed with its picture only.
+std::set<std::string> SidecarsOfListed(std::span<const BatchFile> files);
+
+// The remark about such a file.
+inline constexpr const char* kRenamedWithPicture =
+    TrLater("skipped: it was renamed with its picture.");
 
 // Records a completed rename in the job and renames the thumbnail file, except in a dry run.
 void NoteRename(const std::string& from, const std::string& to, bool dryRun, BatchJob& job);

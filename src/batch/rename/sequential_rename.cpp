@@ -3,6 +3,8 @@
 #include <algorithm>
 #include <numeric>
 #include <random>
+#include <set>
+#include <string>
 #include <utility>
 
 #include "core/plain_name.h"
@@ -66,13 +68,14 @@ std::string RenameHint(const std::string& path, const SequentialRenameRules& rul
 }
 
 FileOutcome RenameOne(const BatchFile& file, const SequentialRenameRules& rules,
-                      RenamedFiles& files, BatchJob& job) {
+                      const std::set<std::string>& sidecars, RenamedFiles& files, BatchJob& job) {
   FileOutcome outcome{.source = file.name, .status = file.status, .hint = file.hint};
+  const std::string path = platform::AbsolutePath(file.name);
   if (outcome.status == Status::Ok &&
-      WentWithPicture(platform::AbsolutePath(file.name), job.changes)) {
+      (sidecars.contains(path) || files.WentAlong(path) || WentWithPicture(path, job.changes))) {
     outcome.destination = file.name;
     outcome.skipped = true;
-    outcome.hint = Tr("skipped: it was renamed with its picture.");
+    outcome.hint = Tr(kRenamedWithPicture);
     return outcome;
   }
   if (outcome.status == Status::Ok &&
@@ -152,13 +155,14 @@ void RunRename(std::span<const BatchFile> files, const RenameOptions& options, B
   RenameLog log(remembers ? std::optional(rules.number) : std::nullopt);
   RenamedFiles renamed(options.dryRun, &log);
   NextNumber next(job, remembers);
+  const std::set<std::string> sidecars = SidecarsOfListed(files);
   const StopToken stop = job.stop.Token();
   uint32_t done = 0;
   for (const size_t place : order) {
     if (stop.Asked() || (job.box != nullptr && !job.box->GoesOn())) break;
     job.source.AssignCut(files[place].name);
     const uint32_t before = job.rename.number;
-    const FileOutcome outcome = RenameOne(files[place], rules, renamed, job);
+    const FileOutcome outcome = RenameOne(files[place], rules, sidecars, renamed, job);
     if (job.rename.number != before) next.Set(job.rename.number);
     ReportOutcome(job, outcome, done++, static_cast<uint32_t>(files.size()));
   }
