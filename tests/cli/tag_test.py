@@ -4,6 +4,7 @@ reads the files, and the pixels stay the same. Sidecars and comment files are wh
 expect them. $FOTOMILL names the program; FOTOMILL_CORPUS adds real pictures."""
 import json
 import os
+import re
 import shutil
 import subprocess
 import sys
@@ -292,6 +293,7 @@ def keep_sidecars():
             "an existing sidecar follows",
         )
         (place.path / "c.jpg.xmp").write_text("<broken")
+        data = (place.path / "c.jpg").read_bytes()
         status, _, err = place.run("tag", "c.jpg", "--in-place", "--comment", "New")
         check(
             (
@@ -302,6 +304,22 @@ def keep_sidecars():
             (1, "<broken", True),
             "a damaged sidecar is left alone",
         )
+        check((place.path / "c.jpg").read_bytes(), data, "and so is its picture")
+        (place.path / "c.jpg.xmp").unlink()
+        (place.path / "real").write_text(packet % "")
+        (place.path / "c.jpg.xmp").symlink_to("real")
+        status, _, err = place.run("tag", "c.jpg", "--in-place", "--comment", "New")
+        check((status, "is a link" in err, (place.path / "c.jpg.xmp").is_symlink()),
+              (1, True, True), "a link to a sidecar is kept")
+        check((place.path / "c.jpg").read_bytes(), data, "and so is its picture")
+        (place.path / "c.jpg.xmp").unlink()
+        words = "".join(f"<rdf:li>{i}</rdf:li>" for i in range(200000))
+        (place.path / "c.jpg.xmp").write_text((packet % "").replace("/></rdf:RDF>",
+            f'><dc:subject xmlns:dc="http://purl.org/dc/elements/1.1/"><rdf:Bag>{words}</rdf:Bag>'
+            "</dc:subject></rdf:Description></rdf:RDF>"))
+        check(place.run("tag", "c.jpg", "--sidecar", "--add-keyword", "one")[0], 0, "many keywords")
+        check(len(re.findall("<rdf:li>", (place.path / "c.jpg.xmp").read_text())), 200001,
+              "all of them are kept")
 
 
 def keep_split_packets():

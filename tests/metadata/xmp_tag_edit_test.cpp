@@ -77,6 +77,18 @@ TEST(XmpTagEdit, ChangesOnlyTheProperty) {
        Description("",
                    "<d:description><r:Alt><r:li xml:lang='de'>B</r:li>"
                    "<r:li xml:lang='x-default'>a&lt;b</r:li></r:Alt></d:description>")},
+      {"other languages",
+       Description("",
+                   "<d:description><r:Alt><r:li xml:lang='de'>B</r:li></r:Alt></d:description>"),
+       kText,
+       Description("",
+                   "<d:description><r:Alt>\n     <r:li xml:lang=\"x-default\">a&lt;b</r:li>"
+                   "<r:li xml:lang='de'>B</r:li></r:Alt></d:description>")},
+      {"no language",
+       Description("", "<d:description><r:Alt><r:li>B</r:li></r:Alt></d:description>"), kText,
+       Description("",
+                   "<d:description>\n    <r:Alt>\n     <r:li xml:lang=\"x-default\">a&lt;b</r:li>"
+                   "\n    </r:Alt>\n   </d:description>")},
       {"copy that is not there", Description("", "<d:x/>"), kCopy, Description("", "<d:x/>")},
   };
   for (const auto& row : rows) {
@@ -96,6 +108,17 @@ TEST(XmpTagEdit, KeepsTheSizeOfPaddedPackets) {
       EXPECT_EQ(Edited(after, kNoRating).size(), before.size());
     }
   }
+}
+
+// Repetitions that take minutes if work grows with the square of their number.
+TEST(XmpTagEdit, IsLinearInLargePackets) {
+  std::string many, deep;
+  for (int i = 0; i < 50000; ++i) many += Description("", "<b:Rating>1</b:Rating>");
+  for (int i = 0; i < 100000; ++i) deep += "<r:RDF>";
+  EXPECT_EQ(Edited(Packet(many), kRating), Packet(Description("", "<b:Rating>4</b:Rating>")));
+  for (int i = 0; i < 100000; ++i) deep += "</r:RDF>";
+  EXPECT_EQ(Edited(Packet(Description("", "<d:subject>" + deep + "</d:subject>")), kRating),
+            "refused");
 }
 
 TEST(XmpTagEdit, RefusesWhatItDoesNotUnderstand) {

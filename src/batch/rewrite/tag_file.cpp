@@ -5,6 +5,7 @@
 #include "metadata/tags/sidecar.h"
 #include "platform/existence.h"
 #include "platform/file_view.h"
+#include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "texts/system_reason.h"
@@ -34,9 +35,10 @@ class TagRewrite {
 
   Status Steps() {
     RETURN_IF_BAD(ReadCurrent());
+    const std::string old = FindSidecar(source_);
+    RETURN_IF_BAD(CheckSidecar(old));
     bool toSidecar = tags_.sidecarOnly;
     if (!tags_.sidecarOnly) RETURN_IF_BAD(RewritePicture(toSidecar));
-    const std::string old = FindSidecar(source_);
     if (toSidecar || !old.empty()) RETURN_IF_BAD(WriteSidecar(old, toSidecar));
     return tags_.commentFiles && tags_.changes.description ? WriteComment() : Status::Ok;
   }
@@ -48,6 +50,22 @@ class TagRewrite {
   Status Fail(Status status, std::string hint) {
     result_.hint = std::move(hint);
     return status;
+  }
+
+  // Before the picture is changed: whether its sidecar can be changed, too.
+  Status CheckSidecar(const std::string& old) {
+    if (old.empty()) return Status::Ok;
+    const std::string name(platform::FileNameOf(old));
+    if (InPlace() && platform::FactsOf(old).link)
+      return Fail(Status::ErrorCreatingFile, Tr("Its sidecar %1 is a link.", name));
+    platform::FileView file;
+    if (!file.Open(old)) return Fail(Status::FileOpenError, ReasonSentence());
+    std::vector<uint8_t> made;
+    bool changed = false;
+    const Status status = EditSidecar(file.Bytes(), current_, tags_.changes, made, changed);
+    return status == Status::DamagedFile
+               ? Fail(status, Tr("Its sidecar %1 cannot be changed safely.", name))
+               : status;
   }
 
   // What cannot be changed safely goes to a sidecar.
@@ -88,11 +106,7 @@ class TagRewrite {
       return EditSidecar(bytes, current_, tags_.changes, made, changed);
     };
     bool written = false;
-    if (const Status status = WriteBeside(old, path, edit, written); status != Status::Ok)
-      return status == Status::DamagedFile
-                 ? Fail(status,
-                        Tr("Its sidecar %1 cannot be changed safely.", platform::FileNameOf(old)))
-                 : status;
+    RETURN_IF_BAD(WriteBeside(old, path, edit, written));
     if (!needed || !written) return Status::Ok;
     const std::string name(platform::FileNameOf(path));
     result_.note = TrRecorded("Written to %1.", name);

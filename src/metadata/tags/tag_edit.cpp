@@ -3,6 +3,7 @@
 #include "metadata/tags/tag_edit.h"
 
 #include <algorithm>
+#include <unordered_set>
 #include <utility>
 
 #include "containers/directory_edit.h"
@@ -222,9 +223,9 @@ bool TagChanges::Empty() const {
 std::vector<std::string> ChangedKeywords(const std::vector<std::string>& old,
                                          const TagChanges& changes) {
   std::vector<std::string> keywords;
+  std::unordered_set<std::string> there;
   const auto add = [&](const std::string& keyword) {
-    const bool there = std::ranges::find(keywords, keyword) != keywords.end();
-    if (!keyword.empty() && !there) keywords.push_back(keyword);
+    if (!keyword.empty() && there.insert(keyword).second) keywords.push_back(keyword);
   };
   std::ranges::for_each(changes.keywords.value_or(old), add);
   std::ranges::for_each(changes.addedKeywords, add);

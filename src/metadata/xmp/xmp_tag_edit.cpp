@@ -71,7 +71,7 @@ class Editor {
   explicit Editor(std::string_view text) : text_(text), namespaces_(elements_) {}
 
   bool Run(std::span<const XmpChange> changes) {
-    if (!ScanXml(text_, elements_) || !FindGraph()) return false;
+    if (!ScanXml(text_, elements_) || TooDeep() || !FindGraph()) return false;
     for (const XmpChange& change : changes) {
       if (!Apply(change)) return false;
     }
@@ -98,6 +98,18 @@ class Editor {
     const XmlAttribute* attribute = nullptr;
     size_t element = 0;  // without an attribute
   };
+
+  // Namespaces are looked up through all the elements around one.
+  bool TooDeep() const {
+    constexpr int kMostLevels = 200;
+    std::vector<int> levels;
+    for (const XmlElement& element : elements_) {
+      const int around = element.parent == XmlElement::kNoParent ? 0 : levels[element.parent];
+      levels.push_back(around + 1);
+      if (around == kMostLevels) return true;
+    }
+    return false;
+  }
 
   bool FindGraph() {
     for (size_t i = 0; i < elements_.size(); ++i) {
@@ -175,7 +187,9 @@ class Editor {
       return true;
     }
     const XmlElement& element = elements_[place.element];
-    if (change.form == XmpForm::Languages && ReplaceDefault(place.element, change)) return true;
+    if (change.form == XmpForm::Languages &&
+        (ReplaceDefault(place.element, change) || AddDefault(place.element, change)))
+      return true;
     std::string made = "<";
     made.append(element.name);
     for (const XmlAttribute& attribute : element.attributes) {
@@ -205,6 +219,32 @@ class Editor {
     return false;
   }
 
+  // Adds the text in the default language, which comes first, to a list that has only others.
+  bool AddDefault(size_t property, const XmpChange& change) {
+    for (size_t i = property + 1;
+         i < elements_.size() && elements_[i].begin < elements_[property].end; ++i) {
+      const XmlElement& list = elements_[i];
+      if (list.parent != property || LocalOf(list.name) != "Alt" || list.alone) continue;
+      if (!AllHaveLanguages(i)) return false;
+      std::string made = "\n     <";
+      made.append(rdf_).append(":li xml:lang=\"x-default\">");
+      made.append(EscapedXml(change.values.front())).append("</").append(rdf_).append(":li>");
+      Put(list.content, list.content, std::move(made));
+      return true;
+    }
+    return false;
+  }
+
+  bool AllHaveLanguages(size_t list) const {
+    for (size_t i = list + 1; i < elements_.size() && elements_[i].begin < elements_[list].end;
+         ++i) {
+      const auto isLanguage = [](const XmlAttribute& a) { return a.name == "xml:lang"; };
+      if (elements_[i].parent == list && std::ranges::none_of(elements_[i].attributes, isLanguage))
+        return false;
+    }
+    return true;
+  }
+
   std::string Body(const XmpChange& change) const {
     if (change.form == XmpForm::Text) return EscapedXml(change.values.front());
     std::string list(rdf_), made;
@@ -230,25 +270,28 @@ class Editor {
 
   // Removes descriptions that have no properties any more.
   void RemoveEmptied() {
-    for (const auto& removed : removed_) {
-      const size_t description = removed.first;
-      const XmlElement& element = elements_[description];
-      const auto properties =
-          static_cast<size_t>(std::ranges::count_if(element.attributes,
-                                                    [](const XmlAttribute& attribute) {
-                                                      return PrefixOf(attribute.name) != "xmlns" &&
-                                                             attribute.name != "xmlns" &&
-                                                             LocalOf(attribute.name) != "about";
-                                                    }) +
-                              std::ranges::count_if(properties_, [&](size_t i) {
-                                return elements_[i].parent == description;
-                              }));
-      if (properties != removed.second) continue;
-      std::erase_if(replacements_, [&](const Replacement& one) {
-        return one.begin >= element.begin && one.end <= element.end;
-      });
-      const size_t begin = text_.find_last_not_of(kBlanks, element.begin - 1) + 1;
-      Put(begin, element.end, {});
+    std::map<size_t, size_t> elementsIn;
+    if (!removed_.empty()) {
+      for (const size_t i : properties_) ++elementsIn[elements_[i].parent];
+    }
+    std::vector<size_t> emptied;  // ascending
+    for (const auto& [description, count] : removed_) {
+      const auto isProperty = [](const XmlAttribute& attribute) {
+        return PrefixOf(attribute.name) != "xmlns" && attribute.name != "xmlns" &&
+               LocalOf(attribute.name) != "about";
+      };
+      const auto attributes =
+          static_cast<size_t>(std::ranges::count_if(elements_[description].attributes, isProperty));
+      if (attributes + elementsIn[description] == count) emptied.push_back(description);
+    }
+    std::erase_if(replacements_, [&](const Replacement& one) {
+      const auto after = std::ranges::upper_bound(emptied, one.begin, {},
+                                                  [this](size_t i) { return elements_[i].begin; });
+      return after != emptied.begin() && one.end <= elements_[*(after - 1)].end;
+    });
+    for (const size_t i : emptied) {
+      const size_t begin = text_.find_last_not_of(kBlanks, elements_[i].begin - 1) + 1;
+      Put(begin, elements_[i].end, {});
     }
   }
 
