@@ -197,6 +197,29 @@ def test_options(work):
     check((work / "nothing").exists(), False, "a dry run writes nothing")
 
 
+def test_safety(work):
+    """Files of others and galleries are not lost, and a gallery does not show itself."""
+    site, source = work / "site", work / "source"
+    for name in ("index.html", "gallery.css", "gallery.js", "page-2.html"):
+        site.mkdir()
+        (site / name).write_text("mine")
+        run("gallery", work / "wide.jpg", work / "small.png", "--per-page", "1", "--dest", site,
+            status=2)
+        check([path.name for path in site.rglob("*")], [name], "nothing is written")
+        check((site / name).read_text(), "mine", f"{name} is kept")
+        shutil.rmtree(site)
+    source.mkdir()
+    shutil.copy(work / "small.png", source)
+    web = source / "web"
+    for _ in range(2):
+        run("gallery", source, source / "small.png", "-r", "--dest", web)
+        check(len(Page(web / "index.html").all("img")), 2, "one picture, and the viewer's")
+    before = state(web)
+    run("gallery", work / "broken.jpg", work / "missing.jpg", "--dest", web, status=1)
+    check(state(web), before, "a gallery of nothing")
+    shutil.rmtree(source)
+
+
 SCRIPT = """
 window.addEventListener("load", async () => {
   const facts = {};
@@ -309,6 +332,7 @@ def main():
         make_pictures(work)
         for test, arguments in ((test_pages, (work, web)), (test_browser, (web,)),
                                 (test_again, (work, web)), (test_options, (work,)),
+                                (test_safety, (work,)),
                                 (test_weight, (work,))):
             before = len(faults)
             test(*arguments)

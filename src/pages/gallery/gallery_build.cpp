@@ -2,6 +2,7 @@
 
 #include <algorithm>
 #include <memory>
+#include <optional>
 #include <set>
 
 #include "batch/picture_failure.h"
@@ -12,6 +13,7 @@
 #include "operations/macros.h"
 #include "pages/gallery/exposure_text.h"
 #include "picture/write_options.h"
+#include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
@@ -27,6 +29,7 @@ namespace {
 constexpr const char* kPictureFolder = "pictures";
 // The pictures of the previous build, one name a line, to delete those no longer used.
 constexpr const char* kListName = "gallery-files.txt";
+constexpr const char *kStyleName = "gallery.css", *kScriptName = "gallery.js";
 constexpr uint64_t kMostBytes = uint64_t{64} << 20;  // of a page or the list
 // WebP takes ten times as long as JPEG, so it is left to the pictures that every visitor loads.
 constexpr int32_t kMostWebp = 1000;  // longer side
@@ -83,6 +86,29 @@ std::string RelativePath(const std::string& folder, const std::string& file) {
     if (i == folder.size() || folder[i] == '/') path += "../";
   }
   return path + file.substr(common);
+}
+
+// The lines of a list of files.
+std::set<std::string> LinesOf(const std::string& text) {
+  std::set<std::string> lines;
+  for (size_t start = 0; start < text.size();) {
+    const size_t end = std::min(text.find('\n', start), text.size());
+    lines.insert(text.substr(start, end - start));
+    start = end + 1;
+  }
+  return lines;
+}
+
+std::string ListPath(const std::string& folder) {
+  return platform::JoinFolder(platform::JoinFolder(folder, kPictureFolder), kListName);
+}
+
+// The files of the previous build; nullopt if there was none.
+std::optional<std::set<std::string>> PreviousFiles(const std::string& folder) {
+  std::string text;
+  if (platform::ReadWholeFile(ListPath(folder), kMostBytes, text) != platform::ReadResult::Done)
+    return std::nullopt;
+  return LinesOf(text);
 }
 
 class GalleryBuild {
@@ -208,21 +234,38 @@ class GalleryBuild {
       }
       shown.push_back(std::move(pictures_[i]));
     }
+    // a mistyped name must not empty a gallery
+    if (shown.empty()) return Status::Ok;
     const size_t perPage = std::max<size_t>(options_.perPage, 1);
     const size_t pages = std::max<size_t>((shown.size() + perPage - 1) / perPage, 1);
     GalleryTexts texts = options_.texts;
     if (host_.countText) texts.count = host_.countText(shown.size());
+    for (size_t page = 0; page < pages; ++page) list += GalleryPageName(page) + "\n";
+    // before the pages, so that after an interruption the next build knows them as its own
+    const std::set<std::string> previous =
+        PreviousFiles(options_.folder).value_or(std::set<std::string>());
+    const std::string listName = std::string(kPictureFolder) + "/" + kListName;
+    RETURN_IF_BAD(Update(listName, list + MissingIn(list, previous), failed));
     for (size_t page = 0; page < pages; ++page) {
       const auto part = std::span(shown).subspan(page * perPage,
                                                  std::min(perPage, shown.size() - page * perPage));
-      list += GalleryPageName(page) + "\n";
       RETURN_IF_BAD(Update(GalleryPageName(page),
                            GalleryPage(options_.theme, texts, part, page, pages), failed));
     }
-    RETURN_IF_BAD(Update("gallery.css", options_.theme.style, failed));
-    RETURN_IF_BAD(Update("gallery.js", options_.theme.script, failed));
-    DeleteUnused(list);
-    return Update(std::string(kPictureFolder) + "/" + kListName, list, failed);
+    RETURN_IF_BAD(Update(kStyleName, options_.theme.style, failed));
+    RETURN_IF_BAD(Update(kScriptName, options_.theme.script, failed));
+    DeleteUnused(previous, list);
+    return Update(listName, list, failed);
+  }
+
+  // The lines that a list lacks.
+  static std::string MissingIn(const std::string& list, const std::set<std::string>& lines) {
+    const std::set<std::string> present = LinesOf(list);
+    std::string missing;
+    for (const std::string& line : lines) {
+      if (!present.contains(line)) missing += line + "\n";
+    }
+    return missing;
   }
 
   // Writes a file unless it has these contents already.
@@ -238,22 +281,9 @@ class GalleryBuild {
   }
 
   // Deletes files of the previous build; only names like those of this program.
-  void DeleteUnused(const std::string& list) const {
-    std::string previous;
-    if (platform::ReadWholeFile(platform::JoinFolder(pictureFolder_, kListName), kMostBytes,
-                                previous) != platform::ReadResult::Done)
-      return;
-    const auto linesOf = [](const std::string& text) {
-      std::set<std::string> lines;
-      for (size_t start = 0; start < text.size();) {
-        const size_t end = std::min(text.find('\n', start), text.size());
-        lines.insert(text.substr(start, end - start));
-        start = end + 1;
-      }
-      return lines;
-    };
-    const std::set<std::string> used = linesOf(list);
-    for (const std::string& name : linesOf(previous)) {
+  void DeleteUnused(const std::set<std::string>& previous, const std::string& list) const {
+    const std::set<std::string> used = LinesOf(list);
+    for (const std::string& name : previous) {
       if (!used.contains(name) && IsOwnName(name)) (void)platform::DeleteFile(PathOf(name));
     }
   }
@@ -280,6 +310,30 @@ class GalleryBuild {
 };
 
 }  // namespace
+
+std::string ForeignFile(const GalleryOptions& options, size_t files) {
+  const auto previous = PreviousFiles(options.folder);
+  std::vector<std::string> names{GalleryPageName(0)};
+  for (size_t page = 1; page * std::max<size_t>(options.perPage, 1) < files; ++page)
+    names.push_back(GalleryPageName(page));
+  if (!previous) names.insert(names.end(), {kStyleName, kScriptName});
+  for (const std::string& name : names) {
+    const std::string path = platform::JoinFolder(options.folder, name);
+    if (!(previous && previous->contains(name)) &&
+        platform::ExistenceOf(path) == platform::Existence::Yes)
+      return path;
+  }
+  return {};
+}
+
+void LeaveOutRepeated(const std::string& folder, std::vector<BatchFile>& files) {
+  std::set<std::string> seen{platform::AbsolutePath(ListPath(folder))};
+  for (const std::string& name : PreviousFiles(folder).value_or(std::set<std::string>()))
+    seen.insert(platform::AbsolutePath(platform::JoinFolder(folder, name)));
+  std::erase_if(files, [&](const BatchFile& file) {
+    return file.status == Status::Ok && !seen.insert(platform::AbsolutePath(file.name)).second;
+  });
+}
 
 Status BuildGallery(std::span<const BatchFile> files, const GalleryOptions& options,
                     const GalleryHost& host, std::vector<GalleryOutcome>& outcomes,

@@ -46,11 +46,18 @@ struct GalleryHost {
   std::function<std::string(size_t pictures)> countText;    // "12 pictures"
 };
 
+// The path of an existing page, style sheet or script that a gallery of that many files would
+// replace, although no gallery wrote it. Empty if there is none.
+std::string ForeignFile(const GalleryOptions& options, size_t files);
+
+// Removes files that are named twice, and the files of a gallery in `folder`.
+void LeaveOutRepeated(const std::string& folder, std::vector<BatchFile>& files);
+
 // Builds a gallery: pages, style sheet, script, and the pictures in several sizes in the folder
 // "pictures". Pictures that are there already, for an unchanged file and unchanged options, are
 // kept, as are pages that would not change; pictures of the previous build that are no longer used
-// are deleted. `outcomes` is in the order of the files. Ok, FunctionCancelled, or why a page cannot
-// be written, with its path in `failed`.
+// are deleted. Without any picture, the gallery is left as it is. `outcomes` is in the order of the
+// files. Ok, FunctionCancelled, or why a page cannot be written, with its path in `failed`.
 Status BuildGallery(std::span<const BatchFile> files, const GalleryOptions& options,
                     const GalleryHost& host, std::vector<GalleryOutcome>& outcomes,
                     std::string& failed);

@@ -94,13 +94,16 @@ GalleryTexts TextsFor(const GalleryCommand& options) {
   return texts;
 }
 
-void Report(const Selection& selection, const std::vector<GalleryOutcome>& outcomes,
+// `built`: the pages were written; else only failed files are reported.
+void Report(const Selection& selection, const std::vector<GalleryOutcome>& outcomes, bool built,
             ResultOutput& output) {
   for (size_t i = 0; i < outcomes.size(); ++i) {
     const std::string& name = selection.files[i].name;
     const GalleryOutcome& outcome = outcomes[i];
     if (outcome.status != Status::Ok) {
       output.FileFailed(name, outcome.status, outcome.hint);
+    } else if (!built) {
+      continue;
     } else if (!output.IsJson()) {
       output.FileDone(name, outcome.destination);
     } else {
@@ -131,7 +134,7 @@ int RunGallery(const GalleryCommand& options, const CommandContext& context) {
     return UsageError(context, Tr("\"%1\" is not a folder.", options.dest));
   if (const RecordedText problem = MacroProblem(options.caption); !problem.empty())
     return UsageError(context, "\"" + options.caption + "\" " + problem.shown);
-  const auto selection = SelectFiles(options.selection, context);
+  auto selection = SelectFiles(options.selection, context);
   if (!selection) return kExitUsage;
   gallery.folder = options.dest;
   gallery.texts = TextsFor(options);
@@ -146,6 +149,10 @@ int RunGallery(const GalleryCommand& options, const CommandContext& context) {
   gallery.perPage = static_cast<size_t>(options.perPage);
   gallery.jobs = static_cast<uint32_t>(options.jobs);
   gallery.dryRun = options.dryRun;
+  LeaveOutRepeated(options.dest, selection->files);
+  if (const std::string path = ForeignFile(gallery, selection->files.size()); !path.empty()) {
+    return UsageError(context, Tr("\"%1\" already exists and does not belong to a gallery.", path));
+  }
 
   ResultOutput output(context, options.json);
   output.CloseWith(selection->leftOut);
@@ -158,10 +165,9 @@ int RunGallery(const GalleryCommand& options, const CommandContext& context) {
   std::vector<GalleryOutcome> outcomes;
   std::string failed;
   const Status status = BuildGallery(selection->files, gallery, host, outcomes, failed);
-  if (status == Status::Ok)
-    Report(*selection, outcomes, output);
-  else if (status != Status::FunctionCancelled)
-    output.Failure(failed, status, ReasonSentence());
+  if (status == Status::FunctionCancelled) return output.Finish();
+  if (status != Status::Ok) output.Failure(failed, status, ReasonSentence());
+  Report(*selection, outcomes, status == Status::Ok, output);
   return output.Finish();
 }
 
