@@ -174,6 +174,19 @@ TEST(PackSheets, ManyPrintsAreFast) {
   const std::vector<PaperSize> sizes(20000, {100, 150});
   const auto places = PackSheets(sizes, {200, 287}, 0);
   EXPECT_EQ(places.back().sheet, 6666u);
+  // two sizes; the small ones fill the sheets of the large ones
+  std::vector<PaperSize> mixed(60000, {100, 150});
+  mixed.resize(90000, {35, 45});
+  EXPECT_EQ(PackSheets(mixed, {200, 287}, 0)[59999].sheet, 19999u);
+}
+
+TEST(PhotoPages, HasALimitOfPrints) {
+  const std::vector<PagePicture> pictures{{.id = 0, .width = 4, .height = 3},
+                                          {.id = 1, .width = 4, .height = 3}};
+  PhotoOptions options;
+  options.cutLines = false;
+  options.sizes = {{.size = {100, 150}, .copies = 60000}};
+  EXPECT_EQ(PhotoPages(options, pictures).size(), 20000u);
 }
 
 TEST(PhotoPages, PrintsMeasureWhatTheySay) {
@@ -245,6 +258,14 @@ TEST(PrintPages, Sizes) {
     const std::vector<Page> pages = PrintPages(row.options, {&picture, 1});
     ASSERT_EQ(pages.size(), 1u);
     ExpectBox(PlaceOf(FirstPicture(pages[0])), row.box);
+  }
+  // larger than the page: nothing in the margins, wherever it is
+  for (const int32_t side : {-1, 0, 1}) {
+    const PrintOptions large{
+        .sizing = PrintSizing::Percent, .percent = 400, .across = side, .down = side};
+    const PictureItem item = FirstPicture(PrintPages(large, {&picture, 1})[0]);
+    ASSERT_EQ(item.clip.size(), 4u);
+    ExpectBox(BoundsOf(item.clip), {10, 10, 277, 190});
   }
   // halftones keep whole dots on request only if they have one bit
   PagePicture halftone = picture;

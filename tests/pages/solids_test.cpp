@@ -257,6 +257,9 @@ TEST(PosterPages, SheetsOverlapAndCoverThePicture) {
       }
     }
   }
+  // a poster of 20000 sheets is left out, not cut
+  const PagePicture pictures[] = {{.id = 0, .name = "n", .width = 2, .height = 20000}, wide};
+  EXPECT_EQ(PosterPages({.turnPaper = false}, pictures).size(), 3u);
 }
 
 }  // namespace

@@ -2,9 +2,8 @@
 
 #include <algorithm>
 #include <functional>
-#include <numeric>
+#include <map>
 #include <optional>
-#include <set>
 #include <tuple>
 
 namespace fotomill {
@@ -14,6 +13,7 @@ namespace {
 constexpr double kTolerance = 1e-6;  // rounding errors of sums of lengths
 constexpr double kCutLine = 0.1;
 constexpr size_t kMostTried = 2000;  // rectangles; for more, few strategies are tried
+constexpr size_t kMostPrints = 100000;  // in all
 
 // How a strategy chooses among the turns of a rectangle.
 enum class Turning { Free, Never, Always };
@@ -82,32 +82,46 @@ class Sheet {
 // The order in which a strategy places rectangles.
 using Order = std::function<double(const PaperSize&)>;
 
+// Rectangles of one size, in their order, and how many of them are placed.
+struct SizeGroup {
+  PaperSize size;
+  std::vector<size_t> members = {};
+  size_t placed = 0;
+};
+
+std::vector<SizeGroup> GroupsOf(std::span<const PaperSize> sizes, const Order& order) {
+  std::vector<SizeGroup> groups;
+  std::map<std::pair<double, double>, size_t> known;
+  for (size_t i = 0; i < sizes.size(); ++i) {
+    const auto [group, added] = known.try_emplace({sizes[i].width, sizes[i].height}, groups.size());
+    if (added) groups.push_back({.size = sizes[i]});
+    groups[group->second].members.push_back(i);
+  }
+  std::ranges::stable_sort(groups, std::greater<>(),
+                           [&](const SizeGroup& group) { return order(group.size); });
+  return groups;
+}
+
+// Work is proportional to the number of rectangles, and of sheets times sizes.
 std::vector<PackedPlace> PackInOrder(std::span<const PaperSize> sizes, const PaperSize& room,
                                      const Order& order, Turning turning) {
-  std::vector<size_t> queue(sizes.size());
-  std::iota(queue.begin(), queue.end(), size_t{0});
-  std::ranges::stable_sort(queue, std::greater<>(), [&](size_t i) { return order(sizes[i]); });
+  std::vector<SizeGroup> groups = GroupsOf(sizes, order);
   std::vector<PackedPlace> places(sizes.size());
-  std::vector<size_t> rest;
-  for (size_t sheet = 0; !queue.empty(); ++sheet, queue = std::move(rest), rest.clear()) {
+  size_t placed = 0;
+  for (size_t sheet = 0; placed < sizes.size(); ++sheet) {
     Sheet bin(room);
-    // equal sizes that did not fit once will not fit later
-    std::set<std::pair<double, double>> tooLarge;
-    for (const size_t i : queue) {
-      const auto key = std::pair(sizes[i].width, sizes[i].height);
-      std::optional<PackedPlace> place;
-      if (!tooLarge.contains(key)) place = bin.Put(sizes[i], turning);
-      if (!place && turning != Turning::Free && !tooLarge.contains(key))
-        place = bin.Put(sizes[i], Turning::Free);
-      if (!place) {
-        tooLarge.insert(key);
-        rest.push_back(i);
-        continue;
+    const size_t before = placed;
+    for (SizeGroup& group : groups) {
+      while (group.placed < group.members.size()) {
+        std::optional<PackedPlace> place = bin.Put(group.size, turning);
+        if (!place && turning != Turning::Free) place = bin.Put(group.size, Turning::Free);
+        if (!place) break;
+        place->sheet = sheet;
+        places[group.members[group.placed++]] = *place;
+        ++placed;
       }
-      places[i] = *place;
-      places[i].sheet = sheet;
     }
-    if (rest.size() == queue.size()) return {};
+    if (placed == before) return {};
   }
   return places;
 }
@@ -214,7 +228,10 @@ struct Print {
 
 std::vector<Print> PrintsOf(const PhotoOptions& options, std::span<const PagePicture> pictures) {
   std::vector<Print> prints;
+  size_t copies = 0;
+  for (const PhotoSize& photo : options.sizes) copies += static_cast<size_t>(photo.copies);
   for (const PagePicture& picture : pictures) {
+    if (prints.size() + copies > kMostPrints) break;
     for (const PhotoSize& photo : options.sizes) {
       const bool turn = !photo.upright && NeedsTurn(picture.width, picture.height,
                                                     {0, 0, photo.size.width, photo.size.height});

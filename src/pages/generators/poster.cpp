@@ -10,6 +10,7 @@ namespace fotomill {
 namespace {
 
 constexpr double kTolerance = 1e-6;
+constexpr int64_t kMostSheets = 10000;  // of all posters
 constexpr double kCutLine = 0.1, kTickGap = 1, kTickLength = 4;
 constexpr double kLabelHeight = 3;
 constexpr Color kWhite = 0xFFFFFF, kGray = 0x808080;
@@ -38,7 +39,7 @@ std::string Centimeters(double mm) {
 
 int32_t SheetsFor(double length, double room, double overlap) {
   const double sheets = std::ceil((length - overlap) / (room - overlap) - kTolerance);
-  return static_cast<int32_t>(std::clamp(sheets, 1.0, 1000.0));
+  return static_cast<int32_t>(std::clamp(sheets, 1.0, kMostSheets + 1.0));
 }
 
 double Reach(int32_t sheets, double room, double overlap) {
@@ -71,6 +72,8 @@ class PosterMaker {
  public:
   PosterMaker(const PosterOptions& options, const PagePicture& picture)
       : options_(options), picture_(picture), plan_(PlanPoster(options, picture)) {}
+
+  int64_t Sheets() const { return int64_t{plan_.columns} * plan_.rows; }
 
   void Make(std::vector<Page>& pages) const {
     for (int32_t row = 0; row < plan_.rows; ++row) {
@@ -194,17 +197,25 @@ PosterPlan PlanPoster(const PosterOptions& options, const PagePicture& picture) 
   if (!options.turnPaper || options.rows > 0) return plan;
   const PosterPlan turned = PlanFor(options, picture, true);
   if (options.size.width > 0)
-    return turned.columns * turned.rows < plan.columns * plan.rows ? turned : plan;
+    return int64_t{turned.columns} * turned.rows < int64_t{plan.columns} * plan.rows ? turned
+                                                                                     : plan;
   // a given number of columns: the orientation that leaves less paper empty
   const auto waste = [](const PosterPlan& p) {
-    return p.columns * p.rows * p.room.width * p.room.height / (p.size.width * p.size.height);
+    return double{1} * p.columns * p.rows * p.room.width * p.room.height /
+           (p.size.width * p.size.height);
   };
   return waste(turned) + kTolerance < waste(plan) ? turned : plan;
 }
 
 std::vector<Page> PosterPages(const PosterOptions& options, std::span<const PagePicture> pictures) {
   std::vector<Page> pages;
-  for (const PagePicture& picture : pictures) PosterMaker(options, picture).Make(pages);
+  int64_t sheets = 0;
+  for (const PagePicture& picture : pictures) {
+    const PosterMaker poster(options, picture);
+    if (sheets + poster.Sheets() > kMostSheets) continue;
+    sheets += poster.Sheets();
+    poster.Make(pages);
+  }
   return pages;
 }
 

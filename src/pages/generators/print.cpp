@@ -14,6 +14,7 @@ constexpr double kMarkGap = 2, kMarkLength = 5, kMarkLine = 0.1;
 constexpr double kShadow = 1;  // offset
 constexpr Color kShade = 0xB0B0B0;
 constexpr double kTextGap = 1.5;
+constexpr double kTolerance = 1e-6;  // rounding errors of lengths
 
 bool WholeDots(const PrintOptions& options, const PagePicture& picture) {
   return options.wholeDots || (options.expandHalftones && picture.bits == 1);
@@ -129,7 +130,8 @@ class PrintPage {
              Placed(room_.y, room_.height, size.height, options_.down), size.width, size.height};
       item = PlacePicture(picture_, box, PictureFit::Stretch, false);
       // larger than the page: only what is within the margins
-      if (box.x < room_.x || box.y < room_.y) item.clip = CornersOf(room_);
+      if (box.width > room_.width + kTolerance || box.height > room_.height + kTolerance)
+        item.clip = CornersOf(room_);
     }
     std::vector<PageItem>& items = page_.items;
     const Box outer{box.x - options_.matte, box.y - options_.matte, box.width + 2 * options_.matte,

@@ -106,7 +106,8 @@ std::string PredictorEntries(int32_t colors, int32_t width) {
          std::to_string(colors) + " /Columns " + std::to_string(width) + " >>";
 }
 
-Status EncodeColors(const PackedImage& image, PdfPicture& picture) {
+// Frees the image.
+Status EncodeColors(PackedImage& image, PdfPicture& picture) {
   const auto width = static_cast<size_t>(image.Width());
   std::vector<uint8_t> filtered, row(width * 3), above(width * 3);
   filtered.reserve((width * 3 + 1) * static_cast<size_t>(image.Height()));
@@ -117,6 +118,7 @@ Status EncodeColors(const PackedImage& image, PdfPicture& picture) {
   }
   picture.colors = "/DeviceRGB";
   picture.entries = PredictorEntries(3, image.Width());
+  image = {};
   return Deflated(filtered, picture.bytes);
 }
 
