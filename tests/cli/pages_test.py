@@ -3,6 +3,7 @@
 import json
 import os
 import re
+import resource
 import shutil
 import subprocess
 import sys
@@ -219,6 +220,10 @@ def test_large(work):
     near(right - left, 150.2, 0.15, "width of a cube's net")
     near(bottom - top, 210.2, 0.15, "height of a cube's net")
     run("pages", "cube", work / "wide.jpg", "--size", "8cm", "--out", work / "x.pdf", status=2)
+    done = run("pages", "cube", *[work / "wide.jpg"] * 7, "--out", work / "seven.pdf", "--json",
+               status=1)
+    check([row["status"] == 0 for row in json.loads(done.stdout)], [True] * 6 + [False],
+          "a picture that has no face")
     pdf = work / "dodecahedron.pdf"
     run("pages", "dodecahedron", work / "wide.jpg", work / "photo.png", "--out", pdf)
     check(len(image_list(pdf)), 12, "faces")
@@ -247,6 +252,16 @@ def test_outputs(work):
     check((work / "dry.pdf").exists(), False, "a dry run writes nothing")
     hint = run("convert", work / "wide.jpg", "--to", "pdf", "--dest", work, status=2).stderr
     check(b"pages print" in hint, True, "hint of convert")
+    # the second page does not fit into a file of 40 KB
+    arguments = ("pages", "print", work / "gray.jpg", work / "noise.png", work / "gray.jpg",
+                 "--to", "png", "--dpi", "40", "--dest", work / "full", "--json")
+    done = subprocess.run(
+        [FOTOMILL, *arguments], capture_output=True, check=False, restore_signals=False,
+        preexec_fn=lambda: resource.setrlimit(resource.RLIMIT_FSIZE, (40000, 40000)))
+    check(done.returncode, 1, "a page that cannot be written")
+    check([row["page"] for row in json.loads(done.stdout)], [1, 0, 0], "files on pages")
+    check(b"Print_00002.png: Error writing" in done.stderr, True, f"its name in {done.stderr}")
+    check([path.name for path in (work / "full").iterdir()], ["Print_00001.png"], "pages written")
     papers = json.loads(run("pages", "papers", "--json").stdout)
     a4 = {"name": "A4", "kind": "paper", "width": 210.0, "height": 297.0}
     check(a4 in papers, True, "papers")
@@ -284,6 +299,7 @@ def make_pictures(work):
     photo.save(work / "profile.jpg", icc_profile=profile)
     photo.save(work / "profile.png", icc_profile=profile)
     photo.convert("L").save(work / "gray.jpg")
+    Image.effect_noise((400, 500), 90).save(work / "noise.png")
     upright = Image.new("RGB", (120, 80))
     upright.paste((255, 255, 255), (0, 0, 60, 40))
     back = {1: None, 2: Image.Transpose.FLIP_LEFT_RIGHT, 3: Image.Transpose.ROTATE_180,

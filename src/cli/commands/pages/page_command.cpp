@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <charconv>
 #include <memory>
+#include <set>
 
 #include "batch/new_job.h"
 #include "cli/frame/destination_format.h"
@@ -74,9 +75,7 @@ class PageWriter {
     destinations_.resize(run.Pages().size());
     Status status = Status::Ok;
     if (run.Pages().empty()) {
-      if (std::ranges::all_of(run.Outcomes(),
-                              [](const PageOutcome& o) { return o.status == Status::Ok; }))
-        output_.Message(Tr("There is nothing to put on pages."));
+      if (files_.empty()) output_.Message(Tr("There is nothing to put on pages."));
     } else if (options_.to.empty()) {
       status = options_.printer.empty() ? WriteDocument(run, options_.out) : Print(run);
     } else if (IsPdf(options_.to)) {
@@ -161,38 +160,63 @@ class PageWriter {
       const Status status = WriteCatalogPage(*page, write, job_, destinations_[i]);
       Explain(status, destinations_[i]);
       RETURN_IF_BAD(status);
+      pagesWritten_ = i + 1;
     }
     return Status::Ok;
   }
 
   int Report(const PageRun& run, Status status) {
     if (status != Status::Ok) {
-      const std::string name = destinations_.empty() ? options_.out : destinations_.front();
+      std::string name;
+      if (pagesWritten_ < destinations_.size()) name = destinations_[pagesWritten_];
+      if (name.empty()) name = options_.dest;  // a page that cannot be drawn
       output_.Failure(name, status, hint_);
     }
     const auto outcomes = run.Outcomes();
+    const std::set<size_t> unwritten =
+        status == Status::Ok ? std::set<size_t>() : PicturesFrom(run, pagesWritten_);
     for (size_t i = 0; i < files_.size(); ++i) {
       const PageOutcome& outcome = outcomes[i];
       if (outcome.status != Status::Ok) {
         output_.FileFailed(files_[i].name, outcome.status, outcome.hint);
-      } else if (status == Status::Ok) {
+      } else if (unwritten.contains(i)) {
+        if (output_.IsJson()) output_.Element(ElementOf(files_[i].name, {}, 0, status));
+      } else if (outcome.page == 0) {
+        output_.FileFailed(files_[i].name, Status::UnsuitableImage, command_.leftOut);
+      } else {
         Done(files_[i].name, outcome);
       }
     }
     return output_.Finish();
   }
 
+  // The pictures on a page and all later ones.
+  static std::set<size_t> PicturesFrom(const PageRun& run, size_t first) {
+    std::set<size_t> pictures;
+    for (size_t page = first; page < run.Pages().size(); ++page) {
+      for (const PageItem& item : run.Pages()[page].items) {
+        if (const auto* const picture = std::get_if<PictureItem>(&item))
+          pictures.insert(picture->picture);
+      }
+    }
+    return pictures;
+  }
+
   void Done(const std::string& name, const PageOutcome& outcome) {
-    const std::string destination =
-        outcome.page > 0 ? destinations_[static_cast<size_t>(outcome.page) - 1] : std::string();
+    const std::string& destination = destinations_[static_cast<size_t>(outcome.page) - 1];
     if (!output_.IsJson()) return output_.FileDone(name, destination);
     output_.CountFile();
+    output_.Element(ElementOf(name, destination, outcome.page, Status::Ok));
+  }
+
+  static Json ElementOf(const std::string& name, const std::string& destination, int32_t page,
+                        Status status) {
     Json element;
     PutName(element, "file", name);
     PutName(element, "destination", destination);
-    element["page"] = outcome.page;
-    PutStatus(element, Status::Ok);
-    output_.Element(element);
+    element["page"] = page;
+    PutStatus(element, status);
+    return element;
   }
 
   const PageCommandOptions& options_;
@@ -202,6 +226,7 @@ class PageWriter {
   ResultOutput output_;
   std::vector<SelectedFile> files_;
   std::vector<std::string> destinations_;  // by page
+  size_t pagesWritten_ = 0;                // of those in files of their own
   std::string hint_;
 };
 

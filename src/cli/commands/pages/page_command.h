@@ -45,6 +45,7 @@ struct PageCommand {
   PageRunOptions run;
   std::string prefix;     // of the names of pages with --to
   double usualDpi = 300;  // of pages with --to
+  std::string leftOut = {};  // why a picture may be on no page, printed after the message
 };
 
 // Reads the selection, makes the pages and writes them as a PDF file, as pictures, or to a printer.

@@ -34,6 +34,7 @@ struct PrintCommand : PageCommandOptions {
 
 constexpr int32_t kMostCopies = 10000;
 constexpr double kPhotoMargin = 5, kPrintMargin = 10;
+constexpr double kLeastRoom = 5;  // within matte and rule
 
 std::string BadLength(const std::string& text) {
   return Tr("\"%1\" is not a length such as 10mm, 1cm or 0.5in.", text);
@@ -73,7 +74,7 @@ std::string ReadPhotos(const PhotoCommand& options, PhotoOptions& photos) {
   if (!options.gap.empty()) {
     const auto gap = ParseLength(options.gap);
     if (!gap) return BadLength(options.gap);
-    photos.gap = *gap;
+    photos.gap = std::min(*gap, kMostSide);  // more would be rounding errors of places
   }
   return PhotosFit(photos) ? std::string()
                            : Tr("A print is larger than the paper without its margins.");
@@ -94,6 +95,7 @@ int RunPhoto(const PhotoCommand& options, const CommandContext& context) {
     return UsageError(context, wrong);
   PageCommand command;
   command.prefix = "Photo_";
+  command.leftOut = Tr("There are too many prints.");
   command.run.generator = [photos](std::span<const PagePicture> pictures) {
     return PhotoPages(photos, pictures);
   };
@@ -173,6 +175,9 @@ std::string ReadDecoration(const PrintCommand& options, PrintOptions& print) {
     if (!width) return BadLength(options.matte);
     print.matte = *width;
   }
+  const double room = std::min(print.paper.width, print.paper.height) - 2 * print.margin;
+  if (room - 2 * (print.matte + print.rule) < kLeastRoom)
+    return Tr("The margins leave no room on the paper.");
   print.ruleColor = static_cast<Color>(settings.PrintWorkshopRuleColor);
   print.ruleShadow = settings.PrintWorkshopRuleShade != 0;
   print.matteColor = static_cast<Color>(settings.PrintWorkshopMattColor);

@@ -77,6 +77,7 @@ int RunPoster(const PosterCommand& options, const CommandContext& context) {
     return UsageError(context, wrong);
   PageCommand command;
   command.prefix = "Poster_";
+  command.leftOut = Tr("The poster would need too many sheets.");
   command.run.generator = [poster](std::span<const PagePicture> pictures) {
     return PosterPages(poster, pictures);
   };
@@ -109,6 +110,7 @@ int RunCutout(const CutoutCommand& options, std::vector<CutoutNet> nets, const s
   }
   PageCommand command;
   command.prefix = prefix;
+  command.leftOut = Tr("There are more pictures than faces.");
   command.run.generator = [cutout, nets = std::move(nets)](std::span<const PagePicture> pictures) {
     return CutoutPages(cutout, nets, pictures);
   };
