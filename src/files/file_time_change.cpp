@@ -1,6 +1,8 @@
 #include "files/file_time_change.h"
 
+#include <chrono>
 #include <cstdio>
+#include <cstdlib>
 
 #include "core/checked.h"
 #include "core/text.h"
@@ -27,7 +29,17 @@ std::optional<int64_t> SecondsOfDate(int64_t date) {
   time.day = take(100);
   time.month = take(100);
   time.year = take(10000);
-  return platform::SecondsOfLocalTime(time);
+  const std::chrono::year_month_day day(std::chrono::year(time.year),
+                                        std::chrono::month(static_cast<unsigned>(time.month)),
+                                        std::chrono::day(static_cast<unsigned>(time.day)));
+  return day.ok() ? platform::SecondsOfLocalTime(time) : std::nullopt;
+}
+
+// Whether a file has a time; file systems silently use the nearest one that they can store.
+bool Holds(const std::string& path, int64_t seconds) {
+  constexpr int64_t kCoarsest = 2;  // seconds, on FAT
+  const auto time = platform::ModificationTime(path);
+  return !time || std::abs(time->seconds - seconds) <= kCoarsest;
 }
 
 }  // namespace
@@ -60,6 +72,12 @@ FileTimeChange FileTimeChanger::Change(const std::string& path, int64_t taken) {
       !platform::SetFileTimes(path, time(rule_.setsAccess), time(rule_.setsModification))) {
     change.status = Status::ErrorWritingFile;
     change.hint = ReasonSentence();
+    return change;
+  }
+  if (!dryRun_ && rule_.setsModification && !Holds(path, when)) {
+    (void)platform::SetFileTimes(path, {}, before);
+    change.status = Status::ErrorWritingFile;
+    change.hint = Tr("The file system cannot store this time.");
     return change;
   }
   rule_.start = when;

@@ -320,6 +320,8 @@ def keep_sidecars():
         check(place.run("tag", "c.jpg", "--sidecar", "--add-keyword", "one")[0], 0, "many keywords")
         check(len(re.findall("<rdf:li>", (place.path / "c.jpg.xmp").read_text())), 200001,
               "all of them are kept")
+        err = place.run("exif", "strip", "c.jpg", "--in-place")[2]
+        check("sidecar c.jpg.xmp still has metadata" in err, True, "exif strip names the sidecar")
 
 
 def keep_split_packets():

@@ -60,9 +60,18 @@ def main():
         place.run("touch", "b.bmp")
         check(before <= (place.path / "b.bmp").stat().st_mtime <= time.time(), True, "now")
         for options in (["--at", "x"], ["--at", "2024-13-01"], ["--at", "2024-05-31 24:00"],
+                        ["--at", "2023-02-29"],
                         ["--increment", "x"], ["--taken", "--at", "now"],
                         ["--set", "FileTimeUpdateWrite=0"]):
             check(place.run("touch", "a.bmp", *options)[0], 2, f"{options}: refused")
+        for year in ("1600", "9999"):
+            before = (place.path / "a.bmp").stat().st_mtime
+            status, _, err = place.run("touch", "a.bmp", "--at", f"{year}-06-01")
+            held = text((place.path / "a.bmp").stat().st_mtime)[:4] if status == 0 else year
+            check(held, year, "a time that file systems may not store")
+            if status != 0:
+                check((status, "cannot store" in err, (place.path / "a.bmp").stat().st_mtime),
+                      (1, True, before), "it keeps its time")
         status, out, _ = place.run("touch", "--json", "none.bmp", "a.bmp", "--at", "2024-05-31")
         check((status, [row["status"] for row in json.loads(out)]), (1, [1, 0]), "missing files")
     with Place() as place:

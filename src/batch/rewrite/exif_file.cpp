@@ -3,7 +3,9 @@
 #include <utility>
 
 #include "metadata/edit/strip.h"
+#include "metadata/tags/sidecar.h"
 #include "platform/file_view.h"
+#include "platform/paths.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
 
@@ -66,6 +68,11 @@ RewrittenFile StripFile(const std::string& source, const std::string& destinatio
     } else {
       status = rewrite.Fail(Status::FileOpenError, ReasonSentence());
     }
+  }
+  if (const std::string sidecar = FindSidecar(destination);
+      status == Status::Ok && !sidecar.empty()) {
+    rewrite.result.note.Append(
+        TrRecorded("Its sidecar %1 still has metadata.", platform::FileNameOf(sidecar)));
   }
   rewrite.result.status = status;
   return std::move(rewrite.result);
