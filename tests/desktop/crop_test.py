@@ -80,6 +80,31 @@ def through_a_selection(folder):
         assert sizes == [(WIDTH - 10, HEIGHT), (WIDTH, HEIGHT), (WIDTH - 10, HEIGHT)], sizes
 
 
+def pictures_that_cannot_be_read(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.bmp"])
+    damaged = pictures / "b.bmp"
+    damaged.write_bytes(damaged.read_bytes()[:40])
+    before = damaged.read_bytes()
+    with Desktop(folder, pictures, settings=SETTINGS) as desktop:
+        open_crop(desktop, 2)
+        desktop.key("ctrl+shift+Left")
+        desktop.wait(rf"crop-area {WIDTH - 10}x{HEIGHT}\+0\+0")
+        desktop.key("Return")
+        desktop.wait(r"crop-problem")
+        # The rectangle of the other picture is not used for this one.
+        known = desktop.log_text().count(" crop-area ")
+        desktop.key("ctrl+Left", "a", "Return")
+        desktop.screenshot("crop-problem")
+        assert desktop.log_text().count(" crop-area ") == known
+        desktop.key("alt+r")
+        desktop.wait(r"crop closed")
+        desktop.wait(r"batch-line .*a.bmp")
+        desktop.wait(r"One file was processed")
+        assert size_of(pictures / "a.bmp") == (WIDTH - 10, HEIGHT)
+        assert damaged.read_bytes() == before
+
+
 @needs_manager
 def copies_with_ratio_and_angle(folder):
     pictures = folder / "pictures"
@@ -109,4 +134,5 @@ def copies_with_ratio_and_angle(folder):
 
 
 if __name__ == "__main__":
-    run(one_jpeg_without_loss, through_a_selection, copies_with_ratio_and_angle)
+    run(one_jpeg_without_loss, through_a_selection, pictures_that_cannot_be_read,
+        copies_with_ratio_and_angle)

@@ -104,11 +104,15 @@ def files_change_and_come_back(folder):
         assert re.findall(r"edit-steps (.*)", desktop.log_text())[-1] == steps
         desktop.key("Page_Up")
         desktop.wait(r"edit-steps brightness \S+$")
-        desktop.key("Escape")
-        desktop.wait(r"prompt discard-steps")
-        desktop.focus("^Edit$", native=True)
-        desktop.key("Return")
+        # Quitting asks as well.
+        for answer in ("Return", "alt+d"):
+            desktop.focus("Fotomill Professional")
+            desktop.key("ctrl+q")
+            desktop.wait(r"prompt discard-steps")
+            desktop.focus("^Edit$", native=True)
+            desktop.key(answer)
         desktop.wait(r"edit closed")
+        desktop.wait_end()
 
 
 def recipes_are_saved_and_run(folder):
@@ -126,6 +130,14 @@ def recipes_are_saved_and_run(folder):
         path = folder / "data/recipes/zz mine.recipe"
         desktop.wait(r"edit-saved .*/zz mine.recipe")
         assert path.read_text().startswith("brightness ")
+        # A recipe with its own output cannot be edited: saved again, it would lose that.
+        other = folder / "data/recipes/zzz saves.recipe"
+        other.write_text("gray; save to=png\n")
+        desktop.focus("^Edit: ")
+        desktop.key("alt+i", "Up", "Return")
+        desktop.wait(r"prompt recipe-problem zzz saves")
+        desktop.focus("^zzz saves$", native=True)
+        desktop.key("Return")
         # A shipped one replaces the steps; undo brings them back.
         desktop.focus("^Edit: ")
         desktop.key("alt+i", "Return")
@@ -133,12 +145,13 @@ def recipes_are_saved_and_run(folder):
         desktop.wait(r"edit-steps gray")
         desktop.key("ctrl+z")
         desktop.wait(r"edit-steps brightness")
+        other.unlink()
         desktop.key("ctrl+d")
         desktop.wait(r"edit-steps$")
         desktop.key("Escape")
         desktop.wait(r"prompt discard-steps")
         desktop.focus("^Edit$", native=True)
-        desktop.key("Return")
+        desktop.key("alt+d")
         desktop.wait(r"edit closed")
         # The last entry of the Functions menu lists the recipes; the own one is the last of them.
         desktop.focus("Fotomill Professional")

@@ -8,6 +8,7 @@
 #include <numbers>
 #include <utility>
 
+#include "desktop/models/drawing/list_palette.h"
 #include "desktop/models/drawing/rgb_image.h"
 #include "desktop/windows/view/canvas_backdrop.h"
 #include "desktop/windows/widgets/bitmaps.h"
@@ -139,6 +140,7 @@ void CropCanvas::OnMouse(wxMouseEvent& event) {
   const wxPoint place = event.GetPosition();
   if (event.LeftDown()) {
     SetFocus();
+    if (!HasPicture()) return;
     from_ = to_ = place;
     grip_ = GripAtPoint(place);
     start_ = area_.Area();
@@ -171,6 +173,7 @@ void CropCanvas::OnMouse(wxMouseEvent& event) {
 }
 
 void CropCanvas::OnKey(wxKeyEvent& event) {
+  if (!HasPicture()) return event.Skip();
   const int step = event.ShiftDown() ? 10 : 1;
   int right = 0, down = 0;
   switch (event.GetKeyCode()) {
@@ -200,7 +203,7 @@ void CropCanvas::OnPaint(wxPaintEvent&) {
   if (size.x < 1 || size.y < 1) return;
   const Backdrop backdrop = BackdropFor(*this);
   RgbImage pixels = FilledImage(size.x, size.y, backdrop.around);
-  if (shown_ != nullptr) {
+  if (HasPicture()) {
     const wxRect picture = PictureOnScreen();
     const auto device = [scale](int place) {
       return static_cast<int32_t>(std::lround(place * scale));
@@ -210,9 +213,13 @@ void CropCanvas::OnPaint(wxPaintEvent&) {
              backdrop, Scale() < 2, pixels);
   }
   dc.DrawBitmap(BitmapOf(pixels, scale), 0, 0);
-  if (shown_ != nullptr && problem_.empty()) PaintRectangle(dc);
+  if (HasPicture()) PaintRectangle(dc);
   if (!problem_.empty()) {
-    dc.SetTextForeground(*wxWHITE);
+    const auto part = [&](int shift) {
+      return static_cast<unsigned char>(static_cast<uint32_t>(backdrop.around) >> shift);
+    };
+    const Shade text = Readable({0, 0, 0}, {part(0), part(8), part(16)});
+    dc.SetTextForeground(wxColour(text.red, text.green, text.blue));
     dc.DrawLabel(problem_, wxRect(GetClientSize()), wxALIGN_CENTER);
   }
 }

@@ -27,8 +27,8 @@ class CropCanvas : public wxWindow {
 
   void StartAfresh();  // another picture
   void Take(PreviewPointer preview);
-  bool HasPicture() const { return shown_ != nullptr; }
-  void ShowProblem(const wxString& problem);  // instead of a picture
+  bool HasPicture() const { return shown_ != nullptr && problem_.empty(); }
+  void ShowProblem(const wxString& problem);  // instead of the picture
   void SetLines(CropLines lines);
   void SetFixedSize(bool fixed) { fixed_ = fixed; }  // the rectangle can only be moved
   void DrawLevel(bool draw);                         // the next drag draws a line along the horizon

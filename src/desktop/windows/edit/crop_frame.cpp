@@ -155,7 +155,14 @@ void CropFrame::BuildProperties() {
                      event.Skip();
                    }
                  }});
-  properties_->Show();
+  canvas_->Bind(wxEVT_PAINT, &CropFrame::ShowProperties, this);
+}
+
+// At the first paint, as window managers keep them above this window only if they appear after it.
+void CropFrame::ShowProperties(wxPaintEvent& event) {
+  canvas_->Unbind(wxEVT_PAINT, &CropFrame::ShowProperties, this);
+  CallAfter([this] { properties_->ShowWithoutActivating(); });
+  event.Skip();
 }
 
 // --- pictures ---
@@ -163,7 +170,9 @@ void CropFrame::BuildProperties() {
 void CropFrame::ShowPicture(size_t place) {
   faces_.Stop();
   place_ = place;
+  known_ = false;
   canvas_->StartAfresh();
+  UpdateControls();
   maker_->SetPicture(files_[place]);
   platform::FileView file;
   JpegFacts facts;
@@ -189,8 +198,10 @@ void CropFrame::RequestPreview() {
 void CropFrame::PreviewsCame() {
   for (const PreviewPointer& preview : maker_->Fetch()) {
     if (preview->status != Status::Ok) {
+      known_ = false;
       canvas_->ShowProblem(Shown(preview->problem));
       LogEvent("crop-problem", preview->problem);
+      UpdateControls();
       continue;
     }
     // The size of a straightened picture is known exactly only later.
@@ -202,6 +213,7 @@ void CropFrame::PreviewsCame() {
 
 // Shows the rectangle of the picture, or suggests one.
 void CropFrame::PictureKnown(Size size) {
+  known_ = true;
   Choice& choice = choices_[place_];
   const bool same = choice.size.width == size.width && choice.size.height == size.height;
   const Size shown = area_.Picture();
@@ -222,6 +234,7 @@ void CropFrame::PictureKnown(Size size) {
 }
 
 void CropFrame::AreaChanged() {
+  if (!known_) return;
   Choice& choice = choices_[place_];
   choice.seen = true;
   choice.area = area_.Area();
@@ -248,7 +261,7 @@ void CropFrame::SetAngle(double angle) {
 // --- commands ---
 
 void CropFrame::Take() {
-  if (!choices_[place_].seen) return wxBell();
+  if (!known_) return wxBell();
   choices_[place_].taken = true;
   if (strip_ != nullptr) strip_->Mark(place_, true);
   UpdateControls();
@@ -270,6 +283,7 @@ void CropFrame::GoBack() {
 }
 
 void CropFrame::UseWhole() {
+  if (!known_) return wxBell();
   area_.SetArea(area_.Suggested());
   AreaChanged();
 }
@@ -391,6 +405,7 @@ void CropFrame::UpdateControls() {
   change_->Enable(count > 0);
   copies_->Enable(count > 0);
   if (back_ != nullptr) back_->Enable(place_ > 0);
+  if (take_ != nullptr) take_->Enable(known_);
   std::string line(platform::FileNameOf(files_[place_]));
   if (files_.size() > 1) line = Tr("%1 of %2", place_ + 1, files_.size()) + ", " + line;
   if (choice.seen)
@@ -452,8 +467,8 @@ void CropFrame::OnClose(wxCloseEvent& event) {
       files_.size() > 1 && std::ranges::any_of(choices_, [](const Choice& c) { return c.taken; });
   if (taken && event.CanVeto()) {
     wxMessageDialog dialog(this, Label("Close without cropping the pictures?"), Label("Crop"),
-                           wxOK | wxCANCEL | wxICON_QUESTION);
-    dialog.SetOKCancelLabels(Label("&Close"), Label("&Continue"));
+                           wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_QUESTION);
+    dialog.SetOKCancelLabels(Label("&Discard"), Label("&Keep editing"));
     LogEvent("prompt", "discard-crops");
     if (dialog.ShowModal() != wxID_OK) return event.Veto();
   }

@@ -12,6 +12,7 @@
 #include "desktop/windows/edit/apply_steps.h"
 #include "desktop/windows/edit/crop_canvas.h"
 #include "desktop/windows/widgets/background.h"
+#include "desktop/windows/widgets/unsaved_work.h"
 #include "files/cropped_jpeg.h"
 
 class wxButton;
@@ -25,7 +26,7 @@ class Shell;
 
 // A Crop window: a rectangle for one picture, or for each of a selection in turn. Enter takes the
 // rectangle and goes on, Backspace goes back; one batch then crops all pictures that were taken.
-class CropFrame : public wxFrame {
+class CropFrame : public wxFrame, public HoldsWork {
  public:
   // Deletes itself when closed.
   CropFrame(Shell& shell, const std::vector<std::string>& files);
@@ -59,6 +60,7 @@ class CropFrame : public wxFrame {
   };
   wxSizer* BuildButtons(wxWindow* parent);
   void BuildProperties();
+  void ShowProperties(wxPaintEvent& event);
   void ShowPicture(size_t place);
   void RequestPreview();
   void PreviewsCame();
@@ -79,6 +81,7 @@ class CropFrame : public wxFrame {
   std::vector<Choice> choices_;
   size_t place_ = 0;
   CropArea area_;
+  bool known_ = false;  // area_ is of this picture
   bool lossless_ = false;
   uint64_t stepsNumber_ = 0;
   CropCanvas* canvas_ = nullptr;

@@ -44,6 +44,9 @@ void EditFrame::LoadRecipe(const std::string& name, const std::string& text) {
     problem += Shown(mistakes[i].Text()) + "\n";
   if (problem.empty() && recipe.outputs.size() > 1)
     problem = Label("This recipe has several outputs. Run it from the Functions menu.");
+  // Saved again, it would lose them.
+  if (problem.empty() && recipe.outputs.front().hasSave)
+    problem = Label("This recipe also sets formats or names. Run it from the Functions menu.");
   if (!problem.empty()) {
     LogEvent("prompt", "recipe-problem " + name);
     wxMessageBox(problem, Shown(name), wxOK | wxICON_WARNING, this);

@@ -154,8 +154,8 @@ wxSizer* EditFrame::BuildStepButtons(wxWindow* parent) {
     row->Add(button, wxSizerFlags().Border(wxRIGHT, FromDIP(4)));
     return button;
   };
-  add(TrLater("&Up"), [this] { MoveStep(-1); });
-  add(TrLater("Do&wn"), [this] { MoveStep(1); });
+  up_ = add(TrLater("&Up"), [this] { MoveStep(-1); });
+  down_ = add(TrLater("Do&wn"), [this] { MoveStep(1); });
   remove_ = add(TrLater("&Remove"), [this] { RemoveStep(); });
   return row;
 }
@@ -439,7 +439,10 @@ void EditFrame::UpdateControls() {
   const bool any = HasSteps();
   copies_->Enable(any);
   change_->Enable(any);
-  remove_->Enable(steps_.Current() != StepList::kNone);
+  const size_t current = steps_.Current();
+  remove_->Enable(current != StepList::kNone);
+  up_->Enable(current != StepList::kNone && current > 0);
+  down_->Enable(current != StepList::kNone && current + 1 < steps_.Steps().size());
   const wxString zoom = wxString::Format("%ld%%", std::lround(canvas_->Zoom() * 100));
   if (zoom_->GetLabel() != zoom) {
     zoom_->SetLabel(zoom);
@@ -474,8 +477,8 @@ void EditFrame::OnCharHook(wxKeyEvent& event) {
 void EditFrame::OnClose(wxCloseEvent& event) {
   if (changed_ && event.CanVeto()) {
     wxMessageDialog dialog(this, Label("Close without applying the steps?"), Label("Edit"),
-                           wxOK | wxCANCEL | wxICON_QUESTION);
-    dialog.SetOKCancelLabels(Label("&Close"), Label("&Continue"));
+                           wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_QUESTION);
+    dialog.SetOKCancelLabels(Label("&Discard"), Label("&Keep editing"));
     LogEvent("prompt", "discard-steps");
     if (dialog.ShowModal() != wxID_OK) return event.Veto();
   }

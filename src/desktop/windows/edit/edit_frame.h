@@ -10,6 +10,7 @@
 #include "desktop/models/edit/preview_maker.h"
 #include "desktop/models/edit/step_list.h"
 #include "desktop/windows/edit/preview_canvas.h"
+#include "desktop/windows/widgets/unsaved_work.h"
 
 class wxButton;
 class wxChoice;
@@ -27,7 +28,7 @@ class StepBox;
 
 // An Edit window: applies operations to one picture or a selection, with a preview of any of them.
 // Nothing is written before Save copies or Change files, which start a batch and close the window.
-class EditFrame : public wxFrame {
+class EditFrame : public wxFrame, public HoldsWork {
  public:
   // Starts with a step of `first`, or without steps if it is null. Deletes itself when closed.
   EditFrame(Shell& shell, const std::vector<std::string>& files, const Operation* first);
@@ -88,7 +89,7 @@ class EditFrame : public wxFrame {
   double previewSeconds_ = 0;  // of the last quick preview
   wxTreeCtrl* operations_ = nullptr;
   StepBox* stepBox_ = nullptr;
-  wxButton* remove_ = nullptr;
+  wxButton *up_ = nullptr, *down_ = nullptr, *remove_ = nullptr;
   wxStaticText* valuesTitle_ = nullptr;
   wxButton* presets_ = nullptr;
   ParameterPanel* values_ = nullptr;

@@ -56,7 +56,8 @@ wxString ValueText(const ExifEditRow& row, size_t files) {
   return Label("%1 (in %2 of %3 files)", text, row.files, files);
 }
 
-// Asks a question with a box to turn it off; `key` is its setting.
+// Asks a question with a box to turn it off; `key` is its setting. Without it, the first answer
+// holds, so the box has no effect on the others.
 int AskUnlessOff(wxWindow& parent, const wxString& question, const wxString& details, long style,
                  const std::vector<wxString>& buttons, int32_t& key) {
   wxRichMessageDialog dialog(&parent, question, Label("Edit EXIF"), style | wxICON_QUESTION);
@@ -69,7 +70,7 @@ int AskUnlessOff(wxWindow& parent, const wxString& question, const wxString& det
   dialog.ShowCheckBox(Label("Do not ask again (can be re-enabled in Setup)"));
   LogEvent("prompt", "exif " + Utf8(question));
   const int answer = dialog.ShowModal();
-  if (answer != wxID_CANCEL && dialog.IsCheckBoxChecked()) {
+  if ((answer == wxID_OK || answer == wxID_YES) && dialog.IsCheckBoxChecked()) {
     key = 0;
     (void)SaveConfiguration();
   }

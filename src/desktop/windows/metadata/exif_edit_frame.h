@@ -8,6 +8,7 @@
 
 #include "desktop/models/metadata/exif_editor.h"
 #include "desktop/windows/widgets/background.h"
+#include "desktop/windows/widgets/unsaved_work.h"
 
 class wxCheckBox;
 class wxDataViewListCtrl;
@@ -23,7 +24,7 @@ class Shell;
 
 // The EXIF editor: changes values, times and place of one or several files, and writes them in the
 // background. Deletes itself when closed.
-class ExifEditFrame : public wxFrame {
+class ExifEditFrame : public wxFrame, public HoldsWork {
  public:
   ExifEditFrame(Shell& shell, wxWindow* parent, std::vector<std::string> files);
 

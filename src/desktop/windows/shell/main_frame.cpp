@@ -17,6 +17,7 @@
 #include "desktop/windows/shell/function_toolbar.h"
 #include "desktop/windows/shell/picture_windows.h"
 #include "desktop/windows/shell/side_pane.h"
+#include "desktop/windows/widgets/unsaved_work.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -168,6 +169,7 @@ void MainFrame::SettingsChanged() {
 void MainFrame::Report(const std::string& text) { SetStatusText(Shown(text), kMessageField); }
 
 void MainFrame::OnClose(wxCloseEvent& event) {
+  if (event.CanVeto() && !CloseWorkWindows()) return event.Veto();
   if (batches_->Running() && event.CanVeto()) {
     wxMessageDialog dialog(this, Label("A batch is running. Stop it and quit?"), kTitle,
                            wxOK | wxCANCEL | wxICON_WARNING);
