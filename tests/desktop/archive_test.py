@@ -23,6 +23,7 @@ def archive_as_folder(folder):
         desktop.focus("Fotomill Professional")
         desktop.key("Home", "Return")
         desktop.wait(r"archive-folder .*trip.zip$")
+        desktop.wait(r"folder-note .*trip.zip")
         desktop.wait(r"browser tabs=2 .*missing=0 listing=0 .*/trip.zip")
         desktop.screenshot("archive-folder")
         # Convert out of it: next to the archive, not into the temporary folder.

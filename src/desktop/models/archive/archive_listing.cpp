@@ -79,7 +79,7 @@ std::span<const ArchiveColumnFacts> ArchiveColumns() {
       {TrLater("Type"), ArchiveListTypeSize, 60, false},
       {TrLater("Size"), ArchiveListUnpackedSize, 90, true},
       {TrLater("Packed"), ArchiveListPackedSize, 90, true},
-      {TrLater("Saved"), ArchiveListRatioSize, 60, true},
+      {TrLater("Saved"), ArchiveListRatioSize, 75, true},
       {TrLater("Modified"), ArchiveListModifiedSize, 150, false},
   };
   return kColumns;

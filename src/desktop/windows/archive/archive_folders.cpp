@@ -88,12 +88,17 @@ void OpenArchiveFolder(Shell& shell, const std::string& archive) {
       });
 }
 
-std::string FolderForResults(const std::string& folder) {
+std::string ArchiveOfFolder(const std::string& folder) {
   for (const auto& [archive, unpacked] : Kept()) {
     const std::string& home = unpacked->home.Path();
-    if (!home.empty() && folder.starts_with(home)) return platform::FolderOf(archive);
+    if (!home.empty() && folder.starts_with(home)) return archive;
   }
-  return folder;
+  return {};
+}
+
+std::string FolderForResults(const std::string& folder) {
+  const std::string archive = ArchiveOfFolder(folder);
+  return archive.empty() ? folder : platform::FolderOf(archive);
 }
 
 }  // namespace fotomill::desktop

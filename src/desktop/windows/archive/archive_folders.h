@@ -11,6 +11,9 @@ class Shell;
 // pictures opens in the archive manager.
 void OpenArchiveFolder(Shell& shell, const std::string& archive);
 
+// The archive from which a folder, or one above it, was unpacked; empty if there is none.
+std::string ArchiveOfFolder(const std::string& folder);
+
 // The folder for results of functions on a folder: that of the archive, if the folder belongs to an
 // unpacked one, else the folder itself.
 std::string FolderForResults(const std::string& folder);

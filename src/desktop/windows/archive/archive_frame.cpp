@@ -26,9 +26,9 @@
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/picture_windows.h"
 #include "desktop/windows/shell/shell.h"
-#include "desktop/windows/widgets/background.h"
 #include "desktop/windows/widgets/button_row.h"
 #include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/loose_work.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "files/previous_file.h"
 #include "platform/folders.h"
@@ -87,13 +87,13 @@ class ArchiveFrame : public wxFrame {
 
   Shell& shell_;
   const std::string archive_;
-  ArchiveListing listing_;  // written by the background task
+  ArchiveListing listing_;
   std::vector<ArchiveRow> rows_;
   std::shared_ptr<platform::TemporaryFolder> viewed_;  // unpacked for viewing
   wxDataViewListCtrl* list_ = nullptr;
   wxStaticText* summary_ = nullptr;
   const std::shared_ptr<bool> alive_ = std::make_shared<bool>(true);
-  Background work_;  // must be last, so that it ends first
+  LooseWork work_;
 };
 
 ArchiveFrame::ArchiveFrame(Shell& shell, const std::string& archive)
@@ -163,9 +163,12 @@ wxSizer* ArchiveFrame::BuildButtons(wxWindow& panel) {
 // --- list ---
 
 void ArchiveFrame::Read() {
-  work_.Start(
-      *this, [this](const StopToken&) { listing_ = ReadArchiveListing(archive_); },
-      [this](Status) { ShowRows(); });
+  work_.Start([this, archive = archive_](const StopToken&, const LooseWork::Report& report) {
+    report([this, listing = ReadArchiveListing(archive)] {
+      listing_ = listing;
+      ShowRows();
+    });
+  });
 }
 
 void ArchiveFrame::ShowRows() {

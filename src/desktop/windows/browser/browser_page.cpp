@@ -14,6 +14,7 @@
 #include "core/choice_lists.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/browser/details_list.h"
+#include "desktop/windows/browser/folder_note.h"
 #include "desktop/windows/browser/folder_problem.h"
 #include "desktop/windows/browser/path_bar.h"
 #include "desktop/windows/browser/thumbnail_canvas.h"
@@ -74,6 +75,8 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
              [this](wxTimerEvent&) { ShowProblem(Tr("Waiting for %1...", model_.Folder())); });
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   sizer->Add(bar, wxSizerFlags().Expand());
+  note_ = new FolderNote(this);
+  sizer->Add(note_, wxSizerFlags().Expand());
   offer_.Bar()->MoveBeforeInTabOrder(views_);
   sizer->Add(offer_.Bar(), wxSizerFlags().Expand());
   sizer->Add(problem_, wxSizerFlags(1).Expand());
@@ -135,6 +138,7 @@ void BrowserPage::ShowFound(const std::string& folder, const std::vector<std::st
     model_.SetView(view);
     filter_->ChangeValue("");
     path_->ShowFolder(folder);
+    note_->ShowText(Shown(host_.NoteAbout(folder)));
     canvas_->ScrollTo(0);
     ShowProblem({});
     ShowView();
@@ -175,6 +179,7 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
   UseView(kNoModes);
   filter_->ChangeValue("");
   path_->ShowFolder(folder);
+  note_->ShowText(Shown(host_.NoteAbout(folder)));
   canvas_->ScrollTo(0);
   ShowProblem({});
   ShowView();
@@ -215,7 +220,7 @@ void BrowserPage::ShowListing(FolderListing listing, bool complete) {
   if (complete) {
     if (!found_) watch_.Watch(model_.Folder());
     StartFacts();
-    if (!found_ && state == FolderState::Listed) OfferThumbnails();
+    if (!found_ && state == FolderState::Listed && !note_->IsShown()) OfferThumbnails();
     wantedFocus_.clear();
     wantedScroll_ = -1;
     wantedNames_.reset();

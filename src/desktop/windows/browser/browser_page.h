@@ -21,6 +21,7 @@ class wxSimplebook;
 namespace fotomill::desktop {
 
 class DetailsList;
+class FolderNote;
 class FolderProblem;
 class PathBar;
 class ThumbnailCanvas;
@@ -37,6 +38,8 @@ class BrowserHost {
   // Saves the view chosen for a folder.
   virtual void KeepView(const std::string& folder, const FolderView& view) = 0;
   virtual const FolderViews& Views() = 0;  // saved views of folders
+  // What users must know about a folder before they change its files; usually empty.
+  virtual std::string NoteAbout(const std::string& folder) const = 0;
   // Actions on files of the browser, performed by the frame.
   virtual void ViewFile(const std::string& path) = 0;
   // `onFile`: for the selection, otherwise for the folder.
@@ -153,6 +156,7 @@ class BrowserPage : public wxPanel {
   wxSearchCtrl* filter_ = nullptr;
   wxSimplebook* views_ = nullptr;
   FolderProblem* problem_ = nullptr;  // shown instead of the views
+  FolderNote* note_ = nullptr;
   ThumbnailCanvas* canvas_ = nullptr;
   DetailsList* details_ = nullptr;
 };

@@ -278,6 +278,13 @@ void BrowserTabs::KeepView(const std::string& folder, const FolderView& view) {
   viewsTimer_.StartOnce(kViewsMs);
 }
 
+std::string BrowserTabs::NoteAbout(const std::string& folder) const {
+  const std::string archive = ArchiveOfFolder(folder);
+  if (archive.empty()) return {};
+  return Tr("Files unpacked from %1. Changes are not saved in the archive.",
+            platform::FileNameOf(archive));
+}
+
 void BrowserTabs::ViewFile(const std::string& path) {
   if (IsArchiveName(path)) return OpenArchiveFolder(shell_, path);
   shell_.Pictures().ViewFromBrowser(path);

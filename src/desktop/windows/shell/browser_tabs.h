@@ -80,6 +80,7 @@ class BrowserTabs : private BrowserHost {
   DetailColumns& Columns() override { return columns_; }
   void KeepView(const std::string& folder, const FolderView& view) override;
   const FolderViews& Views() override { return views_; }
+  std::string NoteAbout(const std::string& folder) const override;
   void ViewFile(const std::string& path) override;
   void ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) override;
   void RenameFile(const std::string& path, const std::string& name) override;
