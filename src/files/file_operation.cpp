@@ -4,8 +4,10 @@
 #include <set>
 
 #include "catalog/thumbnails/picture_changes.h"
+#include "core/text.h"
 #include "files/numbered_name.h"
 #include "files/previous_file.h"
+#include "files/sidecar_moves.h"
 #include "platform/clock.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
@@ -181,6 +183,60 @@ Outcome UndoStep(FileOperationKind kind, const FileStep& step) {
   return Restore(step.from);
 }
 
+// The sidecars that go along when a file is renamed, moved or copied.
+std::vector<RenamedFile> SidecarsAlong(FileOperationKind kind, const std::string& from,
+                                       const std::string& to) {
+  const bool goes = kind == FileOperationKind::Rename || kind == FileOperationKind::Move ||
+                    kind == FileOperationKind::Copy;
+  return goes && platform::IsRegularFile(from) ? SidecarMoves(from, to)
+                                               : std::vector<RenamedFile>();
+}
+
+bool AnyTaken(const std::vector<RenamedFile>& sidecars) {
+  return std::ranges::any_of(sidecars, [](const RenamedFile& sidecar) {
+    return !EqualIgnoringCase(sidecar.from, sidecar.to) &&
+           platform::ExistenceOf(sidecar.to) == platform::Existence::Yes;
+  });
+}
+
+// A step with the sidecars of its file. `made` are the paths made by the operation so far. Sidecars
+// that stay behind are failures of their own.
+Outcome DoWithSidecars(FileOperationKind kind, const FileStep& step, std::set<std::string>& made,
+                       std::vector<FileOperationFailure>& failures) {
+  std::vector<RenamedFile> sidecars = SidecarsAlong(kind, step.from, step.to);
+  std::erase_if(sidecars, [&](const RenamedFile& one) { return made.contains(one.to); });
+  if (AnyTaken(sidecars)) return Tr(kTaken);
+  Outcome outcome = DoStep(kind, step);
+  if (!outcome.empty()) return outcome;
+  if (!step.to.empty()) made.insert(step.to);
+  for (const RenamedFile& sidecar : sidecars) {
+    const Outcome along = DoStep(kind, {sidecar.from, sidecar.to});
+    if (along.empty()) made.insert(sidecar.to);
+    if (!along.empty()) failures.push_back({sidecar.from, along});
+  }
+  return {};
+}
+
+// Adds the places that sidecars left to `undone`.
+Outcome UndoWithSidecars(FileOperationKind kind, const FileStep& step,
+                         std::set<std::string>& undone,
+                         std::vector<FileOperationFailure>& failures) {
+  const bool copy = kind == FileOperationKind::Copy;
+  const std::vector<RenamedFile> sidecars =
+      copy ? SidecarsAlong(kind, step.from, step.to) : SidecarsAlong(kind, step.to, step.from);
+  if (!copy && AnyTaken(sidecars)) return Tr(kTaken);
+  Outcome outcome = UndoStep(kind, step);
+  if (!outcome.empty()) return outcome;
+  for (const RenamedFile& sidecar : sidecars) {
+    if (copy && platform::ExistenceOf(sidecar.to) == platform::Existence::No) continue;
+    const Outcome along =
+        copy ? RemoveCopy({sidecar.from, sidecar.to}) : MoveOne(sidecar.from, sidecar.to);
+    undone.insert(copy ? sidecar.to : sidecar.from);
+    if (!along.empty()) failures.push_back({copy ? sidecar.to : sidecar.from, along});
+  }
+  return {};
+}
+
 // How a completed step, or with `back` an undone one, affects thumbnails.
 PictureChange ChangeBy(FileOperationKind kind, const FileStep& step, bool back) {
   switch (kind) {
@@ -226,8 +282,9 @@ FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::s
     if (target == path)
       target = platform::JoinFolder(folder, options.duplicatePrefix + std::string(name));
     const TakenTest taken = [&](const std::string& candidate) {
-      return planned.contains(candidate) ? platform::Existence::Yes
-                                         : platform::ExistenceOf(candidate);
+      return planned.contains(candidate) || AnyTaken(SidecarsAlong(kind, path, candidate))
+                 ? platform::Existence::Yes
+                 : platform::ExistenceOf(candidate);
     };
     if (taken(target) == platform::Existence::Yes) {
       (void)MakeNumberedVariant(target, options.firstVariant, options.lastVariant, taken);
@@ -242,9 +299,12 @@ FileOperationResult CarryOut(const FileOperation& operation,
                              const FileOperationProgress& progress) {
   FileOperationResult result{{operation.kind, {}}, {}};
   std::vector<PictureChange> changes;
+  std::set<std::string> made;
   for (size_t i = 0; i < operation.steps.size(); ++i) {
     if (progress && !progress(i, operation.steps.size())) break;
-    const Outcome outcome = DoStep(operation.kind, operation.steps[i]);
+    if (made.contains(operation.steps[i].to)) continue;  // a sidecar that went along
+    const Outcome outcome =
+        DoWithSidecars(operation.kind, operation.steps[i], made, result.failures);
     if (outcome.empty()) {
       result.done.steps.push_back(operation.steps[i]);
       changes.push_back(ChangeBy(operation.kind, operation.steps[i], false));
@@ -260,10 +320,15 @@ FileOperationResult CarryOut(const FileOperation& operation,
 FileOperationResult Revert(const FileOperation& operation, const FileOperationProgress& progress) {
   FileOperationResult result{{operation.kind, {}}, {}};
   std::vector<PictureChange> changes;
+  std::set<std::string> undone;
   for (size_t i = operation.steps.size(); i > 0; --i) {
     if (progress && !progress(operation.steps.size() - i, operation.steps.size())) break;
     const FileStep& step = operation.steps[i - 1];
-    const Outcome outcome = UndoStep(operation.kind, step);
+    if (undone.contains(step.to)) {  // a sidecar that went along
+      result.done.steps.insert(result.done.steps.begin(), step);
+      continue;
+    }
+    const Outcome outcome = UndoWithSidecars(operation.kind, step, undone, result.failures);
     if (outcome.empty()) {
       result.done.steps.insert(result.done.steps.begin(), step);
       changes.push_back(ChangeBy(operation.kind, step, true));

@@ -71,7 +71,8 @@ FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::s
                                 const FileOperationOptions& options = {});
 
 // Performs the steps of an operation. Never replaces a file: a step fails if its destination exists
-// by then. Keeps file times. Thumbnail files follow their pictures or are deleted with them, and
+// by then. Keeps file times. Sidecars go along with files that are renamed, moved or copied.
+// Thumbnail files follow their pictures or are deleted with them, and
 // database records of pictures that are no longer there are marked as deleted. May take long; any
 // thread.
 FileOperationResult CarryOut(const FileOperation& operation,

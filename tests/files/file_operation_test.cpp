@@ -60,6 +60,37 @@ TEST_F(FileOperationTest, EveryOperationCanBeUndoneAndRedone) {
   }
 }
 
+TEST_F(FileOperationTest, SidecarsGoAlong) {
+  for (const FileOperationKind kind : {FileOperationKind::Move, FileOperationKind::Copy}) {
+    SCOPED_TRACE(static_cast<int>(kind));
+    const bool copy = kind == FileOperationKind::Copy;
+    WriteText(From("a.png.xmp"), "side");
+    WriteText(From("b.xmp"), "b");
+    // also if they are listed themselves, before or after
+    for (const std::vector<std::string>& listed :
+         {std::vector{From("a.png"), From("b.png")},
+          std::vector{From("a.png"), From("a.png.xmp"), From("b.png")},
+          std::vector{From("a.png.xmp"), From("a.png"), From("b.png")}}) {
+      const FileOperationResult done =
+          CarryOut(PlanFileOperation(kind, listed, folder_.Path("to")));
+      EXPECT_THAT(done.failures, IsEmpty());
+      EXPECT_THAT(Names("to"), ElementsAre("a.png", "a.png.xmp", "b.png", "b.xmp"));
+      EXPECT_EQ(Names("from").size(), copy ? 5u : 1u);
+      EXPECT_THAT(Revert(done.done).failures, IsEmpty());
+      EXPECT_THAT(Names("to"), IsEmpty());
+      EXPECT_THAT(Names("from"), ElementsAre("a.png", "a.png.xmp", "b.png", "b.xmp", "sub"));
+    }
+    WriteText(To("a.png.xmp"), "of another");
+    const FileOperation planned = PlanFileOperation(kind, {From("a.png")}, folder_.Path("to"));
+    EXPECT_NE(planned.steps[0].to, To("a.png"));
+    const FileOperation forced{kind, {{From("a.png"), To("a.png")}}};
+    EXPECT_EQ(CarryOut(forced).failures.size(), 1u);
+    EXPECT_THAT(Names("to"), ElementsAre("a.png.xmp"));
+    EXPECT_EQ(ReadText(To("a.png.xmp")), "of another");
+    std::filesystem::remove(To("a.png.xmp"));
+  }
+}
+
 // Thumbnail files go where their pictures go, and records of what is no longer there are marked.
 TEST_F(FileOperationTest, ThumbnailsFollowOrGo) {
   const std::string dataBefore = DataFolder();

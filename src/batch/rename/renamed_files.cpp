@@ -1,5 +1,6 @@
 #include "batch/rename/renamed_files.h"
 
+#include "core/text.h"
 #include "files/numbered_name.h"
 #include "files/rename_plan.h"
 #include "files/sidecar_moves.h"
@@ -72,7 +73,8 @@ platform::CommitResult RenamedFiles::Rename(const std::string& from, const std::
   const std::vector<RenamedFile> sidecars = SidecarMoves(from, to);
   for (const RenamedFile& sidecar : sidecars) {
     // nor is a sidecar given to another picture
-    if (Exists(sidecar.to)) return Refused(sidecar.to, platform::CommitResult::Taken);
+    const bool same = EqualIgnoringCase(sidecar.from, sidecar.to);  // maybe, for the system
+    if (!same && Exists(sidecar.to)) return Refused(sidecar.to, platform::CommitResult::Taken);
   }
   if (!dryRun_) {
     noted_ =
