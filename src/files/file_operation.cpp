@@ -159,14 +159,14 @@ Outcome DoStep(FileOperationKind kind, const FileStep& step) {
 
 // Trashes a copy, unless it was edited since.
 Outcome RemoveCopy(const FileStep& step) {
-  const platform::FileFacts copy = platform::FactsOf(step.to),
-                            original = platform::FactsOf(step.from);
-  if (copy.kind == platform::FileKind::Missing) return Tr(kGone);
-  const bool changed = copy.kind == platform::FileKind::Regular &&
-                       original.kind == platform::FileKind::Regular &&
-                       (copy.size != original.size || copy.modified != original.modified);
-  if (changed) return Tr("The copy was changed since, so it was left alone.");
+  if (platform::FactsOf(step.to).kind == platform::FileKind::Missing) return Tr(kGone);
+  if (step.made.there && platform::StampOf(step.to) != step.made)
+    return Tr("The copy was changed since, so it was left alone.");
   return TrashOne(step.to);
+}
+
+void NoteCopy(FileStep& step) {
+  if (platform::IsRegularFile(step.to)) step.made = platform::StampOf(step.to);
 }
 
 Outcome UndoStep(FileOperationKind kind, const FileStep& step) {
@@ -307,10 +307,12 @@ FileOperationResult CarryOut(const FileOperation& operation,
         DoWithSidecars(operation.kind, operation.steps[i], made, result.failures);
     if (outcome.empty()) {
       result.done.steps.push_back(operation.steps[i]);
+      if (operation.kind == FileOperationKind::Copy) NoteCopy(result.done.steps.back());
       changes.push_back(ChangeBy(operation.kind, operation.steps[i], false));
       SettleThumbnailFile(operation.kind, changes.back());
     } else if (!WentWithPicture(operation.steps[i].from, changes)) {
       result.failures.push_back({operation.steps[i].from, outcome});
+      result.left.push_back(operation.steps[i]);
     }
   }
   MarkChangedRecords(changes);
@@ -335,6 +337,7 @@ FileOperationResult Revert(const FileOperation& operation, const FileOperationPr
       SettleThumbnailFile(operation.kind, changes.back());
     } else {
       result.failures.push_back({step.to.empty() ? step.from : step.to, outcome});
+      result.left.insert(result.left.begin(), step);
     }
   }
   MarkChangedRecords(changes);
@@ -461,6 +464,14 @@ FileOperation UndoList::PopRedo() {
   undone_.pop_back();
   return operation;
 }
+
+void UndoList::KeepLast(std::vector<FileOperation>& list, FileOperation operation) const {
+  if (!operation.steps.empty() && list.size() < most_)
+    list.insert(list.begin(), std::move(operation));
+}
+
+void UndoList::NotUndone(FileOperation operation) { KeepLast(done_, std::move(operation)); }
+void UndoList::NotRedone(FileOperation operation) { KeepLast(undone_, std::move(operation)); }
 
 void UndoList::Undone(FileOperation operation) { Keep(undone_, std::move(operation)); }
 void UndoList::Redone(FileOperation operation) { Keep(done_, std::move(operation)); }

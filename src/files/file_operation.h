@@ -8,6 +8,7 @@
 #include <vector>
 
 #include "catalog/history/file_history.h"
+#include "platform/held_file.h"
 
 namespace fotomill {
 
@@ -31,6 +32,8 @@ struct FileStep {
   std::string to;  // empty for Trash, Turn, Tag and Change
   // Turn, Tag, Change: the previous contents; after Revert, those before the undo
   std::shared_ptr<PreviousFile> previous = {};
+  // Copy: the state of the new file when it was made; not there: it is a folder
+  platform::FileStamp made = {};
 };
 
 // The steps of one operation, in order.
@@ -50,6 +53,7 @@ struct FileOperationResult {
   FileOperation done;
   std::vector<FileOperationFailure> failures;
   std::string note = {};  // a remark about the completed steps, a sentence
+  std::vector<FileStep> left = {};  // the steps that failed
 };
 
 // Settings for an operation: the range for numbered
@@ -118,9 +122,14 @@ class UndoList {
   FileOperation PopRedo();               // as PopUndo; the list must not be empty
   void Undone(FileOperation operation);  // the steps that were undone; they can be redone
   void Redone(FileOperation operation);  // the steps that were redone
+  // The steps of an operation that could not be undone, with the previous files they need: undone
+  // again last, so that they are not in the way of others.
+  void NotUndone(FileOperation operation);
+  void NotRedone(FileOperation operation);  // the same for steps that could not be redone
 
  private:
   void Keep(std::vector<FileOperation>& list, FileOperation operation);
+  void KeepLast(std::vector<FileOperation>& list, FileOperation operation) const;
   void Shorten(std::vector<FileOperation>& list) const;
 
   size_t most_;

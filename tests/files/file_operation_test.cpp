@@ -261,6 +261,32 @@ TEST_F(FileOperationTest, CopiesInTheSameFolderAreCalledDuplicates) {
   EXPECT_EQ(plan.steps.at(0).to, From("b [1].png")) << "without a prefix";
 }
 
+TEST_F(FileOperationTest, CopiesEditedWithinASecondAreLeftAlone) {
+  const auto plan = PlanFileOperation(FileOperationKind::Copy, {From("a.png"), From("b.png")},
+                                      folder_.Path("to"));
+  const FileOperationResult done = CarryOut(plan);
+  WriteText(To("a.png"), "A.png");  // as long as before
+  const FileOperationResult undone = Revert(done.done);
+  EXPECT_THAT(Names("to"), ElementsAre("a.png"));
+  ASSERT_EQ(undone.left.size(), 1u);
+  EXPECT_EQ(undone.left[0].to, To("a.png"));
+}
+
+TEST(UndoList, KeepsWhatCouldNotBeUndone) {
+  UndoList list(2);
+  for (const char* name : {"a", "b"}) list.Add({FileOperationKind::Rename, {{name, "x"}}});
+  const FileOperation failed = list.PopUndo();
+  list.NotUndone(failed);
+  list.Undone({});
+  EXPECT_EQ(list.UndoName(), "rename of a") << "the others come first";
+  list.Undone(list.PopUndo());
+  EXPECT_EQ(list.UndoName(), "rename of b");
+  list.NotUndone({});
+  list.NotRedone(list.PopUndo());
+  EXPECT_FALSE(list.CanUndo());
+  EXPECT_EQ(list.RedoName(), "rename of a");
+}
+
 TEST(UndoList, KeepsALimitedNumber) {
   UndoList list(2);
   const auto operation = [](const char* name) {

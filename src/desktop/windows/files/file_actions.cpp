@@ -293,6 +293,7 @@ void FileActions::Undo() {
       [this](FileOperationResult result) {
         Took(result.done, true);
         SelectResults(result.done, true);
+        undo_.NotUndone({result.done.kind, std::move(result.left)});
         undo_.Undone(std::move(result.done));
       });
 }
@@ -306,6 +307,7 @@ void FileActions::Redo() {
       [this](FileOperationResult result) {
         Took(result.done, false);
         SelectResults(result.done, false);
+        undo_.NotRedone({result.done.kind, std::move(result.left)});
         undo_.Redone(std::move(result.done));
       });
 }
