@@ -76,6 +76,7 @@ ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model,
     const int beyond = mouse.y < 0 ? mouse.y : std::max(mouse.y - GetClientSize().y, 0);
     if (banding_ && beyond != 0) ScrollTo(scroll_ + beyond);
   });
+  aheadTimer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) { CutNamesAhead(); });
   MeasureCells();
 }
 

@@ -79,7 +79,14 @@ class ThumbnailCanvas : public wxWindow {
   void DrawPlaceholder(wxDC& dc, size_t line, const wxRect& square, bool unreadable,
                        const Looks& looks);
   const wxBitmap& PlaceholderBitmap(bool unreadable, int side, const wxColour& background);
-  wxString CutName(wxDC& dc, const std::string& name, int width);
+  // A name as it fits a cell, and its width.
+  struct CutText {
+    wxString text;
+    int width = 0;
+  };
+  const CutText& CutName(wxDC& dc, const std::string& name, int width);
+  int NameWidth() const;
+  void CutNamesAhead();
   const wxBitmap& BitmapOfThumbnail(const ThumbnailPointer& thumbnail);
   ThumbnailRequest RequestOf(size_t line) const;
   std::vector<ThumbnailRequest> StandInsFor(const CellLayout::Range& lines) const;
@@ -124,7 +131,8 @@ class ThumbnailCanvas : public wxWindow {
     wxBitmap bitmap;
   };
   std::deque<DrawnPlaceholder> placeholders_;
-  std::unordered_map<std::string, wxString> cutNames_;
+  std::unordered_map<std::string, CutText> cutNames_;
+  wxTimer aheadTimer_;  // until the next names are cut
   int cutWidth_ = 0;
 
   std::optional<wxPoint> pressed_;  // where the left button was pressed, in list coordinates

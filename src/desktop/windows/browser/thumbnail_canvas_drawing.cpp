@@ -1,5 +1,6 @@
 #include <wx/control.h>
 #include <wx/dcclient.h>
+#include <wx/dcmemory.h>
 #include <wx/settings.h>
 
 #include <algorithm>
@@ -23,6 +24,7 @@ namespace {
 constexpr double kBitmapBytes = 12e6;  // of bitmaps that are not on the screen
 constexpr double kPixelBytes = 11;     // of a bitmap: its own, and two copies of the toolkit
 constexpr size_t kMostCutNames = 5000;
+constexpr int kAheadMs = 5;  // after painting
 constexpr unsigned long kInkOnPaper = 0x3D3D90;  // for an extension on the sheet, 0xBBGGRR
 
 }  // namespace
@@ -65,6 +67,7 @@ void ThumbnailCanvas::Paint() {
   ++paints_;
   for (size_t line = visible.first; line < visible.end; ++line) DrawCell(dc, line, looks);
   DropBitmaps();
+  if (!aheadTimer_.IsRunning()) aheadTimer_.StartOnce(kAheadMs);
   if (banding_ && pressed_) {
     const wxRect band(
         wxPoint(std::min(pressed_->x, bandEnd_.x),
@@ -91,7 +94,7 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
     dc.DrawRoundedRectangle(cell, FromDIP(5));
   }
   if (focused) {
-    dc.SetPen(wxPen(selected ? looks.selectedText : looks.selected, FromDIP(1), wxPENSTYLE_DOT));
+    dc.SetPen(wxPen(selected ? looks.selectedText : looks.selected, FromDIP(1)));
     dc.SetBrush(*wxTRANSPARENT_BRUSH);
     dc.DrawRoundedRectangle(wxRect(cell).Deflate(FromDIP(2)), FromDIP(4));
   }
@@ -104,16 +107,16 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
     DrawPlaceholder(dc, line, icon, false, looks);
     const int left = icon.GetRight() + padding;
     dc.SetTextForeground(text);
-    dc.DrawText(CutName(dc, item.name, cell.GetRight() - left - padding), left,
+    dc.DrawText(CutName(dc, item.name, cell.GetRight() - left - padding).text, left,
                 cell.y + (cell.height - textHeight_) / 2);
     return;
   }
   const wxRect square(cell.x + (cell.width - square_) / 2, cell.y + padding, square_, square_);
   DrawPicture(dc, line, square, looks);
   if (line == editedLine_) return;
-  const wxString name = CutName(dc, item.name, cell.width - 2 * FromDIP(3));
+  const CutText& name = CutName(dc, item.name, NameWidth());
   dc.SetTextForeground(text);
-  dc.DrawText(name, cell.x + (cell.width - dc.GetTextExtent(name).x) / 2,
+  dc.DrawText(name.text, cell.x + (cell.width - name.width) / 2,
               square.GetBottom() + 1 + padding);
 }
 
@@ -204,14 +207,33 @@ const wxBitmap& ThumbnailCanvas::PlaceholderBitmap(bool unreadable, int side,
   return placeholders_.back().bitmap;
 }
 
-wxString ThumbnailCanvas::CutName(wxDC& dc, const std::string& name, int width) {
+const ThumbnailCanvas::CutText& ThumbnailCanvas::CutName(wxDC& dc, const std::string& name,
+                                                         int width) {
   if (width != cutWidth_ || cutNames_.size() > kMostCutNames) cutNames_.clear();
   cutWidth_ = width;
   const auto [found, added] = cutNames_.try_emplace(name);
-  if (added)
-    found->second =
+  if (added) {
+    const wxString text =
         wxControl::Ellipsize(Shown(name), dc, wxELLIPSIZE_MIDDLE, width, wxELLIPSIZE_FLAGS_NONE);
+    found->second = {text, dc.GetTextExtent(text).x};
+  }
   return found->second;
+}
+
+int ThumbnailCanvas::NameWidth() const { return layout_.Cell(0).width - 2 * FromDIP(3); }
+
+// Measuring texts takes most of the time to paint new cells: does it for the next screen after
+// painting this one.
+void ThumbnailCanvas::CutNamesAhead() {
+  if (square_ == 0) return;
+  wxBitmap pixel(1, 1);
+  wxMemoryDC dc(pixel);
+  dc.SetFont(GetFont());
+  const int height = GetClientSize().y;
+  const int64_t top = std::max<int64_t>(scroll_ + direction_ * height, 0);
+  const CellLayout::Range next = layout_.LinesBetween(top, top + height);
+  for (size_t line = next.first; line < next.end; ++line)
+    (void)CutName(dc, model_.Line(line).name, NameWidth());
 }
 
 const wxBitmap& ThumbnailCanvas::BitmapOfThumbnail(const ThumbnailPointer& thumbnail) {
