@@ -61,8 +61,6 @@ int32_t DecodedSide(const Step& first, const PictureRecord& facts) {
   return first.operation->decodedSide(first.arguments, size, facts.metadata);
 }
 
-bool HasQuality(std::string_view extension) { return extension == "JPG" || extension == "WEBP"; }
-
 std::string ReadFormat(const SaveStep& save, const BatchJob& job, const FormatLookup& lookup,
                        BatchOutput& output) {
   // The command line overrides the recipe.
@@ -78,6 +76,8 @@ std::string ReadFormat(const SaveStep& save, const BatchJob& job, const FormatLo
 }
 
 }  // namespace
+
+bool HasQuality(std::string_view extension) { return extension == "JPG" || extension == "WEBP"; }
 
 FileFunction FunctionOfFamily(Family family) {
   constexpr FileFunction kFunctions[] = {

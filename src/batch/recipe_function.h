@@ -2,6 +2,7 @@
 
 #include <memory>
 #include <string>
+#include <string_view>
 
 #include "batch/run.h"
 #include "operations/recipe.h"
@@ -19,6 +20,10 @@ using FormatLookup = std::function<std::string(const std::string& extension, int
 // success, else what is wrong with the recipe's formats, as a sentence.
 std::string SetRecipe(std::shared_ptr<const Recipe> recipe, const std::string& copyrightHolder,
                       const BatchJob& job, const FormatLookup& lookup, BatchFunction& function);
+
+// Whether outputs of a format have a quality and can be limited in size; `extension` in uppercase,
+// without dot.
+bool HasQuality(std::string_view extension);
 
 // The function recorded in the file history for operations of a family; also decides the prefix of
 // their outputs.

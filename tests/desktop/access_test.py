@@ -222,12 +222,15 @@ def batch_windows_are_heard(folder):
     make_pictures(pictures, ["a.bmp", "b.png"])
     (pictures / "a.gif").write_bytes(b"GIF89a and no more")
     with ReadDesktop(folder, pictures, settings=["CloseProgressWhenDone=0", "DestForceSourceDir=1",
+                                                 "DestinationWindowCombined=0",
                                                  "DefaultFileExtension=png"]) as desktop:
         desktop.wait(r"lines=3 .*listing=0")
         desktop.focus("Fotomill Professional")
         desktop.key("ctrl+a", "ctrl+e")
         desktop.wait(r"prompt destination")
         desktop.focus("^Convert$")
+        desktop.key("Return")
+        desktop.wait(r"destination-part folder")
         desktop.key("Return")
         desktop.wait(r"prompt format")
         desktop.focus("^Destination$")

@@ -18,9 +18,6 @@ def start_convert(desktop):
 
 def confirm(desktop):
     desktop.key("Return")
-    desktop.wait(r"prompt format Write files to the \w+ format")
-    desktop.focus("^Destination$")
-    desktop.key("Return")
 
 
 def convert_and_collide(folder):
@@ -110,6 +107,35 @@ def destination_step(folder):
         desktop.key("Return")
         desktop.wait(rf"batch-line .*one.bmp -> {pictures}/out/one.jpg")
         desktop.wait(r"batch closes")
+
+
+def size_quality_and_name(folder):
+    """A smaller JPEG with a pattern for its name; the values come back."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["one.bmp"])
+    with Desktop(folder, pictures, settings=["DefaultFileExtension=jpg",
+                                             "DestForceSourceDir=1"]) as desktop:
+        desktop.wait(r"lines=1 .*missing=0 listing=0")
+        start_convert(desktop)
+        desktop.key("alt+s", "ctrl+a")
+        desktop.type("50%")
+        desktop.key("alt+q", "Down", "Tab", "ctrl+a")
+        desktop.type("40")
+        desktop.key("alt+n", "ctrl+a")
+        desktop.type("%F-small")
+        desktop.wait(r"destination First: .*/one-small.jpg ")
+        desktop.screenshot("destination-all")
+        desktop.key("Return")
+        desktop.wait(r"batch-line .*one.bmp -> .*one-small.jpg")
+        desktop.wait(r"batch closes")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+    data = (pictures / "one-small.jpg").read_bytes()
+    frame = data.index(b"\xff\xc0") + 5
+    assert data[frame:frame + 4] == bytes([0, 56, 0, 75]), data[frame:frame + 4]
+    text = (folder / "data/Fotomill Professional 11.ini").read_text()
+    assert "DestinationNamePattern=%F-small\n" in text and "DestinationResize=50%\n" in text, text
 
 
 def destination_in_parts(folder):
@@ -301,9 +327,6 @@ def errors_stay_and_abort_stops(folder):
             if path.read_bytes()[:2] not in (b"II", b"MM") or path.stat().st_size < 1000:
                 raise Failure(f"{path.name} is not whole")
         # It starts, while the first one's box stays open for reading.
-        desktop.wait(r"prompt format")
-        desktop.focus("^Destination$")
-        desktop.key("Return")
         desktop.wait(r"batch-line .*a.gif: ")
         desktop.wait(r"batch ended")
         desktop.screenshot("errors")
@@ -331,6 +354,7 @@ def resize_to_a_named_size(folder):
             assert max(sizes) == 16, sizes
 
 
-run(convert_and_collide, destination_step, destination_in_parts, resize_to_a_named_size,
+run(convert_and_collide, destination_step, size_quality_and_name,
+    destination_in_parts, resize_to_a_named_size,
     name_prompt, previews_when_wanted,
     box_shows_work, raised_at_the_end, errors_stay_and_abort_stops)

@@ -1,5 +1,6 @@
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <filesystem>
 
 #include "batch/destination_name.h"
@@ -45,11 +46,82 @@ TEST(Destination, PreviewsTheOutputFolder) {
   }
 }
 
-TEST(Destination, FormatsAreThoseOfTheDefaultFormat) {
-  std::vector<std::string> extensions;
+TEST(Destination, FurtherFormatsFollowThoseOfTheDefaultFormat) {
+  std::vector<std::string> usual, further;
+  for (const DestinationFormat& format : DestinationFormats()) {
+    EXPECT_TRUE(format.further || further.empty());
+    (format.further ? further : usual).push_back(format.extension);
+  }
+  EXPECT_EQ(usual, DestinationExtensions());  // no plug-ins in this test
+  const auto has = [&](const char* extension) {
+    return std::ranges::count(further, extension) == 1;
+  };
+  EXPECT_TRUE(has("gif"));
+  EXPECT_TRUE(has("webp"));
+  EXPECT_FALSE(has("jpeg"));  // the same as jpg
+  EXPECT_FALSE(has("avi"));   // cannot be written
   for (const DestinationFormat& format : DestinationFormats())
-    extensions.push_back(format.extension);
-  EXPECT_EQ(extensions, DestinationExtensions());
+    EXPECT_EQ(JobFor({.extension = format.extension, .folder = {}}).formatIndex, format.row);
+}
+
+TEST(Destination, SizesAreTypedFreely) {
+  struct {
+    const char *typed, *step;  // null: refused
+  } const rows[] = {
+      {"", ""},         {"  ", ""},          {"50%", "resize 50%"},
+      {"1600", "resize 1600"},               {"800 x 600", "resize 800x600"},
+      {"640 \u00D7 480", "resize 640x480"},  {"big", nullptr},
+      {"0x0", nullptr}, {"10; flip horizontal", nullptr},
+  };
+  for (const auto& row : rows) {
+    std::string step = "old";
+    EXPECT_EQ(ResizeStep(row.typed, step), row.step != nullptr) << row.typed;
+    EXPECT_EQ(step, row.step == nullptr ? "" : row.step) << row.typed;
+  }
+}
+
+TEST(Destination, AddsSizeQualityAndNameToARecipe) {
+  const test::ScopedSettings keep;
+  const test::TemporaryFolder folder;
+  SetDataFolder(folder.Path());
+  fs::create_directories(folder.Path("recipes"));
+  test::WriteText(folder.Path("recipes/two.recipe"),
+                  "sharpen 0.5\noutput a\nsave name=own quality=11\noutput b\nsave\n");
+  const std::vector<std::string> files{folder.Path("x.bmp")};
+  DestinationChoice choice{.extension = "jpg",
+                           .folder = folder.Path("out"),
+                           .resize = "resize 50%",
+                           .name = "%F-small",
+                           .quality = 80};
+  EXPECT_EQ(DestinationProblem(choice), "");
+  EXPECT_EQ(OutlookOf(choice, files).first, folder.Path("out/x-small.jpg"));
+  BatchFunction function = FunctionFor(choice, JobFor(choice));
+  ASSERT_EQ(function.outputs.size(), 1u);
+  EXPECT_EQ(function.outputs[0].quality, 80);
+  EXPECT_EQ(function.history, FileFunction::Transform);
+
+  choice.recipe = "two";
+  function = FunctionFor(choice, JobFor(choice));
+  ASSERT_EQ(function.outputs.size(), 2u);
+  EXPECT_EQ(function.outputs[0].quality, 11);
+  EXPECT_EQ(function.outputs[1].quality, 80);
+  EXPECT_EQ(function.outputs[0].name(files[0], nullptr), "own");
+  EXPECT_EQ(function.outputs[1].name(files[0], nullptr), "x-small");
+  EXPECT_EQ(OutlookOf(choice, files).first, folder.Path("out/own.jpg"));
+
+  // Names with facts of the picture are shown as typed; formats without quality have none.
+  choice = {.extension = "png", .folder = folder.Path("out"), .name = "%D", .quality = 80};
+  EXPECT_EQ(OutlookOf(choice, files).first, folder.Path("out/%D.png"));
+  EXPECT_EQ(FunctionFor(choice, JobFor(choice)).outputs.at(0).quality, 0);
+  choice.name = "%Q";
+  EXPECT_NE(DestinationProblem(choice), "");
+  choice.name = "a/b";
+  EXPECT_NE(DestinationProblem(choice), "");
+  choice.name = "";
+  choice.recipe = "none of that name";
+  EXPECT_NE(DestinationProblem(choice), "");
+  EXPECT_TRUE(FunctionFor({.extension = "png", .folder = {}}, {}).outputs.empty());
+  SetDataFolder({});
 }
 
 TEST(Destination, TheStepBeginsWithTheLastFormatAndTheDefaultStays) {

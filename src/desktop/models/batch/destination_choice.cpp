@@ -7,6 +7,8 @@
 #include "batch/new_job.h"
 #include "batch/recipe_function.h"
 #include "core/text.h"
+#include "operations/macros.h"
+#include "operations/recipe_library.h"
 #include "platform/existence.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -22,8 +24,28 @@ namespace fotomill::desktop {
 
 namespace {
 
+// Writable rows that are not in the destination list. Rows that write the same files as a listed
+// one, such as JPEG besides JPG, are left out.
+std::vector<int32_t> FurtherRows() {
+  constexpr uint32_t kNeverListed = FMT_WALLPAPER | FMT_CLIPBOARD | FMT_SPARE;
+  std::vector<WriteOperation> listed;
+  for (const int32_t row : DestinationRows()) listed.push_back(FormatRow(row).write);
+  std::vector<int32_t> further;
+  for (int32_t row = 0; row < formatCount; ++row) {
+    const FormatEntry& entry = FormatRow(row);
+    if (!CanWrite(entry) || entry.enabled == 0 || (entry.flags & kNeverListed) != 0) continue;
+    if (std::ranges::find(listed, entry.write) != listed.end()) continue;
+    listed.push_back(entry.write);
+    further.push_back(row);
+  }
+  return further;
+}
+
 int32_t RowOf(const std::string& extension) {
   for (const int32_t row : DestinationRows()) {
+    if (EqualIgnoringCase(FormatRow(row).extension, extension)) return row;
+  }
+  for (const int32_t row : FurtherRows()) {
     if (EqualIgnoringCase(FormatRow(row).extension, extension)) return row;
   }
   return FindPluginFormat("x." + extension);
@@ -54,6 +76,59 @@ std::vector<std::string> ExtensionsOf(const DestinationChoice& choice) {
   return extensions;
 }
 
+// The recipe of a choice: its own or that of the library, then the resize step, with the choice's
+// quality and name where the recipe has none. Empty on success, else what is wrong, as a sentence.
+std::string RecipeFor(const DestinationChoice& choice, Recipe& recipe) {
+  std::string text = choice.step, path;
+  if (text.empty() && !choice.recipe.empty()) {
+    if (std::string wrong = FindRecipe(choice.recipe, text, path); !wrong.empty()) return wrong;
+  }
+  Recipe resize;
+  for (const auto& [source, target] :
+       {std::pair(text, &recipe), std::pair(choice.resize, &resize)}) {
+    if (source.empty()) continue;
+    const std::vector<Mistake> mistakes = ReadRecipe(source, KeyTextInForce, *target);
+    if (!mistakes.empty()) return mistakes.front().Text();
+  }
+  if (recipe.outputs.empty()) recipe.outputs.emplace_back();
+  for (RecipeOutput& output : recipe.outputs) {
+    output.steps.insert(output.steps.end(), resize.common.begin(), resize.common.end());
+    if (output.save.name.empty()) output.save.name = choice.name;
+    if (output.save.quality != 0 || output.save.mostBytes != 0) continue;
+    const bool own = choice.extension.empty() || RecipeNamesFormats(choice.step);
+    if (!HasQuality(UpperCase(own ? output.save.to : choice.extension))) continue;
+    output.save.quality = choice.quality;
+    output.save.mostBytes = choice.mostBytes;
+  }
+  return {};
+}
+
+bool NeedsRecipe(const DestinationChoice& choice) {
+  return !choice.recipe.empty() || !choice.step.empty() || !choice.resize.empty() ||
+         !choice.name.empty() || choice.quality != 0 || choice.mostBytes != 0;
+}
+
+// What is wrong with a name pattern, as a sentence.
+std::string NameProblem(const std::string& pattern) {
+  if (const RecordedText wrong = MacroProblem(pattern); !wrong.empty())
+    return Tr("The name %1.", wrong.shown);
+  if (pattern.find_first_of("/\\") != std::string::npos)
+    return Tr("The name must not contain a folder.");
+  return {};
+}
+
+// The path of the first output of a file. If its name needs the picture, with the pattern instead.
+std::string PlannedPath(const std::string& file, const DestinationChoice& choice,
+                        const BatchFunction& function, const BatchJob& job) {
+  const BatchOutput* const output = function.outputs.empty() ? nullptr : &function.outputs[0];
+  std::string base = std::string(job.naming.PrefixOf(function.history))
+                         .append(platform::SplitPath(file).base);
+  if (output != nullptr && output->name)
+    base = output->nameNeedsPicture ? choice.name : output->name(file, nullptr);
+  const std::string_view folder = output == nullptr ? std::string_view() : output->folder;
+  return PlannedDestination(file, {ExtensionOfFormat(job), {}, folder, base}, job);
+}
+
 // Sets the comment of all outputs, in addition to other changes.
 void AddComment(const std::string& comment, BatchFunction& function) {
   if (comment.empty()) return;
@@ -72,9 +147,13 @@ std::vector<DestinationFormat> DestinationFormats() {
     if (CanWrite(entry))
       formats.push_back({LowerCase(entry.extension), std::string(entry.description), row});
   }
+  for (const int32_t row : FurtherRows()) {
+    const FormatEntry& entry = FormatRow(row);
+    formats.push_back({LowerCase(entry.extension), std::string(entry.description), row, true});
+  }
   for (const PluginFormatFacts& format : PluginFormats()) {
     if (format.canWrite)
-      formats.push_back({LowerCase(format.extension), PluginDescription(format), kSpareRow});
+      formats.push_back({LowerCase(format.extension), PluginDescription(format), kSpareRow, true});
   }
   return formats;
 }
@@ -91,6 +170,32 @@ size_t FirstFormat(const std::vector<DestinationFormat>& formats) {
   return first;
 }
 
+bool ResizeStep(const std::string& typed, std::string& step) {
+  step.clear();
+  constexpr std::string_view kTimes = "\u00D7";
+  std::string text;
+  for (size_t i = 0; i < typed.size(); ++i) {
+    const bool times = typed.compare(i, kTimes.size(), kTimes) == 0;
+    if (times) i += kTimes.size() - 1;
+    if (typed[i] != ' ') text += times ? 'x' : typed[i];
+  }
+  if (text.empty()) return true;
+  Recipe recipe;
+  const std::string line = "resize " + text;
+  if (text.find_first_not_of("0123456789.x%") != std::string::npos ||
+      !ReadRecipe(line, KeyTextInForce, recipe).empty())
+    return false;
+  step = line;
+  return true;
+}
+
+DestinationChoice LastChoice() {
+  return {.extension = {},
+          .folder = {},
+          .recipe = std::string(settings.DestinationRecipe.view()),
+          .name = std::string(settings.DestinationNamePattern.view())};
+}
+
 std::vector<std::string> RecentDestinations(const std::string& shown) {
   return OfferedEntries(HistoryList::Destination, shown);
 }
@@ -100,6 +205,10 @@ void KeepChoice(const DestinationChoice& choice, const std::string& shown) {
   for (size_t i = 0; i < formats.size(); ++i) {
     if (formats[i].extension == choice.extension)
       settings.LastFormatSelected = NumberOf(formats, i);
+  }
+  if (choice.step.empty()) {
+    settings.DestinationRecipe = SettingText(choice.recipe);
+    settings.DestinationNamePattern = SettingText(choice.name);
   }
   settings.DestForceSourceDir = choice.folder.empty() ? 1 : 0;
   if (!choice.folder.empty())
@@ -117,6 +226,9 @@ std::string DestinationProblem(const DestinationChoice& choice) {
     const int32_t row = RowOf(extension);
     if (row == kNoFormat || !CanWrite(FormatRow(row))) return Tr("The format cannot be written.");
   }
+  if (std::string wrong = NameProblem(choice.name); !wrong.empty()) return wrong;
+  Recipe recipe;
+  if (std::string wrong = RecipeFor(choice, recipe); !wrong.empty()) return wrong;
   if (choice.folder.empty()) return {};
   if (choice.folder.size() > PathText::Capacity())
     return Tr("The path of the folder is longer than 260 characters.");
@@ -136,10 +248,10 @@ std::string WholeFolder(const std::string& typed, const std::string& shown) {
 DestinationOutlook OutlookOf(const DestinationChoice& choice,
                              const std::vector<std::string>& files) {
   const BatchJob job = JobFor(choice);
-  const std::string_view prefix = job.naming.PrefixOf(FunctionFor(choice, job).history);
+  const BatchFunction function = FunctionFor(choice, job);
   DestinationOutlook outlook;
   for (size_t i = 0; i < std::min(files.size(), kMostLookedUp); ++i) {
-    const std::string path = PlannedDestination(files[i], {}, prefix, job);
+    const std::string path = PlannedPath(files[i], choice, function, job);
     if (i == 0) outlook.first = path;
     outlook.existing += platform::ExistenceOf(path) == platform::Existence::Yes;
   }
@@ -172,8 +284,8 @@ BatchFunction FunctionFor(const DestinationChoice& choice, const BatchJob& job) 
   function.autoOrient = choice.autoOrient;
   function.keepMetadata = choice.keepMetadata;
   auto recipe = std::make_shared<Recipe>();
-  if (!choice.step.empty() && ReadRecipe(choice.step, KeyTextInForce, *recipe).empty()) {
-    function.history = FunctionOfFamily(recipe->First()->family);
+  if (NeedsRecipe(choice) && RecipeFor(choice, *recipe).empty()) {
+    if (recipe->HasSteps()) function.history = FunctionOfFamily(recipe->First()->family);
     const FormatLookup lookup = [](const std::string& extension, int32_t& row, std::string& name) {
       row = RowOf(extension);
       name = UpperCase(extension);

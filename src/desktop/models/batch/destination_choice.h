@@ -14,8 +14,10 @@ struct DestinationFormat {
   std::string extension;    // lowercase, without dot
   std::string description;  // "(PNG) Portable Network Graphics"
   int32_t row = kNoFormat;  // in the registry; the spare row for plug-in formats
+  bool further = false;     // not in the destination list, which comes first
 };
-// All writable formats in registry order, plug-in formats last.
+// All writable formats: the destination list in registry order, then animated and other formats,
+// then those of plug-ins.
 std::vector<DestinationFormat> DestinationFormats();
 // The initial format of the step, given at least one: the last one used (LastFormatSelected), or
 // DefaultFileExtension if UseDefaultDestFormat is on or none was used yet.
@@ -30,12 +32,26 @@ struct DestinationChoice {
   bool keepMetadata = true;
   std::string comment = {};  // of all outputs; empty: keep the source's comment
   std::string step = {};     // a recipe applied to every picture; empty: none
+  std::string recipe = {};   // else a recipe of the library; empty: none
+  std::string resize = {};   // a step applied after it; empty: none
+  std::string name = {};     // pattern with macros, without extension; empty: as the source
+  // for formats with a quality, 1 to 100; 0: from the settings
+  int32_t quality = 0;
+  uint64_t mostBytes = 0;  // maximum file size, instead of a quality; 0: none
 };
+
+// The recipe step for a size as people type it: "1600x1200", "1600", "50%"; empty for an empty text.
+// False if it is none.
+[[nodiscard]] bool ResizeStep(const std::string& typed, std::string& step);
+
+// The choice of the last time, except format and folder.
+DestinationChoice LastChoice();
 
 // Recently used folders, latest first; `shown`,
 // the browser's folder, is the built-in choice.
 std::vector<std::string> RecentDestinations(const std::string& shown);
-// Saves a choice for the next time: format and folder. Does not change DefaultFileExtension.
+// Saves a choice for the next time: format, folder, recipe and name. Does not change
+// DefaultFileExtension.
 void KeepChoice(const DestinationChoice& choice, const std::string& shown);
 
 // The contents of one window of the destination step.
@@ -68,7 +84,7 @@ bool RecipeNamesFormats(const std::string& recipe);
 // A job for a valid choice, ignoring DestForceSourceDir.
 BatchJob JobFor(const DestinationChoice& choice);
 
-// How that job processes each picture.
+// How that job processes each picture; the choice must be valid.
 BatchFunction FunctionFor(const DestinationChoice& choice, const BatchJob& job);
 
 }  // namespace fotomill::desktop

@@ -230,32 +230,32 @@ void TurnSelection(Shell& shell, Orientation turn) {
 namespace {
 
 // Asks for the destination and runs the batch on the frame's selection.
-void RunWithDestination(Shell& shell, const wxString& verb, const std::vector<NamedSize>& sizes) {
+void RunWithDestination(Shell& shell, const wxString& verb, bool resizes) {
   const std::vector<std::string> files = shell.Tabs().SelectedFiles();
   if (files.empty()) return;
-  DestinationDialog dialog(&shell.Window(), verb, files, sizes);
+  DestinationDialog dialog(&shell.Window(), verb, files, resizes);
   LogEvent("prompt", "destination");
   if (dialog.ShowModal() != wxID_OK) return;
   const DestinationChoice choice = dialog.Choice();
   std::vector<BatchFile> batch;
   for (const std::string& file : files) batch.push_back({.name = file, .below = {}, .hint = {}});
   BatchJob job = JobFor(choice);
+  if (dialog.ShowedFormatLast()) job.naming.confirmFormat = false;
   BatchFunction function = FunctionFor(choice, job);
   shell.Batches().Run(std::move(batch), std::move(function), std::move(job));
 }
 
 }  // namespace
 
-void ConvertSelection(Shell& shell) { RunWithDestination(shell, Label("Convert"), {}); }
+void ConvertSelection(Shell& shell) { RunWithDestination(shell, Label("Convert"), false); }
 
 void ResizeSelection(Shell& shell) {
-  const std::vector<NamedSize> sizes = NamedSizes();
-  if (sizes.empty()) {
+  if (NamedSizes().empty()) {
     wxMessageBox(Label("No size is set. Enter one as WIDTH,HEIGHT in Setup."), Label("Resize"),
                  wxOK | wxICON_INFORMATION, &shell.Window());
     return;
   }
-  RunWithDestination(shell, Label("Resize"), sizes);
+  RunWithDestination(shell, Label("Resize"), true);
 }
 
 }  // namespace fotomill::desktop

@@ -5,17 +5,24 @@
 #include <wx/choice.h>
 #include <wx/combobox.h>
 #include <wx/dirdlg.h>
+#include <wx/menu.h>
 #include <wx/radiobut.h>
 #include <wx/sizer.h>
+#include <wx/spinctrl.h>
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
+#include <algorithm>
+
+#include "batch/recipe_function.h"
 #include "core/choice_lists.h"
+#include "core/text.h"
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/setup/override_box.h"
 #include "desktop/windows/widgets/wx_text.h"
+#include "operations/macros.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
@@ -24,16 +31,25 @@
 
 namespace fotomill::desktop {
 
+namespace {
+
+// The choices about quality, and the highest limit.
+enum LimitChoice { kAsInSetup, kQuality, kFileSize };
+constexpr int kMostKilobytes = 100'000;
+
+}  // namespace
+
 DestinationDialog::DestinationDialog(wxWindow* parent, const wxString& verb,
-                                     const std::vector<std::string>& files,
-                                     std::vector<NamedSize> sizes, std::string recipe)
+                                     const std::vector<std::string>& files, bool resizes,
+                                     std::string recipe)
     : wxDialog(parent, wxID_ANY, verb, wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "DestinationBox"),
       files_(files),
       shownFolder_(FolderForResults(platform::FolderOf(files_.front()))),
-      sizes_(std::move(sizes)),
-      recipe_(std::move(recipe)),
-      ownFormats_(RecipeNamesFormats(recipe_)) {
+      resizes_(resizes),
+      own_(std::move(recipe)),
+      ownFormats_(RecipeNamesFormats(own_)),
+      last_(own_.empty() ? LastChoice() : DestinationChoice()) {
   auto* sizer = new wxBoxSizer(wxVERTICAL);
   BuildFormat();
   BuildOptions();
@@ -55,37 +71,148 @@ wxSizerFlags DestinationDialog::Below() const {
   return wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, FromDIP(12));
 }
 
+// Labels on the left, their controls aligned on the right.
 void DestinationDialog::BuildFormat() {
-  const int gap = FromDIP(8);
-  auto* row = new wxBoxSizer(wxHORIZONTAL);
-  row->Add(new wxStaticText(this, wxID_ANY, Label("&Format:")),
-           wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
-  format_ = new wxChoice(this, wxID_ANY);
-  format_->SetName(Label("Format"));
-  for (const DestinationFormat& format : formats_) format_->Append(Shown(format.description));
-  format_->SetSelection(static_cast<int>(FirstFormat(formats_)));
-  row->Add(format_, wxSizerFlags(1));
-  options_ = new wxButton(this, wxID_ANY, Label("&Options..."));
-  row->Add(options_, wxSizerFlags().Border(wxLEFT, gap));
+  auto* grid = new wxFlexGridSizer(2, FromDIP(8), FromDIP(8));
+  grid->AddGrowableCol(1);
+  BuildFormatRow(*grid);
+  BuildSizeRow(*grid);
+  BuildQualityRow(*grid);
+  BuildNameRow(*grid);
+  BuildRecipeRow(*grid);
   formatSizer_ = new wxBoxSizer(wxVERTICAL);
-  if (!sizes_.empty()) formatSizer_->Add(NewSizeRow(), Below());
-  formatSizer_->Add(row, Below());
+  formatSizer_->Add(grid, Below());
+  recipe_->Enable(own_.empty());
   if (!ownFormats_) return;
   format_->Disable();
   format_->SetToolTip(Label("The recipe decides the format."));
 }
 
-wxSizer* DestinationDialog::NewSizeRow() {
+void DestinationDialog::AddRow(wxSizer& grid, const wxString& label, wxSizer* controls) {
+  auto* const text = new wxStaticText(this, wxID_ANY, label);
+  // its key moves to the control after it
+  text->MoveBeforeInTabOrder(controls->GetItem(size_t{0})->GetWindow());
+  grid.Add(text, wxSizerFlags().CenterVertical());
+  grid.Add(controls, wxSizerFlags(1).Expand());
+}
+
+// The further formats follow after a line, which cannot be chosen.
+void DestinationDialog::BuildFormatRow(wxSizer& grid) {
+  format_ = new wxChoice(this, wxID_ANY);
+  format_->SetName(Label("Format"));
+  for (size_t i = 0; i < formats_.size(); ++i) {
+    if (formats_[i].further && (i == 0 || !formats_[i - 1].further)) {
+      line_ = static_cast<int>(format_->Append(wxString(24, wxUniChar(0x2500))));
+    }
+    format_->Append(Shown(formats_[i].description));
+  }
+  ChooseFormat(FirstFormat(formats_));
   auto* row = new wxBoxSizer(wxHORIZONTAL);
-  row->Add(new wxStaticText(this, wxID_ANY, Label("&Size:")),
-           wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(8)));
-  size_ = new wxChoice(this, wxID_ANY);
+  row->Add(format_, wxSizerFlags(1));
+  options_ = new wxButton(this, wxID_ANY, Label("&Options..."));
+  row->Add(options_, wxSizerFlags().Border(wxLEFT, FromDIP(8)));
+  AddRow(grid, Label("&Format:"), row);
+}
+
+void DestinationDialog::ChooseFormat(size_t format) {
+  const int place = static_cast<int>(format);
+  chosen_ = line_ != wxNOT_FOUND && place >= line_ ? place + 1 : place;
+  format_->SetSelection(chosen_);
+}
+
+const DestinationFormat& DestinationDialog::ChosenFormat() const {
+  const int after = line_ != wxNOT_FOUND && chosen_ > line_ ? 1 : 0;
+  return formats_[static_cast<size_t>(chosen_ - after)];
+}
+
+// Steps over the line in the direction of the choice.
+void DestinationDialog::FormatChosen() {
+  const int now = format_->GetSelection();
+  if (now == line_) format_->SetSelection(chosen_ < line_ ? line_ + 1 : line_ - 1);
+  chosen_ = format_->GetSelection();
+  UpdateControls();
+}
+
+void DestinationDialog::BuildSizeRow(wxSizer& grid) {
+  size_ = new wxComboBox(this, wxID_ANY);
   size_->SetName(Label("Size"));
-  for (const NamedSize& size : sizes_) size_->Append(Shown(size.text));
-  size_->SetSelection(0);
-  size_->Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { UpdateControls(); });
+  size_->SetHint(Label("Original size"));
+  size_->SetToolTip(Label("The largest width and height, such as 1600x1200, or a percentage; "
+                          "empty: the original size"));
+  for (const NamedSize& size : NamedSizes()) size_->Append(Shown(size.text));
+  for (const char* percent : {"75%", "50%", "25%"}) size_->Append(percent);
+  if (resizes_) size_->SetSelection(0);
+  if (!resizes_ && own_.empty()) size_->SetValue(Shown(settings.DestinationResize.view()));
+  size_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateControls(); });
+  auto* row = new wxBoxSizer(wxHORIZONTAL);
   row->Add(size_, wxSizerFlags(1));
-  return row;
+  AddRow(grid, Label("&Size:"), row);
+}
+
+void DestinationDialog::BuildQualityRow(wxSizer& grid) {
+  limit_ = new wxChoice(this, wxID_ANY);
+  limit_->SetName(Label("Quality"));
+  for (const char* text : {TrLater("As in Setup"), TrLater("Quality, 1 to 100"),
+                           TrLater("Best quality up to a file size, KB")})
+    limit_->Append(Label(text));
+  limit_->SetSelection(kAsInSetup);
+  number_ = new wxSpinCtrl(this, wxID_ANY, wxEmptyString, wxDefaultPosition,
+                           FromDIP(wxSize(130, -1)));
+  number_->SetName(Label("Quality or size"));
+  limit_->Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { LimitChosen(); });
+  number_->Bind(wxEVT_SPINCTRL, [this](wxSpinEvent&) { UpdateControls(); });
+  auto* row = new wxBoxSizer(wxHORIZONTAL);
+  row->Add(limit_, wxSizerFlags(1).CenterVertical());
+  row->Add(number_, wxSizerFlags().Border(wxLEFT, FromDIP(8)));
+  AddRow(grid, Label("&Quality:"), row);
+  LimitChosen();
+}
+
+void DestinationDialog::LimitChosen() {
+  const bool size = limit_->GetSelection() == kFileSize;
+  number_->SetRange(1, size ? kMostKilobytes : 100);
+  number_->SetValue(size ? 500 : std::clamp(settings.JpegCompression, 1, 100));
+  UpdateControls();
+}
+
+void DestinationDialog::BuildNameRow(wxSizer& grid) {
+  name_ = new wxTextCtrl(this, wxID_ANY, Shown(last_.name));
+  name_->SetName(Label("Name"));
+  name_->SetHint(Label("As the picture, %F"));
+  name_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateControls(); });
+  auto* insert = new wxButton(this, wxID_ANY, Label("Insert..."));
+  insert->Bind(wxEVT_BUTTON, [this, insert](wxCommandEvent&) { OfferMacros(*insert); });
+  auto* row = new wxBoxSizer(wxHORIZONTAL);
+  row->Add(name_, wxSizerFlags(1).CenterVertical());
+  row->Add(insert, wxSizerFlags().Border(wxLEFT, FromDIP(8)));
+  AddRow(grid, Label("&Name:"), row);
+}
+
+void DestinationDialog::OfferMacros(wxWindow& button) {
+  wxMenu menu;
+  int id = wxID_HIGHEST + 1;
+  for (const MacroRow& macro : Macros()) {
+    menu.Append(id++, wxString::FromUTF8(macro.written) + "    " + Label(macro.help));
+  }
+  const int chosen =
+      button.GetPopupMenuSelectionFromUser(menu, wxPoint(0, button.GetSize().y)) - wxID_HIGHEST - 1;
+  if (chosen < 0) return;
+  name_->WriteText(wxString::FromUTF8(Macros()[static_cast<size_t>(chosen)].written));
+  name_->SetFocus();
+}
+
+void DestinationDialog::BuildRecipeRow(wxSizer& grid) {
+  recipe_ = new wxChoice(this, wxID_ANY);
+  recipe_->SetName(Label("Recipe"));
+  recipe_->Append(Label("None"));
+  for (const NamedRecipe& recipe : recipes_) recipe_->Append(Shown(recipe.name));
+  const auto last = std::ranges::find(recipes_, last_.recipe, &NamedRecipe::name);
+  recipe_->SetSelection(
+      last == recipes_.end() ? 0 : static_cast<int>(last - recipes_.begin()) + 1);
+  recipe_->Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { UpdateControls(); });
+  auto* row = new wxBoxSizer(wxHORIZONTAL);
+  row->Add(recipe_, wxSizerFlags(1));
+  AddRow(grid, Label("R&ecipe:"), row);
 }
 
 void DestinationDialog::BuildFolder() {
@@ -147,7 +274,7 @@ void DestinationDialog::BuildButtons(const wxString& verb) {
 }
 
 void DestinationDialog::BindControls() {
-  format_->Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { UpdateControls(); });
+  format_->Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { FormatChosen(); });
   beside_->Bind(wxEVT_RADIOBUTTON, [this](wxCommandEvent&) { UpdateControls(); });
   into_->Bind(wxEVT_RADIOBUTTON, [this](wxCommandEvent&) { UpdateControls(); });
   folder_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateControls(); });
@@ -163,7 +290,7 @@ void DestinationDialog::ShowPart(size_t part) {
   part_ = part;
   const bool format = parts_[part] != DestinationPart::Folder;
   GetSizer()->Show(formatSizer_, format, true);
-  orient_->Show(format && sizes_.empty() && recipe_.empty());  // operations always do this
+  orient_->Show(format && own_.empty());
   GetSizer()->Show(folderSizer_, parts_[part] != DestinationPart::Format, true);
   ok_->SetLabel(part + 1 < parts_.size() ? Label("Nex&t") : okText_);
   UpdateControls();
@@ -175,25 +302,41 @@ void DestinationDialog::ShowPart(size_t part) {
 
 DestinationChoice DestinationDialog::Choice() const {
   DestinationChoice choice;
-  choice.step = recipe_;
-  choice.extension = formats_[static_cast<size_t>(format_->GetSelection())].extension;
+  choice.step = own_;
+  choice.extension = ChosenFormat().extension;
   if (into_->GetValue()) choice.folder = WholeFolder(Utf8(folder_->GetValue()), shownFolder_);
   choice.reduce = reduce_->GetValue();
   choice.autoOrient = orient_->GetValue();
   choice.keepMetadata = metadata_->GetValue();
-  if (size_ != nullptr) choice.step = sizes_[static_cast<size_t>(size_->GetSelection())].step;
+  (void)ResizeStep(Utf8(size_->GetValue()), choice.resize);
+  choice.name = Utf8(name_->GetValue());
+  if (recipe_->GetSelection() > 0)
+    choice.recipe = recipes_[static_cast<size_t>(recipe_->GetSelection()) - 1].name;
+  if (limit_->IsEnabled() && limit_->GetSelection() == kQuality)
+    choice.quality = number_->GetValue();
+  if (limit_->IsEnabled() && limit_->GetSelection() == kFileSize)
+    choice.mostBytes = static_cast<uint64_t>(number_->GetValue()) * 1024;
   if (comment_ != nullptr && choice.keepMetadata) choice.comment = Utf8(comment_->GetValue());
   return choice;
 }
 
 void DestinationDialog::UpdateControls() {
+  if (ok_ == nullptr) return;  // during construction
+  const bool lossy = !ownFormats_ && HasQuality(UpperCase(ChosenFormat().extension));
+  limit_->Enable(lossy);
+  number_->Enable(lossy && limit_->GetSelection() != kAsInSetup);
   const DestinationChoice choice = Choice();
+  // operations always do this
+  orient_->Enable(choice.resize.empty() && choice.recipe.empty());
   folder_->Enable(into_->GetValue());
   browse_->Enable(into_->GetValue());
   if (comment_ != nullptr) comment_->Enable(choice.keepMetadata);
   options_->Show(parts_[part_] != DestinationPart::Folder && HasOverrideBox(choice.extension) &&
                  !ownFormats_);
-  const std::string problem = DestinationProblem(choice);
+  std::string step;
+  const std::string problem = ResizeStep(Utf8(size_->GetValue()), step)
+                                  ? DestinationProblem(choice)
+                                  : std::string(Tr("The size is neither like 1600x1200 nor 50%."));
   ok_->Enable(problem.empty() && (!into_->GetValue() || !choice.folder.empty()));
   const std::string outlook = problem.empty() ? OutlookText(choice) : problem;
   LogEvent("destination", outlook);
@@ -215,7 +358,7 @@ std::string DestinationDialog::OutlookText(const DestinationChoice& choice) cons
 }
 
 bool DestinationDialog::ShowFormatOptions() {
-  const std::string& extension = formats_[static_cast<size_t>(format_->GetSelection())].extension;
+  const std::string& extension = ChosenFormat().extension;
   LogEvent("prompt", "options " + extension);
   return ShowOverrideBox(this, extension);
 }
@@ -243,6 +386,7 @@ bool DestinationDialog::Accept(bool shift) {
     ShowPart(part_ + 1);
     return false;
   }
+  if (!resizes_ && own_.empty()) settings.DestinationResize = SettingText(Utf8(size_->GetValue()));
   KeepChoice(Choice(), shownFolder_);
   return true;
 }

@@ -8,12 +8,14 @@
 
 #include "desktop/models/batch/destination_choice.h"
 #include "desktop/models/batch/named_sizes.h"
+#include "operations/recipe_library.h"
 
 class wxButton;
 class wxCheckBox;
 class wxChoice;
 class wxComboBox;
 class wxRadioButton;
+class wxSpinCtrl;
 class wxStaticText;
 class wxTextCtrl;
 
@@ -23,15 +25,28 @@ namespace fotomill::desktop {
 // folder is in the same window, in a second step, or not asked for (DestinationParts).
 class DestinationDialog : public wxDialog {
  public:
-  // `verb` is the label of OK: "Convert". With `sizes`, also resizes pictures to one of them;
-  // `recipe` is applied to every picture. A recipe whose outputs have formats decides the format.
+  // `verb` is the label of OK: "Convert". With `resizes`, the first size of the settings is chosen,
+  // else that of the last time. `recipe` is applied to every picture; nothing is then chosen as the
+  // last time, and a recipe whose outputs have formats decides the format.
   DestinationDialog(wxWindow* parent, const wxString& verb, const std::vector<std::string>& files,
-                    std::vector<NamedSize> sizes = {}, std::string recipe = {});
+                    bool resizes = false, std::string recipe = {});
   DestinationChoice Choice() const;
+  // Whether the format was in the window that was accepted, so that no one needs to ask again.
+  bool ShowedFormatLast() const { return parts_.back() != DestinationPart::Folder; }
 
  private:
   void BuildFormat();
-  wxSizer* NewSizeRow();
+  void AddRow(wxSizer& grid, const wxString& label, wxSizer* controls);
+  void BuildFormatRow(wxSizer& grid);
+  void BuildSizeRow(wxSizer& grid);
+  void BuildQualityRow(wxSizer& grid);
+  void BuildNameRow(wxSizer& grid);
+  void BuildRecipeRow(wxSizer& grid);
+  void ChooseFormat(size_t format);
+  const DestinationFormat& ChosenFormat() const;
+  void FormatChosen();
+  void LimitChosen();
+  void OfferMacros(wxWindow& button);
   void BuildFolder();
   void BuildOptions();
   void BuildButtons(const wxString& verb);
@@ -53,11 +68,18 @@ class DestinationDialog : public wxDialog {
   wxString okText_;
   wxSizer* formatSizer_ = nullptr;  // contains the controls of each part
   wxSizer* folderSizer_ = nullptr;
-  const std::vector<NamedSize> sizes_;
-  const std::string recipe_;
-  const bool ownFormats_;      // the recipe decides the format
-  wxChoice* size_ = nullptr;  // null without sizes
+  const bool resizes_;
+  const std::string own_;       // the caller's recipe
+  const bool ownFormats_;       // it decides the format
+  const DestinationChoice last_;
+  const std::vector<NamedRecipe> recipes_ = ListRecipes();
   wxChoice* format_ = nullptr;
+  int line_ = wxNOT_FOUND, chosen_ = 0;  // items of the list of formats
+  wxComboBox* size_ = nullptr;
+  wxChoice* limit_ = nullptr;
+  wxSpinCtrl* number_ = nullptr;  // the quality, or the limit in KB
+  wxTextCtrl* name_ = nullptr;
+  wxChoice* recipe_ = nullptr;
   wxButton* options_ = nullptr;
   wxRadioButton* beside_ = nullptr;
   wxRadioButton* into_ = nullptr;
