@@ -119,6 +119,29 @@ TEST_F(Reports, PlacesAreReadableAndMeasured) {
   EXPECT_THAT(ReadExifReport(path, ExifReportOptionsFromSettings()).text, testing::Not(HasSubstr("Distance")));
 }
 
+TEST_F(Reports, PhotographersReadTheirOwnUnits) {
+  const std::string path = folder_.Path("a.tif");
+  test::WriteBytes(path, test::LittleEndianBlock());
+  const ExifReport report = ReadExifReport(path, {});
+  const auto rows = RowsForPeople(report, false);
+  ASSERT_GT(rows.size(), 3u);
+  EXPECT_EQ(rows[0].name, "Photo");
+  EXPECT_EQ(rows[1].text, "Acme");
+  const auto has = [](std::span<const ExifRow> all, const char* name, const char* text) {
+    return std::ranges::any_of(
+        all, [&](const ExifRow& row) { return row.name == name && row.text == text; });
+  };
+  EXPECT_TRUE(has(rows, "Exposure time", "1/60 s"));
+  EXPECT_TRUE(has(rows, "Camera settings", ""));
+  EXPECT_FALSE(has(rows, "DIRECTORY EXIF", ""));
+  const auto raw = RowsForPeople(report, true);
+  EXPECT_TRUE(has(raw, "DIRECTORY EXIF", ""));
+  EXPECT_FALSE(has(raw, "Photo", ""));
+
+  test::WriteBytes(path, BlockWithPlace());
+  EXPECT_THAT(ReadExifReport(path, {}).link, testing::StartsWith("https://www.openstreetmap.org/"));
+}
+
 TEST_F(Reports, CardsStayWhole) {
   const std::string path = folder_.Path("a.fits");
   std::string header;

@@ -1,7 +1,10 @@
 #include "desktop/models/info/exif_report.h"
 
+#include <algorithm>
+
 #include "catalog/thumbnails/exif_thumbnail.h"
 #include "core/shown_text.h"
+#include "desktop/models/info/map_link.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_tags.h"
 #include "metadata/gps.h"
@@ -101,6 +104,32 @@ ExifReportOptions ExifReportOptionsFromSettings() {
   return options;
 }
 
+std::string ShownHeading(const std::string& heading, bool raw) {
+  struct Title {
+    const char *heading, *title;
+  };
+  constexpr Title kTitles[] = {{"DIRECTORY IFD 0", TrLater("Picture")},
+                               {"DIRECTORY IFD 1", TrLater("Thumbnail")},
+                               {"DIRECTORY EXIF", TrLater("Camera settings")},
+                               {"DIRECTORY GPS", TrLater("Position")}};
+  const auto* const found = std::ranges::find(kTitles, heading, &Title::heading);
+  return raw || found == std::end(kTitles) ? heading : std::string(Tr(found->title));
+}
+
+std::vector<ExifRow> RowsForPeople(const ExifReport& report, bool raw) {
+  std::vector<ExifRow> rows;
+  if (!raw && !report.photo.empty()) {
+    rows.push_back({true, 0, Tr("Photo"), {}});
+    for (const PhotoFact& fact : report.photo) rows.push_back({false, 0, Tr(fact.label), fact.value});
+    if (!report.link.empty()) rows.push_back({false, 0, Tr("Map"), report.link});
+  }
+  for (const ExifRow& row : report.rows) {
+    rows.push_back(row);
+    if (row.heading) rows.back().name = ShownHeading(row.name, raw);
+  }
+  return rows;
+}
+
 ExifReport ReadExifReport(const std::string& path, const ExifReportOptions& options) {
   ExifReport report;
   ExifSource source;
@@ -122,7 +151,10 @@ ExifReport ReadExifReport(const std::string& path, const ExifReportOptions& opti
     return report;
   }
   gather.Finish();
-  AddPlaces(FindExifPlaces(source.Block()), options, report);
+  const ExifPlaces places = FindExifPlaces(source.Block());
+  AddPlaces(places, options, report);
+  report.photo = PhotoTable(source.Block());
+  if (places.taken) report.link = MapLinkOf(places.taken->latitude, places.taken->longitude);
   AddTags(path, options.tags, report);
   ReadThumbnail(ExifThumbnail(source.Block(), findings), report);
   if (!source.Intact()) {

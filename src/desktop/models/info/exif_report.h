@@ -8,6 +8,7 @@
 #include "core/choice_lists.h"
 #include "core/status.h"
 #include "desktop/models/drawing/rgb_image.h"
+#include "desktop/models/view/photo_facts.h"
 #include "metadata/exif/exif_places.h"
 #include "metadata/exif/exif_text.h"
 #include "metadata/tags/picture_tags.h"
@@ -33,6 +34,10 @@ struct ExifReportOptions {
 // TextCommentExtension. Main thread only.
 ExifReportOptions ExifReportOptionsFromSettings();
 
+// The name of a directory for people: "Camera settings" for "DIRECTORY EXIF"; with `raw` unchanged,
+// as are other headings.
+std::string ShownHeading(const std::string& heading, bool raw);
+
 // The EXIF of a file, for the viewer.
 struct ExifReport {
   Status status = Status::Ok;
@@ -42,9 +47,15 @@ struct ExifReport {
   std::vector<ExifRow> rows;
   // all lines as text, for copying, saving and printing
   std::string text;
+  std::vector<PhotoFact> photo;         // the main facts, as photographers write them
+  std::string link;                     // of a map with the place of the picture; empty: no place
   RgbImage thumbnail;                   // decoded; empty if missing or damaged
   std::vector<uint8_t> thumbnailBytes;  // as stored: a JPEG stream
 };
+
+// The rows with the main facts first and headings for people; with `raw` (ExifShowTypes) only the
+// rows as they are.
+std::vector<ExifRow> RowsForPeople(const ExifReport& report, bool raw);
 
 // Reads a file's EXIF block. May take long; any thread.
 ExifReport ReadExifReport(const std::string& path, const ExifReportOptions& options);

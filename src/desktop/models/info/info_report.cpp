@@ -123,14 +123,24 @@ InfoSection DetailsOf(const PictureRecord& picture) {
   return section;
 }
 
+// What photographers look for, after the general facts.
+void AddPhoto(const ExifReport& report, FileInfo& info) {
+  InfoSection photo{Tr("Photo"), {}};
+  for (const PhotoFact& fact : report.photo) photo.lines.push_back({Tr(fact.label), fact.value});
+  if (!report.link.empty()) photo.lines.push_back({Tr("Map"), report.link, report.link});
+  if (!photo.lines.empty()) info.sections.insert(info.sections.begin() + 1, std::move(photo));
+}
+
 void AddExif(const std::string& path, const InfoOptions& options, FileInfo& info) {
   constexpr std::string_view kDirectory = "DIRECTORY ";
-  for (ExifRow& row : ReadExifReport(path, options.exif).rows) {
+  ExifReport report = ReadExifReport(path, options.exif);
+  AddPhoto(report, info);
+  for (ExifRow& row : report.rows) {
     if (row.heading) {
-      info.sections.push_back({row.name.starts_with(kDirectory)
-                                   ? "EXIF: " + row.name.substr(kDirectory.size())
-                                   : row.name,
-                               {}});
+      const bool directory = row.name.starts_with(kDirectory);
+      std::string title = ShownHeading(row.name, options.exif.text.showTypes);
+      if (title.starts_with(kDirectory)) title.erase(0, kDirectory.size());
+      info.sections.push_back({directory ? "EXIF: " + title : title, {}, directory});
     } else {
       info.sections.back().lines.push_back({std::move(row.name), std::move(row.text)});
     }

@@ -14,12 +14,14 @@ namespace fotomill::desktop {
 struct InfoLine {
   std::string label;  // empty for a line of plain text
   std::string value;
+  std::string link = {};  // a web page about it; may be empty
 };
 
-// A group of lines: "General", "Details", "EXIF".
+// A group of lines: "General", "Photo", "Details", "EXIF: Camera settings".
 struct InfoSection {
   std::string title;
   std::vector<InfoLine> lines;
+  bool folded = false;  // closed at first in windows
 };
 
 // Options of "Get info".

@@ -2,12 +2,14 @@
 
 #include <algorithm>
 #include <string_view>
+#include <utility>
 
 #include "batch/picture_failure.h"
 #include "core/choice_lists.h"
 #include "core/utf8.h"
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/view/photo_facts.h"
+#include "metadata/tags/tag_lines.h"
 #include "platform/paths.h"
 #include "processing/geometry/scale.h"
 #include "registry/registry.h"
@@ -73,6 +75,16 @@ Status ReadPictureReport(const SideOptions& options, const StopToken& stop, Side
   return MakePreview(*picture, options, report);
 }
 
+void AddTags(const SideOptions& options, SideReport& report) {
+  PictureTags tags;
+  if (ReadPictureTags(report.path, options.tags, tags) != Status::Ok) return;
+  report.rating = std::exchange(tags.rating, 0);
+  const std::string comment = std::exchange(tags.comment, {});
+  if (!comment.empty()) report.comment = comment;
+  for (const TagLine& line : TagLines(tags))
+    report.tags.push_back(std::string(Tr(line.label)) + ": " + line.text);
+}
+
 void CountFolder(const StopToken& stop, SideReport& report) {
   const FolderListing listing = ListForBrowser(report.path, false, stop);
   if (listing.state != FolderState::Listed) {
@@ -89,6 +101,15 @@ void CountFolder(const StopToken& stop, SideReport& report) {
 
 }  // namespace
 
+std::string SideReport::RatingText() const {
+  constexpr int32_t kStars = 5;
+  if (rating < 0) return Tr("rejected");
+  std::string stars;
+  for (int32_t star = 1; star <= kStars && rating > 0; ++star)
+    stars += star <= rating ? "\u2605" : "\u2606";
+  return stars;
+}
+
 std::string SideReport::Text() const {
   std::string text = name;
   const auto add = [&text](const std::string& line) {
@@ -96,7 +117,9 @@ std::string SideReport::Text() const {
   };
   add(remark);
   for (const std::string& line : facts) add(line);
+  add(RatingText());
   add(comment);
+  for (const std::string& line : tags) add(line);
   for (const std::string& line : photo) add(line);
   return text;
 }
@@ -115,6 +138,7 @@ SideReport ReadSideReport(const std::string& folder, const FolderItem& item,
   report.facts.push_back(SizeText(item.size, choice::kSizeFitting) + ", " +
                          DateText(item.modified));
   const Status status = ReadPictureReport(options, stop, report);
+  if (!stop.Asked()) AddTags(options, report);
   if (status != Status::Ok) {
     report.remark = FailureText(report.path, status);
     report.preview = {};

@@ -8,6 +8,7 @@
 #include "desktop/models/browser/folder_listing.h"
 #include "desktop/models/drawing/histogram.h"
 #include "desktop/models/drawing/rgb_image.h"
+#include "metadata/tags/picture_tags.h"
 #include "picture/read_request.h"
 
 namespace fotomill::desktop {
@@ -23,7 +24,11 @@ struct SideReport {
   std::vector<std::string> facts;  // lines: type, dimensions, size and date
   std::vector<std::string> photo;  // lines: camera, lens, exposure, date, as PhotoFacts
   std::string comment;             // may have several lines
+  int32_t rating = 0;              // 1 to 5 stars; 0: none, -1: rejected
+  std::vector<std::string> tags;   // lines: title, keywords, label and the like
 
+  // The rating as stars; empty without one.
+  std::string RatingText() const;
   // All texts, a line each, for the clipboard and screen readers.
   std::string Text() const;
 };
@@ -33,6 +38,7 @@ struct SideOptions {
   int32_t side = 320;         // of the square in which the preview must fit, in pixels
   uint32_t matte = 0xffffff;  // behind transparent pictures, 0x00BBGGRR
   ReadOptions read;
+  TagSources tags;
 };
 
 // Reads a picture, or counts the contents of a folder. May take long; any thread. If stopped, the

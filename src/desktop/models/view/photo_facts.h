@@ -12,4 +12,11 @@ namespace fotomill::desktop {
 // mm".
 std::vector<std::string> PhotoFacts(std::span<const uint8_t> exif);
 
+// The same and more facts one by one, with labels in English: "Exposure time", "1/125 s".
+struct PhotoFact {
+  const char* label;
+  std::string value;
+};
+std::vector<PhotoFact> PhotoTable(std::span<const uint8_t> exif);
+
 }  // namespace fotomill::desktop

@@ -5,6 +5,7 @@
 #include <wx/dialog.h>
 #include <wx/dirdlg.h>
 #include <wx/sizer.h>
+#include <wx/stattext.h>
 
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/widgets/button_row.h"
@@ -30,6 +31,9 @@ std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title,
   if (folder->GetCount() > 0) folder->SetSelection(0);
   folder->AutoCompleteDirectories();
   auto* browse = new wxButton(&dialog, wxID_ANY, Label("B&rowse..."));
+  row->Add(new wxStaticText(&dialog, wxID_ANY, Label("&To the folder:")),
+           wxSizerFlags().CenterVertical().Border(wxRIGHT, gap));
+  folder->MoveAfterInTabOrder(row->GetItem(size_t{0})->GetWindow());
   row->Add(folder, wxSizerFlags(1));
   row->Add(browse, wxSizerFlags().Border(wxLEFT, gap));
   sizer->Add(row, wxSizerFlags().Expand().Border(wxALL, gap));

@@ -21,6 +21,7 @@
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "settings/settings.h"
 #include "texts/grouped_count.h"
 #include "texts/status_text.h"
 #include "texts/texts.h"
@@ -94,7 +95,8 @@ void ExifFrame::Finished() {
   if (!report_.rows.empty()) shell_.Uses().NoteAll({path_}, FileFunction::GetInfo);
   problem_->SetLabel(Shown(report_.problem));
   problem_->Show(!report_.problem.empty());
-  for (const ExifRow& row : report_.rows) {
+  rows_ = RowsForPeople(report_, settings.ExifShowTypes != 0);
+  for (const ExifRow& row : rows_) {
     wxVector<wxVariant> cells;
     cells.push_back((row.heading ? wxString() : wxString("    ")) + Shown(row.name));
     cells.push_back(wxString::FromUTF8(row.text));
@@ -124,7 +126,7 @@ void ExifFrame::Finished() {
 wxString ExifFrame::SelectedValue() const {
   const int row = list_->GetSelectedRow();
   if (row == wxNOT_FOUND) return {};
-  const ExifRow& shown = report_.rows[static_cast<size_t>(row)];
+  const ExifRow& shown = rows_[static_cast<size_t>(row)];
   return wxString::FromUTF8(shown.heading ? shown.name : shown.text);
 }
 

@@ -28,6 +28,7 @@ class ExifFrame : public wxFrame {
   Shell& shell_;
   const std::string path_;
   ExifReport report_;
+  std::vector<ExifRow> rows_;  // as shown
   wxStaticText* problem_ = nullptr;
   wxDataViewListCtrl* list_ = nullptr;
   wxStaticBitmap* thumbnail_ = nullptr;

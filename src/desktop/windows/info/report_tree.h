@@ -17,6 +17,9 @@ class ReportTree : public wxTreeListCtrl {
   void Show(std::span<const InfoSection> sections);
   // The value of the selected line, or the title of a section; empty without a selection.
   wxString SelectedValue() const;
+
+ private:
+  void OpenLink(wxTreeListItem item);
 };
 
 }  // namespace fotomill::desktop

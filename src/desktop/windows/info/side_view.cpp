@@ -104,8 +104,10 @@ void SideView::Arrange() {
     }
     AddText(report_.name, &ListPalette::text, true);
     AddText(report_.remark, &ListPalette::fault, false);
+    AddText(report_.RatingText(), &ListPalette::text, true);
     AddLines(report_.facts, &ListPalette::text);
     AddText(report_.comment, &ListPalette::text, false);
+    AddLines(report_.tags, &ListPalette::text);
     if (ready_ && report_.histogram != Histogram()) {
       const wxRect place(FromDIP(kMargin), bottom_, width_, FromDIP(kLevelsHeight));
       pieces_.push_back({Piece::Levels, place});

@@ -24,11 +24,24 @@ wxString WorksHere(const FormatEntry& row) {
   return Tr("not in this build");
 }
 
+// Formats that this build can neither read nor write are gray.
+class FormatLines : public wxDataViewListStore {
+ public:
+  bool GetAttrByRow(unsigned row, unsigned, wxDataViewItemAttr& look) const override {
+    const auto index = static_cast<int32_t>(GetItemData(GetItem(row)));
+    if (CanRead(FormatRow(index)) || CanWrite(FormatRow(index))) return false;
+    look.SetColour(ToWx(CurrentPalette().note));
+    return true;
+  }
+};
+
 }  // namespace
 
 FormatList::FormatList(wxWindow* parent)
     : wxDataViewListCtrl(parent, wxID_ANY, wxDefaultPosition, parent->FromDIP(wxSize(-1, 280)),
                          wxDV_SINGLE | wxDV_ROW_LINES) {
+  const wxObjectDataPtr<FormatLines> lines(new FormatLines);
+  AssociateModel(lines.get());
   SetName(Label("Formats"));
   AppendToggleColumn(Label("On"), wxDATAVIEW_CELL_ACTIVATABLE, FromDIP(50), wxALIGN_CENTER);
   AppendTextColumn(Label("Format"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 300));

@@ -105,6 +105,7 @@ void SidePane::Read() {
   options.side = view_->PreviewSide();
   options.matte = static_cast<uint32_t>(settings.ThumbnailMatte);
   options.read = ReadOptionsFromSettings();
+  options.tags = TagSourcesFromSettings();
   reading_.Start([this, folder = folder_, item = item_, options](const StopToken& stop,
                                                                  const LooseWork::Report& report) {
     SideReport found = ReadSideReport(folder, item, options, stop);
