@@ -1,5 +1,6 @@
 #!/usr/bin/env python3
 """The browser and the view window of the real program, by keyboard."""
+import os
 import re
 import signal
 import time
@@ -329,6 +330,60 @@ def view_window(folder):
         assert desktop.log_text().count("view-window another") == 1, desktop.log_text()
 
 
+def sizes_and_groups(folder):
+    """Sizes of thumbnails, groups, subfolders, and cells of files that cannot be shown."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, NAMES)
+    make_pictures(pictures / "sub", ["c.bmp"])
+    (pictures / "damaged.gif").write_bytes(b"GIF89a and no more")
+    (pictures / "unknown.avi").write_bytes(b"RIFF....AVI ")
+    for number, name in enumerate(NAMES):
+        stamp = 1_600_000_000 + 40 * 86400 * number
+        os.utime(pictures / name, (stamp, stamp))
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"browser tabs=1 lines=7 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "ctrl+plus", "ctrl+plus", "ctrl+plus")
+        desktop.wait(r"thumbnail-side 256")
+        desktop.wait(r"browser .*missing=0 .*view=4")
+        desktop.screenshot("large-thumbnails")
+        desktop.key("ctrl+4")
+        desktop.wait(r"browser .*missing=0 .*view=3")
+        desktop.key("ctrl+k")
+        desktop.focus("^Find command$")
+        desktop.type("group by month")
+        desktop.key("Return")
+        desktop.wait(r"groups [56]$")
+        desktop.focus("Fotomill Professional")
+        desktop.screenshot("groups")
+        desktop.key("ctrl+k")
+        desktop.focus("^Find command$")
+        desktop.type("include subfolders")
+        desktop.key("Return")
+        desktop.wait(r"browser .*lines=7 items=7 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("c")
+        desktop.wait(r"focus=sub/c.bmp")
+        desktop.key("Return")
+        desktop.wait(r"view place=\d/7 .*sub/c.bmp")
+        desktop.focus("View$")
+        desktop.key("n")
+        desktop.wait(r"view place=")
+        desktop.key("p")
+        desktop.wait(r"view place=.*sub/c.bmp")
+        desktop.key("Escape")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+2")
+        desktop.wait(r"browser .*view=1")
+        make_pictures(pictures, ["new.bmp"])  # the others have thumbnails by now
+        desktop.wait(r"details-icons ")
+        desktop.screenshot("details-icons")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+    text = (folder / "data/Fotomill Professional 11.ini").read_text()
+    assert "BrowserGrouping=2\n" in text, text
+
+
 def later_starts(folder):
     pictures, other = folder / "pictures", folder / "other"
     make_pictures(pictures, NAMES)
@@ -381,4 +436,5 @@ def later_starts(folder):
         assert later.wait(30) == 0
 
 
-run(open_select_view, side_pane, view_window, compare, play_animation, later_starts)
+run(open_select_view, side_pane, view_window, sizes_and_groups, compare, play_animation,
+    later_starts)

@@ -68,10 +68,15 @@ TEST(Destination, SizesAreTypedFreely) {
   struct {
     const char *typed, *step;  // null: refused
   } const rows[] = {
-      {"", ""},         {"  ", ""},          {"50%", "resize 50%"},
-      {"1600", "resize 1600"},               {"800 x 600", "resize 800x600"},
-      {"640 \u00D7 480", "resize 640x480"},  {"big", nullptr},
-      {"0x0", nullptr}, {"10; flip horizontal", nullptr},
+      {"", ""},
+      {"  ", ""},
+      {"50%", "resize 50%"},
+      {"1600", "resize 1600"},
+      {"800 x 600", "resize 800x600"},
+      {"640 \u00D7 480", "resize 640x480"},
+      {"big", nullptr},
+      {"0x0", nullptr},
+      {"10; flip horizontal", nullptr},
   };
   for (const auto& row : rows) {
     std::string step = "old";

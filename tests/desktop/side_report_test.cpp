@@ -99,7 +99,8 @@ TEST(SideReport, ShowsPicturesFoldersAndProblems) {
   picture->comment.assign(kComment.begin(), kComment.end());
   ASSERT_EQ(WritePicture(*picture, folder.Path("gray.png"), {}), Status::Ok);
   const auto read = [&](const std::string& name) {
-    return ReadSideReport(folder.Path(""), ItemOf(folder, name), {.side = 60, .read = {}, .tags = {}}, {});
+    return ReadSideReport(folder.Path(""), ItemOf(folder, name),
+                          {.side = 60, .read = {}, .tags = {}}, {});
   };
   const SideReport whole = read("gray.png");
   EXPECT_EQ(whole.preview.width, 60);

@@ -121,8 +121,8 @@ std::string NameProblem(const std::string& pattern) {
 std::string PlannedPath(const std::string& file, const DestinationChoice& choice,
                         const BatchFunction& function, const BatchJob& job) {
   const BatchOutput* const output = function.outputs.empty() ? nullptr : &function.outputs[0];
-  std::string base = std::string(job.naming.PrefixOf(function.history))
-                         .append(platform::SplitPath(file).base);
+  std::string base =
+      std::string(job.naming.PrefixOf(function.history)).append(platform::SplitPath(file).base);
   if (output != nullptr && output->name)
     base = output->nameNeedsPicture ? choice.name : output->name(file, nullptr);
   const std::string_view folder = output == nullptr ? std::string_view() : output->folder;

@@ -40,8 +40,8 @@ struct DestinationChoice {
   uint64_t mostBytes = 0;  // maximum file size, instead of a quality; 0: none
 };
 
-// The recipe step for a size as people type it: "1600x1200", "1600", "50%"; empty for an empty text.
-// False if it is none.
+// The recipe step for a size as people type it: "1600x1200", "1600", "50%"; empty for an empty
+// text. False if it is none.
 [[nodiscard]] bool ResizeStep(const std::string& typed, std::string& step);
 
 // The choice of the last time, except format and folder.

@@ -65,6 +65,12 @@ void BrowserModel::SetSort(int32_t sortMode, bool descending) {
   SetView(view);
 }
 
+void BrowserModel::SetGrouping(DateGrouping grouping) {
+  if (grouping == grouping_) return;
+  grouping_ = grouping;
+  UpdateOrder();
+}
+
 void BrowserModel::SetFolder(const std::string& folder) {
   folder_ = folder;
   listed_ = false;
@@ -72,6 +78,7 @@ void BrowserModel::SetFolder(const std::string& folder) {
   items_.clear();
   order_.clear();
   lines_.clear();
+  groups_.clear();
   selection_.Reset(0);
 }
 
@@ -139,10 +146,15 @@ void BrowserModel::SortItems() {
   std::iota(order_.begin(), order_.end(), 0u);
   const Comparison compare = ComparisonOf(view_.modes.sort);
   const int sign = view_.descending ? -1 : 1;
+  std::vector<int32_t> dates;
+  if (grouping_ != DateGrouping::None) {
+    for (const FolderItem& item : items_) dates.push_back(GroupDate(item, grouping_));
+  }
   std::sort(order_.begin(), order_.end(), [&](uint32_t left, uint32_t right) {
     const FolderItem& a = items_[left];
     const FolderItem& b = items_[right];
     if (a.folder != b.folder) return a.folder;
+    if (!dates.empty() && dates[left] != dates[right]) return dates[left] > dates[right];
     int order = compare != nullptr && !a.folder ? compare(a, b) : 0;
     if (order == 0) order = CompareNatural(a.name, b.name);
     return order * sign < 0;
@@ -159,12 +171,17 @@ std::vector<bool> BrowserModel::SelectedItems() const {
 void BrowserModel::BuildLines(const std::vector<bool>& selectedItems, size_t focusItem,
                               size_t anchorItem) {
   lines_.clear();
+  groups_.clear();
   std::vector<bool> selected;
   size_t focus = kNoLine, anchor = kNoLine;
   for (const uint32_t item : order_) {
     if (!filter_.empty() && !MatchesFilter(items_[item].name, filter_)) continue;
     if (item == focusItem) focus = lines_.size();
     if (item == anchorItem) anchor = lines_.size();
+    if (grouping_ != DateGrouping::None) {
+      const int32_t date = GroupDate(items_[item], grouping_);
+      if (groups_.empty() || groups_.back().date != date) groups_.push_back({lines_.size(), date});
+    }
     selected.push_back(selectedItems[item]);
     lines_.push_back(item);
   }
@@ -182,12 +199,17 @@ size_t BrowserModel::FindLine(std::string_view name) const {
   return kNoLine;
 }
 
+size_t BrowserModel::LineOfPath(std::string_view path) const {
+  const std::string start = platform::JoinFolder(folder_, "");
+  return path.starts_with(start) ? FindLine(path.substr(start.size())) : kNoLine;
+}
+
 size_t BrowserModel::FindTyped(std::string_view typed, bool next) const {
   const size_t count = lines_.size();
   const size_t focus = selection_.Focus() == kNoLine ? 0 : selection_.Focus();
   for (size_t step = next ? 1 : 0; step < count + (next ? 1 : 0); ++step) {
     const size_t line = (focus + step) % count;
-    if (BeginsWith(Line(line).name, typed)) return line;
+    if (BeginsWith(ShownName(Line(line)), typed)) return line;
   }
   return kNoLine;
 }
@@ -278,6 +300,17 @@ std::string BrowserModel::FocusText() const {
   text.append(", ").append(Tr("%1 of %2", ThousandsText(focus + 1), ThousandsText(LineCount())));
   if (selection_.IsSelected(focus)) text.append(", ").append(Tr("selected"));
   return text;
+}
+
+int32_t GroupDate(const FolderItem& item, DateGrouping grouping) {
+  if (item.folder) return 0;
+  int32_t date = static_cast<int32_t>(item.taken / 1'000'000);
+  if (date <= 0) {
+    const platform::LocalTime time = platform::LocalTimeOf(item.modified);
+    date = (time.year * 100 + time.month) * 100 + time.day;
+  }
+  if (grouping == DateGrouping::Month) return date / 100 * 100;
+  return grouping == DateGrouping::Year ? date / 10'000 * 10'000 : date;
 }
 
 std::string SizeText(uint64_t bytes, int32_t mode) {

@@ -16,6 +16,15 @@ namespace fotomill::desktop {
 // or remove them from it.
 enum class MatchMode { Only, Add, Remove };
 
+// Groups of files with the same date: when a picture was taken if known, else changed.
+enum class DateGrouping { None, Day, Month, Year };
+
+// A group of lines. `date` is like 20261122, with 00 for what differs within a group; 0: folders.
+struct LineGroup {
+  size_t first = 0;  // line
+  int32_t date = 0;
+};
+
 // The contents of a browser: the sorted items of a folder, the items that pass the filter as lines,
 // and the selection of lines. Uses no windows or files.
 class BrowserModel {
@@ -27,6 +36,12 @@ class BrowserModel {
   const FolderView& View() const { return view_; }      // modes and direction
   void SetView(const FolderView& view);                 // sorts again if the order changes
   void SetSort(int32_t sortMode, bool descending);  // choice::SortMode
+
+  // Groups lines by date, newest first; kept when the folder changes. Sorts again.
+  void SetGrouping(DateGrouping grouping);
+  DateGrouping Grouping() const { return grouping_; }
+  // The groups of lines; empty without grouping.
+  const std::vector<LineGroup>& Groups() const { return groups_; }
 
   // Changes the folder; empty until listed.
   void SetFolder(const std::string& folder);
@@ -51,8 +66,9 @@ class BrowserModel {
   size_t ItemOfLine(size_t line) const { return lines_[line]; }       // below LineCount
   const FolderItem& Line(size_t line) const { return items_[lines_[line]]; }
   std::string PathOfLine(size_t line) const;  // folder and name
-  // The line with this name; kNoLine if not shown.
+  // The line with this name, or of this file; kNoLine if not shown.
   size_t FindLine(std::string_view name) const;
+  size_t LineOfPath(std::string_view path) const;
   // The first line from the focus on, or with `next` after it, whose name starts with `typed`;
   // wraps around. kNoLine if not found.
   size_t FindTyped(std::string_view typed, bool next) const;
@@ -98,8 +114,13 @@ class BrowserModel {
   std::vector<FolderItem> items_;     // as listed
   std::vector<uint32_t> order_;       // all items in sorted order
   std::vector<uint32_t> lines_;       // items that pass the filter
+  DateGrouping grouping_ = DateGrouping::None;
+  std::vector<LineGroup> groups_;
   Selection selection_;               // of lines
 };
+
+// The date of the group of a file, as in LineGroup.
+int32_t GroupDate(const FolderItem& item, DateGrouping grouping);
 
 // Formats a size, translated: "740 bytes", "18.2 MB"; by choice::SizeMode.
 std::string SizeText(uint64_t bytes, int32_t mode);

@@ -81,6 +81,41 @@ FolderListing ListNames(const std::string& folder, const std::vector<std::string
   return listing;
 }
 
+FolderListing ListWithSubfolders(const std::string& folder, const StopToken& stop) {
+  constexpr size_t kDeepest = 64;
+  struct Level {
+    std::string below;  // relative to the folder, with a separator at its end
+    size_t depth;
+  };
+  FolderListing all{.state = FolderState::Listed};
+  all.chosen = ModesForFolder(folder, all.chosen);
+  FormatFinder formats;
+  std::vector<Level> open{{{}, 0}};
+  while (!open.empty() && !stop.Asked()) {
+    const Level level = std::move(open.back());
+    open.pop_back();
+    const auto entries = platform::ListFolder(platform::JoinFolder(folder, level.below));
+    if (!entries && level.depth == 0) return NotListed(folder);
+    if (!entries) continue;
+    for (const platform::FolderEntry& entry : *entries) {
+      if (entry.name.starts_with('.')) continue;
+      if (entry.kind == platform::FileKind::Folder) {
+        if (!entry.link && level.depth < kDeepest)
+          open.push_back({level.below + entry.name + platform::kSeparator, level.depth + 1});
+        continue;
+      }
+      FolderItem item;
+      item.format = formats.Find(entry.name);
+      if (entry.kind != platform::FileKind::Regular || item.format == kNoFormat) continue;
+      item.name = level.below + entry.name;
+      all.items.push_back(std::move(item));
+    }
+  }
+  return all;
+}
+
+std::string_view ShownName(const FolderItem& item) { return platform::FileNameOf(item.name); }
+
 std::vector<std::string> SubfolderNames(const std::string& folder) {
   std::vector<std::string> names;
   for (const platform::FolderEntry& entry :

@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <string>
+#include <string_view>
 #include <vector>
 
 #include "core/workers/stop_token.h"
@@ -33,6 +34,12 @@ struct FolderListing {
   BrowserModes chosen = {-1, -1, -1};  // modes that the folder itself asks for; -1: none
   std::vector<FolderItem> items = {};  // unsorted
 };
+
+// Lists the files in a folder and its subfolders, as ListForBrowser, but without the folders; names
+// are relative to `folder`. Links to folders are not followed, unreadable subfolders left out.
+FolderListing ListWithSubfolders(const std::string& folder, const StopToken& stop);
+// The name of an item without the folders of such a listing.
+std::string_view ShownName(const FolderItem& item);
 
 // Lists what a browser shows: folders and files of known formats, without hidden ones and thumbnail
 // files. Without `facts`, sizes and times stay 0, which is many times faster. If stopped, returns

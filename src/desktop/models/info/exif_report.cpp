@@ -120,7 +120,8 @@ std::vector<ExifRow> RowsForPeople(const ExifReport& report, bool raw) {
   std::vector<ExifRow> rows;
   if (!raw && !report.photo.empty()) {
     rows.push_back({true, 0, Tr("Photo"), {}});
-    for (const PhotoFact& fact : report.photo) rows.push_back({false, 0, Tr(fact.label), fact.value});
+    for (const PhotoFact& fact : report.photo)
+      rows.push_back({false, 0, Tr(fact.label), fact.value});
     if (!report.link.empty()) rows.push_back({false, 0, Tr("Map"), report.link});
   }
   for (const ExifRow& row : report.rows) {

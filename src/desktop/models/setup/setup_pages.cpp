@@ -53,6 +53,8 @@ constexpr SetupItem kItems[] = {
     Item(Thumbnails, TrLater("Creating"),             FastZoomedThumbnails,           "Prefer speed over quality for large thumbnails"),
     Item(Thumbnails, TrLater("Creating"),             AutoCreateThumbnail,            "Store new thumbnails in the database modes"),
     Item(Thumbnails, TrLater("Creating"),             UpdateThumbnailsFlag,           "Offer to create missing thumbnails"),
+    Item(Thumbnails, TrLater("Lists"),              AlternateFolderGraphics,        "Plain folders, without a picture from inside"),
+    Item(Thumbnails, TrLater("Lists"),              ShowDetailListThumbnails,       "Small thumbnails in the Details view"),
     Item(Thumbnails, TrLater("Faces"),              FaceDetectThumbnailEnable,      "Show the face in stored thumbnails"),
     Item(Thumbnails, TrLater("Faces"),              FaceDetectVirtualThumbnails,    "Show the face in thumbnails that are not stored"),
     Item(Thumbnails, TrLater("Faces"),              FaceDetectThumbnailMultiple,    "Which faces"),

@@ -10,9 +10,12 @@
 #include "catalog/thumbnails/thumbnail_lookup.h"
 #include "catalog/thumbnails/thumbnail_store.h"
 #include "core/choice_lists.h"
+#include "core/natural_order.h"
+#include "desktop/models/browser/folder_listing.h"
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_walk.h"
 #include "platform/files.h"
+#include "platform/paths.h"
 #include "processing/faces/face_finder.h"
 #include "processing/geometry/scale.h"
 #include "registry/registry.h"
@@ -54,11 +57,11 @@ Status PixelsOfPicture(PictureRecord& picture, const ThumbnailRequest& request, 
   return ScaleDown(picture.image, request.side, pixels);
 }
 
-// Loads an existing thumbnail. Records are too small for dense screens; system thumbnails may be
-// large enough.
+// Loads an existing thumbnail. Records are too small for large squares and dense screens; system
+// thumbnails may be large enough.
 bool ReadReady(const ThumbnailRequest& request, Thumbnail& thumbnail) {
-  const bool large = request.side == kLargeThumbnailSide;
-  if (request.side <= kSmallThumbnailSide || large) {
+  const bool large = request.side > kSmallThumbnailSide;
+  if (request.side <= kLargeThumbnailSide) {
     const auto record = std::make_unique<AnyThumbnailRecord>();
     const ThumbnailSources sources{.mode = static_cast<choice::ThumbnailMode>(request.mode),
                                    .listed = &Listed(),
@@ -150,9 +153,31 @@ Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   return ScaleDown(picture->image, request.side, thumbnail.pixels);
 }
 
+// That of the first picture which has one; empty if there is none among the first few.
+ThumbnailPointer LoadFolderThumbnail(const ThumbnailRequest& asked) {
+  constexpr size_t kTried = 5;
+  std::vector<FolderItem> items = ListForBrowser(asked.path, false, {}).items;
+  std::erase_if(items, [](const FolderItem& item) { return item.folder; });
+  const size_t tried = std::min(items.size(), kTried);
+  std::partial_sort(
+      items.begin(), items.begin() + static_cast<ptrdiff_t>(tried), items.end(),
+      [](const FolderItem& a, const FolderItem& b) { return CompareNatural(a.name, b.name) < 0; });
+  for (size_t i = 0; i < tried; ++i) {
+    ThumbnailRequest request = asked;
+    request.path = platform::JoinFolder(asked.path, items[i].name);
+    request.folder = false;
+    request.modified = 0;
+    request.size = 0;
+    ThumbnailPointer thumbnail = LoadThumbnail(request);
+    if (thumbnail != nullptr && !thumbnail->pixels.Empty()) return thumbnail;
+  }
+  return std::make_shared<Thumbnail>();
+}
+
 }  // namespace
 
 ThumbnailPointer LoadThumbnail(const ThumbnailRequest& asked) {
+  if (asked.folder) return LoadFolderThumbnail(asked);
   ThumbnailRequest request = asked;
   if (request.modified == 0 && request.size == 0) {
     const platform::FileFacts facts = platform::FactsOf(request.path);

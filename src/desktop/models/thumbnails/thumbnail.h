@@ -20,6 +20,7 @@ struct ThumbnailRequest {
   int32_t mode = 0;      // choice::ThumbnailMode: where records are stored
   bool standIn = false;  // return whatever is available immediately, until the proper one is loaded
   ThumbnailOptions options = {};
+  bool folder = false;  // the path is a folder; its first picture's
 
   bool operator==(const ThumbnailRequest&) const = default;
 };

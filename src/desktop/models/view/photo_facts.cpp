@@ -15,8 +15,8 @@ namespace {
 
 // Source: CIPA DC-008-2012, sections 4.6.4 to 4.6.6.
 constexpr uint16_t kMake = 0x010f, kModel = 0x0110, kChanged = 0x0132, kExposure = 0x829a,
-                   kFNumber = 0x829d, kIso = 0x8827, kTaken = 0x9003, kBias = 0x9204, kFlash = 0x9209, kFocalLength = 0x920a,
-                   kFocalLengthIn35 = 0xa405,
+                   kFNumber = 0x829d, kIso = 0x8827, kTaken = 0x9003, kBias = 0x9204,
+                   kFlash = 0x9209, kFocalLength = 0x920a, kFocalLengthIn35 = 0xa405,
                    kLensMake = 0xa433, kLens = 0xa434;
 constexpr double kLongestFraction = 0.3;  // seconds; longer exposures are shown as decimals
 

@@ -137,8 +137,9 @@ void DestinationDialog::BuildSizeRow(wxSizer& grid) {
   size_ = new wxComboBox(this, wxID_ANY);
   size_->SetName(Label("Size"));
   size_->SetHint(Label("Original size"));
-  size_->SetToolTip(Label("The largest width and height, such as 1600x1200, or a percentage; "
-                          "empty: the original size"));
+  size_->SetToolTip(
+      Label("The largest width and height, such as 1600x1200, or a percentage; "
+            "empty: the original size"));
   for (const NamedSize& size : NamedSizes()) size_->Append(Shown(size.text));
   for (const char* percent : {"75%", "50%", "25%"}) size_->Append(percent);
   if (resizes_) size_->SetSelection(0);
@@ -156,8 +157,8 @@ void DestinationDialog::BuildQualityRow(wxSizer& grid) {
                            TrLater("Best quality up to a file size, KB")})
     limit_->Append(Label(text));
   limit_->SetSelection(kAsInSetup);
-  number_ = new wxSpinCtrl(this, wxID_ANY, wxEmptyString, wxDefaultPosition,
-                           FromDIP(wxSize(130, -1)));
+  number_ =
+      new wxSpinCtrl(this, wxID_ANY, wxEmptyString, wxDefaultPosition, FromDIP(wxSize(130, -1)));
   number_->SetName(Label("Quality or size"));
   limit_->Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { LimitChosen(); });
   number_->Bind(wxEVT_SPINCTRL, [this](wxSpinEvent&) { UpdateControls(); });
@@ -207,8 +208,7 @@ void DestinationDialog::BuildRecipeRow(wxSizer& grid) {
   recipe_->Append(Label("None"));
   for (const NamedRecipe& recipe : recipes_) recipe_->Append(Shown(recipe.name));
   const auto last = std::ranges::find(recipes_, last_.recipe, &NamedRecipe::name);
-  recipe_->SetSelection(
-      last == recipes_.end() ? 0 : static_cast<int>(last - recipes_.begin()) + 1);
+  recipe_->SetSelection(last == recipes_.end() ? 0 : static_cast<int>(last - recipes_.begin()) + 1);
   recipe_->Bind(wxEVT_CHOICE, [this](wxCommandEvent&) { UpdateControls(); });
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   row->Add(recipe_, wxSizerFlags(1));

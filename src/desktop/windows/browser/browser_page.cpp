@@ -4,6 +4,7 @@
 #include <wx/dnd.h>
 #include <wx/simplebook.h>
 #include <wx/sizer.h>
+#include <wx/slider.h>
 #include <wx/srchctrl.h>
 #include <wx/textdlg.h>
 
@@ -12,6 +13,7 @@
 #include <utility>
 
 #include "core/choice_lists.h"
+#include "desktop/models/browser/thumbnail_side.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/browser/details_list.h"
 #include "desktop/windows/browser/folder_note.h"
@@ -24,6 +26,7 @@
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
+#include "settings/settings.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -42,6 +45,11 @@ BrowserModes Chosen(const BrowserModes& chosen, const BrowserModes& otherwise) {
           either(chosen.sort, otherwise.sort)};
 }
 
+DateGrouping GroupingFromSettings() {
+  const int32_t last = static_cast<int32_t>(DateGrouping::Year);
+  return static_cast<DateGrouping>(std::clamp(settings.BrowserGrouping, 0, last));
+}
+
 }  // namespace
 
 BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails,
@@ -58,6 +66,7 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
       watch_([this] { Reload(); }),
       offer_(this, {[this] { FocusList(); }, [this] { canvas_->WantThumbnails(); }}) {
   model_.SetView(view);
+  model_.SetGrouping(GroupingFromSettings());
   auto* bar = new wxBoxSizer(wxHORIZONTAL);
   path_ = new PathBar(this, trail_,
                       {[this](int steps) { StepAlongTrail(steps); }, [this] { GoUp(); },
@@ -69,6 +78,8 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
   bar->Add(path_, wxSizerFlags(1).CenterVertical());
   BuildFilter();
   bar->Add(filter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
+  BuildSlider();
+  bar->Add(slider_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
   BuildViews();
   problem_ = new FolderProblem(this, [this] { GoUp(); });
   late_.Bind(wxEVT_TIMER,
@@ -102,6 +113,15 @@ void BrowserPage::BuildFilter() {
     if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
     LeaveBar();
   });
+}
+
+void BrowserPage::BuildSlider() {
+  slider_ =
+      new wxSlider(this, wxID_ANY, 0, 0, kSliderEnd, wxDefaultPosition, FromDIP(wxSize(110, -1)),
+                   wxSL_HORIZONTAL, wxDefaultValidator, Label("Thumbnail size"));
+  slider_->SetToolTip(Label("Thumbnail size (Ctrl+wheel)"));
+  slider_->Bind(wxEVT_SLIDER,
+                [this](wxCommandEvent&) { SetSide(SideAtSlider(slider_->GetValue())); });
 }
 
 void BrowserPage::BuildViews() {
@@ -143,6 +163,7 @@ void BrowserPage::ShowFound(const std::string& folder, const std::vector<std::st
     ShowProblem({});
     ShowView();
   }
+  subfolders_ = false;
   found_ = names;
   Reload();
   host_.BrowserChanged();
@@ -175,6 +196,7 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
   wantedNames_.reset();
   watch_.Watch({});
   offer_.Forget();
+  subfolders_ = false;
   model_.SetFolder(folder);
   UseView(kNoModes);
   filter_->ChangeValue("");
@@ -200,7 +222,7 @@ void BrowserPage::UseView(const BrowserModes& chosen) {
 
 void BrowserPage::Reload() {
   if (found_) return reader_.ListFound(model_.Folder(), *found_);
-  reader_.List(model_.Folder(), model_.ItemCount() == 0);
+  reader_.List(model_.Folder(), model_.ItemCount() == 0, subfolders_);
   late_.StartOnce(kPatienceMs);
 }
 
@@ -219,8 +241,10 @@ void BrowserPage::ShowListing(FolderListing listing, bool complete) {
   ShowWanted();
   if (complete) {
     if (!found_) watch_.Watch(model_.Folder());
+    factsRead_ = false;
     StartFacts();
-    if (!found_ && state == FolderState::Listed && !note_->IsShown()) OfferThumbnails();
+    const bool offers = !found_ && !subfolders_ && !note_->IsShown();
+    if (offers && state == FolderState::Listed) OfferThumbnails();
     wantedFocus_.clear();
     wantedScroll_ = -1;
     wantedNames_.reset();
@@ -269,12 +293,12 @@ void BrowserPage::OfferThumbnails() {
 
 bool BrowserPage::NeedsFacts() const {
   const BrowserModes& modes = model_.Modes();
-  return modes.view == choice::kViewDetails || modes.sort == choice::kSortExifDate ||
-         modes.sort == choice::kSortDimensions;
+  return modes.view == choice::kViewDetails || model_.Grouping() != DateGrouping::None ||
+         modes.sort == choice::kSortExifDate || modes.sort == choice::kSortDimensions;
 }
 
 void BrowserPage::StartFacts() {
-  if (Listing() || reader_.ReadingFacts() || !NeedsFacts()) return;
+  if (factsRead_ || Listing() || reader_.ReadingFacts() || !NeedsFacts()) return;
   PlacedItems wanted;
   for (size_t line = 0; line < model_.LineCount(); ++line) {
     const size_t item = model_.ItemOfLine(line);
@@ -286,8 +310,11 @@ void BrowserPage::StartFacts() {
 
 void BrowserPage::ShowFacts(const PlacedItems& found, bool last) {
   for (const auto& [item, known] : found) model_.SetFacts(item, known);
+  factsRead_ = last;  // files that cannot be read have none
   const int32_t sort = model_.Modes().sort;
-  if (last && (sort == choice::kSortExifDate || sort == choice::kSortDimensions)) {
+  const bool ordered = sort == choice::kSortExifDate || sort == choice::kSortDimensions ||
+                       model_.Grouping() != DateGrouping::None;
+  if (last && ordered) {
     model_.UpdateOrder();
     ShowView();
   } else if (ShowsDetails()) {
@@ -312,11 +339,12 @@ void BrowserPage::ShowView() {
     events.sort = [this](int32_t sort) {
       SetSort(sort, model_.Modes().sort == sort && !model_.Descending());
     };
-    details_ = new DetailsList(views_, model_, host_.Columns(), events);
+    details_ = new DetailsList(views_, model_, host_.Columns(), thumbnails_, events);
     views_->AddPage(details_, Label("Details"));
   }
   const bool hadFocus = canvas_->HasFocus() || (details_ != nullptr && details_->HasFocus());
   views_->SetSelection(details ? kDetailsView : kThumbnailView);
+  slider_->SetValue(SliderAtSide(SideInView(model_.Modes().view, settings.ThumbnailSide)));
   ShowLines();
   if (details) {
     details_->ShowSelection();
@@ -349,6 +377,7 @@ void BrowserPage::ChooseView(const FolderView& view) {
 }
 
 void BrowserPage::SetViewMode(int32_t mode) {
+  settings.ThumbnailSide = 0;
   FolderView view = model_.View();
   view.modes.view = mode;
   ChooseView(view);
@@ -368,9 +397,41 @@ void BrowserPage::SetThumbnailMode(int32_t mode) {
 }
 
 void BrowserPage::ChangeSize(int steps) {
-  const int32_t view =
-      std::clamp(model_.Modes().view + steps, choice::kViewList + 0, choice::kViewLarge + 0);
-  if (view != model_.Modes().view) SetViewMode(view);
+  const int32_t view = model_.Modes().view;
+  const bool thumbnails = view >= choice::kViewSmall;
+  const int32_t side = SideInView(view, settings.ThumbnailSide);
+  if (!thumbnails || (steps < 0 && side == kSmallestSide)) {
+    const int32_t other = std::clamp(view + steps, choice::kViewList + 0, choice::kViewSmall + 0);
+    if (other != view) SetViewMode(other);
+  } else {
+    SetSide(SteppedSide(side, steps));
+  }
+}
+
+void BrowserPage::SetSide(int32_t side) {
+  if (model_.Modes().view >= choice::kViewSmall &&
+      side == SideInView(model_.Modes().view, settings.ThumbnailSide))
+    return;
+  FolderView view = model_.View();
+  view.modes.view = ViewOfSide(side);
+  settings.ThumbnailSide = side;
+  LogEvent("thumbnail-side", std::to_string(side));
+  ChooseView(view);
+}
+
+void BrowserPage::SetGrouping(DateGrouping grouping) {
+  settings.BrowserGrouping = static_cast<int32_t>(grouping);
+  model_.SetGrouping(grouping);
+  LogEvent("groups", std::to_string(model_.Groups().size()));
+  ShowView();
+  host_.BrowserChanged();
+}
+
+void BrowserPage::ShowSubfolders(bool show) {
+  if (found_ || show == subfolders_) return;
+  subfolders_ = show;
+  offer_.Forget();
+  Reload();
 }
 
 void BrowserPage::SelectionChanged() {
@@ -401,12 +462,19 @@ void BrowserPage::SelectWhenListed(std::vector<std::string> names) {
   SelectionChanged();
 }
 
+void BrowserPage::FocusPath(const std::string& path) {
+  const size_t line = model_.LineOfPath(path);
+  if (line == kNoLine) return;
+  model_.Selected().SelectOnly(line);
+  SelectionChanged();
+}
+
 void BrowserPage::EditFocusedName() {
   const size_t focus = model_.Selected().Focus();
   if (focus == kNoLine) return;
   if (!ShowsDetails()) return canvas_->EditName(focus);
   wxTextEntryDialog dialog(this, Label("New name:"), Label("Rename"),
-                           Shown(platform::FileNameOf(model_.Line(focus).name)));
+                           Shown(ShownName(model_.Line(focus))));
   if (dialog.ShowModal() == wxID_OK)
     host_.RenameFile(model_.PathOfLine(focus), Utf8(dialog.GetValue()));
 }
@@ -437,14 +505,26 @@ void BrowserPage::LeaveBar() {
 }
 
 void BrowserPage::Activated() {
+  if (model_.Grouping() != GroupingFromSettings()) {
+    model_.SetGrouping(GroupingFromSettings());
+    ShowView();
+  }
   thumbnails_.SetListener(
       [this](const std::vector<ThumbnailLoader::Result>& results) { ThumbnailsCame(results); });
-  canvas_->WantThumbnails();
+  if (ShowsDetails()) {
+    details_->WantThumbnails();
+  } else {
+    canvas_->ModelChanged();  // the size may have changed in another browser
+  }
   if (details_ != nullptr) details_->ShowColumns();
 }
 
 void BrowserPage::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results) {
-  canvas_->ThumbnailsCame(results);
+  if (ShowsDetails()) {
+    details_->ThumbnailsCame(results);
+  } else {
+    canvas_->ThumbnailsCame(results);
+  }
   if (EventLogOn()) host_.BrowserChanged();
 }
 

@@ -17,6 +17,7 @@
 
 class wxSearchCtrl;
 class wxSimplebook;
+class wxSlider;
 
 namespace fotomill::desktop {
 
@@ -83,6 +84,12 @@ class BrowserPage : public wxPanel {
   void SetSort(int32_t sort, bool descending);  // keeps the selected files
   // Changes to the next larger or smaller thumbnails.
   void ChangeSize(int steps);
+  // The edge of thumbnails, device-independent; changes the view to one that has it.
+  void SetSide(int32_t side);
+  void SetGrouping(DateGrouping grouping);
+  // Whether the files in subfolders are listed as well, until another folder is opened.
+  void ShowSubfolders(bool show);
+  bool ShowsSubfolders() const { return subfolders_; }
   // Updates the display of the model's selection.
   void SelectionChanged();
   // Focuses the line with this name and scrolls it into view.
@@ -90,6 +97,7 @@ class BrowserPage : public wxPanel {
   // Selects exactly these names once the folder is listed again, and nothing until then. For
   // commands that just changed the files.
   void SelectWhenListed(std::vector<std::string> names);
+  void FocusPath(const std::string& path);  // of a file
   void EditFocusedName();  // in the list
   void EditPath();         // focuses the path and selects its text
   void OfferTrail();  // shows a menu of visited folders
@@ -115,6 +123,7 @@ class BrowserPage : public wxPanel {
 
  private:
   void BuildFilter();
+  void BuildSlider();
   void BuildViews();
   void ShowFolder(const std::string& folder, const std::string& focus);
   void ShowListing(FolderListing listing, bool complete);
@@ -143,6 +152,8 @@ class BrowserPage : public wxPanel {
   BrowserModes override_;  // from the folder's own file; -1: none
   FolderTrail trail_;
   std::optional<std::vector<std::string>> found_;  // the files to show; none: the folder
+  bool subfolders_ = false;
+  bool factsRead_ = false;  // those of the current listing, as far as possible
   std::string wantedFocus_;
   int64_t wantedScroll_ = -1;
   std::optional<std::vector<std::string>> wantedNames_;  // to select
@@ -154,6 +165,7 @@ class BrowserPage : public wxPanel {
 
   PathBar* path_ = nullptr;
   wxSearchCtrl* filter_ = nullptr;
+  wxSlider* slider_ = nullptr;
   wxSimplebook* views_ = nullptr;
   FolderProblem* problem_ = nullptr;  // shown instead of the views
   FolderNote* note_ = nullptr;

@@ -12,29 +12,42 @@ namespace fotomill::desktop {
 
 class DetailsList::Lines : public wxDataViewVirtualListModel {
  public:
-  explicit Lines(const BrowserModel& model) : model_(model) {}
+  Lines(const BrowserModel& model, DetailsIcons& icons) : model_(model), icons_(icons) {}
   unsigned int GetColumnCount() const { return static_cast<unsigned>(AllDetails().size()); }
-  wxString GetColumnType(unsigned int) const { return "string"; }
+  wxString GetColumnType(unsigned int column) const {
+    return column == 0 ? "wxDataViewIconText" : "string";
+  }
   void GetValueByRow(wxVariant& value, unsigned int row, unsigned int column) const override {
-    value =
-        row < model_.LineCount() ? Shown(AllDetails()[column].text(model_.Line(row))) : wxString();
+    const bool there = row < model_.LineCount();
+    const wxString text = there ? Shown(AllDetails()[column].text(model_.Line(row))) : wxString();
+    if (column != 0) {
+      value = text;
+    } else if (there && icons_.Side() > 0) {
+      value << wxDataViewIconText(text, icons_.IconOf(row));
+    } else {
+      value << wxDataViewIconText(text);
+    }
   }
   bool SetValueByRow(const wxVariant&, unsigned int, unsigned int) override { return false; }
 
  private:
   const BrowserModel& model_;
+  DetailsIcons& icons_;
 };
 
 DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& columns,
-                         Events events)
+                         ThumbnailService& thumbnails, Events events)
     : wxDataViewCtrl(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
                      wxDV_MULTIPLE | wxDV_ROW_LINES | wxBORDER_NONE, wxDefaultValidator,
                      Label("Details")),
       model_(model),
       columns_(columns),
       events_(std::move(events)),
-      lines_(new Lines(model)) {
+      icons_(*this, model, thumbnails,
+             [this](size_t line) { lines_->RowChanged(static_cast<unsigned>(line)); }),
+      lines_(new Lines(model, icons_)) {
   AssociateModel(lines_.get());
+  if (icons_.Side() > 0) SetRowHeight(icons_.Side() + FromDIP(4));
   SetFont(FontOf(*this, TextSize::Normal));
   ShowColumns();
   Bind(wxEVT_DATAVIEW_SELECTION_CHANGED, [this](wxDataViewEvent&) { ReadSelection(); });
@@ -61,10 +74,16 @@ void DetailsList::ShowColumns() {
   for (const DetailColumn& column : columns_) {
     const DetailFacts& facts = AllDetails()[column.detail];
     const wxAlignment alignment = facts.number ? wxALIGN_RIGHT : wxALIGN_LEFT;
+    wxDataViewRenderer* renderer = nullptr;
+    if (column.detail == 0) {
+      renderer = new wxDataViewIconTextRenderer("wxDataViewIconText", wxDATAVIEW_CELL_INERT);
+    } else {
+      renderer = new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT,
+                                            alignment | wxALIGN_CENTER_VERTICAL);
+    }
     auto* added = new wxDataViewColumn(
-        Label(facts.title), new wxDataViewTextRenderer("string", wxDATAVIEW_CELL_INERT, alignment),
-        static_cast<unsigned>(column.detail), FromDIP(column.width), alignment,
-        wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE);
+        Label(facts.title), renderer, static_cast<unsigned>(column.detail), FromDIP(column.width),
+        alignment, wxDATAVIEW_COL_RESIZABLE | wxDATAVIEW_COL_REORDERABLE);
     added->SetHidden(!column.shown);
     AppendColumn(added);
   }
@@ -113,7 +132,12 @@ void DetailsList::ChooseColumns() {
 
 // --- lines ---
 
+void DetailsList::ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results) {
+  icons_.ThumbnailsCame(results);
+}
+
 void DetailsList::ShowLines() {
+  icons_.Forget();
   changing_ = true;
   lines_->Reset(static_cast<unsigned>(model_.LineCount()));
   changing_ = false;

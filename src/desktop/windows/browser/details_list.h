@@ -6,6 +6,7 @@
 
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/browser/detail_columns.h"
+#include "desktop/windows/browser/details_icons.h"
 
 namespace fotomill::desktop {
 
@@ -22,8 +23,12 @@ class DetailsList : public wxDataViewCtrl {
   };
 
   // `columns` belong to the frame: all lists share them.
-  DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& columns, Events events);
+  DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& columns,
+              ThumbnailService& thumbnails, Events events);
 
+  // Small thumbnails: when some are loaded, and when this browser becomes active.
+  void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
+  void WantThumbnails() { icons_.WantThumbnails(); }
   // Call after changes of lines, order or facts.
   void ModelChanged();
   // Shows the model's selection and scrolls to the focused line.
@@ -43,6 +48,7 @@ class DetailsList : public wxDataViewCtrl {
   DetailColumns& columns_;
   DetailColumns shown_;  // as currently shown
   const Events events_;
+  DetailsIcons icons_;
   wxObjectDataPtr<Lines> lines_;
   bool changing_ = false;  // events are caused by the program
 };

@@ -10,10 +10,11 @@ constexpr size_t kBunch = 200;
 
 }  // namespace
 
-void FolderReader::List(const std::string& folder, bool namesFirst) {
+void FolderReader::List(const std::string& folder, bool namesFirst, bool subfolders) {
   facts_.Stop();
   listing_.Start(
-      [this, folder, namesFirst](const StopToken& stop, const LooseWork::Report& report) {
+      [this, folder, namesFirst, subfolders](const StopToken& stop,
+                                             const LooseWork::Report& report) {
         const auto send = [&](FolderListing listing, bool complete) {
           // Reports are copied on their way, which a large listing should not be.
           const auto sent = std::make_shared<FolderListing>(std::move(listing));
@@ -22,7 +23,8 @@ void FolderReader::List(const std::string& folder, bool namesFirst) {
             events_.listed(std::move(*sent), complete);
           });
         };
-        FolderListing listing = ListForBrowser(folder, false, stop);
+        FolderListing listing =
+            subfolders ? ListWithSubfolders(folder, stop) : ListForBrowser(folder, false, stop);
         if (namesFirst && listing.state == FolderState::Listed && !stop.Asked())
           send(FolderListing(listing), false);
         AddFacts(folder, listing, stop);

@@ -28,7 +28,8 @@ class FolderReader {
 
   // Lists a folder. With `namesFirst`, names are delivered first, and sizes and times in a second,
   // complete list, so that even a folder of 100,000 files is shown immediately.
-  void List(const std::string& folder, bool namesFirst);
+  // With `subfolders`, lists the files in them as well.
+  void List(const std::string& folder, bool namesFirst, bool subfolders);
   // Lists only these files, by names relative to the folder.
   void ListFound(const std::string& folder, std::vector<std::string> names);
   // Whether a listing is in progress.

@@ -8,14 +8,15 @@
 #include <unordered_set>
 
 #include "core/choice_lists.h"
+#include "desktop/models/browser/thumbnail_side.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/models/thumbnails/line_request.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/screen_reader.h"
 #include "desktop/windows/widgets/text_sizes.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
-#include "settings/job_options.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
@@ -91,13 +92,14 @@ void ThumbnailCanvas::MeasureCells() {
     square_ = 0;
     layout_.SetCells(TextWidth(*this, kListWidth), textHeight_ + padding, FromDIP(2));
   } else {
-    square_ = FromDIP(model_.Modes().view == choice::kViewSmall   ? 48
-                      : model_.Modes().view == choice::kViewLarge ? 176
-                                                                  : 96);
+    square_ = FromDIP(SideInView(model_.Modes().view, settings.ThumbnailSide));
     const int width = std::max(square_ + 4 * padding, TextWidth(*this, 96));
     layout_.SetCells(width, square_ + textHeight_ + 3 * padding, FromDIP(4));
   }
   layout_.SetCount(model_.LineCount());
+  std::vector<size_t> firstLines;
+  for (const LineGroup& group : model_.Groups()) firstLines.push_back(group.first);
+  layout_.SetGroups(std::move(firstLines), textHeight_ + 3 * padding);
   layout_.SetWindow(GetClientSize().x, GetClientSize().y);
 }
 
@@ -118,15 +120,8 @@ void ThumbnailCanvas::UpdateScrollbar() {
 }
 
 ThumbnailRequest ThumbnailCanvas::RequestOf(size_t line) const {
-  const FolderItem& item = model_.Line(line);
-  ThumbnailRequest request;
-  request.path = model_.PathOfLine(line);
-  request.modified = item.modified;
-  request.size = item.size;
-  request.side = static_cast<int32_t>(std::lround(square_ * GetContentScaleFactor()));
-  request.mode = model_.Modes().thumbnails;
-  request.options = ThumbnailOptionsFromSettings();
-  return request;
+  return RequestForLine(model_, line,
+                        static_cast<int32_t>(std::lround(square_ * GetContentScaleFactor())));
 }
 
 // Requests stand-ins for visible files, then their thumbnails, then one screen ahead in scroll
@@ -157,6 +152,7 @@ void ThumbnailCanvas::WantThumbnails() {
         want(line, line + 1);
     }
     requests.insert(requests.begin(), standIns.begin(), standIns.end());
+    WantFolders(visible, requests);
   }
   thumbnails_.Want(std::move(requests));
 }
@@ -170,6 +166,18 @@ size_t ThumbnailCanvas::RoomAhead(const CellLayout::Range& visible) {
   thumbnails_.MakeRoomFor(kScreensKept * shown * bytes);
   const size_t room = static_cast<size_t>(thumbnails_.Room() / std::max<uint64_t>(bytes, 1));
   return room > 2 * shown ? room - 2 * shown : 0;
+}
+
+// Previews of visible folders come last.
+void ThumbnailCanvas::WantFolders(const CellLayout::Range& lines,
+                                  std::vector<ThumbnailRequest>& requests) {
+  if (settings.AlternateFolderGraphics != 0) return;
+  for (size_t line = lines.first; line < lines.end; ++line) {
+    if (!model_.Line(line).folder || model_.Line(line).modified == 0) continue;
+    ThumbnailRequest request = RequestOf(line);
+    request.folder = true;
+    if (thumbnails_.Find(request) == nullptr) requests.push_back(std::move(request));
+  }
 }
 
 std::vector<ThumbnailRequest> ThumbnailCanvas::StandInsFor(const CellLayout::Range& lines) const {
@@ -455,7 +463,7 @@ void ThumbnailCanvas::EditName(size_t line) {
   if (line >= model_.LineCount()) return;
   ShowLine(line);
   const Rect cell = layout_.Cell(line);
-  const std::string name(platform::FileNameOf(model_.Line(line).name));  // of a found file, too
+  const std::string name(ShownName(model_.Line(line)));
   const int height = textHeight_ + FromDIP(12);
   const int top = static_cast<int>(cell.y - scroll_) + cell.height - height;
   editedLine_ = line;
@@ -486,8 +494,8 @@ void ThumbnailCanvas::FinishEdit(bool accept) {
   const size_t line = std::exchange(editedLine_, kNoLine);
   const std::string name = Utf8(editor->GetValue());
   const bool hadFocus = editor->HasFocus();
-  const bool changed = line < model_.LineCount() && editor->IsModified() &&
-                       name != platform::FileNameOf(model_.Line(line).name);
+  const bool changed =
+      line < model_.LineCount() && editor->IsModified() && name != ShownName(model_.Line(line));
   editor->Hide();
   editor->Destroy();
   if (hadFocus) SetFocus();

@@ -11,6 +11,7 @@
 
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/browser/cell_layout.h"
+#include "desktop/models/browser/thumbnail_side.h"
 #include "desktop/windows/browser/hover_tip.h"
 #include "desktop/windows/browser/thumbnail_service.h"
 
@@ -76,8 +77,13 @@ class ThumbnailCanvas : public wxWindow {
   void MeasureCells();
   void DrawCell(wxDC& dc, size_t line, const Looks& looks);
   void DrawPicture(wxDC& dc, size_t line, const wxRect& square, const Looks& looks);
-  void DrawPlaceholder(wxDC& dc, size_t line, const wxRect& square, bool unreadable,
+  void DrawPlaceholder(wxDC& dc, size_t line, const wxRect& square, CellTrouble trouble,
                        const Looks& looks);
+  void DrawFolder(wxDC& dc, const wxRect& square);
+  void DrawFolderPreview(wxDC& dc, size_t line, const wxRect& square);
+  void DrawHeadings(wxDC& dc, const Looks& looks);
+  void DrawTrouble(wxDC& dc, const wxRect& square, CellTrouble trouble, const Looks& looks,
+                   const wxColour& text);
   const wxBitmap& PlaceholderBitmap(bool unreadable, int side, const wxColour& background);
   // A name as it fits a cell, and its width.
   struct CutText {
@@ -89,6 +95,7 @@ class ThumbnailCanvas : public wxWindow {
   void CutNamesAhead();
   const wxBitmap& BitmapOfThumbnail(const ThumbnailPointer& thumbnail);
   ThumbnailRequest RequestOf(size_t line) const;
+  void WantFolders(const CellLayout::Range& lines, std::vector<ThumbnailRequest>& requests);
   std::vector<ThumbnailRequest> StandInsFor(const CellLayout::Range& lines) const;
   size_t RoomAhead(const CellLayout::Range& visible);
   void ShowRestored();

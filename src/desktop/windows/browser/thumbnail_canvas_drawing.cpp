@@ -1,4 +1,5 @@
 #include <wx/control.h>
+#include <wx/datetime.h>
 #include <wx/dcclient.h>
 #include <wx/dcmemory.h>
 #include <wx/settings.h>
@@ -27,6 +28,16 @@ constexpr size_t kMostCutNames = 5000;
 constexpr int kAheadMs = 5;  // after painting
 constexpr unsigned long kInkOnPaper = 0x3D3D90;  // for an extension on the sheet, 0xBBGGRR
 
+// "22 November 2026", "November 2026" or "2026" in the user's language.
+wxString TitleOfGroup(int32_t date) {
+  const int year = date / 10'000, month = date / 100 % 100, day = date % 100;
+  if (year == 0) return Label("Folders");
+  if (month < 1 || month > 12) return wxString::Format("%d", year);
+  const wxString name = wxDateTime::GetMonthName(static_cast<wxDateTime::Month>(month - 1));
+  if (day == 0) return wxString::Format("%s %d", name, year);
+  return wxString::Format("%d %s %d", day, name, year);
+}
+
 }  // namespace
 
 // Colors for one paint event.
@@ -35,7 +46,7 @@ struct ThumbnailCanvas::Looks {
   wxColour background = ToWx(palette.background), text = ToWx(palette.text);
   wxColour selected = ToWx(palette.selected), selectedText = ToWx(palette.selectedText);
   wxColour resting = ToWx(palette.resting), restingText = ToWx(palette.restingText);
-  wxColour frame = ToWx(palette.frame), note = ToWx(palette.note);
+  wxColour frame = ToWx(palette.frame), note = ToWx(palette.note), faint = ToWx(palette.faint);
 };
 
 // Logs the first paint, the first one with files, and slow ones.
@@ -67,6 +78,7 @@ void ThumbnailCanvas::Paint() {
   ++paints_;
   for (size_t line = visible.first; line < visible.end; ++line) DrawCell(dc, line, looks);
   DropBitmaps();
+  DrawHeadings(dc, looks);
   if (!aheadTimer_.IsRunning()) aheadTimer_.StartOnce(kAheadMs);
   if (banding_ && pressed_) {
     const wxRect band(
@@ -104,17 +116,18 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
   if (square_ == 0) {
     const wxRect icon(cell.x + padding, cell.y + (cell.height - FromDIP(16)) / 2, FromDIP(16),
                       FromDIP(16));
-    DrawPlaceholder(dc, line, icon, false, looks);
+    DrawPlaceholder(dc, line, icon, CellTrouble::None, looks);
     const int left = icon.GetRight() + padding;
     dc.SetTextForeground(text);
-    dc.DrawText(CutName(dc, item.name, cell.GetRight() - left - padding).text, left,
+    const int width = cell.GetRight() - left - padding;
+    dc.DrawText(CutName(dc, std::string(ShownName(item)), width).text, left,
                 cell.y + (cell.height - textHeight_) / 2);
     return;
   }
   const wxRect square(cell.x + (cell.width - square_) / 2, cell.y + padding, square_, square_);
   DrawPicture(dc, line, square, looks);
   if (line == editedLine_) return;
-  const CutText& name = CutName(dc, item.name, NameWidth());
+  const CutText& name = CutName(dc, std::string(ShownName(item)), NameWidth());
   dc.SetTextForeground(text);
   dc.DrawText(name.text, cell.x + (cell.width - name.width) / 2,
               square.GetBottom() + 1 + padding);
@@ -122,21 +135,29 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
 
 void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, const Looks& looks) {
   const FolderItem& item = model_.Line(line);
-  if (item.folder) return DrawPlaceholder(dc, line, square, false, looks);
+  if (item.folder) {
+    DrawFolder(dc, square);
+    return DrawFolderPreview(dc, line, square);
+  }
   const ThumbnailRequest request = RequestOf(line);
   ThumbnailPointer thumbnail = thumbnails_.Find(request);
   const bool right = thumbnail != nullptr;
   if (!right) thumbnail = thumbnails_.FindAny(request.path);
   if (thumbnail == nullptr || thumbnail->status != Status::Ok)
-    return DrawPlaceholder(dc, line, square, thumbnail != nullptr, looks);
+    return DrawPlaceholder(dc, line, square,
+                           thumbnail == nullptr ? CellTrouble::None : TroubleOf(thumbnail->status),
+                           looks);
   const wxBitmap& bitmap = BitmapOfThumbnail(thumbnail);
-  if (!bitmap.IsOk()) return DrawPlaceholder(dc, line, square, true, looks);
+  if (!bitmap.IsOk()) return DrawPlaceholder(dc, line, square, CellTrouble::Damaged, looks);
   // Uses another size, or the embedded thumbnail, until the right one is loaded.
   double scale = 1;
   const wxSize size = wxSize(static_cast<int>(std::lround(bitmap.GetLogicalWidth())),
                              static_cast<int>(std::lround(bitmap.GetLogicalHeight())));
   if (!right) scale = static_cast<double>(square_) / std::max({size.x, size.y, 1});
-  if (!right && !thumbnail->standIn) scale = std::min(scale, 1.0);
+  if (!right && !thumbnail->standIn && thumbnail->width > 0) {
+    const int largest = std::max(thumbnail->width, thumbnail->height);
+    scale = std::min(scale, static_cast<double>(largest) / std::max({size.x, size.y, 1}));
+  }
   const wxSize shown(std::max(static_cast<int>(size.x * scale), 1),
                      std::max(static_cast<int>(size.y * scale), 1));
   const wxPoint corner(square.x + (square.width - shown.x) / 2,
@@ -154,27 +175,105 @@ void ThumbnailCanvas::DrawPicture(wxDC& dc, size_t line, const wxRect& square, c
   DrawBadges(dc, *this, wxRect(corner, shown), *thumbnail, looks.selected, looks.selectedText);
 }
 
-// Draws a folder, or the placeholder with the file's extension, before or instead of a thumbnail.
-void ThumbnailCanvas::DrawPlaceholder(wxDC& dc, size_t line, const wxRect& square, bool unreadable,
-                                      const Looks& looks) {
-  const FolderItem& item = model_.Line(line);
-  if (item.folder) {
-    const int side = square.width;
-    const wxRect body(square.x + side / 10, square.y + side * 3 / 10, side * 8 / 10,
-                      side * 11 / 20);
-    const wxColour paper(0xe8, 0xb9, 0x4a), tab(0xc9, 0x95, 0x2b);
-    dc.SetPen(*wxTRANSPARENT_PEN);
-    dc.SetBrush(wxBrush(tab));
-    dc.DrawRoundedRectangle(body.x, body.y - side / 10, body.width * 9 / 20, side / 4,
-                            std::max(side / 24.0, 1.0));
-    dc.SetBrush(wxBrush(paper));
-    dc.DrawRoundedRectangle(body, std::max(side / 24.0, 1.0));
-    return;
+void ThumbnailCanvas::DrawFolder(wxDC& dc, const wxRect& square) {
+  const int side = square.width;
+  const wxRect body(square.x + side / 10, square.y + side * 3 / 10, side * 8 / 10, side * 11 / 20);
+  const wxColour paper(0xe8, 0xb9, 0x4a), tab(0xc9, 0x95, 0x2b);
+  dc.SetPen(*wxTRANSPARENT_PEN);
+  dc.SetBrush(wxBrush(tab));
+  dc.DrawRoundedRectangle(body.x, body.y - side / 10, body.width * 9 / 20, side / 4,
+                          std::max(side / 24.0, 1.0));
+  dc.SetBrush(wxBrush(paper));
+  dc.DrawRoundedRectangle(body, std::max(side / 24.0, 1.0));
+}
+
+// The first picture of a folder, on its front.
+void ThumbnailCanvas::DrawFolderPreview(wxDC& dc, size_t line, const wxRect& square) {
+  const ThumbnailPointer thumbnail = thumbnails_.FindAny(model_.PathOfLine(line));
+  if (thumbnail == nullptr || thumbnail->pixels.Empty()) return;
+  const wxBitmap& bitmap = BitmapOfThumbnail(thumbnail);
+  if (!bitmap.IsOk()) return;
+  const int side = square.width;
+  const wxRect front(square.x + side * 15 / 100, square.y + side * 36 / 100, side * 70 / 100,
+                     side * 43 / 100);
+  const double width = bitmap.GetLogicalWidth(), height = bitmap.GetLogicalHeight();
+  const double scale = std::min({front.width / width, front.height / height, 1.0});
+  const wxSize shown(std::max(static_cast<int>(width * scale), 1),
+                     std::max(static_cast<int>(height * scale), 1));
+  const wxPoint corner(front.x + (front.width - shown.x) / 2,
+                       front.y + (front.height - shown.y) / 2);
+  dc.SetPen(*wxTRANSPARENT_PEN);
+  dc.SetBrush(*wxWHITE_BRUSH);
+  dc.DrawRectangle(wxRect(corner, shown).Inflate(FromDIP(2)));
+  dc.SetUserScale(scale, scale);
+  dc.DrawBitmap(bitmap, static_cast<int>(corner.x / scale), static_cast<int>(corner.y / scale));
+  dc.SetUserScale(1, 1);
+}
+
+// The dates of groups, with a line up to the edge.
+void ThumbnailCanvas::DrawHeadings(wxDC& dc, const Looks& looks) {
+  dc.SetFont(GetFont().Bold());
+  dc.SetTextForeground(looks.text);
+  dc.SetPen(wxPen(looks.frame, FromDIP(1)));
+  for (size_t i = 0; i < layout_.GroupCount(); ++i) {
+    const Rect place = layout_.Heading(i);
+    const int top = static_cast<int>(place.y - scroll_);
+    if (top + place.height < 0 || top > GetClientSize().y) continue;
+    const wxString title = TitleOfGroup(model_.Groups()[i].date);
+    const int gap = FromDIP(kPadding), middle = top + place.height / 2;
+    dc.DrawText(title, place.x + gap, middle - textHeight_ / 2);
+    const int from = place.x + 3 * gap + dc.GetTextExtent(title).x;
+    if (from < place.x + place.width) dc.DrawLine(from, middle, place.x + place.width, middle);
   }
+  dc.SetFont(GetFont());
+}
+
+// A sheet with a lock or a question mark, and what that means below. Damaged files have a
+// crossed-out sheet instead.
+void ThumbnailCanvas::DrawTrouble(wxDC& dc, const wxRect& square, CellTrouble trouble,
+                                  const Looks& looks, const wxColour& text) {
+  const int side = square.width;
+  const wxRect sheet(square.x + side / 5, square.y + side / 12, side * 3 / 5, side * 13 / 20);
+  dc.SetPen(wxPen(looks.frame, FromDIP(1)));
+  dc.SetBrush(wxBrush(looks.faint));
+  dc.DrawRoundedRectangle(sheet, std::max(side / 24.0, 1.0));
+  const wxPoint middle(sheet.x + sheet.width / 2, sheet.y + sheet.height / 2);
+  if (trouble == CellTrouble::NoAccess) {
+    const int width = side / 4, arch = side / 7;
+    dc.SetPen(wxPen(looks.note, std::max(side / 28, 1)));
+    dc.SetBrush(*wxTRANSPARENT_BRUSH);
+    dc.DrawEllipticArc(middle.x - arch / 2, middle.y - arch, arch, 2 * arch, 0, 180);
+    dc.SetBrush(wxBrush(looks.note));
+    dc.DrawRectangle(middle.x - width / 2, middle.y, width, width * 3 / 4);
+  } else {
+    dc.SetFont(GetFont().Scaled(static_cast<float>(side) / 40.0F));
+    dc.SetTextForeground(looks.note);
+    dc.DrawLabel("?", sheet, wxALIGN_CENTER);
+    dc.SetFont(GetFont());
+  }
+  if (side < FromDIP(80)) return;
+  dc.SetTextForeground(text);
+  dc.DrawLabel(wxControl::Ellipsize(Label(TroubleText(trouble)), dc, wxELLIPSIZE_END, side),
+               wxRect(square.x, sheet.GetBottom(), side, square.GetBottom() - sheet.GetBottom()),
+               wxALIGN_CENTER);
+}
+
+// The file's extension on a photograph while the thumbnail is loading, or else why there is none.
+void ThumbnailCanvas::DrawPlaceholder(wxDC& dc, size_t line, const wxRect& square,
+                                      CellTrouble trouble, const Looks& looks) {
+  const FolderItem& item = model_.Line(line);
+  if (item.folder) return DrawFolder(dc, square);
+  const bool unreadable = trouble != CellTrouble::None;
   const bool selected = model_.Selected().IsSelected(line);
   const wxColour& background = !selected    ? looks.background
                                : HasFocus() ? looks.selected
                                             : looks.resting;
+  if (trouble == CellTrouble::NoAccess || trouble == CellTrouble::Unsupported) {
+    const wxColour& text = !selected    ? looks.note
+                           : HasFocus() ? looks.selectedText
+                                        : looks.restingText;
+    return DrawTrouble(dc, square, trouble, looks, text);
+  }
   const wxBitmap& bitmap = PlaceholderBitmap(unreadable, square.width, background);
   if (bitmap.IsOk()) dc.DrawBitmap(bitmap, square.GetTopLeft());
   if (square.width < FromDIP(40)) return;
@@ -233,7 +332,7 @@ void ThumbnailCanvas::CutNamesAhead() {
   const int64_t top = std::max<int64_t>(scroll_ + direction_ * height, 0);
   const CellLayout::Range next = layout_.LinesBetween(top, top + height);
   for (size_t line = next.first; line < next.end; ++line)
-    (void)CutName(dc, model_.Line(line).name, NameWidth());
+    (void)CutName(dc, std::string(ShownName(model_.Line(line))), NameWidth());
 }
 
 const wxBitmap& ThumbnailCanvas::BitmapOfThumbnail(const ThumbnailPointer& thumbnail) {

@@ -83,9 +83,7 @@ void BrowserTabs::SelectFiles(const std::vector<std::string>& files) {
   BrowserModel& model = browser->Model();
   model.Selected().SelectNone();
   for (const std::string& file : files) {
-    const size_t line = platform::SplitPath(file).folder == platform::JoinFolder(model.Folder(), "")
-                            ? model.FindLine(platform::FileNameOf(file))
-                            : kNoLine;
+    const size_t line = model.LineOfPath(file);
     if (line != kNoLine) model.Selected().Set(line, true);
   }
   browser->SelectionChanged();
@@ -96,8 +94,10 @@ void BrowserTabs::SelectWhenListed(const std::vector<std::string>& files) {
     const std::string folder = platform::JoinFolder(PageAt(tab)->Model().Folder(), "");
     std::vector<std::string> names;
     for (const std::string& file : files) {
-      const bool shown = PageAt(tab)->ShowsFound() ? file.starts_with(folder)
-                                                   : platform::SplitPath(file).folder == folder;
+      const BrowserPage& page = *PageAt(tab);
+      const bool shown = page.ShowsFound() || page.ShowsSubfolders()
+                             ? file.starts_with(folder)
+                             : platform::SplitPath(file).folder == folder;
       if (shown) names.push_back(file.substr(folder.size()));
     }
     if (!names.empty()) PageAt(tab)->SelectWhenListed(std::move(names));

@@ -61,6 +61,25 @@ void SortBy(Shell& shell) {
   browser->SetSort(sort, browser->Model().Modes().sort == sort && !browser->Model().Descending());
 }
 
+template <DateGrouping grouping>
+void GroupBy(Shell& shell) {
+  if (BrowserPage* browser = shell.Tabs().Front()) browser->SetGrouping(grouping);
+}
+template <DateGrouping grouping>
+bool IsGroupedBy(Shell& shell) {
+  const BrowserPage* browser = shell.Tabs().Front();
+  return browser != nullptr && browser->Model().Grouping() == grouping;
+}
+
+void ToggleSubfolders(Shell& shell) {
+  if (BrowserPage* browser = shell.Tabs().Front())
+    browser->ShowSubfolders(!browser->ShowsSubfolders());
+}
+bool HasSubfolders(Shell& shell) {
+  const BrowserPage* browser = shell.Tabs().Front();
+  return browser != nullptr && browser->ShowsSubfolders();
+}
+
 template <void (Selection::*action)()>
 void Select(Shell& shell) {
   BrowserPage* browser = shell.Tabs().Front();
@@ -184,6 +203,12 @@ constexpr Command kCommands[] = {
     {kView, TrLater("Sort by d&ate"),       "",             TrLater("Sorts by date; again reverses the order."), Needs::Nothing, SortBy<choice::kSortDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDate>},
     {kView, TrLater("Sort by E&XIF date"),  "",             TrLater("Sorts by the date the pictures were taken; again reverses the order."), Needs::Nothing, SortBy<choice::kSortExifDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortExifDate>},
     {kView, TrLater("Sort by d&imensions"), "",             TrLater("Sorts by the number of pixels; again reverses the order."), Needs::Nothing, SortBy<choice::kSortDimensions>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDimensions>},
+    {kView, nullptr},
+    {kView, TrLater("No gro&ups"),          "",             TrLater("Shows all files in one group."), Needs::Nothing, GroupBy<DateGrouping::None>, nullptr, false, IsGroupedBy<DateGrouping::None>},
+    {kView, TrLater("Group by da&y"),       "",             TrLater("Groups the files by the day they were taken or changed."), Needs::Nothing, GroupBy<DateGrouping::Day>, nullptr, false, IsGroupedBy<DateGrouping::Day>},
+    {kView, TrLater("Group by mo&nth"),     "",             TrLater("Groups the files by the month they were taken or changed."), Needs::Nothing, GroupBy<DateGrouping::Month>, nullptr, false, IsGroupedBy<DateGrouping::Month>},
+    {kView, TrLater("Group by year"),       "",             TrLater("Groups the files by the year they were taken or changed."), Needs::Nothing, GroupBy<DateGrouping::Year>, nullptr, false, IsGroupedBy<DateGrouping::Year>},
+    {kView, TrLater("Include subfolders"),  "",             TrLater("Lists the files in subfolders as well."), Needs::Nothing, ToggleSubfolders, nullptr, false, HasSubfolders},
     {kView, nullptr},
     {kView, TrLater("T&humbnails: disk-based"), "",         TrLater("Reads thumbnails from files beside the pictures."), Needs::Nothing, ThumbnailsFrom<choice::kDiskBased>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kDiskBased>},
     {kView, TrLater("Thumbnails: &virtual"), "",            TrLater("Keeps thumbnails in memory only."), Needs::Nothing, ThumbnailsFrom<choice::kVirtual>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kVirtual>},

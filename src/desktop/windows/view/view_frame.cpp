@@ -437,8 +437,7 @@ void ViewFrame::SettingSwitched() {
 void ViewFrame::Leave() {
   slideshow_.Stop();
   if (IsFullScreen()) return ToggleFullScreen();
-  if (BrowserPage* browser = shell_.Tabs().Front())
-    browser->FocusName(std::string(platform::FileNameOf(list_[place_])));
+  if (BrowserPage* browser = shell_.Tabs().Front()) browser->FocusPath(list_[place_]);
   Close();
 }
 
