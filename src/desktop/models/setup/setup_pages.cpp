@@ -23,6 +23,7 @@ constexpr SetupItem Item(SetupPage page, const char* group, KeyNumber key, const
 // clang-format off
 constexpr SetupItem kItems[] = {
     Item(Browsing,   TrLater("Start"),              RememberOpenWindows,            "Reopen the tabs of the last session"),
+    Item(Browsing,   TrLater("Start"),              NewBrowserMyPictures,           "Otherwise start in the pictures folder"),
     Item(Browsing,   TrLater("Start"),              ShowStartupWindow,              "Show a startup window"),
     Item(Browsing,   TrLater("Start"),              LogoDelay,                      "Display time in milliseconds"),
     Item(Browsing,   TrLater("Text sizes"),         NormalTextFontSize,             "Lists and reports; 10 is the size of the system"),

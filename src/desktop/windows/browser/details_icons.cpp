@@ -18,7 +18,7 @@ namespace {
 
 constexpr int kSide = 32;  // device-independent pixels
 constexpr int kWaitMs = 40;
-constexpr size_t kMostIcons = 2000;
+constexpr size_t kMostIcons = 2000, kMostMissing = 200;
 
 wxImage Transparent(int side) {
   wxImage image(side, side);
@@ -48,6 +48,7 @@ const wxBitmapBundle& DetailsIcons::IconOf(size_t line) {
   const std::string path = model_.PathOfLine(line);
   const ThumbnailPointer thumbnail = thumbnails_.FindAny(path);
   if (thumbnail == nullptr) {
+    if (missing_.size() > kMostMissing) missing_.clear();  // scrolled past
     missing_[path] = line;
     if (!wait_.IsRunning()) wait_.StartOnce(kWaitMs);
     return none_;

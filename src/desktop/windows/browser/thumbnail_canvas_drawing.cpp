@@ -70,8 +70,10 @@ void ThumbnailCanvas::Paint() {
   dc.SetFont(GetFont());
   if (model_.LineCount() == 0 && model_.Listed()) {
     dc.SetTextForeground(looks.note);
-    dc.DrawLabel(model_.Filter().empty() ? Label("There are no pictures in this folder.")
-                                         : Label("No name matches the filter."),
+    const wxString empty =
+        Label("There are no pictures in this folder.") + "\n\n" +
+        Label("Choose a folder on the left, or drop pictures here to copy them.");
+    dc.DrawLabel(model_.Filter().empty() ? empty : Label("No name matches the filter."),
                  wxRect(GetClientSize()), wxALIGN_CENTER);
   }
   const CellLayout::Range visible = layout_.Visible(scroll_);

@@ -85,7 +85,8 @@ MainFrame::~MainFrame() {
 void MainFrame::ShowStartFolder(std::string folder, bool restore) {
   const bool restored = restore && session_->RestoreTabs();
   if (folder.empty() && (restored || tabs_->Front() != nullptr)) return;
-  if (folder.empty()) folder = platform::SpecialFolderPath(platform::SpecialFolder::Pictures);
+  if (folder.empty() && settings.NewBrowserMyPictures != 0)
+    folder = platform::SpecialFolderPath(platform::SpecialFolder::Pictures);
   tabs_->Show(folder.empty() ? platform::CurrentFolder() : folder);
 }
 

@@ -215,6 +215,7 @@ const wxBitmap* OverlayBar::BitmapOfFile(const std::string& path) {
 void OverlayBar::Draw(wxDC& dc) {
   const double opacity = fade_.Opacity(platform::MonotonicSeconds());
   if (opacity == 0 || layout_.Bar().width == 0 || files_ == nullptr) return;
+  if (layout_.Cells().end > files_->size() || current_ >= files_->size()) return;  // has shrunk
   const std::unique_ptr<wxGraphicsContext> context(wxGraphicsContext::CreateFromUnknownDC(dc));
   if (context == nullptr) return;
   context->SetInterpolationQuality(wxINTERPOLATION_FAST);
