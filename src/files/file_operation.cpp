@@ -1,6 +1,7 @@
 #include "files/file_operation.h"
 
 #include <algorithm>
+#include <map>
 #include <set>
 
 #include "catalog/thumbnails/picture_changes.h"
@@ -138,8 +139,7 @@ Outcome Exchange(const FileStep& step) {
                                there ? platform::Existing::Replace : platform::Existing::Refuse);
     if (!outcome.empty()) return outcome;
   }
-  step.previous->Swap(now);
-  step.previous->Replaced(step.from);
+  step.previous->PutBack(step.from, now);
   return {};
 }
 
@@ -473,7 +473,34 @@ void UndoList::KeepLast(std::vector<FileOperation>& list, FileOperation operatio
 void UndoList::NotUndone(FileOperation operation) { KeepLast(done_, std::move(operation)); }
 void UndoList::NotRedone(FileOperation operation) { KeepLast(undone_, std::move(operation)); }
 
-void UndoList::Undone(FileOperation operation) { Keep(undone_, std::move(operation)); }
-void UndoList::Redone(FileOperation operation) { Keep(done_, std::move(operation)); }
+// Contents that were put back are new files, which the operations before and after must know, or
+// they take them for changes by others.
+void UndoList::FollowFiles(const FileOperation& operation) {
+  std::map<std::string, const PreviousFile*> files;
+  for (const FileStep& step : operation.steps) {
+    if (step.previous != nullptr) files.emplace(step.from, step.previous.get());
+  }
+  if (files.empty()) return;
+  for (auto* list : {&done_, &undone_}) {
+    for (FileOperation& other : *list) {
+      for (FileStep& step : other.steps) {
+        const auto found = files.find(step.to.empty() ? step.from : step.to);
+        if (found == files.end()) continue;
+        if (step.previous != nullptr) step.previous->Follow(*found->second);
+        if (step.made.there) found->second->Update(step.made);
+      }
+    }
+  }
+}
+
+void UndoList::Undone(FileOperation operation) {
+  FollowFiles(operation);
+  Keep(undone_, std::move(operation));
+}
+
+void UndoList::Redone(FileOperation operation) {
+  FollowFiles(operation);
+  Keep(done_, std::move(operation));
+}
 
 }  // namespace fotomill

@@ -130,6 +130,7 @@ class UndoList {
  private:
   void Keep(std::vector<FileOperation>& list, FileOperation operation);
   void KeepLast(std::vector<FileOperation>& list, FileOperation operation) const;
+  void FollowFiles(const FileOperation& operation);
   void Shorten(std::vector<FileOperation>& list) const;
 
   size_t most_;

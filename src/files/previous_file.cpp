@@ -29,7 +29,14 @@ std::vector<platform::FolderEntry> EntriesOf(const std::string& folder) {
 
 bool PreviousFile::Keep(const std::string& path) {
   kept_.Delete();
+  original_ = platform::StampOf(path);
   return platform::ExistenceOf(path) == platform::Existence::No || kept_.Keep(path, KeptFolder());
+}
+
+void PreviousFile::PutBack(const std::string& path, PreviousFile& now) {
+  kept_.Swap(now.kept_);
+  restored_ = std::exchange(original_, now.original_);
+  Replaced(path);
 }
 
 bool PreviousFile::HasChanged(const std::string& path) const {

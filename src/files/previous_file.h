@@ -22,12 +22,22 @@ class PreviousFile {
   void Replaced(const std::string& path) { replaced_ = platform::StampOf(path); }
   // Whether the file was modified since it was replaced.
   bool HasChanged(const std::string& path) const;
-  void Swap(PreviousFile& other) { kept_.Swap(other.kept_); }
+  // To be called after the kept contents were put back: those of `now`, kept just before, take
+  // their place.
+  void PutBack(const std::string& path, PreviousFile& now);
+  // After that: the state that was put back is now that of another file.
+  void Update(platform::FileStamp& state) const {
+    if (state == restored_) state = replaced_;
+  }
+  // After `other` was put back: if that restored the state this one left, it goes on from there.
+  void Follow(const PreviousFile& other) { other.Update(replaced_); }
   const std::string& Path() const { return kept_.Path(); }  // empty: there was no file
 
  private:
   platform::TemporaryFile kept_;
-  platform::FileStamp replaced_;
+  platform::FileStamp original_;  // the file whose contents are kept
+  platform::FileStamp replaced_;  // the file after it was replaced or put back
+  platform::FileStamp restored_;  // the state that was put back last; its copy is `replaced_`
 };
 
 // The previous files of one batch. Thread-safe.

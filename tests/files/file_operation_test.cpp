@@ -5,6 +5,7 @@
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "catalog/thumbnails/thumbnail_store.h"
 #include "core/data_folder.h"
+#include "files/previous_file.h"
 #include "platform/files.h"
 #include "support/files.h"
 #include "support/scoped_environment.h"
@@ -285,6 +286,60 @@ TEST(UndoList, KeepsWhatCouldNotBeUndone) {
   list.NotRedone(list.PopUndo());
   EXPECT_FALSE(list.CanUndo());
   EXPECT_EQ(list.RedoName(), "rename of a");
+}
+
+TEST_F(FileOperationTest, ChangesOfOneFileAreUndoneAndRedoneInARow) {
+  UndoList list(4);
+  for (const char* text : {"one", "two", "three"}) {
+    PreviousFiles previous(FileOperationKind::Tag);
+    ASSERT_TRUE(previous.Keep(From("a.png")));
+    ASSERT_TRUE(previous.Keep(From("a.png.xmp")));
+    std::filesystem::remove(From("a.png"));  // a new file, as functions write it
+    std::filesystem::remove(From("a.png.xmp"));
+    WriteText(From("a.png"), text);
+    WriteText(From("a.png.xmp"), text);
+    for (const char* name : {"a.png", "a.png.xmp"}) previous.Replaced(From(name));
+    list.Add(previous.Operation());
+  }
+  const auto undo = [&] {
+    FileOperationResult result = Revert(list.PopUndo());
+    EXPECT_THAT(result.failures, IsEmpty());
+    list.Undone(std::move(result.done));
+    return ReadText(From("a.png"));
+  };
+  const auto redo = [&] {
+    FileOperationResult result = CarryOut(list.PopRedo());
+    EXPECT_THAT(result.failures, IsEmpty());
+    list.Redone(std::move(result.done));
+    return ReadText(From("a.png.xmp"));
+  };
+  for (int round = 0; round < 2; ++round) {
+    EXPECT_EQ(undo(), "two");
+    EXPECT_EQ(undo(), "one");
+    EXPECT_EQ(redo(), "two");
+    EXPECT_EQ(undo(), "one");
+    EXPECT_EQ(undo(), "a.png");
+    EXPECT_FALSE(platform::FileExists(From("a.png.xmp")));
+    for (const char* text : {"one", "two", "three"}) EXPECT_EQ(redo(), text);
+  }
+  // So can the copy that is changed.
+  list.Add(CarryOut(PlanFileOperation(FileOperationKind::Copy, {From("b.png")}, folder_.Path("to")))
+               .done);
+  PreviousFiles previous(FileOperationKind::Tag);
+  ASSERT_TRUE(previous.Keep(To("b.png")));
+  std::filesystem::remove(To("b.png"));
+  WriteText(To("b.png"), "B");
+  previous.Replaced(To("b.png"));
+  list.Add(previous.Operation());
+  for (int i = 0; i < 2; ++i) (void)undo();
+  EXPECT_THAT(Names("to"), IsEmpty());
+  // Changes by others in between are not overwritten.
+  EXPECT_EQ(undo(), "two");
+  std::filesystem::copy_file(From("a.png"), From("other"));
+  std::filesystem::last_write_time(From("other"),
+                                   std::filesystem::last_write_time(From("a.png")));
+  std::filesystem::rename(From("other"), From("a.png"));
+  EXPECT_EQ(Revert(list.PopUndo()).failures.size(), 1u);
 }
 
 TEST(UndoList, KeepsALimitedNumber) {
