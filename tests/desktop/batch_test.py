@@ -18,6 +18,9 @@ def start_convert(desktop):
 
 def confirm(desktop):
     desktop.key("Return")
+    desktop.wait(r"prompt format Write files to the \w+ format")
+    desktop.focus("^Destination$")
+    desktop.key("Return")
 
 
 def convert_and_collide(folder):
@@ -125,7 +128,7 @@ def size_quality_and_name(folder):
         desktop.type("%F-small")
         desktop.wait(r"destination First: .*/one-small.jpg ")
         desktop.screenshot("destination-all")
-        desktop.key("Return")
+        confirm(desktop)
         desktop.wait(r"batch-line .*one.bmp -> .*one-small.jpg")
         desktop.wait(r"batch closes")
         desktop.focus("Fotomill Professional")
@@ -327,6 +330,9 @@ def errors_stay_and_abort_stops(folder):
             if path.read_bytes()[:2] not in (b"II", b"MM") or path.stat().st_size < 1000:
                 raise Failure(f"{path.name} is not whole")
         # It starts, while the first one's box stays open for reading.
+        desktop.wait(r"prompt format")
+        desktop.focus("^Destination$")
+        desktop.key("Return")
         desktop.wait(r"batch-line .*a.gif: ")
         desktop.wait(r"batch ended")
         desktop.screenshot("errors")

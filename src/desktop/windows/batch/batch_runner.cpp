@@ -240,7 +240,6 @@ void RunWithDestination(Shell& shell, const wxString& verb, bool resizes) {
   std::vector<BatchFile> batch;
   for (const std::string& file : files) batch.push_back({.name = file, .below = {}, .hint = {}});
   BatchJob job = JobFor(choice);
-  if (dialog.ShowedFormatLast()) job.naming.confirmFormat = false;
   BatchFunction function = FunctionFor(choice, job);
   shell.Batches().Run(std::move(batch), std::move(function), std::move(job));
 }

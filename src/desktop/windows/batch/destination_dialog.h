@@ -31,8 +31,6 @@ class DestinationDialog : public wxDialog {
   DestinationDialog(wxWindow* parent, const wxString& verb, const std::vector<std::string>& files,
                     bool resizes = false, std::string recipe = {});
   DestinationChoice Choice() const;
-  // Whether the format was in the window that was accepted, so that no one needs to ask again.
-  bool ShowedFormatLast() const { return parts_.back() != DestinationPart::Folder; }
 
  private:
   void BuildFormat();
