@@ -111,7 +111,7 @@ def open_select_view(folder):
             desktop.key(key)
             desktop.wait(f"view-look {look} keepzoom=0")
             desktop.wait(r"view place=2/6 .*status=0 .*a2.png")
-        desktop.key("k", "1", "plus", "i")
+        desktop.key("k", "a", "plus", "i")
         desktop.wait(r"view-painted 125% .*a2.png")
         desktop.screenshot("view")
         desktop.key("space")
@@ -436,5 +436,87 @@ def later_starts(folder):
         assert later.wait(30) == 0
 
 
-run(open_select_view, side_pane, view_window, sizes_and_groups, compare, play_animation,
-    later_starts)
+def rate_and_label(folder):
+    """Stars and labels by keys, in files and sidecars; filtered, and undone."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.jpg", "c.png"])
+    bitmap = (pictures / "a.bmp").read_bytes()
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"tags rated=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "ctrl+a", "3")
+        desktop.wait(r"files Tags of 3 files done=3 failed=0")
+        desktop.wait(r"tags rated=3")
+        assert (pictures / "a.bmp").read_bytes() == bitmap
+        assert b"<xmp:Rating>3<" in (pictures / "a.bmp.xmp").read_bytes()
+        assert b"<xmp:Rating>3<" in (pictures / "b.jpg").read_bytes()
+        rated = (pictures / "c.png").read_bytes()
+        desktop.key("End", "5")
+        desktop.wait(r"files Tags of c.png done=1 failed=0")
+        five = (pictures / "c.png").read_bytes()
+        desktop.key("6")
+        desktop.wait(r"files Tags of c.png done=1 failed=0")
+        desktop.wait(r"tags rated=3")
+        red = (pictures / "c.png").read_bytes()
+        assert b"<xmp:Label>Red<" in red
+        desktop.screenshot("rated")
+        # Both changes of the file go back and come again.
+        for key, expected in (("z", five), ("z", rated), ("y", five), ("y", red)):
+            desktop.key(f"ctrl+{key}")
+            desktop.wait(r"files (Undo|Redo) .* done=1 failed=0")
+            desktop.wait(r"tags rated=3")
+            assert (pictures / "c.png").read_bytes() == expected, key
+        # The choice is the neighbor of the filter. The files have the focus after it.
+        desktop.key("ctrl+f", "shift+Tab", "space")
+        desktop.wait(r"tag-menu")
+        desktop.settle()
+        desktop.key("Down", "Down", "Down", "Down", "Down", "Down", "Return")
+        desktop.wait(r"tag-filter 5 lines=1")
+        desktop.screenshot("filtered")
+        desktop.key("End", "Return")
+        desktop.wait(r"view place=1/1 .*c.png")
+        rate_in_the_view_window(desktop, pictures / "c.png")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+f", "shift+Tab", "space")
+        desktop.wait(r"tag-menu")
+        desktop.settle()
+        desktop.key("Down", "Return")
+        desktop.wait(r"tag-filter 0 lines=3")
+        desktop.key("Home", "ctrl+z")
+        desktop.wait(r"files Undo .* done=1 failed=0")
+        desktop.key("Home", "0")
+        desktop.wait(r"files Tags of a.bmp done=1 failed=0")
+        assert (pictures / "a.bmp").read_bytes() == bitmap
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+
+
+def rate_in_the_view_window(desktop, picture):
+    """Rates and comments a picture of 5 stars, and undoes it there."""
+    desktop.focus("View$")
+    before = picture.read_bytes()
+    desktop.key("9")
+    desktop.wait(r"files Tags of c.png done=1 failed=0")
+    desktop.wait(r"view place=1/1 .*c.png")
+    assert b"<xmp:Label>Blue<" in picture.read_bytes()
+    desktop.key("t")
+    desktop.wait(r"prompt comment")
+    desktop.focus("^Comment$", native=True)
+    desktop.type("A pier at dusk")
+    desktop.screenshot("comment")
+    desktop.key("alt+o")
+    desktop.wait(r"files Tags of c.png done=1 failed=0")
+    desktop.wait(r"view place=1/1 .*c.png")
+    assert b"A pier at dusk" in picture.read_bytes()
+    desktop.focus("View$")
+    desktop.screenshot("view-rated")
+    for _ in range(2):
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo .* done=1 failed=0")
+        desktop.wait(r"view place=1/1 .*c.png")
+    assert picture.read_bytes() == before
+    desktop.key("Escape")
+
+
+run(open_select_view, rate_and_label, side_pane, view_window, sizes_and_groups, compare,
+    play_animation, later_starts)

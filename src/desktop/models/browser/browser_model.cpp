@@ -9,6 +9,7 @@
 #include "core/choice_lists.h"
 #include "core/natural_order.h"
 #include "core/text.h"
+#include "metadata/tags/sidecar.h"
 #include "platform/clock.h"
 #include "platform/paths.h"
 #include "texts/grouped_count.h"
@@ -141,6 +142,32 @@ void BrowserModel::SetFilter(const std::string& filter) {
   BuildLines(selected, focus, anchor);
 }
 
+void BrowserModel::SetTagFilter(TagFilter filter) {
+  tagFilter_ = filter;
+  UpdateOrder();
+}
+
+void BrowserModel::SetFacts(size_t item, const FolderItem& facts) {
+  const FolderItem now = items_[item];
+  items_[item] = facts;
+  SetTags(item, now);
+}
+
+void BrowserModel::SetTags(size_t item, const FolderItem& tags) {
+  items_[item].tagged = tags.tagged;
+  items_[item].rating = tags.rating;
+  items_[item].label = tags.label;
+}
+
+void BrowserModel::ForgetTags(const std::vector<std::string>& paths) {
+  const std::unordered_set<std::string> changed(paths.begin(), paths.end());
+  for (FolderItem& item : items_) {
+    const std::string path = platform::JoinFolder(folder_, item.name);
+    const auto isOne = [&](const std::string& name) { return changed.contains(name); };
+    if (isOne(path) || std::ranges::any_of(SidecarNames(path), isOne)) item.tagged = false;
+  }
+}
+
 void BrowserModel::SortItems() {
   order_.resize(items_.size());
   std::iota(order_.begin(), order_.end(), 0u);
@@ -176,6 +203,7 @@ void BrowserModel::BuildLines(const std::vector<bool>& selectedItems, size_t foc
   size_t focus = kNoLine, anchor = kNoLine;
   for (const uint32_t item : order_) {
     if (!filter_.empty() && !MatchesFilter(items_[item].name, filter_)) continue;
+    if (!items_[item].folder && !Passes(items_[item], tagFilter_)) continue;
     if (item == focusItem) focus = lines_.size();
     if (item == anchorItem) anchor = lines_.size();
     if (grouping_ != DateGrouping::None) {
@@ -289,6 +317,11 @@ std::string BrowserModel::CountText() const {
   if (selection_.SelectedCount() > 0)
     text.append(", ").append(Tr("%1 selected", ThousandsText(selection_.SelectedCount())));
   if (files > 0) text.append(", ").append(SizeText(bytes, choice::kSizeFitting));
+  if (selection_.SelectedCount() == 1) {
+    const FolderItem& only = Line(selection_.SelectedLines().front());
+    const std::string tags = TagText(only.rating, only.label);
+    if (!tags.empty()) text.append(", ").append(tags);
+  }
   return text;
 }
 
@@ -299,6 +332,8 @@ std::string BrowserModel::FocusText() const {
   if (Line(focus).folder) text.append(", ").append(Tr("folder"));
   text.append(", ").append(Tr("%1 of %2", ThousandsText(focus + 1), ThousandsText(LineCount())));
   if (selection_.IsSelected(focus)) text.append(", ").append(Tr("selected"));
+  if (const std::string tags = TagText(Line(focus).rating, Line(focus).label); !tags.empty())
+    text.append(", ").append(tags);
   return text;
 }
 

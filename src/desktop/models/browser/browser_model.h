@@ -8,6 +8,7 @@
 
 #include "desktop/models/browser/folder_listing.h"
 #include "desktop/models/browser/folder_views.h"
+#include "desktop/models/browser/item_tags.h"
 #include "desktop/models/browser/selection.h"
 
 namespace fotomill::desktop {
@@ -51,12 +52,19 @@ class BrowserModel {
   // from the old ones.
   void SetItems(std::vector<FolderItem> items);
   // Sets facts read later; call UpdateOrder to sort again.
-  void SetFacts(size_t item, const FolderItem& facts) { items_[item] = facts; }
+  void SetFacts(size_t item, const FolderItem& facts);
   void UpdateOrder();  // sorts by current facts, keeping the selection
 
   // Shows only lines whose name matches; others are deselected.
   void SetFilter(const std::string& filter);
   const std::string& Filter() const { return filter_; }  // empty: show everything
+  // Also by rating and label; files whose tags are not read yet are hidden.
+  void SetTagFilter(TagFilter filter);
+  TagFilter TagsShown() const { return tagFilter_; }
+  // Sets rating and label read later. Call UpdateOrder if a tag filter is on.
+  void SetTags(size_t item, const FolderItem& tags);
+  // The tags of these files, or of those with these sidecars, must be read again.
+  void ForgetTags(const std::vector<std::string>& paths);
 
   // Items are the folder's contents, lines those that pass the filter, both from 0. References are
   // valid until the next change.
@@ -111,6 +119,7 @@ class BrowserModel {
   bool listed_ = false;
   FolderView view_;
   std::string filter_;
+  TagFilter tagFilter_ = TagFilter::All;
   std::vector<FolderItem> items_;     // as listed
   std::vector<uint32_t> order_;       // all items in sorted order
   std::vector<uint32_t> lines_;       // items that pass the filter

@@ -48,6 +48,9 @@ std::string TakenText(const FolderItem& item) {
   return text;
 }
 
+std::string RatingText(const FolderItem& item) { return StarsText(item.rating); }
+std::string ColorLabelText(const FolderItem& item) { return LabelText(item.label); }
+
 // clang-format off
 constexpr DetailFacts kDetails[] = {
     {TrLater("Name"),       260, false, true,  choice::kSortName,       NameText},
@@ -57,6 +60,8 @@ constexpr DetailFacts kDetails[] = {
     {TrLater("Dimensions"), 110, true,  true,  choice::kSortDimensions, DimensionsText},
     {TrLater("Depth"),       70, true,  true,  -1,                      DepthText},
     {TrLater("EXIF date"),  140, false, false, choice::kSortExifDate,   TakenText},
+    {TrLater("Rating"),      90, false, false, -1,                      RatingText},
+    {TrLater("Label"),       90, false, false, -1,                      ColorLabelText},
 };
 // clang-format on
 

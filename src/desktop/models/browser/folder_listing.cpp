@@ -6,6 +6,7 @@
 #include "core/natural_order.h"
 #include "core/text.h"
 #include "metadata/exif/taken_date.h"
+#include "metadata/tags/picture_tags.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "registry/registry.h"
@@ -147,6 +148,14 @@ void AddPictureFacts(const std::string& folder, FolderItem& item) {
   item.height = picture->height;
   item.bits = picture->bitsPerPixel;
   item.taken = TakenDate(path);
+}
+
+void AddPictureTags(const std::string& folder, FolderItem& item) {
+  PictureTags tags;
+  (void)ReadPictureTags(platform::JoinFolder(folder, item.name), {}, tags);
+  item.tagged = true;
+  item.rating = tags.rating;
+  item.label = tags.label;
 }
 
 }  // namespace fotomill::desktop

@@ -20,6 +20,11 @@ struct FolderItem {
   int32_t width = 0, height = 0, bits = 0;  // 0 until the header is read
   // the EXIF date as a sortable number; 0: none or not read yet
   int64_t taken = 0;
+  // once they were read: -1 (rejected) to 5 stars, and the color label, English or another
+  // program's
+  bool tagged = false;
+  int32_t rating = 0;
+  std::string label = {};
 
   bool operator==(const FolderItem&) const = default;
 };
@@ -58,5 +63,8 @@ void AddFacts(const std::string& folder, FolderListing& listing, const StopToken
 
 // Sets dimensions, depth and EXIF date of a file from its header.
 void AddPictureFacts(const std::string& folder, FolderItem& item);
+
+// Sets rating and label of a file.
+void AddPictureTags(const std::string& folder, FolderItem& item);
 
 }  // namespace fotomill::desktop

@@ -10,6 +10,7 @@
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/view/photo_facts.h"
 #include "desktop/models/view/view_transform.h"
+#include "metadata/tags/sidecar.h"
 #include "platform/clock.h"
 #include "processing/color/color_transform.h"
 #include "processing/geometry/scale.h"
@@ -125,10 +126,22 @@ std::string SizeAndZoom(const PictureRecord& picture, double scale) {
   return text;
 }
 
+namespace {
+
+platform::FileFacts SidecarFacts(const std::string& path) {
+  const std::string sidecar = FindSidecar(path);
+  return sidecar.empty() ? platform::FileFacts() : platform::FactsOf(sidecar);
+}
+
+}  // namespace
+
 bool ViewPicture::HasChanged() const {
   const platform::FileFacts now = platform::FactsOf(request.path);
-  return now.identity != facts.identity || now.device != facts.device || now.size != facts.size ||
-         now.modified != facts.modified;
+  const auto same = [](const platform::FileFacts& a, const platform::FileFacts& b) {
+    return a.identity == b.identity && a.device == b.device && a.size == b.size &&
+           a.modified == b.modified;
+  };
+  return !same(now, facts) || !same(SidecarFacts(request.path), sidecar);
 }
 
 Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels) {
@@ -147,6 +160,8 @@ ViewPicturePointer LoadViewPicture(const ViewRequest& request, ProgressSink* pro
   view->status = Guarded([&] {
     const FolderScope folder(request.path);
     view->facts = platform::FactsOf(request.path);
+    view->sidecar = SidecarFacts(request.path);
+    (void)ReadPictureTags(request.path, {}, view->tags);
     return LoadInto(request, *view, progress);
   });
   if (view->status != Status::Ok) view->problem = FailureText(request.path, view->status);
@@ -159,6 +174,8 @@ ViewPicturePointer TurnedView(const ViewPicture& view, Orientation turn) {
   auto turned = std::make_shared<ViewPicture>();
   turned->request = view.request;
   turned->facts = view.facts;
+  turned->tags = view.tags;
+  turned->sidecar = view.sidecar;
   turned->photo = view.photo;
   turned->picture = NewPictureRecord(view.request.read.alphaBackground);
   if (turned->picture == nullptr) return nullptr;

@@ -9,9 +9,10 @@
 #include "core/status.h"
 #include "core/workers/latest_work.h"
 #include "desktop/models/drawing/rgb_image.h"
+#include "metadata/tags/picture_tags.h"
 #include "picture/picture_record.h"
-#include "platform/files.h"
 #include "picture/read_request.h"
+#include "platform/files.h"
 #include "processing/geometry/orient.h"
 #include "settings/job_options.h"
 
@@ -64,6 +65,8 @@ struct ViewPicture {
   // scaled to fit the request's window; empty if the picture is smaller
   ViewPixels fitted;
   std::vector<std::string> photo;  // the camera's facts, in lines
+  PictureTags tags;                // ratings, labels, keywords
+  platform::FileFacts sidecar;     // of its file with tags, when it was read
   double seconds = 0;              // decoding time
 
   // Memory size, for caches.

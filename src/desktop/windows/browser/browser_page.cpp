@@ -1,7 +1,9 @@
 #include "desktop/windows/browser/browser_page.h"
 
+#include <wx/button.h>
 #include <wx/dataobj.h>
 #include <wx/dnd.h>
+#include <wx/menu.h>
 #include <wx/simplebook.h>
 #include <wx/sizer.h>
 #include <wx/slider.h>
@@ -50,6 +52,11 @@ DateGrouping GroupingFromSettings() {
   return static_cast<DateGrouping>(std::clamp(settings.BrowserGrouping, 0, last));
 }
 
+// With an arrow, as it opens a menu.
+wxString TagFilterLabel(TagFilter filter) {
+  return wxControl::EscapeMnemonics(Shown(TagFilterName(filter) + "  \xE2\x96\xBE"));
+}
+
 }  // namespace
 
 BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& thumbnails,
@@ -62,7 +69,8 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
       reader_({[this](FolderListing listing, bool complete) {
                  ShowListing(std::move(listing), complete);
                },
-               [this](const PlacedItems& found, bool last) { ShowFacts(found, last); }}),
+               [this](const PlacedItems& found, bool last) { ShowFacts(found, last); },
+               [this](const PlacedItems& found, bool last) { ShowTags(found, last); }}),
       watch_([this] { Reload(); }),
       offer_(this, {[this] { FocusList(); }, [this] { canvas_->WantThumbnails(); }}) {
   model_.SetView(view);
@@ -77,6 +85,7 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
                        [this] { LeaveBar(); }});
   bar->Add(path_, wxSizerFlags(1).CenterVertical());
   BuildFilter();
+  bar->Add(tagFilter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
   bar->Add(filter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
   BuildSlider();
   bar->Add(slider_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
@@ -93,6 +102,11 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
   sizer->Add(problem_, wxSizerFlags(1).Expand());
   sizer->Add(views_, wxSizerFlags(1).Expand());
   SetSizer(sizer);
+  // the details take keys for themselves
+  Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
+    const bool digit = !event.HasAnyModifiers() && details_ != nullptr && details_->HasFocus();
+    if (!digit || !TagByKey(event.GetKeyCode())) event.Skip();
+  });
   SetDropTarget(
       new FolderDrop([this](const wxPoint&) { return model_.Folder(); },
                      [this](const std::vector<std::string>& files, const std::string& folder,
@@ -100,6 +114,13 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
 }
 
 void BrowserPage::BuildFilter() {
+  tagFilter_ = new wxButton(this, wxID_ANY, TagFilterLabel(TagFilter::All));
+  tagFilter_->SetToolTip(Label("Shows only files with this rating or color label"));
+  tagFilter_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ChooseTagFilter(); });
+  tagFilter_->Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
+    if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
+    FocusList();
+  });
   filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(200, -1)),
                              wxTE_PROCESS_ENTER, wxDefaultValidator, Label("Filter"));
   filter_->SetDescriptiveText(Label("Filter"));
@@ -137,6 +158,7 @@ void BrowserPage::BuildViews() {
   events.renamed = [this](size_t line, const std::string& name) {
     host_.RenameFile(model_.PathOfLine(line), name);
   };
+  events.digit = [this](int key) { return TagByKey(key); };
   canvas_ = new ThumbnailCanvas(views_, model_, thumbnails_, events);
   views_->AddPage(canvas_, Label("Thumbnails"));
 }
@@ -243,6 +265,7 @@ void BrowserPage::ShowListing(FolderListing listing, bool complete) {
     if (!found_) watch_.Watch(model_.Folder());
     factsRead_ = false;
     StartFacts();
+    StartTags();
     const bool offers = !found_ && !subfolders_ && !note_->IsShown();
     if (offers && state == FolderState::Listed) OfferThumbnails();
     wantedFocus_.clear();
@@ -321,6 +344,79 @@ void BrowserPage::ShowFacts(const PlacedItems& found, bool last) {
     details_->Refresh();
   }
   if (last) LogEvent("facts", model_.Folder());
+}
+
+// --- ratings and labels ---
+
+void BrowserPage::StartTags() {
+  if (Listing()) return;
+  PlacedItems wanted;
+  const auto want = [&](size_t item) {
+    const FolderItem& facts = model_.Item(item);
+    if (!facts.folder && !facts.tagged) wanted.emplace_back(item, facts);
+  };
+  // what is shown comes first; a filter may hide the rest
+  for (size_t line = 0; line < model_.LineCount(); ++line) want(model_.ItemOfLine(line));
+  if (model_.LineCount() < model_.ItemCount()) {
+    for (size_t item = 0; item < model_.ItemCount(); ++item) want(item);
+  }
+  if (!wanted.empty()) reader_.ReadTags(model_.Folder(), std::move(wanted));
+}
+
+void BrowserPage::ShowTags(const PlacedItems& found, bool last) {
+  for (const auto& [item, tags] : found) model_.SetTags(item, tags);
+  if (model_.TagsShown() != TagFilter::All) {
+    model_.UpdateOrder();
+    ShowLines();
+    host_.BrowserChanged();
+  } else if (ShowsDetails()) {
+    details_->Refresh();
+  } else {
+    canvas_->Refresh();
+  }
+  if (!last) return;
+  size_t rated = 0;
+  for (size_t i = 0; i < model_.ItemCount(); ++i) rated += model_.Item(i).rating > 0;
+  LogEvent("tags", "rated=" + std::to_string(rated) + " " + model_.Folder());
+}
+
+void BrowserPage::ChooseTagFilter() {
+  constexpr int kFirstId = 1;
+  wxMenu menu;
+  for (int i = 0; i <= static_cast<int>(TagFilter::LastLabel); ++i) {
+    const auto filter = static_cast<TagFilter>(i);
+    if (filter == TagFilter::OneStar || filter == TagFilter::Unrated ||
+        filter == TagFilter::FirstLabel)
+      menu.AppendSeparator();
+    menu.AppendCheckItem(kFirstId + i, Shown(TagFilterName(filter)))
+        ->Check(filter == model_.TagsShown());
+  }
+  LogEvent("tag-menu", std::to_string(menu.GetMenuItemCount()));
+  const int chosen =
+      tagFilter_->GetPopupMenuSelectionFromUser(menu, 0, tagFilter_->GetSize().y) - kFirstId;
+  if (chosen >= 0 && chosen <= static_cast<int>(TagFilter::LastLabel)) {
+    model_.SetTagFilter(static_cast<TagFilter>(chosen));
+    tagFilter_->SetLabel(TagFilterLabel(model_.TagsShown()));
+    Layout();
+    ShowLines();
+    LogEvent("tag-filter",
+             std::to_string(chosen) + " lines=" + std::to_string(model_.LineCount()));
+    host_.BrowserChanged();
+  }
+  FocusList();
+}
+
+bool BrowserPage::TagByKey(int key) {
+  const size_t focus = model_.Selected().Focus();
+  const auto changes =
+      ChangesOfKey(key, focus == kNoLine ? std::string() : model_.Line(focus).label);
+  if (changes) host_.TagSelected(*changes);
+  return changes.has_value();
+}
+
+void BrowserPage::TagsChanged(const std::vector<std::string>& paths) {
+  model_.ForgetTags(paths);
+  StartTags();
 }
 
 // --- view modes ---

@@ -15,6 +15,7 @@
 #include "desktop/windows/browser/thumbnail_service.h"
 #include "desktop/windows/browser/update_offer.h"
 
+class wxButton;
 class wxSearchCtrl;
 class wxSimplebook;
 class wxSlider;
@@ -50,6 +51,8 @@ class BrowserHost {
   // `move`: move instead of copying.
   virtual void DropFiles(const std::vector<std::string>& files, const std::string& folder,
                          bool move) = 0;
+  // Changes the tags of the selected files.
+  virtual void TagSelected(const TagChanges& changes) = 0;
 };
 
 // A browser, the contents of a tab. Shows a folder as thumbnails, names or details.
@@ -102,6 +105,10 @@ class BrowserPage : public wxPanel {
   void EditPath();         // focuses the path and selects its text
   void OfferTrail();  // shows a menu of visited folders
   void EditFilter();  // focuses the filter
+  // Changes the tags of the selected files by a digit key; false for other keys.
+  bool TagByKey(int key);
+  // The tags of files were changed, by path, or those of their sidecars.
+  void TagsChanged(const std::vector<std::string>& paths);
   // Lets the user choose the columns of the details view.
   void ChooseColumns();
   // Stores the current arrangement of columns.
@@ -131,6 +138,9 @@ class BrowserPage : public wxPanel {
   void ShowProblem(const std::string& problem);
   void OfferThumbnails();
   void StartFacts();
+  void StartTags();
+  void ChooseTagFilter();
+  void ShowTags(const PlacedItems& found, bool last);
   void ShowFacts(const PlacedItems& found, bool last);
   bool NeedsFacts() const;
   bool ShowsDetails() const;
@@ -166,6 +176,7 @@ class BrowserPage : public wxPanel {
   PathBar* path_ = nullptr;
   wxSearchCtrl* filter_ = nullptr;
   wxSlider* slider_ = nullptr;
+  wxButton* tagFilter_ = nullptr;
   wxSimplebook* views_ = nullptr;
   FolderProblem* problem_ = nullptr;  // shown instead of the views
   FolderNote* note_ = nullptr;

@@ -12,6 +12,7 @@ constexpr size_t kBunch = 200;
 
 void FolderReader::List(const std::string& folder, bool namesFirst, bool subfolders) {
   facts_.Stop();
+  tags_.Stop();
   listing_.Start(
       [this, folder, namesFirst, subfolders](const StopToken& stop,
                                              const LooseWork::Report& report) {
@@ -78,6 +79,32 @@ void FolderReader::ReadFacts(const std::string& folder, PlacedItems wanted) {
       [this] {
         facts_.Stop();
         events_.factsFound({}, true);
+      });
+}
+
+void FolderReader::ReadTags(const std::string& folder, PlacedItems wanted) {
+  tags_.Start(
+      [this, folder, wanted = std::move(wanted)](const StopToken& stop,
+                                                 const LooseWork::Report& report) {
+        const auto send = [&](PlacedItems found, bool last) {
+          report([this, found = std::move(found), last] {
+            if (last) tags_.Stop();
+            events_.tagsFound(found, last);
+          });
+        };
+        PlacedItems found;
+        for (const auto& [place, item] : wanted) {
+          if (stop.Asked()) return;
+          FolderItem tags = item;
+          AddPictureTags(folder, tags);
+          found.emplace_back(place, std::move(tags));
+          if (found.size() == kBunch) send(std::exchange(found, {}), false);
+        }
+        send(std::move(found), true);
+      },
+      [this] {
+        tags_.Stop();
+        events_.tagsFound({}, true);
       });
 }
 

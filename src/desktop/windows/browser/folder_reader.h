@@ -23,6 +23,8 @@ class FolderReader {
     std::function<void(FolderListing listing, bool complete)> listed;
     // `last`: no more follow.
     std::function<void(const PlacedItems& found, bool last)> factsFound;
+    // The same for tags.
+    std::function<void(const PlacedItems& found, bool last)> tagsFound;
   };
   explicit FolderReader(Events events) : events_(std::move(events)) {}
 
@@ -37,13 +39,15 @@ class FolderReader {
   // Reads the headers of items; results are delivered
   // in batches. Stopped by the next listing.
   void ReadFacts(const std::string& folder, PlacedItems wanted);
+  // Reads ratings and labels of items, likewise; instead of those being read.
+  void ReadTags(const std::string& folder, PlacedItems wanted);
   // Whether headers are being read.
   bool ReadingFacts() const { return facts_.Started(); }
 
  private:
   const Events events_;
   LooseWork listing_;
-  LooseWork facts_;
+  LooseWork facts_, tags_;
 };
 
 }  // namespace fotomill::desktop

@@ -3,6 +3,7 @@
 #include <wx/dc.h>
 #include <wx/window.h>
 
+#include "desktop/models/browser/folder_listing.h"
 #include "desktop/models/thumbnails/thumbnail.h"
 
 namespace fotomill::desktop {
@@ -12,5 +13,8 @@ namespace fotomill::desktop {
 // alpha channel.
 void DrawBadges(wxDC& dc, const wxWindow& window, const wxRect& picture, const Thumbnail& thumbnail,
                 const wxColour& color, const wxColour& textColor);
+
+// Draws stars and label of a file at the bottom left of its place in the cell.
+void DrawTags(wxDC& dc, const wxWindow& window, const wxRect& square, const FolderItem& item);
 
 }  // namespace fotomill::desktop

@@ -445,6 +445,8 @@ void ThumbnailCanvas::OnChar(wxKeyEvent& event) {
   if (key < 0x20 || key == 0x7f || event.HasModifiers()) return event.Skip();
   const double now = platform::MonotonicSeconds();
   if (now - typedAt_ > kTypingPause) typed_.clear();
+  const int digit = static_cast<int>(key);
+  if (typed_.empty() && digit < 0x80 && events_.digit && events_.digit(digit)) return;
   typedAt_ = now;
   const std::string letter = Utf8(wxString(key));
   const bool again = typed_ == letter;

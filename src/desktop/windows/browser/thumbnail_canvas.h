@@ -33,6 +33,7 @@ class ThumbnailCanvas : public wxWindow {
     std::function<void()> dragBegins;
     std::function<void(int steps)> resize;  // Ctrl and wheel
     std::function<void(size_t line, const std::string& name)> renamed;
+    std::function<bool(int key)> digit;  // false: not used
   };
 
   ThumbnailCanvas(wxWindow* parent, BrowserModel& model, ThumbnailService& thumbnails,

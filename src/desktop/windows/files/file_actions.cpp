@@ -11,8 +11,10 @@
 #include <memory>
 
 #include "core/plain_name.h"
+#include "core/text.h"
 #include "desktop/models/files/operation_options.h"
 #include "desktop/models/files/pasted_picture.h"
+#include "desktop/models/files/tag_files.h"
 #include "desktop/models/files/turn_one_file.h"
 #include "desktop/models/files/uri_list.h"
 #include "desktop/models/shell/event_log.h"
@@ -22,12 +24,13 @@
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
+#include "metadata/tags/tag_lines.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "settings/history_list.h"
 #include "settings/settings.h"
-#include "texts/status_text.h"
 #include "texts/grouped_count.h"
+#include "texts/status_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -94,6 +97,7 @@ void FileActions::Finished(const std::string& what, FileOperationResult result, 
   const std::vector<FileOperationFailure> failures = result.failures;
   then(std::move(result));
   shell_.FilesChanged();
+  StartTagging();
   ReportFailures(failures, ParentOf(asker));
 }
 
@@ -150,6 +154,38 @@ void FileActions::Follow(const FileOperation& operation, bool back) {
 void FileActions::Took(const FileOperation& operation, bool back) {
   Follow(operation, back);
   shell_.Uses().Note(UsesOf(operation, back));
+  if (operation.kind != FileOperationKind::Tag) return;
+  std::vector<std::string> paths;
+  for (const FileStep& step : operation.steps) paths.push_back(step.from);
+  shell_.Tabs().TagsChanged(paths);
+}
+
+// --- tags ---
+
+void FileActions::Tag(const std::vector<std::string>& paths, const TagChanges& changes) {
+  if (paths.empty()) return;
+  tagging_.push_back({paths, changes});
+  StartTagging();
+}
+
+// One after the other, so that quick keys are not lost.
+void FileActions::StartTagging() {
+  if (busy_ || tagging_.empty()) return;
+  const Tagging next = std::move(tagging_.front());
+  tagging_.pop_front();
+  FileOperation name{FileOperationKind::Tag,
+                     std::vector<FileStep>(next.paths.size(), FileStep{next.paths.front(), {}})};
+  std::string what = FileOperationName(name);
+  what[0] = UpperCase(what[0]);
+  Run(
+      what,
+      [next, options = TagFilesOptionsFromSettings()](const FileOperationProgress& progress) {
+        return TagFiles(next.paths, next.changes, options, progress);
+      },
+      [this](FileOperationResult result) {
+        Took(result.done, false);
+        undo_.Add(std::move(result.done));
+      });
 }
 
 void FileActions::Trash(const std::vector<std::string>& paths) { Trash(paths, {}); }
@@ -401,6 +437,53 @@ void MoveSelectionTo(Shell& shell) {
   const size_t count = shell.Tabs().SelectedPaths().size();
   AskAndDo(shell, Label("Move"), LabelCount("Move %1 file to", "Move %1 files to", count),
            &FileActions::MoveTo);
+}
+
+namespace {
+
+// The tags of a single picture, to start with.
+PictureTags TagsOfOne(const std::vector<std::string>& files) {
+  PictureTags tags;
+  if (files.size() == 1) (void)ReadPictureTags(files.front(), {}, tags);
+  return tags;
+}
+
+wxString NameOfAll(const std::vector<std::string>& files) {
+  return files.size() == 1 ? Shown(platform::FileNameOf(files.front()))
+                           : Shown(Count(files.size()));
+}
+
+}  // namespace
+
+void CommentSelection(Shell& shell) {
+  const std::vector<std::string> files = shell.Tabs().SelectedFiles();
+  if (files.empty()) return;
+  wxTextEntryDialog dialog(&shell.Window(), Label("Comment for %1:", NameOfAll(files)),
+                           Label("Comment"), Shown(TagsOfOne(files).description),
+                           wxTextEntryDialogStyle | wxTE_MULTILINE);
+  LogEvent("prompt", "comment");
+  if (dialog.ShowModal() != wxID_OK) return;
+  TagChanges changes;
+  changes.description = Utf8(dialog.GetValue());
+  shell.Files().Tag(files, changes);
+}
+
+void KeywordSelection(Shell& shell) {
+  const std::vector<std::string> files = shell.Tabs().SelectedFiles();
+  if (files.empty()) return;
+  const bool one = files.size() == 1;
+  const wxString name = NameOfAll(files);
+  wxTextEntryDialog dialog(&shell.Window(),
+                           one ? Label("Keywords for %1, separated by commas:", name)
+                               : Label("Keywords to add to %1, separated by commas:", name),
+                           Label("Keywords"), Shown(KeywordText(TagsOfOne(files))));
+  LogEvent("prompt", "keywords");
+  if (dialog.ShowModal() != wxID_OK) return;
+  TagChanges changes;
+  const std::vector<std::string> keywords = ListedKeywords(Utf8(dialog.GetValue()));
+  if (one) changes.keywords = keywords;
+  if (!one) changes.addedKeywords = keywords;
+  if (!changes.Empty()) shell.Files().Tag(files, changes);
 }
 
 }  // namespace fotomill::desktop

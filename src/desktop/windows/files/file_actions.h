@@ -4,12 +4,14 @@
 #include <wx/weakref.h>
 #include <wx/window.h>
 
+#include <deque>
 #include <functional>
 #include <string>
 #include <vector>
 
 #include "core/workers/background_task.h"
 #include "files/file_operation.h"
+#include "metadata/tags/tag_edit.h"
 #include "processing/geometry/orient.h"
 
 namespace fotomill::desktop {
@@ -45,6 +47,9 @@ class FileActions : public wxEvtHandler {
   // operation is running.
   using Turned = std::function<void(bool done, const std::string& note)>;
   bool SaveTurned(const std::string& path, Orientation turn, Turned then);
+
+  // Changes the tags of pictures; waits for a running operation.
+  void Tag(const std::vector<std::string>& paths, const TagChanges& changes);
 
   // Undoes or redoes the last operation; does nothing while another one is running.
   void Undo();
@@ -85,8 +90,15 @@ class FileActions : public wxEvtHandler {
   void Took(const FileOperation& operation, bool back);
   void ReportFailures(const std::vector<FileOperationFailure>& failures, wxWindow* parent);
 
+  void StartTagging();
+
   Shell& shell_;
   UndoList undo_;
+  struct Tagging {
+    std::vector<std::string> paths;
+    TagChanges changes;
+  };
+  std::deque<Tagging> tagging_;  // waiting
   bool busy_ = false;
   BackgroundTask task_;  // must be last: it uses the other members
 };
@@ -96,5 +108,8 @@ void TrashSelection(Shell& shell);
 void DeleteSelection(Shell& shell);  // permanently, after asking
 void CopySelectionTo(Shell& shell);  // asks for the folder
 void MoveSelectionTo(Shell& shell);  // asks for the folder
+// Asks for a description, or for keywords, of the selected pictures.
+void CommentSelection(Shell& shell);
+void KeywordSelection(Shell& shell);
 
 }  // namespace fotomill::desktop

@@ -303,6 +303,14 @@ void BrowserTabs::DropFiles(const std::vector<std::string>& files, const std::st
   shell_.Files().Drop(files, folder, move);
 }
 
+void BrowserTabs::TagSelected(const TagChanges& changes) {
+  shell_.Files().Tag(SelectedFiles(), changes);
+}
+
+void BrowserTabs::TagsChanged(const std::vector<std::string>& paths) {
+  for (size_t tab = 0; tab < book_->GetPageCount(); ++tab) PageAt(tab)->TagsChanged(paths);
+}
+
 void BrowserTabs::LogState() {
   const BrowserPage* browser = Front();
   if (!EventLogOn() || browser == nullptr) return;

@@ -63,6 +63,8 @@ class BrowserTabs : private BrowserHost {
 
   // Reloads the folders of all browsers.
   void Reload();
+  // The tags of pictures changed in these files, pictures or sidecars.
+  void TagsChanged(const std::vector<std::string>& paths);
   // Updates browsers of the folder and its subfolders.
   void FollowRename(const std::string& from, const std::string& to);
 
@@ -86,6 +88,7 @@ class BrowserTabs : private BrowserHost {
   void RenameFile(const std::string& path, const std::string& name) override;
   void DropFiles(const std::vector<std::string>& files, const std::string& folder,
                  bool move) override;
+  void TagSelected(const TagChanges& changes) override;
 
   BrowserPage* PageAt(size_t tab) const;
   void OnTabChanged(wxAuiNotebookEvent& event);

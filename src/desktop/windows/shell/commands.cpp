@@ -136,6 +136,23 @@ void ToggleFavorite(Shell& shell) {
   shell.Folders().ToggleFavorite(shell.Tabs().CurrentFolder());
 }
 bool IsFavorite(Shell& shell) { return shell.Folders().IsFavorite(shell.Tabs().CurrentFolder()); }
+// By the digit of its key.
+template <int key>
+void TagAs(Shell& shell) {
+  if (BrowserPage* browser = shell.Tabs().Front()) (void)browser->TagByKey(key);
+}
+void TagAll(Shell& shell, const char* label) {
+  TagChanges changes;
+  changes.label = label;
+  shell.Files().Tag(shell.Tabs().SelectedFiles(), changes);
+}
+void TagPurple(Shell& shell) { TagAll(shell, "Purple"); }
+void RemoveLabel(Shell& shell) { TagAll(shell, ""); }
+void Reject(Shell& shell) {
+  TagChanges changes;
+  changes.rating = -1;
+  shell.Files().Tag(shell.Tabs().SelectedFiles(), changes);
+}
 void Larger(Shell& shell) {
   if (BrowserPage* browser = shell.Tabs().Front()) browser->ChangeSize(1);
 }
@@ -153,6 +170,7 @@ constexpr const char* kEdit = TrLater("&Edit");
 constexpr const char* kView = TrLater("&View");
 constexpr const char* kGo = TrLater("&Go");
 constexpr const char* kFunctions = TrLater("F&unctions");
+constexpr const char* kTags = TrLater("T&ags");
 constexpr const char* kTools = TrLater("&Tools");
 constexpr const char* kHelp = TrLater("&Help");
 
@@ -256,6 +274,24 @@ constexpr Command kCommands[] = {
     {kFunctions, TrLater("Create arc&hive..."), "Ctrl+Alt+Z",  TrLater("Archives the selected files and folders."), Needs::Item, ArchiveSelection, nullptr, true},
     {kFunctions, TrLater("&Delete"),        "Delete",       TrLater("Moves the selected files to the trash."), Needs::Item, TrashSelection, "trash", true},
     {kFunctions, TrLater("Delete perma&nently..."), "Shift+Delete", TrLater("Deletes the selected files; this cannot be undone."), Needs::Item, DeleteSelection},
+
+    {kTags, TrLater("&1 star"),               "",             TrLater("Rates the selected files; key 1 in the list."), Needs::Files, TagAs<'1'>},
+    {kTags, TrLater("&2 stars"),              "",             TrLater("Rates the selected files; key 2 in the list."), Needs::Files, TagAs<'2'>},
+    {kTags, TrLater("&3 stars"),              "",             TrLater("Rates the selected files; key 3 in the list."), Needs::Files, TagAs<'3'>},
+    {kTags, TrLater("&4 stars"),              "",             TrLater("Rates the selected files; key 4 in the list."), Needs::Files, TagAs<'4'>},
+    {kTags, TrLater("&5 stars"),              "",             TrLater("Rates the selected files; key 5 in the list."), Needs::Files, TagAs<'5'>},
+    {kTags, TrLater("N&o stars"),             "",             TrLater("Removes the rating; key 0 in the list."), Needs::Files, TagAs<'0'>},
+    {kTags, TrLater("Re&jected"),             "",             TrLater("Marks the selected files as rejected."), Needs::Files, Reject},
+    {kTags, nullptr},
+    {kTags, TrLater("&Red"),                  "",             TrLater("Sets or removes the red label; key 6 in the list."), Needs::Files, TagAs<'6'>},
+    {kTags, TrLater("&Yellow"),               "",             TrLater("Sets or removes the yellow label; key 7 in the list."), Needs::Files, TagAs<'7'>},
+    {kTags, TrLater("&Green"),                "",             TrLater("Sets or removes the green label; key 8 in the list."), Needs::Files, TagAs<'8'>},
+    {kTags, TrLater("&Blue"),                 "",             TrLater("Sets or removes the blue label; key 9 in the list."), Needs::Files, TagAs<'9'>},
+    {kTags, TrLater("&Purple"),               "",             TrLater("Sets the purple label."), Needs::Files, TagPurple},
+    {kTags, TrLater("&No label"),             "",             TrLater("Removes the color label."), Needs::Files, RemoveLabel},
+    {kTags, nullptr},
+    {kTags, TrLater("&Keywords..."),          "Ctrl+Shift+K", TrLater("Sets the keywords of the focused picture, or adds some to several."), Needs::Files, KeywordSelection},
+    {kTags, TrLater("Co&mment..."),           "Ctrl+M",       TrLater("Sets the description of the selected pictures."), Needs::Files, CommentSelection},
 
     {kTools, TrLater("File &history..."),     "Ctrl+H",       TrLater("Lists recently used files."), Needs::Nothing, ShowFileHistory, "history"},
     {kTools, TrLater("&Archive manager..."),  "Ctrl+Alt+A",   TrLater("Lists the selected archive, extracts from it and adds to it."), Needs::Nothing, ManageArchive},

@@ -38,7 +38,7 @@ struct LetterButton {
 constexpr LetterButton kLetterButtons[] = {
     {'a', "previous", WXK_HOME}, {'b', "next", WXK_END},     {'c', "info", 'I'},
     {'e', "back", 'P'},          {'f', "forward", 'N'},      {'g', "zoom-out", '-'},
-    {'h', "zoom-in", '+'},       {'i', "fit", '0'},          {'j', "actual", '1'},
+    {'h', "zoom-in", '+'},       {'i', "fit", 'Z'},          {'j', "actual", 'A'},
     {'k', "rotate-left", 'L'},   {'l', "rotate-right", 'R'}, {'m', "slideshow", 'S'},
     {'n', "full-screen", 'F'},   {'o', "trash", WXK_DELETE}, {'p', "copy", WXK_CONTROL_C},
     {'q', "flip-across", 'H'},   {'r', "flip-down", 'V'},    {'s', "close", WXK_ESCAPE},

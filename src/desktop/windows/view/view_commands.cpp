@@ -25,6 +25,10 @@ template <Orientation turn>
 void Turn(ViewFrame& view) {
   view.Turn(turn);
 }
+template <int key>
+void Tag(ViewFrame& view) {
+  view.TagByKey(key);
+}
 template <int32_t Settings::*setting>
 constexpr auto Switch = SwitchSetting<ViewFrame, setting>;
 template <int32_t Settings::*setting>
@@ -41,10 +45,10 @@ constexpr KeyCommand<ViewFrame> kCommands[] = {
     {nullptr, nullptr, {}, nullptr},
     {TrLater("Zoom &in"),          "+",         {'+', '=', WXK_NUMPAD_ADD},      OfCanvas<&ViewCanvas::ZoomIn>},
     {TrLater("Zoom &out"),         "-",         {'-', WXK_NUMPAD_SUBTRACT},      OfCanvas<&ViewCanvas::ZoomOut>},
-    {TrLater("Fit to &window"),    "0",         {'0', WXK_NUMPAD0},              Zoom<ZoomMode::Fit>},
-    {TrLater("&Actual size"),      "1",         {'1', WXK_NUMPAD1},              OfCanvas<&ViewCanvas::ZoomActual>},
-    {TrLater("Fit to wi&dth"),     "2",         {'2', WXK_NUMPAD2},              Zoom<ZoomMode::FitWidth>},
-    {TrLater("Fi&ll the window"),  "3",         {'3', WXK_NUMPAD3},              Zoom<ZoomMode::Fill>},
+    {TrLater("Fit to &window"),    "Z",         {'Z', '*', WXK_NUMPAD_MULTIPLY},   Zoom<ZoomMode::Fit>},
+    {TrLater("&Actual size"),      "A",         {'A', '/', WXK_NUMPAD_DIVIDE},     OfCanvas<&ViewCanvas::ZoomActual>},
+    {TrLater("Fit to wi&dth"),     "W",         {'W'},                           Zoom<ZoomMode::FitWidth>},
+    {TrLater("Fi&ll the window"),  "D",         {'D'},                           Zoom<ZoomMode::Fill>},
     {TrLater("&Keep zoom and position between pictures"), "K", {'K'},               Switch<&Settings::ViewModeKeepZoom>, IsOn<&Settings::ViewModeKeepZoom>},
     {nullptr, nullptr, {}, nullptr},
     {TrLater("Play, pause or ne&xt"), "Space",  {WXK_SPACE},                     Of<&ViewFrame::PlayOrNext>},
@@ -71,6 +75,18 @@ constexpr KeyCommand<ViewFrame> kCommands[] = {
     {TrLater("Sa&ve rotated picture"), "Ctrl+S", {WXK_CONTROL_S},             Of<&ViewFrame::SaveTurned>},
     {TrLater("&Undo"),             "Ctrl+Z",    {WXK_CONTROL_Z},                 Of<&ViewFrame::Undo>},
     {TrLater("Redo"),              "Ctrl+Y",    {WXK_CONTROL_Y},                 Of<&ViewFrame::Redo>},
+    {nullptr, nullptr, {}, nullptr},
+    {TrLater("No stars"),          "0",         {'0', WXK_NUMPAD0},              Tag<'0'>},
+    {TrLater("1 star"),            "1",         {'1', WXK_NUMPAD1},              Tag<'1'>},
+    {TrLater("2 stars"),           "2",         {'2', WXK_NUMPAD2},              Tag<'2'>},
+    {TrLater("3 stars"),           "3",         {'3', WXK_NUMPAD3},              Tag<'3'>},
+    {TrLater("4 stars"),           "4",         {'4', WXK_NUMPAD4},              Tag<'4'>},
+    {TrLater("5 stars"),           "5",         {'5', WXK_NUMPAD5},              Tag<'5'>},
+    {TrLater("Red"),               "6",         {'6', WXK_NUMPAD6},              Tag<'6'>},
+    {TrLater("Yellow"),            "7",         {'7', WXK_NUMPAD7},              Tag<'7'>},
+    {TrLater("Green"),             "8",         {'8', WXK_NUMPAD8},              Tag<'8'>},
+    {TrLater("Blue"),              "9",         {'9', WXK_NUMPAD9},              Tag<'9'>},
+    {TrLater("Co&mment..."),       "T",         {'T'},                           Of<&ViewFrame::Comment>},
     {nullptr, nullptr, {}, nullptr},
     {TrLater("&Delete"),           "Del",       {WXK_DELETE},                    Of<&ViewFrame::DeleteFile>},
     {TrLater("&Copy picture"),     "Ctrl+C",    {WXK_CONTROL_C},                 Of<&ViewFrame::CopyPicture>},

@@ -1,6 +1,7 @@
 #include "desktop/windows/view/view_frame.h"
 
 #include <wx/clipbrd.h>
+#include <wx/textdlg.h>
 #include <wx/weakref.h>
 
 #include <algorithm>
@@ -9,6 +10,7 @@
 #include "batch/picture_failure.h"
 #include "catalog/history/file_history.h"
 #include "core/text.h"
+#include "desktop/models/browser/item_tags.h"
 #include "desktop/models/drawing/rgb_image.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/edit/crop_frame.h"
@@ -164,6 +166,7 @@ void ViewFrame::StepPage(int pages) {
 }
 
 void ViewFrame::StartAfresh() {
+  tagged_ = false;
   page_ = 0;
   note_.clear();
   turn_ = Orientation::Upright;
@@ -211,7 +214,9 @@ void ViewFrame::ReloadIfChanged() {
         if (!changed || saving_ || loaded_ != picture) return;
         loader_->Forget(list_[place_]);
         loaded_.reset();
-        StartAfresh();
+        const bool samePixels = std::exchange(tagged_, false) && page_ == 0;
+        if (!samePixels || turn_ != Orientation::Upright) return StartAfresh();
+        if (!AskForPicture()) ViewChanged();  // what is shown stays until then
       });
 }
 
@@ -359,6 +364,9 @@ std::string ViewFrame::StatusLine() const {
   } else if (picture.pageCount > 1) {
     line += ", " + Tr("page %1 of %2", page_ + 1, picture.pageCount);
   }
+  if (const std::string tags = TagText(shown->tags.rating, shown->tags.label);
+      !tags.empty())
+    line += ", " + tags;
   for (const std::string& note : {note_, MisnamedRemark(picture)}) {
     if (!note.empty()) line += (line.ends_with('.') ? " " : ". ") + note;
   }
@@ -495,6 +503,29 @@ void ViewFrame::SaveTurned() {
                         : Label("Please wait for the previous file operation."));
 }
 
+// --- tags ---
+
+void ViewFrame::TagByKey(int key) {
+  const bool known = IsCurrent(loaded_);
+  const auto changes = ChangesOfKey(key, known ? loaded_->tags.label : std::string());
+  if (!changes) return;
+  tagged_ = true;
+  shell_.Files().Tag({list_[place_]}, *changes);
+}
+
+void ViewFrame::Comment() {
+  const std::string path = list_[place_];
+  const wxString old = IsCurrent(loaded_) ? Shown(loaded_->tags.description) : wxString();
+  wxTextEntryDialog dialog(this, Label("Comment for %1:", Shown(platform::FileNameOf(path))),
+                           Label("Comment"), old, wxTextEntryDialogStyle | wxTE_MULTILINE);
+  LogEvent("prompt", "comment");
+  if (dialog.ShowModal() != wxID_OK) return;
+  TagChanges changes;
+  changes.description = Utf8(dialog.GetValue());
+  tagged_ = true;
+  shell_.Files().Tag({path}, changes);
+}
+
 void ViewFrame::FilesChanged() { ReloadIfChanged(); }
 
 void ViewFrame::Undo() {
@@ -529,7 +560,7 @@ void ViewFrame::OnKey(wxKeyEvent& event) {
   if (key == WXK_RIGHT || key == WXK_DOWN) return Step(1);
   if (event.ShiftDown() && key == 'S') return ChooseSlideshow();
   if (event.AltDown() && key == WXK_RETURN) return ShowInfoWindow();
-  if (event.AltDown()) return event.Skip();
+  if (event.AltDown() || (event.ShiftDown() && key >= '0' && key <= '9')) return event.Skip();
   // Some letters with Ctrl have the same codes as other keys.
   constexpr int kLettersWithCtrl[] = {'C', 'S', 'Y', 'Z'};
   const bool letter = std::ranges::find(kLettersWithCtrl, key) != std::end(kLettersWithCtrl);

@@ -51,6 +51,9 @@ class ViewFrame : public wxFrame {
   void EditExif();              // of the current file
   void Turn(Orientation turn);  // turns the view only; nothing is written
   void SaveTurned();            // saves the file as displayed
+  // Changes the tags of the file by a digit key, as in the browser.
+  void TagByKey(int key);
+  void Comment();               // asks for a description
   void Undo();                  // undoes turning the view, or else the last file operation
   void Redo();  // of file operations
   // Call after files were written: reloads the picture if its file has changed.
@@ -98,6 +101,7 @@ class ViewFrame : public wxFrame {
   Orientation turn_ = Orientation::Upright;  // of the view relative to the file
   ViewPicturePointer loaded_;                // unturned, as in the file
   bool saving_ = false;
+  bool tagged_ = false;  // tags of the file are about to change, but not its pixels
   std::string note_;    // remark about turning the file
   double keyTime_ = 0;  // time of the request for the pending picture
   bool overlay_ = false;
