@@ -268,12 +268,12 @@ def raised_at_the_end(folder):
     for raises in (0, 1):
         pictures = folder / f"pictures{raises}"
         make_pictures(pictures, ["p.bmp"])
-        for number in range(3000):
+        for number in range(6000):
             os.link(pictures / "p.bmp", pictures / f"p{number}.bmp")
         with Desktop(folder, pictures, settings=["DefaultFileExtension=tif", "DestForceSourceDir=1",
                                                  "CloseProgressWhenDone=0", "WarnDestinationWrite=0",
                                                  "PromptBeforeOverwrite=0", f"ProgressRaiseAppWindow={raises}"]) as desktop:
-            desktop.wait(r"lines=3001 .*listing=0")
+            desktop.wait(r"lines=6001 .*listing=0")
             start_convert(desktop)
             desktop.key("Return")
             desktop.wait(r"batch opened")
