@@ -112,7 +112,8 @@ FMW_READ_REQUEST RequestOf(const ModuleQuestion& question) {
 void TakeBlock(const FMW_BLOCK& block, std::vector<uint8_t>& bytes) {
   if (block.data == nullptr) return;
   const auto whole = platform::LockModuleBlock(block.data);
-  const auto size = static_cast<size_t>(std::min<uint64_t>(block.size, whole.size()));
+  const uint64_t claimed = block.size;  // copied: fields of packed structs may be misaligned
+  const auto size = static_cast<size_t>(std::min<uint64_t>(claimed, whole.size()));
   bytes.assign(whole.begin(), whole.begin() + static_cast<ptrdiff_t>(size));
   platform::UnlockModuleBlock(block.data);
   platform::FreeModuleBlock(block.data);
