@@ -44,4 +44,10 @@ SearchCriteria SearchCriteriaFromSettings() {
   return criteria;
 }
 
+SimilarOptions SimilarOptionsFromSettings() {
+  return {.distance = std::clamp(settings.FindSimlarDistance, 0, kMostDistance),
+          .transforms = settings.FindSimilarTransforms != 0,
+          .read = ReadOptionsFromSettings()};
+}
+
 }  // namespace fotomill

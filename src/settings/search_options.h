@@ -2,6 +2,7 @@
 
 #include "catalog/search/picture_facts.h"
 #include "catalog/search/search_criteria.h"
+#include "catalog/similar/similar_search.h"
 
 namespace fotomill {
 
@@ -12,5 +13,8 @@ FactsOptions FactsOptionsFromSettings();
 // each if its Match key is on, PictureSearchCommentField, PictureSearchKeywordField (separated by
 // commas), PictureSearchMatchField and faces.
 SearchCriteria SearchCriteriaFromSettings();
+
+// FindSimlarDistance, clamped to its range, and FindSimilarTransforms.
+SimilarOptions SimilarOptionsFromSettings();
 
 }  // namespace fotomill
