@@ -10,7 +10,7 @@
 #include <thread>
 #include <vector>
 
-#include "fotomill_plugin_kit.h"
+#include "fotomill_plugin_exports.h"
 
 namespace {
 
@@ -124,18 +124,32 @@ int32_t ToBitmap(const avifImage& image, bool alpha, const FMW_READ_REQUEST* req
   return bitmap.block == nullptr ? FMW_ERROR_MEMORY : 0;
 }
 
-FMW_HANDLE Read(const char* fileName, int32_t page, const FMW_READ_REQUEST* request,
-                int32_t* error) {
+int32_t Read(const char* fileName, const FMW_READ_REQUEST* request, FmwBitmap* bitmap) {
   Decoder decoder;
-  *error = Open(fileName, decoder);
-  if (*error == 0 && (page < 0 || page >= decoder->imageCount)) *error = FMW_ERROR_DAMAGED;
-  if (*error != 0) return nullptr;
-  *error = ErrorOf(page == 0 ? avifDecoderNextImage(decoder.get())
-                             : avifDecoderNthImage(decoder.get(), static_cast<uint32_t>(page)));
-  if (*error != 0) return nullptr;
-  FmwBitmap bitmap;
-  *error = ToBitmap(*decoder->image, decoder->alphaPresent != 0, request, bitmap);
-  return *error == 0 ? bitmap.block : nullptr;
+  const int32_t page = request->page;
+  int32_t error = Open(fileName, decoder);
+  if (error == 0 && (page < 0 || page >= decoder->imageCount)) error = FMW_ERROR_DAMAGED;
+  if (error != 0) return error;
+  error = ErrorOf(page == 0 ? avifDecoderNextImage(decoder.get())
+                            : avifDecoderNthImage(decoder.get(), static_cast<uint32_t>(page)));
+  if (error != 0) return error;
+  return ToBitmap(*decoder->image, decoder->alphaPresent != 0, request, *bitmap);
+}
+
+int32_t Describe(const char* fileName, FMW_PICTURE_INFO* info) {
+  Decoder decoder;
+  const int32_t error = Open(fileName, decoder);
+  if (error != 0) return error;
+  const avifImage& image = *decoder->image;
+  const bool across = TurnOf(image).quarters % 2 != 0;
+  info->width = static_cast<int32_t>(across ? image.height : image.width);
+  info->height = static_cast<int32_t>(across ? image.width : image.height);
+  info->bitsPerPixel = decoder->alphaPresent != 0 ? 32 : 24;
+  info->frame = decoder->imageCount;
+  snprintf(info->typeName, sizeof info->typeName, "AVIF%s, %s, %u bits per sample",
+           decoder->imageCount > 1 ? " animation" : "", avifPixelFormatToString(image.yuvFormat),
+           image.depth);
+  return 0;
 }
 
 FMW_BLOCK FrameDelays(avifDecoder* decoder) {
@@ -147,6 +161,20 @@ FMW_BLOCK FrameDelays(avifDecoder* decoder) {
           static_cast<int32_t>(std::clamp(std::lround(timing.duration * 1000), 0L, 1L << 30));
   }
   return FmwBlock(delays.data(), delays.size() * sizeof delays[0]);
+}
+
+int32_t ReadMetadata(const char* fileName, const FMW_READ_REQUEST*, FMW_METADATA* metadata) {
+  Decoder decoder;
+  const int32_t error = Open(fileName, decoder);
+  if (error != 0) return error;
+  const avifImage& image = *decoder->image;
+  if (image.depth > 8) metadata->lost |= FMW_LOST_DEPTH;
+  metadata->exif = FmwBlock(image.exif.data, image.exif.size);
+  FmwSetUpright(static_cast<uint8_t*>(metadata->exif.data), metadata->exif.size);
+  metadata->xmp = FmwBlock(image.xmp.data, image.xmp.size);
+  metadata->icc = FmwBlock(image.icc.data, image.icc.size);
+  if (decoder->imageCount > 1) metadata->delays = FrameDelays(decoder.get());
+  return 0;
 }
 
 // ---- writing ----
@@ -221,108 +249,39 @@ void AddMetadata(const FMW_WRITE_REQUEST& request, avifImage& image) {
   if (image.exif.size > 0) FmwSetUpright(image.exif.data, image.exif.size);
 }
 
-int32_t Write(const char* fileName, const FmwBitmap& given, const FMW_WRITE_REQUEST& request) {
-  const bool lossless = request.lossless != 0;
+int32_t Write(const char* fileName, const FmwBitmap* given, const FMW_WRITE_REQUEST* request) {
+  const bool lossless = request->lossless != 0;
   Image image;
-  int32_t error = ToImage(given, lossless, request.options[kSampling], image);
+  int32_t error = ToImage(*given, lossless, request->options[kSampling], image);
   if (error != 0) return error;
-  AddMetadata(request, *image);
+  AddMetadata(*request, *image);
   const std::unique_ptr<avifEncoder, EncoderDeleter> encoder(avifEncoderCreate());
   if (encoder == nullptr) return FMW_ERROR_MEMORY;
   encoder->maxThreads = ThreadCount();
-  encoder->speed = std::clamp(request.options[kSpeed], 0, 10);
-  SetQuality(*encoder, request.quality > 0 ? request.quality : request.options[kQuality], lossless);
+  encoder->speed = std::clamp(request->options[kSpeed], 0, 10);
+  SetQuality(*encoder, request->quality > 0 ? request->quality : request->options[kQuality],
+             lossless);
   Output output;
   error = ErrorOf(avifEncoderWrite(encoder.get(), image.get(), &output.data));
   if (error != 0) return error == FMW_ERROR_DAMAGED ? FMW_ERROR_UNSUITABLE : error;
   return FmwWriteFile(fileName, output.data.data, output.data.size);
 }
 
+constexpr FmwModule kModule = {
+    .name = "AVIF",
+    .extensions = "avif;avifs",
+    .description = "AV1 Image File Format",
+    .bits = 24,
+    .flags = FMW_FORMAT_BITMAP | FMW_FORMAT_MULTI | FMW_FORMAT_FRAMES | FMW_FORMAT_ALPHA |
+             FMW_FORMAT_EXIF | FMW_FORMAT_XMP | FMW_FORMAT_ICC,
+    .options = kOptionTable,
+    .optionCount = kOptions,
+};
+
 }  // namespace
 
-extern "C" {
-
-FMW_EXPORT const char* FMW_CALL PLUGIN11GetVersion() { return "1.0"; }
-
-FMW_EXPORT const char* FMW_CALL PLUGIN12GetLibraries() {
-  static char text[64];
-  snprintf(text, sizeof text, "libavif\t%s\tBSD-2-Clause", avifVersion());
-  return text;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, int32_t) {
-  if (params->version < FMW_PLUGIN_VERSION) return 0;
-  strcpy(params->textA, "AVIF");
-  strcpy(params->extensions, "avif;avifs");
-  strcpy(params->textB, "AV1 Image File Format");
-  params->flags1 = 24;
-  params->flags2 = FMW_FORMAT_BITMAP | FMW_FORMAT_MULTI | FMW_FORMAT_FRAMES | FMW_FORMAT_ALPHA |
-                   FMW_FORMAT_EXIF | FMW_FORMAT_XMP | FMW_FORMAT_ICC;
-  return 1;
-}
-
-FMW_EXPORT const FMW_OPTION* FMW_CALL PLUGIN12GetOptions(int32_t* count) {
-  *count = kOptions;
-  return kOptionTable;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* fileName,
-                                            int32_t* error, const FMW_HOST_SERVICES*) {
-  Decoder decoder;
-  *error = Open(fileName, decoder);
-  if (*error != 0) return 0;
-  const avifImage& image = *decoder->image;
-  const bool across = TurnOf(image).quarters % 2 != 0;
-  info->width = static_cast<int32_t>(across ? image.height : image.width);
-  info->height = static_cast<int32_t>(across ? image.width : image.height);
-  info->bitsPerPixel = decoder->alphaPresent != 0 ? 32 : 24;
-  info->frame = decoder->imageCount;
-  snprintf(info->typeName, sizeof info->typeName, "AVIF%s, %s, %u bits per sample",
-           decoder->imageCount > 1 ? " animation" : "", avifPixelFormatToString(image.yuvFormat),
-           image.depth);
-  return 1;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN12GetMetadata(FMW_METADATA* metadata, const char* fileName,
-                                                const FMW_READ_REQUEST*, int32_t* error,
-                                                const FMW_HOST_SERVICES*) {
-  Decoder decoder;
-  *error = Open(fileName, decoder);
-  if (*error != 0) return 0;
-  const avifImage& image = *decoder->image;
-  if (image.depth > 8) metadata->lost |= FMW_LOST_DEPTH;
-  metadata->exif = FmwBlock(image.exif.data, image.exif.size);
-  FmwSetUpright(static_cast<uint8_t*>(metadata->exif.data), metadata->exif.size);
-  metadata->xmp = FmwBlock(image.xmp.data, image.xmp.size);
-  metadata->icc = FmwBlock(image.icc.data, image.icc.size);
-  if (decoder->imageCount > 1) metadata->delays = FrameDelays(decoder.get());
-  return 1;
-}
-
-FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN12ReadImage(const char* fileName,
-                                                 const FMW_READ_REQUEST* request, int32_t* error,
-                                                 const FMW_HOST_SERVICES*) {
-  return Read(fileName, request->page, request, error);
-}
-
-FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* error,
-                                                 const FMW_HOST_SERVICES*) {
-  return Read(fileName, 0, nullptr, error);
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN12WriteImage(const char* fileName, FMW_HANDLE bitmap,
-                                               const FMW_WRITE_REQUEST* request, int32_t* error,
-                                               const FMW_HOST_SERVICES*) {
-  *error = Write(fileName, FmwGivenBitmap(bitmap), *request);
-  return *error == 0;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE bitmap, const char*,
-                                               int32_t* error, const FMW_HOST_SERVICES*) {
-  FMW_WRITE_REQUEST request = {};
-  for (int i = 0; i < kOptions; ++i) request.options[i] = kOptionTable[i].standard;
-  *error = Write(fileName, FmwGivenBitmap(bitmap), request);
-  return *error == 0;
-}
-
-}  // extern "C"
+FMW_MODULE(kModule)
+FMW_MODULE_LIBRARIES("libavif\t%s\tBSD-2-Clause", avifVersion())
+FMW_MODULE_READS(Describe, Read)
+FMW_MODULE_METADATA(ReadMetadata)
+FMW_MODULE_WRITES(Write)

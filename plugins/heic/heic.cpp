@@ -9,7 +9,7 @@
 #include <memory>
 #include <vector>
 
-#include "fotomill_plugin_kit.h"
+#include "fotomill_plugin_exports.h"
 
 namespace {
 
@@ -136,19 +136,30 @@ int32_t ToBitmap(const Image& image, bool alpha, const FMW_READ_REQUEST* request
   return 0;
 }
 
-FMW_HANDLE Read(const char* fileName, int32_t page, int32_t wantedSide,
-                const FMW_READ_REQUEST* request, int32_t* error) {
+int32_t Read(const char* fileName, const FMW_READ_REQUEST* request, FmwBitmap* bitmap) {
   HeifFile file;
   Handle handle;
-  *error = OpenPicture(fileName, page, file, handle);
-  if (*error != 0) return nullptr;
-  PreferThumbnail(wantedSide, handle);
+  int32_t error = OpenPicture(fileName, request->page, file, handle);
+  if (error != 0) return error;
+  PreferThumbnail(request->wantedSide, handle);
   const bool alpha = heif_image_handle_has_alpha_channel(handle.get()) != 0;
   Image image;
-  *error = Decode(handle, alpha, image);
-  FmwBitmap bitmap = {};
-  if (*error == 0) *error = ToBitmap(image, alpha, request, bitmap);
-  return *error == 0 ? bitmap.block : nullptr;
+  error = Decode(handle, alpha, image);
+  return error != 0 ? error : ToBitmap(image, alpha, request, *bitmap);
+}
+
+int32_t Describe(const char* fileName, FMW_PICTURE_INFO* info) {
+  HeifFile file;
+  Handle handle;
+  const int32_t error = OpenPicture(fileName, info->frame, file, handle);
+  if (error != 0) return error;
+  info->width = heif_image_handle_get_width(handle.get());
+  info->height = heif_image_handle_get_height(handle.get());
+  info->bitsPerPixel = heif_image_handle_has_alpha_channel(handle.get()) != 0 ? 32 : 24;
+  info->frame = file.Count();
+  snprintf(info->typeName, sizeof info->typeName, "HEIF, %d bits per sample",
+           heif_image_handle_get_luma_bits_per_pixel(handle.get()));
+  return 0;
 }
 
 FMW_BLOCK ReadProfile(const heif_image_handle* handle) {
@@ -189,7 +200,7 @@ FMW_BLOCK ReadExif(const heif_image_handle* handle, heif_item_id id) {
   return block;
 }
 
-void ReadMetadata(const heif_image_handle* handle, FMW_METADATA& metadata) {
+void ReadBlocks(const heif_image_handle* handle, FMW_METADATA& metadata) {
   constexpr int kMost = 64;
   heif_item_id ids[kMost];
   const int count = heif_image_handle_get_list_of_metadata_block_IDs(handle, nullptr, ids, kMost);
@@ -205,64 +216,31 @@ void ReadMetadata(const heif_image_handle* handle, FMW_METADATA& metadata) {
   }
 }
 
-}  // namespace
-
-extern "C" {
-
-FMW_EXPORT const char* FMW_CALL PLUGIN11GetVersion() { return "1.0"; }
-
-FMW_EXPORT const char* FMW_CALL PLUGIN12GetLibraries() {
-  static char text[64];
-  snprintf(text, sizeof text, "libheif\t%s\tLGPL-3.0-or-later", heif_get_version());
-  return text;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, int32_t) {
-  if (params->version < FMW_PLUGIN_VERSION) return 0;
-  strcpy(params->textA, "HEIC");
-  strcpy(params->extensions, "heic;heif;hif;heics;heifs");
-  strcpy(params->textB, "High Efficiency Image");
-  params->flags2 = FMW_FORMAT_BITMAP | FMW_FORMAT_MULTI;
-  return 1;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* fileName,
-                                            int32_t* error, const FMW_HOST_SERVICES*) {
+int32_t ReadMetadata(const char* fileName, const FMW_READ_REQUEST* request,
+                     FMW_METADATA* metadata) {
   HeifFile file;
   Handle handle;
-  *error = OpenPicture(fileName, info->frame, file, handle);
-  if (*error != 0) return 0;
-  info->width = heif_image_handle_get_width(handle.get());
-  info->height = heif_image_handle_get_height(handle.get());
-  info->bitsPerPixel = heif_image_handle_has_alpha_channel(handle.get()) != 0 ? 32 : 24;
-  info->frame = file.Count();
-  snprintf(info->typeName, sizeof info->typeName, "HEIF, %d bits per sample",
-           heif_image_handle_get_luma_bits_per_pixel(handle.get()));
-  return 1;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN12GetMetadata(FMW_METADATA* metadata, const char* fileName,
-                                                const FMW_READ_REQUEST* request, int32_t* error,
-                                                const FMW_HOST_SERVICES*) {
-  HeifFile file;
-  Handle handle;
-  *error = OpenPicture(fileName, request->page, file, handle);
-  if (*error != 0) return 0;
+  const int32_t error = OpenPicture(fileName, request->page, file, handle);
+  if (error != 0) return error;
   if (heif_image_handle_get_luma_bits_per_pixel(handle.get()) > 8) metadata->lost = FMW_LOST_DEPTH;
   metadata->icc = ReadProfile(handle.get());
-  ReadMetadata(handle.get(), *metadata);
-  return 1;
+  ReadBlocks(handle.get(), *metadata);
+  return 0;
 }
 
-FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN12ReadImage(const char* fileName,
-                                                 const FMW_READ_REQUEST* request, int32_t* error,
-                                                 const FMW_HOST_SERVICES*) {
-  return Read(fileName, request->page, request->wantedSide, request, error);
-}
+constexpr FmwModule kModule = {
+    .name = "HEIC",
+    .extensions = "heic;heif;hif;heics;heifs",
+    .description = "High Efficiency Image",
+    .bits = 0,
+    .flags = FMW_FORMAT_BITMAP | FMW_FORMAT_MULTI,
+    .options = nullptr,
+    .optionCount = 0,
+};
 
-FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* error,
-                                                 const FMW_HOST_SERVICES*) {
-  return Read(fileName, 0, 0, nullptr, error);
-}
+}  // namespace
 
-}  // extern "C"
+FMW_MODULE(kModule)
+FMW_MODULE_LIBRARIES("libheif\t%s\tLGPL-3.0-or-later", heif_get_version())
+FMW_MODULE_READS(Describe, Read)
+FMW_MODULE_METADATA(ReadMetadata)

@@ -6,7 +6,7 @@
 #include <memory>
 #include <vector>
 
-#include "fotomill_plugin_kit.h"
+#include "fotomill_plugin_exports.h"
 
 namespace {
 
@@ -174,23 +174,44 @@ uint32_t ReductionsFor(int32_t wantedSide, const opj_image_t& image) {
   return std::min(reductions, 5u);  // the usual number of resolutions; fewer fail below
 }
 
-FMW_HANDLE Read(const char* fileName, int32_t wantedSide, const FMW_READ_REQUEST* request,
-                int32_t* error) {
+int32_t Read(const char* fileName, const FMW_READ_REQUEST* request, FmwBitmap* bitmap) {
   Reading reading;
-  *error = Open(fileName, 0, reading);
-  if (*error != 0) return nullptr;
-  const uint32_t reductions = ReductionsFor(wantedSide, *reading.image);
+  const int32_t error = Open(fileName, 0, reading);
+  if (error != 0) return error;
+  const uint32_t reductions = ReductionsFor(request->wantedSide, *reading.image);
   if (reductions > 0) {
     Reading reduced;
     if (Open(fileName, reductions, reduced) == 0) reading = std::move(reduced);
   }
-  if (opj_decode(reading.codec.get(), reading.stream.get(), reading.image.get()) == OPJ_FALSE) {
-    *error = FMW_ERROR_DAMAGED;
-    return nullptr;
-  }
-  FmwBitmap bitmap = {};
-  *error = ToBitmap(*reading.image, request, bitmap);
-  return *error == 0 ? bitmap.block : nullptr;
+  if (opj_decode(reading.codec.get(), reading.stream.get(), reading.image.get()) == OPJ_FALSE)
+    return FMW_ERROR_DAMAGED;
+  return ToBitmap(*reading.image, request, *bitmap);
+}
+
+int32_t Describe(const char* fileName, FMW_PICTURE_INFO* info) {
+  Reading reading;
+  const int32_t error = Open(fileName, 0, reading);
+  if (error != 0) return error;
+  const opj_image_t& image = *reading.image;
+  bool known = false;
+  info->width = static_cast<int32_t>(image.comps[0].w);
+  info->height = static_cast<int32_t>(image.comps[0].h);
+  info->bitsPerPixel = LayoutOf(image).Bits();
+  // The definition of channels is not known before decoding, so there may be alpha after all.
+  FmwGrayPalette(info);
+  snprintf(info->typeName, sizeof info->typeName, "JPEG 2000%s, %u bits per sample",
+           IsCodestream(fileName, known) ? " codestream" : "", image.comps[0].prec);
+  return info->width > 0 && info->height > 0 ? 0 : FMW_ERROR_DAMAGED;
+}
+
+int32_t ReadMetadata(const char* fileName, const FMW_READ_REQUEST*, FMW_METADATA* metadata) {
+  Reading reading;
+  const int32_t error = Open(fileName, 0, reading);
+  if (error != 0) return error;
+  if (reading.image->comps[0].prec > 8) metadata->lost |= FMW_LOST_DEPTH;
+  if (reading.image->numcomps > 4) metadata->lost |= FMW_LOST_INKS;
+  metadata->icc = FmwBlock(reading.image->icc_profile_buf, reading.image->icc_profile_len);
+  return 0;
 }
 
 // ---- writing ----
@@ -235,19 +256,19 @@ void AddProfile(const FMW_BLOCK& icc, opj_image_t& image) {
   image.icc_profile_len = static_cast<uint32_t>(icc.size);
 }
 
-int32_t Write(const char* fileName, const FmwBitmap& given, const FMW_WRITE_REQUEST& request) {
-  const bool gray = FmwIsGray(&given) != 0, bare = IsBareName(fileName);
-  const uint32_t components = gray ? 1 : given.bits == 32 ? 4 : 3;
-  const Image image = NewImage(given, components, gray);
+int32_t Write(const char* fileName, const FmwBitmap* given, const FMW_WRITE_REQUEST* request) {
+  const bool gray = FmwIsGray(given) != 0, bare = IsBareName(fileName);
+  const uint32_t components = gray ? 1 : given->bits == 32 ? 4 : 3;
+  const Image image = NewImage(*given, components, gray);
   const Codec codec(opj_create_compress(bare ? OPJ_CODEC_J2K : OPJ_CODEC_JP2));
   if (image == nullptr || codec == nullptr) return FMW_ERROR_MEMORY;
-  if (!bare) AddProfile(request.icc, *image);
+  if (!bare) AddProfile(request->icc, *image);
   opj_cparameters_t parameters;
   opj_set_default_encoder_parameters(&parameters);
-  const int32_t quality = request.quality > 0 ? request.quality : request.options[kQuality];
+  const int32_t quality = request->quality > 0 ? request->quality : request->options[kQuality];
   parameters.tcp_mct = components >= 3 ? 1 : 0;
   parameters.tcp_numlayers = 1;
-  if (request.lossless != 0 || quality >= kLossless) {
+  if (request->lossless != 0 || quality >= kLossless) {
     parameters.cp_disto_alloc = 1;
     parameters.tcp_rates[0] = 0;
   } else {  // a signal-to-noise ratio of 25 to 50 dB
@@ -256,7 +277,7 @@ int32_t Write(const char* fileName, const FmwBitmap& given, const FMW_WRITE_REQU
     parameters.tcp_distoratio[0] = 25.0F + static_cast<float>(quality) / 4;
   }
   while (parameters.numresolution > 1 &&
-         std::min(given.width, given.height) >> (parameters.numresolution - 1) == 0)
+         std::min(given->width, given->height) >> (parameters.numresolution - 1) == 0)
     --parameters.numresolution;
   if (opj_setup_encoder(codec.get(), &parameters, image.get()) == OPJ_FALSE)
     return FMW_ERROR_UNSUITABLE;
@@ -269,88 +290,20 @@ int32_t Write(const char* fileName, const FmwBitmap& given, const FMW_WRITE_REQU
   return done ? 0 : FMW_ERROR_WRITE;
 }
 
+constexpr FmwModule kModule = {
+    .name = "JPEG 2000",
+    .extensions = "jp2;j2k;jpf;jpx;j2c;jpc",
+    .description = "JPEG 2000",
+    .bits = 24,
+    .flags = FMW_FORMAT_BITMAP | FMW_FORMAT_ALPHA | FMW_FORMAT_ICC,
+    .options = kOptionTable,
+    .optionCount = kOptions,
+};
+
 }  // namespace
 
-extern "C" {
-
-FMW_EXPORT const char* FMW_CALL PLUGIN11GetVersion() { return "1.0"; }
-
-FMW_EXPORT const char* FMW_CALL PLUGIN12GetLibraries() {
-  static char text[64];
-  snprintf(text, sizeof text, "OpenJPEG\t%s\tBSD-2-Clause", opj_version());
-  return text;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, int32_t) {
-  if (params->version < FMW_PLUGIN_VERSION) return 0;
-  strcpy(params->textA, "JPEG 2000");
-  strcpy(params->extensions, "jp2;j2k;jpf;jpx;j2c;jpc");
-  strcpy(params->textB, "JPEG 2000");
-  params->flags1 = 24;
-  params->flags2 = FMW_FORMAT_BITMAP | FMW_FORMAT_ALPHA | FMW_FORMAT_ICC;
-  return 1;
-}
-
-FMW_EXPORT const FMW_OPTION* FMW_CALL PLUGIN12GetOptions(int32_t* count) {
-  *count = kOptions;
-  return kOptionTable;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* fileName,
-                                            int32_t* error, const FMW_HOST_SERVICES*) {
-  Reading reading;
-  *error = Open(fileName, 0, reading);
-  if (*error != 0) return 0;
-  const opj_image_t& image = *reading.image;
-  bool known = false;
-  info->width = static_cast<int32_t>(image.comps[0].w);
-  info->height = static_cast<int32_t>(image.comps[0].h);
-  info->bitsPerPixel = LayoutOf(image).Bits();
-  // The definition of channels is not known before decoding, so there may be alpha after all.
-  for (int i = 0; i < 768; ++i) info->palette[i] = static_cast<uint8_t>(i / 3);
-  snprintf(info->typeName, sizeof info->typeName, "JPEG 2000%s, %u bits per sample",
-           IsCodestream(fileName, known) ? " codestream" : "", image.comps[0].prec);
-  if (info->width > 0 && info->height > 0) return 1;
-  *error = FMW_ERROR_DAMAGED;
-  return 0;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN12GetMetadata(FMW_METADATA* metadata, const char* fileName,
-                                                const FMW_READ_REQUEST*, int32_t* error,
-                                                const FMW_HOST_SERVICES*) {
-  Reading reading;
-  *error = Open(fileName, 0, reading);
-  if (*error != 0) return 0;
-  if (reading.image->comps[0].prec > 8) metadata->lost |= FMW_LOST_DEPTH;
-  if (reading.image->numcomps > 4) metadata->lost |= FMW_LOST_INKS;
-  metadata->icc = FmwBlock(reading.image->icc_profile_buf, reading.image->icc_profile_len);
-  return 1;
-}
-
-FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN12ReadImage(const char* fileName,
-                                                 const FMW_READ_REQUEST* request, int32_t* error,
-                                                 const FMW_HOST_SERVICES*) {
-  return Read(fileName, request->wantedSide, request, error);
-}
-
-FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* error,
-                                                 const FMW_HOST_SERVICES*) {
-  return Read(fileName, 0, nullptr, error);
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN12WriteImage(const char* fileName, FMW_HANDLE bitmap,
-                                               const FMW_WRITE_REQUEST* request, int32_t* error,
-                                               const FMW_HOST_SERVICES*) {
-  *error = Write(fileName, FmwGivenBitmap(bitmap), *request);
-  return *error == 0;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE bitmap, const char*,
-                                               int32_t* error, const FMW_HOST_SERVICES*) {
-  FMW_WRITE_REQUEST request = {};
-  request.options[kQuality] = kStandardQuality;
-  *error = Write(fileName, FmwGivenBitmap(bitmap), request);
-  return *error == 0;
-}
-
-}  // extern "C"
+FMW_MODULE(kModule)
+FMW_MODULE_LIBRARIES("OpenJPEG\t%s\tBSD-2-Clause", opj_version())
+FMW_MODULE_READS(Describe, Read)
+FMW_MODULE_METADATA(ReadMetadata)
+FMW_MODULE_WRITES(Write)

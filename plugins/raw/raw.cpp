@@ -11,7 +11,7 @@
 #include <memory>
 #include <vector>
 
-#include "fotomill_plugin_kit.h"
+#include "fotomill_plugin_exports.h"
 #include "raw_exif.h"
 
 namespace {
@@ -198,74 +198,42 @@ int32_t Develop(const char* fileName, bool half, const FMW_READ_REQUEST* request
   return ToBitmap(gray.data(), {image->width, image->height}, 0, request, bitmap);
 }
 
-FMW_HANDLE Read(const char* fileName, int32_t picture, int32_t wantedSide,
-                const FMW_READ_REQUEST* request, int32_t* error) {
+int32_t Read(const char* fileName, const FMW_READ_REQUEST* request, FmwBitmap* bitmap) {
   Raw raw;
-  *error = Open(fileName, raw);
-  if (*error != 0) return nullptr;
+  const int32_t error = Open(fileName, raw);
+  if (error != 0) return error;
   const Size developed = DevelopedSize(fileName, false);
-  const auto wanted = static_cast<uint32_t>(std::max(wantedSide, 0));
-  FmwBitmap bitmap = {};
+  const auto wanted = static_cast<uint32_t>(std::max(request->wantedSide, 0));
+  // Older programs know no other size than that of the developed picture.
+  const bool old = request->version < FMW_PLUGIN_VERSION_12;
+  const int32_t picture = old ? kDeveloped : request->options[kPicture];
   Preview preview;
   const bool fast = wanted > 0 || picture == kPreview;
   if (fast && preview.Find(*raw) &&
       (wanted > 0 ? preview.size.Side() >= wanted : IsLarge(preview, developed)) &&
-      preview.Decode(wanted)) {
-    *error = ToBitmap(preview.pixels.data(), preview.size, raw->sizes.flip, request, bitmap);
-  } else {
-    const bool half = picture == kHalf || (wanted > 0 && developed.Side() / 2 >= wanted);
-    *error = Develop(fileName, half, request, bitmap);
-  }
-  return *error == 0 ? bitmap.block : nullptr;
+      preview.Decode(wanted))
+    return ToBitmap(preview.pixels.data(), preview.size, raw->sizes.flip, request, *bitmap);
+  const bool half = picture == kHalf || (wanted > 0 && developed.Side() / 2 >= wanted);
+  return Develop(fileName, half, request, *bitmap);
 }
 
-}  // namespace
-
-extern "C" {
-
-FMW_EXPORT const char* FMW_CALL PLUGIN11GetVersion() { return "1.0"; }
-
-FMW_EXPORT const char* FMW_CALL PLUGIN12GetLibraries() {
-  static char text[64];
-  snprintf(text, sizeof text, "LibRaw\t%s\tLGPL-2.1-only OR CDDL-1.0", libraw_version());
-  return text;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, int32_t) {
-  if (params->version < FMW_PLUGIN_VERSION) return 0;
-  strcpy(params->textA, "Camera raw");
-  strcpy(params->extensions,
-         "dng;cr2;cr3;crw;nef;nrw;arw;sr2;srf;raf;rw2;orf;pef;srw;rwl;3fr;iiq;mef;mrw;erf;x3f;dcr;"
-         "k25;mos;raw");
-  strcpy(params->textB, "Camera raw");
-  params->flags2 = FMW_FORMAT_BITMAP;
-  return 1;
-}
-
-FMW_EXPORT const FMW_OPTION* FMW_CALL PLUGIN12GetOptions(int32_t* count) {
-  *count = kOptions;
-  return kOptionTable;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* fileName,
-                                            int32_t* error, const FMW_HOST_SERVICES*) {
+int32_t Describe(const char* fileName, FMW_PICTURE_INFO* info) {
   Raw raw;
-  *error = Open(fileName, raw);
-  if (*error != 0) return 0;
+  const int32_t error = Open(fileName, raw);
+  if (error != 0) return error;
   const Size size = DevelopedSize(fileName, false);
   info->width = static_cast<int32_t>(size.width);
   info->height = static_cast<int32_t>(size.height);
   info->bitsPerPixel = 24;
   snprintf(info->typeName, sizeof info->typeName, "%.30s %.30s", raw->idata.make, raw->idata.model);
-  return 1;
+  return 0;
 }
 
-FMW_EXPORT int32_t FMW_CALL PLUGIN12GetMetadata(FMW_METADATA* metadata, const char* fileName,
-                                                const FMW_READ_REQUEST* request, int32_t* error,
-                                                const FMW_HOST_SERVICES*) {
+int32_t ReadMetadata(const char* fileName, const FMW_READ_REQUEST* request,
+                     FMW_METADATA* metadata) {
   Raw raw;
-  *error = Open(fileName, raw);
-  if (*error != 0) return 0;
+  const int32_t error = Open(fileName, raw);
+  if (error != 0) return error;
   metadata->lost = FMW_LOST_DEPTH;
   const std::vector<uint8_t> exif = ExifOf(*raw);
   metadata->exif = FmwBlock(exif.data(), exif.size());
@@ -280,18 +248,24 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN12GetMetadata(FMW_METADATA* metadata, const ch
   }
   metadata->width = static_cast<int32_t>(size.width);
   metadata->height = static_cast<int32_t>(size.height);
-  return 1;
+  return 0;
 }
 
-FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN12ReadImage(const char* fileName,
-                                                 const FMW_READ_REQUEST* request, int32_t* error,
-                                                 const FMW_HOST_SERVICES*) {
-  return Read(fileName, request->options[kPicture], request->wantedSide, request, error);
-}
+constexpr FmwModule kModule = {
+    .name = "Camera raw",
+    .extensions =
+        "dng;cr2;cr3;crw;nef;nrw;arw;sr2;srf;raf;rw2;orf;pef;srw;rwl;3fr;iiq;mef;mrw;erf;"
+        "x3f;dcr;k25;mos;raw",
+    .description = "Camera raw",
+    .bits = 0,
+    .flags = FMW_FORMAT_BITMAP,
+    .options = kOptionTable,
+    .optionCount = kOptions,
+};
 
-FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* error,
-                                                 const FMW_HOST_SERVICES*) {
-  return Read(fileName, kDeveloped, 0, nullptr, error);
-}
+}  // namespace
 
-}  // extern "C"
+FMW_MODULE(kModule)
+FMW_MODULE_LIBRARIES("LibRaw\t%s\tLGPL-2.1-only OR CDDL-1.0", libraw_version())
+FMW_MODULE_READS(Describe, Read)
+FMW_MODULE_METADATA(ReadMetadata)

@@ -6,18 +6,19 @@
 #include <cmath>
 #include <memory>
 
-#include "fotomill_plugin_kit.h"
+#include "fotomill_plugin_exports.h"
 
 namespace {
 
 constexpr double kDotsPerInch = 96;
 constexpr double kStandardSide = 512;  // of a drawing without any size
 constexpr double kMostSide = 16384;
+constexpr int32_t kStandardScale = 100;  // percent
 
 enum OptionPlace { kScale, kOptions };
 constexpr FMW_OPTION kOptionTable[] = {
-    {"Scale", "Scale, in percent of the size in the file", FMW_OPTION_NUMBER, 1, 10000, 100,
-     nullptr},
+    {"Scale", "Scale, in percent of the size in the file", FMW_OPTION_NUMBER, 1, 10000,
+     kStandardScale, nullptr},
 };
 
 struct Unreference {
@@ -97,86 +98,60 @@ int32_t Draw(RsvgHandle* handle, Size size, const FMW_READ_REQUEST* request, Fmw
   return 0;
 }
 
-FMW_HANDLE Read(const char* fileName, int32_t percent, int32_t wantedSide,
-                const FMW_READ_REQUEST* request, int32_t* error) {
-  Handle handle;
-  *error = Open(fileName, handle);
-  if (*error != 0) return nullptr;
-  Size size = SizeOf(handle.get(), percent);
-  const double side = std::max(size.width, size.height);
-  if (wantedSide > 0 && wantedSide < side) {
-    size = {std::max(1.0, std::ceil(size.width * wantedSide / side)),
-            std::max(1.0, std::ceil(size.height * wantedSide / side))};
-  }
-  FmwBitmap bitmap = {};
-  *error = Draw(handle.get(), size, request, bitmap);
-  return *error == 0 ? bitmap.block : nullptr;
-}
-
-int32_t Describe(const char* fileName, int32_t percent, FMW_PICTURE_INFO* info) {
+int32_t Read(const char* fileName, const FMW_READ_REQUEST* request, FmwBitmap* bitmap) {
   Handle handle;
   const int32_t error = Open(fileName, handle);
   if (error != 0) return error;
-  const Size size = SizeOf(handle.get(), percent);
+  Size size = SizeOf(handle.get(), request->options[kScale]);
+  const double side = std::max(size.width, size.height);
+  const double wanted = request->wantedSide;
+  if (wanted > 0 && wanted < side) {
+    size = {std::max(1.0, std::ceil(size.width * wanted / side)),
+            std::max(1.0, std::ceil(size.height * wanted / side))};
+  }
+  return Draw(handle.get(), size, request, *bitmap);
+}
+
+int32_t Measure(const char* fileName, int32_t percent, Size& size) {
+  Handle handle;
+  const int32_t error = Open(fileName, handle);
+  if (error == 0) size = SizeOf(handle.get(), percent);
+  return error;
+}
+
+int32_t Describe(const char* fileName, FMW_PICTURE_INFO* info) {
+  Size size;
+  const int32_t error = Measure(fileName, kStandardScale, size);
   info->width = static_cast<int32_t>(size.width);
   info->height = static_cast<int32_t>(size.height);
   info->bitsPerPixel = 32;
   strcpy(info->typeName, "SVG");
-  return 0;
+  return error;
 }
+
+int32_t ReadMetadata(const char* fileName, const FMW_READ_REQUEST* request,
+                     FMW_METADATA* metadata) {
+  Size size;
+  const int32_t error = Measure(fileName, request->options[kScale], size);
+  metadata->width = static_cast<int32_t>(size.width);
+  metadata->height = static_cast<int32_t>(size.height);
+  return error;
+}
+
+constexpr FmwModule kModule = {
+    .name = "SVG",
+    .extensions = "svg;svgz",
+    .description = "Scalable Vector Graphics",
+    .bits = 0,
+    .flags = FMW_FORMAT_BITMAP,
+    .options = kOptionTable,
+    .optionCount = kOptions,
+};
 
 }  // namespace
 
-extern "C" {
-
-FMW_EXPORT const char* FMW_CALL PLUGIN11GetVersion() { return "1.0"; }
-
-FMW_EXPORT const char* FMW_CALL PLUGIN12GetLibraries() {
-  static char text[64];
-  snprintf(text, sizeof text, "librsvg\t%u.%u.%u\tLGPL-2.1-or-later", rsvg_major_version,
-           rsvg_minor_version, rsvg_micro_version);
-  return text;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetPluginParams(FMW_PLUGIN_PARAMS* params, int32_t) {
-  if (params->version < FMW_PLUGIN_VERSION) return 0;
-  strcpy(params->textA, "SVG");
-  strcpy(params->extensions, "svg;svgz");
-  strcpy(params->textB, "Scalable Vector Graphics");
-  params->flags2 = FMW_FORMAT_BITMAP;
-  return 1;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN11GetInfo(FMW_PICTURE_INFO* info, const char* fileName,
-                                            int32_t* error, const FMW_HOST_SERVICES*) {
-  *error = Describe(fileName, 100, info);
-  return *error == 0;
-}
-
-FMW_EXPORT const FMW_OPTION* FMW_CALL PLUGIN12GetOptions(int32_t* count) {
-  *count = kOptions;
-  return kOptionTable;
-}
-
-FMW_EXPORT int32_t FMW_CALL PLUGIN12GetMetadata(FMW_METADATA* metadata, const char* fileName,
-                                                const FMW_READ_REQUEST* request, int32_t* error,
-                                                const FMW_HOST_SERVICES*) {
-  FMW_PICTURE_INFO info = {};
-  *error = Describe(fileName, request->options[kScale], &info);
-  metadata->width = info.width;
-  metadata->height = info.height;
-  return *error == 0;
-}
-
-FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN12ReadImage(const char* fileName,
-                                                 const FMW_READ_REQUEST* request, int32_t* error,
-                                                 const FMW_HOST_SERVICES*) {
-  return Read(fileName, request->options[kScale], request->wantedSide, request, error);
-}
-
-FMW_EXPORT FMW_HANDLE FMW_CALL PLUGIN11ReadImage(const char* fileName, int32_t* error,
-                                                 const FMW_HOST_SERVICES*) {
-  return Read(fileName, 100, 0, nullptr, error);
-}
-
-}  // extern "C"
+FMW_MODULE(kModule)
+FMW_MODULE_LIBRARIES("librsvg\t%u.%u.%u\tLGPL-2.1-or-later", rsvg_major_version, rsvg_minor_version,
+                     rsvg_micro_version)
+FMW_MODULE_READS(Describe, Read)
+FMW_MODULE_METADATA(ReadMetadata)

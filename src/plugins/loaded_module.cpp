@@ -38,12 +38,12 @@ void LookUpExports(LoadedModule& module) {
   LookUp(library, "PLUGIN11GetInfo", module.exports.getInfo);
   LookUp(library, "PLUGIN11GetComment", module.exports.getComment);
   LookUp(library, "PLUGIN11DoConfigure", module.exports.configure);
-  LookUp(library, "PLUGIN12GetLibraries", module.newer.getLibraries);
-  LookUp(library, "PLUGIN12GetOptions", module.newer.getOptions);
-  LookUp(library, "PLUGIN12GetMetadata", module.newer.getMetadata);
-  LookUp(library, "PLUGIN12ReadImage", module.newer.readImage);
-  LookUp(library, "PLUGIN12WriteImage", module.newer.writeImage);
-  LookUp(library, "PLUGIN12Transcode", module.newer.transcode);
+  LookUp(library, "PLUGIN12GetLibraries", module.exports.getLibraries);
+  LookUp(library, "PLUGIN12GetOptions", module.exports.getOptions);
+  LookUp(library, "PLUGIN12GetMetadata", module.exports.getMetadata);
+  LookUp(library, "PLUGIN12ReadImage", module.exports.readImage12);
+  LookUp(library, "PLUGIN12WriteImage", module.exports.writeImage12);
+  LookUp(library, "PLUGIN12Transcode", module.exports.transcode);
 }
 
 ModuleOption TakeOption(const FMW_OPTION& given) {
@@ -63,9 +63,9 @@ ModuleOption TakeOption(const FMW_OPTION& given) {
 }
 
 void TakeOptions(const LoadedModule& module, ModuleFacts& facts) {
-  if (module.newer.getOptions == nullptr) return;
+  if (module.exports.getOptions == nullptr) return;
   int32_t count = 0;
-  const FMW_OPTION* options = module.newer.getOptions(&count);
+  const FMW_OPTION* options = module.exports.getOptions(&count);
   if (options == nullptr) return;
   count = std::clamp(count, 0, FMW_OPTION_COUNT);
   for (int32_t i = 0; i < count; ++i) facts.options.push_back(TakeOption(options[i]));
@@ -97,15 +97,15 @@ bool LoadModule(const std::string& path, LoadedModule& module, ModuleFacts& fact
   if (exports.getParams == nullptr || exports.readImage == nullptr || exports.getInfo == nullptr ||
       !TakeParams(module, facts))
     return false;
-  facts.writes = exports.writeImage != nullptr || module.newer.writeImage != nullptr;
+  facts.writes = exports.writeImage != nullptr || module.exports.writeImage12 != nullptr;
   facts.hasComments = exports.getComment != nullptr;
   facts.hasDialog = exports.configure != nullptr;
-  facts.hasMetadata = module.newer.getMetadata != nullptr;
-  facts.takesMetadata = module.newer.writeImage != nullptr;
-  facts.transcodes = module.newer.transcode != nullptr;
+  facts.hasMetadata = module.exports.getMetadata != nullptr;
+  facts.takesMetadata = module.exports.writeImage12 != nullptr;
+  facts.transcodes = module.exports.transcode != nullptr;
   if (exports.getVersion != nullptr) facts.version = TextOf(exports.getVersion());
   if (exports.getCopyright != nullptr) facts.copyright = TextOf(exports.getCopyright());
-  if (module.newer.getLibraries != nullptr) facts.libraries = TextOf(module.newer.getLibraries());
+  if (exports.getLibraries != nullptr) facts.libraries = TextOf(exports.getLibraries());
   TakeOptions(module, facts);
   return true;
 }

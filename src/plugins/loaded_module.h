@@ -8,7 +8,8 @@
 
 namespace fotomill {
 
-// A module's exports, in lookup order; missing ones are null.
+// A module's exports, in lookup order; missing ones are null. Those from getLibraries on are of the
+// newer interface.
 struct PluginExports {
   FMW_GET_VERSION getVersion = nullptr;
   FMW_GET_COPYRIGHT getCopyright = nullptr;
@@ -18,15 +19,11 @@ struct PluginExports {
   FMW_GET_INFO getInfo = nullptr;
   FMW_GET_COMMENT getComment = nullptr;
   FMW_CONFIGURE_CALL configure = nullptr;
-};
-
-// The exports of the newer interface, all optional.
-struct PluginExports12 {
   FMW_GET_LIBRARIES getLibraries = nullptr;
   FMW_GET_OPTIONS getOptions = nullptr;
   FMW_GET_METADATA getMetadata = nullptr;
-  FMW_READ_IMAGE_12 readImage = nullptr;
-  FMW_WRITE_IMAGE_12 writeImage = nullptr;
+  FMW_READ_IMAGE_12 readImage12 = nullptr;
+  FMW_WRITE_IMAGE_12 writeImage12 = nullptr;
   FMW_TRANSCODE transcode = nullptr;
 };
 
@@ -34,7 +31,6 @@ struct PluginExports12 {
 struct LoadedModule {
   platform::SharedLibrary library;
   PluginExports exports;
-  PluginExports12 newer;
 };
 
 // Loads a module and asks it about itself. False if it cannot be loaded, lacks a required export or

@@ -121,14 +121,14 @@ void TakeBlock(const FMW_BLOCK& block, std::vector<uint8_t>& bytes) {
 
 void TakeMetadata(const LoadedModule& module, const ModuleQuestion& question, Call& call,
                   ModuleDescription& description) {
-  if (module.newer.getMetadata == nullptr) return;
+  if (module.exports.getMetadata == nullptr) return;
   FMW_METADATA metadata = {};
   metadata.size = sizeof metadata;
   metadata.version = FMW_PLUGIN_VERSION_12;
   const FMW_READ_REQUEST request = RequestOf(question);
   int32_t error = 0;
-  const int32_t done = module.newer.getMetadata(&metadata, question.fileName.c_str(), &request,
-                                                &error, call.Services());
+  const int32_t done = module.exports.getMetadata(&metadata, question.fileName.c_str(), &request,
+                                                  &error, call.Services());
   ModuleDescription taken;
   TakeBlock(metadata.exif, taken.exif);
   TakeBlock(metadata.xmp, taken.xmp);
@@ -184,9 +184,10 @@ Status ReadHere(const LoadedModule& module, const ModuleQuestion& question,
   Call call(surroundings);
   call.Services()->comment = question.comment.empty() ? nullptr : question.comment.c_str();
   int32_t error = 0;
-  if (module.newer.readImage != nullptr) {
+  if (module.exports.readImage12 != nullptr) {
     const FMW_READ_REQUEST request = RequestOf(question);
-    handle = module.newer.readImage(question.fileName.c_str(), &request, &error, call.Services());
+    handle =
+        module.exports.readImage12(question.fileName.c_str(), &request, &error, call.Services());
   } else {
     handle = module.exports.readImage(question.fileName.c_str(), &error, call.Services());
   }
@@ -198,7 +199,7 @@ Status WriteHere(const LoadedModule& module, const ModuleOutput& output,
   Call call(surroundings);
   void* const bitmap = const_cast<uint8_t*>(output.bitmap.data());
   int32_t error = 0, written = 0;
-  if (module.newer.writeImage != nullptr) {
+  if (module.exports.writeImage12 != nullptr) {
     FMW_WRITE_REQUEST request = {};
     request.size = sizeof request;
     request.version = FMW_PLUGIN_VERSION_12;
@@ -211,8 +212,8 @@ Status WriteHere(const LoadedModule& module, const ModuleOutput& output,
     request.xmp = BlockOf(output.xmp);
     request.icc = BlockOf(output.icc);
     request.comment = output.comment;
-    written =
-        module.newer.writeImage(output.fileName.c_str(), bitmap, &request, &error, call.Services());
+    written = module.exports.writeImage12(output.fileName.c_str(), bitmap, &request, &error,
+                                          call.Services());
   } else if (module.exports.writeImage != nullptr) {
     written = module.exports.writeImage(output.fileName.c_str(), bitmap, output.comment, &error,
                                         call.Services());
@@ -224,11 +225,11 @@ Status WriteHere(const LoadedModule& module, const ModuleOutput& output,
 
 Status TranscodeHere(const LoadedModule& module, const std::string& source,
                      const std::string& destination, const ModuleSurroundings& surroundings) {
-  if (module.newer.transcode == nullptr) return Status::UnsupportedFunction;
+  if (module.exports.transcode == nullptr) return Status::UnsupportedFunction;
   Call call(surroundings);
   int32_t error = 0;
   const int32_t done =
-      module.newer.transcode(source.c_str(), destination.c_str(), &error, call.Services());
+      module.exports.transcode(source.c_str(), destination.c_str(), &error, call.Services());
   return done != 0 ? Status::Ok : ModuleError(error, Status::ErrorWritingFile);
 }
 
