@@ -32,6 +32,7 @@ FLOORS = [
     ["settings"],  # lower layers get settings as options of a job
     ["batch"],
     ["pages"],
+    ["printing"],
     ["cli", "desktop"],
 ]
 FLOOR = {room: floor for floor, rooms in enumerate(FLOORS) for room in rooms}

@@ -1,8 +1,6 @@
 #include "cli/commands/contact_sheet.h"
 
-#include <charconv>
 #include <memory>
-#include <optional>
 #include <string>
 
 #include "batch/new_job.h"
@@ -13,6 +11,7 @@
 #include "cli/frame/terminal_prompts.h"
 #include "cli/selection/file_selection.h"
 #include "pages/catalog_page.h"
+#include "printing/value_parsing.h"
 #include "platform/existence.h"
 #include "platform/files.h"
 #include "settings/settings.h"
@@ -45,16 +44,6 @@ constexpr const char* kNoFont = TrLater(
     "fonts-dejavu-core).");
 constexpr Color kPaper = 0xFFFFFF;
 
-// Parses RRGGBB.
-std::optional<Color> ColorOf(std::string_view text) {
-  uint32_t value = 0;
-  if (text.starts_with('#')) text.remove_prefix(1);
-  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), value, 16);
-  if (text.size() != 6 || error != std::errc() || end != text.data() + text.size())
-    return std::nullopt;
-  return (value & 0xFF) << 16 | (value & 0xFF00) | value >> 16;
-}
-
 int32_t FirstAbove0(int32_t option, int32_t setting, int32_t usual) {
   if (option > 0) return option;
   return setting > 0 && setting <= kMostCells ? setting : usual;
@@ -73,11 +62,8 @@ std::string ReadLook(const SheetOptions& options, CatalogLook& look) {
   look.blackText = options.blackText;
   look.names = !options.noNames;
   if (options.blackText) look.background = kPaper;
-  if (!options.background.empty()) {
-    const auto color = ColorOf(options.background);
-    if (!color) return Tr("--background takes a color as RRGGBB, such as FFFFFF.");
-    look.background = *color;
-  }
+  if (std::string wrong = ReadColor(options.background, look.background); !wrong.empty())
+    return wrong;
   const Rectangle page = PageSize(look);
   if (CheckPackedSize(page.width, page.height, 24) != Status::Ok) {
     return Tr("A page of %1 x %2 pixels is too large.", page.width, page.height);

@@ -1,8 +1,6 @@
 #include "cli/commands/pages/page_command.h"
 
 #include <algorithm>
-#include <charconv>
-#include <memory>
 #include <set>
 
 #include "batch/new_job.h"
@@ -19,8 +17,6 @@
 #include "platform/paths.h"
 #include "platform/process.h"
 #include "platform/temporary_file.h"
-#include "settings/job_options.h"
-#include "settings/settings.h"
 #include "texts/status_text.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
@@ -29,7 +25,8 @@ namespace fotomill::cli {
 
 namespace {
 
-constexpr int32_t kMostCells = 100, kMostDpi = 2400;
+constexpr int32_t kMostDpi = 2400;
+constexpr double kUsualDpi = 300;  // of pages that are pictures
 constexpr const char* kNoFont = TrLater(
     "Text needs a font, fontconfig and HarfBuzz: packages fonts-dejavu-core, libfontconfig1 and "
     "libharfbuzz-subset0.");
@@ -54,10 +51,10 @@ std::string OutputProblem(const PageCommandOptions& options) {
 
 class PageWriter {
  public:
-  PageWriter(const PageCommandOptions& options, PageCommand command, BatchJob& job,
+  PageWriter(const PageCommandOptions& options, PagePlan plan, BatchJob& job,
              const CommandContext& context)
       : options_(options),
-        command_(std::move(command)),
+        plan_(std::move(plan)),
         job_(job),
         context_(context),
         output_(context, options.json) {}
@@ -67,7 +64,7 @@ class PageWriter {
     output_.CloseWith(selection.leftOut);
     output_.KeepGoing();
     PageRun run(
-        files_, command_.run,
+        files_, plan_.run,
         {.progress = [this](size_t done, size_t total) { output_.ShowProgress(done, total); },
          .goesOn = [this] { return output_.GoesOn(); },
          .tick = [this] { output_.Tick(); }});
@@ -118,7 +115,7 @@ class PageWriter {
   Status WriteNumbered(PageRun& run) {
     for (uint32_t number = 1; number < kLastCatalogPage; ++number) {
       const std::string path = platform::JoinFolder(
-          options_.dest, CatalogPageName(command_.prefix, number, options_.to));
+          options_.dest, CatalogPageName(plan_.prefix, number, options_.to));
       if (platform::ExistenceOf(path) == platform::Existence::No) return WriteDocument(run, path);
     }
     return Status::ErrorCreatingFile;
@@ -134,7 +131,7 @@ class PageWriter {
     if (status != Status::Ok || run.Pages().empty()) return status;
     output_.MakeWay();
     const auto result = platform::RunAndWait(
-        {"lp", "-s", "-d", options_.printer, "-t", command_.run.title, "--", file.Path()});
+        {"lp", "-s", "-d", options_.printer, "-t", plan_.run.title, "--", file.Path()});
     if (result == 0) return Status::Ok;
     hint_ = result ? Tr("Printer \"%1\" did not take the pages.", options_.printer)
                    : Tr("The print command \"lp\" was not found; it comes with CUPS (package "
@@ -143,7 +140,7 @@ class PageWriter {
   }
 
   Status WritePages(PageRun& run) {
-    const double dpi = options_.dpi > 0 ? options_.dpi : command_.usualDpi;
+    const double dpi = options_.dpi > 0 ? options_.dpi : kUsualDpi;
     for (size_t i = 0; i < run.Pages().size(); ++i) {
       PicturePointer page = NewPictureRecord();
       if (page == nullptr) return Status::MemoryAllocationError;
@@ -156,7 +153,7 @@ class PageWriter {
       }
       page->bitsPerPixel = 24;
       page->metadata.dpiX = page->metadata.dpiY = dpi;
-      const CatalogPageOptions write{.dryRun = options_.dryRun, .prefix = command_.prefix};
+      const CatalogPageOptions write{.dryRun = options_.dryRun, .prefix = plan_.prefix};
       const Status status = WriteCatalogPage(*page, write, job_, destinations_[i]);
       Explain(status, destinations_[i]);
       RETURN_IF_BAD(status);
@@ -182,7 +179,7 @@ class PageWriter {
       } else if (unwritten.contains(i)) {
         if (output_.IsJson()) output_.Element(ElementOf(files_[i].name, {}, 0, status));
       } else if (outcome.page == 0) {
-        output_.FileFailed(files_[i].name, Status::UnsuitableImage, command_.leftOut);
+        output_.FileFailed(files_[i].name, Status::UnsuitableImage, plan_.leftOut);
       } else {
         Done(files_[i].name, outcome);
       }
@@ -220,7 +217,7 @@ class PageWriter {
   }
 
   const PageCommandOptions& options_;
-  const PageCommand command_;
+  const PagePlan plan_;
   BatchJob& job_;
   const CommandContext& context_;
   ResultOutput output_;
@@ -232,22 +229,14 @@ class PageWriter {
 
 }  // namespace
 
-void AddPageOptions(CLI::App& app, PageCommandOptions& options, CommandContext& context) {
+void AddPageOutput(CLI::App& app, PageCommandOptions& options, CommandContext& context) {
   AddSelection(app, options.selection, context);
   AddName(app, "-o,--out", options.out, "FILE.pdf", "Write one PDF file");
   AddName(app, "-t,--to", options.to, "EXT", "Write a picture of each page, by extension");
   AddName(app, "-d,--dest", options.dest, "DIR", "Folder for --to, created if needed");
   AddName(app, "--printer", options.printer, "NAME", "Print on a printer of the system (lp)");
-  AddText(app, "--paper", options.paper, "SIZE",
-          "Paper: a name listed by \"pages papers\", or WxH such as 210x297mm (default: A4)");
-  AddFlag(app, "--landscape", options.landscape, "Turn the paper");
-  AddText(app, "--margin", options.margin, "LENGTH", "Margin on all sides, such as 10mm or 0.5in");
   AddNumber(app, "--dpi", options.dpi, "N", 10, kMostDpi,
             "Pixels per inch of pages with --to; in PDF, the most that pictures have");
-  AddNumber(app, "--brightness", options.brightness, "N", -100, 100,
-            "Brighten or darken the pictures");
-  AddNumber(app, "--contrast", options.contrast, "N", -100, 100,
-            "Change the contrast of the pictures");
   AddChoice(app, "--overwrite", options.overwrite, "HOW",
             "If --out exists: refuse (default) or replace", {"refuse", "replace"});
   AddNumber(app, "-j,--jobs", options.jobs, "N", 0, INT32_MAX,
@@ -257,44 +246,7 @@ void AddPageOptions(CLI::App& app, PageCommandOptions& options, CommandContext& 
           "Print a JSON array of {file, destination, page, status, message}");
 }
 
-std::string ReadPageSetup(const PageCommandOptions& options, double margin, PageSetup& setup) {
-  const auto paper = ParseSize(options.paper, Papers());
-  if (!paper) {
-    return Tr("\"%1\" is not a paper size; \"fotomill pages papers\" lists them.", options.paper);
-  }
-  setup.paper = options.landscape ? paper->Turned() : *paper;
-  setup.margin = margin;
-  if (!options.margin.empty()) {
-    const auto given = ParseLength(options.margin);
-    if (!given) return Tr("\"%1\" is not a length such as 10mm, 1cm or 0.5in.", options.margin);
-    setup.margin = *given;
-  }
-  constexpr double kLeastRoom = 5;
-  if (std::min(setup.paper.width, setup.paper.height) - 2 * setup.margin < kLeastRoom)
-    return Tr("The margins leave no room on the paper.");
-  return {};
-}
-
-bool ReadGrid(const std::string& text, int32_t& columns, int32_t& rows) {
-  const char* const end = text.data() + text.size();
-  const auto first = std::from_chars(text.data(), end, columns);
-  if (first.ec != std::errc() || first.ptr == end || (*first.ptr | 0x20) != 'x') return false;
-  const auto second = std::from_chars(first.ptr + 1, end, rows);
-  const auto fits = [](int32_t count) { return count >= 1 && count <= kMostCells; };
-  return second.ec == std::errc() && second.ptr == end && fits(columns) && fits(rows);
-}
-
-std::optional<Color> ReadColor(std::string_view text) {
-  uint32_t value = 0;
-  if (text.starts_with('#')) text.remove_prefix(1);
-  const auto [end, error] = std::from_chars(text.data(), text.data() + text.size(), value, 16);
-  if (text.size() != 6 || error != std::errc() || end != text.data() + text.size())
-    return std::nullopt;
-  return (value & 0xFF) << 16 | (value & 0xFF00) | value >> 16;
-}
-
-int RunPages(const PageCommandOptions& options, PageCommand command,
-             const CommandContext& context) {
+int RunPages(const PageCommandOptions& options, PagePlan plan, const CommandContext& context) {
   if (const std::string wrong = OutputProblem(options); !wrong.empty())
     return UsageError(context, wrong);
   BatchJob job = NewBatchJob();
@@ -307,19 +259,11 @@ int RunPages(const PageCommandOptions& options, PageCommand command,
   if (!selection) return kExitUsage;
   job.destinationFolder = options.dest;
   job.naming.beside = false;
-  PageRunOptions& run = command.run;
-  run.reading.upright = settings.ExifAdjustOrientation != 0;
-  run.reading.read = job.read;
-  run.reading.brightness = options.brightness;
-  run.reading.contrast = options.contrast;
-  if (options.dpi > 0) run.dpi = options.dpi;
-  run.jobs = static_cast<uint32_t>(options.jobs);
-  run.copyrightHolder = settings.ExifCopyrightHolder.view();
-  if (run.title.empty()) {
-    run.title = options.out.empty() ? std::string("Fotomill")
-                                    : std::string(platform::SplitPath(options.out).base);
-  }
-  const int status = PageWriter(options, std::move(command), job, context).Run(*selection);
+  plan.run.reading.read = job.read;
+  plan.run.jobs = static_cast<uint32_t>(options.jobs);
+  plan.run.title = options.out.empty() ? std::string("Fotomill")
+                                       : std::string(platform::SplitPath(options.out).base);
+  const int status = PageWriter(options, std::move(plan), job, context).Run(*selection);
   const int kept = FinishBatch(job, context);
   return status != kExitOk ? status : kept;
 }
