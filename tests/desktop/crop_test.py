@@ -2,10 +2,9 @@
 """The Crop window of the real program: one picture, a whole selection, ratio and angle."""
 import struct
 
-from driven_desktop import Desktop, make_pictures, needs_manager, run
-from edit_test import applied
+from driven_desktop import needs_manager, run
+from edit_test import applied, browser_of
 
-SETTINGS = ["DestForceSourceDir=1", "DefaultFileExtension=png", "WarnDestinationWrite=0"]
 WIDTH, HEIGHT = 150, 112  # of the sample
 
 
@@ -14,22 +13,16 @@ def size_of(bmp):
 
 
 def open_crop(desktop, count):
-    desktop.wait(rf"lines={count} .*missing=0 listing=0")
-    desktop.focus("Fotomill Professional")
     desktop.key("ctrl+a", "shift+F4")
     desktop.wait(rf"crop-picture 1/{count} {WIDTH}x{HEIGHT}")
     desktop.focus("^Crop: ")
 
 
 def one_jpeg_without_loss(folder):
-    pictures = folder / "pictures"
-    make_pictures(pictures, ["a.jpg"])
-    picture = pictures / "a.jpg"
-    before = picture.read_bytes()
-    with Desktop(folder, pictures, settings=SETTINGS) as desktop:
+    with browser_of(folder, "a.jpg") as (desktop, pictures):
+        picture = pictures / "a.jpg"
+        before = picture.read_bytes()
         # From the view window, which then shows the new picture.
-        desktop.wait(r"lines=1 .*missing=0 listing=0")
-        desktop.focus("Fotomill Professional")
         desktop.key("Home", "ctrl+Return")
         desktop.wait(r"view-painted .*a.jpg")
         desktop.focus("View$")
@@ -53,10 +46,8 @@ def one_jpeg_without_loss(folder):
 
 
 def through_a_selection(folder):
-    pictures = folder / "pictures"
     names = ["a.bmp", "b.bmp", "c.bmp"]
-    make_pictures(pictures, names)
-    with Desktop(folder, pictures, settings=SETTINGS) as desktop:
+    with browser_of(folder, *names) as (desktop, pictures):
         open_crop(desktop, 3)
         desktop.key("ctrl+shift+Left")
         desktop.wait(rf"crop-area {WIDTH - 10}x{HEIGHT}\+0\+0")
@@ -81,12 +72,10 @@ def through_a_selection(folder):
 
 
 def pictures_that_cannot_be_read(folder):
-    pictures = folder / "pictures"
-    make_pictures(pictures, ["a.bmp", "b.bmp"])
-    damaged = pictures / "b.bmp"
-    damaged.write_bytes(damaged.read_bytes()[:40])
-    before = damaged.read_bytes()
-    with Desktop(folder, pictures, settings=SETTINGS) as desktop:
+    with browser_of(folder, "a.bmp", "b.bmp") as (desktop, pictures):
+        damaged = pictures / "b.bmp"
+        damaged.write_bytes(damaged.read_bytes()[:40])
+        before = damaged.read_bytes()
         open_crop(desktop, 2)
         desktop.key("ctrl+shift+Left")
         desktop.wait(rf"crop-area {WIDTH - 10}x{HEIGHT}\+0\+0")
@@ -107,9 +96,7 @@ def pictures_that_cannot_be_read(folder):
 
 @needs_manager
 def copies_with_ratio_and_angle(folder):
-    pictures = folder / "pictures"
-    make_pictures(pictures, ["a.bmp"])
-    with Desktop(folder, pictures, settings=SETTINGS) as desktop:
+    with browser_of(folder, "a.bmp") as (desktop, pictures):
         open_crop(desktop, 1)
         desktop.focus("^Crop properties$")
         desktop.key("alt+r", "ctrl+a")

@@ -1,10 +1,25 @@
 #!/usr/bin/env python3
 """The Edit window of the real program: steps with preview, saved as copies or into the files."""
+import contextlib
 import os
 import re
 import subprocess
 
 from driven_desktop import PROJECT, Desktop, make_pictures, run
+
+# Copies go beside their pictures, without questions.
+COPIES = ["DestForceSourceDir=1", "DefaultFileExtension=png", "WarnDestinationWrite=0"]
+
+
+@contextlib.contextmanager
+def browser_of(folder, *names, settings=COPIES):
+    """The program with these pictures listed, and their folder."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, names)
+    with Desktop(folder, pictures, settings=settings) as desktop:
+        desktop.wait(rf"lines={len(names)} .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        yield desktop, pictures
 
 
 def applied(picture, recipe, folder, extension):
@@ -35,11 +50,7 @@ def open_effects(desktop):
 
 
 def copies_are_those_of_the_command_line(folder):
-    pictures = folder / "pictures"
-    make_pictures(pictures, ["a.bmp", "b.bmp"])
-    with Desktop(folder, pictures, settings=["DestForceSourceDir=1", "DefaultFileExtension=png",
-                                             "WarnDestinationWrite=0"]) as desktop:
-        desktop.wait(r"lines=2 .*missing=0 listing=0")
+    with browser_of(folder, "a.bmp", "b.bmp") as (desktop, pictures):
         open_effects(desktop)
         # The slider goes up by tens; each key is a change.
         desktop.key("Page_Up")
@@ -75,11 +86,9 @@ def copies_are_those_of_the_command_line(folder):
 
 
 def files_change_and_come_back(folder):
-    pictures = folder / "pictures"
-    make_pictures(pictures, ["a.bmp", "b.jpg"])
-    before = {path.name: path.read_bytes() for path in pictures.iterdir()}
-    with Desktop(folder, pictures, settings=["CreateBackups=1"]) as desktop:
-        desktop.wait(r"lines=2 .*missing=0 listing=0")
+    with browser_of(folder, "a.bmp", "b.jpg",
+                    settings=["CreateBackups=1"]) as (desktop, pictures):
+        before = {path.name: path.read_bytes() for path in pictures.iterdir()}
         open_effects(desktop)
         desktop.key("Page_Up")
         steps = desktop.wait(r"edit-steps brightness \S+$").split(" ", 1)[1]
@@ -116,11 +125,7 @@ def files_change_and_come_back(folder):
 
 
 def recipes_are_saved_and_run(folder):
-    pictures = folder / "pictures"
-    make_pictures(pictures, ["a.bmp"])
-    with Desktop(folder, pictures, settings=["DestForceSourceDir=1", "DefaultFileExtension=png",
-                                             "WarnDestinationWrite=0"]) as desktop:
-        desktop.wait(r"lines=1 .*missing=0 listing=0")
+    with browser_of(folder, "a.bmp") as (desktop, pictures):
         open_effects(desktop)
         desktop.key("Page_Up", "ctrl+s")
         desktop.wait(r"prompt recipe-name")

@@ -8,7 +8,6 @@
 #include <numbers>
 #include <utility>
 
-#include "desktop/models/drawing/list_palette.h"
 #include "desktop/models/drawing/rgb_image.h"
 #include "desktop/windows/view/canvas_backdrop.h"
 #include "desktop/windows/widgets/bitmaps.h"
@@ -42,10 +41,7 @@ wxStockCursor CursorOf(CropGrip grip) {
 }  // namespace
 
 CropCanvas::CropCanvas(wxWindow* parent, CropArea& area, Events events)
-    : events_(std::move(events)), area_(area) {
-  SetBackgroundStyle(wxBG_STYLE_PAINT);
-  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxWANTS_CHARS | wxBORDER_NONE,
-         Label("Crop rectangle"));
+    : EditCanvas(parent, Label("Crop rectangle")), events_(std::move(events)), area_(area) {
   Bind(wxEVT_PAINT, &CropCanvas::OnPaint, this);
   Bind(wxEVT_SIZE, [this](wxSizeEvent&) {
     events_.resized();
@@ -63,21 +59,11 @@ wxSize CropCanvas::PaneSize() const {
   return {std::max(size.x, 1), std::max(size.y, 1)};
 }
 
-void CropCanvas::StartAfresh() {
-  shown_ = nullptr;
-  problem_.clear();
-  Refresh();
-}
+void CropCanvas::StartAfresh() { Take(nullptr); }
 
 void CropCanvas::Take(PreviewPointer preview) {
   shown_ = std::move(preview);
-  problem_.clear();
-  Refresh();
-}
-
-void CropCanvas::ShowProblem(const wxString& problem) {
-  problem_ = problem;
-  Refresh();
+  ShowProblem({});
 }
 
 void CropCanvas::SetLines(CropLines lines) {
@@ -214,14 +200,7 @@ void CropCanvas::OnPaint(wxPaintEvent&) {
   }
   dc.DrawBitmap(BitmapOf(pixels, scale), 0, 0);
   if (HasPicture()) PaintRectangle(dc);
-  if (!problem_.empty()) {
-    const auto part = [&](int shift) {
-      return static_cast<unsigned char>(static_cast<uint32_t>(backdrop.around) >> shift);
-    };
-    const Shade text = Readable({0, 0, 0}, {part(0), part(8), part(16)});
-    dc.SetTextForeground(wxColour(text.red, text.green, text.blue));
-    dc.DrawLabel(problem_, wxRect(GetClientSize()), wxALIGN_CENTER);
-  }
+  PaintProblem(dc);
 }
 
 void CropCanvas::PaintRectangle(wxDC& paintDc) const {

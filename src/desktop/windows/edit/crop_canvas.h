@@ -1,11 +1,10 @@
 #pragma once
 
-#include <wx/window.h>
-
 #include <functional>
 
 #include "desktop/models/edit/crop_area.h"
 #include "desktop/models/edit/preview_maker.h"
+#include "desktop/windows/edit/edit_canvas.h"
 
 namespace fotomill::desktop {
 
@@ -15,7 +14,7 @@ enum class CropLines { None, Thirds, Golden };
 // Shows a picture with its crop rectangle: dragged by its edges, corners and inside, or spanned
 // anew outside of it. Arrow keys move it by a pixel, with Shift by ten, with Ctrl its lower right
 // corner moves.
-class CropCanvas : public wxWindow {
+class CropCanvas : public EditCanvas {
  public:
   struct Events {
     std::function<void()> changed;                 // the rectangle
@@ -27,13 +26,11 @@ class CropCanvas : public wxWindow {
 
   void StartAfresh();  // another picture
   void Take(PreviewPointer preview);
-  bool HasPicture() const { return shown_ != nullptr && problem_.empty(); }
-  void ShowProblem(const wxString& problem);  // instead of the picture
+  bool HasPicture() const { return shown_ != nullptr && Problem().empty(); }
   void SetLines(CropLines lines);
   void SetFixedSize(bool fixed) { fixed_ = fixed; }  // the rectangle can only be moved
   void DrawLevel(bool draw);                         // the next drag draws a line along the horizon
-  // Zoom and position of the picture, which always fits the pane.
-  wxSize PaneSize() const;  // device pixels
+  wxSize PaneSize() const;                           // device pixels, which the picture fits
 
  private:
   void OnPaint(wxPaintEvent&);
@@ -51,7 +48,6 @@ class CropCanvas : public wxWindow {
   const Events events_;
   CropArea& area_;
   PreviewPointer shown_;
-  wxString problem_;
   CropLines lines_ = CropLines::Thirds;
   bool fixed_ = false, drawsLevel_ = false;
   CropGrip grip_ = CropGrip::None;

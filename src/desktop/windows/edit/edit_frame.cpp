@@ -2,30 +2,28 @@
 
 #include <wx/button.h>
 #include <wx/choice.h>
-#include <wx/menu.h>
 #include <wx/msgdlg.h>
 #include <wx/panel.h>
 #include <wx/sizer.h>
 #include <wx/splitter.h>
 #include <wx/stattext.h>
-#include <wx/textdlg.h>
-#include <wx/treectrl.h>
 
 #include <algorithm>
 #include <cmath>
-#include <map>
+#include <utility>
 
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/edit/edit_commands.h"
 #include "desktop/windows/edit/histogram_panel.h"
+#include "desktop/windows/edit/operation_tree.h"
 #include "desktop/windows/edit/parameter_panel.h"
 #include "desktop/windows/edit/picture_strip.h"
+#include "desktop/windows/edit/preset_button.h"
 #include "desktop/windows/edit/step_box.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/screen_reader.h"
 #include "desktop/windows/widgets/wx_text.h"
-#include "operations/operations.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
 #include "texts/texts.h"
@@ -36,18 +34,6 @@ namespace {
 
 constexpr int kSideWidth = 350;
 constexpr int kOriginalKey = 'O';  // shows the original while held
-
-// In the order of Family.
-constexpr const char* kFamilies[] = {TrLater("Crop"),   TrLater("Transform"), TrLater("Effects"),
-                                     TrLater("Filter"), TrLater("Annotate"),  TrLater("Watermark"),
-                                     TrLater("Matt")};
-
-// The operation of a row of the tree.
-class OperationItem : public wxTreeItemData {
- public:
-  explicit OperationItem(const Operation& row) : operation(row) {}
-  const Operation& operation;
-};
 
 wxString TitleOf(const std::vector<std::string>& files) {
   if (files.size() == 1) return Label("Edit: %1", Shown(platform::FileNameOf(files.front())));
@@ -75,14 +61,14 @@ EditFrame::EditFrame(Shell& shell, const std::vector<std::string>& files, const 
   auto* splitter = new wxSplitterWindow(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize,
                                         wxSP_LIVE_UPDATE | wxSP_NOBORDER);
   splitter->SetMinimumPaneSize(FromDIP(220));
-  splitter->SplitVertically(BuildSide(splitter), BuildPreview(splitter), FromDIP(kSideWidth));
+  splitter->SplitVertically(BuildSide(splitter, first), BuildPreview(splitter),
+                            FromDIP(kSideWidth));
   column->Add(splitter, wxSizerFlags(1).Expand());
   column->Add(BuildButtons(panel), wxSizerFlags().Expand().Border(wxALL, FromDIP(8)));
   panel->SetSizer(column);
   CreateStatusBar();
   SetMenuBar(NewEditMenu(*this));
   BindKeys();
-  FillOperations(first);
   if (settings.MaximizeViewWindow != 0) Maximize();
   Bind(wxEVT_CLOSE_WINDOW, &EditFrame::OnClose, this);
   ShowPicture(0);
@@ -94,7 +80,7 @@ EditFrame::~EditFrame() { maker_.reset(); }  // its threads call back into this 
 
 // --- building ---
 
-wxWindow* EditFrame::BuildSide(wxWindow* parent) {
+wxWindow* EditFrame::BuildSide(wxWindow* parent, const Operation* first) {
   auto* panel = new wxPanel(parent);
   const int gap = FromDIP(8);
   auto* split = new wxSplitterWindow(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize,
@@ -109,8 +95,10 @@ wxWindow* EditFrame::BuildSide(wxWindow* parent) {
   auto* title = new wxBoxSizer(wxHORIZONTAL);
   valuesTitle_ = NewHeading(lower, "");
   title->Add(valuesTitle_, wxSizerFlags(1).CenterVertical());
-  presets_ = new wxButton(lower, wxID_ANY, Label("&Presets"));
-  presets_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ShowPresets(); });
+  presets_ = new PresetButton(lower, memory_, [this](Step step) {
+    steps_.SetCurrent(std::move(step));
+    StepsChanged();
+  });
   title->Add(presets_, wxSizerFlags().CenterVertical());
   rows->Add(title, wxSizerFlags().Expand().Border(wxTOP, gap));
   values_ = new ParameterPanel(
@@ -122,22 +110,18 @@ wxWindow* EditFrame::BuildSide(wxWindow* parent) {
   rows->Add(histogram_, wxSizerFlags().Expand().Border(wxTOP, gap));
   lower->SetSizer(rows);
   split->SetMinimumPaneSize(FromDIP(100));
-  split->SplitHorizontally(BuildOperations(split), lower, FromDIP(190));
+  split->SplitHorizontally(BuildOperations(split, first), lower, FromDIP(190));
   auto* column = new wxBoxSizer(wxVERTICAL);
   column->Add(split, wxSizerFlags(1).Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
   panel->SetSizer(column);
   return panel;
 }
 
-wxWindow* EditFrame::BuildOperations(wxWindow* parent) {
+wxWindow* EditFrame::BuildOperations(wxWindow* parent, const Operation* first) {
   auto* panel = new wxPanel(parent);
   auto* rows = new wxBoxSizer(wxVERTICAL);
   rows->Add(NewHeading(panel, Label("Operations")));
-  operations_ = new wxTreeCtrl(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize,
-                               wxTR_HIDE_ROOT | wxTR_HAS_BUTTONS | wxTR_SINGLE | wxTR_NO_LINES);
-  operations_->SetName(Label("Operations"));
-  operations_->SetToolTip(Label("Enter or a double click adds a step."));
-  operations_->Bind(wxEVT_TREE_ITEM_ACTIVATED, [this](wxTreeEvent&) { AddChosen(); });
+  operations_ = new OperationTree(panel, first, [this] { AddChosen(); });
   rows->Add(operations_, wxSizerFlags(1).Expand().Border(wxTOP, FromDIP(4)));
   auto* add = new wxButton(panel, wxID_ANY, Label("&Add step"));
   add->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { AddChosen(); });
@@ -164,13 +148,11 @@ wxWindow* EditFrame::BuildPreview(wxWindow* parent) {
   auto* panel = new wxPanel(parent);
   auto* rows = new wxBoxSizer(wxVERTICAL);
   rows->Add(BuildPreviewBar(panel), wxSizerFlags().Expand().Border(wxALL, FromDIP(6)));
-  canvas_ = new PreviewCanvas(panel, {.placed =
-                                          [this] {
-                                            ++viewNumber_;
-                                            originalCame_ = false;
-                                            RequestPreview();
-                                          },
-                                      .painted = [] {}});
+  canvas_ = new PreviewCanvas(panel, [this] {
+    ++viewNumber_;
+    originalCame_ = false;
+    RequestPreview();
+  });
   rows->Add(canvas_, wxSizerFlags(1).Expand());
   if (files_.size() > 1) {
     strip_ = new PictureStrip(panel, files_, [this](size_t place) { ShowPicture(place); });
@@ -210,8 +192,7 @@ wxSizer* EditFrame::BuildPreviewBar(wxWindow* parent) {
   auto* fit = new wxButton(parent, wxID_ANY, Label("Fi&t"));
   fit->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { canvas_->SetZoom(ZoomMode::Fit); });
   bar->Add(fit, apart);
-  auto* actual =
-      new wxButton(parent, wxID_ANY, "&100%");
+  auto* actual = new wxButton(parent, wxID_ANY, "&100%");
   actual->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { canvas_->ZoomActual(); });
   bar->Add(actual, wxSizerFlags().CenterVertical());
   return bar;
@@ -246,33 +227,13 @@ void EditFrame::BindKeys() {
   });
 }
 
-void EditFrame::FillOperations(const Operation* chosen) {
-  const wxTreeItemId root = operations_->AddRoot("");
-  std::map<Family, wxTreeItemId> families;
-  for (const Operation* operation : Operations()) {
-    wxTreeItemId& family = families[operation->family];
-    if (!family.IsOk())
-      family = operations_->AppendItem(root, Label(kFamilies[static_cast<int>(operation->family)]));
-    const wxTreeItemId item = operations_->AppendItem(family, Label(operation->label), -1, -1,
-                                                      new OperationItem(*operation));
-    if (operation == chosen) {
-      operations_->Expand(family);
-      operations_->SelectItem(item);
-      operations_->EnsureVisible(family);
-      operations_->EnsureVisible(item);
-    }
-  }
-}
-
 // --- steps ---
 
 void EditFrame::AddChosen() {
-  const wxTreeItemId item = operations_->GetSelection();
-  if (!item.IsOk()) return;
-  const auto* data = dynamic_cast<OperationItem*>(operations_->GetItemData(item));
-  if (data == nullptr) return operations_->Toggle(item);
-  steps_.Add(memory_.Start(data->operation));
-  (void)memory_.KeepChosen(data->operation);
+  const Operation* const operation = operations_->TakeChosen();
+  if (operation == nullptr) return;
+  steps_.Add(memory_.Start(*operation));
+  (void)memory_.KeepChosen(*operation);
   changed_ = true;
   StepsChanged();
 }
@@ -308,7 +269,7 @@ void EditFrame::StepsChanged() {
   const Step* const step = steps_.CurrentStep();
   valuesTitle_->SetLabel(step == nullptr ? wxString() : Label(step->operation->label));
   valuesTitle_->SetToolTip(step == nullptr ? wxString() : Label(step->operation->help));
-  presets_->Enable(step != nullptr);
+  presets_->SetStep(step);
   UpdateControls();
   std::string text = steps_.RecipeText();
   if (text == lastText_) return;
@@ -319,49 +280,6 @@ void EditFrame::StepsChanged() {
   changed_ = steps_.CanUndo();
   ++stepsNumber_;
   RequestPreview();
-}
-
-void EditFrame::ShowPresets() {
-  const Step* const step = steps_.CurrentStep();
-  if (step == nullptr) return;
-  const std::vector<Preset> presets = memory_.PresetsOf(*step->operation);
-  wxMenu menu;
-  int id = wxID_HIGHEST + 1;
-  const auto add = [&](wxMenu& to, const wxString& text, std::function<void()> run) {
-    to.Append(++id, text);
-    to.Bind(
-        wxEVT_MENU, [run = std::move(run)](wxCommandEvent&) { run(); }, id);
-  };
-  add(menu, Label("&Defaults"), [this, step] {
-    steps_.SetCurrent(FirstStep(*step->operation));
-    StepsChanged();
-  });
-  if (!presets.empty()) menu.AppendSeparator();
-  for (const Preset& preset : presets)
-    add(menu, wxControl::EscapeMnemonics(Shown(preset.name)), [this, preset] {
-      steps_.SetCurrent(preset.step);
-      StepsChanged();
-    });
-  menu.AppendSeparator();
-  add(menu, Label("&Save as preset..."), [this] { SavePreset(); });
-  if (!presets.empty()) {
-    auto* removals = new wxMenu;
-    for (const Preset& preset : presets)
-      add(*removals, wxControl::EscapeMnemonics(Shown(preset.name)),
-          [this, name = preset.name, operation = step->operation] {
-            (void)memory_.RemovePreset(name, *operation);
-          });
-    menu.AppendSubMenu(removals, Label("&Remove"));
-  }
-  presets_->PopupMenu(&menu, 0, presets_->GetSize().y);
-}
-
-void EditFrame::SavePreset() {
-  wxTextEntryDialog dialog(this, Label("Name of the preset:"), Label("Save preset"));
-  if (dialog.ShowModal() != wxID_OK || dialog.GetValue().empty()) return;
-  if (!memory_.KeepPreset(Utf8(dialog.GetValue()), *steps_.CurrentStep()))
-    wxMessageBox(Label("The preset could not be saved."), Label("Save preset"),
-                 wxOK | wxICON_WARNING, this);
 }
 
 // --- preview ---
@@ -416,7 +334,6 @@ void EditFrame::PreviewsCame() {
       continue;
     }
     if (preview->view == viewNumber_ && preview->original && preview->exact) originalCame_ = true;
-    if (!preview->original && !preview->exact) previewSeconds_ = preview->seconds;
     if (!preview->original && preview->exact) exactCame_ = true;
     canvas_->Take(preview);
     const PreviewPointer& result = canvas_->Result();

@@ -15,14 +15,14 @@
 class wxButton;
 class wxChoice;
 class wxStaticText;
-class wxTreeCtrl;
-class wxTreeEvent;
 
 namespace fotomill::desktop {
 
 class HistogramPanel;
+class OperationTree;
 class ParameterPanel;
 class PictureStrip;
+class PresetButton;
 class Shell;
 class StepBox;
 
@@ -54,16 +54,13 @@ class EditFrame : public wxFrame, public HoldsWork {
   void LoadRecipe(const std::string& name, const std::string& text);
 
  private:
-  wxWindow* BuildSide(wxWindow* parent);
-  wxWindow* BuildOperations(wxWindow* parent);
+  wxWindow* BuildSide(wxWindow* parent, const Operation* first);
+  wxWindow* BuildOperations(wxWindow* parent, const Operation* first);
   wxSizer* BuildStepButtons(wxWindow* parent);
   wxWindow* BuildPreview(wxWindow* parent);
   wxSizer* BuildPreviewBar(wxWindow* parent);
   wxSizer* BuildButtons(wxWindow* parent);
   void BindKeys();
-  void FillOperations(const Operation* chosen);
-  void ShowPresets();  // menu of the presets of the current operation
-  void SavePreset();
   void StepsChanged();  // the list or its selection
   RecordedText ChangeValue(const char* parameter, const std::string& text);
   void RequestPreview();
@@ -86,20 +83,18 @@ class EditFrame : public wxFrame, public HoldsWork {
   bool originalCame_ = false;  // for the current view
   bool exactCame_ = false;     // for the current steps and view
   bool changed_ = false;       // steps were changed and not applied
-  double previewSeconds_ = 0;  // of the last quick preview
-  wxTreeCtrl* operations_ = nullptr;
+  OperationTree* operations_ = nullptr;
   StepBox* stepBox_ = nullptr;
   wxButton *up_ = nullptr, *down_ = nullptr, *remove_ = nullptr;
-  wxStaticText* valuesTitle_ = nullptr;
-  wxButton* presets_ = nullptr;
+  wxStaticText* valuesTitle_ = nullptr;  // the current operation
+  PresetButton* presets_ = nullptr;
   ParameterPanel* values_ = nullptr;
   HistogramPanel* histogram_ = nullptr;
   PreviewCanvas* canvas_ = nullptr;
   wxChoice* mode_ = nullptr;
   wxStaticText* zoom_ = nullptr;
   PictureStrip* strip_ = nullptr;  // null for a single picture
-  wxButton* copies_ = nullptr;
-  wxButton* change_ = nullptr;
+  wxButton *copies_ = nullptr, *change_ = nullptr;
   std::unique_ptr<PreviewMaker> maker_;
 };
 

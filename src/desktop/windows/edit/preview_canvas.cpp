@@ -25,10 +25,8 @@ bool IsWhole(const Preview& preview) {
 
 }  // namespace
 
-PreviewCanvas::PreviewCanvas(wxWindow* parent, Events events) : events_(std::move(events)) {
-  SetBackgroundStyle(wxBG_STYLE_PAINT);
-  Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxWANTS_CHARS | wxBORDER_NONE,
-         Label("Preview"));
+PreviewCanvas::PreviewCanvas(wxWindow* parent, std::function<void()> placed)
+    : EditCanvas(parent, Label("Preview")), placed_(std::move(placed)) {
   Bind(wxEVT_PAINT, &PreviewCanvas::OnPaint, this);
   Bind(wxEVT_SIZE, [this](wxSizeEvent&) { Placed(); });
   Bind(wxEVT_MOUSEWHEEL, &PreviewCanvas::OnWheel, this);
@@ -45,9 +43,8 @@ wxSize PreviewCanvas::PaneSize() const {
 
 void PreviewCanvas::StartAfresh() {
   before_ = after_ = {};
-  problem_.clear();
   transform_.SetMode(ZoomMode::Fit);
-  Refresh();
+  ShowProblem({});
 }
 
 void PreviewCanvas::Take(PreviewPointer preview) {
@@ -63,13 +60,7 @@ void PreviewCanvas::Take(PreviewPointer preview) {
   }
   const PreviewPointer& newest = after_.part != nullptr ? after_.part : after_.whole;
   if (newest != nullptr) transform_.SetPicture(newest->whole.width, newest->whole.height);
-  problem_.clear();
-  Refresh();
-}
-
-void PreviewCanvas::ShowProblem(const wxString& problem) {
-  problem_ = problem;
-  Refresh();
+  ShowProblem({});
 }
 
 void PreviewCanvas::SetMode(PreviewMode mode) {
@@ -79,7 +70,7 @@ void PreviewCanvas::SetMode(PreviewMode mode) {
 
 void PreviewCanvas::ShowOriginal(bool show) {
   if (std::exchange(original_, show) == show) return;
-  if (show && before_.whole == nullptr) events_.placed();
+  if (show && before_.whole == nullptr) placed_();
   Refresh();
 }
 
@@ -88,7 +79,7 @@ void PreviewCanvas::ShowOriginal(bool show) {
 void PreviewCanvas::Placed() {
   const wxSize pane = PaneSize();
   transform_.SetWindow(pane.x, pane.y);
-  events_.placed();
+  placed_();
   Refresh();
 }
 
@@ -214,17 +205,7 @@ void PreviewCanvas::OnPaint(wxPaintEvent&) {
     dc.DrawBitmap(BitmapOf(original_ ? before : after, scale), 0, 0);
   }
   if (split) PaintDivider(dc);
-  if (!problem_.empty()) {
-    const wxRect all(GetClientSize());
-    dc.SetTextForeground(*wxWHITE);
-    dc.SetBrush(wxBrush(wxColour(0, 0, 0, 170)));
-    dc.SetPen(*wxTRANSPARENT_PEN);
-    const wxSize extent = dc.GetMultiLineTextExtent(problem_) + FromDIP(wxSize(24, 14));
-    const wxRect box = wxRect(extent).CentreIn(all);
-    dc.DrawRoundedRectangle(box, FromDIP(6));
-    dc.DrawLabel(problem_, box, wxALIGN_CENTER);
-  }
-  events_.painted();
+  PaintProblem(dc);
 }
 
 void PreviewCanvas::PaintDivider(wxDC& dc) const {

@@ -1,12 +1,11 @@
 #pragma once
 
-#include <wx/window.h>
-
 #include <functional>
 
 #include "desktop/models/drawing/rgb_image.h"
 #include "desktop/models/edit/preview_maker.h"
 #include "desktop/models/view/view_drawing.h"
+#include "desktop/windows/edit/edit_canvas.h"
 
 namespace fotomill::desktop {
 
@@ -15,17 +14,13 @@ enum class PreviewMode { After, Split, Sides };
 
 // Shows previews: zoomed with wheel and double click, moved by dragging. In split mode, a line that
 // can be dragged separates the original on its left from the result.
-class PreviewCanvas : public wxWindow {
+class PreviewCanvas : public EditCanvas {
  public:
-  struct Events {
-    std::function<void()> placed;   // another zoom, position or size: request previews
-    std::function<void()> painted;  // a result
-  };
-  PreviewCanvas(wxWindow* parent, Events events);
+  // `placed` is called after another zoom, position or size, to request previews.
+  PreviewCanvas(wxWindow* parent, std::function<void()> placed);
 
   void StartAfresh();  // another picture
   void Take(PreviewPointer preview);
-  void ShowProblem(const wxString& problem);  // instead of the result; empty: none
   void SetMode(PreviewMode mode);
   PreviewMode Mode() const { return mode_; }
   void ShowOriginal(bool show);  // while a key or button is held
@@ -55,7 +50,7 @@ class PreviewCanvas : public wxWindow {
   void Placed();
   double DeviceScale() const { return GetContentScaleFactor(); }
 
-  const Events events_;
+  const std::function<void()> placed_;
   Layers before_, after_;
   ViewTransform transform_;  // of the result in its pane
   PreviewMode mode_ = PreviewMode::After;
@@ -63,7 +58,6 @@ class PreviewCanvas : public wxWindow {
   double split_ = 0.5;  // position of the line, a fraction of the width
   bool movesSplit_ = false;
   wxPoint drag_;
-  wxString problem_;
 };
 
 }  // namespace fotomill::desktop
