@@ -384,6 +384,24 @@ def sizes_and_groups(folder):
     assert "BrowserGrouping=2\n" in text, text
 
 
+def menu_of_empty_space(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.bmp"])
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"browser .*lines=2 .*listing=0")
+        window = desktop.focus("Fotomill Professional")
+        desktop.xdotool("mousemove", "--window", window, 900, 600)
+        for keys in (("Up", "Right", "Down", "Down", "Return"), ("Up", "Right", "Up", "Return")):
+            desktop.xdotool("click", 3)
+            desktop.wait(r"folder-commands")
+            desktop.settle()
+            desktop.key(*keys)
+            desktop.settle()
+        # Sorted by size, in descending order.
+        desktop.key("Home")
+        desktop.wait(r"browser .*sort=2 .*focus=b.bmp")
+
+
 def later_starts(folder):
     pictures, other = folder / "pictures", folder / "other"
     make_pictures(pictures, NAMES)
@@ -519,4 +537,4 @@ def rate_in_the_view_window(desktop, picture):
 
 
 run(open_select_view, rate_and_label, side_pane, view_window, sizes_and_groups, compare,
-    play_animation, later_starts)
+    play_animation, menu_of_empty_space, later_starts)

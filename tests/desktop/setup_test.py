@@ -155,4 +155,36 @@ def plugin_options(folder):
         assert "[Plugins]\nFMWPL_avif.so." in text, text
 
 
-run(setup_round_trip, info_exif_history, previous_version, plugin_options)
+def keys_of_commands(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp"])
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"browser .*lines=1 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+comma")
+        desktop.wait(r"setup page=Browsing")
+        desktop.focus("Setup")
+        desktop.wait(r"setup list has the keyboard")
+        desktop.key("End")
+        desktop.wait(r"setup page=Keyboard")
+        # The first command is Open. A letter alone is for searching, and a key may be taken. Tab
+        # leaves the field, which takes all other keys.
+        desktop.key("Tab", "Tab", "x", "ctrl+c")
+        desktop.wait(r"setup-key X$")
+        desktop.wait(r"setup-key Ctrl\+C conflict=Edit/Copy")
+        desktop.screenshot("keys")
+        desktop.key("F12")
+        desktop.wait(r"setup-key F12$")
+        desktop.key("Tab", "space", "alt+a")
+        desktop.wait(r"setup applied changed=1")
+        desktop.key("Escape")
+        desktop.wait(r"setup closed")
+        assert (desktop.data / "MyKeys.txt").read_text() == "File/Open=F12\n"
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+o", "F12")
+        desktop.wait(r"prompt open")
+        assert desktop.log_text().count("prompt open") == 1
+
+
+run(setup_round_trip, info_exif_history, previous_version, plugin_options,
+    keys_of_commands)

@@ -232,7 +232,7 @@ constexpr const char* kTitles[] = {
     TrLater("Browsing"), TrLater("Thumbnails"), TrLater("Viewing"), TrLater("Batches"),
     TrLater("Saving"), TrLater("Format options"), TrLater("File names"), TrLater("Colors"),
     TrLater("Captions and mattes"), TrLater("EXIF and info"), TrLater("Archives"),
-    TrLater("File history"), TrLater("Formats")};
+    TrLater("File history"), TrLater("Formats"), TrLater("Keyboard")};
 static_assert(std::size(kTitles) == kSetupPageCount);
 
 consteval bool EveryItemIsShownOnce() {

@@ -23,9 +23,10 @@ enum class SetupPage {
   Metadata,
   Archives,
   History,
-  Formats
+  Formats,
+  Keyboard  // has no settings but the keys of commands
 };
-inline constexpr size_t kSetupPageCount = 13;
+inline constexpr size_t kSetupPageCount = 14;
 // Title of a page, in English.
 const char* TitleOf(SetupPage page);
 

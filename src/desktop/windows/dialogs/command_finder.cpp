@@ -21,7 +21,7 @@ namespace {
 wxString LineOf(const Command& command) {
   wxString line = wxControl::RemoveMnemonics(Label(command.menu)) + ": " +
                   wxControl::RemoveMnemonics(Label(command.text));
-  if (*command.accelerator != '\0') line += wxString("    ") + command.accelerator;
+  if (const std::string key = KeyOf(command); !key.empty()) line += "    " + Shown(key);
   return line;
 }
 

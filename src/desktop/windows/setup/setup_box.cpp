@@ -20,6 +20,7 @@
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/setup/format_list.h"
+#include "desktop/windows/setup/keys_panel.h"
 #include "desktop/windows/setup/language_panel.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/looks.h"
@@ -67,7 +68,8 @@ bool ReadSettings(wxWindow& window, const BoundControls& controls,
 
 }  // namespace
 
-SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage first)
+SetupBox::SetupBox(wxWindow* parent, std::vector<KeyedCommand> commands,
+                   std::function<void()> applied, SetupPage first)
     : wxDialog(parent, wxID_ANY, Label(kSetupTitle), wxDefaultPosition, wxDefaultSize,
                wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "SetupBox"),
       applied_(std::move(applied)),
@@ -88,7 +90,7 @@ SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage fi
   left->Add(list_, wxSizerFlags(1).Expand().Border(wxTOP, gap));
   auto* right = new wxBoxSizer(wxVERTICAL);
   right->Add(title_, wxSizerFlags().Border(wxLEFT, FromDIP(8)));
-  BuildPages(*right);
+  BuildPages(*right, std::move(commands));
   auto* middle = new wxBoxSizer(wxHORIZONTAL);
   middle->Add(left, wxSizerFlags().Expand().Border(wxALL, gap));
   middle->Add(right, wxSizerFlags(1).Expand().Border(wxTOP | wxRIGHT | wxBOTTOM, gap));
@@ -130,7 +132,7 @@ SetupBox::SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage fi
 
 // One panel below the other, of which one at a time is shown. (A wxSimplebook takes the keyboard
 // from the search field when it turns a page.)
-void SetupBox::BuildPages(wxSizer& column) {
+void SetupBox::BuildPages(wxSizer& column, std::vector<KeyedCommand> commands) {
   for (size_t page = 0; page < kSetupPageCount; ++page) {
     std::function<wxWindow*(wxWindow*)> above;
     if (static_cast<SetupPage>(page) == SetupPage::Formats) {
@@ -139,6 +141,11 @@ void SetupBox::BuildPages(wxSizer& column) {
     if (static_cast<SetupPage>(page) == SetupPage::Browsing) {
       above = [this](wxWindow* parent) -> wxWindow* {
         return language_ = new LanguagePanel(parent);
+      };
+    }
+    if (static_cast<SetupPage>(page) == SetupPage::Keyboard) {
+      above = [this, &commands](wxWindow* parent) -> wxWindow* {
+        return keys_ = new KeysPanel(parent, std::move(commands));
       };
     }
     auto* panel = new SettingsPanel(
@@ -252,12 +259,14 @@ bool SetupBox::Apply() {
   };
   if (!ReadSettings(*this, controls_, show, changed)) return false;
   language_->Store();
+  changed = keys_->Store() || changed;
   if (TakeSetupChanged() || changed) applied_();
   LogEvent("setup", changed ? "applied changed=1" : "applied changed=0");
   return true;
 }
 
 void SetupBox::ResetPage() {
+  if (page_ == SetupPage::Keyboard) keys_->Reset();
   FillSetupDialog(controls_, destinations_, Panel().Rows(), SetupValues::Default);
   for (const SetupItem& item : Panel().Items()) NoteControlChanged(KeyOf(item.key).control);
   ControlChanged();

@@ -5,6 +5,7 @@
 #include <functional>
 #include <vector>
 
+#include "desktop/models/shell/key_map.h"
 #include "desktop/windows/setup/language_panel.h"
 #include "desktop/windows/setup/settings_panel.h"
 
@@ -14,15 +15,19 @@ class wxStaticText;
 
 namespace fotomill::desktop {
 
+class KeysPanel;
+
 // All settings: list of pages on the left, search
 // field above, controls of one page on the right.
 class SetupBox : public wxDialog {
  public:
   // `applied` is called after settings have been changed and saved.
-  SetupBox(wxWindow* parent, std::function<void()> applied, SetupPage first = SetupPage::Browsing);
+  // `commands` are those whose keys can be changed.
+  SetupBox(wxWindow* parent, std::vector<KeyedCommand> commands, std::function<void()> applied,
+           SetupPage first = SetupPage::Browsing);
 
  private:
-  void BuildPages(wxSizer& column);
+  void BuildPages(wxSizer& column, std::vector<KeyedCommand> commands);
   wxSizer* BuildButtons();
   void ShowPages();             // fills the list: all pages, or search results
   void ChooseLine(bool focus);  // shows the selected item
@@ -41,6 +46,7 @@ class SetupBox : public wxDialog {
   RegistryDestinations destinations_;
   std::vector<SettingsPanel*> panels_;
   LanguagePanel* language_ = nullptr;
+  KeysPanel* keys_ = nullptr;
   std::vector<SetupItem> found_;  // list contents during a search
   bool searching_ = false;
   SetupPage page_;

@@ -291,7 +291,7 @@ void BrowserTabs::ViewFile(const std::string& path) {
 }
 
 void BrowserTabs::ShowContextMenu(wxWindow& window, const wxPoint& place, bool onFile) {
-  if (onFile) menus_.ShowContextMenu(window, place);
+  onFile ? menus_.ShowContextMenu(window, place) : menus_.ShowFolderMenu(window, place);
 }
 
 void BrowserTabs::RenameFile(const std::string& path, const std::string& name) {

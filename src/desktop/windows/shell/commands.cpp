@@ -1,5 +1,7 @@
 #include "desktop/windows/shell/commands.h"
 
+#include <wx/control.h>
+
 #include "core/choice_lists.h"
 #include "desktop/windows/archive/archive_frame.h"
 #include "desktop/windows/batch/batch_runner.h"
@@ -22,6 +24,7 @@
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/shell/side_pane.h"
 #include "desktop/windows/shell/tool_windows.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -53,12 +56,19 @@ void ThumbnailsFrom(Shell& shell) {
   if (BrowserPage* browser = shell.Tabs().Front()) browser->SetThumbnailMode(mode);
 }
 
-// Sorts by a mode; if it is already set, reverses the order.
+// Sorts by a mode, in ascending order; keeps the order if that mode is already set.
 template <int32_t sort>
 void SortBy(Shell& shell) {
   BrowserPage* browser = shell.Tabs().Front();
-  if (browser == nullptr) return;
-  browser->SetSort(sort, browser->Model().Modes().sort == sort && !browser->Model().Descending());
+  if (browser != nullptr && browser->Model().Modes().sort != sort) browser->SetSort(sort, false);
+}
+void ReverseOrder(Shell& shell) {
+  if (BrowserPage* browser = shell.Tabs().Front())
+    browser->SetSort(browser->Model().Modes().sort, !browser->Model().Descending());
+}
+bool IsReversed(Shell& shell) {
+  const BrowserPage* browser = shell.Tabs().Front();
+  return browser != nullptr && browser->Model().Descending();
 }
 
 template <DateGrouping grouping>
@@ -184,16 +194,16 @@ constexpr Command kCommands[] = {
     {kFile, TrLater("&Save tabs as..."),     "",             TrLater("Saves the open tabs under a name."), Needs::Nothing, SaveTabSet},
     {kFile, TrLater("T&ab sets..."),         "",             TrLater("Opens a saved set of tabs."), Needs::Nothing, OpenTabSet},
     {kFile, nullptr},
-    {kFile, TrLater("New &folder..."),      "Ctrl+Shift+N", TrLater("Creates a folder in this folder."), Needs::Nothing, NewFolder},
+    {kFile, TrLater("New &folder..."),      "Ctrl+Shift+N", TrLater("Creates a folder in this folder."), Needs::Nothing, NewFolder, nullptr, false, nullptr, nullptr, false, FolderPlace::Top},
     {kFile, nullptr},
     {kFile, TrLater("&Quit"),               "Ctrl+Q",       TrLater("Quits the program."), Needs::Nothing, Quit},
 
     {kEdit, TrLater("&Undo"),               "Ctrl+Z",       TrLater("Undoes the last file operation."), Needs::Undo, OfFiles<&FileActions::Undo>},
     {kEdit, TrLater("Re&do"),               "Ctrl+Y",       TrLater("Redoes the last undone file operation."), Needs::Redo, OfFiles<&FileActions::Redo>},
     {kEdit, nullptr},
-    {kEdit, TrLater("Cu&t"),                "Ctrl+X",       TrLater("Cuts the selected files to the clipboard."), Needs::Item, Cut},
+    {kEdit, TrLater("Cu&t"),                "Ctrl+X",       TrLater("Cuts the selected files to the clipboard."), Needs::Item, Cut, nullptr, true},
     {kEdit, TrLater("&Copy"),               "Ctrl+C",       TrLater("Copies the selected files to the clipboard."), Needs::Item, Copy, nullptr, true},
-    {kEdit, TrLater("&Paste"),              "Ctrl+V",       TrLater("Pastes files from the clipboard into this folder; a picture is saved as a file."), Needs::Nothing, Paste},
+    {kEdit, TrLater("&Paste"),              "Ctrl+V",       TrLater("Pastes files from the clipboard into this folder; a picture is saved as a file."), Needs::Nothing, Paste, nullptr, false, nullptr, nullptr, false, FolderPlace::Top},
     {kEdit, TrLater("Copy pat&hs"),         "Ctrl+Shift+C", TrLater("Copies the paths of the selected files as text."), Needs::Item, CopyPaths, nullptr, true},
     {kEdit, nullptr},
     {kEdit, TrLater("&Rename..."),          "F2",           TrLater("Renames the focused file."), Needs::Item, OfBrowser<&BrowserPage::EditFocusedName>, nullptr, true},
@@ -207,36 +217,37 @@ constexpr Command kCommands[] = {
     {kEdit, TrLater("Find pictur&es..."),   "Ctrl+Shift+F", TrLater("Finds pictures in folders by name, keywords, date and more."), Needs::Nothing, ShowSearch},
     {kEdit, TrLater("&Filter"),             "Ctrl+F",       TrLater("Shows only files whose names match."), Needs::Nothing, OfBrowser<&BrowserPage::EditFilter>},
 
-    {kView, TrLater("&List"),               "Ctrl+1",       TrLater("Shows names only."), Needs::Nothing, ShowAs<choice::kViewList>, nullptr, false, Has<&BrowserModes::view, choice::kViewList>},
-    {kView, TrLater("&Details"),            "Ctrl+2",       TrLater("Shows names with type, size, date and dimensions."), Needs::Nothing, ShowAs<choice::kViewDetails>, nullptr, false, Has<&BrowserModes::view, choice::kViewDetails>},
-    {kView, TrLater("&Small thumbnails"),   "Ctrl+3",       TrLater("Shows small thumbnails."), Needs::Nothing, ShowAs<choice::kViewSmall>, nullptr, false, Has<&BrowserModes::view, choice::kViewSmall>},
-    {kView, TrLater("&Normal thumbnails"),  "Ctrl+4",       TrLater("Shows thumbnails of 96 pixels."), Needs::Nothing, ShowAs<choice::kViewNormal>, nullptr, false, Has<&BrowserModes::view, choice::kViewNormal>},
-    {kView, TrLater("Lar&ge thumbnails"),   "Ctrl+5",       TrLater("Shows thumbnails of 176 pixels."), Needs::Nothing, ShowAs<choice::kViewLarge>, nullptr, false, Has<&BrowserModes::view, choice::kViewLarge>},
+    {kView, TrLater("&List"),               "Ctrl+1",       TrLater("Shows names only."), Needs::Nothing, ShowAs<choice::kViewList>, nullptr, false, Has<&BrowserModes::view, choice::kViewList>, nullptr, true, FolderPlace::View},
+    {kView, TrLater("&Details"),            "Ctrl+2",       TrLater("Shows names with type, size, date and dimensions."), Needs::Nothing, ShowAs<choice::kViewDetails>, nullptr, false, Has<&BrowserModes::view, choice::kViewDetails>, nullptr, true, FolderPlace::View},
+    {kView, TrLater("&Small thumbnails"),   "Ctrl+3",       TrLater("Shows small thumbnails."), Needs::Nothing, ShowAs<choice::kViewSmall>, nullptr, false, Has<&BrowserModes::view, choice::kViewSmall>, nullptr, true, FolderPlace::View},
+    {kView, TrLater("&Normal thumbnails"),  "Ctrl+4",       TrLater("Shows thumbnails of 96 pixels."), Needs::Nothing, ShowAs<choice::kViewNormal>, nullptr, false, Has<&BrowserModes::view, choice::kViewNormal>, nullptr, true, FolderPlace::View},
+    {kView, TrLater("Lar&ge thumbnails"),   "Ctrl+5",       TrLater("Shows thumbnails of 176 pixels."), Needs::Nothing, ShowAs<choice::kViewLarge>, nullptr, false, Has<&BrowserModes::view, choice::kViewLarge>, nullptr, true, FolderPlace::View},
     {kView, TrLater("Lar&ger"),             "Ctrl++",       TrLater("Shows larger thumbnails."), Needs::Nothing, Larger},
     {kView, TrLater("S&maller"),            "Ctrl+-",       TrLater("Shows smaller thumbnails."), Needs::Nothing, Smaller},
     {kView, nullptr},
-    {kView, TrLater("Sort by na&me"),       "",             TrLater("Sorts by name; again reverses the order."), Needs::Nothing, SortBy<choice::kSortName>, nullptr, false, Has<&BrowserModes::sort, choice::kSortName>},
-    {kView, TrLater("Sort by &type"),       "",             TrLater("Sorts by type; again reverses the order."), Needs::Nothing, SortBy<choice::kSortType>, nullptr, false, Has<&BrowserModes::sort, choice::kSortType>},
-    {kView, TrLater("Sort by si&ze"),       "",             TrLater("Sorts by size; again reverses the order."), Needs::Nothing, SortBy<choice::kSortSize>, nullptr, false, Has<&BrowserModes::sort, choice::kSortSize>},
-    {kView, TrLater("Sort by d&ate"),       "",             TrLater("Sorts by date; again reverses the order."), Needs::Nothing, SortBy<choice::kSortDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDate>},
-    {kView, TrLater("Sort by E&XIF date"),  "",             TrLater("Sorts by the date the pictures were taken; again reverses the order."), Needs::Nothing, SortBy<choice::kSortExifDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortExifDate>},
-    {kView, TrLater("Sort by d&imensions"), "",             TrLater("Sorts by the number of pixels; again reverses the order."), Needs::Nothing, SortBy<choice::kSortDimensions>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDimensions>},
+    {kView, TrLater("Sort by na&me"),       "",             TrLater("Sorts by name."), Needs::Nothing, SortBy<choice::kSortName>, nullptr, false, Has<&BrowserModes::sort, choice::kSortName>, nullptr, true, FolderPlace::Sort},
+    {kView, TrLater("Sort by &type"),       "",             TrLater("Sorts by type."), Needs::Nothing, SortBy<choice::kSortType>, nullptr, false, Has<&BrowserModes::sort, choice::kSortType>, nullptr, true, FolderPlace::Sort},
+    {kView, TrLater("Sort by si&ze"),       "",             TrLater("Sorts by size."), Needs::Nothing, SortBy<choice::kSortSize>, nullptr, false, Has<&BrowserModes::sort, choice::kSortSize>, nullptr, true, FolderPlace::Sort},
+    {kView, TrLater("Sort by d&ate"),       "",             TrLater("Sorts by date."), Needs::Nothing, SortBy<choice::kSortDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDate>, nullptr, true, FolderPlace::Sort},
+    {kView, TrLater("Sort by E&XIF date"),  "",             TrLater("Sorts by the date the pictures were taken."), Needs::Nothing, SortBy<choice::kSortExifDate>, nullptr, false, Has<&BrowserModes::sort, choice::kSortExifDate>, nullptr, true, FolderPlace::Sort},
+    {kView, TrLater("Sort by d&imensions"), "",             TrLater("Sorts by the number of pixels."), Needs::Nothing, SortBy<choice::kSortDimensions>, nullptr, false, Has<&BrowserModes::sort, choice::kSortDimensions>, nullptr, true, FolderPlace::Sort},
+    {kView, TrLater("Re&verse order"),      "",             TrLater("Sorts in descending order: latest, largest or last name first."), Needs::Nothing, ReverseOrder, nullptr, false, IsReversed, nullptr, false, FolderPlace::Sort},
     {kView, nullptr},
-    {kView, TrLater("No gro&ups"),          "",             TrLater("Shows all files in one group."), Needs::Nothing, GroupBy<DateGrouping::None>, nullptr, false, IsGroupedBy<DateGrouping::None>},
-    {kView, TrLater("Group by da&y"),       "",             TrLater("Groups the files by the day they were taken or changed."), Needs::Nothing, GroupBy<DateGrouping::Day>, nullptr, false, IsGroupedBy<DateGrouping::Day>},
-    {kView, TrLater("Group by mo&nth"),     "",             TrLater("Groups the files by the month they were taken or changed."), Needs::Nothing, GroupBy<DateGrouping::Month>, nullptr, false, IsGroupedBy<DateGrouping::Month>},
-    {kView, TrLater("Group by year"),       "",             TrLater("Groups the files by the year they were taken or changed."), Needs::Nothing, GroupBy<DateGrouping::Year>, nullptr, false, IsGroupedBy<DateGrouping::Year>},
+    {kView, TrLater("No gro&ups"),          "",             TrLater("Shows all files in one group."), Needs::Nothing, GroupBy<DateGrouping::None>, nullptr, false, IsGroupedBy<DateGrouping::None>, nullptr, true},
+    {kView, TrLater("Group by da&y"),       "",             TrLater("Groups the files by the day they were taken or changed."), Needs::Nothing, GroupBy<DateGrouping::Day>, nullptr, false, IsGroupedBy<DateGrouping::Day>, nullptr, true},
+    {kView, TrLater("Group by mo&nth"),     "",             TrLater("Groups the files by the month they were taken or changed."), Needs::Nothing, GroupBy<DateGrouping::Month>, nullptr, false, IsGroupedBy<DateGrouping::Month>, nullptr, true},
+    {kView, TrLater("Group by year"),       "",             TrLater("Groups the files by the year they were taken or changed."), Needs::Nothing, GroupBy<DateGrouping::Year>, nullptr, false, IsGroupedBy<DateGrouping::Year>, nullptr, true},
     {kView, TrLater("Include subfolders"),  "",             TrLater("Lists the files in subfolders as well."), Needs::Nothing, ToggleSubfolders, nullptr, false, HasSubfolders},
     {kView, nullptr},
-    {kView, TrLater("T&humbnails: disk-based"), "",         TrLater("Reads thumbnails from files beside the pictures."), Needs::Nothing, ThumbnailsFrom<choice::kDiskBased>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kDiskBased>},
-    {kView, TrLater("Thumbnails: &virtual"), "",            TrLater("Keeps thumbnails in memory only."), Needs::Nothing, ThumbnailsFrom<choice::kVirtual>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kVirtual>},
-    {kView, TrLater("Thumbnails: glo&bal database"), "",    TrLater("Reads thumbnails from the database in the data folder."), Needs::Nothing, ThumbnailsFrom<choice::kGlobalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kGlobalDatabase>},
-    {kView, TrLater("Thumbnails: lo&cal database"), "",     TrLater("Reads thumbnails from the database in the folder."), Needs::Nothing, ThumbnailsFrom<choice::kLocalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kLocalDatabase>},
+    {kView, TrLater("T&humbnails: disk-based"), "",         TrLater("Reads thumbnails from files beside the pictures."), Needs::Nothing, ThumbnailsFrom<choice::kDiskBased>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kDiskBased>, nullptr, true},
+    {kView, TrLater("Thumbnails: &virtual"), "",            TrLater("Keeps thumbnails in memory only."), Needs::Nothing, ThumbnailsFrom<choice::kVirtual>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kVirtual>, nullptr, true},
+    {kView, TrLater("Thumbnails: glo&bal database"), "",    TrLater("Reads thumbnails from the database in the data folder."), Needs::Nothing, ThumbnailsFrom<choice::kGlobalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kGlobalDatabase>, nullptr, true},
+    {kView, TrLater("Thumbnails: lo&cal database"), "",     TrLater("Reads thumbnails from the database in the folder."), Needs::Nothing, ThumbnailsFrom<choice::kLocalDatabase>, nullptr, false, Has<&BrowserModes::thumbnails, choice::kLocalDatabase>, nullptr, true},
     {kView, nullptr},
     {kView, TrLater("Detai&ls columns..."), "",      TrLater("Chooses the columns of the Details view."), Needs::Nothing, OfBrowser<&BrowserPage::ChooseColumns>},
     {kView, TrLater("&Folders"),            "F9",           TrLater("Shows or hides the folder tree."), Needs::Nothing, ToggleFolders, nullptr, false, HasFolders},
     {kView, TrLater("Side &pane"),          "F3",           TrLater("Shows or hides a preview and the facts of the focused picture."), Needs::Nothing, ToggleSide, nullptr, false, HasSide},
-    {kView, TrLater("&Refresh"),            "F5",           TrLater("Reloads the folders."), Needs::Nothing, ReadFoldersAgain},
+    {kView, TrLater("&Refresh"),            "F5",           TrLater("Reloads the folders."), Needs::Nothing, ReadFoldersAgain, nullptr, false, nullptr, nullptr, false, FolderPlace::Top},
 
     {kGo, TrLater("&Back"),                 "Alt+Left",     TrLater("Goes back to the previous folder."), Needs::Nothing, OfBrowser<&BrowserPage::GoBack>},
     {kGo, TrLater("&Forward"),              "Alt+Right",    TrLater("Goes forward to the next folder."), Needs::Nothing, OfBrowser<&BrowserPage::GoForward>},
@@ -311,6 +322,36 @@ constexpr Command kCommands[] = {
 }  // namespace
 
 std::span<const Command> Commands() { return kCommands; }
+
+namespace {
+
+// Menus and texts without mnemonics and dots: "File/Open".
+std::string NameOf(const Command& command) {
+  std::string name = std::string(command.menu) + "/" + command.text;
+  std::erase(name, '&');
+  std::erase(name, '.');
+  return name;
+}
+
+KeyedCommand KeyedOf(const Command& command) {
+  const wxString label = wxControl::RemoveMnemonics(Label(command.menu)) + ": " +
+                         wxControl::RemoveMnemonics(Label(command.text));
+  return {NameOf(command), Utf8(label), command.accelerator};
+}
+
+}  // namespace
+
+std::vector<KeyedCommand> KeyedCommands() {
+  std::vector<KeyedCommand> commands;
+  for (const Command& command : kCommands) {
+    if (command.text != nullptr) commands.push_back(KeyedOf(command));
+  }
+  return commands;
+}
+
+std::string KeyOf(const Command& command) {
+  return UserKeys().KeyOf({NameOf(command), {}, command.accelerator});
+}
 
 const Command& CommandOfId(int id) { return kCommands[id - kFirstCommandId]; }
 

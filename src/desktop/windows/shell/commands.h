@@ -3,7 +3,11 @@
 #include <wx/defs.h>
 
 #include <span>
+#include <string>
 #include <string_view>
+#include <vector>
+
+#include "desktop/models/shell/key_map.h"
 
 namespace fotomill::desktop {
 
@@ -19,6 +23,9 @@ enum class Needs {
   Redo,
   ClosedTab,
 };
+
+// Where a command occurs in the menu of empty space.
+enum class FolderPlace { None, Top, View, Sort };
 
 // A command of the frame: menu item, toolbar button, keys, and
 // function. To add a window, add a row in commands.cpp. Menus and
@@ -36,9 +43,14 @@ struct Command {
   // whether the menu item is checked; null: not checkable
   bool (*checked)(Shell& shell) = nullptr;
   const char* secondKey = nullptr;          // alternative key
+  bool oneOf = false;                       // of the adjacent rows like this, one is checked
+  FolderPlace place = FolderPlace::None;
 };
 
 std::span<const Command> Commands();
+// The commands whose keys can be changed, and the key that one has now; empty: none.
+std::vector<KeyedCommand> KeyedCommands();
+std::string KeyOf(const Command& command);
 // Finds a command by its button's symbol; null if there is none.
 const Command* CommandOfSymbol(std::string_view symbol);
 

@@ -30,9 +30,13 @@ constexpr int kRecipesId = kFirstCommandId + 3000, kMostRecipes = 500;  // likew
 
 // The menu text with its key, in wxWidgets syntax.
 wxString MenuText(const Command& command) {
-  const wxString keys =
-      *command.accelerator == '\0' ? wxString() : wxString("\t") + command.accelerator;
-  return Label(command.text) + keys;
+  const std::string key = KeyOf(command);
+  return Label(command.text) + (key.empty() ? wxString() : "\t" + Shown(key));
+}
+
+wxItemKind KindOf(const Command& command) {
+  if (command.checked == nullptr) return wxITEM_NORMAL;
+  return command.oneOf ? wxITEM_RADIO : wxITEM_CHECK;
 }
 
 }  // namespace
@@ -55,8 +59,7 @@ void FrameMenus::BuildBar() {
       menu->AppendSeparator();
       continue;
     }
-    menu->Append(CommandId(command), MenuText(command), Label(command.help),
-                 command.checked != nullptr ? wxITEM_CHECK : wxITEM_NORMAL);
+    menu->Append(CommandId(command), MenuText(command), Label(command.help), KindOf(command));
   }
   shell_.Window().SetMenuBar(bar);
 }
@@ -128,11 +131,21 @@ void FrameMenus::BindSecondKeys() {
   std::vector<wxAcceleratorEntry> keys;
   for (const Command& command : Commands()) {
     wxAcceleratorEntry key(0, 0, CommandId(command));
-    if (command.secondKey != nullptr && key.FromString(wxString("\t") + command.secondKey))
-      keys.push_back(key);
+    if (command.secondKey == nullptr || KeyOf(command) != command.accelerator) continue;
+    const bool taken = UserKeys().Conflict(KeyedCommands(), {}, command.secondKey) != nullptr;
+    if (!taken && key.FromString(wxString("\t") + command.secondKey)) keys.push_back(key);
   }
   shell_.Window().SetAcceleratorTable(
       wxAcceleratorTable(static_cast<int>(keys.size()), keys.data()));
+}
+
+void FrameMenus::UpdateKeys() {
+  for (const Command& command : Commands()) {
+    if (command.text == nullptr) continue;
+    wxMenuItem* const item = shell_.Window().GetMenuBar()->FindItem(CommandId(command));
+    if (item->GetItemLabel() != MenuText(command)) item->SetItemLabel(MenuText(command));
+  }
+  BindSecondKeys();
 }
 
 void FrameMenus::BindCommands() {
@@ -151,17 +164,41 @@ void FrameMenus::BindCommands() {
 void FrameMenus::Update(wxUpdateUIEvent& event) {
   const Command& command = CommandOfId(event.GetId());
   event.Enable(CanRun(command, shell_));
-  if (command.checked != nullptr) event.Check(command.checked(shell_));
+  // A radio item is unchecked by checking another one.
+  const bool checked = command.checked != nullptr && command.checked(shell_);
+  if (command.checked != nullptr && (checked || !command.oneOf)) event.Check(checked);
   if (command.needs != Needs::Undo && command.needs != Needs::Redo) return;
   const UndoList& undo = shell_.Files().Undoable();
   const std::string name = command.needs == Needs::Undo ? undo.UndoName() : undo.RedoName();
   const wxString verb = Label(command.text);
   const wxString text =
-      (name.empty() ? verb : Label("%1 %2", verb, Shown(name))) + "\t" + command.accelerator;
+      (name.empty() ? verb : Label("%1 %2", verb, Shown(name))) + "\t" + Shown(KeyOf(command));
   wxMenuBar* const bar = shell_.Window().GetMenuBar();
   if (event.GetEventObject() == bar || bar->FindItem(event.GetId())->GetItemLabel() != text) {
     bar->FindItem(event.GetId())->SetItemLabel(text);
   }
+}
+
+// Commands for the folder, and as submenus the choices of the menu bar's View menu.
+void FrameMenus::ShowFolderMenu(wxWindow& window, const wxPoint& place) {
+  wxMenu menu;
+  auto* const view = new wxMenu;
+  auto* const sort = new wxMenu;
+  for (const Command& command : Commands()) {
+    if (command.text == nullptr || command.place == FolderPlace::None) continue;
+    wxMenu& target = command.place == FolderPlace::View   ? *view
+                     : command.place == FolderPlace::Sort ? *sort
+                                                          : menu;
+    wxMenuItem* const item =
+        target.Append(CommandId(command), MenuText(command), Label(command.help), KindOf(command));
+    if (command.checked != nullptr && command.checked(shell_)) item->Check();
+    item->Enable(CanRun(command, shell_));
+  }
+  menu.AppendSeparator();
+  menu.AppendSubMenu(view, Label("&View"));
+  menu.AppendSubMenu(sort, Label("&Sort"));
+  LogEvent("folder-commands", std::to_string(menu.GetMenuItemCount()));
+  window.PopupMenu(&menu, place);
 }
 
 void FrameMenus::ShowContextMenu(wxWindow& window, const wxPoint& place) {

@@ -20,8 +20,12 @@ class FrameMenus {
 
   // Shows the context menu of the selected files at a position in `window`, including "Open with".
   void ShowContextMenu(wxWindow& window, const wxPoint& place);
+  // Shows the menu of the folder, for empty space of a list.
+  void ShowFolderMenu(wxWindow& window, const wxPoint& place);
   // Reloads the submenu of recent files.
   void UpdateRecentFiles();
+  // Call after the user's keys have changed.
+  void UpdateKeys();
 
  private:
   void BuildBar();

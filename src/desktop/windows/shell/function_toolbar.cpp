@@ -53,8 +53,8 @@ void FunctionToolbar::Choose() {
 
 // The tooltip of a disabled button says why.
 void FunctionToolbar::ShowTip(const Command& command) {
-  const wxString key =
-      *command.accelerator == '\0' ? wxString() : wxString(" (") + command.accelerator + ")";
+  const std::string chosen = KeyOf(command);
+  const wxString key = chosen.empty() ? wxString() : " (" + Shown(chosen) + ")";
   const wxString why =
       CanRun(command, shell_) ? wxString() : wxString("\n") + Label(WhyNot(command.needs));
   const wxString tip = Label(command.help) + key + why;

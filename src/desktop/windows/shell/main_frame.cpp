@@ -163,6 +163,7 @@ void MainFrame::SettingsChanged() {
   TakePluginOverride();
   files_->SettingsChanged();
   menus_->UpdateRecentFiles();
+  menus_->UpdateKeys();
   thumbnails_.Clear();
   FilesChanged();
 }

@@ -10,13 +10,14 @@
 #include "desktop/windows/info/info_frame.h"
 #include "desktop/windows/setup/setup_box.h"
 #include "desktop/windows/shell/browser_tabs.h"
+#include "desktop/windows/shell/commands.h"
 #include "desktop/windows/shell/shell.h"
 #include "settings/setup_dialog.h"
 
 namespace fotomill::desktop {
 
 void ShowSetup(Shell& shell) {
-  SetupBox(&shell.Window(), [&shell] { shell.SettingsChanged(); }).ShowModal();
+  SetupBox(&shell.Window(), KeyedCommands(), [&shell] { shell.SettingsChanged(); }).ShowModal();
   LogEvent("setup", "closed");
 }
 
