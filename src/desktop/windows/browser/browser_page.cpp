@@ -1,13 +1,9 @@
 #include "desktop/windows/browser/browser_page.h"
 
-#include <wx/button.h>
 #include <wx/dataobj.h>
 #include <wx/dnd.h>
-#include <wx/menu.h>
 #include <wx/simplebook.h>
 #include <wx/sizer.h>
-#include <wx/slider.h>
-#include <wx/srchctrl.h>
 #include <wx/textdlg.h>
 
 #include <algorithm>
@@ -15,12 +11,12 @@
 #include <utility>
 
 #include "core/choice_lists.h"
-#include "desktop/models/browser/thumbnail_side.h"
+#include "desktop/models/browser/missing_facts.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/browser/browser_bar.h"
 #include "desktop/windows/browser/details_list.h"
 #include "desktop/windows/browser/folder_note.h"
 #include "desktop/windows/browser/folder_problem.h"
-#include "desktop/windows/browser/path_bar.h"
 #include "desktop/windows/browser/thumbnail_canvas.h"
 #include "desktop/windows/browser/update_bar.h"
 #include "desktop/windows/files/file_list_data.h"
@@ -35,9 +31,6 @@ namespace fotomill::desktop {
 
 namespace {
 
-// pages of the book; the second is created when first shown
-enum View { kThumbnailView, kDetailsView };
-
 constexpr BrowserModes kNoModes{-1, -1, -1};
 constexpr int kPatienceMs = 1000;  // until the page says that it waits for a folder
 
@@ -50,11 +43,6 @@ BrowserModes Chosen(const BrowserModes& chosen, const BrowserModes& otherwise) {
 DateGrouping GroupingFromSettings() {
   const int32_t last = static_cast<int32_t>(DateGrouping::Year);
   return static_cast<DateGrouping>(std::clamp(settings.BrowserGrouping, 0, last));
-}
-
-// With an arrow, as it opens a menu.
-wxString TagFilterLabel(TagFilter filter) {
-  return wxControl::EscapeMnemonics(Shown(TagFilterName(filter) + "  \xE2\x96\xBE"));
 }
 
 }  // namespace
@@ -75,26 +63,24 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
       offer_(this, {[this] { FocusList(); }, [this] { canvas_->WantThumbnails(); }}) {
   model_.SetView(view);
   model_.SetGrouping(GroupingFromSettings());
-  auto* bar = new wxBoxSizer(wxHORIZONTAL);
-  path_ = new PathBar(this, trail_,
-                      {[this](int steps) { StepAlongTrail(steps); }, [this] { GoUp(); },
-                       [this](const std::string& folder) {
-                         Open(folder);
-                         FocusList();
-                       },
-                       [this] { LeaveBar(); }});
-  bar->Add(path_, wxSizerFlags(1).CenterVertical());
-  BuildFilter();
-  bar->Add(tagFilter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
-  bar->Add(filter_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
-  BuildSlider();
-  bar->Add(slider_, wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4)));
+  bar_ = new BrowserBar(this, model_, trail_,
+                        {[this](int steps) { StepAlongTrail(steps); }, [this] { GoUp(); },
+                         [this](const std::string& folder) {
+                           Open(folder);
+                           FocusList();
+                         },
+                         [this](int32_t side) { SetSide(side); },
+                         [this] {
+                           ShowLines();
+                           host_.BrowserChanged();
+                         },
+                         [this] { FocusList(); }});
   BuildViews();
   problem_ = new FolderProblem(this, [this] { GoUp(); });
   late_.Bind(wxEVT_TIMER,
              [this](wxTimerEvent&) { ShowProblem(Tr("Waiting for %1...", model_.Folder())); });
   auto* sizer = new wxBoxSizer(wxVERTICAL);
-  sizer->Add(bar, wxSizerFlags().Expand());
+  sizer->Add(bar_, wxSizerFlags().Expand());
   note_ = new FolderNote(this);
   sizer->Add(note_, wxSizerFlags().Expand());
   offer_.Bar()->MoveBeforeInTabOrder(views_);
@@ -111,38 +97,6 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
       new FolderDrop([this](const wxPoint&) { return model_.Folder(); },
                      [this](const std::vector<std::string>& files, const std::string& folder,
                             bool move) { host_.DropFiles(files, folder, move); }));
-}
-
-void BrowserPage::BuildFilter() {
-  tagFilter_ = new wxButton(this, wxID_ANY, TagFilterLabel(TagFilter::All));
-  tagFilter_->SetToolTip(Label("Shows only files with this rating or color label"));
-  tagFilter_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ChooseTagFilter(); });
-  tagFilter_->Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
-    if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
-    FocusList();
-  });
-  filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(200, -1)),
-                             wxTE_PROCESS_ENTER, wxDefaultValidator, Label("Filter"));
-  filter_->SetDescriptiveText(Label("Filter"));
-  filter_->ShowCancelButton(true);
-  filter_->SetToolTip(
-      Label("Shows only files whose names contain this text or match this pattern (*, ?)"));
-  filter_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { ApplyFilter(); });
-  filter_->Bind(wxEVT_SEARCHCTRL_CANCEL_BTN, [this](wxCommandEvent&) { filter_->Clear(); });
-  filter_->Bind(wxEVT_TEXT_ENTER, [this](wxCommandEvent&) { FocusList(); });
-  filter_->Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
-    if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
-    LeaveBar();
-  });
-}
-
-void BrowserPage::BuildSlider() {
-  slider_ =
-      new wxSlider(this, wxID_ANY, 0, 0, kSliderEnd, wxDefaultPosition, FromDIP(wxSize(110, -1)),
-                   wxSL_HORIZONTAL, wxDefaultValidator, Label("Thumbnail size"));
-  slider_->SetToolTip(Label("Thumbnail size (Ctrl+wheel)"));
-  slider_->Bind(wxEVT_SLIDER,
-                [this](wxCommandEvent&) { SetSide(SideAtSlider(slider_->GetValue())); });
 }
 
 void BrowserPage::BuildViews() {
@@ -174,16 +128,9 @@ void BrowserPage::ShowFound(const std::string& folder, const std::vector<std::st
                             const FolderView& view) {
   if (!found_ || folder != model_.Folder()) {
     if (folder != model_.Folder()) trail_.Go(folder);
-    watch_.Watch({});
-    offer_.Forget();
-    model_.SetFolder(folder);
+    EnterFolder(folder);
     model_.SetView(view);
-    filter_->ChangeValue("");
-    path_->ShowFolder(folder);
-    note_->ShowText(Shown(host_.NoteAbout(folder)));
-    canvas_->ScrollTo(0);
-    ShowProblem({});
-    ShowView();
+    ShowEntered();
   }
   subfolders_ = false;
   found_ = names;
@@ -216,19 +163,27 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
   const bool hadFound = std::exchange(found_, {}).has_value();
   if (folder == model_.Folder() && !hadFound) return Reload();
   wantedNames_.reset();
+  subfolders_ = false;
+  EnterFolder(folder);
+  UseView(kNoModes);
+  ShowEntered();
+  Reload();
+  host_.BrowserChanged();
+}
+
+// Empties the browser for another folder, whose view is set next.
+void BrowserPage::EnterFolder(const std::string& folder) {
   watch_.Watch({});
   offer_.Forget();
-  subfolders_ = false;
   model_.SetFolder(folder);
-  UseView(kNoModes);
-  filter_->ChangeValue("");
-  path_->ShowFolder(folder);
+  bar_->ShowFolder(folder);
   note_->ShowText(Shown(host_.NoteAbout(folder)));
+}
+
+void BrowserPage::ShowEntered() {
   canvas_->ScrollTo(0);
   ShowProblem({});
   ShowView();
-  Reload();
-  host_.BrowserChanged();
 }
 
 // The last view chosen for the folder, else the default one; modes `chosen` by the folder itself
@@ -314,30 +269,16 @@ void BrowserPage::OfferThumbnails() {
 
 // --- facts that need the files' headers ---
 
-bool BrowserPage::NeedsFacts() const {
-  const BrowserModes& modes = model_.Modes();
-  return modes.view == choice::kViewDetails || model_.Grouping() != DateGrouping::None ||
-         modes.sort == choice::kSortExifDate || modes.sort == choice::kSortDimensions;
-}
-
 void BrowserPage::StartFacts() {
-  if (factsRead_ || Listing() || reader_.ReadingFacts() || !NeedsFacts()) return;
-  PlacedItems wanted;
-  for (size_t line = 0; line < model_.LineCount(); ++line) {
-    const size_t item = model_.ItemOfLine(line);
-    if (!model_.Item(item).folder && model_.Item(item).width == 0)
-      wanted.emplace_back(item, model_.Item(item));
-  }
+  if (factsRead_ || Listing() || reader_.ReadingFacts() || !NeedsPictureFacts(model_)) return;
+  PlacedItems wanted = ItemsWithoutPictureFacts(model_);
   if (!wanted.empty()) reader_.ReadFacts(model_.Folder(), std::move(wanted));
 }
 
 void BrowserPage::ShowFacts(const PlacedItems& found, bool last) {
   for (const auto& [item, known] : found) model_.SetFacts(item, known);
   factsRead_ = last;  // files that cannot be read have none
-  const int32_t sort = model_.Modes().sort;
-  const bool ordered = sort == choice::kSortExifDate || sort == choice::kSortDimensions ||
-                       model_.Grouping() != DateGrouping::None;
-  if (last && ordered) {
+  if (last && OrderNeedsPictureFacts(model_)) {
     model_.UpdateOrder();
     ShowView();
   } else if (ShowsDetails()) {
@@ -350,16 +291,7 @@ void BrowserPage::ShowFacts(const PlacedItems& found, bool last) {
 
 void BrowserPage::StartTags() {
   if (Listing()) return;
-  PlacedItems wanted;
-  const auto want = [&](size_t item) {
-    const FolderItem& facts = model_.Item(item);
-    if (!facts.folder && !facts.tagged) wanted.emplace_back(item, facts);
-  };
-  // what is shown comes first; a filter may hide the rest
-  for (size_t line = 0; line < model_.LineCount(); ++line) want(model_.ItemOfLine(line));
-  if (model_.LineCount() < model_.ItemCount()) {
-    for (size_t item = 0; item < model_.ItemCount(); ++item) want(item);
-  }
+  PlacedItems wanted = ItemsWithoutTags(model_);
   if (!wanted.empty()) reader_.ReadTags(model_.Folder(), std::move(wanted));
 }
 
@@ -380,32 +312,6 @@ void BrowserPage::ShowTags(const PlacedItems& found, bool last) {
   LogEvent("tags", "rated=" + std::to_string(rated) + " " + model_.Folder());
 }
 
-void BrowserPage::ChooseTagFilter() {
-  constexpr int kFirstId = 1;
-  wxMenu menu;
-  for (int i = 0; i <= static_cast<int>(TagFilter::LastLabel); ++i) {
-    const auto filter = static_cast<TagFilter>(i);
-    if (filter == TagFilter::OneStar || filter == TagFilter::Unrated ||
-        filter == TagFilter::FirstLabel)
-      menu.AppendSeparator();
-    menu.AppendCheckItem(kFirstId + i, Shown(TagFilterName(filter)))
-        ->Check(filter == model_.TagsShown());
-  }
-  LogEvent("tag-menu", std::to_string(menu.GetMenuItemCount()));
-  const int chosen =
-      tagFilter_->GetPopupMenuSelectionFromUser(menu, 0, tagFilter_->GetSize().y) - kFirstId;
-  if (chosen >= 0 && chosen <= static_cast<int>(TagFilter::LastLabel)) {
-    model_.SetTagFilter(static_cast<TagFilter>(chosen));
-    tagFilter_->SetLabel(TagFilterLabel(model_.TagsShown()));
-    Layout();
-    ShowLines();
-    LogEvent("tag-filter",
-             std::to_string(chosen) + " lines=" + std::to_string(model_.LineCount()));
-    host_.BrowserChanged();
-  }
-  FocusList();
-}
-
 bool BrowserPage::TagByKey(int key) {
   const size_t focus = model_.Selected().Focus();
   const auto changes =
@@ -417,117 +323,6 @@ bool BrowserPage::TagByKey(int key) {
 void BrowserPage::TagsChanged(const std::vector<std::string>& paths) {
   model_.ForgetTags(paths);
   StartTags();
-}
-
-// --- view modes ---
-
-bool BrowserPage::ShowsDetails() const { return views_->GetSelection() == kDetailsView; }
-
-void BrowserPage::ShowView() {
-  const bool details = model_.Modes().view == choice::kViewDetails;
-  if (details && details_ == nullptr) {
-    DetailsList::Events events;
-    events.selectionChanged = [this] { host_.BrowserChanged(); };
-    events.activated = [this](size_t line) { Activate(line); };
-    events.contextMenu = [this](size_t line, const wxPoint& place) {
-      host_.ShowContextMenu(*details_, place, line != kNoLine);
-    };
-    events.sort = [this](int32_t sort) {
-      SetSort(sort, model_.Modes().sort == sort && !model_.Descending());
-    };
-    details_ = new DetailsList(views_, model_, host_.Columns(), thumbnails_, events);
-    views_->AddPage(details_, Label("Details"));
-  }
-  const bool hadFocus = canvas_->HasFocus() || (details_ != nullptr && details_->HasFocus());
-  views_->SetSelection(details ? kDetailsView : kThumbnailView);
-  slider_->SetValue(SliderAtSide(SideInView(model_.Modes().view, settings.ThumbnailSide)));
-  ShowLines();
-  if (details) {
-    details_->ShowSelection();
-  } else {
-    canvas_->ShowLine(model_.Selected().Focus());
-  }
-  if (hadFocus) FocusList();
-  StartFacts();
-}
-
-void BrowserPage::ShowLines() {
-  if (ShowsDetails()) {
-    details_->ModelChanged();
-  } else {
-    canvas_->ModelChanged();
-  }
-}
-
-void BrowserPage::ShowAs(const FolderView& view) {
-  model_.SetView(view);
-  ShowView();
-  host_.BrowserChanged();
-}
-
-// The user's choice is saved for this folder, and used for folders without a saved view.
-void BrowserPage::ChooseView(const FolderView& view) {
-  base_ = view;
-  if (!found_) host_.KeepView(model_.Folder(), view);
-  ShowAs(view);
-}
-
-void BrowserPage::SetViewMode(int32_t mode) {
-  settings.ThumbnailSide = 0;
-  FolderView view = model_.View();
-  view.modes.view = mode;
-  ChooseView(view);
-}
-
-void BrowserPage::SetSort(int32_t sort, bool descending) {
-  FolderView view = model_.View();
-  view.modes.sort = sort;
-  view.descending = descending;
-  ChooseView(view);
-}
-
-void BrowserPage::SetThumbnailMode(int32_t mode) {
-  FolderView view = model_.View();
-  view.modes.thumbnails = base_.modes.thumbnails = mode;
-  ShowAs(view);
-}
-
-void BrowserPage::ChangeSize(int steps) {
-  const int32_t view = model_.Modes().view;
-  const bool thumbnails = view >= choice::kViewSmall;
-  const int32_t side = SideInView(view, settings.ThumbnailSide);
-  if (!thumbnails || (steps < 0 && side == kSmallestSide)) {
-    const int32_t other = std::clamp(view + steps, choice::kViewList + 0, choice::kViewSmall + 0);
-    if (other != view) SetViewMode(other);
-  } else {
-    SetSide(SteppedSide(side, steps));
-  }
-}
-
-void BrowserPage::SetSide(int32_t side) {
-  if (model_.Modes().view >= choice::kViewSmall &&
-      side == SideInView(model_.Modes().view, settings.ThumbnailSide))
-    return;
-  FolderView view = model_.View();
-  view.modes.view = ViewOfSide(side);
-  settings.ThumbnailSide = side;
-  LogEvent("thumbnail-side", std::to_string(side));
-  ChooseView(view);
-}
-
-void BrowserPage::SetGrouping(DateGrouping grouping) {
-  settings.BrowserGrouping = static_cast<int32_t>(grouping);
-  model_.SetGrouping(grouping);
-  LogEvent("groups", std::to_string(model_.Groups().size()));
-  ShowView();
-  host_.BrowserChanged();
-}
-
-void BrowserPage::ShowSubfolders(bool show) {
-  if (found_ || show == subfolders_) return;
-  subfolders_ = show;
-  offer_.Forget();
-  Reload();
 }
 
 void BrowserPage::SelectionChanged() {
@@ -575,8 +370,9 @@ void BrowserPage::EditFocusedName() {
     host_.RenameFile(model_.PathOfLine(focus), Utf8(dialog.GetValue()));
 }
 
-void BrowserPage::EditPath() { path_->Edit(); }
-void BrowserPage::OfferTrail() { path_->OfferTrail(); }
+void BrowserPage::EditPath() { bar_->EditPath(); }
+void BrowserPage::OfferTrail() { bar_->OfferTrail(); }
+void BrowserPage::EditFilter() { bar_->EditFilter(); }
 
 void BrowserPage::ChooseColumns() {
   if (!ShowsDetails()) SetViewMode(choice::kViewDetails);
@@ -585,19 +381,6 @@ void BrowserPage::ChooseColumns() {
 
 void BrowserPage::KeepColumns() {
   if (details_ != nullptr) details_->KeepColumns();
-}
-
-void BrowserPage::EditFilter() { filter_->SetFocus(); }
-
-void BrowserPage::ApplyFilter() {
-  model_.SetFilter(Utf8(filter_->GetValue()));
-  ShowLines();
-  host_.BrowserChanged();
-}
-
-void BrowserPage::LeaveBar() {
-  if (!filter_->IsEmpty()) filter_->Clear();
-  FocusList();
 }
 
 void BrowserPage::Activated() {

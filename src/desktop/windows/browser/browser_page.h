@@ -15,17 +15,14 @@
 #include "desktop/windows/browser/thumbnail_service.h"
 #include "desktop/windows/browser/update_offer.h"
 
-class wxButton;
-class wxSearchCtrl;
 class wxSimplebook;
-class wxSlider;
 
 namespace fotomill::desktop {
 
+class BrowserBar;
 class DetailsList;
 class FolderNote;
 class FolderProblem;
-class PathBar;
 class ThumbnailCanvas;
 
 class BrowserPage;
@@ -129,20 +126,18 @@ class BrowserPage : public wxPanel {
   void SetAsksForThumbnails(bool asks) { offer_.SetAsks(asks); }
 
  private:
-  void BuildFilter();
-  void BuildSlider();
   void BuildViews();
   void ShowFolder(const std::string& folder, const std::string& focus);
+  void EnterFolder(const std::string& folder);
+  void ShowEntered();
   void ShowListing(FolderListing listing, bool complete);
   void ShowWanted();
   void ShowProblem(const std::string& problem);
   void OfferThumbnails();
   void StartFacts();
   void StartTags();
-  void ChooseTagFilter();
   void ShowTags(const PlacedItems& found, bool last);
   void ShowFacts(const PlacedItems& found, bool last);
-  bool NeedsFacts() const;
   bool ShowsDetails() const;
   void ShowView();
   void ShowLines();
@@ -152,8 +147,6 @@ class BrowserPage : public wxPanel {
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
   void Activate(size_t line);
   void BeginDrag();
-  void ApplyFilter();
-  void LeaveBar();
 
   BrowserHost& host_;
   ThumbnailService& thumbnails_;
@@ -173,10 +166,7 @@ class BrowserPage : public wxPanel {
   FolderWatch watch_;
   UpdateOffer offer_;
 
-  PathBar* path_ = nullptr;
-  wxSearchCtrl* filter_ = nullptr;
-  wxSlider* slider_ = nullptr;
-  wxButton* tagFilter_ = nullptr;
+  BrowserBar* bar_ = nullptr;
   wxSimplebook* views_ = nullptr;
   FolderProblem* problem_ = nullptr;  // shown instead of the views
   FolderNote* note_ = nullptr;

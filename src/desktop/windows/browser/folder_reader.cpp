@@ -57,54 +57,45 @@ void FolderReader::ListFound(const std::string& folder, std::vector<std::string>
 }
 
 void FolderReader::ReadFacts(const std::string& folder, PlacedItems wanted) {
-  facts_.Start(
-      [this, folder, wanted = std::move(wanted)](const StopToken& stop,
-                                                 const LooseWork::Report& report) {
-        const auto send = [&](PlacedItems found, bool last) {
-          report([this, found = std::move(found), last] {
-            if (last) facts_.Stop();
-            events_.factsFound(found, last);
-          });
-        };
-        PlacedItems found;
-        for (const auto& [place, item] : wanted) {
-          if (stop.Asked()) return;
-          FolderItem facts = item;
-          AddPictureFacts(folder, facts);
-          if (facts.width > 0) found.emplace_back(place, std::move(facts));
-          if (found.size() == kBunch) send(std::exchange(found, {}), false);
-        }
-        send(std::move(found), true);
-      },
-      [this] {
-        facts_.Stop();
-        events_.factsFound({}, true);
-      });
+  const auto read = [folder](FolderItem& item) {
+    AddPictureFacts(folder, item);
+    return item.width > 0;
+  };
+  ReadItems(facts_, std::move(wanted), read, events_.factsFound);
 }
 
 void FolderReader::ReadTags(const std::string& folder, PlacedItems wanted) {
-  tags_.Start(
-      [this, folder, wanted = std::move(wanted)](const StopToken& stop,
-                                                 const LooseWork::Report& report) {
-        const auto send = [&](PlacedItems found, bool last) {
-          report([this, found = std::move(found), last] {
-            if (last) tags_.Stop();
-            events_.tagsFound(found, last);
+  const auto read = [folder](FolderItem& item) {
+    AddPictureTags(folder, item);
+    return true;
+  };
+  ReadItems(tags_, std::move(wanted), read, events_.tagsFound);
+}
+
+// `read` adds to an item, and returns whether it is delivered.
+void FolderReader::ReadItems(LooseWork& work, PlacedItems wanted,
+                             std::function<bool(FolderItem& item)> read, const Found& found) {
+  work.Start(
+      [&work, &found, read = std::move(read), wanted = std::move(wanted)](
+          const StopToken& stop, const LooseWork::Report& report) {
+        const auto send = [&](PlacedItems bunch, bool last) {
+          report([&work, &found, bunch = std::move(bunch), last] {
+            if (last) work.Stop();
+            found(bunch, last);
           });
         };
-        PlacedItems found;
+        PlacedItems bunch;
         for (const auto& [place, item] : wanted) {
           if (stop.Asked()) return;
-          FolderItem tags = item;
-          AddPictureTags(folder, tags);
-          found.emplace_back(place, std::move(tags));
-          if (found.size() == kBunch) send(std::exchange(found, {}), false);
+          FolderItem filled = item;
+          if (read(filled)) bunch.emplace_back(place, std::move(filled));
+          if (bunch.size() == kBunch) send(std::exchange(bunch, {}), false);
         }
-        send(std::move(found), true);
+        send(std::move(bunch), true);
       },
-      [this] {
-        tags_.Stop();
-        events_.tagsFound({}, true);
+      [&work, &found] {
+        work.Stop();
+        found({}, true);
       });
 }
 

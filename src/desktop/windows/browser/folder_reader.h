@@ -2,29 +2,25 @@
 
 #include <functional>
 #include <string>
-#include <utility>
 #include <vector>
 
 #include "desktop/models/browser/folder_listing.h"
+#include "desktop/models/browser/missing_facts.h"
 #include "desktop/windows/widgets/loose_work.h"
 
 namespace fotomill::desktop {
 
-// Items with their index in the original list.
-using PlacedItems = std::vector<std::pair<size_t, FolderItem>>;
-
-// Reads a browser's folder in the background: its
-// contents, and facts from the files' headers.
+// Reads a browser's folder in the background: its contents, and facts from the files' headers.
 class FolderReader {
  public:
+  // `last`: no more follow.
+  using Found = std::function<void(const PlacedItems& found, bool last)>;
   // Called on the window's thread, never after the reader is destroyed.
   struct Events {
     // `complete` is false for the first listing with names only, if requested.
     std::function<void(FolderListing listing, bool complete)> listed;
-    // `last`: no more follow.
-    std::function<void(const PlacedItems& found, bool last)> factsFound;
-    // The same for tags.
-    std::function<void(const PlacedItems& found, bool last)> tagsFound;
+    Found factsFound;
+    Found tagsFound;
   };
   explicit FolderReader(Events events) : events_(std::move(events)) {}
 
@@ -45,6 +41,9 @@ class FolderReader {
   bool ReadingFacts() const { return facts_.Started(); }
 
  private:
+  void ReadItems(LooseWork& work, PlacedItems wanted, std::function<bool(FolderItem& item)> read,
+                 const Found& found);
+
   const Events events_;
   LooseWork listing_;
   LooseWork facts_, tags_;

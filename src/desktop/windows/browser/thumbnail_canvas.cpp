@@ -1,7 +1,6 @@
 #include "desktop/windows/browser/thumbnail_canvas.h"
 
 #include <wx/settings.h>
-#include <wx/textctrl.h>
 
 #include <algorithm>
 #include <cmath>
@@ -41,7 +40,8 @@ ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model,
       thumbnails_(thumbnails),
       events_(std::move(events)),
       bandTimer_(this),
-      tip_(*this) {
+      tip_(*this),
+      editor_(*this) {
   SetBackgroundStyle(wxBG_STYLE_PAINT);
   Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize,
          wxVSCROLL | wxWANTS_CHARS | wxBORDER_NONE, Label("Thumbnails"));
@@ -105,7 +105,7 @@ void ThumbnailCanvas::MeasureCells() {
 
 void ThumbnailCanvas::ModelChanged() {
   restored_.reset();
-  FinishEdit(false);
+  editor_.Finish(false);
   MeasureCells();
   scroll_ = std::clamp<int64_t>(scroll_, 0, layout_.LargestScroll());
   UpdateScrollbar();
@@ -241,7 +241,7 @@ void ThumbnailCanvas::ShowRestored() {
 void ThumbnailCanvas::ScrollTo(int64_t scroll) {
   scroll = std::clamp<int64_t>(scroll, 0, layout_.LargestScroll());
   if (scroll == scroll_) return;
-  FinishEdit(true);
+  editor_.Finish(true);
   direction_ = scroll > scroll_ ? 1 : -1;
   scroll_ = scroll;
   UpdateScrollbar();
@@ -316,7 +316,7 @@ void ThumbnailCanvas::ReportSelection() {
 }
 
 void ThumbnailCanvas::OnMouseDown(wxMouseEvent& event) {
-  FinishEdit(true);
+  editor_.Finish(true);
   SetFocus();
   const size_t line = LineAt(event.GetPosition());
   pressed_ = wxPoint(event.GetX(), static_cast<int>(event.GetY() + scroll_));
@@ -379,7 +379,7 @@ void ThumbnailCanvas::OnDoubleClick(wxMouseEvent& event) {
 }
 
 void ThumbnailCanvas::OnRightDown(wxMouseEvent& event) {
-  FinishEdit(true);
+  editor_.Finish(true);
   SetFocus();
   const size_t line = LineAt(event.GetPosition());
   model_.Selected().ContextClick(line);
@@ -461,48 +461,23 @@ void ThumbnailCanvas::OnChar(wxKeyEvent& event) {
 // --- renaming in place ---
 
 void ThumbnailCanvas::EditName(size_t line) {
-  FinishEdit(true);
+  editor_.Finish(true);
   if (line >= model_.LineCount()) return;
   ShowLine(line);
   const Rect cell = layout_.Cell(line);
   const std::string name(ShownName(model_.Line(line)));
   const int height = textHeight_ + FromDIP(12);
   const int top = static_cast<int>(cell.y - scroll_) + cell.height - height;
-  editedLine_ = line;
-  editor_ = new wxTextCtrl(this, wxID_ANY, Shown(name), wxPoint(cell.x, top),
-                           wxSize(std::max(cell.width, FromDIP(160)), height), wxTE_PROCESS_ENTER,
-                           wxDefaultValidator, Label("New name"));
-  editor_->Bind(wxEVT_TEXT_ENTER,
-                [this](wxCommandEvent&) { CallAfter([this] { FinishEdit(true); }); });
-  editor_->Bind(wxEVT_KILL_FOCUS, [this](wxFocusEvent& event) {
-    CallAfter([this] { FinishEdit(true); });
-    event.Skip();
-  });
-  editor_->Bind(wxEVT_KEY_DOWN, [this](wxKeyEvent& event) {
-    if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
-    CallAfter([this] { FinishEdit(false); });
-  });
-  editor_->SetFocus();
   const size_t base = model_.Line(line).folder
                           ? name.size()
                           : name.size() - platform::SplitPath(name).extension.size();
-  editor_->SetSelection(0,
-                        static_cast<long>(Shown(std::string_view(name).substr(0, base)).length()));
-}
-
-void ThumbnailCanvas::FinishEdit(bool accept) {
-  if (editor_ == nullptr) return;
-  wxTextCtrl* editor = std::exchange(editor_, nullptr);
-  const size_t line = std::exchange(editedLine_, kNoLine);
-  const std::string name = Utf8(editor->GetValue());
-  const bool hadFocus = editor->HasFocus();
-  const bool changed =
-      line < model_.LineCount() && editor->IsModified() && name != ShownName(model_.Line(line));
-  editor->Hide();
-  editor->Destroy();
-  if (hadFocus) SetFocus();
-  Refresh();
-  if (accept && changed && !name.empty() && events_.renamed) events_.renamed(line, name);
+  editedLine_ = line;
+  editor_.Begin(wxRect(cell.x, top, std::max(cell.width, FromDIP(160)), height), Label("New name"),
+                name, base, [this, line](const std::string& changed) {
+                  if (line < model_.LineCount() && changed != ShownName(model_.Line(line)) &&
+                      events_.renamed)
+                    events_.renamed(line, changed);
+                });
 }
 
 }  // namespace fotomill::desktop

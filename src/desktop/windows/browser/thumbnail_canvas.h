@@ -14,9 +14,9 @@
 #include "desktop/models/browser/thumbnail_side.h"
 #include "desktop/windows/browser/hover_tip.h"
 #include "desktop/windows/browser/thumbnail_service.h"
+#include "desktop/windows/widgets/in_place_editor.h"
 
 class wxDC;
-class wxTextCtrl;
 
 namespace fotomill::desktop {
 
@@ -107,7 +107,6 @@ class ThumbnailCanvas : public wxWindow {
   void ReportSelection();
   void UpdateScrollbar();
   void UpdateTip(size_t line);
-  void FinishEdit(bool accept);
 
   BrowserModel& model_;
   ThumbnailService& thumbnails_;
@@ -151,7 +150,7 @@ class ThumbnailCanvas : public wxWindow {
   double typedAt_ = 0;
   wxTimer bandTimer_;
   HoverTip tip_;
-  wxTextCtrl* editor_ = nullptr;
+  InPlaceEditor editor_;
   size_t editedLine_ = kNoLine;
 };
 

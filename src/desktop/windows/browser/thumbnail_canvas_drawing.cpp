@@ -129,7 +129,7 @@ void ThumbnailCanvas::DrawCell(wxDC& dc, size_t line, const Looks& looks) {
   const wxRect square(cell.x + (cell.width - square_) / 2, cell.y + padding, square_, square_);
   DrawPicture(dc, line, square, looks);
   if (!item.folder) DrawTags(dc, *this, square, item);
-  if (line == editedLine_) return;
+  if (editor_.Open() && line == editedLine_) return;
   const CutText& name = CutName(dc, std::string(ShownName(item)), NameWidth());
   dc.SetTextForeground(text);
   dc.DrawText(name.text, cell.x + (cell.width - name.width) / 2,
