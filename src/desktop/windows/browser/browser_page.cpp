@@ -213,9 +213,10 @@ void BrowserPage::ShowListing(FolderListing listing, bool complete) {
   // The user's choices apply until the folder's own settings change.
   const bool otherView = !found_ && state == FolderState::Listed && listing.chosen != override_;
   if (otherView) UseView(listing.chosen);
+  const bool first = model_.LineCount() == 0;
   model_.SetItems(std::move(listing.items));
   LogEvent(complete ? "listed" : "names", std::to_string(count) + " " + model_.Folder());
-  ShowWanted();
+  ShowWanted(first);
   if (complete) {
     if (!found_) watch_.Watch(model_.Folder());
     factsRead_ = false;
@@ -231,15 +232,17 @@ void BrowserPage::ShowListing(FolderListing listing, bool complete) {
   host_.BrowserChanged();
 }
 
-// Shows the new lines, with the selection, focus and place waited for.
-void BrowserPage::ShowWanted() {
+// Shows the new lines, with the selection, focus and place waited for. `first`: there were none
+// before. Later listings leave it alone that no file has the focus: Delete would take it.
+void BrowserPage::ShowWanted(bool first) {
   Selection& selected = model_.Selected();
   if (wantedNames_) {
     model_.SelectNames(*wantedNames_);
   } else {
     const size_t line = wantedFocus_.empty() ? kNoLine : model_.FindLine(wantedFocus_);
     if (line != kNoLine) selected.SelectOnly(line);
-    if (selected.Focus() == kNoLine && model_.LineCount() > 0) selected.MoveFocus(0, false, true);
+    if (first && selected.Focus() == kNoLine && model_.LineCount() > 0)
+      selected.MoveFocus(0, false, true);
   }
   ShowLines();
   const bool placed = wantedNames_ || !wantedFocus_.empty() || wantedScroll_ >= 0;

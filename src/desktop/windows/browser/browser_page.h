@@ -131,7 +131,7 @@ class BrowserPage : public wxPanel {
   void EnterFolder(const std::string& folder);
   void ShowEntered();
   void ShowListing(FolderListing listing, bool complete);
-  void ShowWanted();
+  void ShowWanted(bool first);
   void ShowProblem(const std::string& problem);
   void OfferThumbnails();
   void StartFacts();
