@@ -128,9 +128,11 @@ TEST(Frame, ColorDependsOnOptionTerminalAndEnvironment) {
     bool terminal;
     const char* noColor;
     bool colored;
+    const char* term = "xterm";
   } rows[] = {
       {"pipe", {}, false, nullptr, false},
       {"terminal", {}, true, nullptr, true},
+      {"terminal without colors", {}, true, nullptr, false, "dumb"},
       {"NO_COLOR", {}, true, "1", false},
       {"NO_COLOR empty", {}, true, "", true},
       {"never", {"--color=never"}, true, nullptr, false},
@@ -138,7 +140,8 @@ TEST(Frame, ColorDependsOnOptionTerminalAndEnvironment) {
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
-    const ScopedEnvironment environment("NO_COLOR", row.noColor);
+    const ScopedEnvironment term("TERM", row.term);
+    const ScopedEnvironment noColor("NO_COLOR", row.noColor);
     std::vector<std::string> arguments{"info", "/missing.bmp"};
     arguments.insert(arguments.end(), row.options.begin(), row.options.end());
     const CommandResult result = RunCommand(arguments, {.interactive = row.terminal});
