@@ -2,6 +2,7 @@
 
 #include <wx/defs.h>
 
+#include "desktop/windows/view/view_file_commands.h"
 #include "desktop/windows/view/view_frame.h"
 #include "texts/texts.h"
 
@@ -27,7 +28,7 @@ void Turn(ViewFrame& view) {
 }
 template <int key>
 void Tag(ViewFrame& view) {
-  view.TagByKey(key);
+  TagByKey(view, key);
 }
 template <int32_t Settings::*setting>
 constexpr auto Switch = SwitchSetting<ViewFrame, setting>;
@@ -63,15 +64,15 @@ constexpr KeyCommand<ViewFrame> kCommands[] = {
     {TrLater("In&formation"),      "I",         {'I'},                           Of<&ViewFrame::ToggleOverlay>},
     {TrLater("Apply color pro&file"), "M",    {'M'},                           Switch<&Settings::ViewModeColorProfiles>, IsOn<&Settings::ViewModeColorProfiles>},
     {TrLater("Check&erboard behind transparency"), "B", {'B'},                   Switch<&Settings::ViewModeCheckerboard>, IsOn<&Settings::ViewModeCheckerboard>},
-    {TrLater("G&et info..."),      "Alt+Enter", {},                              Of<&ViewFrame::ShowInfoWindow>},
-    {TrLater("Edit EXIF..."),      "E",         {'E'},                           Of<&ViewFrame::EditExif>},
+    {TrLater("G&et info..."),      "Alt+Enter", {},                              ShowInfoOf},
+    {TrLater("Edit EXIF..."),      "E",         {'E'},                           EditExifOf},
     {nullptr, nullptr, {}, nullptr},
     {TrLater("Rotate &left"),      "L",         {'L'},                           Turn<Orientation::QuarterLeft>},
     {TrLater("Rotate &right"),     "R",         {'R'},                           Turn<Orientation::QuarterRight>},
     {TrLater("Flip horizontally"), "H",       {'H'},                           Turn<Orientation::MirrorAcross>},
     {TrLater("Flip vertically"), "V",       {'V'},                           Turn<Orientation::MirrorDown>},
-    {TrLater("Crop..."),           "C",         {'C'},                           Of<&ViewFrame::CropPicture>},
-    {TrLater("Edit..."),           "F4",        {WXK_F4},                        Of<&ViewFrame::EditPicture>},
+    {TrLater("Crop..."),           "C",         {'C'},                           CropFileOf},
+    {TrLater("Edit..."),           "F4",        {WXK_F4},                        EditFileOf},
     {TrLater("Sa&ve rotated picture"), "Ctrl+S", {WXK_CONTROL_S},             Of<&ViewFrame::SaveTurned>},
     {TrLater("&Undo"),             "Ctrl+Z",    {WXK_CONTROL_Z},                 Of<&ViewFrame::Undo>},
     {TrLater("Redo"),              "Ctrl+Y",    {WXK_CONTROL_Y},                 Of<&ViewFrame::Redo>},
@@ -86,10 +87,10 @@ constexpr KeyCommand<ViewFrame> kCommands[] = {
     {TrLater("Yellow"),            "7",         {'7', WXK_NUMPAD7},              Tag<'7'>},
     {TrLater("Green"),             "8",         {'8', WXK_NUMPAD8},              Tag<'8'>},
     {TrLater("Blue"),              "9",         {'9', WXK_NUMPAD9},              Tag<'9'>},
-    {TrLater("Co&mment..."),       "T",         {'T'},                           Of<&ViewFrame::Comment>},
+    {TrLater("Co&mment..."),       "T",         {'T'},                           CommentOn},
     {nullptr, nullptr, {}, nullptr},
     {TrLater("&Delete"),           "Del",       {WXK_DELETE},                    Of<&ViewFrame::DeleteFile>},
-    {TrLater("&Copy picture"),     "Ctrl+C",    {WXK_CONTROL_C},                 Of<&ViewFrame::CopyPicture>},
+    {TrLater("&Copy picture"),     "Ctrl+C",    {WXK_CONTROL_C},                 CopyPictureOf},
     {TrLater("&Close"),            "Esc",       {WXK_ESCAPE, WXK_RETURN, WXK_NUMPAD_ENTER}, Of<&ViewFrame::Leave>},
 };
 // clang-format on

@@ -1,7 +1,5 @@
 #include "desktop/windows/view/view_frame.h"
 
-#include <wx/clipbrd.h>
-#include <wx/textdlg.h>
 #include <wx/weakref.h>
 
 #include <algorithm>
@@ -9,23 +7,17 @@
 
 #include "batch/picture_failure.h"
 #include "catalog/history/file_history.h"
-#include "core/text.h"
-#include "desktop/models/browser/item_tags.h"
-#include "desktop/models/drawing/rgb_image.h"
 #include "desktop/models/shell/event_log.h"
-#include "desktop/windows/edit/crop_frame.h"
-#include "desktop/windows/edit/edit_frame.h"
+#include "desktop/models/view/view_status.h"
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/history/use_recorder.h"
-#include "desktop/windows/info/info_frame.h"
-#include "desktop/windows/metadata/exif_edit_frame.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/view/animation_bar.h"
 #include "desktop/windows/view/overlay_bar.h"
 #include "desktop/windows/view/view_animation.h"
 #include "desktop/windows/view/view_commands.h"
-#include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/view/view_file_commands.h"
 #include "desktop/windows/widgets/screen_reader.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/clock.h"
@@ -49,10 +41,10 @@ ViewFrame::ViewFrame(Shell& shell, const std::vector<std::string>& list, const s
     : wxFrame(&shell.Window(), wxID_ANY, Label("View"), wxDefaultPosition, wxDefaultSize,
               wxDEFAULT_FRAME_STYLE, "FotomillProfessionalView"),
       shell_(shell),
+      list_(list, file),
       pointerTimer_(this),
       slideshow_({.busy = [this] { return animation_->MustFinish(); },
                   .show = [this](size_t place) { GoTo(place); }}) {
-  TakeList(list, file);
   SetSize(shell.Window().GetSize());
   const WindowCalls::Post post = calls_.Poster();
   loader_ = std::make_unique<ViewLoader>(
@@ -120,36 +112,25 @@ ViewFrame::~ViewFrame() {
 
 // --- choosing pictures ---
 
-void ViewFrame::TakeList(const std::vector<std::string>& list, const std::string& file) {
-  list_ = list;
-  place_ = static_cast<size_t>(std::ranges::find(list_, file) - list_.begin());
-  if (place_ < list_.size()) return;
-  list_ = {file};
-  place_ = 0;
-}
-
 void ViewFrame::ShowList(const std::vector<std::string>& list, const std::string& file) {
   slideshow_.Stop();
-  TakeList(list, file);
+  list_ = ViewList(list, file);
   StartAfresh();
   canvas_->SetFocus();
 }
 
 ViewRequest ViewFrame::RequestOf(size_t place) const {
   const wxSize size = canvas_->DeviceSize();
-  return {list_[place], place == place_ ? page_ : 0, size.x, size.y};
+  return {list_.Files()[place], place == list_.Place() ? page_ : 0, size.x, size.y};
 }
 
-void ViewFrame::Step(int files) {
-  const int64_t count = static_cast<int64_t>(list_.size());
-  const int64_t place = (static_cast<int64_t>(place_) + files % count + count) % count;
-  GoTo(static_cast<size_t>(place));
-}
+void ViewFrame::Step(int files) { GoTo(list_.PlaceAfter(files)); }
 
 void ViewFrame::GoTo(size_t place) {
-  if (place >= list_.size() || (place == place_ && page_ == 0 && canvas_->Picture() != nullptr))
+  if (place >= list_.Count() ||
+      (place == list_.Place() && page_ == 0 && canvas_->Picture() != nullptr))
     return;
-  place_ = place;
+  list_.GoTo(place);
   StartAfresh();
 }
 
@@ -196,7 +177,7 @@ bool ViewFrame::AskForPicture() {
   keyTime_ = platform::MonotonicSeconds();
   WantPictures();
   canvas_->SetNote({});
-  const ViewPicturePointer ready = loader_->Find(RequestOf(place_));
+  const ViewPicturePointer ready = loader_->Find(RequestOf(list_.Place()));
   if (ready == nullptr) return false;
   ShowPicture(ready);
   ReloadIfChanged();
@@ -212,7 +193,7 @@ void ViewFrame::ReloadIfChanged() {
       },
       [this, picture = loaded_](bool changed) {
         if (!changed || saving_ || loaded_ != picture) return;
-        loader_->Forget(list_[place_]);
+        loader_->Forget(list_.File());
         loaded_.reset();
         const bool samePixels = std::exchange(tagged_, false) && page_ == 0;
         if (!samePixels || turn_ != Orientation::Upright) return StartAfresh();
@@ -222,7 +203,7 @@ void ViewFrame::ReloadIfChanged() {
 
 // Shows the browser's thumbnail, if any, until the picture is loaded.
 void ViewFrame::ShowStandIn() {
-  const ThumbnailPointer thumbnail = shell_.Thumbnails().FindAny(list_[place_]);
+  const ThumbnailPointer thumbnail = shell_.Thumbnails().FindAny(list_.File());
   PackedImage image;
   if (thumbnail == nullptr || thumbnail->pixels.Empty() ||
       ToPacked(thumbnail->pixels, image) != Status::Ok)
@@ -236,49 +217,38 @@ void ViewFrame::ShowStandIn() {
   canvas_->ShowStandIn(std::move(image), width, height);
 }
 
-// Requests this picture, then the slideshow's next one, then two in each direction.
 void ViewFrame::WantPictures() {
   if (loader_ == nullptr || canvas_ == nullptr) return;
   std::vector<ViewRequest> requests;
-  const auto want = [&](size_t place) {
-    ViewRequest request = RequestOf(place);
-    const auto same = [&](const ViewRequest& other) { return other.SamePicture(request); };
-    if (std::none_of(requests.begin(), requests.end(), same))
-      requests.push_back(std::move(request));
-  };
-  want(place_);
-  if (const auto upcoming = slideshow_.Upcoming(); upcoming && *upcoming < list_.size())
-    want(*upcoming);
-  const int64_t count = static_cast<int64_t>(list_.size());
-  for (const int64_t step : {1, -1, 2, -2}) {
-    want(static_cast<size_t>(((static_cast<int64_t>(place_) + step) % count + count) % count));
-  }
+  for (const size_t place : list_.PlacesToLoad(slideshow_.Upcoming()))
+    requests.push_back(RequestOf(place));
   loader_->Want(std::move(requests));
 }
 
 void ViewFrame::PictureCame() {
   if (IsCurrent(loaded_)) return;
-  if (const ViewPicturePointer ready = loader_->Find(RequestOf(place_))) ShowPicture(ready);
+  if (const ViewPicturePointer ready = loader_->Find(RequestOf(list_.Place()))) ShowPicture(ready);
 }
 
 void ViewFrame::ShowProgress(const std::string& path, int percent) {
-  if (settings.ShowProgressWhenViewing == 0 || path != list_[place_] || IsCurrent(loaded_)) return;
+  if (settings.ShowProgressWhenViewing == 0 || path != list_.File() || IsCurrent(loaded_)) return;
   loadedPercent_ = percent;
   LogEvent("view-progress", std::to_string(percent) + " " + path);
   ViewChanged();
 }
 
 void ViewFrame::ShowPicture(ViewPicturePointer picture) {
-  LogEvent("view", "place=" + std::to_string(place_ + 1) + "/" + std::to_string(list_.size()) +
-                       " page=" + std::to_string(page_ + 1) + " status=" + std::to_string(StatusNumber(picture->status)) +
-                       " ms=" + std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)) +
-                       " file=" + list_[place_]);
-  if (picture->picture != nullptr) shell_.Uses().Note({FileUse{list_[place_], FileFunction::View}});
+  LogEvent("view",
+           "place=" + PlaceText() + " page=" + std::to_string(page_ + 1) +
+               " status=" + std::to_string(StatusNumber(picture->status)) + " ms=" +
+               std::to_string(std::lround((platform::MonotonicSeconds() - keyTime_) * 1000)) +
+               " file=" + list_.File());
+  if (picture->picture != nullptr) shell_.Uses().Note({FileUse{list_.File(), FileFunction::View}});
   loaded_ = std::move(picture);
   ShowNote();
   ShowTurned();
   animation_->Begin(loaded_);
-  slideshow_.ShownAt(place_, list_.size());
+  slideshow_.ShownAt(list_.Place(), list_.Count());
   if (shown_) shell_.Window().CallAfter(std::exchange(shown_, nullptr));
 }
 
@@ -302,13 +272,10 @@ void ViewFrame::WhenShown(std::function<void()> shown) {
 }
 
 bool ViewFrame::UseList(const std::vector<std::string>& list) {
-  const auto found = std::ranges::find(list, list_[place_]);
-  if (found == list.end()) return false;
-  place_ = static_cast<size_t>(found - list.begin());
-  list_ = list;
+  if (!list_.Replace(list)) return false;
   WantPictures();
   ViewChanged();
-  LogEvent("view-list", std::to_string(place_ + 1) + "/" + std::to_string(list_.size()));
+  LogEvent("view-list", PlaceText());
   return true;
 }
 
@@ -332,7 +299,11 @@ ViewPicturePointer ViewFrame::Turned(const ViewPicturePointer& picture) const {
 }
 
 bool ViewFrame::IsCurrent(const ViewPicturePointer& picture) const {
-  return picture != nullptr && picture->request.SamePicture(RequestOf(place_));
+  return picture != nullptr && picture->request.SamePicture(RequestOf(list_.Place()));
+}
+
+std::string ViewFrame::PlaceText() const {
+  return std::to_string(list_.Place() + 1) + "/" + std::to_string(list_.Count());
 }
 
 // --- showing ---
@@ -350,32 +321,21 @@ void ViewFrame::LogPaint() {
 }
 
 std::string ViewFrame::StatusLine() const {
-  std::string line = Tr("%1 of %2", place_ + 1, ThousandsText(list_.size()));
   const ViewPicturePointer& shown = canvas_->Picture();
-  if (!IsCurrent(shown))
-    return line + ", " +
-           (loadedPercent_ > 0 ? Tr("loading, %1%...", loadedPercent_) : Tr("loading..."));
-  if (shown->picture == nullptr) return line + ", " + shown->problem;
-  const PictureRecord& picture = *shown->picture;
-  line += ", " + SizeAndZoom(picture, canvas_->Zoom());
-  if (turn_ != Orientation::Upright) line += std::string(", ") + Tr("rotated, not saved");
-  if (animation_->Active()) {
-    line += ", " + animation_->StatusText();
-  } else if (picture.pageCount > 1) {
-    line += ", " + Tr("page %1 of %2", page_ + 1, picture.pageCount);
-  }
-  if (const std::string tags = TagText(shown->tags.rating, shown->tags.label);
-      !tags.empty())
-    line += ", " + tags;
-  for (const std::string& note : {note_, MisnamedRemark(picture)}) {
-    if (!note.empty()) line += (line.ends_with('.') ? " " : ". ") + note;
-  }
-  return line;
+  return ViewStatusText({.place = list_.Place(),
+                         .count = list_.Count(),
+                         .picture = IsCurrent(shown) ? shown.get() : nullptr,
+                         .loadedPercent = loadedPercent_,
+                         .zoom = canvas_->Zoom(),
+                         .page = page_,
+                         .turned = turn_ != Orientation::Upright,
+                         .animation = animation_->Active() ? animation_->StatusText() : "",
+                         .note = note_});
 }
 
 // File name, status bar text, camera facts.
 std::vector<std::string> ViewFrame::OverlayLines() const {
-  std::vector<std::string> lines = {std::string(platform::FileNameOf(list_[place_])), StatusLine()};
+  std::vector<std::string> lines = {std::string(platform::FileNameOf(list_.File())), StatusLine()};
   const ViewPicturePointer& shown = canvas_->Picture();
   if (IsCurrent(shown)) lines.insert(lines.end(), shown->photo.begin(), shown->photo.end());
   return lines;
@@ -384,7 +344,7 @@ std::vector<std::string> ViewFrame::OverlayLines() const {
 void ViewFrame::ViewChanged() {
   if (canvas_ == nullptr || GetStatusBar() == nullptr) return;  // during construction
   const std::string line = StatusLine();
-  const wxString name = Shown(platform::FileNameOf(list_[place_]));
+  const wxString name = Shown(platform::FileNameOf(list_.File()));
   const wxString title = turn_ == Orientation::Upright
                              ? Label("%1 - View", name)
                              : Label("%1 (rotated, not saved) - View", name);
@@ -393,7 +353,7 @@ void ViewFrame::ViewChanged() {
   // Do not announce a number that changes many times per second.
   if (!animation_->Playing()) ReportToScreenReader(*canvas_, name, Shown(line));
   canvas_->SetOverlay(overlay_ ? OverlayLines() : std::vector<std::string>());
-  overlayBar_->SetFiles(list_, place_);
+  overlayBar_->SetFiles(list_.Files(), list_.Place());
 }
 
 void ViewFrame::ToggleFullScreen() {
@@ -412,22 +372,14 @@ void ViewFrame::HidePointerLater() {
 void ViewFrame::ToggleSlideshow() {
   if (slideshow_.Running()) return slideshow_.Stop();
   if (!IsFullScreen()) ToggleFullScreen();
-  slideshow_.Start(place_, list_.size());
-  slideshow_.ShownAt(place_, list_.size());
+  slideshow_.Start(list_.Place(), list_.Count());
+  slideshow_.ShownAt(list_.Place(), list_.Count());
 }
 
 void ViewFrame::ChooseSlideshow() {
   slideshow_.Stop();
   if (slideshow_.Choose(*this)) ToggleSlideshow();
 }
-
-void ViewFrame::ShowInfoWindow() { (new InfoFrame(shell_, this, {list_[place_]}))->Show(); }
-
-void ViewFrame::EditPicture() { (new EditFrame(shell_, {list_[place_]}, nullptr))->Show(); }
-
-void ViewFrame::CropPicture() { (new CropFrame(shell_, {list_[place_]}))->Show(); }
-
-void ViewFrame::EditExif() { (new ExifEditFrame(shell_, this, {list_[place_]}))->Show(); }
 
 void ViewFrame::ToggleOverlay() {
   overlay_ = !overlay_;
@@ -445,12 +397,12 @@ void ViewFrame::SettingSwitched() {
 void ViewFrame::Leave() {
   slideshow_.Stop();
   if (IsFullScreen()) return ToggleFullScreen();
-  if (BrowserPage* browser = shell_.Tabs().Front()) browser->FocusPath(list_[place_]);
+  if (BrowserPage* browser = shell_.Tabs().Front()) browser->FocusPath(list_.File());
   Close();
 }
 
 void ViewFrame::DeleteFile() {
-  const std::string path = list_[place_];
+  const std::string path = list_.File();
   shell_.Files().TrashFromView(this, path, [self = wxWeakRef<ViewFrame>(this), path] {
     if (self) self->FileGone(path);
   });
@@ -458,22 +410,17 @@ void ViewFrame::DeleteFile() {
 
 void ViewFrame::FileGone(const std::string& path) {
   loader_->Forget(path);
+  const std::string shown = list_.File();
   // The user or a slideshow may have advanced meanwhile.
-  const auto gone = std::ranges::find(list_, path);
-  if (gone == list_.end()) return;
-  const auto place = static_cast<size_t>(gone - list_.begin());
-  list_.erase(gone);
-  if (place != place_) {
-    if (place < place_) --place_;
-    slideshow_.ShownAt(place_, list_.size());
-    return ViewChanged();
-  }
-  if (list_.empty()) {
+  if (!list_.Contains(path)) return;
+  if (list_.Count() == 1) {
     Close();
     return;
   }
-  place_ = std::min(place_, list_.size() - 1);
-  StartAfresh();
+  list_.Remove(path);
+  if (list_.File() != shown) return StartAfresh();
+  slideshow_.ShownAt(list_.Place(), list_.Count());
+  ViewChanged();
 }
 
 // --- turning ---
@@ -482,21 +429,21 @@ void ViewFrame::Turn(Orientation turn) {
   if (saving_ || !IsCurrent(loaded_) || loaded_->picture == nullptr) return wxBell();
   turn_ = Composed(turn_, turn);
   note_.clear();
-  LogEvent("view-turned", std::to_string(static_cast<int>(turn_)) + " " + list_[place_]);
+  LogEvent("view-turned", std::to_string(static_cast<int>(turn_)) + " " + list_.File());
   ShowTurned();
 }
 
 void ViewFrame::SaveTurned() {
   if (saving_ || turn_ == Orientation::Upright)
     return SetStatusText(Label("The picture is unchanged."));
-  const std::string path = list_[place_];
+  const std::string path = list_.File();
   const wxWeakRef<ViewFrame> self(this);
   saving_ =
       shell_.Files().SaveTurned(path, turn_, [self, path](bool done, const std::string& note) {
         if (!self) return;
         self->saving_ = false;
         if (done) self->FilesChanged();
-        if (self->list_[self->place_] == path) self->note_ = note;
+        if (self->list_.File() == path) self->note_ = note;
         self->ViewChanged();
       });
   SetStatusText(saving_ ? Label("Saving...")
@@ -505,23 +452,9 @@ void ViewFrame::SaveTurned() {
 
 // --- tags ---
 
-void ViewFrame::TagByKey(int key) {
-  const bool known = IsCurrent(loaded_);
-  const auto changes = ChangesOfKey(key, known ? loaded_->tags.label : std::string());
-  if (!changes) return;
-  tagged_ = true;
-  shell_.Files().Tag({list_[place_]}, *changes);
-}
+ViewPicturePointer ViewFrame::Loaded() const { return IsCurrent(loaded_) ? loaded_ : nullptr; }
 
-void ViewFrame::Comment() {
-  const std::string path = list_[place_];
-  const wxString old = IsCurrent(loaded_) ? Shown(loaded_->tags.description) : wxString();
-  wxTextEntryDialog dialog(this, Label("Comment for %1:", Shown(platform::FileNameOf(path))),
-                           Label("Comment"), old, wxTextEntryDialogStyle | wxTE_MULTILINE);
-  LogEvent("prompt", "comment");
-  if (dialog.ShowModal() != wxID_OK) return;
-  TagChanges changes;
-  changes.description = Utf8(dialog.GetValue());
+void ViewFrame::TagFile(const std::string& path, const TagChanges& changes) {
   tagged_ = true;
   shell_.Files().Tag({path}, changes);
 }
@@ -537,20 +470,6 @@ void ViewFrame::Undo() {
 
 void ViewFrame::Redo() { shell_.Files().Redo(); }
 
-void ViewFrame::CopyPicture() {
-  const ViewPicturePointer& shown = canvas_->Picture();
-  if (shown == nullptr || shown->picture == nullptr) return;
-  RgbImage pixels;
-  if (PixelsForOthers(*shown, static_cast<Color>(settings.ViewModeBackground), pixels) !=
-      Status::Ok)
-    return wxBell();
-  const wxClipboardLocker clipboard;
-  if (!clipboard || !wxTheClipboard->SetData(new wxBitmapDataObject(BitmapOf(pixels))))
-    return wxBell();
-  shell_.Uses().NoteAll({shown->request.path}, FileFunction::CopyToClipboard);
-  SetStatusText(Label("The picture was copied to the clipboard."));
-}
-
 // --- keys ---
 
 void ViewFrame::OnKey(wxKeyEvent& event) {
@@ -559,7 +478,7 @@ void ViewFrame::OnKey(wxKeyEvent& event) {
   if (key == WXK_LEFT || key == WXK_UP) return Step(-1);
   if (key == WXK_RIGHT || key == WXK_DOWN) return Step(1);
   if (event.ShiftDown() && key == 'S') return ChooseSlideshow();
-  if (event.AltDown() && key == WXK_RETURN) return ShowInfoWindow();
+  if (event.AltDown() && key == WXK_RETURN) return ShowInfoOf(*this);
   if (event.AltDown() || (event.ShiftDown() && key >= '0' && key <= '9')) return event.Skip();
   // Some letters with Ctrl have the same codes as other keys.
   constexpr int kLettersWithCtrl[] = {'C', 'S', 'Y', 'Z'};

@@ -8,11 +8,16 @@
 #include <string>
 #include <vector>
 
+#include "desktop/models/view/view_list.h"
 #include "desktop/models/view/view_picture.h"
 #include "desktop/windows/view/view_canvas.h"
 #include "desktop/windows/view/view_slideshow.h"
 #include "desktop/windows/widgets/file_question.h"
 #include "desktop/windows/widgets/window_calls.h"
+
+namespace fotomill {
+struct TagChanges;
+}
 
 namespace fotomill::desktop {
 
@@ -43,17 +48,9 @@ class ViewFrame : public wxFrame {
   void ToggleOverlay();    // file and camera facts on top of the picture
   void SettingSwitched();  // after a change of display settings
   void Leave();            // leaves full screen, or else closes the window
-  void CopyPicture();  // to the clipboard, on the view background
-  void DeleteFile();  // moves it to the trash and shows the next one
-  void ShowInfoWindow();        // for the current file
-  void EditPicture();           // in an Edit window
-  void CropPicture();           // in a Crop window
-  void EditExif();              // of the current file
+  void DeleteFile();       // moves it to the trash and shows the next one
   void Turn(Orientation turn);  // turns the view only; nothing is written
   void SaveTurned();            // saves the file as displayed
-  // Changes the tags of the file by a digit key, as in the browser.
-  void TagByKey(int key);
-  void Comment();               // asks for a description
   void Undo();                  // undoes turning the view, or else the last file operation
   void Redo();  // of file operations
   // Call after files were written: reloads the picture if its file has changed.
@@ -63,7 +60,12 @@ class ViewFrame : public wxFrame {
   // Replaces the list of neighbors. False, with no
   // change, if it does not contain the current file.
   bool UseList(const std::vector<std::string>& list);
-  size_t LastPlace() const { return list_.size() - 1; }  // index in the list, from 0
+  // Changes the tags of a file; the picture stays on the screen meanwhile.
+  void TagFile(const std::string& path, const TagChanges& changes);
+  Shell& Owner() { return shell_; }
+  const std::string& File() const { return list_.File(); }  // the current one
+  ViewPicturePointer Loaded() const;                        // that of the current file, or null
+  size_t LastPlace() const { return list_.Count() - 1; }    // index in the list, from 0
   ViewCanvas& Canvas() { return *canvas_; }              // for zooming and moving
 
  private:
@@ -81,9 +83,9 @@ class ViewFrame : public wxFrame {
   ViewRequest RequestOf(size_t place) const;
   bool IsCurrent(const ViewPicturePointer& picture) const;
   std::string StatusLine() const;
+  std::string PlaceText() const;
   std::vector<std::string> OverlayLines() const;
   void HidePointerLater();
-  void TakeList(const std::vector<std::string>& list, const std::string& file);
   void BuildCanvas();
   void BuildMenus();
   void ShowNote();
@@ -95,8 +97,7 @@ class ViewFrame : public wxFrame {
   ViewPicturePointer Turned(const ViewPicturePointer& picture) const;
 
   Shell& shell_;
-  std::vector<std::string> list_;
-  size_t place_ = 0;
+  ViewList list_;
   int32_t page_ = 0;
   Orientation turn_ = Orientation::Upright;  // of the view relative to the file
   ViewPicturePointer loaded_;                // unturned, as in the file
