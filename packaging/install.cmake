@@ -35,7 +35,7 @@ endif()
 
 # Examples for plug-in authors.
 install(FILES ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin.h ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin_kit.h
-              ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin_exports.h
+              ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin_exports.h ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin_light.h
               ${PROJECT_SOURCE_DIR}/samples/plugin/pnm.c ${PROJECT_SOURCE_DIR}/plugins/qoi/qoi.c
         DESTINATION ${CMAKE_INSTALL_DATADIR}/doc/fotomill/examples COMPONENT plugins)
 

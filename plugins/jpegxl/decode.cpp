@@ -28,6 +28,10 @@ struct Reading {
   int32_t next = 0;  // frame
 };
 
+bool IsSame(const FmwFile& one, const FmwFile& other) {
+  return one.size == other.size && memcmp(one.bytes, other.bytes, one.size) == 0;
+}
+
 std::unique_ptr<Reading>& Kept() {
   static std::unique_ptr<Reading> reading;
   return reading;
@@ -136,7 +140,7 @@ int32_t Read(const char* fileName, const FMW_READ_REQUEST* request, FmwBitmap* b
   if (error != 0) return error;
   const bool dcOnly = IsDcEnough(reading->bytes, request->wantedSide);
   if (!dcOnly && page > 0 && Kept() != nullptr && Kept()->next == page &&
-      Kept()->bytes.IsSame(reading->bytes)) {
+      IsSame(Kept()->bytes.file, reading->bytes.file)) {
     reading = std::move(Kept());
   } else {
     error = Start(*reading, page, dcOnly);

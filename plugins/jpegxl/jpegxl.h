@@ -37,17 +37,7 @@ inline Runner NewRunner() {
       nullptr, std::min<size_t>(JxlThreadParallelRunnerDefaultNumWorkerThreads(), 8)));
 }
 
-// A file in memory, freed with it.
-struct Bytes {
-  FmwFile file = {nullptr, 0};
-  Bytes() = default;
-  ~Bytes() { free(file.bytes); }
-  Bytes(const Bytes&) = delete;
-  Bytes& operator=(const Bytes&) = delete;
-  bool IsSame(const Bytes& other) const {
-    return file.size == other.file.size && memcmp(file.bytes, other.file.bytes, file.size) == 0;
-  }
-};
+using Bytes = FmwOwnedFile;
 
 // The error of a decoder that has stopped before it was done.
 int32_t ErrorOf(JxlDecoderStatus status);

@@ -220,4 +220,15 @@ static inline void FmwSetUpright(uint8_t* exif, size_t size) {
   }
 }
 
+#ifdef __cplusplus
+/* A whole file that is freed with the object. */
+struct FmwOwnedFile {
+  FmwFile file = {nullptr, 0};
+  FmwOwnedFile() = default;
+  ~FmwOwnedFile() { free(file.bytes); }
+  FmwOwnedFile(const FmwOwnedFile&) = delete;
+  FmwOwnedFile& operator=(const FmwOwnedFile&) = delete;
+};
+#endif
+
 #endif

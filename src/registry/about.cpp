@@ -86,6 +86,7 @@ constexpr Row kRows[] = {
     {"libheif", nullptr, "LGPL-3.0-or-later", "2017-2023 Dirk Farin and others", TrLater("HEIC, in a plug-in")},
     {"libjxl", nullptr, "BSD-3-Clause", "the JPEG XL Project Authors", TrLater("JPEG XL, in a plug-in")},
     {"OpenJPEG", nullptr, "BSD-2-Clause", "2002-2014 Universite catholique de Louvain and others", TrLater("JPEG 2000, in a plug-in")},
+    {"OpenEXR", nullptr, "BSD-3-Clause", "the contributors to the OpenEXR project", TrLater("OpenEXR, in a plug-in")},
     {"librsvg", nullptr, "LGPL-2.1-or-later", "the librsvg contributors", TrLater("SVG, in a plug-in")},
     {"libarchive", nullptr, "BSD-2-Clause", "2003-2018 Tim Kientzle", nullptr},
     {"lcms2", "lcms2", "MIT", "1998-2023 Marti Maria Saguer", TrLater("color profiles")},

@@ -59,6 +59,7 @@ constexpr SignatureOfRow kWithoutCodec[] = {
     {"DDS",  {0, "DDS "sv, "DDS"}},
     {"EXR",  {0, "\x76\x2f\x31\x01"sv, "OpenEXR"}},
     {"HDR",  {0, "#?RADIANCE"sv, "Radiance HDR"}},
+    {"HDR",  {0, "#?RGBE"sv, "Radiance HDR"}},
     {"PDF",  {0, "%PDF-"sv, "PDF"}},
     {"EPS",  {0, "%!PS"sv, "PostScript"}},
     {"EPS",  {0, "\xc5\xd0\xd3\xc6"sv, "EPS"}},

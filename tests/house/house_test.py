@@ -41,7 +41,7 @@ FLOOR = {room: floor for floor, rooms in enumerate(FLOORS) for room in rooms}
 # src/platform. The plug-in authors' headers are standalone, so they may check the system, and
 # modules may include nothing else of the program.
 SYSTEM_HEADERS = {"src/plugins/fotomill_plugin.h", "src/plugins/fotomill_plugin_kit.h",
-                  "src/plugins/fotomill_plugin_exports.h"}
+                  "src/plugins/fotomill_plugin_exports.h", "src/plugins/fotomill_plugin_light.h"}
 SYSTEM_FOLDERS = {"src/platform/posix", "src/platform/windows"}
 SYSTEM_HEADER = re.compile(
     r"(sys|linux|net|netinet|arpa|asm)/.*|(unistd|fcntl|dirent|dlfcn|pthread|poll|pwd|grp|termios|"

@@ -76,7 +76,7 @@ constexpr Command kCommands[] = {
     {"archive create",  TrLater("create a ZIP archive, encrypted if you like"),         Needs::Settings, SetUpArchiveCreate},
     {"archive test",    TrLater("verify the checksums of a ZIP or RAR archive"),        Needs::Settings, SetUpArchiveTest},
     {"faces",   TrLater("find faces in pictures"),                                      Needs::Formats,  SetUpFaces},
-    {"plugins", TrLater("list the plug-in formats"),                                    Needs::Settings, SetUpPlugins},
+    {"plugins", TrLater("list the plug-in formats"),                                    Needs::Formats,  SetUpPlugins},
     {"find",    TrLater("find pictures by name, keywords, date and other facts"),       Needs::Formats,  SetUpFind},
     {"similar", TrLater("find pictures that look alike"),                               Needs::Formats,  SetUpSimilar},
     {"verify",  TrLater("decode files completely to find damaged ones"),                Needs::Formats,  SetUpVerify},
