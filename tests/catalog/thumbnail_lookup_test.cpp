@@ -199,6 +199,13 @@ TEST_F(Lookup, UsesTheSystemsThumbnailWhileValid) {
                         folder_.Path("cache/thumbnails/x-large"));
   EXPECT_NE(ReadSystemPicture(picture_, 257), nullptr);
   PutSystemThumbnail(0, FileUri(picture_), 100);
+  std::filesystem::rename(folder_.Path("cache/thumbnails/large"),
+                          folder_.Path("cache/thumbnails/normal"));
+  EXPECT_EQ(ReadSystemPicture(picture_, 128)->width, 100);
+  EXPECT_EQ(ReadSystemPicture(picture_, 129)->width, 200) << "the next larger one";
+  std::filesystem::rename(folder_.Path("cache/thumbnails/normal"),
+                          folder_.Path("cache/thumbnails/large"));
+  PutSystemThumbnail(0, FileUri(picture_), 100);
   ASSERT_TRUE(ReadSystemThumbnail(picture_, 0xabcdef, record));
   EXPECT_THAT(record.StoredRow(38).subspan(37 * 3, 3), testing::ElementsAre(0xab, 0xcd, 0xef));
   EXPECT_THAT(record.StoredRow(38).subspan(38 * 3, 3), testing::Not(testing::ElementsAre(0xab, 0xcd, 0xef)));

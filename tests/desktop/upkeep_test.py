@@ -137,7 +137,7 @@ def thumbnail_files_follow(folder):
     with Desktop(folder, pictures) as desktop:
         desktop.wait(r"offer 2")
         desktop.focus("Fotomill Professional")
-        desktop.key("shift+Tab", "shift+Tab", "Return")
+        desktop.key(*["shift+Tab"] * 4, "Return")
         desktop.wait(r"offer-ended changed")
         desktop.focus("Fotomill Professional")
         desktop.key("Home", "F2")
@@ -155,27 +155,42 @@ def thumbnail_files_follow(folder):
         assert not (pictures / "a.THN").exists()
 
 
-def answer_for_this_tab(folder):
-    """Answer 103 is kept with the tab, in later runs too; another tab asks again."""
+def asked_once(folder):
+    """The offer of thumbnail files comes once: not in other folders, tabs and runs."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.bmp"])
+    make_pictures(pictures / "below", ["c.bmp"])
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"offer 2")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "Return")
+        desktop.wait(r"lines=1 .*listing=0 .*folder=.*below")
+        desktop.wait(r"offer-ended unchanged")
+        desktop.key("ctrl+t")
+        desktop.wait(r"browser tabs=2 .*listing=0")
+        desktop.wait(r"offer-ended unchanged")
+        quit_program(desktop)
+        assert "AskForThumbnails=1" not in (desktop.data / "MyDefaultTabs.fmwtabset").read_text()
+        desktop.arguments = []
+        desktop.start()
+        desktop.wait(r"browser tabs=2 lines=1 .*listing=0")
+        desktop.wait(r"offer-ended unchanged")
+        assert " offer " not in desktop.log_text()
+        assert not list(pictures.rglob("*.THN"))
+
+
+def never_again(folder):
+    """"Never" is the setting."""
     pictures = folder / "pictures"
     make_pictures(pictures, ["a.bmp", "b.bmp"])
     with Desktop(folder, pictures) as desktop:
         desktop.wait(r"offer 2")
         desktop.focus("Fotomill Professional")
-        desktop.key("shift+Tab", "shift+Tab", "shift+Tab", "Down", "Down", "Tab", "Return")
+        desktop.key("shift+Tab", "shift+Tab", "Return")
         desktop.wait(r"offer-ended unchanged")
         quit_program(desktop)
-        assert "AskForThumbnails=0" in (desktop.data / "MyDefaultTabs.fmwtabset").read_text()
-        assert "UpdateThumbnailsFlag=0" not in (
-            desktop.data / "Fotomill Professional 11.ini").read_text()
-        desktop.arguments = []
-        desktop.start()
-        desktop.wait(r"browser tabs=1 lines=2 .*listing=0")
-        desktop.wait(r"offer-ended unchanged")
-        assert " offer 2" not in desktop.log_text()
-        desktop.focus("Fotomill Professional")
-        desktop.key("ctrl+t")
-        desktop.wait(r"offer 2")
+        ini = (desktop.data / "Fotomill Professional 11.ini").read_text()
+        assert "UpdateThumbnailsFlag=0" in ini and "UpdateThumbnailsOptions=104" in ini
 
 
 def folders_without_pictures(folder):
@@ -196,4 +211,4 @@ def folders_without_pictures(folder):
 
 
 run(records_and_history_follow_files, exif_window_is_recorded, history_switched_off,
-    thumbnail_files_follow, answer_for_this_tab, folders_without_pictures)
+    thumbnail_files_follow, asked_once, never_again, folders_without_pictures)

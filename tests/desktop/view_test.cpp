@@ -9,6 +9,7 @@
 #include "catalog/thumbnails/thumbnail_database.h"
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "core/choice_lists.h"
+#include "core/data_folder.h"
 #include "desktop/models/thumbnails/placeholder.h"
 #include "desktop/models/thumbnails/thumbnail_loader.h"
 #include "desktop/models/view/photo_facts.h"
@@ -244,6 +245,46 @@ TEST(Thumbnail, DatabaseModesStoreThumbnails) {
   EXPECT_EQ(std::filesystem::file_size(folder.Path("Fotomill.tdb")), 60u + 3 * 28442u);
   request = {folder.Path("none.bmp"), 1, 1, 96, choice::kLocalDatabase};
   EXPECT_EQ(LoadThumbnail(request)->status, Status::FileOpenError);
+}
+
+// A picture without a thumbnail file is decoded once; what the database cannot show well is made
+// again.
+TEST(Thumbnail, DiskBasedModeKeepsCopies) {
+  const test::TemporaryFolder folder;
+  std::filesystem::create_directory(folder.Path("data"));
+  SetDataFolder(folder.Path("data"));
+  const std::string picture = folder.Path("a.bmp"), small = folder.Path("small.bmp");
+  const auto usual = [](const std::string& path, int32_t side) {
+    return ThumbnailRequest{path, 1, 1, side, choice::kDiskBased};
+  };
+  const auto kept = [&] {
+    KeepThumbnailRecords();
+    std::error_code none;
+    const auto size = std::filesystem::file_size(folder.Path("data/Fotomill.tdb"), none);
+    return none ? 0 : (size - 60) / 28442;
+  };
+  ASSERT_EQ(WritePicture(*test::PatternPicture(60, 30, 24), small, {}), Status::Ok);
+  std::filesystem::copy_file(test::SourcePath("samples/bmp-true-color.bmp"), picture);
+  ThumbnailRequest unkept = usual(picture, 96), faces = unkept, virtually = unkept;
+  unkept.options.keep = false;
+  faces.options.onFacesUnkept = true;
+  virtually.mode = choice::kVirtual;
+  for (const ThumbnailRequest& request : {unkept, faces, virtually, usual(small, 96)}) {
+    EXPECT_FALSE(LoadThumbnail(request)->pixels.Empty());
+    EXPECT_EQ(kept(), 0u);
+  }
+  const RgbImage made = LoadThumbnail(usual(picture, 96))->pixels;
+  EXPECT_EQ(kept(), 1u);
+  std::filesystem::remove(picture);
+  const ThumbnailPointer again = LoadThumbnail(usual(picture, 96));
+  EXPECT_EQ(again->pixels.bytes, made.bytes);
+  ThumbnailRequest standIn = usual(picture, 48), changed = usual(picture, 96);
+  standIn.standIn = true;
+  changed.size = 2;
+  EXPECT_EQ(LoadThumbnail(standIn)->pixels.width, 48);
+  for (const ThumbnailRequest& request : {unkept, faces, changed, usual(picture, 176)})
+    EXPECT_EQ(LoadThumbnail(request)->status, Status::FileOpenError);
+  SetDataFolder({});
 }
 
 // Badges are the same wherever the pixels came from.

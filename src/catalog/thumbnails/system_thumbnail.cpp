@@ -24,7 +24,9 @@ struct CacheFolder {
   const char* name;
   int32_t side;
 };
-constexpr CacheFolder kCacheFolders[] = {{"large", 256}, {"x-large", 512}, {"xx-large", 1024}};
+constexpr CacheFolder kLargeFolder = {"large", 256};
+constexpr CacheFolder kCacheFolders[] = {
+    {"normal", 128}, kLargeFolder, {"x-large", 512}, {"xx-large", 1024}};
 
 std::string CachedFile(const CacheFolder& folder, std::string_view uri) {
   const std::string cache = platform::SpecialFolderPath(platform::SpecialFolder::Cache);
@@ -97,7 +99,7 @@ PicturePointer ReadSystemPicture(const std::string& picturePath, int32_t side) {
 
 bool ReadSystemThumbnail(const std::string& picturePath, Color matte,
                          LargeThumbnailRecord& record) {
-  const PicturePointer picture = ReadCached(picturePath, kCacheFolders[0]);
+  const PicturePointer picture = ReadCached(picturePath, kLargeFolder);
   return picture != nullptr && MakeLargeThumbnailRecord(record, *picture, matte);
 }
 

@@ -57,8 +57,8 @@ Status PixelsOfPicture(PictureRecord& picture, const ThumbnailRequest& request, 
   return ScaleDown(picture.image, request.side, pixels);
 }
 
-// Loads an existing thumbnail. Records are too small for large squares and dense screens; system
-// thumbnails may be large enough.
+// Loads the thumbnail stored where the mode says. Records are too small for large squares and dense
+// screens.
 bool ReadReady(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   const bool large = request.side > kSmallThumbnailSide;
   if (request.side <= kLargeThumbnailSide) {
@@ -71,6 +71,25 @@ bool ReadReady(const ThumbnailRequest& request, Thumbnail& thumbnail) {
                            *record) &&
            PixelsOfRecord(*record, request, thumbnail.pixels) == Status::Ok;
   }
+  return false;
+}
+
+// Whether thumbnails that belong in files are also kept in the database of the data folder, as
+// nobody may want the files. The detector of faces looks at pictures again each time.
+bool KeepsCopy(const ThumbnailRequest& request) {
+  return request.mode == choice::kDiskBased && request.options.keep &&
+         !request.options.onFacesUnkept;
+}
+
+// Loads a thumbnail that was made earlier for a picture without a thumbnail file, by this program
+// or by others.
+bool ReadCopy(const ThumbnailRequest& request, Thumbnail& thumbnail) {
+  ThumbnailRecord record;
+  const bool fits = request.side <= kSmallThumbnailSide;
+  if (fits && KeepsCopy(request) &&
+      SharedThumbnailStore().Find(ThumbnailDatabasePath({}), request.path,
+                                  PictureStampOf(request.modified, request.size), record))
+    return PixelsOfRecord(record, request, thumbnail.pixels) == Status::Ok;
   const bool fromSystem = request.mode == choice::kDiskBased && request.options.fromSystem;
   const PicturePointer picture =
       fromSystem ? ReadSystemPicture(request.path, request.side) : nullptr;
@@ -120,17 +139,34 @@ bool Keeps(const ThumbnailRequest& request) {
 int32_t DecodedSide(const ThumbnailRequest& request, bool onFaces) {
   if (Keeps(request) && request.options.quick) return 0;
   return std::max({request.side, onFaces ? kFramingSide : 0,
-                   Keeps(request) ? kSmallThumbnailSide : 0});
+                   Keeps(request) || KeepsCopy(request) ? kSmallThumbnailSide : 0});
+}
+
+void AddToDatabase(const std::string& database, const ThumbnailRequest& request,
+                   const ThumbnailRecord& record) {
+  SharedThumbnailStore().Add(database,
+                             {record, request.path, VolumeKeyFor(request.path), false,
+                              PictureStampOf(request.modified, request.size)},
+                             request.options.hidden);
+}
+
+// Small pictures are shown in their own size, which a record does not have.
+void KeepCopy(const ThumbnailRequest& request, const PictureRecord& picture) {
+  const bool small = std::max(picture.width, picture.height) <= kSmallThumbnailSide;
+  ThumbnailOptions options = request.options;
+  options.quick = false;  // the picture may be decoded in a smaller size
+  ThumbnailRecord record;
+  if (!small && KeepsCopy(request) && MakeThumbnailRecord(record, picture, options))
+    AddToDatabase(ThumbnailDatabasePath({}), request, record);
 }
 
 void KeepRecord(const ThumbnailRequest& request, const PictureRecord& picture) {
   ThumbnailRecord record;
   if (!Keeps(request) || !MakeThumbnailRecord(record, picture, request.options)) return;
-  const PictureStamp stamp = PictureStampOf(request.modified, request.size);
-  if (request.mode == choice::kVirtual) return Listed().Attach(request.path, stamp, record);
-  SharedThumbnailStore().Add(
-      DatabaseForMode(static_cast<choice::ThumbnailMode>(request.mode), request.path),
-      {record, request.path, VolumeKeyFor(request.path), false, stamp}, request.options.hidden);
+  if (request.mode == choice::kVirtual)
+    return Listed().Attach(request.path, PictureStampOf(request.modified, request.size), record);
+  AddToDatabase(DatabaseForMode(static_cast<choice::ThumbnailMode>(request.mode), request.path),
+                request, record);
 }
 
 Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
@@ -149,7 +185,10 @@ Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   if (onFaces)
     RETURN_IF_BAD(FrameOnFaces(*picture, request.options.faces, request.options.onAllFaces));
   RETURN_IF_BAD(PrepareForDisplay(*picture, request.options.matte));
-  if (!thumbnail.partial) KeepRecord(request, *picture);
+  if (!thumbnail.partial) {
+    KeepRecord(request, *picture);
+    KeepCopy(request, *picture);
+  }
   return ScaleDown(picture->image, request.side, thumbnail.pixels);
 }
 
@@ -185,7 +224,7 @@ ThumbnailPointer LoadThumbnail(const ThumbnailRequest& asked) {
     request.size = facts.size;
   }
   auto thumbnail = std::make_shared<Thumbnail>();
-  if (ReadReady(request, *thumbnail)) {
+  if (ReadReady(request, *thumbnail) || ReadCopy(request, *thumbnail)) {
     ReadFacts(request, *thumbnail);
     return thumbnail;
   }

@@ -41,11 +41,12 @@ struct Thumbnail {
 // Shared between cache and windows; immutable.
 using ThumbnailPointer = std::shared_ptr<const Thumbnail>;
 
-// Loads a thumbnail: from LookUpThumbnail, drawn in view size; on dense
-// screens from the system's thumbnails, if allowed; else from the
-// picture. The picture's facts are the same in each case. May take long;
-// called by workers. A stand-in request decodes no picture: it returns
-// the proper thumbnail if available, else the embedded one, else null.
+// Loads a thumbnail: from LookUpThumbnail, drawn in view size. In the disk-based mode, a picture
+// without a thumbnail file has one in the database of the data folder, or among the system's
+// thumbnails. Else the picture is decoded, and the result stored for the next time, as far as the
+// options allow. The picture's facts are the same in each case. May take long; called by workers. A
+// stand-in request decodes no picture: it returns the proper thumbnail if available, else the
+// embedded one, else null.
 ThumbnailPointer LoadThumbnail(const ThumbnailRequest& request);
 
 // Whether files of a format (a row of the registry) can have an embedded thumbnail.

@@ -121,7 +121,7 @@ class BrowserPage : public wxPanel {
   void RestoreScroll(int64_t scroll) { wantedScroll_ = scroll; }
   // Call after Open: this browser is closed if the folder no longer exists.
   void CloseIfMissing() { closesIfMissing_ = true; }
-  // Whether this browser offers to create missing thumbnails.
+  // Whether this browser offers to create missing thumbnail files; it asks only once.
   bool AsksForThumbnails() const { return offer_.Asks(); }
   void SetAsksForThumbnails(bool asks) { offer_.SetAsks(asks); }
 

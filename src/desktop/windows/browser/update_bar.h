@@ -3,17 +3,19 @@
 #include <wx/panel.h>
 
 #include <functional>
+#include <vector>
 
-class wxChoice;
+class wxButton;
 class wxStaticText;
 
 namespace fotomill::desktop {
 
-// The offer to create missing thumbnail files, as a non-modal bar.
+// The offer to create missing thumbnail files, as a line above the list.
 class UpdateBar : public wxPanel {
  public:
   // `answered` receives the choice, 0 if the bar was closed.
   UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answered);
+  // `selected` is the answer of the last time.
   void Ask(int32_t count, int32_t selected);
   // Shows progress instead of a question; closing the bar cancels.
   void Report(const wxString& text);
@@ -21,8 +23,7 @@ class UpdateBar : public wxPanel {
  private:
   const std::function<void(int32_t choice)> answered_;
   wxStaticText* text_ = nullptr;
-  wxChoice* choices_ = nullptr;
-  wxWindow* ok_ = nullptr;
+  std::vector<wxButton*> answers_;  // in the order of kAnswers
 };
 
 }  // namespace fotomill::desktop

@@ -12,7 +12,7 @@ namespace fotomill::desktop {
 UpdateOffer::UpdateOffer(wxWindow* parent, Events events) : events_(std::move(events)) {
   bar_ = new UpdateBar(parent, [this](int32_t choice) {
     if (offer_ != nullptr) offer_->Answer(choice);
-    if (choice == kUpdateNotHere) asks_ = false;
+    if (choice == kUpdateNever) asks_ = true;  // should offers be switched on again
     ShowBar(false);
     events_.answered();
   });
@@ -25,6 +25,8 @@ UpdateOffer::~UpdateOffer() {
 
 void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> files,
                         const BrowserModes& modes) {
+  const ThumbnailUpdateOptions options = ThumbnailUpdateOptionsFromSettings();
+  if (!options.offers) asks_ = true;
   if (offered_) return;
   offered_ = !files.empty();
   ThumbnailBrowser browser;
@@ -33,7 +35,7 @@ void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> file
   browser.mode = static_cast<choice::ThumbnailMode>(modes.thumbnails);
   browser.view = static_cast<choice::ViewMode>(modes.view);
   browser.asks = asks_;
-  browser.options = ThumbnailUpdateOptionsFromSettings();
+  browser.options = options;
   // Drops reports about a folder that was left meanwhile.
   const auto weak = std::make_shared<std::weak_ptr<ThumbnailOffer>>();
   const auto post = [weak](std::function<void()> action) {
@@ -44,6 +46,7 @@ void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> file
   ThumbnailOffer::Events events;
   events.ask = [this, post](int32_t count, int32_t selected) {
     post([this, count, selected] {
+      asks_ = false;  // one question is enough, whatever the answer
       bar_->Ask(count, selected);
       ShowBar(true);
       LogEvent("offer", std::to_string(count));
@@ -56,8 +59,8 @@ void UpdateOffer::Offer(const std::string& folder, std::vector<std::string> file
       LogEvent("scanning", text);
     });
   };
-  events.keep = [](const ThumbnailUpdateOptions& options) {  // whatever the browser shows now
-    wxTheApp->CallAfter([options] { StoreThumbnailUpdate(options); });
+  events.keep = [](const ThumbnailUpdateOptions& chosen) {  // whatever the browser shows now
+    wxTheApp->CallAfter([chosen] { StoreThumbnailUpdate(chosen); });
   };
   events.building = [this, post](size_t done, size_t total) {
     post([this, done, total] {

@@ -43,7 +43,7 @@ class UpdateOffer {
   UpdateBar* bar_;
   std::shared_ptr<ThumbnailOffer> offer_;  // for this folder
   bool offered_ = false;
-  bool asks_ = true;  // false if the user wants no more offers here
+  bool asks_ = true;  // false once the question was shown
 };
 
 }  // namespace fotomill::desktop

@@ -109,8 +109,10 @@ void BrowserTabs::SelectWhenListed(const std::vector<std::string>& files) {
 BrowserPage* BrowserTabs::Open(const std::string& folder) {
   FolderView view{
       {settings.DefaultThumbnailMode, settings.DefaultViewMode, settings.DefaultSortMode}};
-  if (const BrowserPage* browser = Front()) view = browser->Model().View();
+  const BrowserPage* const front = Front();
+  if (front != nullptr) view = front->Model().View();
   auto* page = new BrowserPage(book_, *this, shell_.Thumbnails(), view);
+  if (front != nullptr) page->SetAsksForThumbnails(front->AsksForThumbnails());
   book_->AddPage(page, FolderLabel(folder), true);
   page->Open(folder);
   page->FocusList();
