@@ -103,7 +103,7 @@ Layout LayoutOf(const opj_image_t& image) {
   return layout;
 }
 
-// The samples of a component as 8 bits, at the place of a pixel.
+// The samples of a component as 8 bits, for each pixel.
 class Plane {
  public:
   Plane(const opj_image_comp_t& component, const opj_image_comp_t& first)
@@ -115,18 +115,25 @@ class Plane {
     return component_.data != nullptr && component_.w > 0 && component_.h > 0 &&
            component_.prec >= 1 && component_.prec <= 31;
   }
-  uint8_t At(uint32_t x, uint32_t y) const {
-    const uint32_t column = std::min(x / acrossX_, component_.w - 1);
+  // Writes row y: a sample for each pixel, to every `step`th byte.
+  void CopyRow(uint32_t y, uint32_t width, size_t step, uint8_t* target) const {
     const uint32_t line = std::min(y / acrossY_, component_.h - 1);
+    const int32_t* const samples = component_.data + size_t{line} * component_.w;
+    const uint32_t whole = acrossX_ == 1 ? std::min(width, component_.w) : 0;
+    for (uint32_t x = 0; x < whole; ++x, target += step) *target = ToByte(samples[x]);
+    for (uint32_t x = whole; x < width; ++x, target += step)
+      *target = ToByte(samples[std::min(x / acrossX_, component_.w - 1)]);
+  }
+
+ private:
+  uint8_t ToByte(int32_t sample) const {
+    if (component_.prec == 8) return static_cast<uint8_t>(std::clamp(sample + offset_, 0, 255));
     const int64_t most = (int64_t{1} << component_.prec) - 1;
-    const int64_t value = std::clamp<int64_t>(
-        int64_t{component_.data[size_t{line} * component_.w + column]} + offset_, 0, most);
-    if (component_.prec == 8) return static_cast<uint8_t>(value);
+    const int64_t value = std::clamp<int64_t>(int64_t{sample} + offset_, 0, most);
     return static_cast<uint8_t>(component_.prec > 8 ? value >> (component_.prec - 8)
                                                     : value * 255 / most);
   }
 
- private:
   const opj_image_comp_t& component_;
   uint32_t acrossX_, acrossY_;
   int32_t offset_;
@@ -157,10 +164,9 @@ int32_t ToBitmap(const opj_image_t& image, const FMW_READ_REQUEST* request, FmwB
   if (bitmap.block == nullptr) return FMW_ERROR_MEMORY;
   for (uint32_t y = 0; y < bitmap.height; ++y) {
     uint8_t* pixel = FmwRow(&bitmap, y);
-    for (uint32_t x = 0; x < bitmap.width; ++x, pixel += planes.size()) {
-      for (size_t i = 0; i < planes.size(); ++i) pixel[i] = planes[i].At(x, y);
-      if (layout.yuv) ToRgb(pixel);
-    }
+    for (size_t i = 0; i < planes.size(); ++i)
+      planes[i].CopyRow(y, bitmap.width, planes.size(), pixel + i);
+    for (uint32_t x = 0; layout.yuv && x < bitmap.width; ++x, pixel += planes.size()) ToRgb(pixel);
   }
   return 0;
 }

@@ -222,26 +222,26 @@ static int GrayOf(const uint8_t* color) {
   return (color[2] * 299 + color[1] * 587 + color[0] * 114 + 500) / 1000;
 }
 
-static void WriteRow(FILE* file, const uint8_t* row, const uint8_t* table, int bits, int kind,
-                     uint32_t width) {
-  uint8_t packed = 0;
+/* Converts a row to samples of the file, which fit into `out`: 3 bytes a pixel at most. Returns
+ * their number. */
+static size_t PackRow(const uint8_t* row, const uint8_t* table, int bits, int kind, uint32_t width,
+                      uint8_t* out) {
+  uint8_t* next = out;
   uint32_t x;
   for (x = 0; x < width; ++x) {
     const uint8_t* color = ColorAt(row, table, bits, x);
     if (kind == 6) {
-      putc(color[2], file);
-      putc(color[1], file);
-      putc(color[0], file);
+      *next++ = color[2];
+      *next++ = color[1];
+      *next++ = color[0];
     } else if (kind == 5) {
-      putc(GrayOf(color), file);
+      *next++ = (uint8_t)GrayOf(color);
     } else {
-      if (GrayOf(color) < 128) packed |= (uint8_t)(0x80 >> x % 8);
-      if (x % 8 == 7 || x + 1 == width) {
-        putc(packed, file);
-        packed = 0;
-      }
+      if (x % 8 == 0) *next++ = 0;
+      if (GrayOf(color) < 128) next[-1] |= (uint8_t)(0x80 >> x % 8);
     }
   }
+  return (size_t)(next - out);
 }
 
 /* ---- exports ---- */
@@ -317,14 +317,17 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE 
   const uint8_t* rows = table + (bits == 24 ? 0 : 4u << bits);
   const int kind = KindFor(fileName, bits);
   FILE* file;
+  uint8_t* out;
   uint32_t y;
   if (bits > 24) {
     *error = FMW_ERROR_COLORS;
     return 0;
   }
-  file = fopen(fileName, "wb");
+  out = malloc(3 * (size_t)width);
+  file = out == NULL ? NULL : fopen(fileName, "wb");
   if (file == NULL) {
-    *error = FMW_ERROR_CREATE;
+    *error = out == NULL ? FMW_ERROR_MEMORY : FMW_ERROR_CREATE;
+    free(out);
     return 0;
   }
   fprintf(file, "P%d\n", kind);
@@ -332,12 +335,14 @@ FMW_EXPORT int32_t FMW_CALL PLUGIN11WriteImage(const char* fileName, FMW_HANDLE 
   fprintf(file, kind == 4 ? "%u %u\n" : "%u %u\n255\n", width, height);
   services->progressBegin();
   for (y = 0; y < height; ++y) {
-    WriteRow(file, rows + Stride(width, bits) * (height - 1 - y), table, bits, kind, width);
+    const uint8_t* row = rows + Stride(width, bits) * (height - 1 - y);
+    fwrite(out, 1, PackRow(row, table, bits, kind, width, out), file);
     services->progressStep((int32_t)y, (int32_t)height);
   }
   services->progressEnd();
   if (ferror(file)) *error = FMW_ERROR_WRITE;
   if (fclose(file) != 0) *error = FMW_ERROR_WRITE;
+  free(out);
   return *error == 0;
 }
 
