@@ -18,8 +18,8 @@ namespace fotomill {
 std::string FileUri(std::string_view path);
 
 // Loads the system's thumbnail of a picture, from the first of the folders "normal", "large",
-// "x-large" and "xx-large" (128, 256, 512 and 1024 pixels) suitable for `side` pixels. Null if there
-// is no valid one.
+// "x-large" and "xx-large" (128, 256, 512 and 1024 pixels) suitable for `side` pixels. Null if
+// there is no valid one.
 PicturePointer ReadSystemPicture(const std::string& picturePath, int32_t side);
 
 // Loads the system's thumbnail into a large record. False, with `record` unchanged, if there is no
