@@ -2,7 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include "batch/rewrite/rewrite_run.h"
+#include "batch/rewriting.h"
 #include "files/file_operation.h"
 #include "files/previous_file.h"
 #include "formats/jpeg/jpeg.h"
@@ -84,20 +84,12 @@ TEST(ExifFile, UndoGivesTheOldFileBack) {
                              png = Encode(PngWrite, *PatternPicture(9, 5, 24));
   WriteBytes(folder.Path("a.jpg"), jpeg);
   WriteBytes(folder.Path("b.png"), png);
-  const std::vector<BatchFile> files = {{.name = folder.Path("a.jpg"), .below = {}, .hint = {}},
-                                        {.name = folder.Path("b.png"), .below = {}, .hint = {}}};
   PreviousFiles previous;
-  RewriteFunction function;
-  function.rewrite = [](const std::string& source, const std::string& destination,
-                        const RewriteRequest& request, const WriteOptions& options) {
+  const Rewriter edit = [](const std::string& source, const std::string& destination,
+                           const RewriteRequest& request, const WriteOptions& options) {
     return EditExifFile(source, destination, Artist("Ann Lee"), request, options);
   };
-  function.inPlace = true;
-  function.keepPrevious = [&](const std::string& path) { return previous.Keep(path); };
-  function.replaced = [&](const std::string& path) { previous.Replaced(path); };
-  BatchJob job;
-  ASSERT_EQ(RunRewrite(files, function, job), Status::Ok);
-  EXPECT_FALSE(job.errors);
+  RewriteInPlace({folder.Path("a.jpg"), folder.Path("b.png")}, edit, previous);
   EXPECT_NE(ReadBytes(folder.Path("a.jpg")), jpeg);
   EXPECT_NE(ReadBytes(folder.Path("b.png")), png);
   const FileOperation operation = previous.Operation();

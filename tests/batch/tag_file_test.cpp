@@ -2,7 +2,7 @@
 
 #include <gtest/gtest.h>
 
-#include "batch/rewrite/rewrite_run.h"
+#include "batch/rewriting.h"
 #include "files/file_operation.h"
 #include "files/previous_file.h"
 #include "formats/bmp/bmp.h"
@@ -64,25 +64,18 @@ TEST(TagFile, UndoGivesFilesBackAndRemovesNewSidecars) {
   const std::vector<uint8_t> jpeg = Jpeg(), bmp = Encode(BmpWrite, *PatternPicture(9, 5, 24));
   WriteBytes(folder.Path("a.jpg"), jpeg);
   WriteBytes(folder.Path("b.bmp"), bmp);
-  const std::vector<BatchFile> files = {{.name = folder.Path("a.jpg"), .below = {}, .hint = {}},
-                                        {.name = folder.Path("b.bmp"), .below = {}, .hint = {}}};
+  const std::vector<std::string> paths = {folder.Path("a.jpg"), folder.Path("b.bmp")};
   PreviousFiles previous;
-  RewriteFunction function;
-  function.rewrite = [](const std::string& source, const std::string& destination,
-                        const RewriteRequest& request, const WriteOptions& options) {
+  const Rewriter tag = [](const std::string& source, const std::string& destination,
+                          const RewriteRequest& request, const WriteOptions& options) {
     return TagPictureFile(source, destination, kRequest, request, options);
   };
-  function.inPlace = true;
-  function.keepPrevious = [&](const std::string& path) { return previous.Keep(path); };
-  function.replaced = [&](const std::string& path) { previous.Replaced(path); };
-  BatchJob job;
-  ASSERT_EQ(RunRewrite(files, function, job), Status::Ok);
-  EXPECT_FALSE(job.errors);
+  RewriteInPlace(paths, tag, previous);
   const auto check = [&](bool tagged) {
     EXPECT_EQ(folder.Names().size(), tagged ? 3u : 2u);
     EXPECT_EQ(ReadBytes(folder.Path("a.jpg")) == jpeg, !tagged);
     EXPECT_EQ(ReadBytes(folder.Path("b.bmp")), bmp);
-    for (const BatchFile& file : files) EXPECT_EQ(TagsIn(file.name).rating, tagged ? 4 : 0);
+    for (const std::string& path : paths) EXPECT_EQ(TagsIn(path).rating, tagged ? 4 : 0);
   };
   check(true);
   FileOperation operation = previous.Operation(FileOperationKind::Tag);

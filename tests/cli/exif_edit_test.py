@@ -3,7 +3,6 @@
 stay the same. Also tests wrong usage. $FOTOMILL names the program; FOTOMILL_CORPUS adds real
 pictures."""
 import json
-import os
 import shutil
 import subprocess
 import sys
@@ -13,10 +12,11 @@ from place import Place, check, finish
 
 try:
     from PIL import Image
+
+    from judged_pictures import corpus_pictures, pixels, tags
 except ImportError:
     sys.exit(77)
 
-SUFFIXES = {".jpg", ".jpeg", ".tif", ".tiff", ".png", ".webp", ".wdp", ".hdp"}
 # What follows from any change, or is not a tag; and what a new directory begins with.
 FOLLOWS = {
     "SourceFile",
@@ -36,48 +36,11 @@ def sources(place):
     for suffix in ("jpg", "tif", "png", "webp"):
         picture.save(folder / f"made.{suffix}")
     picture.save(folder / "lossless.webp", lossless=True)
-    corpus = Path(os.environ.get("FOTOMILL_CORPUS") or "/nonexistent")
-    found = sorted(
-        p
-        for p in corpus.rglob("*")
-        if p.suffix.lower() in SUFFIXES
-        and "bad" not in p.parts
-        and b"Raw profile type" not in p.read_bytes()
-    )  # EXIF a second time, in a text
+    # "Raw profile type": EXIF a second time, in a text
+    found = (p for p in corpus_pictures() if b"Raw profile type" not in p.read_bytes())
     for number, path in enumerate(found):
         shutil.copy(path, folder / f"{number:03}-{path.name}")
     return folder
-
-
-def tags(folder):
-    out = subprocess.run(
-        [
-            "exiftool",
-            "-j",
-            "-n",
-            "-G1",
-            "-a",
-            "-u",
-            "-b",
-            "-x",
-            "System:all",
-            "-x",
-            "Composite:all",
-            str(folder),
-        ],
-        stdout=subprocess.PIPE,
-        stderr=subprocess.DEVNULL,
-        check=False,
-    ).stdout
-    return {Path(facts["SourceFile"]).name: facts for facts in json.loads(out or "[]")}
-
-
-def pixels(path):
-    try:
-        with Image.open(path) as picture:
-            return picture.size, picture.tobytes()
-    except Exception:  # whatever Pillow cannot read, it must not read differently afterwards
-        return None
 
 
 def judge(place, command, arguments, expected):

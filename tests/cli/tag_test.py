@@ -14,12 +14,14 @@ from place import Place, bitmap, check, finish
 
 try:
     from PIL import Image, PngImagePlugin
+
+    import judged_pictures
+    from judged_pictures import corpus_pictures, pixels
 except ImportError:
     sys.exit(77)
 if not shutil.which("exiftool"):
     sys.exit(77)
 
-SUFFIXES = {".jpg", ".jpeg", ".tif", ".tiff", ".png", ".webp", ".wdp", ".hdp"}
 CHANGES = ["--rating", "4", "--label", "green", "--keywords", "Seen, Zoë", "--comment", "Bär & Co"]
 # What the changes above may set, with its value; in other places only if it was there.
 NEW = {
@@ -72,6 +74,10 @@ RESOURCES = (
 )
 
 
+def tags(folder):
+    return judged_pictures.tags(folder, "-charset", "iptc=Latin1", "-x", "ExifTool:all")
+
+
 def with_segment(data, marker, payload):
     head = b"\xff" + bytes([marker]) + (len(payload) + 2).to_bytes(2, "big")
     return data[:2] + head + payload + data[2:]
@@ -95,46 +101,9 @@ def sources(place):
     text.add_text("Raw profile type iptc", body, zip=True)
     picture.save(folder / "iptc.png", pnginfo=text)
     picture.save(folder / "iptc.tif", tiffinfo={33723: IPTC, 34377: RESOURCES[-28:]})
-    corpus = Path(os.environ.get("FOTOMILL_CORPUS") or "/nonexistent")
-    found = (p for p in corpus.rglob("*") if p.suffix.lower() in SUFFIXES and "bad" not in p.parts)
-    for number, path in enumerate(sorted(found)):
+    for number, path in enumerate(corpus_pictures()):
         shutil.copy(path, folder / f"{number:03}-{path.name}")
     return folder
-
-
-def tags(folder):
-    out = subprocess.run(
-        [
-            "exiftool",
-            "-j",
-            "-n",
-            "-G1",
-            "-a",
-            "-u",
-            "-b",
-            "-charset",
-            "iptc=Latin1",
-            "-x",
-            "System:all",
-            "-x",
-            "Composite:all",
-            "-x",
-            "ExifTool:all",
-            str(folder),
-        ],
-        stdout=subprocess.PIPE,
-        stderr=subprocess.DEVNULL,
-        check=False,
-    ).stdout
-    return {Path(facts["SourceFile"]).name: facts for facts in json.loads(out or "[]")}
-
-
-def pixels(path):
-    try:
-        with Image.open(path) as picture:
-            return picture.size, picture.tobytes()
-    except Exception:  # whatever Pillow cannot read, it must not read differently afterwards
-        return None
 
 
 def change_everything():
