@@ -138,9 +138,8 @@ void SetUpContactSheet(CLI::App& app, CommandContext& context) {
   AddFlag(app, "--reduce", options->reduce, "Reduce colors if the format supports fewer");
   AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX,
             "Number of parallel jobs (default: 0, one per core)");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
-  AddFlag(app, "--json", options->json,
-          "Print a JSON array of {file, destination, status, message}");
+  AddDryRunAndJson(app, options->dryRun, options->json,
+                   "Print a JSON array of {file, destination, status, message}");
   SetFooter(app,
             "Pages are named Catalog_00001.EXT and so on; PrefixCatalog sets the prefix. Existing files are never replaced.\n"
             "CatalogFontName sets the font of the names.",

@@ -329,9 +329,8 @@ void SetUp(CLI::App& app, CommandContext& context, const std::shared_ptr<Convert
           "Page to convert, from 1; all: every page, into one file if the format holds several");
   AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX,
             "Number of parallel jobs (default: 0, one per core)");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
-  AddFlag(app, "--json", options->json,
-          "Print a JSON array of {file, destination, status, message}");
+  AddDryRunAndJson(app, options->dryRun, options->json,
+                   "Print a JSON array of {file, destination, status, message}");
   context.run = [options, &context] { return RunConvert(*options, context); };
 }
 

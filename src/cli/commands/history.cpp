@@ -7,8 +7,8 @@
 #include "catalog/history/file_history.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
-#include "cli/frame/shown_text.h"
 #include "core/whole_number.h"
+#include "files/file_time_change.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "settings/job_options.h"
@@ -50,7 +50,7 @@ int RunList(const HistoryOptions& options, const CommandContext& context) {
     const FileHistoryEntry entry = FileHistoryAt(i);
     const std::string name(FileFunctionName(entry.function));
     if (!output.IsJson()) {
-      output.Line(TimeText(entry.accessed) + "\t" + name + "\t" + output.Shown(entry.path));
+      output.Line(LocalTimeText(entry.accessed) + "\t" + name + "\t" + output.Shown(entry.path));
       continue;
     }
     Json element;

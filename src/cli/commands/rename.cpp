@@ -140,9 +140,8 @@ void SetUpRename(CLI::App& app, CommandContext& context) {
     Exclude(option, undo);
     Exclude(option, pattern);
   }
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
-  AddFlag(app, "--json", options->json,
-          "Print a JSON array of {file, destination, status, message}");
+  AddDryRunAndJson(app, options->dryRun, options->json,
+                   "Print a JSON array of {file, destination, status, message}");
   SetFooter(app,
             "The names follow the configuration keys that begin with SequentialRename: BaseName, "
             "BaseNumber, Increment,\n"

@@ -334,9 +334,8 @@ void SetUpThumbsMake(CLI::App& app, CommandContext& context) {
   AddFlag(app, "--force", options->force, "Also recreate thumbnails that are current");
   AddNumber(app, "-j,--jobs", options->jobs, "N", 0, 256,
             "Number of parallel jobs (default: 0, one per core)");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
-  AddFlag(app, "--json", options->json,
-          "Print a JSON array of {file, thumbnail, made, status, message}");
+  AddDryRunAndJson(app, options->dryRun, options->json,
+                   "Print a JSON array of {file, thumbnail, made, status, message}");
 }
 
 void SetUpThumbsShow(CLI::App& app, CommandContext& context) {

@@ -104,9 +104,8 @@ void SetUpTouch(CLI::App& app, CommandContext& context) {
                   "Set each file later than the one before, by seconds or as 0:01:30; the first one to "
                   "--at (default: its own time)"),
           taken);
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
-  AddFlag(app, "--json", options->json,
-          "Print a JSON array of {file, before, after, status, message}");
+  AddDryRunAndJson(app, options->dryRun, options->json,
+                   "Print a JSON array of {file, before, after, status, message}");
   SetFooter(app,
             "Prints the old and the new time of each file. Without --taken, --at and --increment, "
             "the FileTime keys apply: FileTimeYear to FileTimeSecond, or now if the year is 0, and "

@@ -11,6 +11,11 @@ CLI::Option* AddFlag(CLI::App& app, const char* names, bool& value, const char* 
   return app.add_flag(names, value, Tr(help));
 }
 
+void AddDryRunAndJson(CLI::App& app, bool& dryRun, bool& json, const char* jsonHelp) {
+  AddFlag(app, "-n,--dry-run", dryRun, "Only show what would be done");
+  AddFlag(app, "--json", json, jsonHelp);
+}
+
 CLI::Option* AddText(CLI::App& app, const char* names, std::string& value, const char* shownAs,
                      const char* help) {
   return app.add_option(names, value, Tr(help))->option_text(shownAs);

@@ -1,10 +1,9 @@
 #include "cli/frame/shown_text.h"
 
 #include <algorithm>
-#include <cstdio>
+#include <cstdint>
 
 #include "core/utf8.h"
-#include "platform/clock.h"
 
 namespace fotomill::cli {
 
@@ -20,14 +19,6 @@ std::string Base64(std::string_view bytes) {
       result += k <= count ? kAlphabet[group >> (18 - 6 * k) & 63] : '=';
   }
   return result;
-}
-
-std::string TimeText(int64_t seconds) {
-  const platform::LocalTime time = platform::LocalTimeOf(seconds);
-  char text[40];
-  std::snprintf(text, sizeof text, "%04d-%02d-%02d %02d:%02d:%02d", time.year, time.month, time.day,
-                time.hour, time.minute, time.second);
-  return text;
 }
 
 std::vector<std::string> WrappedLines(std::string_view text, size_t width) {

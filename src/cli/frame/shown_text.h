@@ -1,6 +1,5 @@
 #pragma once
 
-#include <cstdint>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -11,9 +10,6 @@ namespace fotomill::cli {
 
 // Base64 with padding (RFC 4648, section 4).
 std::string Base64(std::string_view bytes);
-
-// A time in seconds since 1970 as "YYYY-MM-DD HH:MM:SS" in local time.
-std::string TimeText(int64_t seconds);
 
 // Wraps a paragraph at blanks to at most `width` characters per line; longer words get a line of
 // their own.

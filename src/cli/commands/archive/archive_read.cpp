@@ -10,9 +10,9 @@
 #include "cli/commands/archive/archive_options.h"
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
-#include "cli/frame/shown_text.h"
 #include "cli/frame/terminal_prompts.h"
 #include "core/natural_order.h"
+#include "files/file_time_change.h"
 #include "platform/files.h"
 #include "platform/paths.h"
 #include "settings/settings.h"
@@ -96,7 +96,7 @@ void AskPasswordIfNeeded(const CommandContext& context, ResultOutput& output,
 void PutEntry(const ArchiveEntry& entry, ResultOutput& output) {
   const bool folder = entry.facts.kind == RawEntry::Folder;
   if (!output.IsJson()) {
-    output.Line((entry.facts.modified == 0 ? "-" : TimeText(entry.facts.modified)) + "\t" +
+    output.Line((entry.facts.modified == 0 ? "-" : LocalTimeText(entry.facts.modified)) + "\t" +
                 (entry.facts.sizeKnown ? std::to_string(entry.facts.size) : "-") + "\t" +
                 output.Shown(entry.name) + (folder ? "/" : ""));
     return;

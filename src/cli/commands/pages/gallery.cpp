@@ -216,9 +216,8 @@ void SetUpGallery(CLI::App& app, CommandContext& context) {
           "Folder with template.html and gallery.css (default: the built-in theme)");
   AddNumber(app, "-j,--jobs", options->jobs, "N", 0, INT32_MAX,
             "Number of parallel jobs (default: 0, one per core)");
-  AddFlag(app, "-n,--dry-run", options->dryRun, "Only show what would be done");
-  AddFlag(app, "--json", options->json,
-          "Print a JSON array of {file, destination, unchanged, status, message}");
+  AddDryRunAndJson(app, options->dryRun, options->json,
+                   "Print a JSON array of {file, destination, unchanged, status, message}");
   SetFooter(app,
             "The folder works from disk and from any web server. Pictures carry no metadata. A "
             "second build writes only what has changed and deletes pictures that are no longer "
