@@ -29,16 +29,6 @@ namespace {
 
 constexpr int32_t kMostBackups = 1000;  // of one file
 
-// Why a picture cannot be written back; empty if it can.
-std::string Obstacle(const PictureRecord& picture) {
-  if (!CanWrite(FormatRow(picture.formatIndex)))
-    return Tr("Files of this format cannot be written.");
-  if (picture.pageCount > 1) return Tr("The file has several pictures; all but one would be lost.");
-  if (picture.simplified) return Tr("The file has data that would be lost.");
-  if (!picture.warning.empty()) return Tr("The file is damaged, although it can be shown.");
-  return {};
-}
-
 // Edits one file.
 class Editing {
  public:
@@ -65,7 +55,7 @@ class Editing {
     PicturePointer picture;
     if (const Status status = LoadPictureInfo(reading, picture); status != Status::Ok)
       return Fail(status, OpenHint(source_, status));
-    if (std::string obstacle = Obstacle(*picture); !obstacle.empty())
+    if (std::string obstacle = ObstacleToRewriting(*picture); !obstacle.empty())
       return Fail(Status::UnsuitableImage, std::move(obstacle));
     Rectangle area;
     if (FormatRow(picture->formatIndex).turnsWithoutLoss && OnlyCrops(*picture, area)) {
@@ -74,7 +64,7 @@ class Editing {
       if (cropped) return Status::Ok;
     }
     RETURN_IF_BAD(ReadPicture(reading, *picture));
-    if (std::string obstacle = Obstacle(*picture); !obstacle.empty())
+    if (std::string obstacle = ObstacleToRewriting(*picture); !obstacle.empty())
       return Fail(Status::UnsuitableImage, std::move(obstacle));
     RETURN_IF_BAD(TurnUpright(*picture));
     RETURN_IF_BAD(Apply(*picture));

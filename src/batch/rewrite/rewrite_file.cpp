@@ -5,9 +5,19 @@
 #include "batch/picture_failure.h"
 #include "core/byte_writer.h"
 #include "platform/output_file.h"
+#include "registry/registry.h"
 #include "texts/system_reason.h"
 
 namespace fotomill {
+
+std::string ObstacleToRewriting(const PictureRecord& picture) {
+  if (!CanWrite(FormatRow(picture.formatIndex)))
+    return Tr("Files of this format cannot be written.");
+  if (picture.pageCount > 1) return Tr("The file has several pictures; all but one would be lost.");
+  if (picture.simplified) return Tr("The file has data that would be lost.");
+  if (!picture.warning.empty()) return Tr("The file is damaged, although it can be shown.");
+  return {};
+}
 
 Status FileRewrite::Fail(Status status, std::string hint) {
   result.hint = std::move(hint);

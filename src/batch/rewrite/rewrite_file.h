@@ -8,6 +8,7 @@
 #include "containers/file_pieces.h"
 #include "core/status.h"
 #include "core/workers/stop_token.h"
+#include "picture/picture_record.h"
 #include "picture/write_options.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
@@ -15,6 +16,10 @@
 #include "texts/texts.h"
 
 namespace fotomill {
+
+// Why a picture cannot be written back to its file without loss, apart from its pixels, as a
+// sentence; empty if it can.
+std::string ObstacleToRewriting(const PictureRecord& picture);
 
 // The result for one file.
 struct RewrittenFile {

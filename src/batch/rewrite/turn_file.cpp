@@ -46,16 +46,6 @@ bool LookTheSame(const PictureRecord& a, const PictureRecord& b) {
   return true;
 }
 
-// Why a picture cannot be rewritten losslessly, apart from its pixels; empty if it can.
-std::string Obstacle(const PictureRecord& picture) {
-  if (!CanWrite(FormatRow(picture.formatIndex)))
-    return Tr("Files of this format cannot be written.");
-  if (picture.pageCount > 1) return Tr("The file has several pictures; all but one would be lost.");
-  if (picture.simplified) return Tr("The file has data that would be lost.");
-  if (!picture.warning.empty()) return Tr("The file is damaged, although it can be shown.");
-  return {};
-}
-
 // Turns one file.
 class Turning {
  public:
@@ -127,11 +117,11 @@ class Turning {
   }
 
   Status TurnDecoded(PicturePointer picture) {
-    if (std::string obstacle = Obstacle(*picture); !obstacle.empty())
+    if (std::string obstacle = ObstacleToRewriting(*picture); !obstacle.empty())
       return Fail(Status::UnsuitableImage, std::move(obstacle));
     RETURN_IF_BAD(CheckMemory(*picture));
     RETURN_IF_BAD(ReadPicture(Reading(source_), *picture));
-    if (std::string obstacle = Obstacle(*picture); !obstacle.empty())
+    if (std::string obstacle = ObstacleToRewriting(*picture); !obstacle.empty())
       return Fail(Status::UnsuitableImage, std::move(obstacle));
     const Orientation told = OrientationOf(*picture);
     const Orientation turn =

@@ -69,22 +69,29 @@ int64_t ExifDate(const ExifDirectories& exif) {
   return XmpDateNumber(ExifText(exif.exif, kDateTimeOriginal));
 }
 
+void Overlay(std::string& text, std::string_view newer) {
+  if (std::string trimmed = Trimmed(newer); !trimmed.empty()) text = std::move(trimmed);
+}
+
+// The texts that XMP and IPTC have in common, over what is already there.
+template <class Tags>
+void OverlayTexts(const Tags& newer, PictureTags& tags) {
+  Overlay(tags.title, newer.title);
+  Overlay(tags.description, newer.description);
+  Overlay(tags.creator, Joined(newer.creators));
+  Overlay(tags.copyright, newer.copyright);
+  Overlay(tags.sublocation, newer.sublocation);
+  Overlay(tags.city, newer.city);
+  Overlay(tags.state, newer.state);
+  Overlay(tags.country, newer.country);
+  Overlay(tags.countryCode, newer.countryCode);
+}
+
 // What a packet says, over what is already there.
 void OverlayXmp(const XmpTags& xmp, PictureTags& tags) {
-  const auto over = [](std::string& text, const std::string& newer) {
-    if (const std::string trimmed = Trimmed(newer); !trimmed.empty()) text = trimmed;
-  };
-  over(tags.title, xmp.title);
-  over(tags.description, xmp.description);
-  over(tags.creator, Joined(xmp.creators));
-  over(tags.copyright, xmp.copyright);
-  over(tags.sublocation, xmp.sublocation);
-  over(tags.city, xmp.city);
-  over(tags.state, xmp.state);
-  over(tags.country, xmp.country);
-  over(tags.countryCode, xmp.countryCode);
-  over(tags.label, LabelOf(xmp));
-  over(tags.camera, CameraName(Trimmed(xmp.make), Trimmed(xmp.model)));
+  OverlayTexts(xmp, tags);
+  Overlay(tags.label, LabelOf(xmp));
+  Overlay(tags.camera, CameraName(Trimmed(xmp.make), Trimmed(xmp.model)));
   if (const auto rating = RatingOf(xmp)) tags.rating = *rating;
   if (const auto keywords = KeywordsOf(xmp); !keywords.empty()) tags.keywords = keywords;
   for (const std::string* date : {&xmp.taken, &xmp.dateCreated, &xmp.created}) {
@@ -96,31 +103,17 @@ void OverlayXmp(const XmpTags& xmp, PictureTags& tags) {
 }
 
 void OverlayIptc(const IptcTags& iptc, PictureTags& tags) {
-  const auto over = [](std::string& text, const std::string& newer) {
-    if (const std::string trimmed = Trimmed(newer); !trimmed.empty()) text = trimmed;
-  };
-  over(tags.title, iptc.title);
-  over(tags.description, iptc.description);
-  over(tags.creator, Joined(iptc.creators));
-  over(tags.copyright, iptc.copyright);
-  over(tags.sublocation, iptc.sublocation);
-  over(tags.city, iptc.city);
-  over(tags.state, iptc.state);
-  over(tags.country, iptc.country);
-  over(tags.countryCode, iptc.countryCode);
+  OverlayTexts(iptc, tags);
   if (!iptc.keywords.empty()) tags.keywords = iptc.keywords;
 }
 
 void OverlayExif(const ExifDirectories& exif, PictureTags& tags) {
   constexpr uint16_t kDescription = 0x010e, kMaker = 0x010f, kModel = 0x0110, kArtist = 0x013b,
                      kCopyright = 0x8298, kRating = 0x4746;
-  const auto over = [](std::string& text, std::string newer) {
-    if (!newer.empty()) text = std::move(newer);
-  };
-  over(tags.description, ExifText(exif.first, kDescription));
-  over(tags.creator, ExifText(exif.first, kArtist));
-  over(tags.copyright, ExifText(exif.first, kCopyright));
-  over(tags.camera, CameraName(ExifText(exif.first, kMaker), ExifText(exif.first, kModel)));
+  Overlay(tags.description, ExifText(exif.first, kDescription));
+  Overlay(tags.creator, ExifText(exif.first, kArtist));
+  Overlay(tags.copyright, ExifText(exif.first, kCopyright));
+  Overlay(tags.camera, CameraName(ExifText(exif.first, kMaker), ExifText(exif.first, kModel)));
   if (tags.rating == 0) tags.rating = std::min<int32_t>(ExifShort(exif, kRating), 5);
   if (const int64_t date = ExifDate(exif); date != 0) tags.taken = date;
 }
