@@ -5,6 +5,7 @@
 
 #include "cli/commands/exif/exif_edit.h"
 #include "cli/frame/options.h"
+#include "cli/frame/result_output.h"
 #include "metadata/edit/exif_dates.h"
 #include "metadata/edit/gps_place.h"
 #include "metadata/gps.h"
@@ -37,15 +38,24 @@ std::string ReadListedPlace(const std::string& name, GpsPlace& place) {
   return Tr("There is no place \"%1\" in \"%2\".", name, path);
 }
 
-std::string ReadTrack(const std::string& path, GpsTrack& track) {
+// Reads a track; `hint` is the reason for a failure, a sentence.
+Status ReadTrack(const std::string& path, GpsTrack& track, std::string& hint) {
   platform::FileView file;
-  if (!file.Open(path)) return WithReason(Tr("\"%1\" cannot be read.", path));
-  if (track.Parse(file.Bytes()) != Status::Ok) return Tr("\"%1\" is not a GPX track.", path);
-  return track.Empty() ? Tr("\"%1\" has no points with a time.", path) : std::string();
+  if (!file.Open(path)) {
+    hint = ReasonSentence();
+    return Status::FileOpenError;
+  }
+  const Status status = track.Parse(file.Bytes());
+  if (status != Status::Ok) hint = Tr("\"%1\" is not a GPX track.", path);
+  if (status != Status::Ok || !track.Empty()) return status;
+  hint = Tr("\"%1\" has no points with a time.", path);
+  return Status::InformationError;
 }
 
-// Creates the changer for the options. Returns an error message, empty on success.
-std::string MakeChanger(const GpsOptions& options, ExifChanger& changer) {
+// Creates the changer for the options; `track` is read later. Returns an error message, empty on
+// success.
+std::string MakeChanger(const GpsOptions& options, const std::shared_ptr<GpsTrack>& track,
+                        ExifChanger& changer) {
   const int ways = (options.gpx.empty() ? 0 : 1) + (options.at.empty() ? 0 : 1) +
                    (options.place.empty() ? 0 : 1);
   if (ways != 1) return Tr("Choose one of --gpx, --at and --place.");
@@ -54,11 +64,10 @@ std::string MakeChanger(const GpsOptions& options, ExifChanger& changer) {
   if (!options.offset.empty() && !offset)
     return Tr("\"%1\" is not an offset such as +1:30:00.", options.offset);
   if (!options.gpx.empty()) {
-    const auto track = std::make_shared<GpsTrack>();
     changer = [track, offset](const ExifDirectories& old, std::string& reason) {
       return TrackPlace(*track, offset, old, reason);
     };
-    return ReadTrack(options.gpx, *track);
+    return {};
   }
   GpsPlace place;
   std::string wrong;
@@ -93,8 +102,17 @@ void SetUpExifGps(CLI::App& app, CommandContext& context) {
             "fotomill exif gps holiday --in-place --gpx walk.gpx --offset=-2:00");
   context.run = [options, &context] {
     ExifChanger changer;
-    if (const std::string wrong = MakeChanger(*options, changer); !wrong.empty())
+    const auto track = std::make_shared<GpsTrack>();
+    if (const std::string wrong = MakeChanger(*options, track, changer); !wrong.empty())
       return UsageError(context, wrong);
+    std::string hint;
+    const Status status =
+        options->gpx.empty() ? Status::Ok : ReadTrack(options->gpx, *track, hint);
+    if (status != Status::Ok) {
+      ResultOutput output(context, options->rewrite.json);
+      output.FileFailed(options->gpx, status, hint);
+      return output.Finish();
+    }
     return RunExifEdit(options->rewrite, changer, context);
   };
 }
