@@ -31,6 +31,7 @@ constexpr ListFile kLists[] = {
     {"FMWTabHistory.txt", &Settings::TabHistoryMax},
     {"FMWRenameHistory.txt", &Settings::EditListMaximum},
     {"FMWArchiveHistory.txt", &Settings::ArchiveHistoryMax},
+    {"FMWPicturesearchHistory.txt", &Settings::PictureSearchHistoryMax},
 };
 constexpr ListFile kRecentFiles{"FileMenuHistory.txt", &Settings::RecentFilesMaximum};
 

@@ -23,6 +23,8 @@ enum class HistoryList {
   Tabs,         // "FMWTabHistory.txt", TabHistoryMax: folders of closed tabs
   RenameBases,  // "FMWRenameHistory.txt", EditListMaximum: base names of sequential renaming
   Archives,     // "FMWArchiveHistory.txt", ArchiveHistoryMax: folders for extracted files
+  // "FMWPicturesearchHistory.txt", PictureSearchHistoryMax: folders that were searched
+  PictureSearch,
 };
 
 // The valid entries. Empty if the list is missing or cannot be read.
