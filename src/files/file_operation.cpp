@@ -1,11 +1,11 @@
 #include "files/file_operation.h"
 
 #include <algorithm>
-#include <map>
 #include <set>
 
 #include "catalog/thumbnails/picture_changes.h"
 #include "core/text.h"
+#include "files/file_time_change.h"
 #include "files/numbered_name.h"
 #include "files/previous_file.h"
 #include "files/sidecar_moves.h"
@@ -24,6 +24,7 @@ namespace {
 
 constexpr const char* kTaken = TrLater("A file of that name already exists.");
 constexpr const char* kGone = TrLater("It no longer exists.");
+constexpr const char* kChanged = TrLater("It was changed since, so it was left alone.");
 constexpr const char* kNotWritten = TrLater("The copy could not be written; the disk may be full.");
 constexpr const char* kTooDeep = TrLater("The folders are nested too deeply.");
 constexpr int kDeepest = 64;  // of nested folders
@@ -127,8 +128,7 @@ Outcome Restore(const std::string& path) {
 // Restores the previous contents and keeps the current ones in their place.
 Outcome Exchange(const FileStep& step) {
   const bool there = platform::FileExists(step.from);
-  if (step.previous->HasChanged(step.from))
-    return there ? Tr("It was changed since, so it was left alone.") : Tr(kGone);
+  if (step.previous->HasChanged(step.from)) return there ? Tr(kChanged) : Tr(kGone);
   PreviousFile now;
   if (!now.Keep(step.from)) return Tr("There is not enough disk space to keep the current file.");
   DeleteThumbnailFile(step.from);  // it may be newer than the restored file
@@ -143,6 +143,14 @@ Outcome Exchange(const FileStep& step) {
   return {};
 }
 
+// Sets times, unless the file has changed since it got those of `now`.
+Outcome SetTimes(const std::string& path, const platform::FileTimes& now,
+                 const platform::FileTimes& wanted) {
+  const FileTimeChange change = UndoTimes({path, wanted, now}, false);
+  if (change.status == Status::Ok) return {};
+  return change.status == Status::FileOpenError ? Tr(kGone) : change.hint;
+}
+
 Outcome DoStep(FileOperationKind kind, const FileStep& step) {
   switch (kind) {
     case FileOperationKind::Rename:
@@ -152,6 +160,7 @@ Outcome DoStep(FileOperationKind kind, const FileStep& step) {
     case FileOperationKind::Turn:
     case FileOperationKind::Tag:
     case FileOperationKind::Change: return Exchange(step);
+    case FileOperationKind::Times: return SetTimes(step.from, step.oldTimes, step.newTimes);
     case FileOperationKind::Trash: break;
   }
   return TrashOne(step.from);
@@ -178,17 +187,26 @@ Outcome UndoStep(FileOperationKind kind, const FileStep& step) {
     case FileOperationKind::Turn:
     case FileOperationKind::Tag:
     case FileOperationKind::Change: return Exchange(step);
+    case FileOperationKind::Times: return SetTimes(step.from, step.newTimes, step.oldTimes);
     case FileOperationKind::Trash: break;
   }
   return Restore(step.from);
 }
 
-// The sidecars that go along when a file is renamed, moved or copied.
-std::vector<RenamedFile> SidecarsAlong(FileOperationKind kind, const std::string& from,
+// What a run of steps did besides: places where sidecars went or left, so that a step for them is
+// settled; and those that stayed behind.
+struct AlongTheWay {
+  std::set<std::string> settled;
+  std::vector<FileOperationFailure> failures;
+};
+
+// The sidecars and comment files that go along when a file is renamed, moved or copied.
+std::vector<RenamedFile> SidecarsAlong(const FileOperation& operation, const std::string& from,
                                        const std::string& to) {
-  const bool goes = kind == FileOperationKind::Rename || kind == FileOperationKind::Move ||
-                    kind == FileOperationKind::Copy;
-  return goes && platform::IsRegularFile(from) ? SidecarMoves(from, to)
+  const bool goes = operation.kind == FileOperationKind::Rename ||
+                    operation.kind == FileOperationKind::Move ||
+                    operation.kind == FileOperationKind::Copy;
+  return goes && platform::IsRegularFile(from) ? SidecarMoves(from, to, operation.commentExtension)
                                                : std::vector<RenamedFile>();
 }
 
@@ -199,40 +217,66 @@ bool AnyTaken(const std::vector<RenamedFile>& sidecars) {
   });
 }
 
-// A step with the sidecars of its file. `made` are the paths made by the operation so far. Sidecars
-// that stay behind are failures of their own.
-Outcome DoWithSidecars(FileOperationKind kind, const FileStep& step, std::set<std::string>& made,
-                       std::vector<FileOperationFailure>& failures) {
-  std::vector<RenamedFile> sidecars = SidecarsAlong(kind, step.from, step.to);
-  std::erase_if(sidecars, [&](const RenamedFile& one) { return made.contains(one.to); });
+// Removes a file by `remove`, then its sidecars. Returns those that went along.
+std::vector<std::string> RemoveWithSidecars(const std::string& path,
+                                            const std::string& commentExtension,
+                                            Outcome (*remove)(const std::string&), Outcome& outcome,
+                                            AlongTheWay& besides) {
+  std::vector<std::string> sidecars = platform::IsRegularFile(path)
+                                          ? SidecarsOf(path, commentExtension)
+                                          : std::vector<std::string>();
+  outcome = remove(path);
+  if (!outcome.empty()) return {};
+  std::erase_if(sidecars, [&](const std::string& sidecar) {
+    const Outcome along = remove(sidecar);
+    if (!along.empty()) besides.failures.push_back({sidecar, along});
+    return !along.empty();
+  });
+  besides.settled.insert(sidecars.begin(), sidecars.end());
+  return sidecars;
+}
+
+// A step with the sidecars of its file. Notes in the step what went to the trash along with it.
+Outcome DoWithSidecars(const FileOperation& operation, FileStep& step, AlongTheWay& besides) {
+  if (operation.kind == FileOperationKind::Trash) {
+    Outcome outcome;
+    step.along =
+        RemoveWithSidecars(step.from, operation.commentExtension, TrashOne, outcome, besides);
+    return outcome;
+  }
+  std::vector<RenamedFile> sidecars = SidecarsAlong(operation, step.from, step.to);
+  std::erase_if(sidecars, [&](const RenamedFile& one) { return besides.settled.contains(one.to); });
   if (AnyTaken(sidecars)) return Tr(kTaken);
-  Outcome outcome = DoStep(kind, step);
+  Outcome outcome = DoStep(operation.kind, step);
   if (!outcome.empty()) return outcome;
-  if (!step.to.empty()) made.insert(step.to);
+  if (!step.to.empty()) besides.settled.insert(step.to);
   for (const RenamedFile& sidecar : sidecars) {
-    const Outcome along = DoStep(kind, {sidecar.from, sidecar.to});
-    if (along.empty()) made.insert(sidecar.to);
-    if (!along.empty()) failures.push_back({sidecar.from, along});
+    const Outcome along = DoStep(operation.kind, {sidecar.from, sidecar.to});
+    if (along.empty()) besides.settled.insert(sidecar.to);
+    if (!along.empty()) besides.failures.push_back({sidecar.from, along});
   }
   return {};
 }
 
-// Adds the places that sidecars left to `undone`.
-Outcome UndoWithSidecars(FileOperationKind kind, const FileStep& step,
-                         std::set<std::string>& undone,
-                         std::vector<FileOperationFailure>& failures) {
-  const bool copy = kind == FileOperationKind::Copy;
-  const std::vector<RenamedFile> sidecars =
-      copy ? SidecarsAlong(kind, step.from, step.to) : SidecarsAlong(kind, step.to, step.from);
+// Undoes a step; adds the places that sidecars left.
+Outcome UndoWithSidecars(const FileOperation& operation, const FileStep& step,
+                         AlongTheWay& besides) {
+  const bool copy = operation.kind == FileOperationKind::Copy;
+  const std::vector<RenamedFile> sidecars = copy ? SidecarsAlong(operation, step.from, step.to)
+                                                 : SidecarsAlong(operation, step.to, step.from);
   if (!copy && AnyTaken(sidecars)) return Tr(kTaken);
-  Outcome outcome = UndoStep(kind, step);
+  Outcome outcome = UndoStep(operation.kind, step);
   if (!outcome.empty()) return outcome;
   for (const RenamedFile& sidecar : sidecars) {
     if (copy && platform::ExistenceOf(sidecar.to) == platform::Existence::No) continue;
     const Outcome along =
         copy ? RemoveCopy({sidecar.from, sidecar.to}) : MoveOne(sidecar.from, sidecar.to);
-    undone.insert(copy ? sidecar.to : sidecar.from);
-    if (!along.empty()) failures.push_back({copy ? sidecar.to : sidecar.from, along});
+    besides.settled.insert(copy ? sidecar.to : sidecar.from);
+    if (!along.empty()) besides.failures.push_back({copy ? sidecar.to : sidecar.from, along});
+  }
+  for (const std::string& sidecar : step.along) {
+    if (const Outcome along = Restore(sidecar); !along.empty())
+      besides.failures.push_back({sidecar, along});
   }
   return {};
 }
@@ -248,6 +292,7 @@ PictureChange ChangeBy(FileOperationKind kind, const FileStep& step, bool back) 
     case FileOperationKind::Turn:
     case FileOperationKind::Tag:
     case FileOperationKind::Change:
+    case FileOperationKind::Times:
     case FileOperationKind::Trash: break;
   }
   return {step.from};
@@ -267,9 +312,13 @@ void SettleThumbnailFile(FileOperationKind kind, const PictureChange& change) {
 
 }  // namespace
 
+FileStep TimesStep(const ChangedTimes& changed) {
+  return {.from = changed.path, .to = {}, .oldTimes = changed.before, .newTimes = changed.after};
+}
+
 FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::string>& paths,
                                 const std::string& folder, const FileOperationOptions& options) {
-  FileOperation operation{kind, {}};
+  FileOperation operation{kind, {}, options.commentExtension};
   std::set<std::string> planned;
   for (const std::string& path : paths) {
     if (kind == FileOperationKind::Trash) {
@@ -282,7 +331,7 @@ FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::s
     if (target == path)
       target = platform::JoinFolder(folder, options.duplicatePrefix + std::string(name));
     const TakenTest taken = [&](const std::string& candidate) {
-      return planned.contains(candidate) || AnyTaken(SidecarsAlong(kind, path, candidate))
+      return planned.contains(candidate) || AnyTaken(SidecarsAlong(operation, path, candidate))
                  ? platform::Existence::Yes
                  : platform::ExistenceOf(candidate);
     };
@@ -297,40 +346,41 @@ FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::s
 
 FileOperationResult CarryOut(const FileOperation& operation,
                              const FileOperationProgress& progress) {
-  FileOperationResult result{{operation.kind, {}}, {}};
+  FileOperationResult result{{operation.kind, {}, operation.commentExtension}, {}};
   std::vector<PictureChange> changes;
-  std::set<std::string> made;
+  AlongTheWay besides;
   for (size_t i = 0; i < operation.steps.size(); ++i) {
     if (progress && !progress(i, operation.steps.size())) break;
-    if (made.contains(operation.steps[i].to)) continue;  // a sidecar that went along
-    const Outcome outcome =
-        DoWithSidecars(operation.kind, operation.steps[i], made, result.failures);
+    FileStep step = operation.steps[i];
+    if (besides.settled.contains(step.to.empty() ? step.from : step.to)) continue;
+    const Outcome outcome = DoWithSidecars(operation, step, besides);
     if (outcome.empty()) {
-      result.done.steps.push_back(operation.steps[i]);
-      if (operation.kind == FileOperationKind::Copy) NoteCopy(result.done.steps.back());
-      changes.push_back(ChangeBy(operation.kind, operation.steps[i], false));
+      if (operation.kind == FileOperationKind::Copy) NoteCopy(step);
+      changes.push_back(ChangeBy(operation.kind, step, false));
       SettleThumbnailFile(operation.kind, changes.back());
-    } else if (!WentWithPicture(operation.steps[i].from, changes)) {
-      result.failures.push_back({operation.steps[i].from, outcome});
-      result.left.push_back(operation.steps[i]);
+      result.done.steps.push_back(std::move(step));
+    } else if (!WentWithPicture(step.from, changes)) {
+      result.failures.push_back({step.from, outcome});
+      result.left.push_back(std::move(step));
     }
   }
+  result.failures.insert(result.failures.end(), besides.failures.begin(), besides.failures.end());
   MarkChangedRecords(changes);
   return result;
 }
 
 FileOperationResult Revert(const FileOperation& operation, const FileOperationProgress& progress) {
-  FileOperationResult result{{operation.kind, {}}, {}};
+  FileOperationResult result{{operation.kind, {}, operation.commentExtension}, {}};
   std::vector<PictureChange> changes;
-  std::set<std::string> undone;
+  AlongTheWay besides;
   for (size_t i = operation.steps.size(); i > 0; --i) {
     if (progress && !progress(operation.steps.size() - i, operation.steps.size())) break;
     const FileStep& step = operation.steps[i - 1];
-    if (undone.contains(step.to)) {  // a sidecar that went along
+    if (besides.settled.contains(step.to)) {
       result.done.steps.insert(result.done.steps.begin(), step);
       continue;
     }
-    const Outcome outcome = UndoWithSidecars(operation.kind, step, undone, result.failures);
+    const Outcome outcome = UndoWithSidecars(operation, step, besides);
     if (outcome.empty()) {
       result.done.steps.insert(result.done.steps.begin(), step);
       changes.push_back(ChangeBy(operation.kind, step, true));
@@ -340,17 +390,23 @@ FileOperationResult Revert(const FileOperation& operation, const FileOperationPr
       result.left.insert(result.left.begin(), step);
     }
   }
+  result.failures.insert(result.failures.end(), besides.failures.begin(), besides.failures.end());
   MarkChangedRecords(changes);
   return result;
 }
 
 FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
+                                  const FileOperationOptions& options,
                                   const FileOperationProgress& progress) {
   FileOperationResult result{{FileOperationKind::Trash, {}}, {}};
   std::vector<PictureChange> changes;
+  AlongTheWay besides;
+  const auto remove = [](const std::string& path) { return DeleteTree(path, 0); };
   for (size_t i = 0; i < paths.size(); ++i) {
     if (progress && !progress(i, paths.size())) break;
-    const Outcome outcome = DeleteTree(paths[i], 0);
+    if (besides.settled.contains(paths[i])) continue;
+    Outcome outcome;
+    (void)RemoveWithSidecars(paths[i], options.commentExtension, remove, outcome, besides);
     if (!outcome.empty()) {
       if (!WentWithPicture(paths[i], changes)) result.failures.push_back({paths[i], outcome});
       continue;
@@ -359,6 +415,7 @@ FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
     changes.push_back({paths[i]});
     DeleteThumbnailFile(paths[i]);
   }
+  result.failures.insert(result.failures.end(), besides.failures.begin(), besides.failures.end());
   MarkChangedRecords(changes);
   return result;
 }
@@ -390,6 +447,9 @@ std::vector<FileUse> UsesOf(const FileOperation& operation, bool back) {
       case FileOperationKind::Tag:
       case FileOperationKind::Change:
         if (!back) use(step.from, FileFunction::Transform);
+        break;
+      case FileOperationKind::Times:
+        if (!back) use(step.from, FileFunction::FileTime);
         break;
       case FileOperationKind::Trash:
         if (!back) gone(step.from);
@@ -425,82 +485,12 @@ std::string FileOperationName(const FileOperation& operation) {
     case FileOperationKind::Change:
       return named(TrLater("change of %1"),
                    TrCount("change of %1 file", "change of %1 files", count));
+    case FileOperationKind::Times:
+      return named(TrLater("times of %1"), TrCount("times of %1 file", "times of %1 files", count));
     case FileOperationKind::Trash: break;
   }
   return named(TrLater("deletion of %1"),
                TrCount("deletion of %1 file", "deletion of %1 files", count));
-}
-
-void UndoList::Keep(std::vector<FileOperation>& list, FileOperation operation) {
-  if (operation.steps.empty()) return;
-  list.push_back(std::move(operation));
-  Shorten(list);
-}
-
-void UndoList::Shorten(std::vector<FileOperation>& list) const {
-  if (list.size() > most_) list.erase(list.begin(), list.end() - static_cast<ptrdiff_t>(most_));
-}
-
-void UndoList::SetLimit(size_t most) {
-  most_ = most;
-  Shorten(done_);
-  Shorten(undone_);
-}
-
-void UndoList::Add(FileOperation operation) {
-  if (operation.steps.empty()) return;
-  undone_.clear();
-  Keep(done_, std::move(operation));
-}
-
-FileOperation UndoList::PopUndo() {
-  FileOperation operation = std::move(done_.back());
-  done_.pop_back();
-  return operation;
-}
-
-FileOperation UndoList::PopRedo() {
-  FileOperation operation = std::move(undone_.back());
-  undone_.pop_back();
-  return operation;
-}
-
-void UndoList::KeepLast(std::vector<FileOperation>& list, FileOperation operation) const {
-  if (!operation.steps.empty() && list.size() < most_)
-    list.insert(list.begin(), std::move(operation));
-}
-
-void UndoList::NotUndone(FileOperation operation) { KeepLast(done_, std::move(operation)); }
-void UndoList::NotRedone(FileOperation operation) { KeepLast(undone_, std::move(operation)); }
-
-// Contents that were put back are new files, which the operations before and after must know, or
-// they take them for changes by others.
-void UndoList::FollowFiles(const FileOperation& operation) {
-  std::map<std::string, const PreviousFile*> files;
-  for (const FileStep& step : operation.steps) {
-    if (step.previous != nullptr) files.emplace(step.from, step.previous.get());
-  }
-  if (files.empty()) return;
-  for (auto* list : {&done_, &undone_}) {
-    for (FileOperation& other : *list) {
-      for (FileStep& step : other.steps) {
-        const auto found = files.find(step.to.empty() ? step.from : step.to);
-        if (found == files.end()) continue;
-        if (step.previous != nullptr) step.previous->Follow(*found->second);
-        if (step.made.there) found->second->Update(step.made);
-      }
-    }
-  }
-}
-
-void UndoList::Undone(FileOperation operation) {
-  FollowFiles(operation);
-  Keep(undone_, std::move(operation));
-}
-
-void UndoList::Redone(FileOperation operation) {
-  FollowFiles(operation);
-  Keep(done_, std::move(operation));
 }
 
 }  // namespace fotomill

@@ -8,6 +8,8 @@
 #include <vector>
 
 #include "catalog/history/file_history.h"
+#include "files/times_log.h"
+#include "platform/file_times.h"
 #include "platform/held_file.h"
 
 namespace fotomill {
@@ -22,6 +24,7 @@ enum class FileOperationKind {
   Turn,    // the picture in `from` was rotated or flipped
   Tag,     // keywords, ratings and the like were changed in `from`, a picture or its sidecar
   Change,  // the contents of `from` were changed
+  Times,   // the times of `from` were set
 };
 
 class PreviousFile;
@@ -29,17 +32,25 @@ class PreviousFile;
 // One file of an operation; absolute paths.
 struct FileStep {
   std::string from;
-  std::string to;  // empty for Trash, Turn, Tag and Change
+  std::string to;  // empty for Trash, Turn, Tag, Change and Times
   // Turn, Tag, Change: the previous contents; after Revert, those before the undo
   std::shared_ptr<PreviousFile> previous = {};
   // Copy: the state of the new file when it was made; not there: it is a folder
   platform::FileStamp made = {};
+  // Times: those before and after they were set
+  platform::FileTimes oldTimes = {}, newTimes = {};
+  // Trash: the sidecars and the comment file that went along
+  std::vector<std::string> along = {};
 };
+
+// The step for a file whose times were set.
+FileStep TimesStep(const ChangedTimes& changed);
 
 // The steps of one operation, in order.
 struct FileOperation {
   FileOperationKind kind = FileOperationKind::Rename;
   std::vector<FileStep> steps;
+  std::string commentExtension = {};  // as in FileOperationOptions
 };
 
 // Why a step failed.
@@ -62,6 +73,8 @@ struct FileOperationOptions {
   int64_t firstVariant = 1, lastVariant = INT32_MAX;
   // of a copy in the same folder; if empty, adds a number instead
   std::string duplicatePrefix = {};
+  // of text files with comments beside pictures, "photo.jpg.txt"; empty: there are none
+  std::string commentExtension = {};
 };
 
 // Called before each step; return false to stop.
@@ -75,20 +88,21 @@ FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::s
                                 const FileOperationOptions& options = {});
 
 // Performs the steps of an operation. Never replaces a file: a step fails if its destination exists
-// by then. Keeps file times. Sidecars go along with files that are renamed, moved or copied.
-// Thumbnail files follow their pictures or are deleted with them, and
-// database records of pictures that are no longer there are marked as deleted. May take long; any
-// thread.
+// by then. Keeps file times. Sidecars and comment files go along with their pictures; a sidecar
+// that pictures share goes with the last one. Thumbnail files follow their pictures or are deleted
+// with them, and database records of pictures that are no longer there are marked as deleted. May
+// take long; any thread.
 FileOperationResult CarryOut(const FileOperation& operation,
                              const FileOperationProgress& progress = {});
 // Undoes an operation, last step first: files are moved back, outputs and unmodified copies go to
-// the trash.
+// the trash. Times are left alone if the file was changed since.
 FileOperationResult Revert(const FileOperation& operation,
                            const FileOperationProgress& progress = {});
 
-// Permanently deletes files, and folders with their contents, and their thumbnails. The completed
-// steps cannot be undone.
+// Permanently deletes files, and folders with their contents, with their thumbnails, sidecars and
+// comment files. The completed steps cannot be undone.
 FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
+                                  const FileOperationOptions& options = {},
                                   const FileOperationProgress& progress = {});
 
 // Uses to record in the file history after an operation, or with `back` after undoing it: new paths
@@ -97,44 +111,5 @@ std::vector<FileUse> UsesOf(const FileOperation& operation, bool back = false);
 
 // "rename of 12 files", "move of beach.jpg"
 std::string FileOperationName(const FileOperation& operation);
-
-// Undo and redo history, limited in length.
-class UndoList {
- public:
-  explicit UndoList(size_t most) : most_(most) {}  // keeps at most that many operations
-  // Changes the limit, dropping the oldest operations beyond it.
-  void SetLimit(size_t most);
-  // Adds an operation and clears the redo list.
-  // Operations without steps are ignored.
-  void Add(FileOperation operation);
-  bool CanUndo() const { return !done_.empty(); }    // there is an operation to undo
-  bool CanRedo() const { return !undone_.empty(); }  // there is an operation to redo
-  // The next operation to undo, as FileOperationName; empty if none.
-  std::string UndoName() const {
-    return CanUndo() ? FileOperationName(done_.back()) : std::string();
-  }
-  // The next operation to redo; empty if none.
-  std::string RedoName() const {
-    return CanRedo() ? FileOperationName(undone_.back()) : std::string();
-  }
-  // Takes the next operation to undo or redo; return its result with Undone or Redone.
-  FileOperation PopUndo();
-  FileOperation PopRedo();               // as PopUndo; the list must not be empty
-  void Undone(FileOperation operation);  // the steps that were undone; they can be redone
-  void Redone(FileOperation operation);  // the steps that were redone
-  // The steps of an operation that could not be undone, with the previous files they need: undone
-  // again last, so that they are not in the way of others.
-  void NotUndone(FileOperation operation);
-  void NotRedone(FileOperation operation);  // the same for steps that could not be redone
-
- private:
-  void Keep(std::vector<FileOperation>& list, FileOperation operation);
-  void KeepLast(std::vector<FileOperation>& list, FileOperation operation) const;
-  void FollowFiles(const FileOperation& operation);
-  void Shorten(std::vector<FileOperation>& list) const;
-
-  size_t most_;
-  std::vector<FileOperation> done_, undone_;
-};
 
 }  // namespace fotomill

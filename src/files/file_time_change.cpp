@@ -8,6 +8,7 @@
 #include "core/text.h"
 #include "platform/clock.h"
 #include "platform/file_times.h"
+#include "platform/folders.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
 
@@ -35,25 +36,53 @@ std::optional<int64_t> SecondsOfDate(int64_t date) {
   return day.ok() ? platform::SecondsOfLocalTime(time) : std::nullopt;
 }
 
+constexpr int64_t kCoarsest = 2;  // seconds, on FAT
+
 // Whether a file has a time; file systems silently use the nearest one that they can store.
 bool Holds(const std::string& path, int64_t seconds) {
-  constexpr int64_t kCoarsest = 2;  // seconds, on FAT
   const auto time = platform::ModificationTime(path);
   return !time || std::abs(time->seconds - seconds) <= kCoarsest;
 }
 
+// Whether a file with the time `found` may have been given the time `set`. File systems keep
+// nanoseconds, hundredths of a second, or seconds.
+bool IsStoredAs(const platform::ExactTime& found, const platform::ExactTime& set) {
+  constexpr int64_t kNanoseconds = 1'000'000'000, kHundredth = 10'000'000;
+  if (std::abs(found.seconds - set.seconds) > kCoarsest) return false;
+  const int64_t off =
+      (found.seconds - set.seconds) * kNanoseconds + found.nanoseconds - set.nanoseconds;
+  return std::abs(off) < (found.nanoseconds == 0 ? kCoarsest * kNanoseconds : kHundredth);
+}
+
 }  // namespace
+
+// Sets the times of `changed`.
+void FileTimeChanger::Set(FileTimeChange& change) {
+  const ChangedTimes& changed = change.changed;
+  const auto modified =
+      rule_.setsModification ? std::optional(changed.after.modified) : std::nullopt;
+  change.logged = log_ == nullptr || log_->Intend(changed);
+  if (!platform::SetFileTimes(changed.path, changed.after.accessed, modified)) {
+    change.status = Status::ErrorWritingFile;
+    change.hint = ReasonSentence();
+  } else if (modified && !Holds(changed.path, modified->seconds)) {
+    (void)platform::SetFileTimes(changed.path, changed.before.accessed, changed.before.modified);
+    change.status = Status::ErrorWritingFile;
+    change.hint = Tr("The file system cannot store this time.");
+  }
+  if (log_ != nullptr) log_->Settle(change.status == Status::Ok);
+}
 
 FileTimeChange FileTimeChanger::Change(const std::string& path, int64_t taken) {
   FileTimeChange change;
-  const auto before = platform::ModificationTime(path);
-  if (!before || !platform::IsRegularFile(path)) {
+  const auto times = platform::FileTimesOf(path);
+  if (!times || !platform::IsRegularFile(path)) {
     change.status = Status::FileOpenError;
-    change.hint = before ? std::string() : ReasonSentence();
+    change.hint = times ? std::string() : ReasonSentence();
     return change;
   }
-  change.before = *before;
-  int64_t when = rule_.start.value_or(before->seconds);
+  change.before = times->modified;
+  int64_t when = rule_.start.value_or(change.before.seconds);
   if (rule_.taken) {
     const auto date = taken > 0 ? SecondsOfDate(taken) : std::nullopt;
     if (!date) {
@@ -66,22 +95,37 @@ FileTimeChange FileTimeChanger::Change(const std::string& path, int64_t taken) {
     change.status = Status::InformationError;
     return change;
   }
-  change.after = {when, !rule_.taken && !rule_.start ? before->nanoseconds : 0};
-  const auto time = [&](bool set) { return set ? std::optional(change.after) : std::nullopt; };
-  if (!dryRun_ &&
-      !platform::SetFileTimes(path, time(rule_.setsAccess), time(rule_.setsModification))) {
-    change.status = Status::ErrorWritingFile;
+  change.after = {when, !rule_.taken && !rule_.start ? change.before.nanoseconds : 0};
+  change.changed = {platform::AbsolutePath(path), {{}, change.before}, {{}, change.before}};
+  if (rule_.setsAccess) change.changed.before.accessed = times->accessed;
+  if (rule_.setsAccess) change.changed.after.accessed = change.after;
+  if (rule_.setsModification) change.changed.after.modified = change.after;
+  if (!dryRun_) Set(change);
+  if (change.status != Status::Ok) return change;
+  rule_.start = when;
+  begun_ = true;
+  return change;
+}
+
+FileTimeChange UndoTimes(const ChangedTimes& changed, bool dryRun) {
+  FileTimeChange change{.after = changed.before.modified, .changed = changed};
+  const auto now = platform::FileTimesOf(changed.path);
+  if (!now) {
+    change.status = Status::FileOpenError;
     change.hint = ReasonSentence();
     return change;
   }
-  if (!dryRun_ && rule_.setsModification && !Holds(path, when)) {
-    (void)platform::SetFileTimes(path, {}, before);
+  change.before = now->modified;
+  // if it has the old time, the program was ended before it set the new one
+  if (!IsStoredAs(now->modified, changed.after.modified) &&
+      now->modified != changed.before.modified) {
     change.status = Status::ErrorWritingFile;
-    change.hint = Tr("The file system cannot store this time.");
-    return change;
+    change.hint = Tr("It was changed since, so it was left alone.");
+  } else if (!dryRun && !platform::SetFileTimes(changed.path, changed.before.accessed,
+                                                changed.before.modified)) {
+    change.status = Status::ErrorWritingFile;
+    change.hint = ReasonSentence();
   }
-  rule_.start = when;
-  begun_ = true;
   return change;
 }
 

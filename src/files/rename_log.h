@@ -2,11 +2,10 @@
 
 #include <cstdint>
 #include <optional>
-#include <span>
 #include <string>
 #include <vector>
 
-#include "platform/store_file.h"
+#include "files/undo_log.h"
 
 namespace fotomill {
 
@@ -24,35 +23,19 @@ struct RenameHistory {
   std::optional<uint32_t> number;
 };
 
-// Log of the last run's renames, for undo: "FMWRenameUndo.dat" in the data
-// folder. For each file the old path, a NUL, the new path, a NUL; a record
-// with an empty old path has a number instead of the new path. An incomplete
-// record at the end is ignored. Renames are logged before they are done, so
-// that none is lost; readers check which files really have the new name.
-// Concurrent runs share one log, which is locked during each rename.
+// Log of the last run's renames, "FMWRenameUndo.dat": old and new paths; a record with an empty old
+// path has a number instead of the new path. Readers check which files really have the new name.
 class RenameLog {
  public:
-  explicit RenameLog(std::optional<uint32_t> number = {}) : number_(number) {}
+  explicit RenameLog(std::optional<uint32_t> number = {});
 
-  // Logs an upcoming rename and keeps the log locked until Settle. The first call starts a new log,
-  // unless other runs are writing to it. False if it cannot be written.
-  bool Intend(const RenamedFile& file);
-  // Records whether the file was renamed.
-  void Settle(bool renamed);
-  // Locks the log, if there is one, for the lifetime of this object. Intend and Settle then append
-  // to it without unlocking. False if locking fails.
-  bool LockForUndo();
+  // As in UndoLog.
+  bool Intend(const RenamedFile& file) { return log_.Intend({file.from, file.to}); }
+  void Settle(bool renamed) { log_.Settle(renamed); }
+  bool LockForUndo() { return log_.LockForUndo(); }
 
  private:
-  bool LockFile(bool create);
-  bool Begin(bool fresh);
-  bool Append(const RenamedFile& file);
-
-  std::optional<uint32_t> number_;
-  platform::StoreFile file_;
-  uint64_t before_ = 0;  // size without the pending record
-  bool failed_ = false, locked_ = false;
-  bool forUndo_ = false;
+  UndoLog log_;
 };
 
 // nullopt if the log exists but cannot be read.

@@ -3,6 +3,7 @@
 #include <algorithm>
 #include <utility>
 
+#include "catalog/thumbnails/thumbnail_file.h"
 #include "core/text.h"
 #include "metadata/tags/sidecar.h"
 #include "metadata/xmp/xmp_tags.h"
@@ -18,7 +19,8 @@ namespace {
 
 constexpr std::string_view kExtension = ".xmp";
 
-// Whether a folder has other files "photo.*" beside a picture "photo.nef", apart from sidecars.
+// Whether a folder has other files "photo.*" beside a picture "photo.nef", apart from sidecars and
+// thumbnails.
 bool HasNamesakes(const std::string& picture) {
   const platform::PathParts parts = platform::SplitPath(picture);
   const auto entries = platform::ListFolder(platform::FolderOf(picture).empty()
@@ -28,7 +30,8 @@ bool HasNamesakes(const std::string& picture) {
   return std::ranges::any_of(*entries, [&](const platform::FolderEntry& entry) {
     const platform::PathParts other = platform::SplitPath(entry.name);
     return other.base == parts.base && entry.name != platform::FileNameOf(picture) &&
-           !other.extension.empty() && !EqualIgnoringCase(other.extension, kExtension);
+           !other.extension.empty() && !EqualIgnoringCase(other.extension, kExtension) &&
+           !EqualIgnoringCase(other.extension, kThumbnailExtension);
   });
 }
 
@@ -42,18 +45,51 @@ bool GoesWith(const std::string& sidecar, const std::string& picture) {
   return !HasNamesakes(picture);
 }
 
+// The names a picture's sidecars may have, and that of its comment file; the first is always its
+// own, the second may be shared.
+std::vector<std::string> NamesBeside(const std::string& picture,
+                                     const std::string& commentExtension) {
+  std::vector<std::string> names = SidecarNames(picture);
+  if (names.size() < 2) names.emplace_back();
+  names.push_back(commentExtension.empty() ? std::string()
+                                           : CommentFileName(picture, {}, commentExtension));
+  return names;
+}
+
+// Whether the i-th name is that of an existing file that belongs to the picture.
+bool Belongs(const std::vector<std::string>& names, size_t i, const std::string& picture) {
+  if (names[i].empty() || platform::ExistenceOf(names[i]) != platform::Existence::Yes) return false;
+  return i != 1 || GoesWith(names[i], picture);
+}
+
+// Sidecars have none of their own.
+bool IsSidecar(const std::string& path) {
+  return EqualIgnoringCase(platform::SplitPath(path).extension, kExtension);
+}
+
 }  // namespace
 
-std::vector<RenamedFile> SidecarMoves(const std::string& from, const std::string& to) {
+std::vector<RenamedFile> SidecarMoves(const std::string& from, const std::string& to,
+                                      const std::string& commentExtension) {
   std::vector<RenamedFile> moves;
-  // sidecars have none of their own
-  if (EqualIgnoringCase(platform::SplitPath(from).extension, kExtension)) return moves;
-  const std::vector<std::string> old = SidecarNames(from), wanted = SidecarNames(to);
-  for (size_t i = 0; i < std::min(old.size(), wanted.size()); ++i) {
-    if (old[i] == wanted[i] || platform::ExistenceOf(old[i]) != platform::Existence::Yes) continue;
-    if (i == 0 || GoesWith(old[i], from)) moves.push_back({old[i], wanted[i]});
+  if (IsSidecar(from)) return moves;
+  const auto old = NamesBeside(from, commentExtension), wanted = NamesBeside(to, commentExtension);
+  for (size_t i = 0; i < old.size(); ++i) {
+    if (old[i] != wanted[i] && !wanted[i].empty() && Belongs(old, i, from))
+      moves.push_back({old[i], wanted[i]});
   }
   return moves;
+}
+
+std::vector<std::string> SidecarsOf(const std::string& picture,
+                                    const std::string& commentExtension) {
+  std::vector<std::string> found;
+  if (IsSidecar(picture)) return found;
+  const auto names = NamesBeside(picture, commentExtension);
+  for (size_t i = 0; i < names.size(); ++i) {
+    if (Belongs(names, i, picture)) found.push_back(names[i]);
+  }
+  return found;
 }
 
 }  // namespace fotomill

@@ -7,9 +7,16 @@
 
 namespace fotomill {
 
-// The sidecars that go along when a picture is renamed or moved, with their new names; absolute
-// paths if those of the picture are. "photo.nef.xmp" always does. "photo.xmp" does if it names the
-// picture's extension as its own, or else with the last picture of that name, as it may be shared.
-std::vector<RenamedFile> SidecarMoves(const std::string& from, const std::string& to);
+// What goes along with a picture that is renamed or removed, as absolute paths if that of the
+// picture is: "photo.nef.xmp" always; "photo.xmp" if it names the picture's extension as its own,
+// or else with the last picture of that name, as it may be shared; and the comment file
+// "photo.nef.txt", for the extension "txt". No extension: there are no comment files.
+
+// The files that move along when a picture gets a new path, with theirs.
+std::vector<RenamedFile> SidecarMoves(const std::string& from, const std::string& to,
+                                      const std::string& commentExtension = {});
+// The files that are removed with a picture.
+std::vector<std::string> SidecarsOf(const std::string& picture,
+                                    const std::string& commentExtension = {});
 
 }  // namespace fotomill

@@ -14,6 +14,15 @@ namespace fotomill::platform {
 // cannot be expressed, or a field is out of range.
 std::optional<int64_t> SecondsOfLocalTime(const LocalTime& time);
 
+// The times of a file that can be set; those of the access only if they are of interest.
+struct FileTimes {
+  std::optional<ExactTime> accessed = {};
+  ExactTime modified = {};
+};
+// Both times of the file that a path refers to, following links. nullopt, with the reason kept, if
+// it does not exist or permission is denied.
+std::optional<FileTimes> FileTimesOf(const std::string& path);
+
 // Sets the times of the file that a path refers to, following links; nullopt keeps a time. False,
 // with the reason kept, if the system refuses.
 [[nodiscard]] bool SetFileTimes(const std::string& path, std::optional<ExactTime> accessed,

@@ -69,6 +69,7 @@ bool IsHidden(const std::string& path);  // a leading dot, or the hidden attribu
 struct ExactTime {
   int64_t seconds = 0;
   int64_t nanoseconds = 0;
+  bool operator==(const ExactTime&) const = default;
 };
 // Of the file that a path refers to, following links. nullopt or false if it does not exist or
 // permission is denied.

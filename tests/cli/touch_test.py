@@ -29,6 +29,50 @@ def text(seconds):
     return time.strftime("%Y-%m-%d %H:%M:%S", time.localtime(seconds))
 
 
+def undo():
+    """`touch --undo` gives the very times back, but not to files that were changed since."""
+    names = ["a.bmp", "b.bmp", "c.bmp"]
+    with Place(ordinary=True) as place:
+        place.files(*names, time=LONG_AGO * 10**9 + 5)
+        log = place.path / "data" / "FMWTimesUndo.dat"
+
+        def times():
+            return [(place.path / name).stat().st_mtime_ns - LONG_AGO * 10**9 for name in names]
+
+        place.run("touch", *names, "--at", "2024-05-31", "--set", "FileTimeUpdateAccess=1")
+        dry = place.run("touch", "--undo", "--dry-run")
+        check(5 in times(), False, "a dry run")
+        status, out, _ = place.run("touch", "--undo", "b.bmp")
+        line = f"b.bmp: 2024-05-31 00:00:00 -> {text(LONG_AGO)}\n"
+        check((status, out[-len(line):], times()[1]), (0, line, 5), "one file")
+        check((place.path / "b.bmp").stat().st_atime_ns, LONG_AGO * 10**9 + 5, "its access time")
+        check((dry[0], dry[1].count("2024-05-31 00:00:00 -> ")), (0, 3), "a dry run: report")
+        (place.path / "c.bmp").write_bytes(b"new")
+        new = times()[2]
+        status, out, err = place.run("touch", "--undo", "--json")
+        check((status, [row["status"] for row in json.loads(out)]), (1, [11, 0]), "the others")
+        check(("changed since" in err, times()), (True, [5, 5, new]), "a changed file")
+        # the changed one stays in the record, until the next run
+        (place.path / "c.bmp").unlink()
+        check(place.run("touch", "--undo")[0], 1, "a file that is gone")
+        names.pop()
+        place.run("touch", "a.bmp", "a.bmp", "b.bmp", "--increment", "60")
+        check(times()[1] != 5, True, "changed twice")
+        check((place.run("touch", "--undo")[0], times()), (0, [5, 5]), "the first time again")
+        check((log.exists(), place.run("touch", "--undo")[:2]), (False, (0, "")), "nothing left")
+        # ended between the record and the file
+        record = b"%b\0%d 5 %d 0\0" % (os.fsencode(place.path / "a.bmp"), LONG_AGO, LONG_AGO + 50)
+        place.files("data/FMWTimesUndo.dat", contents=record + b"/x\0x\0cut")
+        check((place.run("touch", "--undo")[0], times()), (0, [5, 5]), "never set")
+        for options in (["--at", "now"], ["--taken"], ["--increment", "5"]):
+            check(place.run("touch", "--undo", *options)[0], 2, f"{options} with --undo")
+        log.mkdir()
+        status, _, err = place.run("touch", "--undo")
+        check((status, "cannot be read" in err), (1, True), "an unreadable record")
+        status, _, err = place.run("touch", "a.bmp", "--at", "now")
+        check((status, "--undo" in err), (0, True), "a change without record")
+
+
 def main():
     os.environ["TZ"] = "America/New_York"
     time.tzset()
@@ -74,6 +118,7 @@ def main():
                       (1, True, before), "it keeps its time")
         status, out, _ = place.run("touch", "--json", "none.bmp", "a.bmp", "--at", "2024-05-31")
         check((status, [row["status"] for row in json.loads(out)]), (1, [1, 0]), "missing files")
+    undo()
     with Place() as place:
         if shutil.which("exiftool") and os.path.exists("/usr/bin/python3"):
             made = subprocess.run(["/usr/bin/python3", "-c", "from PIL import Image; import sys\n"

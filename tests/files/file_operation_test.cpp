@@ -5,7 +5,9 @@
 #include "catalog/thumbnails/thumbnail_file.h"
 #include "catalog/thumbnails/thumbnail_store.h"
 #include "core/data_folder.h"
+#include "files/file_time_change.h"
 #include "files/previous_file.h"
+#include "files/undo_list.h"
 #include "platform/files.h"
 #include "support/files.h"
 #include "support/scoped_environment.h"
@@ -90,6 +92,78 @@ TEST_F(FileOperationTest, SidecarsGoAlong) {
     EXPECT_EQ(ReadText(To("a.png.xmp")), "of another");
     std::filesystem::remove(To("a.png.xmp"));
   }
+}
+
+// What goes to the trash with a picture comes back; a shared sidecar goes with the last one.
+TEST_F(FileOperationTest, SidecarsAreRemovedWithTheirPictures) {
+  const FileOperationOptions options{.commentExtension = "txt"};
+  const struct {
+    const char* name;
+    std::vector<std::string> listed;
+    std::vector<std::string> left;  // of a.nef, a.png, a.nef.xmp, a.xmp, a.png.txt, a.THN
+  } rows[] = {
+      {"a shared sidecar stays", {"a.png"}, {"a.THN", "a.nef", "a.nef.xmp", "a.xmp"}},
+      {"its own goes", {"a.nef"}, {"a.THN", "a.png", "a.png.txt", "a.xmp"}},
+      {"all go with the last", {"a.png", "a.nef"}, {"a.THN"}},
+      {"listed themselves", {"a.xmp", "a.nef", "a.nef.xmp"}, {"a.THN", "a.png", "a.png.txt"}},
+  };
+  const auto fill = [&] {
+    std::filesystem::remove_all(folder_.Path("from"));
+    std::filesystem::create_directory(folder_.Path("from"));
+    for (const char* name : {"a.nef", "a.png", "a.nef.xmp", "a.xmp", "a.png.txt", "a.THN"})
+      WriteText(From(name), name);
+  };
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.name);
+    fill();
+    const std::vector<std::string> before = Names("from");
+    std::vector<std::string> paths;
+    for (const std::string& name : row.listed) paths.push_back(From(name));
+    FileOperation operation = PlanFileOperation(FileOperationKind::Trash, paths, {}, options);
+    for (int round = 0; round < 2; ++round) {
+      const FileOperationResult done = CarryOut(operation);
+      EXPECT_THAT(done.failures, IsEmpty());
+      EXPECT_EQ(Names("from"), row.left);
+      operation = Revert(done.done).done;
+      EXPECT_EQ(Names("from"), before);
+      EXPECT_EQ(ReadText(From("a.png.txt")), "a.png.txt");
+    }
+    EXPECT_THAT(DeleteForGood(paths, options).failures, IsEmpty());
+    EXPECT_EQ(Names("from"), row.left);
+  }
+  // without the extension, texts are no comments; a name that was taken meanwhile is not replaced
+  fill();
+  const FileOperationResult done =
+      CarryOut(PlanFileOperation(FileOperationKind::Trash, {From("a.png"), From("a.nef")}, {}));
+  EXPECT_THAT(Names("from"), ElementsAre("a.THN", "a.png.txt"));
+  WriteText(From("a.xmp"), "new");
+  const FileOperationResult undone = Revert(done.done);
+  ASSERT_EQ(undone.failures.size(), 1u);
+  EXPECT_EQ(undone.failures[0].path, From("a.xmp"));
+  EXPECT_EQ(ReadText(From("a.xmp")), "new");
+  EXPECT_TRUE(platform::FileExists(From("a.nef.xmp")));
+}
+
+TEST_F(FileOperationTest, TimesAreUndoneUnlessTheFileWasChanged) {
+  const auto times = [&] { return platform::FileTimesOf(From("a.png")).value(); };
+  const platform::ExactTime old{1'000'000'000, 123'456'789}, access{1'100'000'000, 5};
+  ASSERT_TRUE(platform::SetFileTimes(From("a.png"), access, old));
+  FileTimeChanger changer({.start = 1'000'000'001, .setsAccess = true}, false);
+  const FileTimeChange change = changer.Change(From("a.png"), 0);
+  ASSERT_EQ(change.status, Status::Ok);
+  FileOperation operation{FileOperationKind::Times, {TimesStep(change.changed)}};
+  for (int round = 0; round < 2; ++round) {
+    EXPECT_EQ(times().modified, (platform::ExactTime{1'000'000'001, 0}));
+    operation = Revert(operation).done;
+    ASSERT_EQ(operation.steps.size(), 1u);
+    EXPECT_EQ(times().modified, old);
+    EXPECT_EQ(times().accessed, access);
+    operation = CarryOut(operation).done;
+  }
+  WriteText(From("a.png"), "new");
+  const platform::ExactTime now = times().modified;
+  EXPECT_EQ(Revert(operation).failures.size(), 1u);
+  EXPECT_EQ(times().modified, now);
 }
 
 // Thumbnail files go where their pictures go, and records of what is no longer there are marked.
@@ -181,6 +255,7 @@ TEST_F(FileOperationTest, TellsTheHistoryWhatWasUsed) {
       {"output undone", FileOperationKind::Create, true, "-/to"},
       {"turn", FileOperationKind::Turn, false, "/from 6 "},
       {"turn undone", FileOperationKind::Turn, true, ""},
+      {"times", FileOperationKind::Times, false, "/from 16 "},
       {"trash", FileOperationKind::Trash, false, "-/from"},
       {"trash undone", FileOperationKind::Trash, true, ""},
   };

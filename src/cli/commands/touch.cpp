@@ -1,7 +1,11 @@
 #include "cli/commands/touch.h"
 
+#include <algorithm>
 #include <memory>
+#include <set>
 #include <string>
+#include <utility>
+#include <vector>
 
 #include "cli/frame/options.h"
 #include "cli/frame/result_output.h"
@@ -10,17 +14,22 @@
 #include "files/file_time_change.h"
 #include "metadata/edit/exif_dates.h"
 #include "metadata/tags/picture_tags.h"
+#include "platform/folders.h"
 #include "settings/job_options.h"
+#include "texts/system_reason.h"
 #include "texts/texts.h"
 
 namespace fotomill::cli {
 
 namespace {
 
+constexpr const char* kNotLogged = TrLater("It could not be recorded for --undo.");
+
 struct TouchOptions {
   SelectionOptions selection;
   bool taken = false;
   std::string at, increment;
+  bool undo = false;
   bool dryRun = false;
   bool json = false;
 };
@@ -63,10 +72,52 @@ void Report(ResultOutput& output, const std::string& name, const FileTimeChange&
   }
   if (!known) return output.Failure(name, change.status, change.hint);
   if (!output.IsJson()) output.Line(output.Shown(name) + ": " + before + " -> " + after);
+  if (!change.logged) output.Message(output.Shown(name) + ": " + Tr(kNotLogged));
   output.CountFile();
 }
 
+// Gives the files of the last run their old times, the last one first; with a selection only those
+// in it. What cannot be undone stays in the log.
+int RunUndo(const TouchOptions& options, const CommandContext& context) {
+  Selection chosen;
+  if (!context.names.values.empty() || !options.selection.filesFrom.empty()) {
+    auto selected = SelectFiles(options.selection, context);
+    if (!selected) return kExitUsage;
+    chosen = std::move(*selected);
+  }
+  std::set<std::string> only;
+  for (const SelectedFile& file : chosen.files) only.insert(platform::AbsolutePath(file.name));
+  ResultOutput output(context, options.json);
+  output.KeepGoing();
+  TimesLog lock;
+  auto log = options.dryRun || lock.LockForUndo() ? ReadTimesLog() : std::nullopt;
+  if (!log) {
+    output.Message(std::string("fotomill: ") +
+                   WithReason(Tr("The record of the last changes of file times, in the data "
+                                 "folder, cannot be read.")));
+    return std::max(output.Finish(), static_cast<int>(kExitFailed));
+  }
+  const auto wanted = [&](const ChangedTimes& file) {
+    return only.empty() || only.contains(file.path);
+  };
+  output.Expect(static_cast<size_t>(std::ranges::count_if(*log, wanted)));
+  std::vector<ChangedTimes> left;
+  for (; !log->empty(); log->pop_back()) {
+    const ChangedTimes& file = log->back();
+    bool undone = false;
+    if (wanted(file) && output.GoesOn()) {
+      const FileTimeChange change = UndoTimes(file, options.dryRun);
+      Report(output, file.path, change);
+      undone = change.status == Status::Ok;
+    }
+    if (!undone) left.insert(left.begin(), file);
+  }
+  if (!options.dryRun && !WriteTimesLog(left)) output.Message(WithReason(Tr(kNotLogged)));
+  return output.Finish();
+}
+
 int RunTouch(const TouchOptions& options, const CommandContext& context) {
+  if (options.undo) return RunUndo(options, context);
   FileTimeRule rule;
   const std::string wrong = ReadRule(options, rule);
   if (!wrong.empty()) return UsageError(context, wrong);
@@ -76,7 +127,8 @@ int RunTouch(const TouchOptions& options, const CommandContext& context) {
   output.KeepGoing();
   output.CloseWith(selection->leftOut);
   output.Expect(selection->files.size());
-  FileTimeChanger changer(rule, options.dryRun);
+  TimesLog log;
+  FileTimeChanger changer(rule, options.dryRun, &log);
   const TagSources sources = TagSourcesFromSettings();
   for (const SelectedFile& file : selection->files) {
     if (!output.GoesOn()) break;
@@ -97,13 +149,18 @@ void SetUpTouch(CLI::App& app, CommandContext& context) {
   AddSelection(app, options->selection, context);
   CLI::Option* taken = AddFlag(app, "--taken", options->taken,
                                "Set the time when the picture was taken, by local time");
-  Exclude(AddName(app, "--at", options->at, "TIME",
-                  "Set this local time, as \"2024-05-31 14:03:09\", or now"),
-          taken);
-  Exclude(AddName(app, "--increment", options->increment, "STEP",
-                  "Set each file later than the one before, by seconds or as 0:01:30; the first one to "
-                  "--at (default: its own time)"),
-          taken);
+  CLI::Option* at = AddName(app, "--at", options->at, "TIME",
+                            "Set this local time, as \"2024-05-31 14:03:09\", or now");
+  CLI::Option* increment = AddName(
+      app, "--increment", options->increment, "STEP",
+      "Set each file later than the one before, by seconds or as 0:01:30; the first one to --at "
+      "(default: its own time)");
+  Exclude(at, taken);
+  Exclude(increment, taken);
+  CLI::Option* undo = AddFlag(app, "--undo", options->undo,
+                              "Give the files of the last run, or the named ones of these, their "
+                              "old times again");
+  for (CLI::Option* option : {taken, at, increment}) Exclude(undo, option);
   AddDryRunAndJson(app, options->dryRun, options->json,
                    "Print a JSON array of {file, before, after, status, message}");
   SetFooter(app,

@@ -28,6 +28,16 @@ std::optional<int64_t> SecondsOfLocalTime(const LocalTime& time) {
   return seconds;
 }
 
+std::optional<FileTimes> FileTimesOf(const std::string& path) {
+  struct stat facts = {};
+  if (FaultDue() || stat(path.c_str(), &facts) != 0) {
+    KeepErrno();
+    return std::nullopt;
+  }
+  const auto time = [](const timespec& t) { return ExactTime{t.tv_sec, t.tv_nsec}; };
+  return FileTimes{time(facts.st_atim), time(facts.st_mtim)};
+}
+
 bool SetFileTimes(const std::string& path, std::optional<ExactTime> accessed,
                   std::optional<ExactTime> modified) {
   const auto time = [](const std::optional<ExactTime>& wanted) {

@@ -8,10 +8,13 @@
 namespace fotomill::desktop {
 
 FileOperationOptions FileOperationOptionsFromSettings() {
+  // those in a folder of their own may belong to pictures of other folders
+  const bool beside = settings.FileCommentPath.view().empty();
   return {
       .firstVariant = settings.NumberedVariantMin,
       .lastVariant = settings.NumberedVariantMax,
-      .duplicatePrefix = std::string(NewBatchJob().naming.PrefixOf(PrefixedFunction::Duplicate))};
+      .duplicatePrefix = std::string(NewBatchJob().naming.PrefixOf(PrefixedFunction::Duplicate)),
+      .commentExtension = std::string(beside ? settings.TextCommentExtension.view() : "")};
 }
 
 size_t UndoLimitFromSettings() {

@@ -4,7 +4,8 @@
 
 namespace fotomill::desktop {
 
-// From the current NumberedVariantMin, NumberedVariantMax, PrefixDuplicate and FilenameUnderbars.
+// From the current NumberedVariantMin, NumberedVariantMax, PrefixDuplicate, FilenameUnderbars,
+// TextCommentExtension and FileCommentPath.
 FileOperationOptions FileOperationOptionsFromSettings();
 // How many operations can be undone: UndoLevels.
 size_t UndoLimitFromSettings();

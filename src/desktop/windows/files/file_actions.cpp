@@ -194,7 +194,8 @@ void FileActions::Trash(const std::vector<std::string>& paths) { Trash(paths, {}
 void FileActions::Trash(const std::vector<std::string>& paths, const Asker& asker) {
   if (paths.empty()) return;
   const auto noTrash = std::make_shared<bool>(false);
-  const FileOperation operation = PlanFileOperation(FileOperationKind::Trash, paths, {});
+  const FileOperation operation = 
+      PlanFileOperation(FileOperationKind::Trash, paths, {}, FileOperationOptionsFromSettings());
   std::string what = FileOperationName(operation);
   what[0] = static_cast<char>(what[0] - 'a' + 'A');
   Run(
@@ -243,7 +244,9 @@ void FileActions::Delete(const std::vector<std::string>& paths, const Asker& ask
   if (dialog.ShowModal() != wxID_OK) return;
   Run(
       Tr("Permanent deletion"),
-      [paths](const FileOperationProgress& progress) { return DeleteForGood(paths, progress); },
+      [paths, options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
+        return DeleteForGood(paths, options, progress);
+      },
       [this, asker, count = paths.size()](FileOperationResult result) {
         Took(result.done, false);
         if (asker.gone && result.done.steps.size() == count) asker.gone();
@@ -275,7 +278,8 @@ void FileActions::Rename(const std::string& path, const std::string& name) {
 
 void FileActions::RenameAll(std::vector<FileStep> steps) {
   if (steps.empty()) return;
-  FileOperation operation{FileOperationKind::Rename, std::move(steps)};
+  FileOperation operation{FileOperationKind::Rename, std::move(steps),
+                          FileOperationOptionsFromSettings().commentExtension};
   Run(
       Tr("Rename"),
       [operation](const FileOperationProgress& progress) { return CarryOut(operation, progress); },
@@ -329,7 +333,7 @@ void FileActions::Undo() {
       [this](FileOperationResult result) {
         Took(result.done, true);
         SelectResults(result.done, true);
-        undo_.NotUndone({result.done.kind, std::move(result.left)});
+        undo_.NotUndone({result.done.kind, std::move(result.left), result.done.commentExtension});
         undo_.Undone(std::move(result.done));
       });
 }
@@ -343,7 +347,7 @@ void FileActions::Redo() {
       [this](FileOperationResult result) {
         Took(result.done, false);
         SelectResults(result.done, false);
-        undo_.NotRedone({result.done.kind, std::move(result.left)});
+        undo_.NotRedone({result.done.kind, std::move(result.left), result.done.commentExtension});
         undo_.Redone(std::move(result.done));
       });
 }

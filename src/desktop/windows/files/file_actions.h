@@ -11,6 +11,7 @@
 
 #include "core/workers/background_task.h"
 #include "files/file_operation.h"
+#include "files/undo_list.h"
 #include "metadata/tags/tag_edit.h"
 #include "processing/geometry/orient.h"
 
