@@ -1,5 +1,5 @@
-// Changes to hostile files of every form, and removal: what comes out has what was put in, and a
-// second run finds nothing to do. The first byte chooses the change.
+// Changes of EXIF and tags to hostile files of every form, and removal: what comes out has what was
+// put in, and a second run finds nothing to do. The first byte chooses the change.
 
 #include <algorithm>
 #include <cstdlib>
@@ -9,6 +9,7 @@
 #include "metadata/edit/exif_input.h"
 #include "metadata/edit/picture_edit.h"
 #include "metadata/edit/strip.h"
+#include "metadata/tags/tag_edit.h"
 
 namespace {
 
@@ -61,6 +62,20 @@ void Strip(std::span<const uint8_t> file, uint8_t choice) {
   if (StripPlaces(file, made, reason) == Status::Ok) (void)MetadataLeft(made.Joined());
 }
 
+void Tag(std::span<const uint8_t> file, uint8_t choice) {
+  TagChanges changes{.addedKeywords = {"a", "b & c"}};
+  if (choice & 1) changes.rating = choice >> 5;
+  if (choice & 2) changes.description = "lake";
+  if (changes.rating && *changes.rating > 5) changes.rating = -1;
+  FilePieces made, again;
+  bool changed = false;
+  std::string reason;
+  if (EditPictureTags(file, changes, made, changed, reason) != Status::Ok || !changed) return;
+  const std::vector<uint8_t> bytes = made.Joined();
+  Expect(MetadataFormOf(bytes) == MetadataFormOf(file));
+  Expect(EditPictureTags(bytes, changes, again, changed, reason) == Status::Ok && !changed);
+}
+
 }  // namespace
 
 extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
@@ -68,6 +83,7 @@ extern "C" int LLVMFuzzerTestOneInput(const uint8_t* data, size_t size) {
   const std::vector<uint8_t> file(data + 1, data + size);
   Edit(file, data[0]);
   Strip(file, data[0]);
+  Tag(file, data[0]);
   (void)MetadataLeft(file);
   return 0;
 }

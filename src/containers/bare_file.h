@@ -44,5 +44,13 @@ Status MakeBareWebp(std::span<const uint8_t> file, const BareOptions& options,
                     std::vector<uint8_t>& bare);
 Status MakeBareTiff(std::span<const uint8_t> file, const BareOptions& options,
                     std::vector<uint8_t>& bare);
+// Repetitions are kept; comments if `texts` is on.
+Status MakeBareGif(std::span<const uint8_t> file, const BareOptions& options,
+                   std::vector<uint8_t>& bare);
+// Layers are part of the picture, with whatever they contain.
+Status MakeBarePsd(std::span<const uint8_t> file, const BareOptions& options,
+                   std::vector<uint8_t>& bare);
+// Whether a resource is always kept there; the profile is not.
+bool IsPsdPictureResource(uint16_t number);
 
 }  // namespace fotomill

@@ -21,7 +21,8 @@ struct MetadataBlocks {
   std::optional<std::vector<uint8_t>> exif = {};  // starting at the byte order
   std::optional<std::vector<uint8_t>> xmp = {};   // the packet
   // JPEG: the resources of the first APP13 segment with Photoshop's data; PNG: the data of the zTXt
-  // chunk that replaces the first "Raw profile type" of IPTC. Not added, and ignored elsewhere.
+  // chunk that replaces the first "Raw profile type" of IPTC; Photoshop: all resources, before
+  // `exif` and `xmp` are put there. Not added, and ignored elsewhere.
   std::optional<std::vector<uint8_t>> iptc = {};
 };
 
@@ -46,5 +47,14 @@ std::vector<uint8_t> MakePngXmpChunk(std::span<const uint8_t> packet);
 Status FindWebpMetadata(std::span<const uint8_t> file, MetadataViews& views);
 Status RewriteWebp(std::span<const uint8_t> file, const MetadataBlocks& blocks, FilePieces& made,
                    std::string& reason);
+// GIF has no EXIF. A file of the older version becomes one of 1989 with its first XMP.
+Status FindGifMetadata(std::span<const uint8_t> file, MetadataViews& views);
+Status RewriteGif(std::span<const uint8_t> file, const MetadataBlocks& blocks, FilePieces& made,
+                  std::string& reason);
+Status FindPsdMetadata(std::span<const uint8_t> file, MetadataViews& views);
+Status RewritePsd(std::span<const uint8_t> file, const MetadataBlocks& blocks, FilePieces& made,
+                  std::string& reason);
+// The resources of a Photoshop file; empty if there are none that can be found.
+std::span<const uint8_t> PsdResources(std::span<const uint8_t> file);
 
 }  // namespace fotomill

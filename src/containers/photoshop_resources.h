@@ -11,6 +11,9 @@ namespace fotomill {
 inline constexpr std::string_view kPhotoshopHead("Photoshop 3.0\0", 14);  // of the segments
 inline constexpr uint16_t kIptcResource = 0x0404;
 inline constexpr uint16_t kIptcDigestResource = 0x0425;  // MD5 of the IPTC data, 16 bytes
+inline constexpr uint16_t kProfileResource = 0x040F;     // ICC
+inline constexpr uint16_t kExifResource = 0x0422;        // starting at the byte order
+inline constexpr uint16_t kXmpResource = 0x0424;
 
 struct PhotoshopResource {
   uint16_t number = 0;

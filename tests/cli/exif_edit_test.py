@@ -13,7 +13,7 @@ from place import Place, check, finish
 try:
     from PIL import Image
 
-    from judged_pictures import corpus_pictures, pixels, tags
+    from judged_pictures import corpus_pictures, pixels, save_gif, save_psd, tags
 except ImportError:
     sys.exit(77)
 
@@ -347,13 +347,61 @@ def remove_for_good():
             )
         status, _, err = place.run("exif", "strip", "t.jpg", "--in-place", "--keep", "gsp")
         check((status, 'Did you mean "gps"?' in err), (2, True), "an unknown word")
-        (place.path / "x.gif").write_bytes(b"GIF89a")
-        status, _, err = place.run("exif", "strip", "x.gif", "--in-place")
+        place.files("x.bmp")
+        status, _, err = place.run("exif", "strip", "x.bmp", "--in-place")
         check(
             (status, "Unsupported format. Metadata can be removed from" in err),
             (1, True),
             "another format",
         )
+
+
+def strip_gif_and_psd():
+    """All but the picture goes, and what is kept stays the same bytes."""
+    with Place() as place:
+        picture = Image.radial_gradient("L").convert("RGB").resize((40, 24))
+        iptc = b"\x1c\x02\x19\0\x06SECRET\x1c\x02\x5a\0\x0cSECRET-PLACE"
+        save_gif(picture, place.path / "t.gif")
+        save_psd(
+            picture,
+            place.path / "t.psd",
+            (1028, iptc),
+            (1036, b"SECRET thumbnail"),
+            (1086, b"SECRET/a.psd"),
+        )
+        packet = ["-XMP-photoshop:City=SECRET-PLACE", "-XMP-dc:Title=SECRET title"]
+        for name, left in [
+            ("t.gif", "Nothing is left beside the picture."),
+            ("t.psd", "Nothing is left beside the picture."),
+        ]:
+            if shutil.which("exiftool"):
+                subprocess.run(
+                    ["exiftool", "-q", "-overwrite_original", *packet, place.path / name],
+                    check=True,
+                )
+            old = (place.path / name).read_bytes()
+            check(b"SECRET" in old, True, f"{name}: there is something")
+            status, out, err = place.run("exif", "strip", name, "--out", "bare-" + name, "--json")
+            bare = (place.path / ("bare-" + name)).read_bytes()
+            check((status, b"SECRET" in bare), (0, False), f"{name}: {err}")
+            check(json.loads(out)[0]["note"], left, f"{name}: what is left")
+            check(
+                pixels(place.path / ("bare-" + name)), pixels(place.path / name), f"{name}: pixels"
+            )
+            status, _, err = place.run("exif", "strip", "bare-" + name, "--in-place")
+            check((status, "already so." in err), (0, True), f"{name}: stripped twice")
+            place.run("exif", "strip", name, "--out", "gps-" + name, "--gps-only")
+            gone = (place.path / ("gps-" + name)).read_bytes()
+            check(
+                (len(gone), b"SECRET-PLACE" in gone, gone.count(b"SECRET")),
+                (len(old), False, old.count(b"SECRET") - old.count(b"SECRET-PLACE")),
+                f"{name}: --gps-only",
+            )
+            status, _, err = place.run("exif", "set", name, "Artist=x", "--in-place")
+            check((status, "EXIF can be changed in" in err), (1, True), f"{name}: no EXIF")
+            check((place.path / name).read_bytes(), old, f"{name}: left alone")
+        with Image.open(place.path / "bare-t.gif") as frames:
+            check((frames.n_frames, frames.info["loop"]), (2, 0), "frames and loop")
 
 
 def move_between():
@@ -477,12 +525,24 @@ def go_places():
             (["--at", "91,0"], "is not LAT,LON"),
             (["--at", "1,2", "--offset", "+1:00"], "--offset needs --gpx."),
             (["--gpx", "walk.gpx", "--offset", "1"], "is not an offset"),
-            (["--gpx", "t.jpg"], "is not a GPX track."),
-            (["--gpx", "none.gpx"], "cannot be read."),
             (["--place", "sea"], 'There is no place "sea"'),
         ]:
             status, out, err = place.run("exif", "gps", "t.jpg", "--in-place", *arguments)
             check((status, out, message in err), (2, "", True), f"gps {arguments}: {err}")
+        place.files("empty.gpx", contents=b'<gpx version="1.1"/>')
+        for track, number, message in [
+            ("t.jpg", 2, 't.jpg: Damaged file. "t.jpg" is not a GPX track.'),
+            ("none.gpx", 1, "none.gpx: File open error."),
+            ("data", 1, "data: File open error."),
+            ("empty.gpx", 7, "has no points with a time."),
+        ]:
+            before = (place.path / "t.jpg").read_bytes()
+            status, out, err = place.run(
+                "exif", "gps", "t.jpg", "--in-place", "--json", "--gpx", track
+            )
+            found = [(row["file"], row["status"]) for row in json.loads(out)]
+            check((status, found, message in err), (1, [(track, number)], True), f"{track}: {err}")
+            check((place.path / "t.jpg").read_bytes(), before, f"{track}: nothing was touched")
         status, _, err = place.run("exif", "gps", "t.jpg", "--in-place", "--gpx", "walk.gpx")
         check(
             (status, "The track has no point within 30 minutes of its time." in err),
@@ -497,6 +557,7 @@ def main():
     hold_arguments()
     extend_webp()
     remove_for_good()
+    strip_gif_and_psd()
     move_between()
     go_places()
     change_everything()

@@ -16,7 +16,7 @@ try:
     from PIL import Image, PngImagePlugin
 
     import judged_pictures
-    from judged_pictures import corpus_pictures, pixels
+    from judged_pictures import corpus_pictures, pixels, save_gif, save_psd
 except ImportError:
     sys.exit(77)
 if not shutil.which("exiftool"):
@@ -49,6 +49,7 @@ FOLLOWS = {
     "File:CurrentIPTCDigest",
     "IPTC:CodedCharacterSet",
     "RIFF:WebP_Flags",
+    "GIF:GIFVersion",
     "File:FileType",
     "MPImage2:MPImageStart",
     "PNG:Rawprofiletypeiptc",
@@ -101,7 +102,11 @@ def sources(place):
     text.add_text("Raw profile type iptc", body, zip=True)
     picture.save(folder / "iptc.png", pnginfo=text)
     picture.save(folder / "iptc.tif", tiffinfo={33723: IPTC, 34377: RESOURCES[-28:]})
-    for number, path in enumerate(corpus_pictures()):
+    picture.convert("P").save(folder / "plain.gif")
+    save_gif(picture, folder / "frames.gif")
+    save_psd(picture, folder / "plain.psd")
+    save_psd(picture, folder / "iptc.psd", (1028, IPTC), (1058, exif.tobytes()[6:]))
+    for number, path in enumerate(corpus_pictures(".gif", ".psd")):
         shutil.copy(path, folder / f"{number:03}-{path.name}")
     return folder
 

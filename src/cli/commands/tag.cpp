@@ -119,7 +119,7 @@ void SetUpTag(CLI::App& app, CommandContext& context) {
   AddRewriteOptions(app, options->rewrite);
   SetFooter(app,
             "Changes XMP, and IPTC and EXIF where these have the same tags, in JPEG, TIFF, PNG, "
-            "WebP and HD Photo files; everything\n"
+            "WebP, HD Photo, GIF and PSD files; everything\n"
             "else stays the same bytes. Other pictures, camera raw files and files that cannot be "
             "changed safely get a sidecar, which\n"
             "digiKam, darktable and Lightroom read. An existing sidecar is kept up to date.",

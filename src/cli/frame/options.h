@@ -41,7 +41,8 @@ CLI::Option* AddTexts(CLI::App& app, const char* names, std::vector<std::string>
 CLI::Option* AddRepeatedText(CLI::App& app, const char* names, std::vector<std::string>& values,
                              const char* shownAs, const char* help);
 
-// The flags of commands that change files: -n, --dry-run, and --json with the fields of its elements.
+// The flags of commands that change files: -n, --dry-run, and --json with the fields of its
+// elements.
 void AddDryRunAndJson(CLI::App& app, bool& dryRun, bool& json, const char* jsonHelp);
 
 // Makes an option mandatory.

@@ -1,6 +1,10 @@
 #include <algorithm>
 
+#include "containers/bare_file.h"
+#include "containers/gif_walk.h"
 #include "containers/jpeg_segments.h"
+#include "containers/metadata_rewrite.h"
+#include "containers/photoshop_resources.h"
 #include "containers/png_chunks.h"
 #include "containers/riff_chunks.h"
 #include "core/byte_reader.h"
@@ -131,6 +135,42 @@ void LookIntoWebp(std::span<const uint8_t> file, Found& found) {
   }
 }
 
+void LookIntoGif(std::span<const uint8_t> file, Found& found) {
+  GifWalk walk(file);
+  for (GifBlock block; walk.Next(block);) {
+    if (block.kind == GifBlock::Kind::Image ||
+        IsGifPictureExtension(block.label, block.application))
+      continue;
+    found.Add(block.label == kGifCommentLabel       ? kCommentsName
+              : block.application == kGifXmp        ? kXmpName
+              : block.application == kGifProfile    ? kProfileName
+                                                    : kOtherName);
+  }
+  if (walk.Outcome() == Status::Ok && walk.Position() + 1 < file.size()) found.Add(kOtherName);
+}
+
+void LookIntoPsd(std::span<const uint8_t> file, Found& found) {
+  constexpr struct {
+    uint16_t number;
+    const char* name;
+  } kNames[] = {{kExifResource, kExifName},    {kXmpResource, kXmpName},
+                {kIptcResource, kIptcName},    {kIptcDigestResource, kIptcName},
+                {kProfileResource, kProfileName}, {1033, kThumbnailName},
+                {1036, kThumbnailName}};
+  constexpr uint16_t kUntagged = 1041;
+  bool complete = false;
+  for (const PhotoshopResource& one : PhotoshopResources(PsdResources(file), complete)) {
+    const auto named = std::ranges::find(kNames, one.number, [](const auto& row) {
+      return row.number;
+    });
+    if (named != std::end(kNames)) {
+      found.Add(named->name);
+    } else if (one.number != kUntagged && !IsPsdPictureResource(one.number)) {
+      found.Add(kOtherName);
+    }
+  }
+}
+
 void LookIntoDirectory(std::span<const uint8_t> file, Found& found) {
   constexpr struct {
     uint16_t tag;
@@ -152,6 +192,8 @@ std::vector<const char*> MetadataLeft(std::span<const uint8_t> file) {
     case MetadataForm::Jpeg: LookIntoJpeg(file, found); break;
     case MetadataForm::Png: LookIntoPng(file, found); break;
     case MetadataForm::Webp: LookIntoWebp(file, found); break;
+    case MetadataForm::Gif: LookIntoGif(file, found); break;
+    case MetadataForm::Psd: LookIntoPsd(file, found); break;
     case MetadataForm::Tiff:
     case MetadataForm::HdPhoto: LookIntoDirectory(file, found); break;
     case MetadataForm::None: break;

@@ -2,7 +2,6 @@
 
 #include <algorithm>
 
-#include "containers/metadata_rewrite.h"
 #include "containers/png_chunks.h"
 #include "containers/riff_chunks.h"
 #include "core/byte_reader.h"
@@ -16,22 +15,6 @@ namespace fotomill {
 namespace {
 
 constexpr uint16_t kOrientation = 0x0112, kExifVersionTag = 0x9000, kGpsVersionTag = 0x0000;
-
-struct FormOperations {
-  Status (*find)(std::span<const uint8_t> file, MetadataViews& views);
-  Status (*rewrite)(std::span<const uint8_t> file, const MetadataBlocks& blocks, FilePieces& made,
-                    std::string& reason);
-};
-
-// For formats with an EXIF block.
-FormOperations OperationsOf(MetadataForm form) {
-  switch (form) {
-    case MetadataForm::Jpeg: return {FindJpegMetadata, RewriteJpeg};
-    case MetadataForm::Png: return {FindPngMetadata, RewritePng};
-    case MetadataForm::Webp: return {FindWebpMetadata, RewriteWebp};
-    default: return {};
-  }
-}
 
 bool Starts(std::span<const uint8_t> file, std::string_view text) {
   return ByteReader(file).Match(text);
@@ -122,11 +105,28 @@ Status EditBlock(std::span<const uint8_t> file, const FormOperations& operations
 
 }  // namespace
 
+FormOperations OperationsOf(MetadataForm form) {
+  switch (form) {
+    case MetadataForm::Jpeg: return {FindJpegMetadata, RewriteJpeg};
+    case MetadataForm::Png: return {FindPngMetadata, RewritePng};
+    case MetadataForm::Webp: return {FindWebpMetadata, RewriteWebp};
+    case MetadataForm::Gif: return {FindGifMetadata, RewriteGif};
+    case MetadataForm::Psd: return {FindPsdMetadata, RewritePsd};
+    default: return {};
+  }
+}
+
+bool HasEditableExif(MetadataForm form) {
+  return form != MetadataForm::None && form != MetadataForm::Gif && form != MetadataForm::Psd;
+}
+
 MetadataForm MetadataFormOf(std::span<const uint8_t> file) {
   if (Starts(file, "\xFF\xD8")) return MetadataForm::Jpeg;
   if (Starts(file, kPngSignature)) return MetadataForm::Png;
   if (IsRiff(file, "WEBP")) return MetadataForm::Webp;
   if (Starts(file, "II\xBC\x01")) return MetadataForm::HdPhoto;
+  if (Starts(file, "GIF87a") || Starts(file, "GIF89a")) return MetadataForm::Gif;
+  if (Starts(file, "8BPS")) return MetadataForm::Psd;
   for (const std::string_view head : {std::string_view("II*\0", 4), std::string_view("MM\0*", 4),
                                       std::string_view("II+\0", 4), std::string_view("MM\0+", 4)}) {
     if (Starts(file, head)) return MetadataForm::Tiff;
@@ -170,7 +170,7 @@ Status EditPictureExif(std::span<const uint8_t> file, const ExifChanger& changer
   made.Clear();
   reason.clear();
   const MetadataForm form = MetadataFormOf(file);
-  if (form == MetadataForm::None) {
+  if (!HasEditableExif(form)) {
     reason = Tr("EXIF can be changed in JPEG, TIFF, PNG, WebP and HD Photo files.");
     return Status::UnsupportedFormat;
   }

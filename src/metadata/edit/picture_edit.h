@@ -8,6 +8,7 @@
 
 #include "containers/directory_edit.h"
 #include "containers/file_pieces.h"
+#include "containers/metadata_rewrite.h"
 #include "core/status.h"
 
 namespace fotomill {
@@ -20,8 +21,20 @@ enum class MetadataForm : uint8_t {
   Webp,
   Tiff,  // also BigTIFF and bare EXIF blocks: entries are in the file's own directories
   HdPhoto,
+  Gif,  // XMP only
+  Psd,  // EXIF is not changed
 };
 MetadataForm MetadataFormOf(std::span<const uint8_t> file);
+// Whether EXIF of such files can be changed.
+bool HasEditableExif(MetadataForm form);
+
+// How to find and replace metadata in formats with separate blocks for them; null for others.
+struct FormOperations {
+  Status (*find)(std::span<const uint8_t> file, MetadataViews& views) = nullptr;
+  Status (*rewrite)(std::span<const uint8_t> file, const MetadataBlocks& blocks, FilePieces& made,
+                    std::string& reason) = nullptr;
+};
+FormOperations OperationsOf(MetadataForm form);
 
 // The EXIF entries of a file, values in its byte
 // order; empty if there are none that can be read.

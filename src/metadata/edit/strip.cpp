@@ -46,8 +46,8 @@ ExifChanges KeptEntries(std::span<const uint8_t> file, MetadataForm form, uint32
       form == MetadataForm::Png ? FindTagBlocks(file).exif : GatherPictureExif(file);
   return TakenEntries(exif, [&](const ExifEntry& entry, ExifPlace place) {
     // in TIFF and HD Photo, MakeBareTiff keeps the orientation
-    const bool own = entry.tag == kOrientation && form != MetadataForm::Jpeg &&
-                     form != MetadataForm::Png && form != MetadataForm::Webp;
+    const bool own =
+        entry.tag == kOrientation && (form == MetadataForm::Tiff || form == MetadataForm::HdPhoto);
     return !own && IsKept(entry, place, kept);
   });
 }
@@ -58,9 +58,7 @@ std::vector<uint8_t> XmpOf(std::span<const uint8_t> file, MetadataForm form) {
     const TagBlocks blocks = FindTagBlocks(file);
     return {blocks.xmp.begin(), blocks.xmp.end()};
   }
-  const Status status =
-      form == MetadataForm::Jpeg ? FindJpegMetadata(file, views) : FindWebpMetadata(file, views);
-  if (status != Status::Ok) return {};
+  if (OperationsOf(form).find(file, views) != Status::Ok) return {};
   return {views.xmp.begin(), views.xmp.end()};
 }
 
@@ -91,6 +89,16 @@ Status StripDirectories(std::span<const uint8_t> file, MetadataForm form,
   return Status::Ok;
 }
 
+Status MakeBare(std::span<const uint8_t> file, MetadataForm form, const BareOptions& options,
+                std::vector<uint8_t>& bare) {
+  switch (form) {
+    case MetadataForm::Png: return MakeBarePng(file, options, bare);
+    case MetadataForm::Gif: return MakeBareGif(file, options, bare);
+    case MetadataForm::Psd: return MakeBarePsd(file, options, bare);
+    default: return MakeBareWebp(file, options, bare);
+  }
+}
+
 }  // namespace
 
 std::span<const KeptName> KeptNames() { return kNames; }
@@ -105,7 +113,7 @@ Status StripPicture(std::span<const uint8_t> file, uint32_t kept, FilePieces& ma
                       .iptc = (kept & kKeepIptc) != 0,
                       .xmp = (kept & kKeepXmp) != 0};
   if (form == MetadataForm::None) {
-    reason = Tr("Metadata can be removed from JPEG, TIFF, PNG, WebP and HD Photo files.");
+    reason = Tr(kNotStripped);
     return Status::UnsupportedFormat;
   }
   if (form == MetadataForm::Tiff || form == MetadataForm::HdPhoto)
@@ -117,14 +125,11 @@ Status StripPicture(std::span<const uint8_t> file, uint32_t kept, FilePieces& ma
     options.newXmp = xmp;
     return MakeBareJpeg(file, options, made);
   }
-  const bool png = form == MetadataForm::Png;
   std::vector<uint8_t> bare;
-  RETURN_IF_BAD(png ? MakeBarePng(file, options, bare) : MakeBareWebp(file, options, bare));
+  RETURN_IF_BAD(MakeBare(file, form, options, bare));
   FilePieces pieces;
   const auto view = pieces.Own(std::move(bare));
-  const MetadataBlocks blocks{exif, xmp};
-  RETURN_IF_BAD(png ? RewritePng(view, blocks, made, reason)
-                    : RewriteWebp(view, blocks, made, reason));
+  RETURN_IF_BAD(OperationsOf(form).rewrite(view, {exif, xmp}, made, reason));
   made.Append(std::move(pieces));  // `made` refers to them
   return Status::Ok;
 }

@@ -9,8 +9,13 @@
 
 #include "containers/file_pieces.h"
 #include "core/status.h"
+#include "texts/texts.h"
 
 namespace fotomill {
+
+// The reason for refusing other files.
+inline constexpr const char* kNotStripped =
+    TrLater("Metadata can be removed from JPEG, TIFF, PNG, WebP, HD Photo, GIF and PSD files.");
 
 // Removes metadata: EXIF with thumbnail, GPS and maker notes, XMP, IPTC, comments, texts and times,
 // data of other programs, embedded pictures. Compressed pixels are never touched. No byte of the

@@ -249,7 +249,7 @@ class JpegPlaces {
   std::map<std::string_view, Extended> extended_;  // by digest
 };
 
-// --- PNG and WebP ---
+// --- PNG, WebP, GIF and Photoshop ---
 
 // The data of an APP1 segment: EXIF, with or without its signature, or XMP.
 Status BlankApp1(std::vector<uint8_t>& data, std::string& reason) {
@@ -317,9 +317,11 @@ Status StripPngPlaces(std::span<const uint8_t> file, FilePieces& made, std::stri
   return walk.Outcome();
 }
 
-Status StripWebpPlaces(std::span<const uint8_t> file, FilePieces& made, std::string& reason) {
+// WebP, GIF and Photoshop.
+Status StripBlockPlaces(std::span<const uint8_t> file, MetadataForm form, FilePieces& made,
+                        std::string& reason) {
   MetadataViews views;
-  RETURN_IF_BAD(FindWebpMetadata(file, views));
+  RETURN_IF_BAD(OperationsOf(form).find(file, views));
   MetadataBlocks blocks;
   std::vector<uint8_t> exif(views.exif.begin(), views.exif.end());
   if (!exif.empty()) {
@@ -329,7 +331,12 @@ Status StripWebpPlaces(std::span<const uint8_t> file, FilePieces& made, std::str
   std::vector<uint8_t> packet(views.xmp.begin(), views.xmp.end());
   RETURN_IF_BAD(BlankXmp(packet, reason));
   if (!std::ranges::equal(packet, views.xmp)) blocks.xmp = std::move(packet);
-  return RewriteWebp(file, blocks, made, reason);
+  if (form == MetadataForm::Psd) {
+    const auto resources = PsdResources(file);
+    blocks.iptc.emplace(resources.begin(), resources.end());
+    BlankResources(*blocks.iptc);
+  }
+  return OperationsOf(form).rewrite(file, blocks, made, reason);
 }
 
 // --- TIFF and HD Photo ---
@@ -380,12 +387,14 @@ Status StripPlaces(std::span<const uint8_t> file, FilePieces& made, std::string&
   switch (MetadataFormOf(file)) {
     case MetadataForm::Jpeg: return JpegPlaces(file, reason).Run(made);
     case MetadataForm::Png: return StripPngPlaces(file, made, reason);
-    case MetadataForm::Webp: return StripWebpPlaces(file, made, reason);
+    case MetadataForm::Webp:
+    case MetadataForm::Gif:
+    case MetadataForm::Psd: return StripBlockPlaces(file, MetadataFormOf(file), made, reason);
     case MetadataForm::Tiff:
     case MetadataForm::HdPhoto: return StripFilePlaces(file, made, reason);
     case MetadataForm::None: break;
   }
-  reason = Tr("Metadata can be removed from JPEG, TIFF, PNG, WebP and HD Photo files.");
+  reason = Tr(kNotStripped);
   return Status::UnsupportedFormat;
 }
 

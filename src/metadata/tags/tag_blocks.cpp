@@ -76,9 +76,14 @@ class Finder {
     ReadXmp();
   }
 
-  void Webp() {
+  // WebP, GIF and Photoshop.
+  void Blocks() {
     MetadataViews views;
-    if (FindWebpMetadata(file_, views) != Status::Ok) return;
+    if (OperationsOf(blocks_.form).find(file_, views) != Status::Ok) return;
+    if (blocks_.form == MetadataForm::Psd) {
+      blocks_.resources = PsdResources(file_);
+      Photoshop(blocks_.resources);
+    }
     blocks_.xmp = views.xmp;
     blocks_.exifBlock = views.exif;
     blocks_.exif = ParseExifBlock(views.exif);
@@ -149,7 +154,9 @@ TagBlocks FindTagBlocks(std::span<const uint8_t> file) {
   switch (blocks.form) {
     case MetadataForm::Jpeg: finder.Jpeg(); break;
     case MetadataForm::Png: finder.Png(); break;
-    case MetadataForm::Webp: finder.Webp(); break;
+    case MetadataForm::Webp:
+    case MetadataForm::Gif:
+    case MetadataForm::Psd: finder.Blocks(); break;
     case MetadataForm::Tiff:
     case MetadataForm::HdPhoto: finder.Directories(); break;
     case MetadataForm::None: break;

@@ -19,7 +19,8 @@ struct TagBlocks {
   // digest of the IPTC data at the time XMP was last in agreement with it
   std::span<const uint8_t> iptcDigest;
   std::span<const uint8_t> extension;  // a second packet with further properties
-  // Photoshop's resources around the IPTC data: of the first JPEG segment, or a PNG profile
+  // Photoshop's resources around the IPTC data: of the first JPEG segment, a PNG profile, or all of
+  // a Photoshop file
   std::span<const uint8_t> resources;
   std::string iptcKeyword;  // of the PNG text chunk that holds the IPTC data
   // starting at the byte order; empty in TIFF files, and if it is not stored as such

@@ -168,7 +168,7 @@ class Editor {
       if (!edit.Empty()) blocks.exif = EditedBlock(blocks_.exifBlock, std::move(edit));
     }
     if (iptc_) {
-      if (blocks_.form == MetadataForm::Jpeg) {
+      if (blocks_.form != MetadataForm::Png) {
         if (FindPhotoshopResource(blocks_.resources, kIptcResource).empty())
           return Refuse(Tr("Its IPTC data are split over several segments."));
         blocks.iptc = NewResources(blocks_.resources);
@@ -179,11 +179,7 @@ class Editor {
         if (blocks.iptc->empty()) return Status::MemoryAllocationError;
       }
     }
-    switch (blocks_.form) {
-      case MetadataForm::Jpeg: return RewriteJpeg(file_, blocks, made_, reason_);
-      case MetadataForm::Png: return RewritePng(file_, blocks, made_, reason_);
-      default: return RewriteWebp(file_, blocks, made_, reason_);
-    }
+    return OperationsOf(blocks_.form).rewrite(file_, blocks, made_, reason_);
   }
 
   Status EditFile(ExifChanges entries) {

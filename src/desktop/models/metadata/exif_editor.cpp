@@ -87,7 +87,7 @@ ExifFileTexts ReadExifFile(const std::string& path) {
     file.problem = WithReason(Tr("It cannot be read."));
     return file;
   }
-  if (MetadataFormOf(view.Bytes()) == MetadataForm::None) {
+  if (!HasEditableExif(MetadataFormOf(view.Bytes()))) {
     file.problem = Tr("EXIF can be changed in JPEG, TIFF, PNG, WebP and HD Photo files.");
     return file;
   }
