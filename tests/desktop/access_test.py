@@ -150,13 +150,16 @@ class ReadDesktop(Desktop):
                       and not {heard.reference, heard.name} & met]
 
 
-# Windows opened from the browser: the keys to open them, the log line, the title. Without keys:
-# words for the command finder.
+# Windows opened from the browser: the keys to open them, or words for the command finder, or
+# nothing if it is open; the log line, the title.
 WINDOWS = [
     ("ctrl+e", r"prompt destination", "Convert"),
     ("shift+F2", r"prompt sequential-rename", "Sequential Rename"),
     ("alt+Return", r"info files=", "Get info: 2 files"),
     ("alt+shift+Return", r"exif rows=", "EXIF: a.bmp"),
+    ("F4", r"edit-preview exact=1", "Edit: 2 pictures"),
+    ("shift+F4", r"crop-picture 1/2", "Crop properties"),
+    ("", None, "Crop: 2 pictures"),  # its panel was closed
     ("ctrl+h", r"history rows=", "File history"),
     ("ctrl+k", r"finder found=", "Find command"),
     ("tools compact", None, "Compact thumbnail database"),
@@ -175,8 +178,9 @@ def every_window_is_heard(folder):
         desktop.focus("Fotomill Professional")
         desktop.check("Fotomill Professional", tab=False)
         for keys, line, title in WINDOWS:
-            desktop.focus("Fotomill Professional")
-            desktop.key("ctrl+a", "ctrl+k" if " " in keys else keys)
+            if keys:
+                desktop.focus("Fotomill Professional")
+                desktop.key("ctrl+a", "ctrl+k" if " " in keys else keys)
             if " " in keys:
                 desktop.wait(r"finder found=")
                 desktop.focus("Find command")

@@ -7,9 +7,11 @@
 #include <mutex>
 
 #include "core/data_folder.h"
+#include "desktop/models/edit/choice_text.h"
 #include "desktop/models/edit/operation_memory.h"
 #include "desktop/models/edit/preview_maker.h"
 #include "desktop/models/edit/preview_steps.h"
+#include "desktop/models/edit/quick_actions.h"
 #include "desktop/models/edit/slider_scale.h"
 #include "desktop/models/edit/step_list.h"
 #include "operations/engine.h"
@@ -18,7 +20,9 @@
 #include "processing/promote.h"
 #include "registry/registry.h"
 #include "settings/key_texts.h"
+#include "settings/settings.h"
 #include "support/files.h"
+#include "support/scoped_settings.h"
 
 namespace fotomill::desktop {
 namespace {
@@ -143,6 +147,51 @@ TEST(OperationMemory, KeepsChoicesValuesAndPresets) {
   EXPECT_EQ(OperationMemory().PresetsOf(blur).size(), 1u);
   EXPECT_TRUE(test::ReadText(folder.Path("FMWOperations.txt")).starts_with("later\tunknown\n"));
   SetDataFolder({});
+}
+
+TEST(QuickActions, UseTheSizesAndTheLastValues) {
+  const test::TemporaryFolder folder;
+  const test::ScopedSettings keep;
+  SetDataFolder(folder.Path());
+  settings.Transform320.AssignCut("64,48");
+  settings.Transform640.AssignCut("none");
+  settings.WatermarkText.AssignCut("mine");
+  ASSERT_TRUE(OperationMemory().KeepLast(Read("caption text='a b' position=above")));
+  const struct {
+    const char *text, *recipe;
+  } kRows[] = {
+      {"Resize to 64 \u00D7 48", "resize 64x48"},
+      {"Resize (no size set)", ""},
+      {"Resize to 800 \u00D7 600", "resize 800x600"},
+      {"Resize to 1024 \u00D7 768", "resize 1024x768"},
+      {"Resize to 1280 \u00D7 1024", "resize 1280x1024"},
+      {"Auto &levels", "auto-levels"},
+      {"&Caption", "caption text=\"a b\" position=above"},
+      {"&Watermark", "watermark"},
+  };
+  const std::vector<QuickAction> actions = QuickActions();
+  ASSERT_EQ(actions.size(), std::size(kRows));
+  for (size_t i = 0; i < actions.size(); ++i) {
+    EXPECT_EQ(actions[i].text, kRows[i].text);
+    EXPECT_EQ(QuickRecipe(i), kRows[i].recipe);
+    EXPECT_EQ(actions[i].startsGroup, i == 5);
+  }
+  SetDataFolder({});
+}
+
+TEST(ChoiceText, KnowsEveryWordOfTheOperations) {
+  for (const Operation* operation : Operations()) {
+    for (const Parameter& row : operation->parameters) {
+      for (int32_t i = 0; !WordOf(row.choices, i).empty(); ++i) {
+        const std::string_view word = WordOf(row.choices, i);
+        const bool unit = word.size() == 2;
+        EXPECT_EQ(ChoiceText(word) == word, unit) << operation->name << " " << word;
+      }
+    }
+  }
+  EXPECT_EQ(ChoiceText("top-left"), "Top left");
+  const Step step = Read("watermark text=a gravity=top-left tiled=yes")[0];
+  EXPECT_EQ(StepText(step), "Watermark: Text a, Place Top left, Tiled yes");
 }
 
 TEST(PreviewSteps, ReduceWhatIsMeasuredInPixels) {

@@ -3,6 +3,7 @@
 import contextlib
 import os
 import re
+import struct
 import subprocess
 
 from driven_desktop import PROJECT, Desktop, make_pictures, run
@@ -179,6 +180,70 @@ def recipes_are_saved_and_run(folder):
         assert [name[-11:] for name in names] == ["a-large.jpg", "a-small.jpg"], names
 
 
+def quick_actions_ask_nothing(folder):
+    with browser_of(folder, "a.bmp", "b.jpg", "c.bmp",
+                    settings=["Transform640=64,48", "WatermarkText=mine"]) as (desktop, pictures):
+        (pictures / "c.bmp").write_bytes((pictures / "c.bmp").read_bytes()[:40])
+        before = {path.name: path.read_bytes() for path in pictures.iterdir()}
+        desktop.key("ctrl+a", "ctrl+alt+2")
+        desktop.wait(r"quick-action resize 64x48")
+        # What failed is listed with its reason; the others are done and stay selected.
+        desktop.wait(r"batch-line .*c.bmp: Damaged file")
+        desktop.wait(r"batch stays-open")
+        desktop.wait(r"lines=3 items=3 selected=3 missing=0 listing=0")
+        resized = {path.name: path.read_bytes() for path in pictures.iterdir()}
+        assert struct.unpack("<2i", resized["a.bmp"][18:26]) == (64, 48)
+        assert resized["b.jpg"] != before["b.jpg"] and resized["c.bmp"] == before["c.bmp"]
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo change of 2 files done=2")
+        assert before == {path.name: path.read_bytes() for path in pictures.iterdir()}
+        # The same from the view window, which shows the new picture, and by name.
+        desktop.key("ctrl+shift+a", "Home", "ctrl+Return")
+        desktop.wait(r"view-painted .*a.bmp")
+        desktop.focus("View$")
+        desktop.key("ctrl+alt+6")
+        desktop.wait(r"quick-action auto-levels")
+        desktop.wait(r"batch ended status=0")
+        desktop.wait(r"view place=1/3 .*a.bmp")
+        assert (pictures / "a.bmp").read_bytes() != before["a.bmp"]
+        desktop.focus("View$")
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo change of a.bmp done=1")
+        assert (pictures / "a.bmp").read_bytes() == before["a.bmp"]
+        desktop.focus("Fotomill Professional")
+        find_command(desktop, "quick watermark")
+        desktop.wait(r"quick-action watermark")
+        desktop.wait(r"batch ended status=0")
+        changed = (pictures / "a.bmp").read_bytes()
+        (pictures / "a.bmp").write_bytes(before["a.bmp"])
+        assert changed == applied(pictures / "a.bmp", "watermark mine", folder / "peer", "bmp")
+
+
+def right_click_chooses_the_operation(folder):
+    data = folder / "data"
+    data.mkdir()
+    # Effects is the first button.
+    (data / "FMWToolbar.txt").write_text("effects\n")
+    for once, then in ((0, "contrast"), (1, "brightness")):
+        (data / "FMWOperations.txt").unlink(missing_ok=True)
+        with browser_of(folder, "a.bmp",
+                        settings=[f"RightClickOneTimeFunctions={once}"]) as (desktop, _):
+            window = desktop.focus("Fotomill Professional")
+            desktop.xdotool("mousemove", "--window", window, 20, 50, "click", 3)
+            desktop.wait(r"operation-menu effects brightness")
+            desktop.settle()
+            desktop.screenshot("operation-menu")
+            desktop.key("Down", "Down", "Return")
+            desktop.wait(r"edit-steps contrast$")
+            desktop.focus("^Edit: ")
+            desktop.key("Escape")
+            desktop.wait(r"edit closed")
+            desktop.focus("Fotomill Professional")
+            find_command(desktop, "functions effects")
+            desktop.wait(rf"edit-steps {then}$")
+
+
 if __name__ == "__main__":
     run(copies_are_those_of_the_command_line, files_change_and_come_back,
-        recipes_are_saved_and_run)
+        recipes_are_saved_and_run, quick_actions_ask_nothing, right_click_chooses_the_operation)

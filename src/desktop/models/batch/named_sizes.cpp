@@ -27,13 +27,19 @@ std::optional<NamedSize> ReadSize(std::string_view text) {
 
 }  // namespace
 
-std::vector<NamedSize> NamedSizes() {
+std::vector<NamedSize> SizeSettings() {
   std::vector<NamedSize> sizes;
   for (const std::string_view text :
        {settings.Transform320.view(), settings.Transform640.view(), settings.Transform800.view(),
         settings.Transform1024.view(), settings.Transform1280.view()}) {
-    if (auto size = ReadSize(text)) sizes.push_back(std::move(*size));
+    sizes.push_back(ReadSize(text).value_or(NamedSize{}));
   }
+  return sizes;
+}
+
+std::vector<NamedSize> NamedSizes() {
+  std::vector<NamedSize> sizes = SizeSettings();
+  std::erase_if(sizes, [](const NamedSize& size) { return size.step.empty(); });
   return sizes;
 }
 

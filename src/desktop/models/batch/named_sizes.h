@@ -11,8 +11,10 @@ struct NamedSize {
   std::string step;  // recipe step: "resize 640x480"
 };
 
-// The sizes in the settings Transform320 to Transform1280, in this order. Settings that are not
-// WIDTH,HEIGHT are skipped.
+// The settings Transform320 to Transform1280, in this order. Texts of those that are not
+// WIDTH,HEIGHT are empty.
+std::vector<NamedSize> SizeSettings();
+// The same without those.
 std::vector<NamedSize> NamedSizes();
 
 }  // namespace fotomill::desktop

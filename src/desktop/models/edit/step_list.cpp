@@ -143,19 +143,4 @@ std::string ArgumentText(const Step& step, std::string_view parameter) {
   return value.given ? value.text : std::string();
 }
 
-std::string StepText(const Step& step) {
-  std::string text = Tr(step.operation->label);
-  const auto rows = step.arguments.Rows();
-  const char* separator = ": ";
-  for (size_t i = 0; i < rows.size(); ++i) {
-    const Value& value = step.arguments.At(i);
-    if (!value.given || value.byDefault) continue;
-    text.append(separator);
-    if (rows.size() > 1) text.append(Tr(rows[i].label)).append(" ");
-    text.append(value.text);
-    separator = ", ";
-  }
-  return text;
-}
-
 }  // namespace fotomill::desktop

@@ -72,7 +72,5 @@ class StepList {
 Step FirstStep(const Operation& operation);
 // The current text of a parameter, for a control; empty if it has none.
 std::string ArgumentText(const Step& step, std::string_view parameter);
-// "Blur: sigma 3": the label with the values that are not defaults.
-std::string StepText(const Step& step);
 
 }  // namespace fotomill::desktop

@@ -41,6 +41,7 @@ constexpr SetupItem kItems[] = {
     Item(Browsing,   TrLater("Files"),              UndoLevels,                     "Undo steps"),
     Item(Browsing,   TrLater("Files"),              NewFolderName,                  "Name of new folders"),
     Item(Browsing,   TrLater("Files"),              ClipboardPictureName,           "Name of pictures from the clipboard"),
+    Item(Browsing,   TrLater("Toolbar"),            RightClickOneTimeFunctions,     "Operations chosen by right click are used only once"),
     Item(Browsing,   TrLater("Find similar"),       FindSimlarDistance,             "How many of 64 bits may differ, 0 to 32"),
     Item(Browsing,   TrLater("Find similar"),       FindSimilarTransforms,          "Also find pictures that are rotated or mirrored"),
     Item(Browsing,   TrLater("Recently used"), CopyHistoryMax,        "Folders copied or moved to"),

@@ -9,7 +9,9 @@
 
 #include <vector>
 
+#include "desktop/models/edit/quick_actions.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/edit/quick_menu.h"
 #include "desktop/windows/shell/commands.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
@@ -60,19 +62,27 @@ class FinderBox : public wxDialog {
   // The ID of the chosen command, wxID_NONE if nothing was found.
   int Chosen() const {
     const int line = list_->GetSelection();
-    return line == wxNOT_FOUND ? wxID_NONE : CommandId(*found_[static_cast<size_t>(line)]);
+    return line == wxNOT_FOUND ? wxID_NONE : found_[static_cast<size_t>(line)];
   }
 
  private:
   void Fill() {
     found_.clear();
     wxArrayString lines;
+    const auto offer = [&](int id, const wxString& line, const wxString& help) {
+      if (!HoldsEveryWord(line + " " + help, words_->GetValue())) return;
+      found_.push_back(id);
+      lines.Add(line);
+    };
     for (const Command& command : Commands()) {
-      if (command.text == nullptr ||
-          !HoldsEveryWord(LineOf(command) + " " + Label(command.help), words_->GetValue()))
-        continue;
-      found_.push_back(&command);
-      lines.Add(LineOf(command));
+      if (command.text != nullptr) offer(CommandId(command), LineOf(command), Label(command.help));
+    }
+    int id = kFirstQuickId;
+    for (const QuickAction& action : QuickActions()) {
+      const wxString line = wxControl::RemoveMnemonics(Label("&Quick actions")) + ": " +
+                            wxControl::RemoveMnemonics(Shown(action.text));
+      offer(id, line + wxString::Format("    Ctrl+Alt+%d", id - kFirstQuickId + 1), "");
+      ++id;
     }
     list_->Set(lines);
     if (!found_.empty()) list_->SetSelection(0);
@@ -92,7 +102,7 @@ class FinderBox : public wxDialog {
 
   wxTextCtrl* words_ = nullptr;
   wxListBox* list_ = nullptr;
-  std::vector<const Command*> found_;
+  std::vector<int> found_;  // IDs
 };
 
 }  // namespace

@@ -32,12 +32,17 @@ namespace fotomill::desktop {
 
 namespace {
 
-constexpr int kSideWidth = 350;
-constexpr int kOriginalKey = 'O';  // shows the original while held
+constexpr int kLeastSide = 350, kMostSide = 460;  // widths of the side pane
+constexpr int kOriginalKey = 'O';                 // shows the original while held
 
 wxString TitleOf(const std::vector<std::string>& files) {
   if (files.size() == 1) return Label("Edit: %1", Shown(platform::FileNameOf(files.front())));
   return LabelCount("Edit: %1 picture", "Edit: %1 pictures", files.size());
+}
+
+// A third of the window, within limits.
+int SideWidth(const wxWindow& frame) {
+  return std::clamp(frame.GetSize().x / 3, frame.FromDIP(kLeastSide), frame.FromDIP(kMostSide));
 }
 
 wxStaticText* NewHeading(wxWindow* parent, const wxString& text) {
@@ -61,8 +66,7 @@ EditFrame::EditFrame(Shell& shell, const std::vector<std::string>& files, const 
   auto* splitter = new wxSplitterWindow(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize,
                                         wxSP_LIVE_UPDATE | wxSP_NOBORDER);
   splitter->SetMinimumPaneSize(FromDIP(220));
-  splitter->SplitVertically(BuildSide(splitter, first), BuildPreview(splitter),
-                            FromDIP(kSideWidth));
+  splitter->SplitVertically(BuildSide(splitter, first), BuildPreview(splitter), SideWidth(*this));
   column->Add(splitter, wxSizerFlags(1).Expand());
   column->Add(BuildButtons(panel), wxSizerFlags().Expand().Border(wxALL, FromDIP(8)));
   panel->SetSizer(column);
@@ -403,15 +407,21 @@ void EditFrame::OnClose(wxCloseEvent& event) {
   event.Skip();
 }
 
-void EditSelection(Shell& shell) {
+namespace {
+
+void EditFiles(Shell& shell, const Operation* first) {
   const std::vector<std::string> files = shell.Tabs().SelectedFiles();
-  if (!files.empty()) (new EditFrame(shell, files, nullptr))->Show();
+  if (!files.empty()) (new EditFrame(shell, files, first))->Show();
 }
 
+}  // namespace
+
+void EditSelection(Shell& shell) { EditFiles(shell, nullptr); }
+
+void EditSelectionWith(Shell& shell, const Operation& operation) { EditFiles(shell, &operation); }
+
 void EditSelectionWith(Shell& shell, Family family) {
-  const std::vector<std::string> files = shell.Tabs().SelectedFiles();
-  if (files.empty()) return;
-  (new EditFrame(shell, files, &OperationMemory().Chosen(family)))->Show();
+  EditSelectionWith(shell, OperationMemory().Chosen(family));
 }
 
 }  // namespace fotomill::desktop

@@ -100,7 +100,8 @@ class EditFrame : public wxFrame, public HoldsWork {
 
 // Functions of the frame's menu, for the selected files.
 void EditSelection(Shell& shell);
-// Starts with the operation of a family that was chosen last.
+// Starts with an operation, or with the one of a family that was chosen last.
+void EditSelectionWith(Shell& shell, const Operation& operation);
 void EditSelectionWith(Shell& shell, Family family);
 
 }  // namespace fotomill::desktop

@@ -10,8 +10,10 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
+#include <algorithm>
 #include <cstdio>
 
+#include "desktop/models/edit/choice_text.h"
 #include "desktop/models/edit/slider_scale.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/setup/color_button.h"
@@ -21,17 +23,6 @@
 namespace fotomill::desktop {
 
 namespace {
-
-// "top-left" as "Top left".
-wxString ChoiceLabel(std::string_view word) {
-  std::string text(word);
-  for (char& c : text) {
-    if (c == '-') c = ' ';
-  }
-  wxString label = Label(text.c_str());
-  if (!label.empty()) label = label.Left(1).Upper() + label.Mid(1);
-  return label;
-}
 
 std::string HexColor(int32_t color, uint8_t alpha) {
   char text[12];
@@ -46,6 +37,17 @@ std::string HexColor(int32_t color, uint8_t alpha) {
 }
 
 wxString NameOf(const Parameter& parameter) { return Label(parameter.label); }
+
+// The width of the longest number that a field can be asked to show; beyond that it scrolls.
+int WidestNumber(const wxWindow& field, const Parameter& parameter) {
+  constexpr double kMost = 10000;
+  int width = field.GetTextExtent("0000").x;
+  for (const double number : {std::max(parameter.least, -kMost), std::min(parameter.most, kMost)}) {
+    const int digits = DigitsOf(parameter);
+    width = std::max(width, field.GetTextExtent(wxString::FromDouble(number, digits)).x);
+  }
+  return width;
+}
 
 }  // namespace
 
@@ -120,11 +122,12 @@ wxSizer* ParameterPanel::NewNumber(const Parameter& parameter, Row& row) {
     slider->SetToolTip(Label(parameter.help));
     line->Add(slider, wxSizerFlags(1).CenterVertical());
   }
-  auto* field = new wxSpinCtrlDouble(this, wxID_ANY, "", wxDefaultPosition,
-                                     wxSize(TextWidth(*this, FromDIP(140)), -1), wxSP_ARROW_KEYS);
+  auto* field =
+      new wxSpinCtrlDouble(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxSP_ARROW_KEYS);
   field->SetRange(parameter.least, parameter.most);
   field->SetDigits(static_cast<unsigned>(DigitsOf(parameter)));
   field->SetIncrement(StepOf(parameter));
+  field->SetInitialSize(field->GetSizeFromTextSize(WidestNumber(*field, parameter)));
   field->SetName(NameOf(parameter));
   field->SetToolTip(Label(parameter.help));
   line->Add(field, wxSizerFlags(slider == nullptr ? 1 : 0).CenterVertical());
@@ -164,7 +167,7 @@ wxSizer* ParameterPanel::NewChoice(const Parameter& parameter, Row& row) {
   list->SetName(NameOf(parameter));
   list->SetToolTip(Label(parameter.help));
   for (int32_t i = 0; !WordOf(parameter.choices, i).empty(); ++i)
-    list->Append(ChoiceLabel(WordOf(parameter.choices, i)));
+    list->Append(Shown(ChoiceText(WordOf(parameter.choices, i))));
   list->Bind(wxEVT_CHOICE, [this, list, &parameter](wxCommandEvent&) {
     Change(parameter, std::string(WordOf(parameter.choices, list->GetSelection())), true);
   });

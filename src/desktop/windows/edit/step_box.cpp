@@ -1,5 +1,6 @@
 #include "desktop/windows/edit/step_box.h"
 
+#include "desktop/models/edit/choice_text.h"
 #include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {

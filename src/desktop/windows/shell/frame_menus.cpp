@@ -10,6 +10,7 @@
 
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/edit/apply_steps.h"
+#include "desktop/windows/edit/quick_menu.h"
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/files/open_with.h"
 #include "desktop/windows/shell/browser_tabs.h"
@@ -44,7 +45,7 @@ wxItemKind KindOf(const Command& command) {
 FrameMenus::FrameMenus(Shell& shell) : shell_(shell) {
   BuildBar();
   AddRecentFiles();
-  AddRecipes();
+  AddFunctions();
   BindSecondKeys();
   BindCommands();
 }
@@ -94,13 +95,26 @@ void FrameMenus::UpdateRecentFiles() {
   LogEvent("recent-files", std::to_string(recentFiles_.size()));
 }
 
-// The recipes of the library; they are listed each time the menu is opened.
-void FrameMenus::AddRecipes() {
-  recipes_ = new wxMenu;
+void FrameMenus::AddFunctions() {
   wxMenuBar* const bar = shell_.Window().GetMenuBar();
   wxMenu* const functions = bar->GetMenu(static_cast<size_t>(bar->FindMenu(Label("F&unctions"))));
   functions->AppendSeparator();
-  functions->Append(kRecipesId, Label("Appl&y recipe"), recipes_,
+  functions->AppendSubMenu(NewQuickMenu(), Label("&Quick actions"),
+                           Label("Changes the selected files at once, with the last values."));
+  HandleQuickActions(
+      shell_.Window(), shell_,
+      [this] {
+        const BrowserPage* const browser = shell_.Tabs().Front();
+        return browser != nullptr && browser->Model().HasFileForFunction();
+      },
+      [this] { return shell_.Tabs().SelectedFiles(); });
+  AddRecipes(*functions);
+}
+
+// The recipes of the library; they are listed each time the menu is opened.
+void FrameMenus::AddRecipes(wxMenu& functions) {
+  recipes_ = new wxMenu;
+  functions.Append(kRecipesId, Label("Appl&y recipe"), recipes_,
                     Label("Applies a recipe to the selected pictures and saves copies."));
   shell_.Window().Bind(
       wxEVT_MENU,
@@ -109,8 +123,8 @@ void FrameMenus::AddRecipes() {
         if (place < recipeNames_.size()) RunRecipe(shell_, std::string(recipeNames_[place]));
       },
       kRecipesId + 1, kRecipesId + kMostRecipes);
-  shell_.Window().Bind(wxEVT_MENU_OPEN, [this, functions](wxMenuEvent& event) {
-    if (event.GetMenu() == functions) ListRecipesInMenu();
+  shell_.Window().Bind(wxEVT_MENU_OPEN, [this, &functions](wxMenuEvent& event) {
+    if (event.GetMenu() == &functions) ListRecipesInMenu();
     event.Skip();
   });
   ListRecipesInMenu();
@@ -207,6 +221,7 @@ void FrameMenus::ShowContextMenu(wxWindow& window, const wxPoint& place) {
     if (command.text == nullptr || !command.inContextMenu) continue;
     menu.Append(CommandId(command), MenuText(command), Label(command.help));
   }
+  menu.AppendSubMenu(NewQuickMenu(), Label("&Quick actions"));
   if (wxMenu* programs = NewOpenWithMenu(shell_, shell_.Tabs().SelectedFiles())) {
     menu.AppendSeparator();
     menu.AppendSubMenu(programs, Label("Open &with"));

@@ -32,7 +32,8 @@ class FrameMenus {
   void BindSecondKeys();
   void BindCommands();
   void AddRecentFiles();
-  void AddRecipes();
+  void AddFunctions();  // those that are not rows of commands.cpp
+  void AddRecipes(wxMenu& functions);
   void ListRecipesInMenu();
   void Update(wxUpdateUIEvent& event);
 

@@ -7,6 +7,7 @@
 
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/dialogs/toolbar_box.h"
+#include "desktop/windows/edit/operation_menu.h"
 #include "desktop/windows/shell/commands.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/bitmaps.h"
@@ -23,6 +24,9 @@ FunctionToolbar::FunctionToolbar(Shell& shell)
   bar_->Bind(wxEVT_UPDATE_UI, [this](wxUpdateUIEvent& event) {
     if (IsCommandId(event.GetId())) ShowTip(CommandOfId(event.GetId()));
     event.Skip();
+  });
+  bar_->Bind(wxEVT_TOOL_RCLICKED, [this](wxCommandEvent& event) {
+    if (IsCommandId(event.GetId())) ChooseOfFamily(CommandOfId(event.GetId()));
   });
   // Symbols use the text color.
   shell_.Window().Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
@@ -49,6 +53,15 @@ void FunctionToolbar::Fill() {
 
 void FunctionToolbar::Choose() {
   if (AskForToolbar(shell_.Window())) Fill();
+}
+
+// Buttons of families of operations have their names.
+void FunctionToolbar::ChooseOfFamily(const Command& command) {
+  if (!CanRun(command, shell_)) return;
+  for (const Family family : {Family::Crop, Family::Transform, Family::Effects, Family::Filter,
+                              Family::Annotate, Family::Watermark, Family::Matt}) {
+    if (command.symbol == FamilyName(family)) return ChooseOperation(shell_, *bar_, family);
+  }
 }
 
 // The tooltip of a disabled button says why.

@@ -17,6 +17,7 @@ class FunctionToolbar {
 
  private:
   void Fill();
+  void ChooseOfFamily(const Command& command);
   void ShowTip(const Command& command);
 
   Shell& shell_;

@@ -2,6 +2,7 @@
 
 #include <wx/defs.h>
 
+#include "desktop/windows/edit/quick_menu.h"
 #include "desktop/windows/view/view_file_commands.h"
 #include "desktop/windows/view/view_frame.h"
 #include "texts/texts.h"
@@ -73,6 +74,7 @@ constexpr KeyCommand<ViewFrame> kCommands[] = {
     {TrLater("Flip vertically"), "V",       {'V'},                           Turn<Orientation::MirrorDown>},
     {TrLater("Crop..."),           "C",         {'C'},                           CropFileOf},
     {TrLater("Edit..."),           "F4",        {WXK_F4},                        EditFileOf},
+    {TrLater("&Quick actions"),    "",          {},                              nullptr, nullptr, NewQuickMenu},
     {TrLater("Sa&ve rotated picture"), "Ctrl+S", {WXK_CONTROL_S},             Of<&ViewFrame::SaveTurned>},
     {TrLater("&Undo"),             "Ctrl+Z",    {WXK_CONTROL_Z},                 Of<&ViewFrame::Undo>},
     {TrLater("Redo"),              "Ctrl+Y",    {WXK_CONTROL_Y},                 Of<&ViewFrame::Redo>},

@@ -9,6 +9,7 @@
 #include "catalog/history/file_history.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/models/view/view_status.h"
+#include "desktop/windows/edit/quick_menu.h"
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/shell/browser_tabs.h"
@@ -79,7 +80,11 @@ ViewFrame::ViewFrame(Shell& shell, const std::vector<std::string>& list, const s
   ShowPlace();
 }
 
-void ViewFrame::BuildMenus() { SetMenuBar(NewCommandBar(ViewCommands(), ViewMenus(), *this)); }
+void ViewFrame::BuildMenus() {
+  SetMenuBar(NewCommandBar(ViewCommands(), ViewMenus(), *this));
+  HandleQuickActions(
+      *this, shell_, [] { return true; }, [this] { return std::vector{File()}; });
+}
 
 void ViewFrame::BuildCanvas() {
   canvas_ = new ViewCanvas(this, {.resized = [this] { Resized(); },
@@ -479,6 +484,7 @@ void ViewFrame::OnKey(wxKeyEvent& event) {
   if (key == WXK_RIGHT || key == WXK_DOWN) return Step(1);
   if (event.ShiftDown() && key == 'S') return ChooseSlideshow();
   if (event.AltDown() && key == WXK_RETURN) return ShowInfoOf(*this);
+  if (const int id = QuickActionOfKey(event); id != wxID_NONE) return (void)ProcessCommand(id);
   if (event.AltDown() || (event.ShiftDown() && key >= '0' && key <= '9')) return event.Skip();
   // Some letters with Ctrl have the same codes as other keys.
   constexpr int kLettersWithCtrl[] = {'C', 'S', 'Y', 'Z'};

@@ -23,6 +23,8 @@ struct KeyCommand {
   void (*run)(Window& window);
   // whether the menu item is checked; null: not checkable
   bool (*checked)(const Window& window) = nullptr;
+  // if not null, the row is a submenu, whose commands the window handles
+  wxMenu* (*newSubmenu)() = nullptr;
 };
 
 // Finds the command of a key; null if there is none.
@@ -44,6 +46,10 @@ void ShowCommandMenu(std::span<const KeyCommand<Window>> commands, Window& windo
   for (const KeyCommand<Window>& command : commands) {
     if (command.text == nullptr) {
       menu.AppendSeparator();
+      continue;
+    }
+    if (command.newSubmenu != nullptr) {
+      menu.AppendSubMenu(command.newSubmenu(), Label(command.text));
       continue;
     }
     // Keys are only displayed, as the window handles them.
@@ -85,6 +91,10 @@ wxMenuBar* NewCommandBar(std::span<const KeyCommand<Window>> commands,
     for (const KeyCommand<Window>& command : commands) {
       if (command.text == nullptr) ++group;
       if (command.text == nullptr || group != row.group) continue;
+      if (command.newSubmenu != nullptr) {
+        menu->AppendSubMenu(command.newSubmenu(), Label(command.text));
+        continue;
+      }
       const bool checkable = command.checked != nullptr;
       wxMenuItem* const item = menu->Append(wxID_ANY, MenuTextOf(command), wxEmptyString,
                                             checkable ? wxITEM_CHECK : wxITEM_NORMAL);
