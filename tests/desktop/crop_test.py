@@ -1,8 +1,10 @@
 #!/usr/bin/env python3
 """The Crop window of the real program: one picture, a whole selection, ratio and angle."""
+import re
 import struct
+import subprocess
 
-from driven_desktop import needs_manager, run
+from driven_desktop import PROJECT, needs_manager, run
 from edit_test import applied, browser_of
 
 WIDTH, HEIGHT = 150, 112  # of the sample
@@ -120,6 +122,49 @@ def copies_with_ratio_and_angle(folder):
         assert made.read_bytes() == wanted
 
 
+def a_horizon_is_drawn(folder):
+    with browser_of(folder, "a.bmp") as (desktop, pictures):
+        before = (pictures / "a.bmp").read_bytes()
+        open_crop(desktop, 1)
+        window = desktop.focus("^Crop: ")
+        desktop.key("F9", "h")  # the panel is closed, as it may cover the picture
+        desktop.settle()
+        desktop.xdotool("mousemove", "--window", window, 500, 300, "mousedown", 1)
+        desktop.xdotool("mousemove", "--window", window, 600, 310)
+        desktop.screenshot("crop-horizon")
+        desktop.xdotool("mousemove", "--window", window, 700, 320, "mouseup", 1)
+        desktop.wait(r"crop-angle -5.71")
+        desktop.wait(r"crop-picture 1/1")
+        area = desktop.wait(r"crop-area ").split()[1]
+        desktop.key("Return", "Return")
+        desktop.wait(r"batch ended status=0")
+        made = (pictures / "a.bmp").read_bytes()
+        (pictures / "a.bmp").write_bytes(before)
+        recipe = f"straighten -5.71; crop {area}"
+        assert made == applied(pictures / "a.bmp", recipe, folder / "peer", "bmp")
+
+
+def the_rectangle_goes_around_faces(folder):
+    face = 200, 220, 90  # center and size
+    with browser_of(folder, "a.bmp") as (desktop, pictures):
+        drawn = subprocess.run([PROJECT / "tests/support/drawn_faces.py", pictures / "a.bmp",
+                                ",".join(map(str, face))])
+        if drawn.returncode == 77:
+            return print("Pillow is not installed: left out")
+        desktop.key("ctrl+a", "shift+F4")
+        desktop.wait(r"crop-picture 1/1 640x480")
+        desktop.focus("^Crop: ")
+        desktop.key("f")
+        status, count = desktop.wait(r"crop-faces ").split()[1:]
+        if status == "22":
+            return print("the face detector is not installed: left out")
+        assert (status, count) == ("0", "1")
+        area = desktop.wait(r"crop-area ").split()[1]
+        width, height, x, y = map(int, re.split(r"[x+]", area))
+        assert x < face[0] < x + width and y < face[1] < y + height, area
+        assert face[2] < width < 5 * face[2] and height < 480, area
+
+
 if __name__ == "__main__":
     run(one_jpeg_without_loss, through_a_selection, pictures_that_cannot_be_read,
-        copies_with_ratio_and_angle)
+        copies_with_ratio_and_angle, a_horizon_is_drawn, the_rectangle_goes_around_faces)
