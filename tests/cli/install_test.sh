@@ -51,18 +51,24 @@ for file in bash-completion/completions/fotomill zsh/site-functions/_fotomill \
   Expect "$file" "*convert*" "$(<"$prefix/share/$file")"
 done
 
+# Errors and warnings but one: the program has no web page.
+AppStreamProblems() {
+  local file=$prefix/share/metainfo/org.fotomill.Fotomill.metainfo.xml
+  appstreamcli validate --no-net "$file" >"$work/log" 2>&1
+  grep -q 'alidation' "$work/log" || cat "$work/log"
+  grep -E '^ *[EW]: ' "$work/log" | grep -v 'url-homepage-missing$'
+}
+
 if [[ -x $prefix/bin/fotomill-desktop ]]; then
   for file in man/man1/fotomill-desktop.1 applications/fotomill-desktop.desktop \
     icons/hicolor/scalable/apps/fotomill-desktop.svg mime/packages/fotomill-formats.xml \
-    thumbnailers/fotomill.thumbnailer metainfo/fotomill-desktop.metainfo.xml; do
+    thumbnailers/fotomill.thumbnailer metainfo/org.fotomill.Fotomill.metainfo.xml; do
     Expect "$file" "yes" "$([[ -s $prefix/share/$file ]] && echo yes)"
   done
   ! command -v desktop-file-validate >/dev/null ||
     Expect "desktop entry" "" \
       "$(desktop-file-validate "$prefix/share/applications/fotomill-desktop.desktop")"
-  ! command -v appstreamcli >/dev/null ||
-    Expect "AppStream" "0" \
-      "$(appstreamcli validate --no-net "$prefix/share/metainfo/fotomill-desktop.metainfo.xml" >"$work/log" 2>&1; echo $?)"
+  ! command -v appstreamcli >/dev/null || Expect "AppStream" "" "$(AppStreamProblems)"
 fi
 
 # Uninstalling removes our files and keeps others.
