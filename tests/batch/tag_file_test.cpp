@@ -6,7 +6,9 @@
 #include "files/file_operation.h"
 #include "files/previous_file.h"
 #include "formats/bmp/bmp.h"
+#include "formats/gif/gif.h"
 #include "formats/jpeg/jpeg.h"
+#include "formats/photoshop/psd.h"
 #include "support/codecs.h"
 #include "support/faults.h"
 #include "support/files.h"
@@ -26,10 +28,10 @@ PictureTags TagsIn(const std::string& path) {
 
 // Every operation on the system fails once: each file is the old or the new one, and nothing else
 // is there.
-TEST(TagFile, FaultsLoseNothing) {
+void SweepFaults(const std::string& name, const std::vector<uint8_t>& old) {
+  SCOPED_TRACE(name);
   const TemporaryFolder folder;
-  const std::string path = folder.Path("a.jpg"), sidecar = path + ".xmp";
-  const std::vector<uint8_t> old = Jpeg();
+  const std::string path = folder.Path(name), sidecar = path + ".xmp";
   WriteBytes(path, old);
   TagRequest beside = kRequest;
   beside.sidecarOnly = true;
@@ -53,10 +55,16 @@ TEST(TagFile, FaultsLoseNothing) {
     if (result.status == Status::Ok) {
       EXPECT_EQ(second, newSidecar);
     }
-    EXPECT_EQ(folder.Names(), (std::vector<std::string>{"a.jpg", "a.jpg.xmp"}));
+    EXPECT_EQ(folder.Names(), (std::vector<std::string>{name, name + ".xmp"}));
     platform::faultCountdown = left;
   });
   EXPECT_GT(faults, 8);
+}
+
+TEST(TagFile, FaultsLoseNothing) {
+  SweepFaults("a.jpg", Jpeg());
+  SweepFaults("a.gif", Encode(GifWrite, *PatternPicture(32, 16, 8)));
+  SweepFaults("a.psd", Encode(PsdWrite, *PatternPicture(32, 16, 24)));
 }
 
 TEST(TagFile, UndoGivesFilesBackAndRemovesNewSidecars) {

@@ -240,9 +240,50 @@ def working_files_of_killed_runs():
         check(status == 0 and not stale.exists(), f"a killed run's working file: {status} {err}")
 
 
+def gif(frames):
+    """A GIF with many frames of one pixel."""
+    frame = bytes.fromhex("2c00000000010001000002024401 00")
+    return b"GIF89a" + bytes.fromhex("01000100800000 000000ffffff") + frame * frames + b"\x3b"
+
+
+def changes_killed():
+    """Tags of GIF and PSD files, and times: each file is the old or the new one, and times can be
+    undone."""
+    psd = b"8BPS\0\1" + bytes(6) + bytes.fromhex("0001 00000001 00000001 0008 0001") + bytes(14)
+    with Place() as place:
+        for name, old in (("t.gif", gif(3)), ("t.psd", psd)):
+            place.file("one/" + name, old)
+        place.run("tag", "one", "--in-place", "--rating", "3")
+        made = {name: (place.path / "one" / name).read_bytes() for name in ("t.gif", "t.psd")}
+        check(made["t.gif"] != gif(3) and made["t.psd"] != psd, "the tags are in the files")
+        for attempt in range(12):
+            folder = place.path / f"in{attempt}"
+            for i in range(150):
+                place.file(f"in{attempt}/n{i}.gif", gif(3))
+                place.file(f"in{attempt}/n{i}.psd", psd)
+            times = {p.name: p.stat().st_mtime_ns for p in folder.iterdir()}
+            process = place.start("touch", f"in{attempt}", "--at", "2024-05-31")
+            time.sleep(0.004 + 0.002 * attempt)
+            process.send_signal(signal.SIGKILL)
+            process.communicate()
+            status, _, err = place.run("touch", "--undo")
+            check(status == 0 and times == {p.name: p.stat().st_mtime_ns for p in folder.iterdir()},
+                  f"the times after a kill: {status} {err[:300]}")
+            process = place.start("tag", f"in{attempt}", "--in-place", "--rating", "3")
+            time.sleep(0.004 + 0.004 * attempt)
+            process.send_signal(signal.SIGKILL)
+            process.communicate()
+            for path in folder.iterdir():
+                if path.suffix not in (".gif", ".psd"):
+                    continue  # a working file
+                found = path.read_bytes()
+                check(found in (gif(3) if path.suffix == ".gif" else psd, made["t" + path.suffix]),
+                      f"{path.name} after a kill")
+
+
 def main():
     for case in (folders_that_one_may_not_enter, reasons, turns_at_once, replaced_meanwhile,
-                 attributes, renames_killed,
+                 attributes, renames_killed, changes_killed,
                  held_locks, two_cleanings, links_of_the_system, working_files_of_killed_runs):
         if len(sys.argv) > 1 and case.__name__ not in sys.argv[1:]:
             continue

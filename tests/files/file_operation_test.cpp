@@ -9,6 +9,7 @@
 #include "files/previous_file.h"
 #include "files/undo_list.h"
 #include "platform/files.h"
+#include "support/faults.h"
 #include "support/files.h"
 #include "support/scoped_environment.h"
 #include "texts/texts.h"
@@ -144,6 +145,28 @@ TEST_F(FileOperationTest, SidecarsAreRemovedWithTheirPictures) {
   EXPECT_TRUE(platform::FileExists(From("a.nef.xmp")));
 }
 
+// Every operation on the system fails once: what did not go to the trash is where it was, and undo
+// brings back the rest.
+TEST_F(FileOperationTest, FaultsInTheTrashLoseNothing) {
+  const FileOperationOptions options{.commentExtension = "txt"};
+  const std::vector<std::string> names = {"a.png", "a.png.txt", "a.png.xmp", "b.png", "sub"};
+  for (const char* name : {"a.png.xmp", "a.png.txt"}) WriteText(From(name), name);
+  const int64_t faults = test::ForEachFault([&] {
+    const FileOperationResult done = CarryOut(
+        PlanFileOperation(FileOperationKind::Trash, {From("a.png"), From("b.png")}, {}, options));
+    const int64_t left = platform::faultCountdown.exchange(0);
+    if (done.done.steps.size() == 2 && done.failures.empty()) {
+      EXPECT_LE(Names("from").size(), 3u);  // sidecars stay if it is unknown whose they are
+    }
+    EXPECT_THAT(Revert(done.done).failures, IsEmpty());
+    EXPECT_EQ(Names("from"), names);
+    for (const char* name : {"a.png", "a.png.xmp", "a.png.txt", "b.png"})
+      EXPECT_EQ(ReadText(From(name)), name);
+    platform::faultCountdown = left;
+  });
+  EXPECT_GT(faults, 8);
+}
+
 TEST_F(FileOperationTest, TimesAreUndoneUnlessTheFileWasChanged) {
   const auto times = [&] { return platform::FileTimesOf(From("a.png")).value(); };
   const platform::ExactTime old{1'000'000'000, 123'456'789}, access{1'100'000'000, 5};
@@ -164,6 +187,36 @@ TEST_F(FileOperationTest, TimesAreUndoneUnlessTheFileWasChanged) {
   const platform::ExactTime now = times().modified;
   EXPECT_EQ(Revert(operation).failures.size(), 1u);
   EXPECT_EQ(times().modified, now);
+}
+
+// Every operation on the system fails once while times are set: they are the old ones, or the log
+// brings these back.
+TEST_F(FileOperationTest, FaultsWhileTimesAreSetLoseNone) {
+  const std::string dataBefore = DataFolder();
+  SetDataFolder(folder_.Path("data"));
+  const platform::ExactTime old{1'000'000'000, 123'456'789}, set{1'500'000'000, 0};
+  const auto time = [&] { return platform::ModificationTime(From("a.png")).value(); };
+  ASSERT_TRUE(platform::SetFileTimes(From("a.png"), {}, old));
+  const int64_t faults = test::ForEachFault([&] {
+    FileTimeChange change;
+    {
+      TimesLog log;
+      change = FileTimeChanger({.start = set.seconds}, false, &log).Change(From("a.png"), 0);
+    }
+    const int64_t left = platform::faultCountdown.exchange(0);
+    EXPECT_EQ(time(), change.status == Status::Ok ? set : old);
+    const auto logged = ReadTimesLog();
+    if (change.status == Status::Ok && change.logged) {
+      ASSERT_TRUE(logged && logged->size() == 1);
+      EXPECT_EQ(UndoTimes(logged->front(), false).status, Status::Ok);
+      EXPECT_EQ(time(), old);
+    }
+    EXPECT_TRUE(platform::SetFileTimes(From("a.png"), {}, old));
+    EXPECT_TRUE(WriteTimesLog({}));
+    platform::faultCountdown = left;
+  });
+  EXPECT_GT(faults, 3);
+  SetDataFolder(dataBefore);
 }
 
 // Thumbnail files go where their pictures go, and records of what is no longer there are marked.
