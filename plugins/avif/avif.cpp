@@ -174,6 +174,9 @@ int32_t ReadMetadata(const char* fileName, const FMW_READ_REQUEST*, FMW_METADATA
   metadata->xmp = FmwBlock(image.xmp.data, image.xmp.size);
   metadata->icc = FmwBlock(image.icc.data, image.icc.size);
   if (decoder->imageCount > 1) metadata->delays = FrameDelays(decoder.get());
+#if AVIF_VERSION_MAJOR >= 1
+  if (decoder->repetitionCount >= 0) metadata->rounds = decoder->repetitionCount + 1;
+#endif
   return 0;
 }
 
@@ -249,22 +252,67 @@ void AddMetadata(const FMW_WRITE_REQUEST& request, avifImage& image) {
   if (image.exif.size > 0) FmwSetUpright(image.exif.data, image.exif.size);
 }
 
-int32_t Write(const char* fileName, const FmwBitmap* given, const FMW_WRITE_REQUEST* request) {
-  const bool lossless = request->lossless != 0;
-  Image image;
-  int32_t error = ToImage(*given, lossless, request->options[kSampling], image);
-  if (error != 0) return error;
-  AddMetadata(*request, *image);
-  const std::unique_ptr<avifEncoder, EncoderDeleter> encoder(avifEncoderCreate());
-  if (encoder == nullptr) return FMW_ERROR_MEMORY;
+using Encoder = std::unique_ptr<avifEncoder, EncoderDeleter>;
+
+Encoder NewEncoder(const FMW_WRITE_REQUEST& request) {
+  Encoder encoder(avifEncoderCreate());
+  if (encoder == nullptr) return encoder;
   encoder->maxThreads = ThreadCount();
-  encoder->speed = std::clamp(request->options[kSpeed], 0, 10);
-  SetQuality(*encoder, request->quality > 0 ? request->quality : request->options[kQuality],
-             lossless);
-  Output output;
-  error = ErrorOf(avifEncoderWrite(encoder.get(), image.get(), &output.data));
+  encoder->speed = std::clamp(request.options[kSpeed], 0, 10);
+  const int32_t quality = request.quality > 0 ? request.quality : request.options[kQuality];
+  SetQuality(*encoder, quality, request.lossless != 0);
+  return encoder;
+}
+
+int32_t WriteOutput(const char* fileName, avifResult result, const Output& output) {
+  const int32_t error = ErrorOf(result);
   if (error != 0) return error == FMW_ERROR_DAMAGED ? FMW_ERROR_UNSUITABLE : error;
   return FmwWriteFile(fileName, output.data.data, output.data.size);
+}
+
+int32_t Write(const char* fileName, const FmwBitmap* given, const FMW_WRITE_REQUEST* request) {
+  Image image;
+  const int32_t error = ToImage(*given, request->lossless != 0, request->options[kSampling], image);
+  if (error != 0) return error;
+  AddMetadata(*request, *image);
+  const Encoder encoder = NewEncoder(*request);
+  if (encoder == nullptr) return FMW_ERROR_MEMORY;
+  Output output;
+  return WriteOutput(fileName, avifEncoderWrite(encoder.get(), image.get(), &output.data), output);
+}
+
+// Older versions of the library have no place for the number of rounds; readers then repeat the
+// animation without end.
+void SetRounds(avifEncoder& encoder, int32_t rounds) {
+#if AVIF_VERSION_MAJOR >= 1
+  encoder.repetitionCount = rounds == 0 ? AVIF_REPETITION_COUNT_INFINITE : rounds - 1;
+#else
+  (void)encoder;
+  (void)rounds;
+#endif
+}
+
+int32_t WriteFrames(const char* fileName, const FMW_FRAMES* frames,
+                    const FMW_WRITE_REQUEST* request) {
+  const Encoder encoder = NewEncoder(*request);
+  if (encoder == nullptr) return FMW_ERROR_MEMORY;
+  encoder->timescale = 1000;
+  SetRounds(*encoder, frames->rounds);
+  for (int32_t i = 0; i < frames->count; ++i) {
+    const FMW_HANDLE bitmap = frames->frame(frames, i);
+    if (bitmap == nullptr) return FMW_ERROR_READ;
+    Image image;
+    int32_t error =
+        ToImage(FmwGivenBitmap(bitmap), request->lossless != 0, request->options[kSampling], image);
+    if (error != 0) return error;
+    AddMetadata(*request, *image);
+    const auto delay = static_cast<uint64_t>(std::max(frames->delays[i], 1));
+    error =
+        ErrorOf(avifEncoderAddImage(encoder.get(), image.get(), delay, AVIF_ADD_IMAGE_FLAG_NONE));
+    if (error != 0) return error == FMW_ERROR_DAMAGED ? FMW_ERROR_UNSUITABLE : error;
+  }
+  Output output;
+  return WriteOutput(fileName, avifEncoderFinish(encoder.get(), &output.data), output);
 }
 
 constexpr FmwModule kModule = {
@@ -285,3 +333,4 @@ FMW_MODULE_LIBRARIES("libavif\t%s\tBSD-2-Clause", avifVersion())
 FMW_MODULE_READS(Describe, Read)
 FMW_MODULE_METADATA(ReadMetadata)
 FMW_MODULE_WRITES(Write)
+FMW_MODULE_WRITES_FRAMES(WriteFrames)

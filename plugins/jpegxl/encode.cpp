@@ -24,11 +24,16 @@ JxlOrientation OrientationOf(const FMW_BLOCK& exif) {
   return static_cast<JxlOrientation>(value >= 1 && value <= 8 ? value : 1);
 }
 
-bool SetHeader(JxlEncoder* encoder, const FmwBitmap& given, bool lossless,
-               const FMW_WRITE_REQUEST& request) {
+bool SetHeader(JxlEncoder* encoder, const FmwBitmap& given, bool gray, const FMW_FRAMES* frames,
+               bool lossless, const FMW_WRITE_REQUEST& request) {
   JxlBasicInfo info;
   JxlEncoderInitBasicInfo(&info);
-  const bool gray = FmwIsGray(&given) != 0;
+  if (frames != nullptr) {
+    info.have_animation = JXL_TRUE;
+    info.animation.tps_numerator = 1000;
+    info.animation.tps_denominator = 1;
+    info.animation.num_loops = static_cast<uint32_t>(std::max(frames->rounds, 0));
+  }
   info.xsize = given.width;
   info.ysize = given.height;
   info.bits_per_sample = 8;
@@ -67,8 +72,7 @@ bool AddMetadata(JxlEncoder* encoder, const FMW_WRITE_REQUEST& request) {
   return done;
 }
 
-bool AddPixels(JxlEncoderFrameSettings* settings, const FmwBitmap& given) {
-  const bool gray = FmwIsGray(&given) != 0;
+bool AddPixels(JxlEncoderFrameSettings* settings, const FmwBitmap& given, bool gray) {
   const uint32_t channels = gray ? 1 : given.bits == 32 ? 4 : 3;
   const JxlPixelFormat format = {channels, JXL_TYPE_UINT8, JXL_NATIVE_ENDIAN, 0};
   std::vector<uint8_t> pixels(size_t{given.width} * given.height * channels);
@@ -82,45 +86,89 @@ bool AddPixels(JxlEncoderFrameSettings* settings, const FmwBitmap& given) {
          JXL_ENC_SUCCESS;
 }
 
-}  // namespace
+// An encoder with all settings made. With frames, it encodes an animation.
+struct Encoding {
+  Runner runner;  // outlives the encoder
+  Encoder encoder;
+  JxlEncoderFrameSettings* settings = nullptr;  // owned by the encoder
 
-int32_t Finish(JxlEncoder* encoder, const char* fileName) {
-  JxlEncoderCloseInput(encoder);
-  std::vector<uint8_t> out(1 << 16);
-  size_t done = 0;
+  int32_t Start(const FmwBitmap& given, bool gray, const FMW_FRAMES* frames,
+                const FMW_WRITE_REQUEST& request) {
+    encoder.reset(JxlEncoderCreate(nullptr));
+    runner = NewRunner();
+    if (encoder == nullptr || runner == nullptr) return FMW_ERROR_MEMORY;
+    JxlEncoderSetParallelRunner(encoder.get(), JxlThreadParallelRunner, runner.get());
+    const bool lossless =
+        request.lossless != 0 || (request.quality == 0 && request.options[kLossless] != 0);
+    const int32_t quality = request.quality > 0 ? request.quality : request.options[kQuality];
+    if (!AddMetadata(encoder.get(), request) ||
+        !SetHeader(encoder.get(), given, gray, frames, lossless, request))
+      return FMW_ERROR_UNSUITABLE;
+    settings = JxlEncoderFrameSettingsCreate(encoder.get(), nullptr);
+    JxlEncoderFrameSettingsSetOption(settings, JXL_ENC_FRAME_SETTING_EFFORT,
+                                     std::clamp(request.options[kEffort], 1, 9));
+    if (lossless) {
+      JxlEncoderSetFrameLossless(settings, JXL_TRUE);
+    } else {
+      JxlEncoderSetFrameDistance(settings, DistanceOf(quality));
+    }
+    return 0;
+  }
+};
+
+// Encodes what the encoder was given so far, to the end of `out`.
+int32_t Drain(JxlEncoder* encoder, std::vector<uint8_t>& out, size_t& done) {
   for (;;) {
+    if (out.size() - done < 1 << 15) out.resize(2 * out.size() + (1 << 16));
     uint8_t* next = out.data() + done;
     size_t left = out.size() - done;
     const JxlEncoderStatus status = JxlEncoderProcessOutput(encoder, &next, &left);
     done = static_cast<size_t>(next - out.data());
-    if (status == JXL_ENC_SUCCESS) break;
+    if (status == JXL_ENC_SUCCESS) return 0;
     if (status != JXL_ENC_NEED_MORE_OUTPUT) return FMW_ERROR_UNSUITABLE;
-    out.resize(2 * out.size());
   }
-  return FmwWriteFile(fileName, out.data(), done);
+}
+
+}  // namespace
+
+int32_t Finish(JxlEncoder* encoder, const char* fileName) {
+  JxlEncoderCloseInput(encoder);
+  std::vector<uint8_t> out;
+  size_t done = 0;
+  const int32_t error = Drain(encoder, out, done);
+  return error != 0 ? error : FmwWriteFile(fileName, out.data(), done);
 }
 
 int32_t Write(const char* fileName, const FmwBitmap* given, const FMW_WRITE_REQUEST* request) {
-  const Encoder encoder(JxlEncoderCreate(nullptr));
-  const Runner runner = NewRunner();
-  if (encoder == nullptr || runner == nullptr) return FMW_ERROR_MEMORY;
-  JxlEncoderSetParallelRunner(encoder.get(), JxlThreadParallelRunner, runner.get());
-  const bool lossless =
-      request->lossless != 0 || (request->quality == 0 && request->options[kLossless] != 0);
-  const int32_t quality = request->quality > 0 ? request->quality : request->options[kQuality];
-  if (!AddMetadata(encoder.get(), *request) ||
-      !SetHeader(encoder.get(), *given, lossless, *request))
-    return FMW_ERROR_UNSUITABLE;
-  JxlEncoderFrameSettings* settings = JxlEncoderFrameSettingsCreate(encoder.get(), nullptr);
-  JxlEncoderFrameSettingsSetOption(settings, JXL_ENC_FRAME_SETTING_EFFORT,
-                                   std::clamp(request->options[kEffort], 1, 9));
-  if (lossless) {
-    JxlEncoderSetFrameLossless(settings, JXL_TRUE);
-  } else {
-    JxlEncoderSetFrameDistance(settings, DistanceOf(quality));
+  Encoding encoding;
+  const int32_t error = encoding.Start(*given, FmwIsGray(given) != 0, nullptr, *request);
+  if (error != 0) return error;
+  if (!AddPixels(encoding.settings, *given, FmwIsGray(given) != 0)) return FMW_ERROR_UNSUITABLE;
+  return Finish(encoding.encoder.get(), fileName);
+}
+
+int32_t WriteFrames(const char* fileName, const FMW_FRAMES* frames,
+                    const FMW_WRITE_REQUEST* request) {
+  Encoding encoding;
+  std::vector<uint8_t> out;
+  size_t done = 0;
+  for (int32_t i = 0; i < frames->count; ++i) {
+    const FMW_HANDLE bitmap = frames->frame(frames, i);
+    if (bitmap == nullptr) return FMW_ERROR_READ;
+    const FmwBitmap given = FmwGivenBitmap(bitmap);
+    int32_t error = i == 0 ? encoding.Start(given, false, frames, *request) : 0;
+    if (error != 0) return error;
+    JxlFrameHeader header;
+    JxlEncoderInitFrameHeader(&header);
+    header.duration = static_cast<uint32_t>(std::max(frames->delays[i], 0));
+    if (JxlEncoderSetFrameHeader(encoding.settings, &header) != JXL_ENC_SUCCESS ||
+        !AddPixels(encoding.settings, given, false))
+      return FMW_ERROR_UNSUITABLE;
+    if (i + 1 == frames->count) JxlEncoderCloseInput(encoding.encoder.get());
+    error = Drain(encoding.encoder.get(), out, done);
+    if (error != 0) return error;
   }
-  if (!AddPixels(settings, *given)) return FMW_ERROR_UNSUITABLE;
-  return Finish(encoder.get(), fileName);
+  return FmwWriteFile(fileName, out.data(), done);
 }
 
 }  // namespace jpegxl

@@ -76,6 +76,7 @@ FMW_MODULE_LIBRARIES("libjxl\t%u.%u.%u\tBSD-3-Clause", JxlDecoderVersion() / 100
 FMW_MODULE_READS(Describe, Read)
 FMW_MODULE_METADATA(ReadMetadata)
 FMW_MODULE_WRITES(Write)
+FMW_MODULE_WRITES_FRAMES(WriteFrames)
 
 FMW_EXPORT_C int32_t FMW_CALL PLUGIN12Transcode(const char* source, const char* destination,
                                                 int32_t* error, const FMW_HOST_SERVICES*) {

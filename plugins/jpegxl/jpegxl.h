@@ -68,6 +68,9 @@ int32_t Read(const char* fileName, const FMW_READ_REQUEST* request, FmwBitmap* b
 
 int32_t Write(const char* fileName, const FmwBitmap* given, const FMW_WRITE_REQUEST* request);
 
+int32_t WriteFrames(const char* fileName, const FMW_FRAMES* frames,
+                    const FMW_WRITE_REQUEST* request);
+
 // Runs the encoder to its end and writes what it gives.
 int32_t Finish(JxlEncoder* encoder, const char* fileName);
 

@@ -204,9 +204,9 @@ class Batch {
     const bool all =
         function_.page == kAllPages ||
         std::ranges::find(job_.everyPage, to.extension.view()) != job_.everyPage.end();
-    // PNG has frames, but not pages
+    // PNG and plug-ins have frames, but not pages
     const bool holds = to.sequence != nullptr && target.output->mostBytes == 0 &&
-                       (animation || (all && (to.flags & FMT_PNG) == 0));
+                       (animation || (all && (to.flags & (FMT_PNG | FMT_SPARE)) == 0));
     target.sequence = holds;
     target.pages = all && !holds ? picture.pageCount : 0;
   }

@@ -251,6 +251,19 @@ typedef struct FMW_WRITE_REQUEST {
   const char* comment;               /* 0 if there is none */
 } FMW_WRITE_REQUEST;
 
+/* Passed to PLUGIN12WriteAnimation. */
+typedef struct FMW_FRAMES {
+  int32_t size;          /*  0 */
+  int32_t version;       /*  4: 3073 or later */
+  int32_t count;         /*  8: frames, at least 1 */
+  int32_t rounds;        /* 12: times the animation plays, 0 for endless */
+  int32_t width, height; /* 16: of all frames, pixels */
+  int32_t bits;          /* 24: per pixel of all frames, 24, or 32 if any of them is transparent */
+  const int32_t* delays; /* 28: of each frame, milliseconds */
+  /* A frame, from 0, as a packed bitmap that the next call replaces; 0 if it cannot be read. */
+  FMW_HANDLE(FMW_CALL* frame)(const struct FMW_FRAMES* frames, int32_t index);
+} FMW_FRAMES;
+
 #pragma pack(pop)
 
 /* An option of a module, which the program shows in the module's options box and stores. */
@@ -284,6 +297,11 @@ typedef FMW_HANDLE(FMW_CALL* FMW_READ_IMAGE_12)(const char* fileName,
 typedef int32_t(FMW_CALL* FMW_WRITE_IMAGE_12)(const char* fileName, FMW_HANDLE bitmap,
                                               const FMW_WRITE_REQUEST* request, int32_t* error,
                                               const FMW_HOST_SERVICES* services);
+/* PLUGIN12WriteAnimation: writes a new file with several frames, each of them whole, under the
+ * rules of PLUGIN11WriteImage. Only for modules with FMW_FORMAT_FRAMES. */
+typedef int32_t(FMW_CALL* FMW_WRITE_ANIMATION)(const char* fileName, const FMW_FRAMES* frames,
+                                               const FMW_WRITE_REQUEST* request, int32_t* error,
+                                               const FMW_HOST_SERVICES* services);
 /* PLUGIN12Transcode: stores the compressed picture of a file in the other format without decoding
  * it, so that nothing is lost; the extensions tell the formats. FMW_ERROR_UNSUPPORTED or
  * FMW_ERROR_FORMAT for files that it cannot do this with. */

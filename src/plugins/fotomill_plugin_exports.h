@@ -6,7 +6,8 @@
  *   FMW_MODULE(module)
  *   FMW_MODULE_READS(Describe, Read)
  *
- * and, as far as it has them, FMW_MODULE_METADATA, FMW_MODULE_WRITES and FMW_MODULE_LIBRARIES.
+ * and, as far as it has them, FMW_MODULE_METADATA, FMW_MODULE_WRITES, FMW_MODULE_WRITES_FRAMES and
+ * FMW_MODULE_LIBRARIES.
  */
 #ifndef FOTOMILL_PLUGIN_EXPORTS_H
 #define FOTOMILL_PLUGIN_EXPORTS_H
@@ -135,6 +136,17 @@ static inline void FmwGrayPalette(FMW_PICTURE_INFO* info) {
                                                    const FMW_HOST_SERVICES* services) {          \
     const FMW_WRITE_REQUEST request = FmwOldWriteRequest(FmwThisModule(), comment);              \
     return PLUGIN12WriteImage(fileName, bitmap, &request, error, services);                      \
+  }
+
+/* int32_t write(const char* fileName, const FMW_FRAMES* frames, const FMW_WRITE_REQUEST* request)
+ */
+#define FMW_MODULE_WRITES_FRAMES(write)                                                 \
+  FMW_EXPORT_C int32_t FMW_CALL PLUGIN12WriteAnimation(                                 \
+      const char* fileName, const FMW_FRAMES* frames, const FMW_WRITE_REQUEST* request, \
+      int32_t* error, const FMW_HOST_SERVICES* services) {                              \
+    (void)services;                                                                     \
+    *error = write(fileName, frames, request);                                          \
+    return *error == 0;                                                                 \
   }
 
 /* The libraries of FMW_GET_LIBRARIES, as arguments of printf. */

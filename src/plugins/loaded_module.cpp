@@ -43,6 +43,7 @@ void LookUpExports(LoadedModule& module) {
   LookUp(library, "PLUGIN12GetMetadata", module.exports.getMetadata);
   LookUp(library, "PLUGIN12ReadImage", module.exports.readImage12);
   LookUp(library, "PLUGIN12WriteImage", module.exports.writeImage12);
+  LookUp(library, "PLUGIN12WriteAnimation", module.exports.writeAnimation);
   LookUp(library, "PLUGIN12Transcode", module.exports.transcode);
 }
 
@@ -102,6 +103,7 @@ bool LoadModule(const std::string& path, LoadedModule& module, ModuleFacts& fact
   facts.hasDialog = exports.configure != nullptr;
   facts.hasMetadata = module.exports.getMetadata != nullptr;
   facts.takesMetadata = module.exports.writeImage12 != nullptr;
+  facts.writesFrames = exports.writeAnimation != nullptr;
   facts.transcodes = module.exports.transcode != nullptr;
   if (exports.getVersion != nullptr) facts.version = TextOf(exports.getVersion());
   if (exports.getCopyright != nullptr) facts.copyright = TextOf(exports.getCopyright());

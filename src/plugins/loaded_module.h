@@ -24,6 +24,7 @@ struct PluginExports {
   FMW_GET_METADATA getMetadata = nullptr;
   FMW_READ_IMAGE_12 readImage12 = nullptr;
   FMW_WRITE_IMAGE_12 writeImage12 = nullptr;
+  FMW_WRITE_ANIMATION writeAnimation = nullptr;
   FMW_TRANSCODE transcode = nullptr;
 };
 

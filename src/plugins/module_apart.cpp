@@ -131,6 +131,14 @@ unsigned SecondsFor(unsigned atLeast, int32_t width, int32_t height) {
   return atLeast + static_cast<unsigned>(pixels / moduleLimits.pixelsPerSecond);
 }
 
+unsigned SecondsForFrames(const FrameFacts& frames) {
+  constexpr uint64_t kMost = 86400;
+  const uint64_t pixels =
+      static_cast<uint64_t>(frames.width) * static_cast<uint64_t>(frames.height);
+  const uint64_t more = pixels * frames.delays.size() / moduleLimits.pixelsPerSecond;
+  return moduleLimits.writeSeconds + static_cast<unsigned>(std::min(more, kMost));
+}
+
 void Put(std::span<const uint8_t> bytes, std::span<uint8_t>& target) {
   std::ranges::copy(bytes, target.begin());
   target = target.subspan(bytes.size());
@@ -213,21 +221,35 @@ Status WriteApart(const std::string& module, const ModuleOutput& output, const P
   order.xmp = output.xmp.size();
   order.icc = output.icc.size();
   order.comment = comment.size();
+  std::span<const uint8_t> delays;
+  unsigned seconds = SecondsFor(moduleLimits.writeSeconds, image.Width(), image.Height());
+  if (output.frames != nullptr) {
+    const FrameFacts& frames = *output.frames;
+    delays = {reinterpret_cast<const uint8_t*>(frames.delays.data()),
+              frames.delays.size() * sizeof(int32_t)};
+    order.bitmap = 0;
+    order.delays = delays.size();
+    order.width = frames.width;
+    order.height = frames.height;
+    order.rounds = frames.rounds;
+    order.transparent = frames.transparent ? 1 : 0;
+    seconds = SecondsForFrames(frames);
+  }
   SharedBlock block;
   if (!block.Allocate(kModuleAnswerBytes + order.bitmap + order.exif + order.xmp + order.icc +
-                      order.comment))
+                      order.comment + order.delays))
     return Status::MemoryAllocationError;
   std::span<uint8_t> rest = block.Bytes().subspan(kModuleAnswerBytes);
-  PutModuleBitmap(image, alpha, rest.first(order.bitmap));
+  if (order.bitmap > 0) PutModuleBitmap(image, alpha, rest.first(order.bitmap));
   rest = rest.subspan(order.bitmap);
   for (const auto bytes : {output.exif, output.xmp, output.icc}) Put(bytes, rest);
   Put({reinterpret_cast<const uint8_t*>(comment.data()), comment.size()}, rest);
+  Put(delays, rest);
   ModuleAnswer answer;
+  const std::string frameFile = output.frames == nullptr ? "" : output.frames->path;
   const ApartResult result =
-      Run(RequestBytes(order, module, output.fileName), surroundings.configuration,
-          {SecondsFor(moduleLimits.writeSeconds, image.Width(), image.Height()),
-           ApartKind::ModuleWriter},
-          surroundings, block, answer);
+      Run(RequestBytes(order, module, output.fileName, frameFile), surroundings.configuration,
+          {seconds, ApartKind::ModuleWriter}, surroundings, block, answer);
   return StatusOf(result, answer, Status::ErrorWritingFile);
 }
 

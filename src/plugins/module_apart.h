@@ -57,7 +57,8 @@ struct ApartBitmap {
 // `width` and `height` are those of the picture as described, which the bitmap may not exceed.
 Status ReadApart(const std::string& module, const ModuleQuestion& question, int32_t width,
                  int32_t height, const ApartSurroundings& surroundings, ApartBitmap& bitmap);
-// The bitmap of `output` is replaced by `image` and `alpha`, which may be empty.
+// The bitmap of `output` is replaced by `image` and `alpha`, which may be empty, unless it has
+// frames.
 Status WriteApart(const std::string& module, const ModuleOutput& output, const PackedImage& image,
                   const PackedImage& alpha, const ApartSurroundings& surroundings);
 Status TranscodeApart(const std::string& module, const std::string& source,

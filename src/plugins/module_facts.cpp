@@ -66,6 +66,7 @@ constexpr SwitchRow kSwitches[] = {
     {"dialog", &ModuleFacts::hasDialog},
     {"metadata", &ModuleFacts::hasMetadata},
     {"takesMetadata", &ModuleFacts::takesMetadata},
+    {"writesFrames", &ModuleFacts::writesFrames},
     {"transcodes", &ModuleFacts::transcodes},
 };
 

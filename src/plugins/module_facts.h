@@ -31,6 +31,7 @@ struct ModuleFacts {
   uint32_t flags2 = 0;       // FMW_FORMAT_ bits
   bool writes = false, hasComments = false, hasDialog = false, hasMetadata = false;
   bool takesMetadata = false;  // the writer is that of the newer interface
+  bool writesFrames = false;
   bool transcodes = false;
   std::string version, copyright;
   std::string libraries;  // a line each: name, version, license, separated by tabs

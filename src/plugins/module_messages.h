@@ -13,7 +13,8 @@ namespace fotomill {
 
 enum class ModuleOperation : int32_t { Facts, Describe, Read, Write, Transcode };
 
-// The request, followed by the module's path, the file's path and, to transcode, the destination.
+// The request, followed by the module's path, the file's path and a second path: to transcode, the
+// destination, to write an animation, the file with its frames.
 // The input is the configuration table, to read followed by the picture's comment.
 struct ModuleOrder {
   ModuleOperation operation = ModuleOperation::Facts;
@@ -23,7 +24,9 @@ struct ModuleOrder {
   uint32_t moduleSize = 0, fileSize = 0, destinationSize = 0;  // bytes of the paths
   uint64_t commentSize = 0;                                    // to read: in the input
   // To write: in the reply block, in this order, behind kModuleAnswerBytes.
-  uint64_t bitmap = 0, exif = 0, xmp = 0, icc = 0, comment = 0;
+  uint64_t bitmap = 0, exif = 0, xmp = 0, icc = 0, comment = 0, delays = 0;
+  // To write an animation.
+  int32_t width = 0, height = 0, rounds = 0, transparent = 0;
 };
 
 // The start of the reply; results are behind kModuleAnswerBytes, one after the other in this order.

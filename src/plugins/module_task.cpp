@@ -178,6 +178,18 @@ void AnswerWrite(const KeptModule& kept, const Request& request,
   const auto text = take(order.comment);
   const std::string comment(text.begin(), text.end());
   output.comment = comment.empty() ? nullptr : comment.c_str();
+  FrameFacts frames;
+  if (order.delays > 0) {
+    const auto delays = take(order.delays);
+    frames = {.path = request.destination,
+              .width = order.width,
+              .height = order.height,
+              .rounds = order.rounds,
+              .transparent = order.transparent != 0,
+              .delays = std::vector<int32_t>(delays.size() / sizeof(int32_t))};
+    std::memcpy(frames.delays.data(), delays.data(), frames.delays.size() * sizeof(int32_t));
+    output.frames = &frames;
+  }
   answer.status = WriteHere(kept.module, output, surroundings);
 }
 

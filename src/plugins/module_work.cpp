@@ -162,6 +162,33 @@ FMW_BLOCK BlockOf(std::span<const uint8_t> bytes) {
   return {bytes.empty() ? nullptr : const_cast<uint8_t*>(bytes.data()), bytes.size()};
 }
 
+FMW_WRITE_REQUEST WriteRequestOf(const ModuleOutput& output) {
+  FMW_WRITE_REQUEST request = {};
+  request.size = sizeof request;
+  request.version = FMW_PLUGIN_VERSION_12;
+  request.quality = output.quality;
+  request.lossless = output.lossless ? 1 : 0;
+  request.dpiX = output.dpiX;
+  request.dpiY = output.dpiY;
+  std::ranges::copy(output.options, request.options);
+  request.exif = BlockOf(output.exif);
+  request.xmp = BlockOf(output.xmp);
+  request.icc = BlockOf(output.icc);
+  request.comment = output.comment;
+  return request;
+}
+
+Status WriteFrames(const LoadedModule& module, const ModuleOutput& output, Call& call) {
+  if (module.exports.writeAnimation == nullptr) return Status::UnsupportedFunction;
+  FrameFileReader frames;
+  RETURN_IF_BAD(frames.Open(*output.frames));
+  const FMW_WRITE_REQUEST request = WriteRequestOf(output);
+  int32_t error = 0;
+  const int32_t written = module.exports.writeAnimation(output.fileName.c_str(), &frames.Frames(),
+                                                        &request, &error, call.Services());
+  return written != 0 ? Status::Ok : ModuleError(error, Status::ErrorWritingFile);
+}
+
 }  // namespace
 
 Status DescribeHere(const LoadedModule& module, const ModuleQuestion& question,
@@ -197,21 +224,11 @@ Status ReadHere(const LoadedModule& module, const ModuleQuestion& question,
 Status WriteHere(const LoadedModule& module, const ModuleOutput& output,
                  const ModuleSurroundings& surroundings) {
   Call call(surroundings);
+  if (output.frames != nullptr) return WriteFrames(module, output, call);
   void* const bitmap = const_cast<uint8_t*>(output.bitmap.data());
   int32_t error = 0, written = 0;
   if (module.exports.writeImage12 != nullptr) {
-    FMW_WRITE_REQUEST request = {};
-    request.size = sizeof request;
-    request.version = FMW_PLUGIN_VERSION_12;
-    request.quality = output.quality;
-    request.lossless = output.lossless ? 1 : 0;
-    request.dpiX = output.dpiX;
-    request.dpiY = output.dpiY;
-    std::ranges::copy(output.options, request.options);
-    request.exif = BlockOf(output.exif);
-    request.xmp = BlockOf(output.xmp);
-    request.icc = BlockOf(output.icc);
-    request.comment = output.comment;
+    const FMW_WRITE_REQUEST request = WriteRequestOf(output);
     written = module.exports.writeImage12(output.fileName.c_str(), bitmap, &request, &error,
                                           call.Services());
   } else if (module.exports.writeImage != nullptr) {

@@ -7,6 +7,7 @@
 
 #include "core/status.h"
 #include "picture/read_request.h"
+#include "plugins/frame_file.h"
 #include "plugins/loaded_module.h"
 
 namespace fotomill {
@@ -60,7 +61,8 @@ struct ModuleOutput {
   bool lossless = false;
   int32_t dpiX = 0, dpiY = 0;
   ModuleOptionValues options = {};
-  std::span<const uint8_t> bitmap;  // a packed bitmap
+  std::span<const uint8_t> bitmap;     // a packed bitmap
+  const FrameFacts* frames = nullptr;  // instead of the bitmap, for an animation
   std::span<const uint8_t> exif, xmp, icc;
   const char* comment = nullptr;
 };

@@ -168,9 +168,9 @@ void TakeSize(bool mayBeReduced, PictureRecord& picture) {
   picture.reduction = (picture.width + width - 1) / width;
 }
 
-// Has the module write the picture to `path`.
-Status CallWriter(const PluginFormat& format, PictureRecord& picture, const std::string& path,
-                  const WriteOptions& options) {
+// Has the module write the picture, or the frames instead of its image, to `path`.
+Status CallWriter(const PluginFormat& format, PictureRecord& picture, const FrameFacts* frames,
+                  const std::string& path, const WriteOptions& options) {
   const std::string comment =
       options.comment ? std::string(picture.comment.begin(), picture.comment.end()) : "";
   ModuleOutput output;
@@ -186,6 +186,7 @@ Status CallWriter(const PluginFormat& format, PictureRecord& picture, const std:
     output.xmp = picture.metadata.xmp;
   }
   output.comment = comment.empty() ? nullptr : comment.c_str();
+  output.frames = frames;
   PictureListener listener(picture);
   if (format.here == nullptr) {
     const auto carried = CarriedConfiguration(configuration);
@@ -193,11 +194,13 @@ Status CallWriter(const PluginFormat& format, PictureRecord& picture, const std:
                       {.listener = &listener, .configuration = carried, .stop = picture.stop});
   }
   platform::MemoryBlock bitmap;
-  if (!bitmap.Allocate(static_cast<size_t>(ModuleBitmapSize(picture.image, picture.alpha)),
-                       platform::Fill::Unset))
-    return Status::MemoryAllocationError;
-  PutModuleBitmap(picture.image, picture.alpha, bitmap.Bytes());
-  output.bitmap = bitmap.Bytes();
+  if (frames == nullptr) {
+    if (!bitmap.Allocate(static_cast<size_t>(ModuleBitmapSize(picture.image, picture.alpha)),
+                         platform::Fill::Unset))
+      return Status::MemoryAllocationError;
+    PutModuleBitmap(picture.image, picture.alpha, bitmap.Bytes());
+    output.bitmap = bitmap.Bytes();
+  }
   const ModuleCall call(PathOf(format), ModuleStage::Working);
   return WriteHere(*format.here, output, {.listener = &listener, .configuration = configuration});
 }
@@ -267,7 +270,9 @@ Status PluginRead(PictureRecord& picture, const ReadRequest& request) {
   return Status::Ok;
 }
 
-Status PluginWrite(PictureRecord& picture, const WriteOptions& options) {
+namespace {
+
+Status WriteFile(PictureRecord& picture, const FrameFacts* frames, const WriteOptions& options) {
   const PluginFormat* format = PluginFormatOf(picture.fileName);
   if (format == nullptr || !format->facts->writes) return Status::UnsupportedFunction;
   const std::string destination(picture.fileName.view());
@@ -275,12 +280,23 @@ Status PluginWrite(PictureRecord& picture, const WriteOptions& options) {
   platform::TemporaryFolder folder;
   if (!out.Create(destination) || !folder.Create()) return Status::ErrorCreatingFile;
   const std::string working = WorkingName(folder.Path(), destination);
-  RETURN_IF_BAD(CallWriter(*format, picture, working, options));
+  RETURN_IF_BAD(CallWriter(*format, picture, frames, working, options));
   if (!ReadsBack(*format, working)) return Status::ErrorWritingFile;
   platform::FileView written;
   if (!written.Open(working) || written.Bytes().empty()) return Status::ErrorWritingFile;
   out.Bytes(written.Bytes());
   return written.Intact() ? CommitOutput(out, options) : Status::ErrorWritingFile;
+}
+
+}  // namespace
+
+Status PluginWrite(PictureRecord& picture, const WriteOptions& options) {
+  return WriteFile(picture, nullptr, options);
+}
+
+Status PluginWriteFrames(PictureRecord& picture, const FrameFacts& frames,
+                         const WriteOptions& options) {
+  return WriteFile(picture, &frames, options);
 }
 
 Status DescribePluginFrames(const ReadRequest& request, PluginFrames& frames) {
@@ -318,6 +334,7 @@ int32_t BindPluginFormat(std::string_view fileName) {
   row.write = PluginWrite;
   const bool frames = (entry.flags2 & FMW_FORMAT_FRAMES) != 0 && format->facts->hasMetadata;
   row.animate = frames ? PluginAnimate : nullptr;
+  row.sequence = frames && format->facts->writesFrames ? PluginSequenceBegin : nullptr;
   row.canRead = true;
   row.canWrite = format->facts->writes;
   row.reserved = 0;

@@ -2,8 +2,10 @@
 
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
+#include "picture/sequence.h"
 #include "picture/write_options.h"
 #include "plugins/fotomill_plugin.h"
+#include "plugins/frame_file.h"
 
 namespace fotomill {
 
@@ -24,6 +26,14 @@ Status PluginRead(PictureRecord& picture, const ReadRequest& request);
 // without a file that it can read itself. A failed write leaves nothing behind. The comment is
 // written if the options say so.
 Status PluginWrite(PictureRecord& picture, const WriteOptions& options);
+
+// As PluginWrite, for an animation; metadata and comment are those of `picture`, whose image is not
+// used.
+Status PluginWriteFrames(PictureRecord& picture, const FrameFacts& frames,
+                         const WriteOptions& options);
+// Starts an animation.
+Status PluginSequenceBegin(const std::string& path, const SequenceFacts& facts,
+                           const WriteOptions& options, SequencePointer& sequence);
 
 // Sets the configuration table that modules may access, in the ABI layout; not owned. Without this
 // call modules get none.
