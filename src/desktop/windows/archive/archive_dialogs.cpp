@@ -33,14 +33,15 @@ namespace {
 
 // A dialog of rows below each other.
 class RowDialog : public wxDialog {
- public:
+ protected:
   RowDialog(wxWindow& parent, const wxString& title, const wxString& name)
       : wxDialog(&parent, wxID_ANY, title, wxDefaultPosition, wxDefaultSize,
                  wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, name) {
     SetSizer(new wxBoxSizer(wxVERTICAL));
   }
+  virtual void Browse() = 0;
+  virtual void UpdateControls() = 0;
 
- protected:
   wxSizerFlags Below() const {
     return wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxTOP, FromDIP(10));
   }
@@ -51,8 +52,7 @@ class RowDialog : public wxDialog {
     return box;
   }
   // A labeled field with a button that asks for its value.
-  wxComboBox* AddPath(const wxString& label, const std::vector<std::string>& offered,
-                      const std::function<void()>& browse) {
+  wxComboBox* AddPath(const wxString& label, const std::vector<std::string>& offered) {
     GetSizer()->Add(new wxStaticText(this, wxID_ANY, label), Below());
     auto* row = new wxBoxSizer(wxHORIZONTAL);
     auto* field =
@@ -61,17 +61,22 @@ class RowDialog : public wxDialog {
     for (const std::string& item : offered) field->Append(wxString::FromUTF8(item));
     if (!offered.empty()) field->SetSelection(0);
     auto* button = new wxButton(this, wxID_ANY, Label("&Browse..."));
-    button->Bind(wxEVT_BUTTON, [browse](wxCommandEvent&) { browse(); });
+    field->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateControls(); });
+    button->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { Browse(); });
     row->Add(field, wxSizerFlags(1));
     row->Add(button, wxSizerFlags().Border(wxLEFT, FromDIP(6)));
     GetSizer()->Add(row, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, FromDIP(10)));
     return field;
   }
-  void Finish(wxButton& ok) {
-    GetSizer()->Add(BuildAnswerRow(*this, ok), wxSizerFlags().Expand().Border(wxALL, FromDIP(10)));
+  void Finish(const wxString& label) {
+    ok_ = new wxButton(this, wxID_OK, label);
+    GetSizer()->Add(BuildAnswerRow(*this, *ok_), wxSizerFlags().Expand().Border(wxALL, FromDIP(10)));
+    UpdateControls();
     GetSizer()->SetSizeHints(this);
     CentreOnParent();
   }
+
+  wxButton* ok_ = nullptr;  // null until the dialog is complete
 };
 
 // --- extracting ---
@@ -84,8 +89,10 @@ class ExtractDialog : public RowDialog {
 
  private:
   std::vector<std::string> Offered() const;
-  void Browse();
-  void UpdateControls() { ok_->Enable(!folder_->GetValue().empty()); }
+  void Browse() override;
+  void UpdateControls() override {
+    if (ok_ != nullptr) ok_->Enable(!folder_->GetValue().empty());
+  }
 
   const std::string beside_;
   wxRadioButton* all_ = nullptr;
@@ -93,7 +100,6 @@ class ExtractDialog : public RowDialog {
   wxComboBox* folder_ = nullptr;
   wxCheckBox* paths_ = nullptr;
   wxCheckBox* times_ = nullptr;
-  wxButton* ok_ = nullptr;
 };
 
 ExtractDialog::ExtractDialog(wxWindow& parent, const std::string& archive, size_t count,
@@ -107,14 +113,11 @@ ExtractDialog::ExtractDialog(wxWindow& parent, const std::string& archive, size_
   (selected > 1 ? selected_ : all_)->SetValue(true);
   GetSizer()->Add(all_, Below());
   GetSizer()->Add(selected_, Below());
-  folder_ = AddPath(Label("Into the &folder:"), Offered(), [this] { Browse(); });
+  folder_ = AddPath(Label("Into the &folder:"), Offered());
   folder_->AutoCompleteDirectories();
-  folder_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateControls(); });
   paths_ = AddFlag(Label("&Keep the folders of the archive"), settings.ArchivePreservePaths != 0);
   times_ = AddFlag(Label("Keep file &times"), settings.ArchivePreserveTimestamps != 0);
-  ok_ = new wxButton(this, wxID_OK, Label("&Extract"));
-  UpdateControls();
-  Finish(*ok_);
+  Finish(Label("&Extract"));
   ok_->SetFocus();
 }
 
@@ -153,8 +156,8 @@ class CreateDialog : public RowDialog {
 
  private:
   wxTextCtrl* AddPassword(const wxString& label);
-  void Browse();
-  void UpdateControls();
+  void Browse() override;
+  void UpdateControls() override;
 
   const std::string folder_;
   wxComboBox* path_ = nullptr;
@@ -164,7 +167,6 @@ class CreateDialog : public RowDialog {
   wxTextCtrl* password_ = nullptr;
   wxTextCtrl* again_ = nullptr;  // null if the password is shown
   wxStaticText* problem_ = nullptr;
-  wxButton* ok_ = nullptr;
 };
 
 CreateDialog::CreateDialog(wxWindow& parent, const std::vector<std::string>& files)
@@ -173,9 +175,7 @@ CreateDialog::CreateDialog(wxWindow& parent, const std::vector<std::string>& fil
   const std::string folder = platform::AbsolutePath(folder_);  // without the separator at its end
   const std::string name(files.size() == 1 ? platform::SplitPath(files.front()).base
                                            : platform::FileNameOf(folder));
-  path_ = AddPath(Label("ZIP &archive:"), {platform::JoinFolder(folder_, name + ".zip")},
-                  [this] { Browse(); });
-  path_->Bind(wxEVT_TEXT, [this](wxCommandEvent&) { UpdateControls(); });
+  path_ = AddPath(Label("ZIP &archive:"), {platform::JoinFolder(folder_, name + ".zip")});
   add_ = AddFlag(Label("A&dd to the existing archive"), true);
   paths_ = AddFlag(Label("&Keep the folders"), settings.ArchivePreservePaths != 0);
   thumbnails_ = AddFlag(Label("Include &thumbnail files"), settings.ArchiveAddThumbnails != 0);
@@ -184,10 +184,7 @@ CreateDialog::CreateDialog(wxWindow& parent, const std::vector<std::string>& fil
   problem_ =
       new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxST_NO_AUTORESIZE);
   GetSizer()->Add(problem_, Below());
-  ok_ = new wxButton(this, wxID_OK,
-                     LabelCount("Archi&ve %1 item", "Archi&ve %1 items", files.size()));
-  Finish(*ok_);
-  UpdateControls();
+  Finish(LabelCount("Archi&ve %1 item", "Archi&ve %1 items", files.size()));
   path_->SetFocus();
 }
 

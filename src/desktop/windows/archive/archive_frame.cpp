@@ -26,9 +26,9 @@
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/picture_windows.h"
 #include "desktop/windows/shell/shell.h"
-#include "desktop/windows/widgets/button_row.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/loose_work.h"
+#include "desktop/windows/widgets/tool_frame.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "files/previous_file.h"
 #include "platform/folders.h"
@@ -66,13 +66,13 @@ void RememberPrompt(Shell& shell, BatchJob& job) {
   };
 }
 
-class ArchiveFrame : public wxFrame {
+class ArchiveFrame : public ToolFrame {
  public:
   ArchiveFrame(Shell& shell, const std::string& archive);
 
  private:
-  wxSizer* BuildButtons(wxWindow& panel);
-  void BuildList(wxWindow& panel);
+  void BuildList();
+  void LayOutContents();
   void Read();
   void ShowRows();
   void SortBy(int32_t column);
@@ -97,34 +97,22 @@ class ArchiveFrame : public wxFrame {
 };
 
 ArchiveFrame::ArchiveFrame(Shell& shell, const std::string& archive)
-    : wxFrame(&shell.Window(), wxID_ANY, Label("Archive: %1", Shown(platform::FileNameOf(archive))),
-              wxDefaultPosition, wxDefaultSize, wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT,
-              "ArchiveBox"),
+    : ToolFrame(&shell.Window(), Label("Archive: %1", Shown(platform::FileNameOf(archive))),
+                "ArchiveBox"),
       shell_(shell),
       archive_(archive) {
-  const int gap = FromDIP(10);
-  auto* panel = new wxPanel(this);
-  BuildList(*panel);
-  summary_ = new wxStaticText(panel, wxID_ANY, Label("Reading..."));
-  auto* column = new wxBoxSizer(wxVERTICAL);
-  column->Add(list_, wxSizerFlags(1).Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
-  column->Add(summary_, wxSizerFlags().Expand().Border(wxALL, gap));
-  column->Add(BuildButtons(*panel),
-              wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
-  panel->SetSizer(column);
-  const bool known = settings.ArchiveManagerWidth > 0 && settings.ArchiveManagerDepth > 0;
-  SetSize(FromDIP(known ? wxSize(settings.ArchiveManagerWidth, settings.ArchiveManagerDepth)
-                        : wxSize(900, 520)));
-  CentreOnParent();
+  BuildList();
+  summary_ = new wxStaticText(Panel(), wxID_ANY, Label("Reading..."));
+  LayOutContents();
   Bind(wxEVT_CLOSE_WINDOW, &ArchiveFrame::OnClose, this);
   list_->SetFocus();
   UpdateControls();
   Read();
 }
 
-void ArchiveFrame::BuildList(wxWindow& panel) {
+void ArchiveFrame::BuildList() {
   const long rules = settings.ArchiveListRuleEnable != 0 ? wxDV_HORIZ_RULES : 0;
-  list_ = new wxDataViewListCtrl(&panel, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+  list_ = new wxDataViewListCtrl(Panel(), wxID_ANY, wxDefaultPosition, wxDefaultSize,
                                  wxDV_MULTIPLE | rules);
   list_->SetName(Label("Files in the archive"));
   for (const ArchiveColumnFacts& facts : ArchiveColumns()) {
@@ -139,7 +127,7 @@ void ArchiveFrame::BuildList(wxWindow& panel) {
               [this](wxDataViewEvent& event) { SortBy(event.GetColumn()); });
 }
 
-wxSizer* ArchiveFrame::BuildButtons(wxWindow& panel) {
+void ArchiveFrame::LayOutContents() {
   const RowButton rows[] = {
       {kExtractId, TrLater("&Extract..."), [this] { Extract(); }},
       {kTestId, TrLater("&Test"), [this] { Test(); }},
@@ -148,16 +136,17 @@ wxSizer* ArchiveFrame::BuildButtons(wxWindow& panel) {
       {kBrowseId, TrLater("&Browse"), [this] { OpenArchiveFolder(shell_, archive_); }},
       {wxID_CLOSE, TrLater("C&lose"), [this] { Close(); }},
   };
-  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'A', wxID_SELECTALL},
-                               {wxACCEL_CTRL, 'E', kExtractId},
-                               {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE},
-                               {wxACCEL_CTRL, 'W', wxID_CLOSE}};
-  SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
+  auto* contents = new wxBoxSizer(wxVERTICAL);
+  contents->Add(list_, wxSizerFlags(1).Expand());
+  contents->Add(summary_, wxSizerFlags().Expand().Border(wxTOP, FromDIP(10)));
+  const bool known = settings.ArchiveManagerWidth > 0 && settings.ArchiveManagerDepth > 0;
+  LayOut(nullptr, *contents, rows,
+         {{wxACCEL_CTRL, 'A', wxID_SELECTALL}, {wxACCEL_CTRL, 'E', kExtractId}},
+         known ? wxSize(settings.ArchiveManagerWidth, settings.ArchiveManagerDepth)
+               : wxSize(900, 520));
   Bind(
       wxEVT_MENU, [this](wxCommandEvent&) { list_->SelectAll(); }, wxID_SELECTALL);
-  wxSizer* buttons = BuildButtonRow(*this, panel, rows);
   FindWindow(kBrowseId)->SetToolTip(Label("Shows the archive like a folder, in a tab."));
-  return buttons;
 }
 
 // --- list ---

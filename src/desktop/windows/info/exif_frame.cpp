@@ -4,7 +4,6 @@
 #include <wx/dataview.h>
 #include <wx/filedlg.h>
 #include <wx/msgdlg.h>
-#include <wx/panel.h>
 #include <wx/sizer.h>
 #include <wx/statbmp.h>
 #include <wx/stattext.h>
@@ -16,8 +15,6 @@
 #include "desktop/windows/metadata/exif_edit_frame.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/bitmaps.h"
-#include "desktop/windows/widgets/button_row.h"
-#include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/paths.h"
@@ -29,27 +26,21 @@
 namespace fotomill::desktop {
 
 ExifFrame::ExifFrame(Shell& shell, wxWindow* parent, const std::string& path)
-    : wxFrame(parent, wxID_ANY, "EXIF: " + Shown(platform::FileNameOf(path)), wxDefaultPosition,
-              wxDefaultSize, wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT, "ExifBox"),
+    : ToolFrame(parent, "EXIF: " + Shown(platform::FileNameOf(path)), "ExifBox"),
       shell_(shell),
       path_(path) {
-  const int gap = FromDIP(10);
-  auto* panel = new wxPanel(this);
-  problem_ = new wxStaticText(panel, wxID_ANY, Label("Reading..."));
-  list_ = new wxDataViewListCtrl(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize,
-                                 wxDV_SINGLE | wxDV_ROW_LINES);
-  list_->SetName(Label("EXIF values"));
-  list_->AppendTextColumn(Label("Name"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 270));
-  list_->AppendTextColumn(Label("Value"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 330));
-  thumbnail_ = new wxStaticBitmap(panel, wxID_ANY, wxBitmapBundle());
-  thumbnailFacts_ = new wxStaticText(panel, wxID_ANY, wxEmptyString);
+  problem_ = new wxStaticText(Panel(), wxID_ANY, Label("Reading..."));
+  list_ =
+      NewTextList(Panel(), Label("EXIF values"), {{Label("Name"), 270}, {Label("Value"), 330}});
+  thumbnail_ = new wxStaticBitmap(Panel(), wxID_ANY, wxBitmapBundle());
+  thumbnailFacts_ = new wxStaticText(Panel(), wxID_ANY, wxEmptyString);
 
   auto* side = new wxBoxSizer(wxVERTICAL);
   side->Add(thumbnail_);
   side->Add(thumbnailFacts_, wxSizerFlags().Border(wxTOP, FromDIP(6)));
   auto* middle = new wxBoxSizer(wxHORIZONTAL);
   middle->Add(list_, wxSizerFlags(1).Expand());
-  middle->Add(side, wxSizerFlags().Border(wxLEFT, gap));
+  middle->Add(side, wxSizerFlags().Border(wxLEFT, FromDIP(10)));
 
   const RowButton rows[] = {
       {wxID_COPY, TrLater("&Copy value"), [this] { CopyText(SelectedValue()); }},
@@ -63,22 +54,15 @@ ExifFrame::ExifFrame(Shell& shell, wxWindow* parent, const std::string& path)
        [this] { (new ExifEditFrame(shell_, GetParent(), {path_}))->Show(); }},
       {wxID_CLOSE, TrLater("C&lose"), [this] { Close(); }},
   };
-  wxSizer* buttons = BuildButtonRow(*this, *panel, rows);
+  LayOut(problem_, *middle, rows,
+         {{wxACCEL_CTRL, 'C', wxID_COPY},
+          {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
+          {wxACCEL_CTRL, 'S', wxID_SAVEAS},
+          {wxACCEL_CTRL, 'P', wxID_PRINT}},
+         wxSize(880, 620));
   // until the file has been read
   for (const RowButton& row : rows)
     FindWindow(row.id)->Enable(row.id == wxID_CLOSE || row.id == wxID_EDIT);
-  auto* column = new wxBoxSizer(wxVERTICAL);
-  column->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
-  column->Add(middle, wxSizerFlags(1).Expand().Border(wxALL, gap));
-  column->Add(buttons, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
-  panel->SetSizer(column);
-  wxAcceleratorEntry keys[] = {
-      {wxACCEL_CTRL, 'C', wxID_COPY},           {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
-      {wxACCEL_CTRL, 'S', wxID_SAVEAS},         {wxACCEL_CTRL, 'P', wxID_PRINT},
-      {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE}, {wxACCEL_CTRL, 'W', wxID_CLOSE}};
-  SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
-  SetSize(FromDIP(wxSize(880, 620)));
-  CentreOnParent();
   list_->SetFocus();
   work_.Start(
       *this,

@@ -1,22 +1,19 @@
 #pragma once
 
-#include <wx/frame.h>
-
 #include <string>
 
 #include "desktop/models/info/exif_report.h"
 #include "desktop/windows/widgets/background.h"
+#include "desktop/windows/widgets/tool_frame.h"
 
-class wxDataViewListCtrl;
 class wxStaticBitmap;
-class wxStaticText;
 
 namespace fotomill::desktop {
 
 class Shell;
 
 // The EXIF viewer: the EXIF entries as a list, and the embedded thumbnail.
-class ExifFrame : public wxFrame {
+class ExifFrame : public ToolFrame {
  public:
   ExifFrame(Shell& shell, wxWindow* parent, const std::string& path);
 

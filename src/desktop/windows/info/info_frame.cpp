@@ -2,7 +2,6 @@
 
 #include <wx/accel.h>
 #include <wx/listbox.h>
-#include <wx/panel.h>
 #include <wx/sizer.h>
 #include <wx/splitter.h>
 #include <wx/stattext.h>
@@ -13,7 +12,6 @@
 #include "desktop/windows/info/report_tree.h"
 #include "desktop/windows/info/text_actions.h"
 #include "desktop/windows/shell/shell.h"
-#include "desktop/windows/widgets/button_row.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/paths.h"
 #include "texts/texts.h"
@@ -32,34 +30,22 @@ constexpr int kProgressMs = 200;
 }  // namespace
 
 InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> paths)
-    : wxFrame(parent, wxID_ANY, TitleOf(paths), wxDefaultPosition, wxDefaultSize,
-              wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT, "InfoBox"),
-      shell_(shell),
-      paths_(std::move(paths)) {
-  const int gap = FromDIP(10);
-  auto* panel = new wxPanel(this);
-  auto* column = new wxBoxSizer(wxVERTICAL);
-  problem_ = new wxStaticText(panel, wxID_ANY, Label("Reading..."));
-  column->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
+    : ToolFrame(parent, TitleOf(paths), "InfoBox"), shell_(shell), paths_(std::move(paths)) {
+  problem_ = new wxStaticText(Panel(), wxID_ANY, Label("Reading..."));
   if (paths_.size() == 1) {
-    tree_ = new ReportTree(panel);
-    column->Add(tree_, wxSizerFlags(1).Expand().Border(wxALL, gap));
+    tree_ = new ReportTree(Panel());
+    LayOutWith(*tree_);
   } else {
-    auto* splitter = new wxSplitterWindow(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize,
+    auto* splitter = new wxSplitterWindow(Panel(), wxID_ANY, wxDefaultPosition, wxDefaultSize,
                                           wxSP_LIVE_UPDATE | wxSP_NOBORDER);
     list_ = new wxListBox(splitter, wxID_ANY);
     list_->SetName(Label("Files"));
     tree_ = new ReportTree(splitter);
     splitter->SetMinimumPaneSize(FromDIP(80));
     splitter->SplitVertically(list_, tree_, FromDIP(220));
-    column->Add(splitter, wxSizerFlags(1).Expand().Border(wxALL, gap));
     list_->Bind(wxEVT_LISTBOX, [this](wxCommandEvent&) { ShowChoice(); });
+    LayOutWith(*splitter);
   }
-  column->Add(BuildButtons(*panel),
-              wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
-  panel->SetSizer(column);
-  SetSize(FromDIP(paths_.size() == 1 ? wxSize(700, 560) : wxSize(900, 560)));
-  CentreOnParent();
   tree_->SetFocus();
 
   timer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
@@ -79,20 +65,20 @@ InfoFrame::InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> pa
       [this](Status) { Finished(); });  // shows what could be read
 }
 
-wxSizer* InfoFrame::BuildButtons(wxWindow& panel) {
+void InfoFrame::LayOutWith(wxWindow& report) {
   const RowButton rows[] = {
       {wxID_COPY, TrLater("&Copy value"), [this] { CopyText(tree_->SelectedValue()); }},
       {wxID_SELECTALL, TrLater("Copy &all"), [this] { CopyText(wxString::FromUTF8(WholeText())); }},
       {wxID_SAVE, TrLater("&Save as text..."), [this] { SaveTextAs(*this, "info.txt", WholeText()); }},
       {wxID_CLOSE, TrLater("C&lose"), [this] { Close(); }},
   };
-  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY},
-                               {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
-                               {wxACCEL_CTRL, 'S', wxID_SAVE},
-                               {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE},
-                               {wxACCEL_CTRL, 'W', wxID_CLOSE}};
-  SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
-  return BuildButtonRow(*this, panel, rows);
+  auto* contents = new wxBoxSizer(wxHORIZONTAL);
+  contents->Add(&report, wxSizerFlags(1).Expand());
+  LayOut(problem_, *contents, rows,
+         {{wxACCEL_CTRL, 'C', wxID_COPY},
+          {wxACCEL_CTRL | wxACCEL_SHIFT, 'C', wxID_SELECTALL},
+          {wxACCEL_CTRL, 'S', wxID_SAVE}},
+         paths_.size() == 1 ? wxSize(700, 560) : wxSize(900, 560));
 }
 
 void InfoFrame::Finished() {

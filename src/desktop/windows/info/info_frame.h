@@ -1,6 +1,5 @@
 #pragma once
 
-#include <wx/frame.h>
 #include <wx/timer.h>
 
 #include <atomic>
@@ -9,10 +8,9 @@
 
 #include "desktop/models/info/info_report.h"
 #include "desktop/windows/widgets/background.h"
+#include "desktop/windows/widgets/tool_frame.h"
 
 class wxListBox;
-class wxSizer;
-class wxStaticText;
 
 namespace fotomill::desktop {
 
@@ -21,12 +19,12 @@ class ReportTree;
 
 // "Get info": information about one file, or about several with totals and differences. Files are
 // read in the background.
-class InfoFrame : public wxFrame {
+class InfoFrame : public ToolFrame {
  public:
   InfoFrame(Shell& shell, wxWindow* parent, std::vector<std::string> paths);
 
  private:
-  wxSizer* BuildButtons(wxWindow& panel);
+  void LayOutWith(wxWindow& report);
   void Finished();
   void ShowChoice();  // of the selected list item
   std::string WholeText() const;

@@ -6,7 +6,6 @@
 #include <wx/dataview.h>
 #include <wx/hyperlink.h>
 #include <wx/msgdlg.h>
-#include <wx/panel.h>
 #include <wx/richmsgdlg.h>
 #include <wx/sizer.h>
 #include <wx/srchctrl.h>
@@ -23,8 +22,6 @@
 #include "desktop/windows/metadata/rewrite_batch.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
-#include "desktop/windows/widgets/button_row.h"
-#include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "metadata/edit/exif_dates.h"
 #include "metadata/gps.h"
@@ -80,49 +77,33 @@ int AskUnlessOff(wxWindow& parent, const wxString& question, const wxString& det
 }  // namespace
 
 ExifEditFrame::ExifEditFrame(Shell& shell, wxWindow* parent, std::vector<std::string> files)
-    : wxFrame(parent, wxID_ANY, TitleOf(files), wxDefaultPosition, wxDefaultSize,
-              wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT, "ExifEditBox"),
-      shell_(shell),
-      paths_(std::move(files)) {
-  const int gap = FromDIP(10);
-  auto* panel = new wxPanel(this);
-  problem_ = new wxStaticText(panel, wxID_ANY, Label("Reading..."));
-  list_ = new wxDataViewListCtrl(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize,
-                                 wxDV_SINGLE | wxDV_ROW_LINES);
-  list_->SetName(Label("EXIF values"));
-  list_->AppendTextColumn("", wxDATAVIEW_CELL_INERT, FromDIP(24));
-  list_->AppendTextColumn(Label("Name"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 240));
-  list_->AppendTextColumn(Label("Value"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 300));
+    : ToolFrame(parent, TitleOf(files), "ExifEditBox"), shell_(shell), paths_(std::move(files)) {
+  problem_ = new wxStaticText(Panel(), wxID_ANY, Label("Reading..."));
+  list_ = NewTextList(Panel(), Label("EXIF values"),
+                      {{"", 24}, {Label("Name"), 240}, {Label("Value"), 300}});
   list_->Bind(wxEVT_DATAVIEW_SELECTION_CHANGED, [this](wxDataViewEvent&) { ShowSelected(); });
   list_->Bind(wxEVT_DATAVIEW_ITEM_ACTIVATED, [this](wxDataViewEvent&) { value_->FocusValue(); });
 
   auto* middle = new wxBoxSizer(wxHORIZONTAL);
   auto* left = new wxBoxSizer(wxVERTICAL);
-  left->Add(BuildSearch(*panel), wxSizerFlags().Expand().Border(wxBOTTOM, FromDIP(6)));
+  left->Add(BuildSearch(), wxSizerFlags().Expand().Border(wxBOTTOM, FromDIP(6)));
   left->Add(list_, wxSizerFlags(1).Expand());
   middle->Add(left, wxSizerFlags(1).Expand());
-  middle->Add(BuildSide(*panel), wxSizerFlags().Expand().Border(wxLEFT, gap));
-  auto* column = new wxBoxSizer(wxVERTICAL);
-  column->Add(problem_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
-  column->Add(middle, wxSizerFlags(1).Expand().Border(wxALL, gap));
-  column->Add(BuildButtons(*panel),
-              wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
-  panel->SetSizer(column);
-  SetSize(FromDIP(wxSize(980, 640)));
-  CentreOnParent();
+  middle->Add(BuildSide(), wxSizerFlags().Expand().Border(wxLEFT, FromDIP(10)));
+  LayOutWith(*middle);
   Bind(wxEVT_CLOSE_WINDOW, &ExifEditFrame::OnClose, this);
   list_->SetFocus();
   UpdateControls();
   Read();
 }
 
-wxSizer* ExifEditFrame::BuildSearch(wxWindow& panel) {
+wxSizer* ExifEditFrame::BuildSearch() {
   auto* row = new wxBoxSizer(wxHORIZONTAL);
-  search_ = new wxSearchCtrl(&panel, wxID_ANY);
+  search_ = new wxSearchCtrl(Panel(), wxID_ANY);
   search_->SetName(Label("Filter"));
   search_->SetDescriptiveText(Label("Filter"));
   search_->ShowCancelButton(true);
-  all_ = new wxCheckBox(&panel, wxID_ANY, Label("Show &all tags"));
+  all_ = new wxCheckBox(Panel(), wxID_ANY, Label("Show &all tags"));
   all_->SetToolTip(Label("Also shows tags that the files do not have, to add them."));
   row->Add(search_, wxSizerFlags(1).CenterVertical());
   row->Add(all_, wxSizerFlags().CenterVertical().Border(wxLEFT, FromDIP(10)));
@@ -132,14 +113,14 @@ wxSizer* ExifEditFrame::BuildSearch(wxWindow& panel) {
   return row;
 }
 
-wxSizer* ExifEditFrame::BuildSide(wxWindow& panel) {
+wxSizer* ExifEditFrame::BuildSide() {
   auto* side = new wxBoxSizer(wxVERTICAL);
   value_ =
-      new ExifValuePanel(&panel, {.entered = [this](const std::string& text) { Entered(text); },
+      new ExifValuePanel(Panel(), {.entered = [this](const std::string& text) { Entered(text); },
                                   .removed = [this] { ChangeSelected(&ExifEditor::Remove); },
                                   .reverted = [this] { ChangeSelected(&ExifEditor::Revert); }});
   side->Add(value_, wxSizerFlags(1).Expand());
-  auto* box = new wxStaticBoxSizer(wxVERTICAL, &panel, Label("Place"));
+  auto* box = new wxStaticBoxSizer(wxVERTICAL, Panel(), Label("Place"));
   wxWindow* const parent = box->GetStaticBox();
   place_ = new wxStaticText(parent, wxID_ANY, "");
   map_ = new wxHyperlinkCtrl(parent, wxID_ANY, Label("Show on OpenStreetMap"), "https://");
@@ -149,7 +130,7 @@ wxSizer* ExifEditFrame::BuildSide(wxWindow& panel) {
   return side;
 }
 
-wxSizer* ExifEditFrame::BuildButtons(wxWindow& panel) {
+void ExifEditFrame::LayOutWith(wxSizer& contents) {
   const RowButton rows[] = {
       {kPlaceId, TrLater("&Place..."), [this] { SetPlace(); }},
       {kShiftId, TrLater("Shift &times..."), [this] { ShiftTimes(); }},
@@ -157,17 +138,12 @@ wxSizer* ExifEditFrame::BuildButtons(wxWindow& panel) {
       {wxID_CLOSE, TrLater("C&lose"), [this] { Close(); }},
       {wxID_SAVE, TrLater("&Write"), [this] { Write(); }},
   };
-  wxSizer* buttons = BuildButtonRow(*this, panel, rows);
+  LayOut(problem_, contents, rows,
+         {{wxACCEL_CTRL, 'S', wxID_SAVE}, {wxACCEL_CTRL, 'F', wxID_FIND}}, wxSize(980, 640));
   FindWindow(kOwnerId)->SetToolTip(
       Label("Sets artist, copyright and the other values on the page EXIF and info of Setup."));
-  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'S', wxID_SAVE},
-                               {wxACCEL_CTRL, 'F', wxID_FIND},
-                               {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE},
-                               {wxACCEL_CTRL, 'W', wxID_CLOSE}};
-  SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
   Bind(
       wxEVT_MENU, [this](wxCommandEvent&) { search_->SetFocus(); }, wxID_FIND);
-  return buttons;
 }
 
 // --- reading ---

@@ -1,21 +1,17 @@
 #pragma once
 
-#include <wx/frame.h>
-
 #include <memory>
 #include <string>
 #include <vector>
 
 #include "desktop/models/metadata/exif_editor.h"
 #include "desktop/windows/widgets/background.h"
+#include "desktop/windows/widgets/tool_frame.h"
 #include "desktop/windows/widgets/unsaved_work.h"
 
 class wxCheckBox;
-class wxDataViewListCtrl;
 class wxHyperlinkCtrl;
 class wxSearchCtrl;
-class wxSizer;
-class wxStaticText;
 
 namespace fotomill::desktop {
 
@@ -24,15 +20,15 @@ class Shell;
 
 // The EXIF editor: changes values, times and place of one or several files, and writes them in the
 // background. Deletes itself when closed.
-class ExifEditFrame : public wxFrame, public HoldsWork {
+class ExifEditFrame : public ToolFrame, public HoldsWork {
  public:
   ExifEditFrame(Shell& shell, wxWindow* parent, std::vector<std::string> files);
 
  private:
   friend void RefreshExifEditors();
-  wxSizer* BuildSearch(wxWindow& panel);
-  wxSizer* BuildSide(wxWindow& panel);
-  wxSizer* BuildButtons(wxWindow& panel);
+  wxSizer* BuildSearch();
+  wxSizer* BuildSide();
+  void LayOutWith(wxSizer& contents);
   void Read();
   void ReadIfChanged();
   void FilesRead();

@@ -2,8 +2,6 @@
 
 #include <wx/accel.h>
 #include <wx/dataview.h>
-#include <wx/frame.h>
-#include <wx/panel.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
 
@@ -14,8 +12,7 @@
 #include "desktop/windows/info/text_actions.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/background.h"
-#include "desktop/windows/widgets/button_row.h"
-#include "desktop/windows/widgets/looks.h"
+#include "desktop/windows/widgets/tool_frame.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/paths.h"
 #include "texts/texts.h"
@@ -24,7 +21,7 @@ namespace fotomill::desktop {
 
 namespace {
 
-class LeftFrame : public wxFrame {
+class LeftFrame : public ToolFrame {
  public:
   LeftFrame(wxWindow* parent, std::vector<std::string> files);
 
@@ -40,33 +37,17 @@ class LeftFrame : public wxFrame {
 };
 
 LeftFrame::LeftFrame(wxWindow* parent, std::vector<std::string> files)
-    : wxFrame(parent, wxID_ANY, Label("Metadata Left"), wxDefaultPosition, wxDefaultSize,
-              wxDEFAULT_FRAME_STYLE | wxFRAME_FLOAT_ON_PARENT, "MetadataLeftBox"),
-      files_(std::move(files)) {
-  const int gap = FromDIP(10);
-  auto* panel = new wxPanel(this);
-  summary_ = new wxStaticText(panel, wxID_ANY, Label("Reading..."));
-  list_ = new wxDataViewListCtrl(panel, wxID_ANY, wxDefaultPosition, wxDefaultSize,
-                                 wxDV_SINGLE | wxDV_ROW_LINES);
-  list_->SetName(Label("Files"));
-  list_->AppendTextColumn(Label("File"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 240));
-  list_->AppendTextColumn(Label("Left in the file"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 320));
+    : ToolFrame(parent, Label("Metadata Left"), "MetadataLeftBox"), files_(std::move(files)) {
+  summary_ = new wxStaticText(Panel(), wxID_ANY, Label("Reading..."));
+  list_ = NewTextList(Panel(), Label("Files"),
+                      {{Label("File"), 240}, {Label("Left in the file"), 320}});
   const RowButton rows[] = {
       {wxID_COPY, TrLater("Copy &all"), [this] { CopyText(wxString::FromUTF8(text_)); }},
       {wxID_CLOSE, TrLater("C&lose"), [this] { Close(); }},
   };
-  wxSizer* buttons = BuildButtonRow(*this, *panel, rows);
-  auto* column = new wxBoxSizer(wxVERTICAL);
-  column->Add(summary_, wxSizerFlags().Expand().Border(wxLEFT | wxTOP | wxRIGHT, gap));
-  column->Add(list_, wxSizerFlags(1).Expand().Border(wxALL, gap));
-  column->Add(buttons, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
-  panel->SetSizer(column);
-  wxAcceleratorEntry keys[] = {{wxACCEL_CTRL, 'C', wxID_COPY},
-                               {wxACCEL_NORMAL, WXK_ESCAPE, wxID_CLOSE},
-                               {wxACCEL_CTRL, 'W', wxID_CLOSE}};
-  SetAcceleratorTable(wxAcceleratorTable(static_cast<int>(std::size(keys)), keys));
-  SetSize(FromDIP(wxSize(640, 400)));
-  CentreOnParent();
+  auto* contents = new wxBoxSizer(wxHORIZONTAL);
+  contents->Add(list_, wxSizerFlags(1).Expand());
+  LayOut(summary_, *contents, rows, {{wxACCEL_CTRL, 'C', wxID_COPY}}, wxSize(640, 400));
   list_->SetFocus();
   work_.Start(
       *this,

@@ -25,6 +25,7 @@
 #include "desktop/windows/widgets/button_row.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/loose_work.h"
+#include "desktop/windows/widgets/tool_frame.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "metadata/edit/strip.h"
 #include "platform/folders.h"
@@ -165,13 +166,9 @@ void StripDialog::BuildFolder() {
 }
 
 void StripDialog::BuildPreview() {
-  list_ = new wxDataViewListCtrl(this, wxID_ANY, wxDefaultPosition,
-                                 wxSize(TextWidth(*this, 680), FromDIP(180)),
-                                 wxDV_SINGLE | wxDV_ROW_LINES);
-  list_->SetName(Label("Preview"));
-  list_->AppendTextColumn(Label("File"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 170));
-  list_->AppendTextColumn(Label("Removed"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 280));
-  list_->AppendTextColumn(Label("Kept"), wxDATAVIEW_CELL_INERT, TextWidth(*this, 200));
+  list_ = NewTextList(this, Label("Preview"),
+                      {{Label("File"), 170}, {Label("Removed"), 280}, {Label("Kept"), 200}});
+  list_->SetMinSize(wxSize(TextWidth(*this, 680), FromDIP(180)));
   GetSizer()->Add(list_, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT | wxTOP, FromDIP(10)));
   if (files_.size() <= kMostPreviewed) return;
   auto* note =
