@@ -38,6 +38,9 @@ TEST(ItemTags, FilterByRatingAndLabel) {
     EXPECT_EQ(Passes(item, row.filter), row.filter == TagFilter::All) << "not read yet";
     item.tagged = true;
     EXPECT_EQ(Passes(item, row.filter), row.passes) << row.rating << row.label;
+    item.tagged = false;
+    item.outdated = true;
+    EXPECT_EQ(Passes(item, row.filter), row.passes) << "until it is read again";
   }
 }
 
@@ -75,7 +78,50 @@ TEST(ItemTags, ModelKeepsWhatBelongsTogether) {
   EXPECT_FALSE(model.Item(0).tagged);
   EXPECT_TRUE(model.Item(1).tagged);
   model.UpdateOrder();
-  EXPECT_EQ(model.LineCount(), 1u);
+  EXPECT_EQ(model.LineCount(), 2u) << "the old rating counts until the new one is read";
+}
+
+// A rated file stays in a filtered list with focus and selection, unless the new rating hides it:
+// then the next one takes its place.
+TEST(ItemTags, FilterKeepsARatedFileUntilItsTagsAreRead) {
+  BrowserModel model;
+  model.SetFolder("/p");
+  std::vector<FolderItem> items(4);
+  for (size_t i = 0; i < items.size(); ++i) {
+    items[i].name = std::string(1, static_cast<char>('a' + i)) + ".jpg";
+    items[i].tagged = true;
+    items[i].rating = i == 1 ? 0 : 3;
+  }
+  model.SetItems(items);
+  model.SetTagFilter(TagFilter::ThreeStars);
+  model.Selected().SelectOnly(1);  // c.jpg
+  const auto rate = [&](size_t item, int32_t rating) {
+    model.ForgetTags({"/p/" + items[item].name});
+    std::vector<FolderItem> listed(items);
+    listed[item].modified = 7 + rating;
+    for (FolderItem& now : listed) now.tagged = false, now.rating = 0;
+    model.SetItems(listed);
+    EXPECT_EQ(model.LineCount(), 3u);
+    EXPECT_EQ(model.Line(model.Selected().Focus()).name, items[item].name);
+    EXPECT_TRUE(model.Selected().IsSelected(model.Selected().Focus()));
+    FolderItem read = model.Item(item);
+    EXPECT_FALSE(read.tagged);
+    read.tagged = true;
+    read.outdated = false;
+    read.rating = rating;
+    model.SetTags(item, read);
+    model.UpdateOrder();
+    return model.Line(model.Selected().Focus()).name;
+  };
+  EXPECT_EQ(rate(2, 5), "c.jpg");
+  EXPECT_EQ(rate(2, 2), "d.jpg");
+  EXPECT_EQ(model.LineCount(), 2u);
+  EXPECT_EQ(model.FilesForFunction(), std::vector<std::string>{"/p/d.jpg"});
+  FolderItem hidden = model.Item(3);
+  hidden.rating = 0;
+  model.SetTags(3, hidden);
+  model.UpdateOrder();
+  EXPECT_EQ(model.FilesForFunction(), std::vector<std::string>{"/p/a.jpg"});
 }
 
 }  // namespace

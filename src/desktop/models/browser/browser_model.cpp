@@ -103,7 +103,13 @@ void BrowserModel::SetItems(std::vector<FolderItem> items) {
     selected[i] = oldSelected[found->second];
     if (found->second == oldFocus) focus = i;
     if (found->second == oldAnchor) anchor = i;
-    if (before.modified == items[i].modified && before.size == items[i].size) items[i] = before;
+    if (before.modified == items[i].modified && before.size == items[i].size) {
+      items[i] = before;
+    } else {
+      items[i].rating = before.rating;
+      items[i].label = before.label;
+      items[i].outdated = before.tagged || before.outdated;
+    }
   }
   const bool moves = focused && focus == kNoLine;
   if (moves) focus = Nearest(newPlaces);
@@ -132,6 +138,22 @@ void BrowserModel::UpdateOrder() {
   const size_t focus = ItemOrNone(selection_.Focus()), anchor = ItemOrNone(selection_.Anchor());
   SortItems();
   BuildLines(selected, focus, anchor);
+  if (focus == kNoLine || selection_.Focus() != kNoLine || lines_.empty()) return;
+  if (selection_.SelectedCount() == 0) {
+    selection_.SelectOnly(LineAfter(focus));
+  } else {
+    selection_.MoveFocus(LineAfter(focus), false, true);
+  }
+}
+
+// The first line that follows an item in the sorted order; the last one if there is none.
+size_t BrowserModel::LineAfter(size_t item) const {
+  size_t line = 0;
+  for (const uint32_t other : order_) {
+    if (other == item) break;
+    if (line < lines_.size() && lines_[line] == other) ++line;
+  }
+  return std::min(line, lines_.size() - 1);
 }
 
 void BrowserModel::SetFilter(const std::string& filter) {
@@ -155,6 +177,7 @@ void BrowserModel::SetFacts(size_t item, const FolderItem& facts) {
 
 void BrowserModel::SetTags(size_t item, const FolderItem& tags) {
   items_[item].tagged = tags.tagged;
+  items_[item].outdated = tags.outdated;
   items_[item].rating = tags.rating;
   items_[item].label = tags.label;
 }
@@ -164,7 +187,9 @@ void BrowserModel::ForgetTags(const std::vector<std::string>& paths) {
   for (FolderItem& item : items_) {
     const std::string path = platform::JoinFolder(folder_, item.name);
     const auto isOne = [&](const std::string& name) { return changed.contains(name); };
-    if (isOne(path) || std::ranges::any_of(SidecarNames(path), isOne)) item.tagged = false;
+    if (!isOne(path) && !std::ranges::any_of(SidecarNames(path), isOne)) continue;
+    item.outdated |= item.tagged;
+    item.tagged = false;
   }
 }
 

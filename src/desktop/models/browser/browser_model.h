@@ -53,17 +53,20 @@ class BrowserModel {
   void SetItems(std::vector<FolderItem> items);
   // Sets facts read later; call UpdateOrder to sort again.
   void SetFacts(size_t item, const FolderItem& facts);
-  void UpdateOrder();  // sorts by current facts, keeping the selection
+  // Sorts by current facts and applies the filters, keeping the selection. If the focused item is
+  // hidden now, the focus moves to the next line.
+  void UpdateOrder();
 
   // Shows only lines whose name matches; others are deselected.
   void SetFilter(const std::string& filter);
   const std::string& Filter() const { return filter_; }  // empty: show everything
-  // Also by rating and label; files whose tags are not read yet are hidden.
+  // Also by rating and label; files whose tags were never read are hidden.
   void SetTagFilter(TagFilter filter);
   TagFilter TagsShown() const { return tagFilter_; }
   // Sets rating and label read later. Call UpdateOrder if a tag filter is on.
   void SetTags(size_t item, const FolderItem& tags);
-  // The tags of these files, or of those with these sidecars, must be read again.
+  // The tags of these files, or of those with these sidecars, must be read again; until then, the
+  // old ones count.
   void ForgetTags(const std::vector<std::string>& paths);
 
   // Items are the folder's contents, lines those that pass the filter, both from 0. References are
@@ -113,6 +116,7 @@ class BrowserModel {
   void SortItems();
   void BuildLines(const std::vector<bool>& selectedItems, size_t focusItem, size_t anchorItem);
   std::vector<bool> SelectedItems() const;
+  size_t LineAfter(size_t item) const;
   size_t ItemOrNone(size_t line) const { return line < lines_.size() ? lines_[line] : kNoLine; }
 
   std::string folder_;

@@ -154,6 +154,7 @@ void AddPictureTags(const std::string& folder, FolderItem& item) {
   PictureTags tags;
   (void)ReadPictureTags(platform::JoinFolder(folder, item.name), {}, tags);
   item.tagged = true;
+  item.outdated = false;
   item.rating = tags.rating;
   item.label = tags.label;
 }

@@ -23,6 +23,8 @@ struct FolderItem {
   // once they were read: -1 (rejected) to 5 stars, and the color label, English or another
   // program's
   bool tagged = false;
+  // not `tagged`, but rating and label are those from before the file was changed
+  bool outdated = false;
   int32_t rating = 0;
   std::string label = {};
 

@@ -19,7 +19,7 @@ int32_t Number(TagFilter filter) { return static_cast<int32_t>(filter); }
 
 bool Passes(const FolderItem& item, TagFilter filter) {
   if (filter == TagFilter::All) return true;
-  if (!item.tagged) return false;
+  if (!item.tagged && !item.outdated) return false;
   if (filter == TagFilter::Unrated) return item.rating == 0;
   if (filter == TagFilter::Rejected) return item.rating < 0;
   if (filter <= TagFilter::FiveStars) return item.rating >= Number(filter);

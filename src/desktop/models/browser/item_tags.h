@@ -22,6 +22,7 @@ enum class TagFilter : uint8_t {
   FirstLabel,  // in the order of kLabelNames
   LastLabel = FirstLabel + 4,
 };
+// Outdated tags count until the new ones are read, so that files stay in place.
 bool Passes(const FolderItem& item, TagFilter filter);
 // For a list of choices, translated.
 std::string TagFilterName(TagFilter filter);
