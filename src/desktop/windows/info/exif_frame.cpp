@@ -30,8 +30,7 @@ ExifFrame::ExifFrame(Shell& shell, wxWindow* parent, const std::string& path)
       shell_(shell),
       path_(path) {
   problem_ = new wxStaticText(Panel(), wxID_ANY, Label("Reading..."));
-  list_ =
-      NewTextList(Panel(), Label("EXIF values"), {{Label("Name"), 270}, {Label("Value"), 330}});
+  list_ = NewTextList(Panel(), Label("EXIF values"), {{Label("Name"), 270}, {Label("Value"), 330}});
   thumbnail_ = new wxStaticBitmap(Panel(), wxID_ANY, wxBitmapBundle());
   thumbnailFacts_ = new wxStaticText(Panel(), wxID_ANY, wxEmptyString);
 

@@ -117,8 +117,8 @@ wxSizer* ExifEditFrame::BuildSide() {
   auto* side = new wxBoxSizer(wxVERTICAL);
   value_ =
       new ExifValuePanel(Panel(), {.entered = [this](const std::string& text) { Entered(text); },
-                                  .removed = [this] { ChangeSelected(&ExifEditor::Remove); },
-                                  .reverted = [this] { ChangeSelected(&ExifEditor::Revert); }});
+                                   .removed = [this] { ChangeSelected(&ExifEditor::Remove); },
+                                   .reverted = [this] { ChangeSelected(&ExifEditor::Revert); }});
   side->Add(value_, wxSizerFlags(1).Expand());
   auto* box = new wxStaticBoxSizer(wxVERTICAL, Panel(), Label("Place"));
   wxWindow* const parent = box->GetStaticBox();
@@ -138,8 +138,8 @@ void ExifEditFrame::LayOutWith(wxSizer& contents) {
       {wxID_CLOSE, TrLater("C&lose"), [this] { Close(); }},
       {wxID_SAVE, TrLater("&Write"), [this] { Write(); }},
   };
-  LayOut(problem_, contents, rows,
-         {{wxACCEL_CTRL, 'S', wxID_SAVE}, {wxACCEL_CTRL, 'F', wxID_FIND}}, wxSize(980, 640));
+  LayOut(problem_, contents, rows, {{wxACCEL_CTRL, 'S', wxID_SAVE}, {wxACCEL_CTRL, 'F', wxID_FIND}},
+         wxSize(980, 640));
   FindWindow(kOwnerId)->SetToolTip(
       Label("Sets artist, copyright and the other values on the page EXIF and info of Setup."));
   Bind(
@@ -247,6 +247,7 @@ void ExifEditFrame::UpdateControls() {
   const size_t files = editor_.Changeable().size();
   const bool ready = files > 0 && !writing_;
   for (const wxWindowID id : {kPlaceId, kShiftId, kOwnerId}) FindWindow(id)->Enable(ready);
+  value_->Enable(!writing_);  // what is entered now would not be written
   auto* write = static_cast<wxButton*>(FindWindow(wxID_SAVE));
   write->SetLabel(LabelCount("&Write %1 file", "&Write %1 files", std::max<size_t>(files, 1)));
   write->Enable(ready && !invalid_ && editor_.HasChanges());
@@ -349,7 +350,9 @@ void ExifEditFrame::Write() {
     return EditExifFile(source, destination, changer, request, options);
   };
   writing_ = true;
+  focus_ = wxWindow::FindFocus();
   UpdateControls();
+  LogEvent("exif-edit", "writing");
   RunRewriteBatch(shell_, editor_.Changeable(), std::move(function), {}, alive_,
                   [this](bool errors) { Written(errors); });
 }
@@ -358,6 +361,8 @@ void ExifEditFrame::Written(bool errors) {
   writing_ = false;
   if (!errors) editor_.Clear();
   UpdateControls();
+  // a control that was disabled has lost the focus
+  if (IsActive() && focus_ != nullptr && value_->IsDescendant(focus_)) focus_->SetFocus();
   Read();
 }
 

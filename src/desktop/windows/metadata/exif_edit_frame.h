@@ -1,5 +1,7 @@
 #pragma once
 
+#include <wx/weakref.h>
+
 #include <memory>
 #include <string>
 #include <vector>
@@ -55,6 +57,7 @@ class ExifEditFrame : public ToolFrame, public HoldsWork {
   std::vector<ExifEditRow> rows_;  // of the list
   bool invalid_ = false;           // the value in the panel
   bool writing_ = false;
+  wxWeakRef<wxWindow> focus_;  // when writing began
   wxStaticText* problem_ = nullptr;
   wxSearchCtrl* search_ = nullptr;
   wxCheckBox* all_ = nullptr;
