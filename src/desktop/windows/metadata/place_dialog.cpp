@@ -5,14 +5,17 @@
 #include <wx/dialog.h>
 #include <wx/filepicker.h>
 #include <wx/hyperlink.h>
+#include <wx/msgdlg.h>
 #include <wx/radiobut.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
+#include <wx/textdlg.h>
 
 #include <memory>
 
 #include "desktop/models/metadata/exif_editor.h"
+#include "desktop/models/metadata/place_list.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/widgets/button_row.h"
 #include "desktop/windows/widgets/looks.h"
@@ -22,26 +25,11 @@
 #include "metadata/gps.h"
 #include "platform/file_view.h"
 #include "settings/exif_settings.h"
-#include "settings/job_options.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
-
-// The default location, then the places of the list.
-std::vector<ListedPlace> OfferedPlaces() {
-  std::string list;
-  std::vector<ListedPlace> places;
-  if (ReadLocations(list).empty()) places = ListedPlaces(list);
-  GpsLocation home;
-  if (GpsLocationFromSettings(home)) {
-    const GpsPlace place{.latitude = GpsDegrees(home.latitude),
-                         .longitude = GpsDegrees(home.longitude)};
-    places.insert(places.begin(), {Tr("Default location"), place});
-  }
-  return places;
-}
 
 class PlaceDialog : public wxDialog {
  public:
@@ -49,8 +37,15 @@ class PlaceDialog : public wxDialog {
   void Apply();
 
  private:
-  wxRadioButton* AddWay(const wxString& label, wxWindow* control, bool first = false);
+  wxRadioButton* AddWay(const wxString& label, wxSizer* controls, bool first = false);
   void BuildWays();
+  wxButton* AddButton(wxSizer& row, const wxString& label, void (PlaceDialog::*run)());
+  void ShowList(const std::string& chosen);
+  const OfferedPlace* Listed() const;  // the place chosen in the list
+  void Done(const std::string& problem, const std::string& chosen);
+  void AddToList();
+  void Rename();
+  void Remove();
   void ReadTrack();
   void UpdateControls();
   std::optional<GpsPlace> ChosenPlace() const;
@@ -59,7 +54,7 @@ class PlaceDialog : public wxDialog {
   wxString TrackText() const;
 
   ExifEditor& editor_;
-  const std::vector<ListedPlace> places_ = OfferedPlaces();
+  std::vector<OfferedPlace> places_ = OfferedPlaces();
   std::shared_ptr<const GpsTrack> track_;
   wxString trackProblem_;
   wxFlexGridSizer* grid_ = nullptr;
@@ -71,6 +66,9 @@ class PlaceDialog : public wxDialog {
   wxTextCtrl* field_ = nullptr;
   wxFilePickerCtrl* file_ = nullptr;
   wxTextCtrl* offset_ = nullptr;
+  wxButton* rename_ = nullptr;
+  wxButton* remove_ = nullptr;
+  wxButton* add_ = nullptr;
   wxStaticText* note_ = nullptr;
   wxHyperlinkCtrl* map_ = nullptr;
   wxButton* ok_ = nullptr;
@@ -102,45 +100,64 @@ PlaceDialog::PlaceDialog(wxWindow* parent, ExifEditor& editor)
                                            GpsDegreesText(place->longitude)));
   }
   (places_.empty() ? typed_ : listed_)->SetValue(true);
-  UpdateControls();
+  ShowList({});
   // A list takes the focus only when it is visible.
   CallAfter([this] { (places_.empty() ? static_cast<wxWindow*>(field_) : list_)->SetFocus(); });
 }
 
-wxRadioButton* PlaceDialog::AddWay(const wxString& label, wxWindow* control, bool first) {
+wxRadioButton* PlaceDialog::AddWay(const wxString& label, wxSizer* controls, bool first) {
   auto* way = new wxRadioButton(this, wxID_ANY, label, wxDefaultPosition, wxDefaultSize,
                                 first ? wxRB_GROUP : 0);
   way->Bind(wxEVT_RADIOBUTTON, [this](wxCommandEvent&) { UpdateControls(); });
   grid_->Add(way, wxSizerFlags().CenterVertical());
-  if (control != nullptr) {
-    control->MoveAfterInTabOrder(way);
-    grid_->Add(control, wxSizerFlags().Expand());
-  } else {
+  if (controls == nullptr) {
     grid_->AddSpacer(0);
+    return way;
   }
+  wxWindow* before = way;
+  for (wxSizerItem* item : controls->GetChildren()) {
+    item->GetWindow()->MoveAfterInTabOrder(before);
+    before = item->GetWindow();
+  }
+  grid_->Add(controls, wxSizerFlags().Expand());
   return way;
+}
+
+wxButton* PlaceDialog::AddButton(wxSizer& row, const wxString& label, void (PlaceDialog::*run)()) {
+  auto* button = new wxButton(this, wxID_ANY, label);
+  button->Bind(wxEVT_BUTTON, [this, run](wxCommandEvent&) { (this->*run)(); });
+  row.Add(button, wxSizerFlags().CenterVertical().Border(wxLEFT, FromDIP(6)));
+  return button;
 }
 
 void PlaceDialog::BuildWays() {
   const auto update = [this](wxCommandEvent&) { UpdateControls(); };
   list_ = new wxChoice(this, wxID_ANY);
   list_->SetName(Label("Places"));
-  for (const ListedPlace& place : places_) list_->Append(Shown(place.name));
-  list_->SetSelection(0);
   list_->Bind(wxEVT_CHOICE, update);
-  listed_ = AddWay(Label("&From the list"), list_, true);
-  listed_->Enable(!places_.empty());
+  const wxSizerFlags whole = wxSizerFlags(1).CenterVertical();
+  auto* list = new wxBoxSizer(wxHORIZONTAL);
+  list->Add(list_, whole);
+  rename_ = AddButton(*list, Label("Rena&me..."), &PlaceDialog::Rename);
+  remove_ = AddButton(*list, Label("&Delete"), &PlaceDialog::Remove);
+  remove_->SetToolTip(Label("Deletes this place from the list."));
+  listed_ = AddWay(Label("&From the list"), list, true);
   listed_->SetToolTip(Shown(LocationsPath()));
   field_ = new wxTextCtrl(this, wxID_ANY, "", wxDefaultPosition, wxSize(TextWidth(*this, 330), -1));
   field_->SetName(Label("Latitude, longitude"));
   field_->SetHint("45.33,-79.22");
   field_->Bind(wxEVT_TEXT, update);
-  typed_ = AddWay(Label("&Latitude, longitude"), field_);
+  auto* typed = new wxBoxSizer(wxHORIZONTAL);
+  typed->Add(field_, whole);
+  add_ = AddButton(*typed, Label("Add &to list..."), &PlaceDialog::AddToList);
+  typed_ = AddWay(Label("&Latitude, longitude"), typed);
   file_ = new wxFilePickerCtrl(
       this, wxID_ANY, "", Label("GPX track"), Label("GPX tracks (*.gpx)|*.gpx;*.GPX|All files|*"),
       wxDefaultPosition, wxDefaultSize, wxFLP_OPEN | wxFLP_USE_TEXTCTRL | wxFLP_SMALL);
   file_->Bind(wxEVT_FILEPICKER_CHANGED, [this](wxFileDirPickerEvent&) { ReadTrack(); });
-  tracked_ = AddWay(Label("From a &GPX track"), file_);
+  auto* track = new wxBoxSizer(wxHORIZONTAL);
+  track->Add(file_, whole);
+  tracked_ = AddWay(Label("From a &GPX track"), track);
   file_->GetTextCtrl()->SetName(Label("GPX track"));
   // before its field, which its mnemonic focuses
   grid_->Add(new wxStaticText(this, wxID_ANY, Label("&Added to the camera's time:")),
@@ -153,6 +170,66 @@ void PlaceDialog::BuildWays() {
   offset_->Bind(wxEVT_TEXT, update);
   grid_->Add(offset_, wxSizerFlags().Expand());
   removed_ = AddWay(Label("&Remove the place"), nullptr);
+}
+
+// --- the list of places ---
+
+void PlaceDialog::ShowList(const std::string& chosen) {
+  places_ = OfferedPlaces();
+  list_->Clear();
+  int selected = 0;
+  for (const OfferedPlace& place : places_) {
+    const int line = list_->Append(Shown(place.name));
+    if (place.listed && place.name == chosen) selected = line;
+  }
+  if (!places_.empty()) list_->SetSelection(selected);
+  listed_->Enable(!places_.empty());
+  if (places_.empty()) typed_->SetValue(true);
+  UpdateControls();
+}
+
+const OfferedPlace* PlaceDialog::Listed() const {
+  const int line = list_->GetSelection();
+  return line == wxNOT_FOUND ? nullptr : &places_[static_cast<size_t>(line)];
+}
+
+void PlaceDialog::Done(const std::string& problem, const std::string& chosen) {
+  LogEvent("places", problem.empty() ? chosen : problem);
+  if (!problem.empty()) wxMessageBox(Shown(problem), Label("Place"), wxOK | wxICON_WARNING, this);
+  ShowList(chosen);
+}
+
+void PlaceDialog::AddToList() {
+  const auto place = ParseGpsPlace(Utf8(field_->GetValue()));
+  if (!place) return;
+  LogEvent("prompt", "place-name");
+  const wxString name =
+      wxGetTextFromUser(Label("Name of the place:"), Label("Add to list"), "", this);
+  if (name.empty()) return;
+  const std::string problem = AddPlace(Utf8(name), *place);
+  if (problem.empty()) listed_->SetValue(true);
+  Done(problem, Utf8(name));
+}
+
+void PlaceDialog::Rename() {
+  const OfferedPlace* const place = Listed();
+  if (place == nullptr) return;
+  const std::string old = place->name;
+  LogEvent("prompt", "place-name");
+  const wxString name = wxGetTextFromUser(Label("New name:"), Label("Rename"), Shown(old), this);
+  if (name.empty()) return;
+  const std::string problem = RenamePlace(old, Utf8(name));
+  Done(problem, problem.empty() ? Utf8(name) : old);
+}
+
+void PlaceDialog::Remove() {
+  const OfferedPlace* const place = Listed();
+  if (place == nullptr) return;
+  wxMessageDialog dialog(this, Label("Delete \"%1\" from the list of places?", place->name),
+                         Label("Delete place"), wxOK | wxCANCEL | wxICON_QUESTION);
+  dialog.SetOKLabel(Label("&Delete"));
+  LogEvent("prompt", "place-delete");
+  if (dialog.ShowModal() == wxID_OK) Done(RemovePlace(place->name), {});
 }
 
 // A track may be long, so it is read in the background.
@@ -178,8 +255,7 @@ void PlaceDialog::ReadTrack() {
 }
 
 std::optional<GpsPlace> PlaceDialog::ChosenPlace() const {
-  if (listed_->GetValue() && list_->GetSelection() != wxNOT_FOUND)
-    return places_[static_cast<size_t>(list_->GetSelection())].place;
+  if (listed_->GetValue() && Listed() != nullptr) return Listed()->place;
   if (typed_->GetValue()) return ParseGpsPlace(Utf8(field_->GetValue()));
   return {};
 }
@@ -213,6 +289,10 @@ void PlaceDialog::UpdateControls() {
   map_->Show(place.has_value());
   if (place) map_->SetURL(Shown(MapLink(*place)));
   list_->Enable(listed_->GetValue());
+  const bool own = listed_->GetValue() && Listed() != nullptr && Listed()->listed;
+  rename_->Enable(own);
+  remove_->Enable(own);
+  add_->Enable(typed_->GetValue() && place.has_value());
   field_->Enable(typed_->GetValue());
   file_->Enable(tracked_->GetValue());
   offset_->Enable(tracked_->GetValue());
