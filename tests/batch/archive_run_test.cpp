@@ -8,6 +8,7 @@
 
 #include "archive/packed_sizes.h"
 #include "batch/archive/create_run.h"
+#include "batch/outcome_box.h"
 #include "batch/prompts.h"
 #include "files/file_operation.h"
 #include "files/previous_file.h"
@@ -19,19 +20,6 @@ namespace fotomill::test {
 namespace {
 
 using testing::ElementsAre;
-
-// Collects the outcomes of a run.
-class Box : public ProgressBox {
- public:
-  std::vector<FileOutcome> outcomes;
-  bool Open(const ProgressModel&) override { return true; }
-  void ShowLine(const ProgressLine&, const FileOutcome* outcome) override {
-    if (outcome != nullptr) outcomes.push_back(*outcome);
-  }
-  void ShowStatus(const std::string&) override {}
-  void StayOpen(const ProgressModel&) override {}
-  void Close(const ProgressModel&) override {}
-};
 
 // Gives one password, and counts the questions.
 class OnePassword : public Prompts {
@@ -55,7 +43,7 @@ class ArchiveRun : public testing::Test {
     WriteText(folder_.Path("in/a.txt"), std::string(5000, 'a'));
     WriteText(folder_.Path("in/sub/b.txt"), "b");
   }
-  static void Prepare(BatchJob& job, Box& box, OnePassword& prompts, bool replace) {
+  static void Prepare(BatchJob& job, OutcomeBox& box, OnePassword& prompts, bool replace) {
     job.box = &box;
     job.prompts = &prompts;
     job.formatIndex = FindFormatByName("a.zip");
@@ -67,7 +55,7 @@ class ArchiveRun : public testing::Test {
   // The statuses of the lines.
   std::vector<Status> Create(const std::vector<std::string>& files, std::string password = {},
                              bool add = false, bool replace = false) {
-    Box box;
+    OutcomeBox box;
     BatchJob job;
     Prepare(job, box, prompts_, replace);
     CreateArchive request{
@@ -80,14 +68,14 @@ class ArchiveRun : public testing::Test {
   }
   std::vector<Status> Extract(const ArchivePart& part, bool replace = false,
                               bool keepPaths = true) {
-    Box box;
+    OutcomeBox box;
     BatchJob job;
     Prepare(job, box, prompts_, replace);
     EXPECT_EQ(RunExtract(part, {.folder = folder_.Path("out"), .keepPaths = keepPaths}, job),
               Status::Ok);
     return StatusesOf(box);
   }
-  static std::vector<Status> StatusesOf(const Box& box) {
+  static std::vector<Status> StatusesOf(const OutcomeBox& box) {
     std::vector<Status> statuses;
     for (const FileOutcome& outcome : box.outcomes) statuses.push_back(outcome.status);
     return statuses;
@@ -139,7 +127,7 @@ TEST_F(ArchiveRun, AddingKeepsTheOthersAndCanBeUndone) {
 TEST_F(ArchiveRun, PasswordsAreAskedForOnce) {
   Create({folder_.Path("in")}, "secret");
   BatchJob job;
-  Box box;
+  OutcomeBox box;
   Prepare(job, box, prompts_, false);
   EXPECT_EQ(RunArchiveTest({.path = zip_}, job), Status::Ok);
   EXPECT_TRUE(box.outcomes.empty());  // the question was canceled

@@ -14,7 +14,7 @@
 #include <optional>
 
 #include "batch/new_job.h"
-#include "batch/progress_box.h"
+#include "batch/outcome_box.h"
 #include "batch/rename/pattern_rename.h"
 #include "batch/rename/sequential_rename.h"
 #include "core/plain_name.h"
@@ -43,19 +43,6 @@ constexpr int kMostNumber = 32760, kMostIncrement = 1000;
 constexpr std::string_view kFirstPattern = "%D{%Y-%m-%d} %03c %F";
 
 std::string_view BuiltInBase() { return DefaultText(KeyOf(KeyNumber::SequentialRenameBaseName)); }
-
-// Records the results of a dry run instead of showing them.
-class PreviewBox : public ProgressBox {
- public:
-  std::vector<FileOutcome> outcomes;
-  bool Open(const ProgressModel&) override { return true; }
-  void ShowLine(const ProgressLine&, const FileOutcome* outcome) override {
-    if (outcome != nullptr) outcomes.push_back(*outcome);
-  }
-  void ShowStatus(const std::string&) override {}
-  void StayOpen(const ProgressModel&) override {}
-  void Close(const ProgressModel&) override {}
-};
 
 struct FlagBox {
   KeyNumber key;
@@ -265,7 +252,7 @@ void SequentialRenameDialog::UpdateControls() {
   if (!problem.empty()) return;
   const std::vector<BatchFile> files = BatchFiles(files_, kMostPreviewed);
   if (!byPattern) {
-    PreviewBox box;
+    OutcomeBox box;
     BatchJob job;
     job.box = &box;
     RunRename(files, {.rules = ReadControls(), .seed = 1, .dryRun = true}, job);
@@ -274,7 +261,7 @@ void SequentialRenameDialog::UpdateControls() {
   PatternRenameOptions options = ReadPattern();
   options.dryRun = true;
   work_.Start([this, files, options](const StopToken&, const LooseWork::Report& report) {
-    PreviewBox box;
+    OutcomeBox box;
     BatchJob job;
     job.box = &box;
     RunPatternRename(files, options, job);
