@@ -1,5 +1,6 @@
 #!/usr/bin/env python3
 """Archives in the real program: as folders, in the archive manager, created from a selection."""
+import re
 import zipfile
 
 from driven_desktop import Desktop, make_pictures, run
@@ -26,6 +27,13 @@ def archive_as_folder(folder):
         desktop.wait(r"folder-note .*trip.zip")
         desktop.wait(r"browser tabs=2 .*missing=0 listing=0 .*/trip.zip")
         desktop.screenshot("archive-folder")
+        # Nothing is changed there, by commands, keys of tags or in other windows.
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "Delete", "F2", "ctrl+alt+e", "5")
+        desktop.wait(r"prompt archive-stays")
+        desktop.focus("^Archive$", native=True)
+        desktop.key("Return")
+        assert not re.search(r"^\S+ (files|exif-edit|prompt delete)", desktop.log_text(), re.M)
         # Convert out of it: next to the archive, not into the temporary folder.
         desktop.focus("Fotomill Professional")
         desktop.key("ctrl+f")

@@ -68,11 +68,15 @@ class RowDialog : public wxDialog {
     GetSizer()->Add(row, wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT, FromDIP(10)));
     return field;
   }
-  void Finish(const wxString& label) {
+  // `kept`: the last size in device-independent pixels; 0: none.
+  void Finish(const wxString& label, const wxSize& kept) {
     ok_ = new wxButton(this, wxID_OK, label);
-    GetSizer()->Add(BuildAnswerRow(*this, *ok_), wxSizerFlags().Expand().Border(wxALL, FromDIP(10)));
+    GetSizer()->Add(BuildAnswerRow(*this, *ok_),
+                    wxSizerFlags().Expand().Border(wxALL, FromDIP(10)));
     UpdateControls();
     GetSizer()->SetSizeHints(this);
+    const wxSize size = FromDIP(kept), least = GetSize();
+    SetSize(wxSize(std::max(size.x, least.x), std::max(size.y, least.y)));
     CentreOnParent();
   }
 
@@ -84,6 +88,7 @@ class RowDialog : public wxDialog {
 class ExtractDialog : public RowDialog {
  public:
   ExtractDialog(wxWindow& parent, const std::string& archive, size_t count, size_t selected);
+  ~ExtractDialog() override;
   ExtractChoice Choice() const;
   void Keep() const;
 
@@ -117,7 +122,7 @@ ExtractDialog::ExtractDialog(wxWindow& parent, const std::string& archive, size_
   folder_->AutoCompleteDirectories();
   paths_ = AddFlag(Label("&Keep the folders of the archive"), settings.ArchivePreservePaths != 0);
   times_ = AddFlag(Label("Keep file &times"), settings.ArchivePreserveTimestamps != 0);
-  Finish(Label("&Extract"));
+  Finish(Label("&Extract"), wxSize(settings.ArchiveCopyWidth, settings.ArchiveCopyDepth));
   ok_->SetFocus();
 }
 
@@ -135,6 +140,12 @@ void ExtractDialog::Browse() {
   if (dialog.ShowModal() == wxID_OK) folder_->SetValue(dialog.GetPath());
 }
 
+ExtractDialog::~ExtractDialog() {
+  settings.ArchiveCopyWidth = ToDIP(GetSize()).x;
+  settings.ArchiveCopyDepth = ToDIP(GetSize()).y;
+  (void)SaveConfiguration();
+}
+
 ExtractChoice ExtractDialog::Choice() const {
   return {WholeFolder(Utf8(folder_->GetValue()), beside_), selected_->GetValue()};
 }
@@ -143,7 +154,6 @@ void ExtractDialog::Keep() const {
   settings.ArchivePreservePaths = paths_->GetValue() ? 1 : 0;
   settings.ArchivePreserveTimestamps = times_->GetValue() ? 1 : 0;
   (void)AddChoice(HistoryList::Archives, Choice().folder, beside_);
-  (void)SaveConfiguration();
 }
 
 // --- creating ---
@@ -151,6 +161,7 @@ void ExtractDialog::Keep() const {
 class CreateDialog : public RowDialog {
  public:
   CreateDialog(wxWindow& parent, const std::vector<std::string>& files);
+  ~CreateDialog() override;
   CreateChoice Choice() const;
   void Keep() const;
 
@@ -184,8 +195,15 @@ CreateDialog::CreateDialog(wxWindow& parent, const std::vector<std::string>& fil
   problem_ =
       new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxST_NO_AUTORESIZE);
   GetSizer()->Add(problem_, Below());
-  Finish(LabelCount("Archi&ve %1 item", "Archi&ve %1 items", files.size()));
+  Finish(LabelCount("Archi&ve %1 item", "Archi&ve %1 items", files.size()),
+         wxSize(settings.ArchiveOptionsOpenWidth, settings.ArchiveOptionsOpenDepth));
   path_->SetFocus();
+}
+
+CreateDialog::~CreateDialog() {
+  settings.ArchiveOptionsOpenWidth = ToDIP(GetSize()).x;
+  settings.ArchiveOptionsOpenDepth = ToDIP(GetSize()).y;
+  (void)SaveConfiguration();
 }
 
 wxTextCtrl* CreateDialog::AddPassword(const wxString& label) {
@@ -225,7 +243,6 @@ void CreateDialog::UpdateControls() {
 void CreateDialog::Keep() const {
   settings.ArchivePreservePaths = paths_->GetValue() ? 1 : 0;
   settings.ArchiveAddThumbnails = thumbnails_->GetValue() ? 1 : 0;
-  (void)SaveConfiguration();
 }
 
 }  // namespace

@@ -1,7 +1,9 @@
 #include "desktop/windows/archive/archive_folders.h"
 
 #include <wx/frame.h>
+#include <wx/msgdlg.h>
 
+#include <algorithm>
 #include <map>
 #include <memory>
 
@@ -13,6 +15,7 @@
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
+#include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/held_file.h"
@@ -94,6 +97,18 @@ std::string ArchiveOfFolder(const std::string& folder) {
     if (!home.empty() && folder.starts_with(home)) return archive;
   }
   return {};
+}
+
+const char* const kUnpackedFilesStay =
+    TrLater("Files in an archive cannot be changed. Extract or copy them to a folder first.");
+
+bool RefusesChange(wxWindow* parent, const std::vector<std::string>& paths) {
+  const bool unpacked = std::ranges::any_of(
+      paths, [](const std::string& path) { return !ArchiveOfFolder(path).empty(); });
+  if (!unpacked) return false;
+  LogEvent("prompt", "archive-stays");
+  wxMessageBox(Label(kUnpackedFilesStay), Label("Archive"), wxOK | wxICON_INFORMATION, parent);
+  return true;
 }
 
 std::string FolderForResults(const std::string& folder) {

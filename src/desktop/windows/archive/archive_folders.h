@@ -1,6 +1,9 @@
 #pragma once
 
 #include <string>
+#include <vector>
+
+class wxWindow;
 
 namespace fotomill::desktop {
 
@@ -13,6 +16,12 @@ void OpenArchiveFolder(Shell& shell, const std::string& archive);
 
 // The archive from which a folder, or one above it, was unpacked; empty if there is none.
 std::string ArchiveOfFolder(const std::string& folder);
+
+// Changes to unpacked files would be lost with their folder, so they are refused. Tells the user if
+// one of these files or folders is an unpacked one, and returns true then.
+bool RefusesChange(wxWindow* parent, const std::vector<std::string>& paths);
+// Why, a sentence in English, for translation.
+extern const char* const kUnpackedFilesStay;
 
 // The folder for results of functions on a folder: that of the archive, if the folder belongs to an
 // unpacked one, else the folder itself.

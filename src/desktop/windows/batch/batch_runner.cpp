@@ -7,6 +7,7 @@
 #include "batch/rewrite/turn_run.h"
 #include "desktop/models/batch/destination_choice.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/batch/destination_dialog.h"
 #include "desktop/windows/batch/name_dialog.h"
 #include "desktop/windows/batch/notification.h"
@@ -213,6 +214,7 @@ bool BatchRunner::Confirm(const std::string& question, const std::string& yes) {
 
 void TurnSelection(Shell& shell, Orientation turn) {
   std::vector<BatchFile> files;
+  if (RefusesChange(&shell.Window(), shell.Tabs().SelectedFiles())) return;
   for (const std::string& file : shell.Tabs().SelectedFiles())
     files.push_back({.name = file, .below = {}, .hint = {}});
   if (files.empty()) return;

@@ -345,6 +345,11 @@ void BrowserPage::FocusName(const std::string& name) {
   SelectionChanged();
 }
 
+void BrowserPage::ShowInList(const std::string& name) {
+  const size_t line = model_.FindLine(name);
+  if (line != kNoLine && !ShowsDetails()) canvas_->ShowLine(line);
+}
+
 void BrowserPage::SelectWhenListed(std::vector<std::string> names) {
   if (found_) {
     const std::unordered_set<std::string> found(found_->begin(), found_->end());
@@ -440,7 +445,10 @@ void BrowserPage::BeginDrag() {
   if (chosen.empty()) return;
   FileListData files(chosen);
   wxDropSource source(files, this);
-  if (source.DoDragDrop(wxDrag_AllowMove) == wxDragMove) Reload();
+  // unpacked files must stay for the others that use them
+  const bool mayMove = host_.NoteAbout(model_.Folder()).empty();
+  LogEvent("drag", std::to_string(chosen.size()) + (mayMove ? "" : " copy"));
+  if (source.DoDragDrop(mayMove ? wxDrag_AllowMove : wxDrag_CopyOnly) == wxDragMove) Reload();
 }
 
 }  // namespace fotomill::desktop

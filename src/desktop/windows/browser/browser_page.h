@@ -94,6 +94,8 @@ class BrowserPage : public wxPanel {
   void SelectionChanged();
   // Focuses the line with this name and scrolls it into view.
   void FocusName(const std::string& name);
+  // Scrolls to the line with this name, keeping focus and selection; thumbnails only.
+  void ShowInList(const std::string& name);
   // Selects exactly these names once the folder is listed again, and nothing until then. For
   // commands that just changed the files.
   void SelectWhenListed(std::vector<std::string> names);

@@ -18,6 +18,7 @@
 #include "desktop/models/files/turn_one_file.h"
 #include "desktop/models/files/uri_list.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/dialogs/folder_dialog.h"
 #include "desktop/windows/files/file_list_data.h"
 #include "desktop/windows/history/use_recorder.h"
@@ -117,6 +118,9 @@ void FileActions::ReportFailures(const std::vector<FileOperationFailure>& failur
 void FileActions::Do(FileOperationKind kind, const std::vector<std::string>& paths,
                      const std::string& folder) {
   if (paths.empty()) return;
+  std::vector<std::string> changed{folder};
+  if (kind == FileOperationKind::Move) changed.insert(changed.end(), paths.begin(), paths.end());
+  if (RefusesChange(&shell_.Window(), changed)) return;
   FileOperation name{kind, std::vector<FileStep>(paths.size(), FileStep{paths.front(), {}})};
   std::string what = FileOperationName(name);
   what[0] = static_cast<char>(what[0] - 'a' + 'A');
@@ -163,7 +167,7 @@ void FileActions::Took(const FileOperation& operation, bool back) {
 // --- tags ---
 
 void FileActions::Tag(const std::vector<std::string>& paths, const TagChanges& changes) {
-  if (paths.empty()) return;
+  if (paths.empty() || RefusesChange(&shell_.Window(), paths)) return;
   tagging_.push_back({paths, changes});
   StartTagging();
 }
@@ -192,7 +196,7 @@ void FileActions::Trash(const std::vector<std::string>& paths) { Trash(paths, {}
 
 // Finds out in the background whether there is a trash, too.
 void FileActions::Trash(const std::vector<std::string>& paths, const Asker& asker) {
-  if (paths.empty()) return;
+  if (paths.empty() || RefusesChange(ParentOf(asker), paths)) return;
   const auto noTrash = std::make_shared<bool>(false);
   const FileOperation operation = 
       PlanFileOperation(FileOperationKind::Trash, paths, {}, FileOperationOptionsFromSettings());
@@ -219,6 +223,7 @@ void FileActions::Trash(const std::vector<std::string>& paths, const Asker& aske
 void FileActions::TrashFromView(wxWindow* view, const std::string& path,
                                 std::function<void()> gone) {
   if (busy_) return wxBell();
+  if (RefusesChange(view, {path})) return;
   if (settings.PromptDeleteFromView != 0) {
     wxMessageDialog dialog(view, Label("Move %1 to the trash?", Shown(platform::FileNameOf(path))),
                            Label("Delete"), wxOK | wxCANCEL | wxICON_QUESTION);
@@ -231,7 +236,7 @@ void FileActions::TrashFromView(wxWindow* view, const std::string& path,
 void FileActions::Delete(const std::vector<std::string>& paths) { Delete(paths, {}, false); }
 
 void FileActions::Delete(const std::vector<std::string>& paths, const Asker& asker, bool noTrash) {
-  if (paths.empty()) return;
+  if (paths.empty() || RefusesChange(ParentOf(asker), paths)) return;
   const wxString what = paths.size() == 1 ? "\"" + Shown(platform::FileNameOf(paths.front())) + "\""
                                           : Shown(Count(paths.size()));
   const wxString why =
@@ -267,6 +272,7 @@ void FileActions::Drop(const std::vector<std::string>& paths, const std::string&
 }
 
 void FileActions::Rename(const std::string& path, const std::string& name) {
+  if (RefusesChange(&shell_.Window(), {path})) return;
   if (!IsPlainName(name)) {
     wxMessageBox(
         Label("A name cannot contain \"%1\".", Shown(std::string(1, platform::kSeparator))),
@@ -291,6 +297,7 @@ void FileActions::RenameAll(std::vector<FileStep> steps) {
 }
 
 void FileActions::NewFolder(const std::string& parent) {
+  if (RefusesChange(&shell_.Window(), {parent})) return;
   wxTextEntryDialog dialog(&shell_.Window(), Label("Name of the new folder:"), Label("New folder"),
                            wxString::FromUTF8(settings.NewFolderName.c_str()));
   if (dialog.ShowModal() != wxID_OK) return;
@@ -309,7 +316,7 @@ void FileActions::NewFolder(const std::string& parent) {
 }
 
 bool FileActions::SaveTurned(const std::string& path, Orientation turn, Turned then) {
-  if (busy_) return false;
+  if (busy_ || RefusesChange(&shell_.Window(), {path})) return false;
   const auto work = [path, turn](const FileOperationProgress&) { return TurnOneFile(path, turn); };
   Run(Tr("Rotation of %1", platform::FileNameOf(path)), work,
       [this, then = std::move(then)](FileOperationResult result) {
@@ -379,6 +386,7 @@ void FileActions::PathsToClipboard(const std::vector<std::string>& paths) {
 }
 
 void FileActions::Paste(const std::string& folder) {
+  if (RefusesChange(&shell_.Window(), {folder})) return;
   FileListData files;
   wxCustomDataObject marked{wxDataFormat(kGnomeFiles)};
   bool cut = false;

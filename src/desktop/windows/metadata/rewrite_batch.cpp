@@ -3,6 +3,7 @@
 #include <wx/frame.h>
 
 #include "batch/new_job.h"
+#include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/shell/shell.h"
 #include "files/previous_file.h"
@@ -12,6 +13,7 @@ namespace fotomill::desktop {
 void RunRewriteBatch(Shell& shell, const std::vector<std::string>& files, RewriteFunction function,
                      const std::string& folder, const std::weak_ptr<bool>& alive,
                      std::function<void(bool errors)> done) {
+  if (folder.empty() && RefusesChange(&shell.Window(), files)) return done(true);
   std::vector<BatchFile> batch;
   for (const std::string& file : files) batch.push_back({.name = file, .below = {}, .hint = {}});
   auto previous = std::make_shared<PreviousFiles>(FileOperationKind::Change);

@@ -283,7 +283,7 @@ void BrowserTabs::KeepView(const std::string& folder, const FolderView& view) {
 std::string BrowserTabs::NoteAbout(const std::string& folder) const {
   const std::string archive = ArchiveOfFolder(folder);
   if (archive.empty()) return {};
-  return Tr("Files unpacked from %1. Changes are not saved in the archive.",
+  return Tr("Files in %1. They can be viewed, copied and converted, but not changed.",
             platform::FileNameOf(archive));
 }
 
@@ -302,7 +302,8 @@ void BrowserTabs::RenameFile(const std::string& path, const std::string& name) {
 
 void BrowserTabs::DropFiles(const std::vector<std::string>& files, const std::string& folder,
                             bool move) {
-  shell_.Files().Drop(files, folder, move);
+  const bool unpacked = !files.empty() && !ArchiveOfFolder(files.front()).empty();
+  shell_.Files().Drop(files, folder, move && !unpacked);
 }
 
 void BrowserTabs::TagSelected(const TagChanges& changes) {
