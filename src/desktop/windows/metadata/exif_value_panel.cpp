@@ -1,16 +1,15 @@
 #include "desktop/windows/metadata/exif_value_panel.h"
 
 #include <wx/button.h>
-#include <wx/calctrl.h>
 #include <wx/choice.h>
-#include <wx/dialog.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
+#include <algorithm>
+
 #include "core/text.h"
-#include "desktop/models/shell/event_log.h"
-#include "desktop/windows/widgets/button_row.h"
+#include "desktop/windows/metadata/day_dialog.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "metadata/edit/exif_dates.h"
@@ -22,35 +21,6 @@ namespace fotomill::desktop {
 namespace {
 
 constexpr int kWidth = 300;  // of the panel, device-independent
-
-// Asks for a day; changes the date in a text "2024:05:31 14:03:00". False if canceled.
-bool AskForDay(wxWindow& parent, std::string& text) {
-  wxDialog dialog(&parent, wxID_ANY, Label("Date"), wxDefaultPosition, wxDefaultSize,
-                  wxDEFAULT_DIALOG_STYLE, "DateBox");
-  auto* calendar = new wxCalendarCtrl(&dialog, wxID_ANY);
-  const auto time = ParseExifTime(text);
-  if (time) {
-    wxDateTime day;
-    day.ParseFormat(wxString::FromUTF8(ExifTimeText(*time).substr(0, 10)), "%Y:%m:%d");
-    if (day.IsValid()) calendar->SetDate(day);
-  }
-  auto* sizer = new wxBoxSizer(wxVERTICAL);
-  const int gap = parent.FromDIP(10);
-  sizer->Add(calendar, wxSizerFlags(1).Expand().Border(wxALL, gap));
-  auto* ok = new wxButton(&dialog, wxID_OK);
-  sizer->Add(BuildAnswerRow(dialog, *ok),
-             wxSizerFlags().Expand().Border(wxLEFT | wxRIGHT | wxBOTTOM, gap));
-  dialog.SetSizerAndFit(sizer);
-  dialog.CentreOnParent();
-  calendar->Bind(wxEVT_CALENDAR_DOUBLECLICKED,
-                 [&dialog](wxCalendarEvent&) { dialog.EndModal(wxID_OK); });
-  calendar->SetFocus();
-  LogEvent("prompt", "date");
-  if (dialog.ShowModal() != wxID_OK) return false;
-  const std::string clock = time ? ExifTimeText(*time).substr(10) : " 00:00:00";
-  text = Utf8(calendar->GetDate().Format("%Y:%m:%d")) + clock;
-  return true;
-}
 
 }  // namespace
 
@@ -196,8 +166,15 @@ void ExifValuePanel::FocusValue() {
 }
 
 void ExifValuePanel::PickDate() {
-  std::string text = Utf8(text_->GetValue());
-  if (AskForDay(*this, text)) text_->SetValue(wxString::FromUTF8(text));
+  const auto time = ParseExifTime(Utf8(text_->GetValue()));
+  std::string text = time ? ExifTimeText(*time) : std::string();
+  std::string day = text.substr(0, 10);
+  std::ranges::replace(day, ':', '-');
+  const auto chosen = AskForDay(*this, day);
+  if (!chosen) return;
+  text = *chosen + (time ? text.substr(10) : " 00:00:00");
+  std::ranges::replace(text.begin(), text.begin() + 10, '-', ':');
+  text_->SetValue(wxString::FromUTF8(text));
 }
 
 void ExifValuePanel::EnterFlash() {
