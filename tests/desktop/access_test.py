@@ -160,6 +160,12 @@ WINDOWS = [
     ("F4", r"edit-preview exact=1", "Edit: 2 pictures"),
     ("shift+F4", r"crop-picture 1/2", "Crop properties"),
     ("", None, "Crop: 2 pictures"),  # its panel was closed
+    ("ctrl+alt+t", r"prompt file-times", "File Times"),
+    ("ctrl+j", r"prompt jump", "Jump to File"),
+    ("ctrl+shift+f", r"prompt search", "Find pictures"),
+    ("ctrl+alt+e", r"exif-edit files=", "Edit EXIF: 2 files"),
+    ("ctrl+alt+m", r"prompt strip", "Remove Metadata"),
+    ("ctrl+alt+z", r"prompt archive", "Create archive"),
     ("ctrl+h", r"history rows=", "File history"),
     ("ctrl+k", r"finder found=", "Find command"),
     ("tools compact", None, "Compact thumbnail database"),

@@ -491,6 +491,16 @@ def rate_and_label(folder):
         desktop.key("Down", "Down", "Down", "Down", "Down", "Down", "Return")
         desktop.wait(r"tag-filter 5 lines=1")
         desktop.screenshot("filtered")
+        # A file that is changed stays in the list, with focus and selection.
+        start = len(desktop.log_text())
+        desktop.key("End", "7")
+        desktop.wait(r"files Tags of c.png done=1 failed=0")
+        desktop.wait(r"tags rated=3")
+        assert "lines=0" not in desktop.log_text()[start:]
+        assert "selected=0" not in desktop.log_text()[start:]
+        desktop.key("ctrl+z")
+        desktop.wait(r"files Undo .* done=1 failed=0")
+        desktop.wait(r"tags rated=3")
         desktop.key("End", "Return")
         desktop.wait(r"view place=1/1 .*c.png")
         rate_in_the_view_window(desktop, pictures / "c.png")
@@ -536,5 +546,44 @@ def rate_in_the_view_window(desktop, picture):
     desktop.key("Escape")
 
 
-run(open_select_view, rate_and_label, side_pane, view_window, sizes_and_groups, compare,
+def jump(folder):
+    """The jump window finds by words, shows what it finds, and selects it."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["beach-night.bmp", "beach-noon.bmp", "city-night.bmp", "other.bmp"])
+    with Desktop(folder, pictures, settings=["JumpWindowHotKey=71"]) as desktop:
+        desktop.wait(r"lines=4 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "ctrl+j")
+        desktop.wait(r"prompt jump")
+        desktop.focus("^Jump to File$")
+        desktop.type("ni bea")
+        desktop.wait(r"jump 1 beach-night.bmp")
+        desktop.key("ctrl+a")
+        desktop.type("night")
+        desktop.wait(r"jump 2 beach-night.bmp")
+        desktop.screenshot("jump")
+        desktop.key("Down")
+        desktop.wait(r"jump 2 city-night.bmp")
+        desktop.key("Return")
+        desktop.wait(r"selected=1 .* focus=city-night.bmp")
+        # The other key; within words; Escape leaves the selection alone.
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+shift+g")
+        desktop.wait(r"jump 2 beach-night.bmp")
+        desktop.focus("^Jump to File$")
+        desktop.key("ctrl+a")
+        desktop.type("the")
+        desktop.wait(r"jump 0 -")
+        desktop.key("alt+w")
+        desktop.wait(r"jump 1 other.bmp")
+        desktop.key("Escape")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+        assert "focus=other" not in desktop.log_text()
+        stored = (desktop.data / "Fotomill Professional 11.ini").read_text()
+        assert "JumpWindowSearchStart=0" in stored and "JumpWindowSearchTerm=the" in stored
+
+
+run(open_select_view, jump, rate_and_label, side_pane, view_window, sizes_and_groups, compare,
     play_animation, menu_of_empty_space, later_starts)

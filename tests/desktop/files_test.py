@@ -234,7 +234,9 @@ def search_results_in_a_tab(folder):
     make_pictures(pictures, ["tree.bmp", "sea1.bmp"])
     (pictures / "deep").mkdir()
     make_pictures(pictures / "deep/er", ["sea2.bmp", "hill.bmp"])
-    with Desktop(folder, pictures, settings=["UpdateThumbnailsFlag=0"]) as desktop:
+    with Desktop(folder, pictures,
+                 settings=["UpdateThumbnailsFlag=0", "DestForceSourceDir=1", "WarnDestinationWrite=0",
+                           "DefaultFileExtension=png"]) as desktop:
         desktop.wait(r"lines=3 .*missing=0 listing=0")
         desktop.focus("Fotomill Professional")
         desktop.key("ctrl+shift+f")
@@ -250,6 +252,17 @@ def search_results_in_a_tab(folder):
         desktop.key("Escape")
         desktop.focus("Fotomill Professional")
         desktop.screenshot("search-results")
+        desktop.key("Home", "ctrl+a", "4")
+        desktop.wait(r"files Tags of 2 files done=2 failed=0")
+        desktop.wait(r"tags rated=2")
+        assert b"<xmp:Rating>4<" in (pictures / "deep/er/sea2.bmp.xmp").read_bytes()
+        desktop.key("ctrl+e")
+        desktop.wait(r"prompt destination")
+        desktop.focus("^Convert$")
+        desktop.key("Return")
+        desktop.wait(rf"batch-line {pictures}/deep/er/sea2.bmp -> {pictures}/deep/er/sea2.png")
+        desktop.wait(r"batch ended status=0")
+        desktop.focus("Fotomill Professional")
         desktop.key("Home", "F2")
         desktop.type("ocean")
         desktop.key("Return")

@@ -2,6 +2,7 @@
 """Metadata in the real program: editing EXIF of several files, places, removal, undo."""
 import os
 import subprocess
+import time
 
 from driven_desktop import PROJECT, Desktop, make_pictures, run
 
@@ -99,6 +100,10 @@ def edit_values(folder):
         desktop.wait(r"prompt exif discard")
 
 
+def places_of(folder):
+    return (folder / "data/Locations.gps").read_text()
+
+
 def places(folder):
     pictures = folder / "pictures"
     tagged(pictures, ["one.jpg"])
@@ -131,6 +136,36 @@ def places(folder):
             desktop.wait(r"exif-edit files=1")
             return exif_of(pictures / "one.jpg")
 
+        # A place is added to the list, renamed and deleted.
+        place("alt+l", "Tab")
+        desktop.type("41.9,12.5")
+        desktop.wait(r"place 41")
+        desktop.key("alt+t")
+        desktop.wait(r"prompt place-name")
+        desktop.focus("^Add to list$", native=True)
+        desktop.type("Rome")
+        desktop.key("Return")
+        desktop.wait(r"places Rome")
+        desktop.focus("^Place$")
+        desktop.screenshot("place-list")
+        desktop.key("alt+m")
+        desktop.wait(r"prompt place-name")
+        desktop.focus("^Rename$", native=True)
+        desktop.key("ctrl+a")
+        desktop.type("Roma")
+        desktop.key("Return")
+        desktop.wait(r"places Roma")
+        assert places_of(folder).splitlines()[1:] == ["Lake = 45.5,-79.25",
+                                                      "Roma = 41.90000,12.50000"]
+        desktop.focus("^Place$")
+        desktop.key("alt+d")
+        desktop.wait(r"prompt place-delete")
+        desktop.focus("^Delete place$", native=True)
+        desktop.key("alt+d")
+        desktop.wait(r"places $")
+        assert places_of(folder) == "Home = 48.5,11.25\nLake = 45.5,-79.25\n"
+        desktop.focus("^Place$")
+        desktop.key("Escape")
         # From the list: the default location, Home, Lake.
         place("Down", "Down")
         desktop.wait(r"place 45.* 30' 00.00\" N, 79")
@@ -143,7 +178,9 @@ def places(folder):
         assert exif["East or West longitude"] == "West"
         assert exif["Copyright holder"] == "Ann Lee"
         # From a track; the camera was two hours ahead.
-        place("alt+g", "Tab")
+        place("alt+g")
+        desktop.wait(r"place Choose a recorded track")
+        desktop.key("Tab")
         desktop.type(str(folder / "walk.gpx"))
         desktop.wait(r"place 0 of 1 file was taken on this track")
         desktop.key("alt+a")
@@ -159,6 +196,17 @@ def places(folder):
         desktop.wait(r"place All GPS values are removed")
         desktop.key("alt+s")
         assert "Latitude" not in write()
+        # The value has the focus again after writing, and can be edited on.
+        desktop.focus("^Edit EXIF: one.jpg$")
+        desktop.key("alt+a")
+        choose(desktop, "Image title")
+        desktop.type("A")
+        desktop.wait(r"exif-edit-value Image title: A")
+        desktop.key("ctrl+s")
+        desktop.wait(r"exif-edit writing")
+        desktop.wait(r"exif-edit files=1")
+        desktop.type("B")
+        desktop.wait(r"exif-edit-value Image title: \w*B")
 
 
 def strip(folder):
@@ -222,5 +270,65 @@ def strip(folder):
         assert (pictures / "one.jpg").read_bytes() == old["one.jpg"]
 
 
+def file_times(folder):
+    """To when they were taken, and a sequence from a given time; undone."""
+    pictures = folder / "pictures"
+    tagged(pictures, ["one.jpg", "two.jpg"])
+    make_pictures(pictures, ["three.bmp"])
+    for path in pictures.iterdir():
+        os.utime(path, (1.6e9, 1.6e9))
+
+    def times():
+        return [time.strftime("%Y-%m-%d %H:%M:%S", time.localtime(path.stat().st_mtime))
+                for path in sorted(pictures.iterdir())]
+
+    old = times()
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"lines=3 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "ctrl+alt+t")
+        desktop.wait(r"file-time .*one.jpg: .* -> 2024-05-31 14:10:00")
+        desktop.wait(r"file-time .*three.bmp: .* -> It does not say when it was taken")
+        desktop.wait(r"file-time .*two.jpg: .* -> 2024-05-31 14:10:00")
+        desktop.focus("^File Times$")
+        desktop.screenshot("file-times")
+        assert times() == old
+        desktop.key("alt+s")
+        desktop.wait(r"batch-line .*three.bmp: ")
+        desktop.wait(r"batch ended status=0")
+        assert times() == ["2024-05-31 14:10:00", old[1], "2024-05-31 14:10:00"]
+        desktop.focus("^Progress$")
+        desktop.key("Escape")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "ctrl+alt+t")
+        desktop.wait(r"prompt file-times")
+        desktop.focus("^File Times$")
+        desktop.key("alt+i")
+        desktop.wait(r"file-times valid")
+        desktop.key("Tab", "ctrl+a")
+        desktop.type("2024-01-02 03:04")
+        desktop.wait(r"file-time .*two.jpg: .* -> 2024-01-02 03:04:00")
+        desktop.key("alt+e")
+        desktop.wait(r"file-times valid")
+        desktop.key("Tab", "ctrl+a")
+        desktop.type("later")
+        desktop.wait(r"file-times \"later\" is not a time difference")
+        desktop.key("ctrl+a")
+        desktop.type("0:01:00")
+        desktop.wait(r"file-time .*two.jpg: .* -> 2024-01-02 03:06:00")
+        desktop.screenshot("file-times-sequence")
+        desktop.key("alt+s")
+        desktop.wait(r"batch ended status=0")
+        sequence = [f"2024-01-02 03:0{minute}:00" for minute in (4, 5, 6)]
+        assert times() == sequence
+        desktop.focus("Fotomill Professional")
+        for key, what, count, expected in (
+                ("z", "Undo", 3, ["2024-05-31 14:10:00", old[1], "2024-05-31 14:10:00"]),
+                ("z", "Undo", 2, old), ("y", "Redo", 2, None), ("y", "Redo", 3, sequence)):
+            desktop.key(f"ctrl+{key}")
+            desktop.wait(rf"files {what} .* done={count} failed=0")
+            assert expected is None or times() == expected
+
+
 if __name__ == "__main__":
-    run(edit_values, places, strip)
+    run(edit_values, places, strip, file_times)

@@ -3,8 +3,10 @@
 #include <wx/control.h>
 
 #include "core/choice_lists.h"
+#include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/archive/archive_frame.h"
 #include "desktop/windows/batch/batch_runner.h"
+#include "desktop/windows/browser/jump_window.h"
 #include "desktop/windows/compare/compare_frame.h"
 #include "desktop/windows/dialogs/command_finder.h"
 #include "desktop/windows/dialogs/select_dialog.h"
@@ -14,6 +16,7 @@
 #include "desktop/windows/files/open_dialog.h"
 #include "desktop/windows/files/sequential_rename_dialog.h"
 #include "desktop/windows/metadata/exif_edit_frame.h"
+#include "desktop/windows/metadata/file_time_dialog.h"
 #include "desktop/windows/metadata/strip_dialog.h"
 #include "desktop/windows/search/search_window.h"
 #include "desktop/windows/shell/browser_tabs.h"
@@ -175,6 +178,11 @@ void View(Shell& shell) {
   if (!files.empty()) shell.Pictures().ViewFromBrowser(files.front(), another);
 }
 
+void Jump(Shell& shell) {
+  if (BrowserPage* browser = shell.Tabs().Front())
+    JumpToFile(shell.Window(), *browser, shell.Thumbnails());
+}
+
 constexpr const char* kFile = TrLater("&File");
 constexpr const char* kEdit = TrLater("&Edit");
 constexpr const char* kView = TrLater("&View");
@@ -214,7 +222,8 @@ constexpr Command kCommands[] = {
     {kEdit, TrLater("Select by p&attern..."), "Ctrl+S",     TrLater("Selects files by part of their name or by a pattern."), Needs::Nothing, SelectByPattern},
     {kEdit, TrLater("Select same t&ype"),   "",             TrLater("Selects all files of the focused file's type."), Needs::Item, SelectSameType},
     {kEdit, nullptr},
-    {kEdit, TrLater("Find pictur&es..."),   "Ctrl+Shift+F", TrLater("Finds pictures in folders by name, keywords, date and more."), Needs::Nothing, ShowSearch},
+    {kEdit, TrLater("Find pictur&es..."),   "Ctrl+Shift+F", TrLater("Finds pictures in folders by name, keywords, date and more."), Needs::Nothing, ShowSearch, "find"},
+    {kEdit, TrLater("&Jump to file..."),    "Ctrl+J",       TrLater("Finds a file in this folder by its name and selects it."), Needs::Nothing, Jump},
     {kEdit, TrLater("&Filter"),             "Ctrl+F",       TrLater("Shows only files whose names match."), Needs::Nothing, OfBrowser<&BrowserPage::EditFilter>},
 
     {kView, TrLater("&List"),               "Ctrl+1",       TrLater("Shows names only."), Needs::Nothing, ShowAs<choice::kViewList>, nullptr, false, Has<&BrowserModes::view, choice::kViewList>, nullptr, true, FolderPlace::View},
@@ -278,6 +287,7 @@ constexpr Command kCommands[] = {
     {kFunctions, TrLater("E&XIF..."),       "Alt+Shift+Return", TrLater("Shows the EXIF data of the focused picture."), Needs::Files, ShowExif, "exif", true},
     {kFunctions, TrLater("Remove metada&ta..."), "Ctrl+Alt+M", TrLater("Removes EXIF, GPS, comments and other metadata from the selected files."), Needs::Files, StripSelection, nullptr, true},
     {kFunctions, TrLater("Edit EXI&F..."),  "Ctrl+Alt+E",   TrLater("Changes EXIF values, times and places of the selected files."), Needs::Files, EditExifOfSelection, nullptr, true},
+    {kFunctions, TrLater("File times..."),  "Ctrl+Alt+T",   TrLater("Sets the times of the selected files, for example to when they were taken."), Needs::Files, SetTimesOfSelection, nullptr, true},
     {kFunctions, nullptr},
     {kFunctions, TrLater("C&opy to..."),    "F7",           TrLater("Copies the selected files to a folder."), Needs::Item, CopySelectionTo, "copy", true},
     {kFunctions, TrLater("&Move to..."),    "F6",           TrLater("Moves the selected files to a folder."), Needs::Item, MoveSelectionTo, "move", true},
@@ -319,6 +329,19 @@ constexpr Command kCommands[] = {
 };
 // clang-format on
 
+// What changes the selected files or their folder; not for files unpacked from an archive.
+constexpr void (*kChanging[])(Shell&) = {
+    Cut, Paste, NewFolder, OfBrowser<&BrowserPage::EditFocusedName>, Turn<Orientation::QuarterLeft>,
+    Turn<Orientation::QuarterRight>, StripSelection, EditExifOfSelection, SetTimesOfSelection,
+    MoveSelectionTo, RenameSelectionSequentially, TrashSelection, DeleteSelection, TagAs<'1'>,
+    TagAs<'2'>, TagAs<'3'>, TagAs<'4'>, TagAs<'5'>, TagAs<'0'>, Reject, TagAs<'6'>, TagAs<'7'>,
+    TagAs<'8'>, TagAs<'9'>, TagPurple, RemoveLabel, KeywordSelection, CommentSelection};
+
+bool IsRefusedInArchive(const Command& command, Shell& shell) {
+  return std::ranges::find(kChanging, command.run) != std::end(kChanging) &&
+         !ArchiveOfFolder(shell.Tabs().CurrentFolder()).empty();
+}
+
 }  // namespace
 
 std::span<const Command> Commands() { return kCommands; }
@@ -359,7 +382,10 @@ bool IsCommandId(int id) {
   return id >= kFirstCommandId && id < kFirstCommandId + static_cast<int>(std::size(kCommands));
 }
 
+const Command& JumpCommand() { return *std::ranges::find(kCommands, &Jump, &Command::run); }
+
 bool CanRun(const Command& command, Shell& shell) {
+  if (IsRefusedInArchive(command, shell)) return false;
   const BrowserPage* browser = shell.Tabs().Front();
   switch (command.needs) {
     case Needs::Files: return browser != nullptr && browser->Model().HasFileForFunction();
@@ -375,8 +401,9 @@ bool CanRun(const Command& command, Shell& shell) {
   return true;
 }
 
-const char* WhyNot(Needs needs) {
-  switch (needs) {
+const char* WhyNot(const Command& command, Shell& shell) {
+  if (IsRefusedInArchive(command, shell)) return kUnpackedFilesStay;
+  switch (command.needs) {
     case Needs::Files: return TrLater("No picture is selected.");
     case Needs::Few: return TrLater("Select two to four pictures.");
     case Needs::Item: return TrLater("No file or folder is selected.");

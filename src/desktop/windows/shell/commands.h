@@ -66,6 +66,8 @@ const Command& CommandOfId(int id);
 // Whether a command is currently available.
 bool CanRun(const Command& command, Shell& shell);
 // Why a command is not available, as a sentence.
-const char* WhyNot(Needs needs);
+const char* WhyNot(const Command& command, Shell& shell);
+// The command that opens the jump window, for its additional key.
+const Command& JumpCommand();
 
 }  // namespace fotomill::desktop

@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "core/text.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/edit/apply_steps.h"
 #include "desktop/windows/edit/quick_menu.h"
@@ -19,6 +20,7 @@
 #include "desktop/windows/widgets/wx_text.h"
 #include "operations/recipe_library.h"
 #include "settings/history_list.h"
+#include "settings/settings.h"
 
 namespace fotomill::desktop {
 
@@ -149,6 +151,10 @@ void FrameMenus::BindSecondKeys() {
     const bool taken = UserKeys().Conflict(KeyedCommands(), {}, command.secondKey) != nullptr;
     if (!taken && key.FromString(wxString("\t") + command.secondKey)) keys.push_back(key);
   }
+  const int32_t code = settings.JumpWindowHotKey;
+  const char letter = code > 0 && code < 0x80 ? UpperCase(static_cast<char>(code)) : '\0';
+  if (IsLetter(letter) || IsDigit(letter))
+    keys.emplace_back(wxACCEL_CTRL | wxACCEL_SHIFT, letter, CommandId(JumpCommand()));
   shell_.Window().SetAcceleratorTable(
       wxAcceleratorTable(static_cast<int>(keys.size()), keys.data()));
 }

@@ -69,7 +69,7 @@ void FunctionToolbar::ShowTip(const Command& command) {
   const std::string chosen = KeyOf(command);
   const wxString key = chosen.empty() ? wxString() : " (" + Shown(chosen) + ")";
   const wxString why =
-      CanRun(command, shell_) ? wxString() : wxString("\n") + Label(WhyNot(command.needs));
+      CanRun(command, shell_) ? wxString() : wxString("\n") + Label(WhyNot(command, shell_));
   const wxString tip = Label(command.help) + key + why;
   if (bar_->GetToolShortHelp(CommandId(command)) != tip)
     bar_->SetToolShortHelp(CommandId(command), tip);
