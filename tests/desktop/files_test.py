@@ -235,8 +235,8 @@ def search_results_in_a_tab(folder):
     (pictures / "deep").mkdir()
     make_pictures(pictures / "deep/er", ["sea2.bmp", "hill.bmp"])
     with Desktop(folder, pictures,
-                 settings=["UpdateThumbnailsFlag=0", "DestForceSourceDir=1", "WarnDestinationWrite=0",
-                           "DefaultFileExtension=png"]) as desktop:
+                 settings=["UpdateThumbnailsFlag=0", "DestForceSourceDir=1",
+                           "WarnDestinationWrite=0", "DefaultFileExtension=png"]) as desktop:
         desktop.wait(r"lines=3 .*missing=0 listing=0")
         desktop.focus("Fotomill Professional")
         desktop.key("ctrl+shift+f")
@@ -262,6 +262,21 @@ def search_results_in_a_tab(folder):
         desktop.key("Return")
         desktop.wait(rf"batch-line {pictures}/deep/er/sea2.bmp -> {pictures}/deep/er/sea2.png")
         desktop.wait(r"batch ended status=0")
+        desktop.focus("Fotomill Professional")
+        # Copies go where those of the last search went.
+        (folder / "found").mkdir()
+        desktop.key("Home", "ctrl+a", "F7")
+        desktop.wait(r"prompt folder")
+        desktop.focus("^Copy 2 files to$")
+        desktop.key("ctrl+a")
+        desktop.type(str(folder / "found"))
+        desktop.key("Return")
+        desktop.wait(r"files Copy of 2 files done=2 failed=0")
+        copies = sorted(path.name for path in (folder / "found").glob("*.bmp"))
+        assert copies == ["sea1.bmp", "sea2.bmp"], copies
+        stored = (desktop.data / "Fotomill Professional 11.ini").read_text()
+        assert f"PictureSearchDestination={folder}/found" in stored
+        assert (desktop.data / "FMWPicturesearchHistory.txt").read_text() == f"{pictures}\n"
         desktop.focus("Fotomill Professional")
         desktop.key("Home", "F2")
         desktop.type("ocean")

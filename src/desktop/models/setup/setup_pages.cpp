@@ -46,6 +46,7 @@ constexpr SetupItem kItems[] = {
     Item(Browsing,   TrLater("Find similar"),       FindSimilarTransforms,          "Also find pictures that are rotated or mirrored"),
     Item(Browsing,   TrLater("Recently used"), CopyHistoryMax,        "Folders copied or moved to"),
     Item(Browsing,   TrLater("Recently used"), DestHistoryMax,        "Destination folders"),
+    Item(Browsing,   TrLater("Recently used"), PictureSearchHistoryMax,    "Folders that were searched"),
     Item(Browsing,   TrLater("Recently used"), RecentFilesMaximum,    "Files in the File menu"),
     Item(Browsing,   TrLater("Recently used"), EditListMaximum,       "Base names of sequential renaming"),
     Item(Thumbnails, TrLater("Creating"),             BrowserThumbnailPrecacheEnable, "Also create thumbnails of files that are not visible"),

@@ -16,7 +16,8 @@
 namespace fotomill::desktop {
 
 std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title,
-                                        const wxString& verb, HistoryList history) {
+                                        const wxString& verb, HistoryList history,
+                                        const std::string& first) {
   wxDialog dialog(&parent, wxID_ANY, title, wxDefaultPosition, wxDefaultSize,
                   wxDEFAULT_DIALOG_STYLE | wxRESIZE_BORDER, "FolderBox");
   const int gap = dialog.FromDIP(10);
@@ -26,8 +27,10 @@ std::optional<std::string> AskForFolder(wxWindow& parent, const wxString& title,
       new wxComboBox(&dialog, wxID_ANY, "", wxDefaultPosition, dialog.FromDIP(wxSize(460, -1)), 0,
                      nullptr, wxTE_PROCESS_ENTER, wxDefaultValidator, Label("Folder"));
   const std::string builtIn = platform::SpecialFolderPath(platform::SpecialFolder::Pictures);
-  for (const std::string& entry : OfferedEntries(history, builtIn))
-    folder->Append(wxString::FromUTF8(entry));
+  if (!first.empty()) folder->Append(wxString::FromUTF8(first));
+  for (const std::string& entry : OfferedEntries(history, builtIn)) {
+    if (entry != first) folder->Append(wxString::FromUTF8(entry));
+  }
   if (folder->GetCount() > 0) folder->SetSelection(0);
   folder->AutoCompleteDirectories();
   auto* browse = new wxButton(&dialog, wxID_ANY, Label("B&rowse..."));

@@ -28,7 +28,9 @@
 #include "metadata/tags/tag_lines.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "settings/configuration.h"
 #include "settings/history_list.h"
+#include "settings/search_options.h"
 #include "settings/settings.h"
 #include "texts/grouped_count.h"
 #include "texts/status_text.h"
@@ -434,8 +436,17 @@ void AskAndDo(Shell& shell, const wxString& verb, const wxString& question,
               void (FileActions::*action)(const std::vector<std::string>&, const std::string&)) {
   const std::vector<std::string> paths = shell.Tabs().SelectedPaths();
   if (paths.empty()) return;
-  const auto folder = AskForFolder(shell.Window(), question, verb, HistoryList::MoveCopy);
-  if (folder) (shell.Files().*action)(paths, *folder);
+  // pictures that were found usually go where those of the last search went
+  const BrowserPage* const browser = shell.Tabs().Front();
+  const bool found = browser != nullptr && browser->ShowsFound();
+  const auto folder = AskForFolder(shell.Window(), question, verb, HistoryList::MoveCopy,
+                                   found ? SearchDestinationFromSettings() : std::string());
+  if (!folder) return;
+  if (found) {
+    RememberSearchDestination(*folder);
+    (void)SaveConfiguration();
+  }
+  (shell.Files().*action)(paths, *folder);
 }
 
 }  // namespace

@@ -3,6 +3,7 @@
 #include <wx/button.h>
 #include <wx/checkbox.h>
 #include <wx/choice.h>
+#include <wx/combobox.h>
 #include <wx/dialog.h>
 #include <wx/dirdlg.h>
 #include <wx/frame.h>
@@ -61,12 +62,13 @@ class SearchWindow : public wxDialog {
 
  private:
   void AddFolderRow(wxFlexGridSizer& grid);
+  void OfferFolders(const std::string& folder);
   void AddFields(wxFlexGridSizer& grid);
   void AddRanges(wxFlexGridSizer& grid);
   wxSizer* Options();
   wxSizer* Buttons();
   void UpdateControls();
-  void StoreControls() const;
+  void StoreControls();
   bool ReadCriteria(SearchCriteria& criteria);
   void Begin();
   void Take(const SearchNews& news);
@@ -80,7 +82,7 @@ class SearchWindow : public wxDialog {
   uint64_t examined_ = 0;
   wxWeakRef<BrowserPage> page_;  // with the results of this search
 
-  wxTextCtrl* place_ = nullptr;
+  wxComboBox* place_ = nullptr;
   wxTextCtrl* name_ = nullptr;
   wxCheckBox* checks_[std::size(kFields)] = {};
   wxTextCtrl* texts_[std::size(kFields)] = {};
@@ -147,14 +149,14 @@ SearchWindow::~SearchWindow() {
 }
 
 void SearchWindow::AddFolderRow(wxFlexGridSizer& grid) {
-  std::string folder = shell_.Tabs().CurrentFolder();
-  const std::string kept(settings.PictureSearchPath);
-  if (settings.PictureSearchPreservePath != 0 && !kept.empty()) folder = kept;
+  const std::string folder = SearchFolderFromSettings(shell_.Tabs().CurrentFolder());
   grid.Add(new wxStaticText(this, wxID_ANY, Label("F&older:")), wxSizerFlags().CenterVertical());
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   place_ =
-      new wxTextCtrl(this, wxID_ANY, Shown(folder), wxDefaultPosition, FromDIP(wxSize(340, -1)));
+      new wxComboBox(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(340, -1)));
   place_->SetName(Label("Folder"));
+  OfferFolders(folder);
+  place_->AutoCompleteDirectories();
   row->Add(place_, wxSizerFlags(1).CenterVertical());
   auto* browse = new wxButton(this, wxID_ANY, Label("&Browse..."));
   browse->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) {
@@ -164,6 +166,13 @@ void SearchWindow::AddFolderRow(wxFlexGridSizer& grid) {
   });
   row->Add(browse, wxSizerFlags().CenterVertical().Border(wxLEFT, FromDIP(6)));
   grid.Add(row, wxSizerFlags().Expand());
+}
+
+void SearchWindow::OfferFolders(const std::string& folder) {
+  place_->Clear();
+  for (const std::string& offered : OfferedSearchFolders())
+    place_->Append(wxString::FromUTF8(offered));
+  place_->SetValue(wxString::FromUTF8(folder));
 }
 
 void SearchWindow::AddFields(wxFlexGridSizer& grid) {
@@ -260,8 +269,12 @@ void SearchWindow::UpdateControls() {
   close_->SetLabel(work_.Started() ? Label("Stop") : Label("Close"));
 }
 
-void SearchWindow::StoreControls() const {
-  settings.PictureSearchPath.AssignCut(Utf8(place_->GetValue()));
+void SearchWindow::StoreControls() {
+  const std::string folder = platform::AbsolutePath(Utf8(place_->GetValue()));
+  if (platform::IsFolder(folder)) {
+    (void)RememberSearchFolder(folder);
+    OfferFolders(folder);
+  }
   settings.PictureSearchWildcardField.AssignCut(Utf8(name_->GetValue()));
   for (size_t i = 0; i < std::size(kFields); ++i) {
     settings.*kFields[i].on = checks_[i]->GetValue() ? 1 : 0;
