@@ -192,4 +192,22 @@ std::vector<Library> LibrariesOf(std::span<const OwnLibrary> own) {
   return libraries;
 }
 
+std::string VersionText(const Library& library) {
+  if (!library.version.empty()) return library.version;
+  return library.present ? "present" : "missing";
+}
+
+std::string LicensesText(std::span<const Library> libraries) {
+  std::string text;
+  for (const Library& library : libraries) {
+    text += "\n" + library.name + " " + VersionText(library) + ": " + library.license + "\n";
+    text += "  Copyright " + std::string(library.copyright) + "\n";
+    text += "  " + std::string(Tr(library.purpose)) + "; " +
+            Tr(library.linking == Linking::Inside ? TrLater("part of the program")
+                                                  : TrLater("a library of the system")) +
+            "\n";
+  }
+  return text;
+}
+
 }  // namespace fotomill

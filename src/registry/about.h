@@ -36,6 +36,11 @@ struct OwnLibrary {
 // The libraries of this build, including a front end's `own` ones, in table order.
 std::vector<Library> LibrariesOf(std::span<const OwnLibrary> own);
 
+// A library's version as people read it; without one, whether the library is there.
+std::string VersionText(const Library& library);
+// Name, version, license, copyright and purpose of each library, in paragraphs of three lines.
+std::string LicensesText(std::span<const Library> libraries);
+
 // The program's name, version and build date, YYYY-MM-DD.
 extern const char* const kProgramName;
 extern const char* const kProgramVersion;

@@ -39,9 +39,4 @@ std::span<const Library> Libraries() {
   return libraries;
 }
 
-std::string VersionText(const Library& library) {
-  if (!library.version.empty()) return library.version;
-  return library.present ? "present" : "missing";
-}
-
 }  // namespace fotomill::cli

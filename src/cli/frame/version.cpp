@@ -9,17 +9,8 @@ namespace fotomill::cli {
 
 namespace {
 
-// How a library is linked: word for JSON, text in English.
-struct LinkingRow {
-  const char* word;
-  const char* text;
-};
-constexpr LinkingRow kLinkings[] = {
-    {"inside", TrLater("part of the program")},
-    {"shared", TrLater("a library of the system")},
-    {"loaded", TrLater("a library of the system")},
-};
-const LinkingRow& RowOf(Linking linking) { return kLinkings[static_cast<size_t>(linking)]; }
+// How a library is linked, for JSON.
+constexpr const char* kLinkings[] = {"inside", "shared", "loaded"};
 
 std::string JsonPage() {
   Json object{{"name", kProgramName},
@@ -33,20 +24,10 @@ std::string JsonPage() {
                                    {"license", library.license},
                                    {"copyright", library.copyright},
                                    {"purpose", library.purpose},
-                                   {"linking", RowOf(library.linking).word},
+                                   {"linking", kLinkings[static_cast<size_t>(library.linking)]},
                                    {"present", library.present}});
   }
   return object.dump(2, ' ', false, Json::error_handler_t::replace) + "\n";
-}
-
-std::string LicensesPage() {
-  std::string page;
-  for (const Library& library : Libraries()) {
-    page += "\n" + library.name + " " + VersionText(library) + ": " + library.license + "\n";
-    page += "  Copyright " + std::string(library.copyright) + "\n";
-    page += "  " + std::string(Tr(library.purpose)) + "; " + Tr(RowOf(library.linking).text) + "\n";
-  }
-  return page;
 }
 
 }  // namespace
@@ -55,7 +36,7 @@ std::string VersionPage(const VersionOptions& options) {
   EnablePlugins();  // they use libraries, too
   if (options.json) return JsonPage();
   std::string page = std::string(kProgramName) + " " + kProgramVersion + "\n";
-  if (options.licenses) return page + Tr(kLicenseNote) + "\n" + LicensesPage();
+  if (options.licenses) return page + Tr(kLicenseNote) + "\n" + LicensesText(Libraries());
   for (const Library& library : Libraries())
     page += library.name + " " + VersionText(library) + "\n";
   return page;

@@ -7,7 +7,7 @@
 #include <algorithm>
 
 #include "desktop/models/shell/event_log.h"
-#include "desktop/windows/widgets/bitmaps.h"
+#include "desktop/windows/widgets/app_icon.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "settings/configuration.h"
 
@@ -27,7 +27,7 @@ wxBitmap Logo() {
   dc.SetPen(text);
   dc.SetBrush(*wxTRANSPARENT_BRUSH);
   dc.DrawRectangle(0, 0, kWidth, kHeight);
-  const wxBitmap symbol = Symbol("exif", kSymbol).GetBitmap(wxSize(kSymbol, kSymbol));
+  const wxBitmap symbol = AppIcon(kSymbol).GetBitmap(wxSize(kSymbol, kSymbol));
   dc.DrawBitmap(symbol, 28, (kHeight - kSymbol) / 2, true);
   const wxFont font = wxSystemSettings::GetFont(wxSYS_DEFAULT_GUI_FONT);
   dc.SetTextForeground(text);

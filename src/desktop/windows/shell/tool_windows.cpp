@@ -2,6 +2,7 @@
 
 #include "desktop/models/setup/setup_help.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/dialogs/about_box.h"
 #include "desktop/windows/dialogs/help.h"
 #include "desktop/windows/dialogs/plugin_box.h"
 #include "desktop/windows/dialogs/upkeep_boxes.h"
@@ -44,6 +45,7 @@ void ShowCleanUp(Shell& shell) {
 }
 void ShowPlugins(Shell& shell) { PluginBox(&shell.Window()).ShowModal(); }
 void ShowManual(Shell& shell) { ShowHelp(shell.Window(), kManual); }
+void ShowAbout(Shell& shell) { ShowAboutBox(shell.Window()); }
 void ShowConfigurationHelp(Shell& shell) { ShowHelp(shell.Window(), kGeneralHelpPage); }
 
 }  // namespace fotomill::desktop

@@ -14,5 +14,6 @@ void ShowCleanUp(Shell& shell);  // for the current folder
 void ShowPlugins(Shell& shell);  // modal
 void ShowManual(Shell& shell);   // as a help page
 void ShowConfigurationHelp(Shell& shell);
+void ShowAbout(Shell& shell);  // modal
 
 }  // namespace fotomill::desktop
