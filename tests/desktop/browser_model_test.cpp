@@ -197,10 +197,14 @@ TEST(BrowserModel, TypingFinds) {
 }
 
 TEST(Toolbar, KeepsItsButtonsAndAddsNewOnes) {
-  const std::vector<std::string> known{"view", "convert", "info", "setup"};
+  const std::vector<ToolbarButton> known{
+      {"view", true}, {"convert", true}, {"info", true}, {"setup", true},
+      {"Edit/Undo", false}, {"Edit/Redo", false}};
   const std::vector<ToolbarButton> expected{
-      {"setup", true}, {"view", false}, {"convert", true}, {"info", true}};
-  EXPECT_EQ(ParseToolbar("setup\r\n-view\ngone\nsetup\n-\nconvert\n", known), expected);
+      {"setup", true}, {"view", false}, {"Edit/Redo", true}, {"convert", true},
+      {"info", true}, {"Edit/Undo", false}};
+  EXPECT_EQ(ParseToolbar("setup\r\n-view\ngone\nsetup\n-\nEdit/Redo\nconvert\n", known), expected);
+  EXPECT_EQ(ParseToolbar("", known), known);
 }
 
 // The system's colors: background, text, highlight and its text.

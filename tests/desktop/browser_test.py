@@ -425,8 +425,9 @@ def later_starts(folder):
         desktop.wait(r"prompt toolbar")
         desktop.focus("^Toolbar$")
         desktop.screenshot("toolbar")
-        desktop.key("space", "alt+o")
-        desktop.wait(r"toolbar convert ")
+        # every command is offered, at the end those without a button
+        desktop.key("space", "End", "space", "alt+o")
+        desktop.wait(r"toolbar convert .* Help/About$")
         desktop.focus("Fotomill Professional")
         for keys, name in (("ctrl+Tab", "pictures"), ("ctrl+shift+Tab", "other")):
             desktop.key(keys)
@@ -585,5 +586,30 @@ def jump(folder):
         assert "JumpWindowSearchStart=0" in stored and "JumpWindowSearchTerm=the" in stored
 
 
+def order_and_tabs(folder):
+    """The order's buttons in the bar; the strip of tabs is there for several tabs only."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.png", "c.bmp"])
+    (pictures / "b.png").write_bytes((pictures / "b.png").read_bytes() + bytes(100000))
+    with Desktop(folder, pictures, settings=["UpdateThumbnailsFlag=0"]) as desktop:
+        desktop.wait(r"tab-strip 0")
+        desktop.wait(r"lines=3 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("shift+Tab", "shift+Tab", "space", "Escape", "Home")
+        desktop.wait(r"selected=1 .*sort=0 .*focus=c.bmp")
+        desktop.key("shift+Tab", "shift+Tab", "shift+Tab", "space")
+        desktop.wait(r"order-menu 6")
+        desktop.key("Down", "Down", "Down", "Return")
+        desktop.wait(r"sort=2 ")
+        desktop.key("Home")
+        desktop.wait(r"selected=1 .*sort=2 .*focus=b.png")
+        desktop.key("ctrl+t")
+        desktop.wait(r"tab-strip -1")
+        desktop.wait(r"browser tabs=2 .*listing=0")
+        desktop.screenshot("tabs")
+        desktop.key("ctrl+w")
+        desktop.wait(r"tab-strip 0")
+
+
 run(open_select_view, jump, rate_and_label, side_pane, view_window, sizes_and_groups, compare,
-    play_animation, menu_of_empty_space, later_starts)
+    play_animation, menu_of_empty_space, later_starts, order_and_tabs)

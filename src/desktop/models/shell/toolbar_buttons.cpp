@@ -19,23 +19,24 @@ constexpr char kHidden = '-';
 
 }  // namespace
 
-std::vector<ToolbarButton> ParseToolbar(std::string_view text, std::span<const std::string> known) {
+std::vector<ToolbarButton> ParseToolbar(std::string_view text,
+                                        std::span<const ToolbarButton> known) {
   std::vector<ToolbarButton> buttons;
   const auto add = [&](std::string_view name, bool shown) {
     const bool there = std::ranges::any_of(
         buttons, [&](const ToolbarButton& button) { return button.name == name; });
-    if (!there && std::ranges::find(known, name) != known.end())
+    if (!there && std::ranges::find(known, name, &ToolbarButton::name) != known.end())
       buttons.push_back({std::string(name), shown});
   };
   for (std::string_view line : ParseHistoryList(std::string(text), kMostButtons)) {
     const bool hidden = line.starts_with(kHidden);
     add(line.substr(hidden ? 1 : 0), !hidden);
   }
-  for (const std::string& name : known) add(name, true);
+  for (const ToolbarButton& button : known) add(button.name, button.shown);
   return buttons;
 }
 
-std::vector<ToolbarButton> LoadToolbar(std::span<const std::string> known) {
+std::vector<ToolbarButton> LoadToolbar(std::span<const ToolbarButton> known) {
   std::string text;
   const std::string path = DataFile(kFile);
   if (!path.empty()) (void)platform::ReadWholeFile(path, limits.listFileBytes, text);

@@ -15,13 +15,13 @@ struct ToolbarButton {
   bool operator==(const ToolbarButton&) const = default;
 };
 
-// Parses the order of buttons: one name per line,
-// "-" before hidden ones. Names not in `known` are
-// ignored; missing ones are appended, visible.
-std::vector<ToolbarButton> ParseToolbar(std::string_view text, std::span<const std::string> known);
+// Parses the order of buttons: one name per line, "-" before hidden ones. Names not in `known` are
+// ignored; missing ones are appended as they are there.
+std::vector<ToolbarButton> ParseToolbar(std::string_view text,
+                                        std::span<const ToolbarButton> known);
 
 // The user's choice, stored in the file "FMWToolbar.txt" in the data folder.
-std::vector<ToolbarButton> LoadToolbar(std::span<const std::string> known);
+std::vector<ToolbarButton> LoadToolbar(std::span<const ToolbarButton> known);
 // False if the file cannot be written.
 [[nodiscard]] bool SaveToolbar(std::span<const ToolbarButton> buttons);
 

@@ -1,25 +1,39 @@
 #include "desktop/windows/browser/browser_bar.h"
 
+#include <wx/bmpbuttn.h>
 #include <wx/button.h>
 #include <wx/menu.h>
 #include <wx/sizer.h>
 #include <wx/slider.h>
 #include <wx/srchctrl.h>
 
+#include <algorithm>
+#include <span>
+#include <utility>
+
+#include "core/choice_lists.h"
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/browser/thumbnail_side.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/browser/path_bar.h"
+#include "desktop/windows/widgets/bitmaps.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "settings/settings.h"
+#include "texts/texts.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
 // With an arrow, as it opens a menu.
-wxString TagFilterLabel(TagFilter filter) {
-  return wxControl::EscapeMnemonics(Shown(TagFilterName(filter) + "  \xE2\x96\xBE"));
+wxString MenuLabel(const std::string& text) {
+  return wxControl::EscapeMnemonics(Shown(text + "  \xE2\x96\xBE"));
+}
+wxString TagFilterLabel(TagFilter filter) { return MenuLabel(TagFilterName(filter)); }
+
+// The orders in which files can be listed, with their names in English.
+std::span<const ChoiceEntry> Orders() {
+  return {kSortModeChoices, static_cast<size_t>(choice::kSortDimensions) + 1};
 }
 
 }  // namespace
@@ -33,12 +47,15 @@ BrowserBar::BrowserBar(wxWindow* parent, BrowserModel& model, const FolderTrail&
   path_ = new PathBar(this, trail, {events_.step, events_.up, events_.open, [this] { Leave(); }});
   BuildTagFilter();
   BuildFilter();
+  BuildOrder();
   BuildSlider();
   const auto flags = wxSizerFlags().CenterVertical().Border(wxRIGHT, FromDIP(4));
   auto* row = new wxBoxSizer(wxHORIZONTAL);
   row->Add(path_, wxSizerFlags(1).CenterVertical());
   row->Add(tagFilter_, flags);
   row->Add(filter_, flags);
+  row->Add(order_, wxSizerFlags().CenterVertical());
+  row->Add(direction_, flags);
   row->Add(slider_, flags);
   SetSizer(row);
 }
@@ -54,7 +71,7 @@ void BrowserBar::BuildTagFilter() {
 }
 
 void BrowserBar::BuildFilter() {
-  filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(200, -1)),
+  filter_ = new wxSearchCtrl(this, wxID_ANY, "", wxDefaultPosition, FromDIP(wxSize(150, -1)),
                              wxTE_PROCESS_ENTER, wxDefaultValidator, Label("Filter"));
   filter_->SetDescriptiveText(Label("Filter"));
   filter_->ShowCancelButton(true);
@@ -72,9 +89,60 @@ void BrowserBar::BuildFilter() {
   });
 }
 
+void BrowserBar::BuildOrder() {
+  // wide enough for every label
+  order_ = new wxButton(this, wxID_ANY, "");
+  int width = 0;
+  for (const ChoiceEntry& order : Orders()) {
+    order_->SetLabel(MenuLabel(Tr(order.text)));
+    width = std::max(width, order_->GetBestSize().x);
+  }
+  order_->SetMinSize(wxSize(width, -1));
+  order_->SetToolTip(Label("Order of the files"));
+  order_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) { ChooseOrder(); });
+  direction_ = new wxBitmapButton(this, wxID_ANY, Symbol("ascending"), wxDefaultPosition,
+                                  wxDefaultSize, wxBORDER_NONE, wxDefaultValidator,
+                                  Label("Reverse order"));
+  direction_->Bind(wxEVT_BUTTON, [this](wxCommandEvent&) {
+    events_.sort(model_.Modes().sort, !model_.Descending());
+  });
+  direction_->Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
+    ShowDirection();
+    event.Skip();
+  });
+  ShowDirection();
+  const auto leave = [this](wxKeyEvent& event) {
+    if (event.GetKeyCode() != WXK_ESCAPE) return event.Skip();
+    events_.left();
+  };
+  order_->Bind(wxEVT_CHAR_HOOK, leave);
+  direction_->Bind(wxEVT_CHAR_HOOK, leave);
+}
+
+void BrowserBar::ChooseOrder() {
+  constexpr int kFirstId = 1;
+  wxMenu menu;
+  int id = kFirstId;
+  for (const ChoiceEntry& order : Orders()) {
+    wxMenuItem* const item = menu.AppendRadioItem(id++, Label(order.text));
+    if (order.value == model_.Modes().sort) item->Check();
+  }
+  LogEvent("order-menu", std::to_string(menu.GetMenuItemCount()));
+  const int chosen =
+      order_->GetPopupMenuSelectionFromUser(menu, 0, order_->GetSize().y) - kFirstId;
+  if (chosen >= 0) events_.sort(Orders()[static_cast<size_t>(chosen)].value, model_.Descending());
+  events_.left();
+}
+
+void BrowserBar::ShowDirection() {
+  direction_->SetBitmap(Symbol(descending_ ? "descending" : "ascending"));
+  direction_->SetToolTip(descending_ ? Label("Descending order; click for ascending")
+                                     : Label("Ascending order; click for descending"));
+}
+
 void BrowserBar::BuildSlider() {
   slider_ =
-      new wxSlider(this, wxID_ANY, 0, 0, kSliderEnd, wxDefaultPosition, FromDIP(wxSize(110, -1)),
+      new wxSlider(this, wxID_ANY, 0, 0, kSliderEnd, wxDefaultPosition, FromDIP(wxSize(100, -1)),
                    wxSL_HORIZONTAL, wxDefaultValidator, Label("Thumbnail size"));
   slider_->SetToolTip(Label("Thumbnail size (Ctrl+wheel)"));
   slider_->Bind(wxEVT_SLIDER, [this](wxCommandEvent&) {
@@ -87,7 +155,12 @@ void BrowserBar::ShowFolder(const std::string& folder) {
   path_->ShowFolder(folder);
 }
 
-void BrowserBar::ShowSide() {
+void BrowserBar::ShowView() {
+  for (const ChoiceEntry& order : Orders()) {
+    if (order.value == model_.Modes().sort) order_->SetLabel(MenuLabel(Tr(order.text)));
+  }
+  const bool before = std::exchange(descending_, model_.Descending());
+  if (before != descending_) ShowDirection();
   slider_->SetValue(SliderAtSide(SideInView(model_.Modes().view, settings.ThumbnailSide)));
 }
 

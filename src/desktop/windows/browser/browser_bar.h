@@ -6,6 +6,7 @@
 #include <functional>
 #include <string>
 
+class wxBitmapButton;
 class wxButton;
 class wxSearchCtrl;
 class wxSlider;
@@ -16,8 +17,8 @@ class BrowserModel;
 class FolderTrail;
 class PathBar;
 
-// The bar above the files of a browser: its path, the filters by tags and by name, and the size of
-// the thumbnails. Filters take effect in the model at once.
+// The bar above the files of a browser: its path, the filters by tags and by name, the order of the
+// files, and the size of the thumbnails. Filters take effect in the model at once.
 class BrowserBar : public wxPanel {
  public:
   // User actions.
@@ -25,6 +26,8 @@ class BrowserBar : public wxPanel {
     std::function<void(int steps)> step;  // back or forward in the trail
     std::function<void()> up;
     std::function<void(const std::string& folder)> open;  // an existing folder
+    // a choice::SortMode and its direction
+    std::function<void(int32_t mode, bool descending)> sort;
     std::function<void(int32_t side)> resize;             // edge of thumbnails
     std::function<void()> filtered;                       // the model has other lines
     std::function<void()> left;                           // the list gets the focus
@@ -34,8 +37,8 @@ class BrowserBar : public wxPanel {
 
   // The browser's folder has changed: updates the path and empties the filter.
   void ShowFolder(const std::string& folder);
-  // Updates the slider to the model's view.
-  void ShowSide();
+  // Updates order and size to the model's view.
+  void ShowView();
   void EditPath();    // focuses the path and selects its text
   void OfferTrail();  // shows a menu of visited folders
   void EditFilter();  // focuses the filter
@@ -43,8 +46,11 @@ class BrowserBar : public wxPanel {
  private:
   void BuildTagFilter();
   void BuildFilter();
+  void BuildOrder();
   void BuildSlider();
   void ChooseTagFilter();
+  void ChooseOrder();
+  void ShowDirection();
   void Leave();
 
   BrowserModel& model_;
@@ -52,6 +58,9 @@ class BrowserBar : public wxPanel {
   PathBar* path_ = nullptr;
   wxButton* tagFilter_ = nullptr;
   wxSearchCtrl* filter_ = nullptr;
+  wxButton* order_ = nullptr;
+  wxBitmapButton* direction_ = nullptr;
+  bool descending_ = false;  // as the direction is drawn
   wxSlider* slider_ = nullptr;
 };
 

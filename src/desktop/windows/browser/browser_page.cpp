@@ -69,6 +69,7 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
                            Open(folder);
                            FocusList();
                          },
+                         [this](int32_t mode, bool descending) { SetSort(mode, descending); },
                          [this](int32_t side) { SetSide(side); },
                          [this] {
                            ShowLines();

@@ -42,7 +42,7 @@ void BrowserPage::ShowView() {
   }
   const bool hadFocus = canvas_->HasFocus() || (details_ != nullptr && details_->HasFocus());
   views_->SetSelection(details ? kDetailsView : kThumbnailView);
-  bar_->ShowSide();
+  bar_->ShowView();
   ShowLines();
   if (details) {
     details_->ShowSelection();

@@ -49,8 +49,7 @@ UpdateBar::UpdateBar(wxWindow* parent, std::function<void(int32_t choice)> answe
       new wxStaticText(this, wxID_ANY, "", wxDefaultPosition, wxDefaultSize, wxST_ELLIPSIZE_END);
   row->Add(text_, wxSizerFlags(1).CenterVertical().Border(wxLEFT, FromDIP(8)));
   for (const Answer& answer : kAnswers) {
-    auto* button = new wxButton(this, wxID_ANY, Label(answer.label), wxDefaultPosition,
-                                wxDefaultSize, wxBU_EXACTFIT);
+    auto* button = new wxButton(this, wxID_ANY, Label(answer.label));
     button->SetToolTip(TextOfChoice(answer.value));
     button->Bind(wxEVT_BUTTON,
                  [this, value = answer.value](wxCommandEvent&) { answered_(value); });

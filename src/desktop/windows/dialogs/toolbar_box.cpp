@@ -17,12 +17,22 @@ namespace {
 
 constexpr const char* kTitle = TrLater("Toolbar");
 
-std::vector<std::string> KnownButtons() {
-  std::vector<std::string> known;
+std::vector<ToolbarButton> KnownButtons() {
+  std::vector<ToolbarButton> known;
   for (const Command& command : Commands()) {
-    if (command.symbol != nullptr) known.emplace_back(command.symbol);
+    if (command.text != nullptr)
+      known.push_back({ButtonNameOf(command), command.symbol != nullptr});
   }
+  std::ranges::stable_partition(known, &ToolbarButton::shown);
   return known;
+}
+
+// "View: Details", as the same word occurs in several menus.
+wxString LabelOf(const Command& command) {
+  wxString label = wxControl::RemoveMnemonics(Label(command.menu)) + ": " +
+                   wxControl::RemoveMnemonics(Label(command.text));
+  label.EndsWith("...", &label);
+  return label;
 }
 
 }  // namespace
@@ -36,9 +46,7 @@ bool AskForToolbar(wxWindow& parent) {
   for (const ToolbarButton& button : before) {
     const int place = static_cast<int>(labels.size());
     order.push_back(button.shown ? place : ~place);  // how wxRearrangeList marks unchecked items
-    wxString label = wxControl::RemoveMnemonics(CommandOfSymbol(button.name)->text);
-    label.EndsWith("...", &label);
-    labels.push_back(label);
+    labels.push_back(LabelOf(*CommandOfButton(button.name)));
   }
   wxRearrangeDialog dialog(&parent, Label("Toolbar buttons and their order:"), Label(kTitle), order,
                            labels);

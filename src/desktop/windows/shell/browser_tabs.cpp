@@ -9,6 +9,7 @@
 #include "desktop/models/shell/favorites.h"
 #include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/files/file_actions.h"
+#include "desktop/windows/shell/flat_tab_art.h"
 #include "desktop/windows/shell/frame_menus.h"
 #include "desktop/windows/shell/picture_windows.h"
 #include "desktop/windows/shell/shell.h"
@@ -41,8 +42,12 @@ BrowserTabs::BrowserTabs(wxWindow* parent, Shell& shell, FrameMenus& menus,
                             wxAUI_NB_TOP | wxAUI_NB_TAB_MOVE | wxAUI_NB_SCROLL_BUTTONS |
                                 wxAUI_NB_CLOSE_ON_ALL_TABS | wxAUI_NB_MIDDLE_CLICK_CLOSE |
                                 wxBORDER_NONE);
-  book_->SetArtProvider(new wxAuiGenericTabArt);
+  book_->SetArtProvider(new FlatTabArt);
   book_->Bind(wxEVT_AUINOTEBOOK_PAGE_CHANGED, &BrowserTabs::OnTabChanged, this);
+  book_->Bind(wxEVT_AUINOTEBOOK_PAGE_CLOSED, [this](wxAuiNotebookEvent& event) {
+    ShowStrip();
+    event.Skip();
+  });
   book_->Bind(wxEVT_AUINOTEBOOK_PAGE_CLOSE, [this](wxAuiNotebookEvent& event) {
     if (book_->GetPageCount() == 1) return event.Veto();
     closed_.Add(PageAt(static_cast<size_t>(event.GetSelection()))->Model().Folder());
@@ -245,9 +250,18 @@ void BrowserTabs::Keep(Session& session) {
   (void)views_.Save();
 }
 
+// One tab needs no strip.
+void BrowserTabs::ShowStrip() {
+  const int height = settings.TabbedBarEnable != 0 && book_->GetPageCount() > 1 ? -1 : 0;
+  if (height == stripHeight_) return;
+  book_->SetTabCtrlHeight(stripHeight_ = height);
+  LogEvent("tab-strip", std::to_string(height));
+}
+
 // --- BrowserHost ---
 
 void BrowserTabs::BrowserChanged() {
+  ShowStrip();
   const BrowserPage* browser = Front();
   if (browser == nullptr) return;
   const std::string& folder = browser->Model().Folder();

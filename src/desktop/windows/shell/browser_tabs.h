@@ -92,12 +92,14 @@ class BrowserTabs : private BrowserHost {
 
   BrowserPage* PageAt(size_t tab) const;
   void OnTabChanged(wxAuiNotebookEvent& event);
+  void ShowStrip();
   void LogState();
 
   Shell& shell_;
   FrameMenus& menus_;
   const std::function<void()> changed_;
   wxAuiNotebook* book_ = nullptr;
+  int stripHeight_ = -1;  // as the notebook takes it: 0 hides the tabs
   FolderViews views_;
   wxTimer viewsTimer_;  // delay before writing views
   DetailColumns columns_ = ParseDetailColumns({});

@@ -326,6 +326,8 @@ constexpr Command kCommands[] = {
     {kHelp, TrLater("&Find command..."),      "Ctrl+K",       TrLater("Finds a command by name."), Needs::Nothing, FindCommand},
     {kHelp, TrLater("&Manual"),               "F1",           TrLater("Describes the windows and their keyboard shortcuts."), Needs::Nothing, ShowManual},
     {kHelp, TrLater("&Configuration"),        "",             TrLater("Describes how settings are stored."), Needs::Nothing, ShowConfigurationHelp},
+    {kHelp, nullptr},
+    {kHelp, TrLater("&About..."),             "",             TrLater("Shows the version of the program, and its libraries with their licenses."), Needs::Nothing, ShowAbout},
 };
 // clang-format on
 
@@ -415,9 +417,13 @@ const char* WhyNot(const Command& command, Shell& shell) {
   return "";
 }
 
-const Command* CommandOfSymbol(std::string_view symbol) {
-  const auto has = [symbol](const Command& command) {
-    return command.symbol != nullptr && command.symbol == symbol;
+std::string ButtonNameOf(const Command& command) {
+  return command.symbol != nullptr ? command.symbol : NameOf(command);
+}
+
+const Command* CommandOfButton(std::string_view name) {
+  const auto has = [name](const Command& command) {
+    return command.text != nullptr && ButtonNameOf(command) == name;
   };
   const auto* const found = std::ranges::find_if(kCommands, has);
   return found == std::end(kCommands) ? nullptr : found;

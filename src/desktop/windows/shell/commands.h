@@ -37,7 +37,7 @@ struct Command {
   const char* help = "";         // a sentence for the status bar
   Needs needs = Needs::Nothing;
   void (*run)(Shell& shell) = nullptr;
-  // toolbar symbol (bitmaps.cpp), null: no button
+  // toolbar symbol (bitmaps.cpp) of a button shown by default; null: a button only if it is chosen
   const char* symbol = nullptr;
   bool inContextMenu = false;               // for files in a browser
   // whether the menu item is checked; null: not checkable
@@ -51,8 +51,10 @@ std::span<const Command> Commands();
 // The commands whose keys can be changed, and the key that one has now; empty: none.
 std::vector<KeyedCommand> KeyedCommands();
 std::string KeyOf(const Command& command);
-// Finds a command by its button's symbol; null if there is none.
-const Command* CommandOfSymbol(std::string_view symbol);
+// The stored name of a command's toolbar button: its symbol, else menu and text in English.
+std::string ButtonNameOf(const Command& command);
+// Finds a command by that name; null if there is none.
+const Command* CommandOfButton(std::string_view name);
 
 // The ID of a row's menu item and button.
 inline constexpr int kFirstCommandId = wxID_HIGHEST + 100;

@@ -3,6 +3,7 @@
 #include <wx/control.h>
 #include <wx/frame.h>
 #include <wx/menu.h>
+#include <wx/toolbar.h>
 
 #include <map>
 #include <string>
@@ -184,9 +185,10 @@ void FrameMenus::BindCommands() {
 void FrameMenus::Update(wxUpdateUIEvent& event) {
   const Command& command = CommandOfId(event.GetId());
   event.Enable(CanRun(command, shell_));
-  // A radio item is unchecked by checking another one.
+  // A radio item of a menu is unchecked by checking another one.
   const bool checked = command.checked != nullptr && command.checked(shell_);
-  if (command.checked != nullptr && (checked || !command.oneOf)) event.Check(checked);
+  const bool radio = command.oneOf && dynamic_cast<wxToolBar*>(event.GetEventObject()) == nullptr;
+  if (command.checked != nullptr && (checked || !radio)) event.Check(checked);
   if (command.needs != Needs::Undo && command.needs != Needs::Redo) return;
   const UndoList& undo = shell_.Files().Undoable();
   const std::string name = command.needs == Needs::Undo ? undo.UndoName() : undo.RedoName();

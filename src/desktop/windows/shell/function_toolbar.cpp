@@ -8,6 +8,7 @@
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/dialogs/toolbar_box.h"
 #include "desktop/windows/edit/operation_menu.h"
+#include "desktop/windows/shell/command_symbols.h"
 #include "desktop/windows/shell/commands.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/bitmaps.h"
@@ -41,10 +42,11 @@ void FunctionToolbar::Fill() {
   std::string names;
   for (const ToolbarButton& button : ToolbarButtons()) {
     if (!button.shown) continue;
-    const Command& command = *CommandOfSymbol(button.name);
+    const Command& command = *CommandOfButton(button.name);
     wxString label = wxControl::RemoveMnemonics(Label(command.text));
     label.EndsWith("...", &label);
-    bar_->AddTool(CommandId(command), label, Symbol(command.symbol, 20), Label(command.help));
+    bar_->AddTool(CommandId(command), label, Symbol(SymbolOf(command), 20), Label(command.help),
+                  command.checked == nullptr ? wxITEM_NORMAL : wxITEM_CHECK);
     names += " " + button.name;
   }
   bar_->Realize();
@@ -57,7 +59,7 @@ void FunctionToolbar::Choose() {
 
 // Buttons of families of operations have their names.
 void FunctionToolbar::ChooseOfFamily(const Command& command) {
-  if (!CanRun(command, shell_)) return;
+  if (command.symbol == nullptr || !CanRun(command, shell_)) return;
   for (const Family family : {Family::Crop, Family::Transform, Family::Effects, Family::Filter,
                               Family::Annotate, Family::Watermark, Family::Matt}) {
     if (command.symbol == FamilyName(family)) return ChooseOperation(shell_, *bar_, family);
