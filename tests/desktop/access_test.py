@@ -173,6 +173,7 @@ WINDOWS = [
     ("tools plug", None, "Plug-ins"),
     ("tools toolbar", r"prompt toolbar", "Toolbar"),
     ("help manual", r"help ", "Help: .*"),
+    ("help about", r"about libraries=", "About Fotomill Professional"),
 ]
 
 

@@ -54,8 +54,9 @@ class Desktop:
         self.size = size
         self.data = self.folder / "data"
         self.data.mkdir(exist_ok=True)
-        if settings:
-            text = "[Fotomill]\n" + "".join(line + "\n" for line in settings)
+        if settings or not any(self.data.iterdir()):
+            welcome = [] if "ShowWelcomeWizard=1" in settings else ["ShowWelcomeWizard=0"]
+            text = "[Fotomill]\n" + "".join(line + "\n" for line in [*welcome, *settings])
             (self.data / "Fotomill Professional 11.ini").write_text(text)
         self.log = self.folder / "log"
         self.seen = 0

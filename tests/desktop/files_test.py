@@ -293,5 +293,28 @@ def search_results_in_a_tab(folder):
         assert (pictures / "sea1.bmp").exists()
 
 
+def delete_for_good(folder):
+    """The question shows thumbnails; Enter and Escape keep the files."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, [f"{i}.bmp" for i in range(7)])
+    settings = ["UpdateThumbnailsFlag=0", "DeleteShowPreview=1"]
+    with Desktop(folder, pictures, settings=settings) as desktop:
+        desktop.wait(r"lines=7 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        for answer in ("Escape", "Return", "alt+d"):
+            desktop.key("ctrl+a", "shift+Delete")
+            desktop.wait(r"prompt delete")
+            desktop.wait(r"delete-previews 5")
+            desktop.focus("^Delete$")
+            if answer == "Return":
+                desktop.screenshot("delete")
+            assert len(names(pictures)) == 7
+            desktop.key(answer)
+            if answer == "alt+d":
+                desktop.wait(r"lines=0 .*listing=0")
+            desktop.focus("Fotomill Professional")
+        assert names(pictures) == []
+
+
 run(search_results_in_a_tab, rename_delete_undo_paste, names_that_are_not_utf8,
-    rename_in_sequence, thumbnails_and_session, turn_and_take_back)
+    rename_in_sequence, thumbnails_and_session, turn_and_take_back, delete_for_good)

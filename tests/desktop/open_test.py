@@ -132,4 +132,53 @@ def loading_is_told(folder):
             assert told == (wanted == "1"), desktop.log_text()
 
 
-run(media_and_recent_files, many_programs_at_once, override_that_appears, loading_is_told)
+def welcome_once(folder):
+    """The welcome comes at the first start without a file, and only once, even if skipped."""
+    ini = folder / "data/Fotomill Professional 11.ini"
+    program = Desktop(folder)
+    ini.unlink()
+    with program as desktop:
+        desktop.wait(r"prompt welcome")
+        desktop.focus("^Welcome$")
+        desktop.screenshot("welcome")
+        desktop.key("Escape")
+        desktop.wait(r"welcome skipped")
+        desktop.wait(r"browser tabs=1 .*listing=0")
+        assert "ShowWelcomeWizard=0" in ini.read_text()
+        assert "UpdateThumbnailsFlag=0" not in ini.read_text()
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+q")
+        desktop.wait_end()
+        desktop.start()
+        desktop.wait(r"browser tabs=1 .*listing=0")
+        assert "prompt welcome" not in desktop.log_text()
+
+
+def welcome_answered(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp"])
+    with Desktop(folder, settings=["ShowWelcomeWizard=1"]) as desktop:
+        desktop.wait(r"prompt welcome")
+        desktop.focus("^Welcome$")
+        desktop.key("ctrl+a")
+        desktop.type(str(folder / "none"))
+        desktop.key("Return")  # this folder does not exist
+        desktop.key("ctrl+a")
+        desktop.type(str(pictures))
+        desktop.key("Escape")  # closes the list of folders
+        desktop.key("Tab", "Tab", "Down", "Down", "Tab", "End")
+        desktop.screenshot("welcome-answered")
+        desktop.key("alt+s")
+        desktop.wait(r"welcome answered")
+        desktop.wait(r"browser tabs=1 lines=1 .*folder=.*pictures$")
+        text = (desktop.data / "Fotomill Professional 11.ini").read_text()
+        for line in ("DefaultThumbnailMode=1", "UpdateThumbnailsFlag=0", "Language=de"):
+            assert line in text, text
+        assert str(pictures) in (desktop.data / "FMWFavourites.txt").read_text()
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+k")
+        desktop.wait(r"active Befehl suchen")
+
+
+run(media_and_recent_files, many_programs_at_once, override_that_appears, loading_is_told,
+    welcome_once, welcome_answered)

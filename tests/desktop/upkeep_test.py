@@ -4,8 +4,9 @@ file history, the answers to its offers."""
 import os
 import struct
 import subprocess
+import time
 
-from driven_desktop import PROJECT, Desktop, make_pictures, run
+from driven_desktop import PATIENCE, PROJECT, Desktop, make_pictures, run
 
 RECORD, HEADER = 28442, 60
 GLOBAL = "DefaultThumbnailMode=2"
@@ -210,5 +211,26 @@ def folders_without_pictures(folder):
         assert (pictures / "new.THN").exists(), "30 days are not over"
 
 
+def thumbnails_beyond_the_window(folder):
+    """Those of other files are made when the list has been at rest for the time of the setting."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, [f"{i:03}.bmp" for i in range(150)])
+    database = folder / "data/Fotomill.tdb"
+    kept = lambda: len(records(database)) if database.exists() else 0
+    settings = ["UpdateThumbnailsFlag=0", "BrowserThumbnailPrecacheDelay=60000"]
+    with Desktop(folder, pictures, settings=settings) as desktop:
+        desktop.wait(r"lines=150 .*missing=0 listing=0")
+        quit_program(desktop)
+        assert 0 < kept() < 150, kept()
+    ini = folder / "data/Fotomill Professional 11.ini"
+    ini.write_text(ini.read_text().replace("Delay=60000", "Delay=0"))
+    with Desktop(folder, pictures) as desktop:
+        end = time.monotonic() + PATIENCE
+        while kept() < 150 and time.monotonic() < end:
+            time.sleep(0.05)
+        assert kept() == 150, kept()
+
+
 run(records_and_history_follow_files, exif_window_is_recorded, history_switched_off,
-    thumbnail_files_follow, asked_once, never_again, folders_without_pictures)
+    thumbnail_files_follow, asked_once, never_again, folders_without_pictures,
+    thumbnails_beyond_the_window)

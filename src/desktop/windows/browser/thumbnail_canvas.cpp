@@ -77,6 +77,10 @@ ThumbnailCanvas::ThumbnailCanvas(wxWindow* parent, BrowserModel& model,
     const int beyond = mouse.y < 0 ? mouse.y : std::max(mouse.y - GetClientSize().y, 0);
     if (banding_ && beyond != 0) ScrollTo(scroll_ + beyond);
   });
+  restTimer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
+    resting_ = true;
+    WantThumbnails();
+  });
   aheadTimer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) { CutNamesAhead(); });
   MeasureCells();
 }
@@ -85,7 +89,8 @@ bool ThumbnailCanvas::ListsNames() const { return model_.Modes().view == choice:
 
 void ThumbnailCanvas::MeasureCells() {
   SetFont(wxSystemSettings::GetFont(wxSYS_DEFAULT_GUI_FONT));
-  SetFont(FontOf(*this, TextSize::ThumbnailName));
+  const bool large = model_.Modes().view == choice::kViewLarge;
+  SetFont(FontOf(*this, large ? TextSize::LargeThumbnailName : TextSize::ThumbnailName));
   textHeight_ = GetCharHeight();
   const int padding = FromDIP(kPadding);
   if (ListsNames()) {
@@ -109,9 +114,17 @@ void ThumbnailCanvas::ModelChanged() {
   MeasureCells();
   scroll_ = std::clamp<int64_t>(scroll_, 0, layout_.LargestScroll());
   UpdateScrollbar();
+  WaitForRest();
   WantThumbnails();
   ReportFocus();
   Refresh();
+}
+
+// Thumbnails that nobody has asked for wait until nothing has moved for a while.
+void ThumbnailCanvas::WaitForRest() {
+  const int delay = std::max(settings.BrowserThumbnailPrecacheDelay, 0);
+  resting_ = delay == 0;
+  if (!resting_) restTimer_.StartOnce(delay);
 }
 
 void ThumbnailCanvas::UpdateScrollbar() {
@@ -125,7 +138,7 @@ ThumbnailRequest ThumbnailCanvas::RequestOf(size_t line) const {
 }
 
 // Requests stand-ins for visible files, then their thumbnails, then one screen ahead in scroll
-// direction, then the rest from there on if precaching is enabled.
+// direction, then the rest from there on if precaching is enabled, once the list is at rest.
 void ThumbnailCanvas::WantThumbnails() {
   std::vector<ThumbnailRequest> requests;
   const auto want = [&](size_t first, size_t end) {
@@ -146,7 +159,7 @@ void ThumbnailCanvas::WantThumbnails() {
     const CellLayout::Range next = layout_.LinesBetween(top, top + height);
     if (direction_ > 0) want(std::max(next.first, visible.end), next.end);
     if (direction_ < 0) want(next.first, std::min(next.end, visible.first));
-    if (settings.BrowserThumbnailPrecacheEnable != 0) {
+    if (settings.BrowserThumbnailPrecacheEnable != 0 && resting_) {
       const size_t end = std::min(model_.LineCount(), visible.end + ahead);
       for (size_t line = visible.end; line < end && requests.size() < kPrecache; ++line)
         want(line, line + 1);
@@ -245,6 +258,7 @@ void ThumbnailCanvas::ScrollTo(int64_t scroll) {
   direction_ = scroll > scroll_ ? 1 : -1;
   scroll_ = scroll;
   UpdateScrollbar();
+  WaitForRest();
   WantThumbnails();
   Refresh();
 }

@@ -98,6 +98,7 @@ class ThumbnailCanvas : public wxWindow {
   ThumbnailRequest RequestOf(size_t line) const;
   void WantFolders(const CellLayout::Range& lines, std::vector<ThumbnailRequest>& requests);
   std::vector<ThumbnailRequest> StandInsFor(const CellLayout::Range& lines) const;
+  void WaitForRest();
   size_t RoomAhead(const CellLayout::Range& visible);
   void ShowRestored();
   void DropBitmaps();
@@ -139,6 +140,8 @@ class ThumbnailCanvas : public wxWindow {
   };
   std::deque<DrawnPlaceholder> placeholders_;
   std::unordered_map<std::string, CutText> cutNames_;
+  bool resting_ = false;  // nothing has moved for a while
+  wxTimer restTimer_;     // until then
   wxTimer aheadTimer_;  // until the next names are cut
   int cutWidth_ = 0;
 

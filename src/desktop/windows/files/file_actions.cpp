@@ -20,6 +20,7 @@
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/dialogs/folder_dialog.h"
+#include "desktop/windows/files/delete_dialog.h"
 #include "desktop/windows/files/file_list_data.h"
 #include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/shell/browser_tabs.h"
@@ -243,12 +244,8 @@ void FileActions::Delete(const std::vector<std::string>& paths, const Asker& ask
                                           : Shown(Count(paths.size()));
   const wxString why =
       noTrash ? Label("There is no trash for files of this folder.") + "\n" : wxString();
-  wxMessageDialog dialog(ParentOf(asker),
-                         why + Label("Delete %1 permanently? This cannot be undone.", what),
-                         Label("Delete"), wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_WARNING);
-  dialog.SetOKLabel(Label("&Delete"));
-  LogEvent("prompt", "delete");
-  if (dialog.ShowModal() != wxID_OK) return;
+  const wxString question = why + Label("Delete %1 permanently? This cannot be undone.", what);
+  if (!AskToDelete(*ParentOf(asker), question, paths, shell_.Thumbnails())) return;
   Run(
       Tr("Permanent deletion"),
       [paths, options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {

@@ -49,7 +49,8 @@ bool FolderDrop::Drop(const std::string& folder, std::vector<std::string> files)
   if (folder.empty() || files.empty()) return false;
   // Ignore files already in the folder.
   if (platform::SplitPath(files.front()).folder == platform::JoinFolder(folder, "")) return false;
-  const DropKind kind = KindNow();
+  const bool asks = KindNow() == DropKind::Move && settings.PromptBeforeMoving != 0;
+  const DropKind kind = asks ? DropKind::Ask : KindNow();
   // Wait for the end of the drag before asking or doing anything.
   wxTheApp->CallAfter([dropped = dropped_, files = std::move(files), folder, kind] {
     const int move = kind == DropKind::Ask ? AskKind(folder) : kind == DropKind::Move ? 1 : 0;

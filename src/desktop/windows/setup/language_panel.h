@@ -14,13 +14,13 @@ class LanguagePanel : public wxPanel {
  public:
   explicit LanguagePanel(wxWindow* parent);
 
+  // The code of the chosen language; empty: the system's.
+  std::string Chosen() const;
   // Stores the choice. On the first change,
   // a message says when it takes effect.
   void Store();
 
  private:
-  std::string Chosen() const;
-
   wxChoice* choice_ = nullptr;
   std::vector<std::string> codes_;  // per line; empty: system language
 };

@@ -17,11 +17,13 @@
 #include "desktop/models/shell/event_log.h"
 #include "desktop/models/shell/start_argument.h"
 #include "desktop/models/view/view_picture.h"
+#include "desktop/windows/dialogs/welcome_box.h"
 #include "desktop/windows/setup/override_box.h"
 #include "desktop/windows/shell/frame_session.h"
 #include "desktop/windows/shell/main_frame.h"
 #include "desktop/windows/shell/startup_window.h"
 #include "desktop/windows/view/screen_profile.h"
+#include "desktop/windows/widgets/app_icon.h"
 #include "desktop/windows/widgets/control_names.h"
 #include "desktop/windows/widgets/text_sizes.h"
 #include "desktop/windows/widgets/wx_text.h"
@@ -38,6 +40,7 @@
 #include "settings/format_switches.h"
 #include "settings/plugin_settings.h"
 #include "settings/previous_version.h"
+#include "settings/settings.h"
 
 namespace fotomill::desktop {
 
@@ -96,6 +99,9 @@ class App : public wxApp {
     (void)LoadConfiguration();
     TakeFormatSwitches();
     NameControlsAsTheyCome();
+    GiveIconsToWindows();
+    SetTextSizes(ReadEarlySettings());
+    Welcome();
     InstallOverrideBoxes();
     RunFormatStartup();
     formatsStarted_ = true;
@@ -106,7 +112,6 @@ class App : public wxApp {
     LogEvent("screen-profile", std::to_string(screen.size()));
     SetScreenProfile(std::move(screen));
     const EarlySettings early = ReadEarlySettings();
-    SetTextSizes(early);
     ShowStartupWindow(early);
     frame_ = new MainFrame;
     frame_->Session().RestorePlace();
@@ -148,6 +153,17 @@ class App : public wxApp {
     wxTranslations::Set(translations);
     translations->SetLanguage(wxString::FromUTF8(TextLanguage()));
     translations->AddStdCatalog();
+  }
+
+  // At the first start, or if Setup asks for it; not when a file or folder is to be shown, and not
+  // if nothing can be stored, as it would come each time. Texts follow a new language at once.
+  void Welcome() {
+    const bool first = StateOfConfiguration() == ConfigurationState::Missing;
+    if (!argument_.empty() || (!first && settings.ShowWelcomeWizard == 0)) return;
+    if (StoreSetting(KeyOf(KeyNumber::ShowWelcomeWizard), {}) != SaveResult::Done) return;
+    argument_ = ShowWelcome();
+    (void)SaveConfiguration();
+    StartTranslations();
   }
 
   // Shown in the status bar; failures in a message.

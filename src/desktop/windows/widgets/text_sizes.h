@@ -15,6 +15,7 @@ enum class TextSize {
   Normal,         // NormalTextFontSize: lists and reports
   Small,          // SmallTextFontSize: notes
   ThumbnailName,  // NormalThumbFontSize: names below thumbnails
+  LargeThumbnailName,  // LargeThumbFontSize: names below large ones
 };
 
 // Sets the sizes, once at startup. The default value of a key means the system's size, other values
