@@ -211,6 +211,9 @@ TEST_F(FileOperationTest, FaultsWhileTimesAreSetLoseNone) {
       EXPECT_EQ(UndoTimes(logged->front(), false).status, Status::Ok);
       EXPECT_EQ(time(), old);
     }
+    if (change.status != Status::Ok) {
+      EXPECT_TRUE(logged && logged->empty());
+    }
     EXPECT_TRUE(platform::SetFileTimes(From("a.png"), {}, old));
     EXPECT_TRUE(WriteTimesLog({}));
     platform::faultCountdown = left;

@@ -103,6 +103,7 @@ TEST(GifMetadata, StripKeepsThePicture) {
             (std::vector<std::string>{"color profile", "other data", "XMP", "comments"}));
   EXPECT_EQ(Stripped(file, 0), made({}, {}));
   EXPECT_TRUE(Left(made({}, {})).empty());
+  EXPECT_EQ(Left(Joined({made({}, {}), Text("behind")})), std::vector<std::string>{"other data"});
   EXPECT_EQ(Stripped(file, kKeepUsually), made(profile, {}));
   EXPECT_EQ(Stripped(file, kKeepComments), made({}, comment));
   EXPECT_EQ(Stripped(file, kKeepXmp), made(GifXmp("<one/>"), {}));
