@@ -157,4 +157,9 @@ FileTimeRule FileTimeRuleFromSettings() {
 
 bool WritesCommentsFromSettings() { return settings.WriteFileComments != 0; }
 
+std::string CommentExtensionBesideFromSettings() {
+  const bool beside = settings.FileCommentPath.view().empty();
+  return std::string(beside ? settings.TextCommentExtension.view() : std::string_view());
+}
+
 }  // namespace fotomill

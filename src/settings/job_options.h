@@ -1,5 +1,7 @@
 #pragma once
 
+#include <string>
+
 #include "core/choice_lists.h"
 
 namespace fotomill {
@@ -51,5 +53,8 @@ TagSources TagSourcesFromSettings();
 FileTimeRule FileTimeRuleFromSettings();
 // WriteFileComments.
 bool WritesCommentsFromSettings();
+// TextCommentExtension; empty if FileCommentPath is set, as comment files in a folder of their own
+// may belong to pictures of other folders, and stay there when a picture moves.
+std::string CommentExtensionBesideFromSettings();
 
 }  // namespace fotomill

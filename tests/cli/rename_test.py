@@ -80,6 +80,16 @@ OF_NEF = """<x:xmpmeta xmlns:x="adobe:ns:meta/">
 SIDECARS = [
     ("goes along", {"a.bmp": "a", "a.bmp.xmp": "A"}, ["a.bmp", "--pattern", "b"],
      {"b.bmp": "a", "b.bmp.xmp": "A"}),
+    ("comment", {"a.bmp": "a", "a.bmp.txt": "A"}, ["a.bmp", "--pattern", "b"],
+     {"b.bmp": "a", "b.bmp.txt": "A"}),
+    ("comment, listed too", {"a.bmp": "a", "a.bmp.txt": "A"},
+     ["a.bmp", "a.bmp.txt", "--base", "b", "--digits", "1"], {"b1.bmp": "a", "b1.bmp.txt": "A"}),
+    ("text of another kind", {"a.bmp": "a", "a.bmp.txt": "A"},
+     ["a.bmp", "--pattern", "b", "--set", "TextCommentExtension=cmt"],
+     {"b.bmp": "a", "a.bmp.txt": "A"}),
+    ("comments elsewhere", {"a.bmp": "a", "a.bmp.txt": "A"},
+     ["a.bmp", "--pattern", "b", "--set", "FileCommentPath=notes"],
+     {"b.bmp": "a", "a.bmp.txt": "A"}),
     ("in sequence", {"a.bmp": "a", "a.xmp": "A"}, ["a.bmp", "--base", "b", "--digits", "1"],
      {"b1.bmp": "a", "b1.xmp": "A"}),
     ("both kinds", {"a.nef": "a", "a.xmp": "A", "a.nef.xmp": "B"}, ["a.nef", "--pattern", "b"],
@@ -120,6 +130,9 @@ def sidecars():
             check(contents(place), files, f"{what}: dry run")
             status, out, err = place.run("rename", *listed)
             check((status, out, contents(place)), (0, dry, after), f"{what}: names {err}")
+            (place.path / "empty").mkdir()
+            place.run("rename", "--undo", "empty")
+            check(contents(place), after, f"{what}: undo of nothing")
             check(place.run("rename", "--undo")[0], 0, f"{what}: undo")
             check(contents(place), files, f"{what}: names again")
     files = {"a.bmp": "a", "a.bmp.xmp": "A", "b.bmp.xmp": "B", "c2.bmp.xmp": "C"}

@@ -42,6 +42,8 @@ def undo():
         place.run("touch", *names, "--at", "2024-05-31", "--set", "FileTimeUpdateAccess=1")
         dry = place.run("touch", "--undo", "--dry-run")
         check(5 in times(), False, "a dry run")
+        (place.path / "empty").mkdir()
+        check((place.run("touch", "--undo", "empty")[0], 5 in times()), (0, False), "no files")
         status, out, _ = place.run("touch", "--undo", "b.bmp")
         line = f"b.bmp: 2024-05-31 00:00:00 -> {text(LONG_AGO)}\n"
         check((status, out[-len(line):], times()[1]), (0, line, 5), "one file")

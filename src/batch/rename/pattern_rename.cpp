@@ -62,7 +62,7 @@ class PatternRename {
     if (Stopped()) return;
     RefuseDuplicates();
     RenameLog log;
-    RenamedFiles renamed(options_.dryRun, &log);
+    RenamedFiles renamed(options_.dryRun, &log, options_.commentExtension);
     CarryOut(renamed);
     for (size_t i = 0; i < candidates_.size(); ++i) {
       if (!candidates_[i].outcome.source.empty())
@@ -77,7 +77,7 @@ class PatternRename {
 
   void TakeSources() {
     std::set<std::string> seen;
-    const std::set<std::string> sidecars = SidecarsOfListed(files_);
+    const std::set<std::string> sidecars = SidecarsOfListed(files_, options_.commentExtension);
     for (size_t i = 0; i < files_.size(); ++i) {
       Candidate& candidate = candidates_[i];
       candidate.from = platform::AbsolutePath(files_[i].name);

@@ -16,6 +16,7 @@ struct PatternRenameOptions {
   std::string pattern;
   int64_t start = 1, increment = 1;  // of the counter
   std::string copyrightHolder = {};  // for %N; empty: use the user's full name
+  std::string commentExtension = {};  // of comment files that go along; empty: none
   bool dryRun = false;
 };
 

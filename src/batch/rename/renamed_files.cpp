@@ -70,7 +70,7 @@ bool RenamedFiles::Exists(const std::string& path) const {
 }
 
 platform::CommitResult RenamedFiles::Rename(const std::string& from, const std::string& to) {
-  const std::vector<RenamedFile> sidecars = SidecarMoves(from, to);
+  const std::vector<RenamedFile> sidecars = SidecarMoves(from, to, commentExtension_);
   for (const RenamedFile& sidecar : sidecars) {
     // nor is a sidecar given to another picture
     const bool same = EqualIgnoringCase(sidecar.from, sidecar.to);  // maybe, for the system
@@ -137,10 +137,14 @@ bool RenamedFiles::WentAlong(const std::string& path) const {
   return sidecars_.contains(path) && !Exists(path);
 }
 
-std::set<std::string> SidecarsOfListed(std::span<const BatchFile> files) {
+std::set<std::string> SidecarsOfListed(std::span<const BatchFile> files,
+                                       const std::string& commentExtension) {
   std::set<std::string> sidecars;
-  for (const BatchFile& file : files)
-    sidecars.insert(SidecarNames(platform::AbsolutePath(file.name)).front());
+  for (const BatchFile& file : files) {
+    const std::string path = platform::AbsolutePath(file.name);
+    sidecars.insert(SidecarNames(path).front());
+    if (!commentExtension.empty()) sidecars.insert(CommentFileName(path, {}, commentExtension));
+  }
   return sidecars;
 }
 

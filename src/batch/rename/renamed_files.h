@@ -3,6 +3,7 @@
 #include <set>
 #include <span>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "batch/batch_file.h"
@@ -17,11 +18,13 @@ namespace fotomill {
 class RenamedFiles {
  public:
   // Renames are recorded in `log`, if not null, before they are done.
-  explicit RenamedFiles(bool dryRun, RenameLog* log = nullptr) : dryRun_(dryRun), log_(log) {}
+  // `commentExtension`: of the text files with comments beside pictures; empty: there are none.
+  explicit RenamedFiles(bool dryRun, RenameLog* log = nullptr, std::string commentExtension = {})
+      : dryRun_(dryRun), log_(log), commentExtension_(std::move(commentExtension)) {}
   // Whether a path exists, or would exist by now in a dry run.
   bool Exists(const std::string& path) const;
   // Renames without replacing: returns Taken if the new name exists. A dry run only records it. The
-  // sidecars of a picture go along, or nothing is renamed.
+  // sidecars and the comment file of a picture go along, or nothing is renamed.
   platform::CommitResult Rename(const std::string& from, const std::string& to);
   // After a failure: the new name that was not available, of the file or of a sidecar.
   const std::string& RefusedName() const { return refused_; }
@@ -40,6 +43,7 @@ class RenamedFiles {
 
   const bool dryRun_;
   RenameLog* const log_;
+  const std::string commentExtension_;
   bool noted_ = true;
   std::string refused_;
   std::set<std::string> gone_, there_, sidecars_;
@@ -48,9 +52,10 @@ class RenamedFiles {
 // The remark about a file that was renamed but cannot be undone.
 inline constexpr const char* kRenameNotNoted = TrLater("It could not be recorded for --undo.");
 
-// The names "photo.nef.xmp" for all files of a list, as absolute paths. Such a file in the same
-// list is renamed with its picture only.
-std::set<std::string> SidecarsOfListed(std::span<const BatchFile> files);
+// The names "photo.nef.xmp" and "photo.nef.txt", of comment files, for all files of a list, as
+// absolute paths. Such a file in the same list is renamed with its picture only.
+std::set<std::string> SidecarsOfListed(std::span<const BatchFile> files,
+                                       const std::string& commentExtension);
 
 // The remark about such a file.
 inline constexpr const char* kRenamedWithPicture =

@@ -153,9 +153,9 @@ void RunRename(std::span<const BatchFile> files, const RenameOptions& options, B
     order = RandomOrder(files.size(), options.seed ? *options.seed : std::random_device()());
   const bool remembers = rules.update && !options.dryRun && job.remember;
   RenameLog log(remembers ? std::optional(rules.number) : std::nullopt);
-  RenamedFiles renamed(options.dryRun, &log);
+  RenamedFiles renamed(options.dryRun, &log, options.commentExtension);
   NextNumber next(job, remembers);
-  const std::set<std::string> sidecars = SidecarsOfListed(files);
+  const std::set<std::string> sidecars = SidecarsOfListed(files, options.commentExtension);
   const StopToken stop = job.stop.Token();
   uint32_t done = 0;
   for (const size_t place : order) {

@@ -45,6 +45,7 @@ std::vector<size_t> RandomOrder(size_t count, uint64_t seed);
 struct RenameOptions {
   SequentialRenameRules rules = {};
   std::optional<uint64_t> seed = {};  // for random order; none: different each time
+  std::string commentExtension = {};  // of comment files that go along; empty: none
   bool dryRun = false;
 };
 

@@ -55,7 +55,8 @@ std::set<std::string> Restore(const std::vector<RenamedFile>& wanted, RenamedFil
 
 }  // namespace
 
-bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
+bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job,
+                const std::string& commentExtension) {
   RenameLog lock;
   if (!dryRun && !lock.LockForUndo()) return false;
   const auto log = ReadRenameLog();
@@ -63,7 +64,7 @@ bool UndoRename(const std::set<std::string>& only, bool dryRun, BatchJob& job) {
   RenameHistory remaining{.files = RenamesToUndo(log->files, platform::FileExists),
                           .number = log->number};
   if (!OpenProgressBox(job)) return true;
-  RenamedFiles files(dryRun, dryRun ? nullptr : &lock);
+  RenamedFiles files(dryRun, dryRun ? nullptr : &lock, commentExtension);
   const std::set<std::string> restored = Restore(Wanted(remaining.files, only), files, job);
   std::erase_if(remaining.files,
                 [&](const RenamedFile& file) { return restored.contains(file.to); });

@@ -16,6 +16,7 @@
 #include "core/plain_name.h"
 #include "platform/folders.h"
 #include "settings/configuration.h"
+#include "settings/job_options.h"
 #include "settings/key_table.h"
 #include "settings/settings.h"
 #include "texts/system_reason.h"
@@ -42,7 +43,8 @@ int RunUndo(const RenameCommandOptions& options, const std::vector<SelectedFile>
             ResultOutput& output, BatchJob& job) {
   std::set<std::string> only;
   for (const SelectedFile& file : files) only.insert(platform::AbsolutePath(file.name));
-  if (UndoRename(only, options.dryRun, job)) return kExitOk;
+  if (UndoRename(only, options.dryRun, job, CommentExtensionBesideFromSettings()))
+    return kExitOk;
   output.Message(
       std::string("fotomill: ") +
       WithReason(Tr("The record of the last renaming, in the data folder, cannot be read.")));
@@ -72,6 +74,7 @@ PatternRenameOptions PatternOf(const RenameCommandOptions& options) {
           .start = std::max(options.start, options.start < 0 ? 1 : 0),
           .increment = std::max(options.increment, 1),
           .copyrightHolder = std::string(settings.ExifCopyrightHolder),
+          .commentExtension = CommentExtensionBesideFromSettings(),
           .dryRun = options.dryRun};
 }
 
@@ -88,7 +91,8 @@ int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& 
   }
   const SelectionOptions& selection = options.selection;
   Selection chosen;
-  if (!options.undo || !context.names.values.empty() || !selection.filesFrom.empty()) {
+  const bool named = !context.names.values.empty() || !selection.filesFrom.empty();
+  if (!options.undo || named) {
     auto selected = SelectFiles(selection, context);
     if (!selected) return kExitUsage;
     chosen = std::move(*selected);
@@ -100,11 +104,14 @@ int RunRenameCommand(const RenameCommandOptions& options, const CommandContext& 
   job.box = &box;
   int status = kExitOk;
   if (options.undo) {
-    status = RunUndo(options, chosen.files, output, job);
+    // without names, all files
+    if (!named || !chosen.files.empty()) status = RunUndo(options, chosen.files, output, job);
   } else if (!options.pattern.empty()) {
     RunPatternRename(chosen.files, PatternOf(options), job);
   } else {
-    RenameOptions rename{.rules = RulesOf(options), .dryRun = options.dryRun};
+    RenameOptions rename{.rules = RulesOf(options),
+                         .commentExtension = CommentExtensionBesideFromSettings(),
+                         .dryRun = options.dryRun};
     if (options.seed >= 0) rename.seed = static_cast<uint64_t>(options.seed);
     RunRename(chosen.files, rename, job);
   }

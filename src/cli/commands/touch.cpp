@@ -4,7 +4,6 @@
 #include <memory>
 #include <set>
 #include <string>
-#include <utility>
 #include <vector>
 
 #include "cli/frame/options.h"
@@ -79,14 +78,13 @@ void Report(ResultOutput& output, const std::string& name, const FileTimeChange&
 // Gives the files of the last run their old times, the last one first; with a selection only those
 // in it. What cannot be undone stays in the log.
 int RunUndo(const TouchOptions& options, const CommandContext& context) {
-  Selection chosen;
-  if (!context.names.values.empty() || !options.selection.filesFrom.empty()) {
-    auto selected = SelectFiles(options.selection, context);
-    if (!selected) return kExitUsage;
-    chosen = std::move(*selected);
-  }
+  const bool all = context.names.values.empty() && options.selection.filesFrom.empty();
   std::set<std::string> only;
-  for (const SelectedFile& file : chosen.files) only.insert(platform::AbsolutePath(file.name));
+  if (!all) {
+    const auto chosen = SelectFiles(options.selection, context);
+    if (!chosen) return kExitUsage;
+    for (const SelectedFile& file : chosen->files) only.insert(platform::AbsolutePath(file.name));
+  }
   ResultOutput output(context, options.json);
   output.KeepGoing();
   TimesLog lock;
@@ -98,7 +96,7 @@ int RunUndo(const TouchOptions& options, const CommandContext& context) {
     return std::max(output.Finish(), static_cast<int>(kExitFailed));
   }
   const auto wanted = [&](const ChangedTimes& file) {
-    return only.empty() || only.contains(file.path);
+    return all || only.contains(file.path);
   };
   output.Expect(static_cast<size_t>(std::ranges::count_if(*log, wanted)));
   std::vector<ChangedTimes> left;
@@ -110,8 +108,9 @@ int RunUndo(const TouchOptions& options, const CommandContext& context) {
       Report(output, file.path, change);
       undone = change.status == Status::Ok;
     }
-    if (!undone) left.insert(left.begin(), file);
+    if (!undone) left.push_back(file);
   }
+  std::ranges::reverse(left);
   if (!options.dryRun && !WriteTimesLog(left)) output.Message(WithReason(Tr(kNotLogged)));
   return output.Finish();
 }

@@ -3,18 +3,17 @@
 #include <algorithm>
 
 #include "batch/new_job.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 
 namespace fotomill::desktop {
 
 FileOperationOptions FileOperationOptionsFromSettings() {
-  // those in a folder of their own may belong to pictures of other folders
-  const bool beside = settings.FileCommentPath.view().empty();
   return {
       .firstVariant = settings.NumberedVariantMin,
       .lastVariant = settings.NumberedVariantMax,
       .duplicatePrefix = std::string(NewBatchJob().naming.PrefixOf(PrefixedFunction::Duplicate)),
-      .commentExtension = std::string(beside ? settings.TextCommentExtension.view() : "")};
+      .commentExtension = CommentExtensionBesideFromSettings()};
 }
 
 size_t UndoLimitFromSettings() {

@@ -31,6 +31,7 @@
 #include "platform/paths.h"
 #include "settings/configuration.h"
 #include "settings/history_list.h"
+#include "settings/job_options.h"
 #include "settings/settings.h"
 #include "texts/texts.h"
 
@@ -191,7 +192,8 @@ PatternRenameOptions SequentialRenameDialog::ReadPattern() const {
   return {.pattern = Utf8(pattern_->GetValue()),
           .start = number_->GetValue(),
           .increment = increment_->GetValue(),
-          .copyrightHolder = std::string(settings.ExifCopyrightHolder)};
+          .copyrightHolder = std::string(settings.ExifCopyrightHolder),
+          .commentExtension = CommentExtensionBesideFromSettings()};
 }
 
 // Rules that are not in the dialog come from the settings.
@@ -255,7 +257,12 @@ void SequentialRenameDialog::UpdateControls() {
     OutcomeBox box;
     BatchJob job;
     job.box = &box;
-    RunRename(files, {.rules = ReadControls(), .seed = 1, .dryRun = true}, job);
+    RunRename(files,
+              {.rules = ReadControls(),
+               .seed = 1,
+               .commentExtension = CommentExtensionBesideFromSettings(),
+               .dryRun = true},
+              job);
     return ShowPreview(box.outcomes);
   }
   PatternRenameOptions options = ReadPattern();
@@ -299,7 +306,7 @@ std::optional<RenameChoice> SequentialRenameDialog::Ask() {
 
 // Adds the renames of the last run to the frame's undo list. Tabs with found files follow them.
 void NoteRenames(Shell& shell) {
-  FileOperation operation{FileOperationKind::Rename, {}};
+  FileOperation operation{FileOperationKind::Rename, {}, CommentExtensionBesideFromSettings()};
   const bool follows = shell.Tabs().FoundPage() != nullptr;
   for (const RenamedFile& file : ReadRenameLog().value_or(RenameHistory()).files) {
     operation.steps.push_back({file.from, file.to});
@@ -318,11 +325,15 @@ void RenameSelectionSequentially(Shell& shell) {
   const std::optional<RenameChoice> choice = dialog.Ask();
   if (!choice) return;
   shell.Batches().Run(NewBatchJob(),
-                      [batch = BatchFiles(files, files.size()), choice, &shell](BatchJob& running) {
+                      [batch = BatchFiles(files, files.size()), choice,
+                       comments = CommentExtensionBesideFromSettings(),
+                       &shell](BatchJob& running) {
                         if (choice->pattern) {
                           RunPatternRename(batch, *choice->pattern, running);
                         } else {
-                          RunRename(batch, {.rules = choice->rules}, running);
+                          RunRename(batch,
+                                    {.rules = choice->rules, .commentExtension = comments},
+                                    running);
                         }
                         shell.Window().CallAfter([&shell] { NoteRenames(shell); });
                         return Status::Ok;
