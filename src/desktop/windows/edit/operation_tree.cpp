@@ -41,8 +41,11 @@ OperationTree::OperationTree(wxWindow* parent, const Operation* chosen,
     if (operation == chosen) {
       Expand(family);
       SelectItem(item);
-      EnsureVisible(family);
-      EnsureVisible(item);
+      // The size is not known yet.
+      CallAfter([this, family, item] {
+        EnsureVisible(family);
+        EnsureVisible(item);
+      });
     }
   }
   Bind(wxEVT_TREE_ITEM_ACTIVATED,

@@ -3,6 +3,7 @@
 #include <wx/frame.h>
 #include <wx/toolbar.h>
 
+#include <optional>
 #include <string>
 
 #include "desktop/models/shell/event_log.h"
@@ -15,6 +16,20 @@
 #include "desktop/windows/widgets/wx_text.h"
 
 namespace fotomill::desktop {
+
+namespace {
+
+// Buttons of families of operations have their names.
+std::optional<Family> FamilyOf(const Command& command) {
+  if (command.symbol == nullptr) return std::nullopt;
+  for (const Family family : {Family::Crop, Family::Transform, Family::Effects, Family::Filter,
+                              Family::Annotate, Family::Watermark, Family::Matt}) {
+    if (command.symbol == FamilyName(family)) return family;
+  }
+  return std::nullopt;
+}
+
+}  // namespace
 
 FunctionToolbar::FunctionToolbar(Shell& shell)
     : shell_(shell),
@@ -57,13 +72,9 @@ void FunctionToolbar::Choose() {
   if (AskForToolbar(shell_.Window())) Fill();
 }
 
-// Buttons of families of operations have their names.
 void FunctionToolbar::ChooseOfFamily(const Command& command) {
-  if (command.symbol == nullptr || !CanRun(command, shell_)) return;
-  for (const Family family : {Family::Crop, Family::Transform, Family::Effects, Family::Filter,
-                              Family::Annotate, Family::Watermark, Family::Matt}) {
-    if (command.symbol == FamilyName(family)) return ChooseOperation(shell_, *bar_, family);
-  }
+  const std::optional<Family> family = FamilyOf(command);
+  if (family && CanRun(command, shell_)) ChooseOperation(shell_, *bar_, *family);
 }
 
 // The tooltip of a disabled button says why.
@@ -72,7 +83,8 @@ void FunctionToolbar::ShowTip(const Command& command) {
   const wxString key = chosen.empty() ? wxString() : " (" + Shown(chosen) + ")";
   const wxString why =
       CanRun(command, shell_) ? wxString() : wxString("\n") + Label(WhyNot(command, shell_));
-  const wxString tip = Label(command.help) + key + why;
+  const wxString more = FamilyOf(command) ? "\n" + Label("Right click: other operations") : "";
+  const wxString tip = Label(command.help) + key + more + why;
   if (bar_->GetToolShortHelp(CommandId(command)) != tip)
     bar_->SetToolShortHelp(CommandId(command), tip);
 }
