@@ -184,7 +184,8 @@ TEST(PsdMetadata, StripKeepsThePicture) {
 }
 
 TEST(PsdMetadata, IptcAndExifFollowTheTags) {
-  const Bytes iptc = Hex("1C0219 0003 6F6C64");  // the keyword "old"
+  // the keyword "old", and a dataset that ends in zeros
+  const Bytes iptc = Hex("1C0219 0003 6F6C64  1C02C8 0002 0100");
   const Bytes exif = Hex("4D4D002A00000008 0001 4746 0003 00000001 00010000 00000000");  // one star
   const auto text = [](const Bytes& bytes) { return std::string(bytes.begin(), bytes.end()); };
   const Bytes file = Psd(Joined({Resource(1028, text(iptc)), Resource(1058, text(exif))}));
@@ -194,6 +195,9 @@ TEST(PsdMetadata, IptcAndExifFollowTheTags) {
   const TagChanges changes{.addedKeywords = {"new"}, .rating = 3};
   ASSERT_EQ(EditPictureTags(file, changes, made, changed, reason), Status::Ok) << reason;
   const Bytes bytes = made.Joined();
+  FilePieces again;
+  EXPECT_EQ(EditPictureTags(bytes, changes, again, changed, reason), Status::Ok);
+  EXPECT_FALSE(changed);
   const PictureTags tags = TagsOfFile(bytes);
   EXPECT_EQ(tags.keywords, (std::vector<std::string>{"old", "new"}));
   EXPECT_EQ(tags.rating, 3);

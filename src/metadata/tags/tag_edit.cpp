@@ -113,10 +113,12 @@ class Editor {
     std::vector<uint8_t> made;
     if (EditIptc(blocks_.iptc, wanted, made) != Status::Ok)
       return Refuse(Tr("Its IPTC data are damaged."));
-    const auto end = std::ranges::find_if(blocks_.iptc.rbegin(), blocks_.iptc.rend(),
-                                          [](uint8_t byte) { return byte != 0; });
-    const auto size = static_cast<size_t>(blocks_.iptc.rend() - end);
-    if (!std::ranges::equal(made, blocks_.iptc.first(size))) iptc_ = std::move(made);
+    // the old data may be padded with zeros
+    const size_t size = std::min(made.size(), blocks_.iptc.size());
+    const bool same = std::ranges::equal(made, blocks_.iptc.first(size)) &&
+                      std::ranges::count(blocks_.iptc.subspan(size), uint8_t{0}) ==
+                          static_cast<ptrdiff_t>(blocks_.iptc.size() - size);
+    if (!same) iptc_ = std::move(made);
     return Status::Ok;
   }
 
