@@ -52,7 +52,7 @@ TEST(KeyHelp, IsPlainText) {
   EXPECT_EQ(KeyHelp(*FindKey("WebPLossless")),
             "WebP files are lossless. If off, they have the quality of WebPQualityFactor and are much smaller.");
   EXPECT_EQ(KeySummary(*FindKey("WebPLossless")), "WebP files are lossless.");
-  EXPECT_EQ(KeyHelp(*FindKey("ArchiveOptionsOpenDepth")), "");
+  EXPECT_EQ(KeyHelp(*FindKey("QuickTimeCodec")), "");
   for (const KeyRow& row : Keys()) {
     EXPECT_EQ(KeyHelp(row).find_first_of("`*#\n"), std::string::npos) << row.name;
     EXPECT_TRUE(!IsKeyUsed(row) || KeySummary(row).ends_with('.')) << row.name;
