@@ -427,7 +427,7 @@ def later_starts(folder):
         desktop.screenshot("toolbar")
         # every command is offered, at the end those without a button
         desktop.key("space", "End", "space", "alt+o")
-        desktop.wait(r"toolbar convert .* Help/About$")
+        desktop.wait(r"toolbar view convert .* Help/About$")
         desktop.focus("Fotomill Professional")
         for keys, name in (("ctrl+Tab", "pictures"), ("ctrl+shift+Tab", "other")):
             desktop.key(keys)

@@ -165,7 +165,6 @@ def welcome_answered(folder):
         desktop.key("Return")  # this folder does not exist
         desktop.key("ctrl+a")
         desktop.type(str(pictures))
-        desktop.key("Escape")  # closes the list of folders
         desktop.key("Tab", "Tab", "Down", "Down", "Tab", "End")
         desktop.screenshot("welcome-answered")
         desktop.key("alt+s")
@@ -177,7 +176,8 @@ def welcome_answered(folder):
         assert str(pictures) in (desktop.data / "FMWFavourites.txt").read_text()
         desktop.focus("Fotomill Professional")
         desktop.key("ctrl+k")
-        desktop.wait(r"active Befehl suchen")
+        desktop.wait(r"finder found=")
+        desktop.focus("^Befehl suchen$")
 
 
 run(media_and_recent_files, many_programs_at_once, override_that_appears, loading_is_told,

@@ -55,7 +55,7 @@ BrowserBar::BrowserBar(wxWindow* parent, BrowserModel& model, const FolderTrail&
   row->Add(tagFilter_, flags);
   row->Add(filter_, flags);
   row->Add(order_, wxSizerFlags().CenterVertical());
-  row->Add(direction_, flags);
+  row->Add(direction_, wxSizerFlags().CenterVertical().Border(wxLEFT | wxRIGHT, FromDIP(6)));
   row->Add(slider_, flags);
   SetSizer(row);
 }

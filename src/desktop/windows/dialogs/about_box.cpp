@@ -46,7 +46,7 @@ std::string VersionsText(const std::vector<Library>& libraries) {
 void CopyText(const std::string& text) {
   const wxClipboardLocker lock;
   if (!lock) return;
-  wxTheClipboard->SetData(new wxTextDataObject(Shown(text)));
+  wxTheClipboard->SetData(new wxTextDataObject(wxString::FromUTF8(text)));
   LogEvent("about", "copied");
 }
 
@@ -80,7 +80,7 @@ void ShowAboutBox(wxWindow& parent) {
               wxSizerFlags().Border(wxLEFT | wxRIGHT, gap));
   std::string licenses = LicensesText(libraries);
   licenses.erase(0, licenses.find_first_not_of('\n'));
-  auto* text = new wxTextCtrl(&dialog, wxID_ANY, Shown(licenses), wxDefaultPosition,
+  auto* text = new wxTextCtrl(&dialog, wxID_ANY, wxString::FromUTF8(licenses), wxDefaultPosition,
                               dialog.FromDIP(wxSize(520, 280)),
                               wxTE_MULTILINE | wxTE_READONLY | wxTE_BESTWRAP);
   column->Add(text, wxSizerFlags(1).Expand().Border(wxLEFT | wxRIGHT | wxTOP, gap / 2));

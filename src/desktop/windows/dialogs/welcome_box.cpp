@@ -75,9 +75,8 @@ WelcomeBox::WelcomeBox()
     column_->Add(button, wxSizerFlags().Border(wxLEFT | wxRIGHT | wxTOP, gap_ / 2));
     keepings_.push_back(button);
   }
-  AddHeading(TrLater("Language"));
   language_ = new LanguagePanel(this);
-  column_->Add(language_, wxSizerFlags().Border(wxLEFT | wxRIGHT | wxTOP, gap_ / 2));
+  column_->Add(language_, wxSizerFlags().Border(wxTOP, FromDIP(18)));
   start_ = new wxButton(this, wxID_OK, Label("&Start"));
   column_->AddSpacer(gap_);
   column_->Add(BuildAnswerRow(*this, *start_), wxSizerFlags().Expand().Border(wxTOP, gap_));
