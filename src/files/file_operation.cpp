@@ -119,6 +119,12 @@ Outcome TrashOne(const std::string& path) {
              : Outcome(Tr("There is no trash on this volume; Shift+Delete deletes permanently."));
 }
 
+// Whether a file may be trashed or deleted.
+Outcome CheckSeen(const FileStep& step) {
+  if (!step.seen.there || platform::StampOf(step.from) == step.seen) return {};
+  return platform::FileExists(step.from) ? Tr(kChanged) : Tr(kGone);
+}
+
 Outcome Restore(const std::string& path) {
   if (platform::FileExists(path)) return Tr(kTaken);
   return platform::RestoreFromTrash(path) ? Outcome()
@@ -239,7 +245,8 @@ std::vector<std::string> RemoveWithSidecars(const std::string& path,
 // A step with the sidecars of its file. Notes in the step what went to the trash along with it.
 Outcome DoWithSidecars(const FileOperation& operation, FileStep& step, AlongTheWay& besides) {
   if (operation.kind == FileOperationKind::Trash) {
-    Outcome outcome;
+    Outcome outcome = CheckSeen(step);
+    if (!outcome.empty()) return outcome;
     step.along =
         RemoveWithSidecars(step.from, operation.commentExtension, TrashOne, outcome, besides);
     return outcome;
@@ -395,25 +402,27 @@ FileOperationResult Revert(const FileOperation& operation, const FileOperationPr
   return result;
 }
 
-FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
-                                  const FileOperationOptions& options,
+FileOperationResult DeleteForGood(const FileOperation& operation,
                                   const FileOperationProgress& progress) {
   FileOperationResult result{{FileOperationKind::Trash, {}}, {}};
   std::vector<PictureChange> changes;
   AlongTheWay besides;
   const auto remove = [](const std::string& path) { return DeleteTree(path, 0); };
-  for (size_t i = 0; i < paths.size(); ++i) {
-    if (progress && !progress(i, paths.size())) break;
-    if (besides.settled.contains(paths[i])) continue;
-    Outcome outcome;
-    (void)RemoveWithSidecars(paths[i], options.commentExtension, remove, outcome, besides);
+  for (size_t i = 0; i < operation.steps.size(); ++i) {
+    if (progress && !progress(i, operation.steps.size())) break;
+    const FileStep& step = operation.steps[i];
+    const std::string& path = step.from;
+    if (besides.settled.contains(path)) continue;
+    Outcome outcome = CheckSeen(step);
+    if (outcome.empty())
+      (void)RemoveWithSidecars(path, operation.commentExtension, remove, outcome, besides);
     if (!outcome.empty()) {
-      if (!WentWithPicture(paths[i], changes)) result.failures.push_back({paths[i], outcome});
+      if (!WentWithPicture(path, changes)) result.failures.push_back({path, outcome});
       continue;
     }
-    result.done.steps.push_back({paths[i], {}});
-    changes.push_back({paths[i]});
-    DeleteThumbnailFile(paths[i]);
+    result.done.steps.push_back(step);
+    changes.push_back({path});
+    DeleteThumbnailFile(path);
   }
   result.failures.insert(result.failures.end(), besides.failures.begin(), besides.failures.end());
   MarkChangedRecords(changes);

@@ -41,6 +41,8 @@ struct FileStep {
   platform::FileTimes oldTimes = {}, newTimes = {};
   // Trash: the sidecars and the comment file that went along
   std::vector<std::string> along = {};
+  // Trash: the state that the file must have; not there: any
+  platform::FileStamp seen = {};
 };
 
 // The step for a file whose times were set.
@@ -99,10 +101,9 @@ FileOperationResult CarryOut(const FileOperation& operation,
 FileOperationResult Revert(const FileOperation& operation,
                            const FileOperationProgress& progress = {});
 
-// Permanently deletes files, and folders with their contents, with their thumbnails, sidecars and
-// comment files. The completed steps cannot be undone.
-FileOperationResult DeleteForGood(const std::vector<std::string>& paths,
-                                  const FileOperationOptions& options = {},
+// Carries out a Trash operation by permanently deleting files, and folders with their contents,
+// with their thumbnails, sidecars and comment files. The completed steps cannot be undone.
+FileOperationResult DeleteForGood(const FileOperation& operation,
                                   const FileOperationProgress& progress = {});
 
 // Uses to record in the file history after an operation, or with `back` after undoing it: new paths

@@ -182,6 +182,7 @@ TEST(HashStore, StoresHashes) {
     HashStore store(path);
     HashRecord digested = RecordOf(11, 22);
     digested.digest = "00112233445566778899aabbccddeeff";
+    digested.sharpness = 12.5F;
     store.Put("/a", digested);
     store.Put("/b", RecordOf(33, 44));
     HashRecord fresh = RecordOf(1, 1);
@@ -196,10 +197,12 @@ TEST(HashStore, StoresHashes) {
   ASSERT_TRUE(a);
   EXPECT_EQ(a->digest, "00112233445566778899aabbccddeeff");
   EXPECT_EQ(a->hashes, RecordOf(11, 22).hashes);
+  EXPECT_EQ(a->sharpness, 12.5F);
   EXPECT_EQ(a->width, 7);
   EXPECT_TRUE(a->hasHashes);
   ASSERT_TRUE(store.Find("/b", 55, 1000));
   EXPECT_EQ(store.Find("/b", 55, 1000)->digest, "");
+  EXPECT_LT(store.Find("/b", 55, 1000)->sharpness, 0);
   EXPECT_FALSE(store.Find("/b", 33, 1000)) << "of an older file";
   EXPECT_FALSE(store.Find("/a", 11, 1001));
   EXPECT_FALSE(store.Find("/c", 11, 1000));

@@ -166,6 +166,7 @@ WINDOWS = [
     ("ctrl+alt+e", r"exif-edit files=", "Edit EXIF: 2 files"),
     ("ctrl+alt+m", r"prompt strip", "Remove Metadata"),
     ("ctrl+alt+z", r"prompt archive", "Create archive"),
+    ("ctrl+shift+s", r"prompt similar", "Find similar pictures"),
     ("ctrl+h", r"history rows=", "File history"),
     ("ctrl+k", r"finder found=", "Find command"),
     ("tools compact", None, "Compact thumbnail database"),

@@ -129,7 +129,8 @@ TEST_F(FileOperationTest, SidecarsAreRemovedWithTheirPictures) {
       EXPECT_EQ(Names("from"), before);
       EXPECT_EQ(ReadText(From("a.png.txt")), "a.png.txt");
     }
-    EXPECT_THAT(DeleteForGood(paths, options).failures, IsEmpty());
+    operation = PlanFileOperation(FileOperationKind::Trash, paths, {}, options);
+    EXPECT_THAT(DeleteForGood(operation).failures, IsEmpty());
     EXPECT_EQ(Names("from"), row.left);
   }
   // without the extension, texts are no comments; a name that was taken meanwhile is not replaced
@@ -274,7 +275,7 @@ TEST_F(FileOperationTest, ThumbnailsFollowOrGo) {
   }
   ThumbnailRecord record;
   ASSERT_TRUE(WriteThumbnailFile(record, From("b.THN"), true));
-  EXPECT_EQ(DeleteForGood({From("b.png")}).done.steps.size(), 1u);
+  EXPECT_EQ(DeleteForGood({FileOperationKind::Trash, {{From("b.png"), {}}}}).done.steps.size(), 1u);
   EXPECT_FALSE(platform::FileExists(From("b.THN")));
   EXPECT_EQ(live(), 1);
   SharedThumbnailStore().Close();
@@ -368,9 +369,28 @@ TEST_F(FileOperationTest, FoldersCannotBeMovedIntoThemselves) {
   // Links are deleted, never their targets.
   std::filesystem::create_directory_symlink(folder_.Path("to"), From("sub/link"));
   WriteText(To("kept"), "kept");
-  EXPECT_THAT(DeleteForGood({From("sub")}).failures, IsEmpty());
+  EXPECT_THAT(DeleteForGood({FileOperationKind::Trash, {{From("sub"), {}}}}).failures, IsEmpty());
   EXPECT_THAT(Names("from"), ElementsAre("a.png", "b.png"));
   EXPECT_EQ(ReadText(To("kept")), "kept");
+}
+
+TEST_F(FileOperationTest, OnlyFilesInTheStateSeenAreTrashed) {
+  FileOperation operation{FileOperationKind::Trash, {}};
+  for (const char* name : {"a.png", "b.png"}) {
+    operation.steps.push_back({From(name), {}});
+    operation.steps.back().seen = platform::StampOf(From(name));
+  }
+  WriteText(From("b.png"), "was worked on");
+  const FileOperationResult done = CarryOut(operation);
+  ASSERT_EQ(done.done.steps.size(), 1u);
+  ASSERT_EQ(done.failures.size(), 1u);
+  EXPECT_EQ(done.failures[0].path, From("b.png"));
+  EXPECT_THAT(done.failures[0].reason, testing::HasSubstr("changed"));
+  EXPECT_EQ(DeleteForGood(operation).done.steps.size(), 0u);
+  EXPECT_EQ(ReadText(From("b.png")), "was worked on");
+  // What came back may be trashed again.
+  EXPECT_THAT(Revert(done.done).failures, IsEmpty());
+  EXPECT_THAT(CarryOut(done.done).failures, IsEmpty());
 }
 
 TEST_F(FileOperationTest, CopiesInTheSameFolderAreCalledDuplicates) {

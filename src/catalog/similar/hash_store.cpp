@@ -1,5 +1,6 @@
 #include "catalog/similar/hash_store.h"
 
+#include <bit>
 #include <span>
 #include <utility>
 
@@ -11,7 +12,7 @@ namespace {
 
 constexpr RecordLayout kLayout{"FMWHASH1", 96};
 constexpr uint64_t kDigestBytes = 16;
-constexpr uint32_t kHasHashes = 1, kHasDigest = 2;
+constexpr uint32_t kHasHashes = 1, kHasDigest = 2, kHasSharpness = 4;
 
 void AddLittle(std::string& data, uint64_t value, int count) {
   for (int i = 0; i < count; ++i) data.push_back(static_cast<char>(value >> (8 * i)));
@@ -30,8 +31,12 @@ std::string DataOf(const HashRecord& record) {
         digest ? Nibble(record.digest[2 * i]) << 4 | Nibble(record.digest[2 * i + 1]) : 0;
     data.push_back(static_cast<char>(byte));
   }
-  AddLittle(data, (record.hasHashes ? kHasHashes : 0) | (digest ? kHasDigest : 0), 4);
-  AddLittle(data, 0, 4);
+  const bool sharpness = record.sharpness >= 0;
+  AddLittle(data,
+            (record.hasHashes ? kHasHashes : 0) | (digest ? kHasDigest : 0) |
+                (sharpness ? kHasSharpness : 0),
+            4);
+  AddLittle(data, sharpness ? std::bit_cast<uint32_t>(record.sharpness) : 0, 4);
   return data;
 }
 
@@ -62,6 +67,7 @@ std::optional<HashRecord> HashStore::Find(const std::string& path, uint64_t size
   const uint32_t flags = reader.Le32();
   record.hasHashes = (flags & kHasHashes) != 0;
   if ((flags & kHasDigest) != 0) record.digest = DigestText(digest);
+  if ((flags & kHasSharpness) != 0) record.sharpness = std::bit_cast<float>(reader.Le32());
   return record;
 }
 

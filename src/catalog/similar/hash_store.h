@@ -19,6 +19,7 @@ struct HashRecord {
   bool hasHashes = false;
   PictureHashes hashes{};
   std::string digest = {};  // of the pixels, 32 characters; empty if not computed
+  float sharpness = -1;     // as MeasureSharpness; negative if not measured
 };
 
 // The store of picture hashes in the data folder, a RecordStore with 96 bytes of data per picture,
@@ -28,8 +29,8 @@ struct HashRecord {
 //        0    8  width and height, 4 bytes each
 //        8   64  eight hashes
 //       72   16  digest of the pixels
-//       88    4  bit 0: has hashes, bit 1: has a digest
-//       92    4  0
+//       88    4  bit 0: has hashes, bit 1: has a digest, bit 2: has a sharpness
+//       92    4  sharpness, IEEE 754 single; else 0
 inline constexpr std::string_view kHashStoreName = "Fotomill.hashes";
 
 // A store. Not thread-safe.

@@ -2,9 +2,9 @@
 
 #include <algorithm>
 #include <map>
-#include <span>
 #include <utility>
 
+#include "catalog/similar/sharpness.h"
 #include "core/workers/ordered_run.h"
 #include "metadata/exif/picture_exif.h"
 #include "platform/files.h"
@@ -44,14 +44,13 @@ void SimilarSearch::Read(std::vector<ComparedFile>& files, const SimilarEvents& 
     }
     return chosen;
   };
-  for (ComparedFile* file : those([](const ComparedFile&) { return true; })) Recall(*file);
+  Recall(files);
   ForEach(those([](const ComparedFile& file) { return !file.known; }), &SimilarSearch::Look,
           events);
   if (options_.exact) {
     const std::vector<const ComparedFile*> lonely = Lonely(files);
     const auto needed = [&lonely](const ComparedFile& file) {
-      return file.known && file.record.digest.empty() &&
-             !std::ranges::binary_search(lonely, &file);
+      return file.known && file.record.digest.empty() && !std::ranges::binary_search(lonely, &file);
     };
     ForEach(those(needed), &SimilarSearch::Digest, events);
   }
@@ -74,18 +73,21 @@ void SimilarSearch::ForEach(const std::vector<ComparedFile*>& files, Work work,
     if ((i + 1) % kSavedEvery == 0) kept_ = store_.Save() && kept_;
     if (events.progress) events.progress(i + 1, files.size());
   };
-  OrderedRun({.work = run, .deliver = take, .goesOn = events.goesOn, .tick = events.tick})
+  const auto goesOn = [&] { return !events.goesOn || events.goesOn(); };
+  OrderedRun({.work = run, .deliver = take, .goesOn = goesOn, .tick = events.tick})
       .Run(files.size(), platform::CoreCount());
 }
 
-// Loads what the store knows.
-void SimilarSearch::Recall(ComparedFile& file) const {
-  const platform::FileFacts facts = platform::FactsOf(file.name);
-  const auto stored = store_.Find(platform::AbsolutePath(file.name), facts.size, facts.modified);
-  if (stored) file.record = *stored;
-  file.known = stored && (options_.exact || stored->hasHashes);
-  file.record.size = facts.size;
-  file.record.modified = facts.modified;
+void SimilarSearch::Recall(std::vector<ComparedFile>& files) const {
+  for (ComparedFile& file : files) {
+    if (file.status != Status::Ok) continue;
+    const platform::FileFacts facts = platform::FactsOf(file.name);
+    const auto stored = store_.Find(platform::AbsolutePath(file.name), facts.size, facts.modified);
+    if (stored) file.record = *stored;
+    file.known = stored && (options_.exact || stored->hasHashes);
+    file.record.size = facts.size;
+    file.record.modified = facts.modified;
+  }
 }
 
 // Determines size and, unless only identical pictures count, hashes.
@@ -113,6 +115,28 @@ Status SimilarSearch::Digest(ComparedFile& file) const {
   file.record.width = picture->width;  // upright
   file.record.height = picture->height;
   return Status::Ok;
+}
+
+Status SimilarSearch::FindSharpness(ComparedFile& file) const {
+  PicturePointer picture;
+  RETURN_IF_BAD(LoadPicture(
+      {.fileName = file.name, .thumbnailSide = kSideForSharpness, .options = options_.read},
+      picture));
+  if (file.record.width == 0) {  // not read by a search
+    file.record.width = picture->width;
+    file.record.height = picture->height;
+  }
+  return MeasureSharpness(*picture, file.record.sharpness);
+}
+
+void SimilarSearch::Measure(std::vector<ComparedFile>& files, std::span<const size_t> which,
+                            const SimilarEvents& events) {
+  std::vector<ComparedFile*> chosen;
+  for (const size_t i : which) {
+    if (files[i].status == Status::Ok && files[i].record.sharpness < 0) chosen.push_back(&files[i]);
+  }
+  ForEach(chosen, &SimilarSearch::FindSharpness, events);
+  kept_ = store_.Save() && kept_;
 }
 
 std::vector<SimilarGroup> SimilarSearch::Group(const std::vector<ComparedFile>& files,

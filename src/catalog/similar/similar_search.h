@@ -2,6 +2,7 @@
 
 #include <cstdint>
 #include <functional>
+#include <span>
 #include <string>
 #include <vector>
 
@@ -25,16 +26,17 @@ struct SimilarOptions {
 
 // A file to be compared with others.
 struct ComparedFile {
-  std::string name;             // path, absolute or relative
-  Status status = Status::Ok;   // why it is left out
-  std::string hint = {};        // to follow that message; may be empty
+  std::string name;            // path, absolute or relative
+  Status status = Status::Ok;  // why it is left out
+  std::string hint = {};       // to follow that message; may be empty
   HashRecord record = {};
-  bool known = false;           // the record has all that is needed
+  bool known = false;  // the record has all that is needed
 };
 
-// What a search reports. All but `hint` and `goesOn` are called on the thread that searches.
+// What a search reports; each may be empty. All but `hint` and `goesOn` are called on the thread
+// that searches.
 struct SimilarEvents {
-  // Explains a failure, on any thread; may be empty.
+  // Explains a failure, on any thread.
   std::function<std::string(const std::string& name, Status status)> hint = {};
   std::function<bool()> goesOn = {};  // on any thread; false ends the search
   std::function<void()> tick = {};    // a few times a second
@@ -49,6 +51,8 @@ class SimilarSearch {
   SimilarSearch(const SimilarOptions& options, HashStore& store)
       : options_(options), store_(store) {}
 
+  // Loads what the store knows. Read does so itself.
+  void Recall(std::vector<ComparedFile>& files) const;
   // Determines what is compared, on all cores. Files that have a status already are ignored; those
   // that cannot be read get one. If ended, some of the others are not `known`.
   void Read(std::vector<ComparedFile>& files, const SimilarEvents& events);
@@ -56,16 +60,19 @@ class SimilarSearch {
   // `goesOn` returns false.
   std::vector<SimilarGroup> Group(const std::vector<ComparedFile>& files,
                                   const std::function<bool()>& goesOn) const;
+  // Measures the sharpness of the files with these indices, unless it is known.
+  void Measure(std::vector<ComparedFile>& files, std::span<const size_t> which,
+               const SimilarEvents& events);
   // False if the store could not be written; the results are right all the same.
   bool Kept() const { return kept_; }
 
  private:
   using Work = Status (SimilarSearch::*)(ComparedFile& file) const;
 
-  void Recall(ComparedFile& file) const;
   void ForEach(const std::vector<ComparedFile*>& files, Work work, const SimilarEvents& events);
   Status Look(ComparedFile& file) const;
   Status Digest(ComparedFile& file) const;
+  Status FindSharpness(ComparedFile& file) const;
 
   const SimilarOptions options_;
   HashStore& store_;

@@ -12,13 +12,6 @@ namespace {
 
 constexpr double kTimeLeftAfter = 3;  // seconds
 
-std::string TimeLeft(const ProgressFacts& facts) {
-  const ProgressWork& work = facts.work;
-  if (facts.seconds < kTimeLeftAfter || work.done == 0 || work.done >= work.count) return {};
-  const auto left = std::lround(std::ceil(facts.seconds / work.done * (work.count - work.done)));
-  return ", " + (left < 60 ? Tr("%1 s left", left) : Tr("%1 min left", (left + 59) / 60));
-}
-
 std::string StoppingText(const ProgressWork& work) {
   if (work.inWork > 1)
     return TrCount("Stopping when %1 file is done...", "Stopping when %1 files are done...",
@@ -29,6 +22,13 @@ std::string StoppingText(const ProgressWork& work) {
 
 }  // namespace
 
+std::string TimeLeftText(double seconds, uint64_t done, uint64_t count) {
+  if (seconds < kTimeLeftAfter || done == 0 || done >= count) return {};
+  const double each = seconds / static_cast<double>(done);
+  const auto left = std::lround(std::ceil(each * static_cast<double>(count - done)));
+  return left < 60 ? Tr("%1 s left", left) : Tr("%1 min left", (left + 59) / 60);
+}
+
 std::string ProgressStatusLine(const ProgressFacts& facts) {
   const ProgressWork& work = facts.work;
   if (facts.ended) return facts.status;
@@ -36,7 +36,8 @@ std::string ProgressStatusLine(const ProgressFacts& facts) {
   std::string line = facts.status;
   if (work.count > 0)
     line = Tr("Processing file %1 of %2", std::min(work.done + 1, work.count), work.count);
-  line += TimeLeft(facts);
+  if (const std::string left = TimeLeftText(facts.seconds, work.done, work.count); !left.empty())
+    line.append(", ").append(left);
   if (facts.waiting > 0)
     line.append(", ").append(
         TrCount("%1 batch is waiting", "%1 batches are waiting", facts.waiting));

@@ -1,6 +1,7 @@
 #pragma once
 
 #include <cstddef>
+#include <cstdint>
 #include <string>
 
 #include "batch/progress_box.h"
@@ -19,5 +20,9 @@ struct ProgressFacts {
 // "Processing file 3 of 12, 8 s left: beach.jpg"; after Abort, what is still running; at the end,
 // the batch's text.
 std::string ProgressStatusLine(const ProgressFacts& facts);
+
+// "8 s left", from the time that some of `count` equal steps took; empty if it is too early to say,
+// or nothing is left.
+std::string TimeLeftText(double seconds, uint64_t done, uint64_t count);
 
 }  // namespace fotomill::desktop

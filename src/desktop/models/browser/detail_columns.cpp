@@ -35,18 +35,7 @@ std::string DepthText(const FolderItem& item) {
                         : TrCount("%1 bit", "%1 bits", static_cast<uint64_t>(item.bits));
 }
 
-// Formats 20040831223208 as "2004-08-31 22:32".
-std::string TakenText(const FolderItem& item) {
-  if (item.taken <= 0) return {};
-  const auto part = [&](int64_t unit, int64_t size) {
-    return static_cast<long long>(item.taken / unit % size);
-  };
-  char text[64];
-  std::snprintf(text, sizeof text, "%04lld-%02lld-%02lld %02lld:%02lld",
-                part(10'000'000'000, 10'000), part(100'000'000, 100), part(1'000'000, 100),
-                part(10'000, 100), part(100, 100));
-  return text;
-}
+std::string TakenText(const FolderItem& item) { return DateNumberText(item.taken); }
 
 std::string RatingText(const FolderItem& item) { return StarsText(item.rating); }
 std::string ColorLabelText(const FolderItem& item) { return LabelText(item.label); }
@@ -70,6 +59,18 @@ bool Holds(const DetailColumns& columns, size_t detail) {
 }
 
 }  // namespace
+
+std::string DateNumberText(int64_t date) {
+  if (date <= 0) return {};
+  const auto part = [&](int64_t unit, int64_t size) {
+    return static_cast<long long>(date / unit % size);
+  };
+  char text[64];
+  std::snprintf(text, sizeof text, "%04lld-%02lld-%02lld %02lld:%02lld",
+                part(10'000'000'000, 10'000), part(100'000'000, 100), part(1'000'000, 100),
+                part(10'000, 100), part(100, 100));
+  return text;
+}
 
 std::span<const DetailFacts> AllDetails() { return kDetails; }
 

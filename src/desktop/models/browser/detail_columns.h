@@ -37,4 +37,7 @@ using DetailColumns = std::vector<DetailColumn>;  // from left to right, each de
 DetailColumns ParseDetailColumns(std::string_view text);
 std::string DetailColumnsText(const DetailColumns& columns);
 
+// Formats 20040831223208 as "2004-08-31 22:32"; 0 as nothing.
+std::string DateNumberText(int64_t date);
+
 }  // namespace fotomill::desktop

@@ -1,14 +1,11 @@
 #include "desktop/models/search/folder_search.h"
 
-#include <algorithm>
 #include <utility>
 
 #include "batch/picture_failure.h"
 #include "catalog/search/picture_search.h"
-#include "core/natural_order.h"
-#include "desktop/models/browser/folder_listing.h"
+#include "desktop/models/files/folder_walk.h"
 #include "platform/clock.h"
-#include "platform/files.h"
 #include "platform/paths.h"
 #include "texts/status_text.h"
 
@@ -17,7 +14,6 @@ namespace fotomill::desktop {
 namespace {
 
 constexpr double kReportInterval = 0.2;  // seconds
-constexpr int kDeepest = 64;             // of nested folders
 
 class Search {
  public:
@@ -30,7 +26,9 @@ class Search {
         search_(std::move(search.criteria), 0, WithStop(std::move(search.facts), stop), index_) {}
 
   void Run() {
-    SearchIn("", 0);
+    WalkFolder(folder_, true, stop_,
+               {.files = [this](const std::vector<std::string>& names) { SearchIn(names); },
+                .problem = [this](const std::string& why) { news_.problems.push_back(why); }});
     Report();
   }
 
@@ -45,35 +43,12 @@ class Search {
     report_(std::exchange(news_, {}));
   }
 
-  // `below` is relative to the searched folder.
-  void SearchIn(const std::string& below, int depth) {
-    const std::string folder = below.empty() ? folder_ : platform::JoinFolder(folder_, below);
-    FolderListing listing = ListForBrowser(folder, false, stop_);
-    if (listing.state != FolderState::Listed) {
-      news_.problems.push_back(listing.problem);
-      return;
-    }
-    std::ranges::sort(listing.items, [](const FolderItem& a, const FolderItem& b) {
-      return CompareNatural(a.name, b.name) < 0;
-    });
-    std::vector<std::string> names, paths, folders;
-    for (const FolderItem& item : listing.items) {
-      std::string name = below.empty() ? item.name : platform::JoinFolder(below, item.name);
-      const std::string path = platform::JoinFolder(folder_, name);
-      if (!item.folder) {
-        paths.push_back(path);
-        names.push_back(std::move(name));
-      } else if (depth < kDeepest && !platform::FactsOf(path).link) {
-        folders.push_back(std::move(name));
-      }
-    }
+  void SearchIn(const std::vector<std::string>& names) {
+    std::vector<std::string> paths;
+    for (const std::string& name : names) paths.push_back(platform::JoinFolder(folder_, name));
     search_.Run(paths,
                 {.examined = [&](size_t i, const ExaminedFile& file) { Take(names[i], file); },
                  .hint = FailureText});
-    for (const std::string& next : folders) {
-      if (stop_.Asked()) return;
-      SearchIn(next, depth + 1);
-    }
   }
 
   void Take(const std::string& name, const ExaminedFile& file) {

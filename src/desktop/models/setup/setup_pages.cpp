@@ -49,6 +49,7 @@ constexpr SetupItem kItems[] = {
     Item(Browsing,   TrLater("Toolbar"),            RightClickOneTimeFunctions,     "Operations chosen by right click are used only once"),
     Item(Browsing,   TrLater("Find similar"),       FindSimlarDistance,             "How many of 64 bits may differ, 0 to 32"),
     Item(Browsing,   TrLater("Find similar"),       FindSimilarTransforms,          "Also find pictures that are rotated or mirrored"),
+    Item(Browsing,   TrLater("Find similar"),       FindSimilarSubfolders,          "Also search subfolders"),
     Item(Browsing,   TrLater("Recently used"), CopyHistoryMax,        "Folders copied or moved to"),
     Item(Browsing,   TrLater("Recently used"), DestHistoryMax,        "Destination folders"),
     Item(Browsing,   TrLater("Recently used"), PictureSearchHistoryMax,    "Folders that were searched"),

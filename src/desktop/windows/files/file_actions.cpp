@@ -57,6 +57,16 @@ PastedPicture PictureOf(const wxBitmap& bitmap) {
 constexpr const char* kGnomeFiles = "x-special/gnome-copied-files";
 constexpr size_t kMostFailuresShown = 10;
 
+FileOperation TrashOf(const std::vector<std::string>& paths) {
+  return PlanFileOperation(FileOperationKind::Trash, paths, {}, FileOperationOptionsFromSettings());
+}
+
+std::vector<std::string> PathsOf(const FileOperation& operation) {
+  std::vector<std::string> paths;
+  for (const FileStep& step : operation.steps) paths.push_back(step.from);
+  return paths;
+}
+
 std::string Count(size_t files) { return TrGroupedCount("%1 file", "%1 files", files); }
 
 }  // namespace
@@ -195,14 +205,20 @@ void FileActions::StartTagging() {
       });
 }
 
-void FileActions::Trash(const std::vector<std::string>& paths) { Trash(paths, {}); }
+void FileActions::Trash(const std::vector<std::string>& paths) {
+  Trash(TrashOf(paths), {});
+}
+
+void FileActions::TrashSteps(wxWindow* parent, std::vector<FileStep> steps) {
+  FileOperation operation = TrashOf({});
+  operation.steps = std::move(steps);
+  Trash(operation, {parent, {}});
+}
 
 // Finds out in the background whether there is a trash, too.
-void FileActions::Trash(const std::vector<std::string>& paths, const Asker& asker) {
-  if (paths.empty() || RefusesChange(ParentOf(asker), paths)) return;
+void FileActions::Trash(const FileOperation& operation, const Asker& asker) {
+  if (operation.steps.empty() || RefusesChange(ParentOf(asker), PathsOf(operation))) return;
   const auto noTrash = std::make_shared<bool>(false);
-  const FileOperation operation = 
-      PlanFileOperation(FileOperationKind::Trash, paths, {}, FileOperationOptionsFromSettings());
   std::string what = FileOperationName(operation);
   what[0] = static_cast<char>(what[0] - 'a' + 'A');
   Run(
@@ -213,10 +229,11 @@ void FileActions::Trash(const std::vector<std::string>& paths, const Asker& aske
         return *noTrash ? FileOperationResult{{FileOperationKind::Trash, {}}, {}}
                         : CarryOut(operation, progress);
       },
-      [this, paths, asker, noTrash](FileOperationResult result) {
-        if (*noTrash) return CallAfter([this, paths, asker] { Delete(paths, asker, true); });
+      [this, operation, asker, noTrash](FileOperationResult result) {
+        if (*noTrash)
+          return CallAfter([this, operation, asker] { Delete(operation, asker, true); });
         Took(result.done, false);
-        const bool all = result.done.steps.size() == paths.size();
+        const bool all = result.done.steps.size() == operation.steps.size();
         undo_.Add(std::move(result.done));
         if (all && asker.gone) asker.gone();
       },
@@ -233,12 +250,15 @@ void FileActions::TrashFromView(wxWindow* view, const std::string& path,
     dialog.SetOKLabel(Label("&Delete"));
     if (dialog.ShowModal() != wxID_OK) return;
   }
-  Trash({path}, {view, std::move(gone)});
+  Trash(TrashOf({path}), {view, std::move(gone)});
 }
 
-void FileActions::Delete(const std::vector<std::string>& paths) { Delete(paths, {}, false); }
+void FileActions::Delete(const std::vector<std::string>& paths) {
+  Delete(TrashOf(paths), {}, false);
+}
 
-void FileActions::Delete(const std::vector<std::string>& paths, const Asker& asker, bool noTrash) {
+void FileActions::Delete(const FileOperation& operation, const Asker& asker, bool noTrash) {
+  const std::vector<std::string> paths = PathsOf(operation);
   if (paths.empty() || RefusesChange(ParentOf(asker), paths)) return;
   const wxString what = paths.size() == 1 ? "\"" + Shown(platform::FileNameOf(paths.front())) + "\""
                                           : Shown(Count(paths.size()));
@@ -248,8 +268,8 @@ void FileActions::Delete(const std::vector<std::string>& paths, const Asker& ask
   if (!AskToDelete(*ParentOf(asker), question, paths, shell_.Thumbnails())) return;
   Run(
       Tr("Permanent deletion"),
-      [paths, options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
-        return DeleteForGood(paths, options, progress);
+      [operation](const FileOperationProgress& progress) {
+        return DeleteForGood(operation, progress);
       },
       [this, asker, count = paths.size()](FileOperationResult result) {
         Took(result.done, false);

@@ -32,6 +32,8 @@ class FileActions : public wxEvtHandler {
   // depending on PromptDeleteFromView. `gone` is called when the file was deleted, also if it did
   // not exist any more.
   void TrashFromView(wxWindow* view, const std::string& path, std::function<void()> gone);
+  // The same for the steps of a Trash operation; `parent` is that of questions and messages.
+  void TrashSteps(wxWindow* parent, std::vector<FileStep> steps);
   void Delete(const std::vector<std::string>& paths);  // permanently, after asking
   // Copies files and folders; adds a number if a name is taken.
   void CopyTo(const std::vector<std::string>& paths, const std::string& folder);
@@ -78,8 +80,8 @@ class FileActions : public wxEvtHandler {
   };
   wxWindow* ParentOf(const Asker& asker) const;
   void Run(const std::string& what, Work work, Then then, const Asker& asker = {});
-  void Trash(const std::vector<std::string>& paths, const Asker& asker);
-  void Delete(const std::vector<std::string>& paths, const Asker& asker, bool noTrash);
+  void Trash(const FileOperation& operation, const Asker& asker);
+  void Delete(const FileOperation& operation, const Asker& asker, bool noTrash);
   void Do(FileOperationKind kind, const std::vector<std::string>& paths, const std::string& folder);
   void Finished(const std::string& what, FileOperationResult result, const Then& then,
                 const Asker& asker);

@@ -27,6 +27,7 @@
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/shell/side_pane.h"
 #include "desktop/windows/shell/tool_windows.h"
+#include "desktop/windows/similar/similar_frame.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "texts/texts.h"
 
@@ -314,6 +315,7 @@ constexpr Command kCommands[] = {
     {kTags, TrLater("&Keywords..."),          "Ctrl+Shift+K", TrLater("Sets the keywords of the focused picture, or adds some to several."), Needs::Files, KeywordSelection},
     {kTags, TrLater("Co&mment..."),           "Ctrl+M",       TrLater("Sets the description of the selected pictures."), Needs::Files, CommentSelection},
 
+    {kTools, TrLater("Find si&milar..."),     "Ctrl+Shift+S", TrLater("Finds similar pictures in the selected folders, or in this one."), Needs::Nothing, FindSimilarInBrowser},
     {kTools, TrLater("File &history..."),     "Ctrl+H",       TrLater("Lists recently used files."), Needs::Nothing, ShowFileHistory, "history"},
     {kTools, TrLater("&Archive manager..."),  "Ctrl+Alt+A",   TrLater("Lists the selected archive, extracts from it and adds to it."), Needs::Nothing, ManageArchive},
     {kTools, TrLater("Compact &database..."), "",             TrLater("Removes deleted records from a thumbnail database."), Needs::Nothing, ShowCompaction},

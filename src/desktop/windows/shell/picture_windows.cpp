@@ -7,6 +7,7 @@
 #include "desktop/windows/metadata/exif_edit_frame.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
+#include "desktop/windows/similar/similar_frame.h"
 
 namespace fotomill::desktop {
 
@@ -62,6 +63,7 @@ void PictureWindows::FilesChanged() {
     if (auto* compare = dynamic_cast<CompareFrame*>(window)) compare->FilesChanged();
   }
   RefreshExifEditors();
+  RefreshSimilar();
 }
 
 }  // namespace fotomill::desktop
