@@ -33,6 +33,10 @@ if(left_out_modules)
   install(FILES ${CMAKE_BINARY_DIR}/plugin/left-out.txt DESTINATION lib/fotomill/plugin COMPONENT plugins)
 endif()
 
+# File managers get thumbnails of the modules' formats.
+install(FILES ${packaging_folder}/desktop/fotomill-plugins.thumbnailer DESTINATION ${CMAKE_INSTALL_DATADIR}/thumbnailers
+        COMPONENT plugins)
+
 # Examples for plug-in authors.
 install(FILES ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin.h ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin_kit.h
               ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin_exports.h ${PROJECT_SOURCE_DIR}/src/plugins/fotomill_plugin_light.h

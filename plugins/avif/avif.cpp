@@ -163,13 +163,22 @@ FMW_BLOCK FrameDelays(avifDecoder* decoder) {
   return FmwBlock(delays.data(), delays.size() * sizeof delays[0]);
 }
 
+// Some writers put "Exif" and two zeros first.
+FMW_BLOCK ExifOf(const avifImage& image) {
+  constexpr size_t kPrefix = 6;
+  const bool prefixed =
+      image.exif.size > kPrefix && memcmp(image.exif.data, "Exif\0\0", kPrefix) == 0;
+  const size_t skipped = prefixed ? kPrefix : 0;
+  return FmwBlock(image.exif.data + skipped, image.exif.size - skipped);
+}
+
 int32_t ReadMetadata(const char* fileName, const FMW_READ_REQUEST*, FMW_METADATA* metadata) {
   Decoder decoder;
   const int32_t error = Open(fileName, decoder);
   if (error != 0) return error;
   const avifImage& image = *decoder->image;
   if (image.depth > 8) metadata->lost |= FMW_LOST_DEPTH;
-  metadata->exif = FmwBlock(image.exif.data, image.exif.size);
+  metadata->exif = ExifOf(image);
   FmwSetUpright(static_cast<uint8_t*>(metadata->exif.data), metadata->exif.size);
   metadata->xmp = FmwBlock(image.xmp.data, image.xmp.size);
   metadata->icc = FmwBlock(image.icc.data, image.icc.size);

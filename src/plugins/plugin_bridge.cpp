@@ -319,6 +319,19 @@ Status DescribePluginFrames(const ReadRequest& request, PluginFrames& frames) {
   return Status::Ok;
 }
 
+bool PluginMetadata(const std::string& path, ForeignMetadata& metadata) {
+  const PluginFormat* format = PluginFormatOf(path);
+  if (format == nullptr || !format->facts->hasMetadata) return false;
+  const PicturePointer picture = NewPictureRecord({});
+  ModuleDescription description;
+  if (picture == nullptr || Describe(*format, QuestionOf(*format, {.fileName = path}), *picture, {},
+                                     description) != Status::Ok)
+    return false;
+  metadata.exif = std::move(description.exif);
+  metadata.xmp = std::move(description.xmp);
+  return true;
+}
+
 void InstallPluginConfiguration(const FMW_CONFIG_ENTRY* rows, int32_t count) {
   configuration = {rows, static_cast<size_t>(count)};
 }

@@ -1,5 +1,6 @@
 #pragma once
 
+#include "metadata/exif/foreign_metadata.h"
 #include "picture/picture_record.h"
 #include "picture/read_request.h"
 #include "picture/sequence.h"
@@ -34,6 +35,10 @@ Status PluginWriteFrames(PictureRecord& picture, const FrameFacts& frames,
 // Starts an animation.
 Status PluginSequenceBegin(const std::string& path, const SequenceFacts& facts,
                            const WriteOptions& options, SequencePointer& sequence);
+
+// The EXIF block and XMP packet that a module finds in a file of one of its extensions. Called by
+// several threads at a time.
+bool PluginMetadata(const std::string& path, ForeignMetadata& metadata);
 
 // Sets the configuration table that modules may access, in the ABI layout; not owned. Without this
 // call modules get none.

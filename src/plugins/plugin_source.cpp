@@ -5,6 +5,7 @@
 #include <mutex>
 
 #include "core/text.h"
+#include "platform/paths.h"
 #include "plugins/plugin_bridge.h"
 #include "plugins/plugin_table.h"
 #include "registry/registry.h"
@@ -59,6 +60,17 @@ std::vector<PluginLibrary> LibrariesForRegistry() {
   return libraries;
 }
 
+// A built-in format with exactly the extension of the file keeps the modules from being loaded for
+// nothing.
+bool MetadataForTags(const std::string& path, ForeignMetadata& metadata) {
+  const std::string_view extension = platform::ExtensionOf(path);
+  for (int32_t i = 0; i < kSpareRow; ++i) {
+    if (EqualIgnoringCase(FormatRow(i).extension, extension)) return false;
+  }
+  ScanOnce();
+  return PluginMetadata(path, metadata);
+}
+
 constexpr PluginSource kPluginSource = {BindForRegistry, ListForRegistry, LibrariesForRegistry};
 
 }  // namespace
@@ -68,6 +80,7 @@ void EnablePlugins(const std::string& folder) {
   scanned = false;
   pluginFolder = folder;
   InstallPluginSource(&kPluginSource);
+  InstallForeignReader(MetadataForTags);
 }
 
 }  // namespace fotomill

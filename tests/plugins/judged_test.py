@@ -109,7 +109,7 @@ def test_reading(folder):
     source = folder / "source.png"
     fotomill("convert", PROJECT / "samples/bmp-true-color.bmp", "--to", "png", "--out", source)
     run("exiftool", "-overwrite_original", "-Artist=A. N. Other", "-Orientation#=6",
-        "-XMP:Title=A title", source)
+        "-XMP-dc:Title=A title", "-DateTimeOriginal=2004:08:31 22:32:08", source)
     jpeg = folder / "source.jpg"
     fotomill("convert", source, "--to", "jpg", "--out", jpeg)
     for extension, command in [("avif", ["avifenc", "-s", "8", jpeg]), ("jxl", ["cjxl", jpeg])]:
@@ -122,6 +122,9 @@ def test_reading(folder):
         check(f"{path.name}: {info}", info["status"] == 0)
         text = json.dumps(result)
         check(f"{path.name}: no EXIF: {text}", "A. N. Other" in text)
+        found = json.loads(fotomill("find", "--json", path).stdout)[0]
+        check(f"{path.name}: not found by its tags: {found}",
+              found["taken"] == "2004-08-31 22:32:08" and found["title"] == "A title")
 
 
 def test_metadata(folder):

@@ -2,6 +2,7 @@
 
 #include "metadata/exif/exif_source.h"
 #include "metadata/exif/exif_walk.h"
+#include "metadata/exif/foreign_metadata.h"
 
 namespace fotomill {
 
@@ -27,7 +28,9 @@ int64_t TakenDate(const std::string& path) {
   ExifSource exif;
   DateFinder date;
   const bool found = exif.Open(path.c_str()) == Status::Ok && WalkExif(exif.Block(), &date);
-  return found ? date.number : 0;
+  ForeignMetadata foreign;
+  if (!found && ReadForeignMetadata(path, foreign)) (void)WalkExif(foreign.exif, &date);
+  return date.number;
 }
 
 }  // namespace fotomill

@@ -9,6 +9,7 @@
 #include "core/text.h"
 #include "core/utf8.h"
 #include "metadata/exif/exif_value.h"
+#include "metadata/exif/foreign_metadata.h"
 #include "metadata/tags/sidecar.h"
 #include "metadata/tags/tag_blocks.h"
 #include "metadata/tags/tag_words.h"
@@ -118,6 +119,19 @@ void OverlayExif(const ExifDirectories& exif, PictureTags& tags) {
   if (const int64_t date = ExifDate(exif); date != 0) tags.taken = date;
 }
 
+// What a plug-in finds in a file. Its EXIF block is laid out as a TIFF file.
+PictureTags TagsOfForeign(const std::string& path, bool exif) {
+  ForeignMetadata foreign;
+  PictureTags tags;
+  if (!ReadForeignMetadata(path, foreign)) return tags;
+  XmpTags xmp;
+  if (ReadXmpTags(foreign.xmp, xmp) == Status::Ok) OverlayXmp(xmp, tags);
+  const TagBlocks blocks = FindTagBlocks(foreign.exif);
+  if (exif) OverlayExif(blocks.exif, tags);
+  if (exif) tags.comment = UserComment(blocks.exif);
+  return tags;
+}
+
 // A text file with the comment.
 void ReadCommentFile(const std::string& path, const TagSources& sources, PictureTags& tags) {
   constexpr uint64_t kMostBytes = 64 * 1024;  // longer texts are no comments
@@ -156,6 +170,7 @@ Status ReadPictureTags(const std::string& path, const TagSources& sources, Pictu
     if (!file.Open(path)) return Status::FileOpenError;
     tags = TagsOfFile(file.Bytes(), sources.exif);
   }
+  if (tags == PictureTags()) tags = TagsOfForeign(path, sources.exif);
   if (const std::string name = FindSidecar(path); !name.empty()) {
     platform::FileView sidecar;
     XmpTags xmp;

@@ -38,7 +38,8 @@ struct TagSources {
 // Reads the tags of a picture from its metadata (XMP, IPTC, EXIF), its sidecar and its text file,
 // without decoding pixels. Where they differ, the sidecar wins; then, following the guidelines of
 // the Metadata Working Group, EXIF for description, creator and copyright; then XMP, unless another
-// program changed IPTC without updating XMP. Files without tags and files of other formats are Ok.
+// program changed IPTC without updating XMP. Plug-ins are asked about files of their formats. Files
+// without tags and files of other formats are Ok.
 // FileOpenError (1) if the picture cannot be opened. On any thread.
 Status ReadPictureTags(const std::string& path, const TagSources& sources, PictureTags& tags);
 
