@@ -26,7 +26,8 @@ class FileActions : public wxEvtHandler {
   explicit FileActions(Shell& shell);  // must outlive this object
   ~FileActions() override = default;
 
-  // Where there is no trash, asks whether to delete permanently.
+  // Moves files to the trash without asking the user. If the files' folder has no trash, nothing is
+  // moved, and a message box asks the user whether to delete them permanently.
   void Trash(const std::vector<std::string>& paths);
   // The same for a file shown in `view`, the parent of questions and messages; asks first,
   // depending on PromptDeleteFromView. `gone` is called when the file was deleted, also if it did
