@@ -9,6 +9,7 @@
 #include "batch/rewrite/edit_run.h"
 #include "desktop/models/batch/destination_choice.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/batch/destination_dialog.h"
 #include "desktop/windows/shell/browser_tabs.h"
@@ -91,7 +92,7 @@ bool SaveCopiesOf(Shell& shell, wxWindow& parent, const std::vector<std::string>
 
 bool ChangeFilesBy(Shell& shell, const std::vector<std::string>& files, const std::string& recipe) {
   const RecipePointer read = Read(recipe);
-  if (read == nullptr) return false;
+  if (read == nullptr || RefusesChange(&shell.Window(), files)) return false;
   Change(shell, files, read, {});
   return true;
 }
@@ -120,8 +121,10 @@ bool SaveCopiesOf(Shell& shell, wxWindow& parent, const FileRecipes& recipes) {
 
 bool ChangeFilesBy(Shell& shell, const FileRecipes& recipes) {
   const ReadRecipes read = ReadAll(recipes);
+  const std::vector<std::string> files = FilesOf(recipes);
   if (recipes.empty() || read.size() != recipes.size()) return false;
-  Change(shell, FilesOf(recipes), read.begin()->second, read);
+  if (RefusesChange(&shell.Window(), files)) return false;
+  Change(shell, files, read.begin()->second, read);
   return true;
 }
 
