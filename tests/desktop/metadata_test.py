@@ -162,7 +162,7 @@ def places(folder):
         desktop.wait(r"prompt place-delete")
         desktop.focus("^Delete place$", native=True)
         desktop.key("alt+d")
-        desktop.wait(r"places $")
+        desktop.wait(r"places ?$")
         assert places_of(folder) == "Home = 48.5,11.25\nLake = 45.5,-79.25\n"
         desktop.focus("^Place$")
         desktop.key("Escape")

@@ -229,7 +229,9 @@ void PlaceDialog::Remove() {
                          Label("Delete place"), wxOK | wxCANCEL | wxICON_QUESTION);
   dialog.SetOKLabel(Label("&Delete"));
   LogEvent("prompt", "place-delete");
-  if (dialog.ShowModal() == wxID_OK) Done(RemovePlace(place->name), {});
+  if (dialog.ShowModal() != wxID_OK) return;
+  Done(RemovePlace(place->name), {});
+  list_->SetFocus();  // the button may be disabled now
 }
 
 // A track may be long, so it is read in the background.
