@@ -196,7 +196,7 @@ def places(folder):
         desktop.wait(r"place All GPS values are removed")
         desktop.key("alt+s")
         assert "Latitude" not in write()
-        # The value has the focus again after writing, and can be edited on.
+        # The value keeps the focus while it is written, and can be edited on.
         desktop.focus("^Edit EXIF: one.jpg$")
         desktop.key("alt+a")
         choose(desktop, "Image title")

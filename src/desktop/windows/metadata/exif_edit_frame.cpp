@@ -247,7 +247,6 @@ void ExifEditFrame::UpdateControls() {
   const size_t files = editor_.Changeable().size();
   const bool ready = files > 0 && !writing_;
   for (const wxWindowID id : {kPlaceId, kShiftId, kOwnerId}) FindWindow(id)->Enable(ready);
-  value_->Enable(!writing_);  // what is entered now would not be written
   auto* write = static_cast<wxButton*>(FindWindow(wxID_SAVE));
   write->SetLabel(LabelCount("&Write %1 file", "&Write %1 files", std::max<size_t>(files, 1)));
   write->Enable(ready && !invalid_ && editor_.HasChanges());
@@ -256,7 +255,12 @@ void ExifEditFrame::UpdateControls() {
 
 // --- changes ---
 
+// What is entered while values are written would not be among them, so it is taken back.
 void ExifEditFrame::Entered(const std::string& text) {
+  if (writing_) {
+    wxBell();
+    return ShowSelected();
+  }
   const int selected = list_->GetSelectedRow();
   if (selected == wxNOT_FOUND) return;
   ExifEditRow& row = rows_[static_cast<size_t>(selected)];
@@ -270,6 +274,7 @@ void ExifEditFrame::Entered(const std::string& text) {
 }
 
 void ExifEditFrame::ChangeSelected(void (ExifEditor::*change)(uint16_t tag)) {
+  if (writing_) return wxBell();
   const int selected = list_->GetSelectedRow();
   if (selected == wxNOT_FOUND) return;
   (editor_.*change)(rows_[static_cast<size_t>(selected)].tag);
@@ -350,7 +355,6 @@ void ExifEditFrame::Write() {
     return EditExifFile(source, destination, changer, request, options);
   };
   writing_ = true;
-  focus_ = wxWindow::FindFocus();
   UpdateControls();
   LogEvent("exif-edit", "writing");
   RunRewriteBatch(shell_, editor_.Changeable(), std::move(function), {}, alive_,
@@ -361,8 +365,6 @@ void ExifEditFrame::Written(bool errors) {
   writing_ = false;
   if (!errors) editor_.Clear();
   UpdateControls();
-  // a control that was disabled has lost the focus
-  if (IsActive() && focus_ != nullptr && value_->IsDescendant(focus_)) focus_->SetFocus();
   Read();
 }
 

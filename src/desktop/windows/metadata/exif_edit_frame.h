@@ -1,7 +1,5 @@
 #pragma once
 
-#include <wx/weakref.h>
-
 #include <memory>
 #include <string>
 #include <vector>
@@ -57,7 +55,6 @@ class ExifEditFrame : public ToolFrame, public HoldsWork {
   std::vector<ExifEditRow> rows_;  // of the list
   bool invalid_ = false;           // the value in the panel
   bool writing_ = false;
-  wxWeakRef<wxWindow> focus_;  // when writing began
   wxStaticText* problem_ = nullptr;
   wxSearchCtrl* search_ = nullptr;
   wxCheckBox* all_ = nullptr;
