@@ -74,10 +74,4 @@ void HandleQuickActions(wxFrame& frame, Shell& shell, std::function<bool()> can,
   });
 }
 
-int QuickActionOfKey(const wxKeyEvent& event) {
-  const int place = event.GetKeyCode() - '1';
-  const bool known = place >= 0 && place < static_cast<int>(QuickActions().size());
-  return event.ControlDown() && event.AltDown() && known ? kFirstQuickId + place : wxID_NONE;
-}
-
 }  // namespace fotomill::desktop

@@ -7,7 +7,6 @@
 #include <vector>
 
 class wxFrame;
-class wxKeyEvent;
 class wxMenu;
 
 namespace fotomill::desktop {
@@ -22,10 +21,6 @@ wxMenu* NewQuickMenu();
 // without questions; can be undone. They are enabled while `can` is true.
 void HandleQuickActions(wxFrame& frame, Shell& shell, std::function<bool()> can,
                         std::function<std::vector<std::string>()> files);
-
-// The ID of the quick action that a key stands for, wxID_NONE if none. For windows that may have no
-// visible menu bar.
-int QuickActionOfKey(const wxKeyEvent& event);
 
 // The ID of an action, by its index in QuickActions.
 inline constexpr int kFirstQuickId = wxID_HIGHEST + 5000;

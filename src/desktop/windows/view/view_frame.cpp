@@ -484,7 +484,6 @@ void ViewFrame::OnKey(wxKeyEvent& event) {
   if (key == WXK_RIGHT || key == WXK_DOWN) return Step(1);
   if (event.ShiftDown() && key == 'S') return ChooseSlideshow();
   if (event.AltDown() && key == WXK_RETURN) return ShowInfoOf(*this);
-  if (const int id = QuickActionOfKey(event); id != wxID_NONE) return (void)ProcessCommand(id);
   if (event.AltDown() || (event.ShiftDown() && key >= '0' && key <= '9')) return event.Skip();
   // Some letters with Ctrl have the same codes as other keys.
   constexpr int kLettersWithCtrl[] = {'C', 'S', 'Y', 'Z'};
