@@ -33,11 +33,12 @@ ListedThumbnails& Listed() {
   return listed;
 }
 
+// With the filter of records, so that a cell looks the same when its copy is shown.
 Status ScaleDown(const PackedImage& image, int32_t side, RgbImage& pixels) {
   if (image.Width() <= side && image.Height() <= side) return ToRgb(image, pixels);
   PackedImage scaled, noAlpha, noScaledAlpha;
   RETURN_IF_BAD(ScaleFiltered(image, noAlpha, FitSize(image.Width(), image.Height(), side),
-                              ScaleFilter::Bicubic, scaled, noScaledAlpha));
+                              ScaleFilter::Lanczos, scaled, noScaledAlpha));
   return ToRgb(scaled, pixels);
 }
 
