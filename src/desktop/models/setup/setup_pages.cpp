@@ -6,7 +6,10 @@
 
 #include "core/text.h"
 #include "desktop/models/setup/setup_help.h"
+#include "processing/faces/face_finder.h"
+#include "processing/faces/face_options.h"
 #include "registry/registry.h"
+#include "settings/job_options.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -255,9 +258,14 @@ consteval bool EveryItemIsShownOnce() {
 }
 static_assert(EveryItemIsShownOnce());
 
-// The rows above, plus a page with the settings of formats, one group per format.
+// The rows above, but those of faces only if the detector is installed, plus a page with the
+// settings of formats, one group per format.
 std::vector<SetupItem> WithSettingsOfFormats() {
   std::vector<SetupItem> items(std::begin(kItems), std::end(kItems));
+  if (!CanFindFaces({}) && !CanFindFaces(FaceOptionsFromSettings())) {
+    std::erase_if(items,
+                  [](const SetupItem& item) { return item.group == std::string_view("Faces"); });
+  }
   auto place =
       std::ranges::find_if(items, [](const SetupItem& item) { return item.page > FormatOptions; });
   for (const FormatSettings* const codec : SettingsOfFormats()) {

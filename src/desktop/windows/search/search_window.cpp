@@ -88,7 +88,7 @@ class SearchWindow : public wxDialog {
   wxTextCtrl* texts_[std::size(kFields)] = {};
   wxChoice* rating_ = nullptr;
   wxTextCtrl* taken_ = nullptr;
-  wxCheckBox* faces_ = nullptr;
+  wxCheckBox* faces_ = nullptr;  // null if the face detector is not installed
   wxCheckBox* damaged_ = nullptr;
   wxChoice* mode_ = nullptr;
   wxCheckBox* remember_ = nullptr;
@@ -236,16 +236,12 @@ wxSizer* SearchWindow::Options() {
     options->Add(check);
     return check;
   };
-  faces_ = box(TrLater("With &faces"), settings.PictureFaceDetectMatch != 0);
+  if (CanFindFaces(FactsOptionsFromSettings().faces))
+    faces_ = box(TrLater("With &faces"), settings.PictureFaceDetectMatch != 0);
   remember_ = box(TrLater("Re&member the folder"), settings.PictureSearchPreservePath != 0);
   damaged_ = box(TrLater("&Damaged files only"), false);
   replace_ = box(TrLater("Re&place the last results"), settings.PictureSearchClearList != 0);
   select_ = box(TrLater("Se&lect the pictures found"), settings.PictureSearchTagAfterSearch != 0);
-  if (!CanFindFaces(FactsOptionsFromSettings().faces)) {
-    faces_->SetValue(false);
-    faces_->Disable();
-    faces_->SetToolTip(Label("The face detector is not installed."));
-  }
   return options;
 }
 
@@ -280,7 +276,7 @@ void SearchWindow::StoreControls() {
     settings.*kFields[i].on = checks_[i]->GetValue() ? 1 : 0;
     (settings.*kFields[i].text).AssignCut(Utf8(texts_[i]->GetValue()));
   }
-  settings.PictureFaceDetectMatch = faces_->GetValue() ? 1 : 0;
+  if (faces_ != nullptr) settings.PictureFaceDetectMatch = faces_->GetValue() ? 1 : 0;
   settings.PictureSearchMode = mode_->GetSelection();
   settings.PictureSearchPreservePath = remember_->GetValue() ? 1 : 0;
   settings.PictureSearchClearList = replace_->GetValue() ? 1 : 0;
@@ -291,6 +287,7 @@ void SearchWindow::StoreControls() {
 // False after showing what is wrong.
 bool SearchWindow::ReadCriteria(SearchCriteria& criteria) {
   criteria = SearchCriteriaFromSettings();
+  criteria.faces = faces_ != nullptr && faces_->GetValue();
   criteria.damaged = damaged_->GetValue();
   if (rating_->GetSelection() > 0)
     criteria.rating = NumberRange{rating_->GetSelection(), kMostStars};
