@@ -29,7 +29,7 @@ TEST(JumpSearch, MatchesWordsOrPhrases) {
       {"beach at night.jpg", "t n", kPhraseAnywhere, true},
       {"beach at night.jpg", "ni be", kPhraseAnywhere, false},
       {"banana.jpg", "na", kWordStarts, false},
-      {"a-na.jpg", "na", kWordStarts, true},  // not the first, but the second place
+      {"banana na.jpg", "na", kWordStarts, true},  // not at the first place, but later
       {"IMG_2041.jpg", "2041", kWordStarts, true},
       {"IMG2041.jpg", "2041", kWordStarts, true},
       {"IMG2041.jpg", "041", kWordStarts, false},
@@ -54,6 +54,7 @@ TEST(JumpSearch, ListsShownItemsInOrder) {
   ASSERT_EQ(found.size(), 4u);
   EXPECT_EQ(found[0].name, "b1.jpg");
   EXPECT_EQ(found[3].name, "sub/b9.jpg") << "found by its own name";
+  EXPECT_TRUE(JumpTargets(model, "sub", {}).empty()) << "not by its folder";
   model.SetFilter("b2");
   EXPECT_EQ(JumpTargets(model, "b", {}).size(), 1u) << "hidden files are not found";
 }

@@ -47,15 +47,13 @@ bool ChangeLines(std::string& list, std::string_view name,
   return found;
 }
 
+// `edit` leaves the list alone if it returns a problem.
 std::string Edit(const std::function<std::string(std::string& list)>& edit) {
   const std::string path = LocationsPath();
   if (path.empty()) return Tr("There is no data folder.");
   std::string problem;
-  const EditResult result = EditTextFile(path, limits.listFileBytes, [&](std::string& list) {
-    std::string edited = list;
-    problem = edit(edited);
-    if (problem.empty()) list = edited;
-  });
+  const EditResult result = EditTextFile(path, limits.listFileBytes,
+                                         [&](std::string& list) { problem = edit(list); });
   if (!problem.empty()) return problem;
   if (result == EditResult::NotRead) return WithReason(Tr("\"%1\" cannot be read.", path));
   if (result == EditResult::Failed) return WithReason(Tr("\"%1\" cannot be written.", path));
