@@ -42,6 +42,9 @@ PageRun::PageRun(std::span<const BatchFile> files, const PageRunOptions& options
     : files_(files), options_(options), host_(std::move(host)), outcomes_(files.size()) {}
 
 bool PageRun::Open() {
+  opened_ = false;
+  pictures_.clear();
+  outcomes_.assign(files_.size(), {});
   std::vector<PagePicture> pictures(files_.size());
   OrderedRun run({.work =
                       [&](size_t i) {
@@ -68,6 +71,16 @@ bool PageRun::Open() {
                       }});
   run.Run(files_.size(), options_.jobs == 0 ? platform::CoreCount() : options_.jobs);
   if (!GoesOn()) return false;
+  opened_ = true;
+  MakePages();
+  return true;
+}
+
+bool PageRun::Change(const PageRunOptions& options) {
+  const bool known = opened_ && options.texts == options_.texts &&
+                     options.reading.upright == options_.reading.upright;
+  options_ = options;
+  if (!known) return Open();
   MakePages();
   return true;
 }
@@ -80,6 +93,7 @@ void PageRun::Fail(size_t file, Status status) {
 
 void PageRun::MakePages() {
   pages_.clear();
+  for (PageOutcome& outcome : outcomes_) outcome.page = 0;
   if (!pictures_.empty()) pages_ = options_.generator(pictures_);
   for (size_t page = 0; page < pages_.size(); ++page) {
     for (const PageItem& item : pages_[page].items) {
@@ -150,7 +164,6 @@ Status PageRun::WritePictures(PdfDocument& document) {
   std::erase_if(pictures_, [this](const PagePicture& picture) {
     return outcomes_[picture.id].status != Status::Ok;
   });
-  for (PageOutcome& outcome : outcomes_) outcome.page = 0;
   MakePages();
   return Status::Ok;
 }

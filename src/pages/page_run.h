@@ -54,6 +54,9 @@ class PageRun {
   // Reads the facts of all pictures, in parallel, and makes the pages. False if the run was
   // canceled.
   bool Open();
+  // Makes the pages with other options. Facts that do not depend on what has changed are not read
+  // again. False as above.
+  bool Change(const PageRunOptions& options);
   // The pages, without failed pictures. Empty if there are none.
   const std::vector<Page>& Pages() const { return pages_; }
   // By file.
@@ -78,11 +81,12 @@ class PageRun {
   Status WritePictures(PdfDocument& document);
 
   std::span<const BatchFile> files_;
-  const PageRunOptions options_;
+  PageRunOptions options_;
   const PageRunHost host_;
   std::vector<PagePicture> pictures_;  // of readable files
   std::vector<PageOutcome> outcomes_;
   std::vector<Page> pages_;
+  bool opened_ = false;
 };
 
 }  // namespace fotomill

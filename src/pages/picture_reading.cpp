@@ -33,7 +33,8 @@ Status ReadPageFacts(const std::string& file, const PagePictureOptions& options,
   picture.name = platform::FileNameOf(file);
   picture.width = swap ? record->height : record->width;
   picture.height = swap ? record->width : record->height;
-  picture.dpi = record->metadata.dpiX;
+  picture.dpi = swap ? record->metadata.dpiY : record->metadata.dpiX;
+  picture.dpiDown = swap ? record->metadata.dpiX : record->metadata.dpiY;
   picture.bits = record->bitsPerPixel;
   return picture.width > 0 && picture.height > 0 ? Status::Ok : Status::DamagedFile;
 }

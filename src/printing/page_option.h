@@ -22,13 +22,15 @@ enum class PageOptionKind {
 struct PageOption {
   const char* name;  // "grid"
   PageOptionKind kind = PageOptionKind::Flag;
-  const char* label = nullptr;    // in a window; a flag's is its help
+  const char* label = nullptr;    // in a window; null for a flag: its help
   const char* shownAs = nullptr;  // stands for the value in the command line's help
   const char* help = nullptr;
   const char* usual = "";  // the value if none is given
+  const char* hint = "";   // shown in the empty field of a window: such a value
   int32_t least = 0, most = 0;
-  std::initializer_list<const char*> choices = {};   // an array that lives as long as the program
-  std::vector<std::string> (*examples)() = nullptr;  // values to offer for a text; null: none
+  std::initializer_list<const char*> choices = {};  // an array that lives as long as the program
+  std::initializer_list<const char*> choiceLabels = {};  // in a window, likewise
+  std::vector<std::string> (*examples)() = nullptr;      // values to offer for a text; null: none
 };
 
 // Values of options by name, as text. Options without value, or with an empty one, are not given.

@@ -12,7 +12,8 @@ namespace {
 
 constexpr int32_t kMostCopies = 10000;
 constexpr double kMargin = 5;
-constexpr std::initializer_list<const char*> kFits{"fill", "fit"};
+constexpr std::initializer_list<const char*> kFits{"fill", "fit"},
+    kFitLabels{TrLater("Crop to the size"), TrLater("Show all of them")};
 
 double Margin() { return settings.PhotoPrnMargin > 0 ? settings.PhotoPrnMargin : kMargin; }
 std::vector<std::string> SizeNames() { return NamesOf(PrintSizes()); }
@@ -77,10 +78,10 @@ constexpr PageOption kOptions[] = {
     {.name = "copies", .kind = PageOptionKind::Number, .label = TrLater("Copies"), .shownAs = "N",
      .help = TrLater("Copies of each print"), .usual = "1", .least = 1, .most = kMostCopies},
     {.name = "gap", .kind = PageOptionKind::Text, .label = TrLater("Space between"), .shownAs = "LENGTH",
-     .help = TrLater("Space between prints (default: none)")},
+     .help = TrLater("Space between prints (default: none)"), .hint = "0mm"},
     {.name = "fit", .kind = PageOptionKind::Choice, .label = TrLater("Pictures"), .shownAs = "HOW",
      .help = TrLater("fill (default) crops pictures to the size, fit shows all of them"), .usual = "fill",
-     .choices = kFits},
+     .choices = kFits, .choiceLabels = kFitLabels},
     {.name = "no-cut-lines", .help = TrLater("Leave out the lines to cut along")},
 };
 // clang-format on

@@ -16,6 +16,10 @@ constexpr double kLineSpacing = 1.2;
 constexpr std::initializer_list<const char*> kPositions{"center",    "top",         "bottom",
                                                         "left",      "right",       "top-left",
                                                         "top-right", "bottom-left", "bottom-right"};
+constexpr std::initializer_list<const char*> kPositionLabels{
+    TrLater("Center"),    TrLater("Top"),         TrLater("Bottom"),
+    TrLater("Left"),      TrLater("Right"),       TrLater("Top left"),
+    TrLater("Top right"), TrLater("Bottom left"), TrLater("Bottom right")};
 constexpr const char* kSizeWords[] = {"fit", "fill", "actual"};
 
 double Margin() { return 10; }
@@ -154,20 +158,24 @@ constexpr PageOption kOptions[] = {
                      "PrintWorkshopSizeMode)"),
      .examples = SizeExamples},
     {.name = "position", .kind = PageOptionKind::Choice, .label = TrLater("Position"), .shownAs = "WHERE",
-     .help = TrLater("Position on the page"), .choices = kPositions},
+     .help = TrLater("Position on the page"), .choices = kPositions,
+     .choiceLabels = kPositionLabels},
     {.name = "no-turn", .help = TrLater("Do not turn the page for wide pictures")},
     {.name = "names", .help = TrLater("Print the file names")},
     {.name = "title", .kind = PageOptionKind::Text, .label = TrLater("Title"), .shownAs = "TEXT",
      .help = TrLater("Text above each picture; may contain macros")},
-    {.name = "titles", .help = TrLater("Print the text of PrintTitleText above")},
+    {.name = "titles", .label = TrLater("Title from Setup"),
+     .help = TrLater("Print the text of PrintTitleText above")},
     {.name = "comment", .kind = PageOptionKind::Text, .label = TrLater("Comment"), .shownAs = "TEXT",
      .help = TrLater("Text below each picture, as above")},
-    {.name = "comments", .help = TrLater("Print the text of PrintWorkshopComment below")},
+    {.name = "comments", .label = TrLater("Comment from Setup"),
+     .help = TrLater("Print the text of PrintWorkshopComment below")},
     {.name = "rule", .kind = PageOptionKind::Text, .label = TrLater("Line"), .shownAs = "WIDTH",
-     .help = TrLater("Line around pictures, such as 1pt or 0.5mm")},
+     .help = TrLater("Line around pictures, such as 1pt or 0.5mm"), .hint = "1pt"},
     {.name = "matte", .kind = PageOptionKind::Text, .label = TrLater("Border"), .shownAs = "WIDTH",
-     .help = TrLater("Border around pictures in the color PrintWorkshopMattColor")},
-    {.name = "crop-marks", .help = TrLater("Print marks at the corners to cut along")},
+     .help = TrLater("Border around pictures in the color PrintWorkshopMattColor"), .hint = "5mm"},
+    {.name = "crop-marks", .label = TrLater("Crop marks at the corners"),
+     .help = TrLater("Print marks at the corners to cut along")},
 };
 // clang-format on
 

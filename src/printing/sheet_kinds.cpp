@@ -14,7 +14,8 @@ namespace {
 
 constexpr double kSheetDpi = 300;  // pictures on sheets have at most this resolution
 constexpr int32_t kFewest = 1, kMost = 100;
-constexpr std::initializer_list<const char*> kFrames{"none", "flat"};
+constexpr std::initializer_list<const char*> kFrames{"none", "flat"},
+    kFrameLabels{TrLater("No frame"), TrLater("Lines")};
 
 double Margin() { return 10; }
 
@@ -85,16 +86,17 @@ std::string CompleteCatalog(const PageValues& values, const PageSetup& setup, Pa
 // clang-format off
 constexpr PageOption kContactOptions[] = {
     {.name = "grid", .kind = PageOptionKind::Text, .label = TrLater("Columns x rows"), .shownAs = "CxR",
-     .help = TrLater("Columns and rows (default: CatalogPortraitWide and so on, else 4x5 or 5x4)")},
+     .help = TrLater("Columns and rows (default: CatalogPortraitWide and so on, else 4x5 or 5x4)"), .hint = "4x5"},
     {.name = "frame", .kind = PageOptionKind::Choice, .label = TrLater("Frames"), .shownAs = "HOW",
-     .help = TrLater("Line around each picture: none (default) or flat"), .usual = "none", .choices = kFrames},
+     .help = TrLater("Line around each picture: none (default) or flat"), .usual = "none", .choices = kFrames,
+     .choiceLabels = kFrameLabels},
     {.name = "background", .kind = PageOptionKind::Text, .label = TrLater("Page color"), .shownAs = "RRGGBB",
-     .help = TrLater("Page color (default: FFFFFF)")},
+     .help = TrLater("Page color (default: FFFFFF)"), .hint = "FFFFFF"},
     {.name = "no-names", .help = TrLater("Leave out the file names")},
 };
 constexpr PageOption kCatalogOptions[] = {
     {.name = "grid", .kind = PageOptionKind::Text, .label = TrLater("Columns x rows"), .shownAs = "CxR",
-     .help = TrLater("Columns and rows (default: 3x4, on landscape paper 4x3)")},
+     .help = TrLater("Columns and rows (default: 3x4, on landscape paper 4x3)"), .hint = "3x4"},
     {.name = "details", .kind = PageOptionKind::Text, .label = TrLater("Details"), .shownAs = "TEXT",
      .help = TrLater("Text below each name; may contain macros (default: %W x %H)"), .usual = "%W x %H"},
     {.name = "footer", .kind = PageOptionKind::Text, .label = TrLater("Footer"), .shownAs = "TEXT",

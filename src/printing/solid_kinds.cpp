@@ -106,15 +106,16 @@ constexpr PageOption kPosterOptions[] = {
     {.name = "size", .kind = PageOptionKind::Text, .label = TrLater("Size"), .shownAs = "SIZE",
      .help = TrLater("Size to fit into, such as 60x40cm or A1"), .examples = PosterSizes},
     {.name = "grid", .kind = PageOptionKind::Text, .label = TrLater("Sheets"), .shownAs = "CxR",
-     .help = TrLater("Sheets across and down (default: two across, or PrintPosterSize)")},
+     .help = TrLater("Sheets across and down (default: two across, or PrintPosterSize)"), .hint = "2x2"},
     {.name = "overlap", .kind = PageOptionKind::Text, .label = TrLater("Overlap"), .shownAs = "LENGTH",
-     .help = TrLater("Overlap of neighboring sheets (default: 10mm)")},
+     .help = TrLater("Overlap of neighboring sheets (default: 10mm)"), .hint = "10mm"},
     {.name = "no-cut-lines", .help = TrLater("Leave out the lines to cut along")},
-    {.name = "no-sketch", .help = TrLater("Leave out the page that shows how the sheets fit together")},
+    {.name = "no-sketch", .label = TrLater("Leave out the assembly sketch"),
+     .help = TrLater("Leave out the page that shows how the sheets fit together")},
 };
 constexpr PageOption kCutoutOptions[] = {
     {.name = "size", .kind = PageOptionKind::Text, .label = TrLater("Edges"), .shownAs = "LENGTH",
-     .help = TrLater("Length of the edges, such as 5cm (default: as long as the paper allows)")},
+     .help = TrLater("Length of the edges, such as 5cm (default: as long as the paper allows)"), .hint = "5cm"},
 };
 // clang-format on
 

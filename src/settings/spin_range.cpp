@@ -28,6 +28,9 @@ constexpr KeyRange kRanges[] = {
     {KeyNumber::MaximumPreviewDimension,       {16, 65535, 16}},  // pixels
     {KeyNumber::MovieQualityFactor,            {0, 10000, 100}},
     {KeyNumber::PngCompression,                {0, 9,     1}},    // deflate level
+    {KeyNumber::PrintBrightness,               {-100, 100, 1}},
+    {KeyNumber::PrintContrast,                 {-100, 100, 1}},
+    {KeyNumber::PrintFontSize,                 {4, 72,    1}},    // points
     {KeyNumber::TiffResolution,                {1, 32767, 1}},    // dots per inch
     {KeyNumber::UndoLevels,                    {0, 1000,  1}},
     {KeyNumber::WebPQualityFactor,             {0, 100,   1}},

@@ -169,6 +169,7 @@ WINDOWS = [
     ("ctrl+shift+s", r"prompt similar", "Find similar pictures"),
     ("ctrl+h", r"history rows=", "File history"),
     ("ctrl+k", r"finder found=", "Find command"),
+    ("ctrl+p", r"pages-preview", "Print and pages: 2 pictures"),
     ("tools compact", None, "Compact thumbnail database"),
     ("tools clean", r"cleanup orphans=", "Clean up thumbnails"),
     ("tools plug", None, "Plug-ins"),

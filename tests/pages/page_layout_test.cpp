@@ -229,15 +229,20 @@ TEST(PhotoPages, PrintsMeasureWhatTheySay) {
 }
 
 TEST(PrintPages, Sizes) {
-  const PagePicture picture{.width = 600, .height = 400, .dpi = 200};
+  PagePicture picture{.width = 600, .height = 400, .dpi = 200};
   const struct {
     const char* name;
     PrintOptions options;
     Box box;
+    double dpiDown = 0;
   } rows[] = {
       {"fit", {.turnPage = false}, {10, 148.5 - 190 / 3.0, 190, 190 * 2 / 3.0}},
       {"the page lies", {}, {148.5 - 277 / 2.0, 105 - 277 / 3.0, 277, 277 * 2 / 3.0}},
       {"actual", {.sizing = PrintSizing::Actual, .turnPage = false}, {66.9, 123.1, 76.2, 50.8}},
+      {"actual, pixels that are not square",
+       {.sizing = PrintSizing::Actual, .turnPage = false},
+       {66.9, 135.8, 76.2, 25.4},
+       400},
       {"half",
        {.sizing = PrintSizing::Percent, .percent = 50, .turnPage = false},
        {85.95, 135.8, 38.1, 25.4}},
@@ -255,6 +260,7 @@ TEST(PrintPages, Sizes) {
   };
   for (const auto& row : rows) {
     SCOPED_TRACE(row.name);
+    picture.dpiDown = row.dpiDown;
     const std::vector<Page> pages = PrintPages(row.options, {&picture, 1});
     ASSERT_EQ(pages.size(), 1u);
     ExpectBox(PlaceOf(FirstPicture(pages[0])), row.box);

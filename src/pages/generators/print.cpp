@@ -23,7 +23,8 @@ bool WholeDots(const PrintOptions& options, const PagePicture& picture) {
 // The size of a picture in millimeters, given the room for it.
 PaperSize SizeOf(const PrintOptions& options, const PagePicture& picture, const Box& room) {
   const double dpi = picture.dpi > 0 ? picture.dpi : options.dpi;
-  const PaperSize actual{picture.width / dpi * kMmPerInch, picture.height / dpi * kMmPerInch};
+  const double down = picture.dpi > 0 && picture.dpiDown > 0 ? picture.dpiDown : dpi;
+  const PaperSize actual{picture.width / dpi * kMmPerInch, picture.height / down * kMmPerInch};
   Box box = room;
   if (options.sizing == PrintSizing::Actual || options.sizing == PrintSizing::Percent) {
     const double factor = options.sizing == PrintSizing::Percent ? options.percent / 100 : 1;

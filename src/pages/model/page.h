@@ -90,6 +90,7 @@ struct PagePicture {
   int32_t width = 0, height = 0;  // pixels, upright
   int32_t bits = 24;              // per pixel
   double dpi = 0;                 // pixels per inch; 0: unknown
+  double dpiDown = 0;             // the same from top to bottom; 0: as across
   // texts for it, macros expanded: whatever the generator's options ask for
   std::vector<std::string> texts = {};
 };

@@ -17,7 +17,7 @@
 #include "platform/paths.h"
 #include "platform/process.h"
 #include "platform/temporary_file.h"
-#include "texts/status_text.h"
+#include "printing/page_failure.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
 
@@ -27,9 +27,6 @@ namespace {
 
 constexpr int32_t kMostDpi = 2400;
 constexpr double kUsualDpi = 300;  // of pages that are pictures
-constexpr const char* kNoFont = TrLater(
-    "Text needs a font, fontconfig and HarfBuzz: packages fonts-dejavu-core, libfontconfig1 and "
-    "libharfbuzz-subset0.");
 
 bool IsPdf(std::string_view name) { return EqualIgnoringCase(name, "pdf"); }
 
@@ -100,15 +97,8 @@ class PageWriter {
     }
     const Status status =
         run.WritePdf(path, replace ? platform::Existing::Replace : platform::Existing::Refuse);
-    Explain(status, path);
+    hint_ = PageFailureHint(status, path);
     return status;
-  }
-
-  void Explain(Status status, const std::string& path) {
-    if (status == Status::ErrorCreatingFile)
-      hint_ = WithReason(Tr("\"%1\" cannot be created.", path));
-    if (status == Status::ErrorWritingFile) hint_ = ReasonSentence();
-    if (status == Status::ResourceError) hint_ = Tr(kNoFont);
   }
 
   // A document under the first free number.
@@ -127,7 +117,7 @@ class PageWriter {
     platform::TemporaryFile file;
     if (!file.Create(".pdf")) return Status::ErrorCreatingFile;
     const Status status = run.WritePdf(file.Path(), platform::Existing::Replace);
-    Explain(status, file.Path());
+    hint_ = PageFailureHint(status, file.Path());
     if (status != Status::Ok || run.Pages().empty()) return status;
     output_.MakeWay();
     const auto result = platform::RunAndWait(
@@ -146,7 +136,7 @@ class PageWriter {
       if (page == nullptr) return Status::MemoryAllocationError;
       if (!options_.dryRun) {
         const Status drawn = run.DrawPage(i, dpi, page->image);
-        if (drawn == Status::ResourceError) hint_ = Tr(kNoFont);
+        hint_ = PageFailureHint(drawn, {});
         RETURN_IF_BAD(drawn);
         page->width = page->image.Width();
         page->height = page->image.Height();
@@ -155,7 +145,7 @@ class PageWriter {
       page->metadata.dpiX = page->metadata.dpiY = dpi;
       const CatalogPageOptions write{.dryRun = options_.dryRun, .prefix = plan_.prefix};
       const Status status = WriteCatalogPage(*page, write, job_, destinations_[i]);
-      Explain(status, destinations_[i]);
+      hint_ = PageFailureHint(status, destinations_[i]);
       RETURN_IF_BAD(status);
       pagesWritten_ = i + 1;
     }

@@ -196,6 +196,28 @@ constexpr SetupItem kItems[] = {
     Item(Captions,   TrLater("Mattes"),            MattUseOuterBorder,            "Draw an outer border"),
     Item(Captions,   TrLater("Mattes"),            MattOuterBorderSize,           "Width of the outer border, in pixels"),
     Item(Captions,   TrLater("Mattes"),            MattOuterBorderColor,          "Color of the outer border"),
+    Item(Printing,   TrLater("Window"), PhotoPrnPreview, "Show a preview of the pages"),
+    Item(Printing,   TrLater("Texts"), PrintFontName, "Font"),
+    Item(Printing,   TrLater("Texts"), PrintFontSize, "Font size in points"),
+    Item(Printing,   TrLater("Single prints"), PrintTitleText, "Title"),
+    Item(Printing,   TrLater("Single prints"), PrintWorkshopComment, "Comment"),
+    Item(Printing,   TrLater("Single prints"), PrintBrightness, "Brightness, -100 to 100"),
+    Item(Printing,   TrLater("Single prints"), PrintContrast, "Contrast, -100 to 100"),
+    Item(Printing,   TrLater("Single prints"), PrintBackground, "Page color"),
+    Item(Printing,   TrLater("Single prints"), PrintWorkshopMattColor, "Color of the border"),
+    Item(Printing,   TrLater("Single prints"), PrintWorkshopRuleColor, "Color of the line"),
+    Item(Printing,   TrLater("Single prints"), PrintWorkshopRuleShade, "Draw a shadow of the line"),
+    Item(Printing,   TrLater("Single prints"), PrintWorkshopPrepress, "Print register marks"),
+    Item(Printing,   TrLater("Single prints"), PrintIntegral, "Whole numbers of dots per pixel"),
+    Item(Printing,   TrLater("Single prints"), ExpandPrintedHalftones, "The same for black-and-white pictures only"),
+    Item(Printing,   TrLater("Photo prints"), PhotoPrnCutlineColor, "Color of the cut lines"),
+    Item(Printing,   TrLater("Catalog"), GrafcatFontName, "Font"),
+    Item(Printing,   TrLater("Catalog"), GrafcatFrameTitle, "Names in a bar above the pictures"),
+    Item(Printing,   TrLater("Catalog"), GrafcatBackground, "Page color"),
+    Item(Printing,   TrLater("Poster"), PrintPosterCutlineColor, "Color of the cut lines"),
+    Item(Printing,   TrLater("Cube and dodecahedron"), PrintDodecDashedLines, "Dash the lines to fold along"),
+    Item(Printing,   TrLater("Cube and dodecahedron"), PrintDodecForeground, "Color of the lines"),
+    Item(Printing,   TrLater("Cube and dodecahedron"), PrintDodecBackground, "Page color"),
     Item(Metadata,   TrLater("EXIF"),               ExifShowTypes,                  "Show value types"),
     Item(Metadata,   TrLater("Edit EXIF"),          ExifConfirmWrite,               "Ask before values are written"),
     Item(Metadata,   TrLater("Edit EXIF"),          ExifConfirmAddNew,              "Ask before tags are added"),
@@ -243,8 +265,8 @@ constexpr SetupItem kItems[] = {
 constexpr const char* kTitles[] = {
     TrLater("Browsing"), TrLater("Thumbnails"), TrLater("Viewing"), TrLater("Batches"),
     TrLater("Saving"), TrLater("Format options"), TrLater("File names"), TrLater("Colors"),
-    TrLater("Captions and mattes"), TrLater("EXIF and info"), TrLater("Archives"),
-    TrLater("File history"), TrLater("Formats"), TrLater("Keyboard")};
+    TrLater("Captions and mattes"), TrLater("Printing"), TrLater("EXIF and info"),
+    TrLater("Archives"), TrLater("File history"), TrLater("Formats"), TrLater("Keyboard")};
 static_assert(std::size(kTitles) == kSetupPageCount);
 
 consteval bool EveryItemIsShownOnce() {

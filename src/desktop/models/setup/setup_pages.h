@@ -20,13 +20,14 @@ enum class SetupPage {
   Names,
   Colors,
   Captions,
+  Printing,
   Metadata,
   Archives,
   History,
   Formats,
   Keyboard  // has no settings but the keys of commands
 };
-inline constexpr size_t kSetupPageCount = 14;
+inline constexpr size_t kSetupPageCount = 15;
 // Title of a page, in English.
 const char* TitleOf(SetupPage page);
 

@@ -18,6 +18,7 @@
 #include "desktop/windows/metadata/exif_edit_frame.h"
 #include "desktop/windows/metadata/file_time_dialog.h"
 #include "desktop/windows/metadata/strip_dialog.h"
+#include "desktop/windows/pages/pages_frame.h"
 #include "desktop/windows/search/search_window.h"
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/folder_pane.h"
@@ -134,6 +135,11 @@ template <Family family>
 void EditWith(Shell& shell) {
   EditSelectionWith(shell, family);
 }
+void Print(Shell& shell) { PrintSelection(shell, "print"); }
+void MakeContactSheet(Shell& shell) { PrintSelection(shell, "contact"); }
+void MakeCatalog(Shell& shell) { PrintSelection(shell, "catalog"); }
+void MakePhotoPrints(Shell& shell) { PrintSelection(shell, "photo"); }
+void MakePoster(Shell& shell) { PrintSelection(shell, "poster"); }
 void NewTab(Shell& shell) { shell.Tabs().Open(shell.Tabs().CurrentFolder()); }
 void CloseTab(Shell& shell) { shell.Tabs().Close(); }
 void ReopenTab(Shell& shell) { shell.Tabs().Reopen(); }
@@ -204,6 +210,8 @@ constexpr Command kCommands[] = {
     {kFile, TrLater("T&ab sets..."),         "",             TrLater("Opens a saved set of tabs."), Needs::Nothing, OpenTabSet},
     {kFile, nullptr},
     {kFile, TrLater("New &folder..."),      "Ctrl+Shift+N", TrLater("Creates a folder in this folder."), Needs::Nothing, NewFolder, nullptr, false, nullptr, nullptr, false, FolderPlace::Top},
+    {kFile, nullptr},
+    {kFile, TrLater("&Print..."),           "Ctrl+P",       TrLater("Prints the selected pictures, or saves them as PDF."), Needs::Files, Print},
     {kFile, nullptr},
     {kFile, TrLater("&Quit"),               "Ctrl+Q",       TrLater("Quits the program."), Needs::Nothing, Quit},
 
@@ -284,6 +292,11 @@ constexpr Command kCommands[] = {
     {kFunctions, TrLater("Matt..."),        "",             TrLater("Adds frames and borders to the selected pictures."), Needs::Files, EditWith<Family::Matt>, "matt"},
     {kFunctions, TrLater("Rotate &left"),   "Ctrl+Alt+L",   TrLater("Rotates the selected files; JPEG losslessly."), Needs::Files, Turn<Orientation::QuarterLeft>, nullptr, true},
     {kFunctions, TrLater("Rotate r&ight"),  "Ctrl+Alt+R",   TrLater("Rotates the selected files; JPEG losslessly."), Needs::Files, Turn<Orientation::QuarterRight>, nullptr, true},
+    {kFunctions, TrLater("Print..."),       "",             TrLater("Prints the selected pictures, or saves them as PDF."), Needs::Files, Print, "print", true},
+    {kFunctions, TrLater("Contact sheet..."), "",           TrLater("Puts the selected pictures on pages in a grid."), Needs::Files, MakeContactSheet},
+    {kFunctions, TrLater("Catalog..."),     "",             TrLater("Puts the selected pictures on pages with details and a footer."), Needs::Files, MakeCatalog},
+    {kFunctions, TrLater("Photo prints..."), "",            TrLater("Prints the selected pictures in exact sizes, packed on sheets."), Needs::Files, MakePhotoPrints},
+    {kFunctions, TrLater("Poster..."),      "",             TrLater("Prints each selected picture over many sheets."), Needs::Files, MakePoster},
     {kFunctions, TrLater("&Get info..."),   "Alt+Return",   TrLater("Shows information about the selected files."), Needs::Files, ShowInfo, "info", true},
     {kFunctions, TrLater("E&XIF..."),       "Alt+Shift+Return", TrLater("Shows the EXIF data of the focused picture."), Needs::Files, ShowExif, "exif", true},
     {kFunctions, TrLater("Remove metada&ta..."), "Ctrl+Alt+M", TrLater("Removes EXIF, GPS, comments and other metadata from the selected files."), Needs::Files, StripSelection, nullptr, true},

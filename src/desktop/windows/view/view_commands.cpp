@@ -91,6 +91,7 @@ constexpr KeyCommand<ViewFrame> kCommands[] = {
     {TrLater("Blue"),              "9",         {'9', WXK_NUMPAD9},              Tag<'9'>},
     {TrLater("Co&mment..."),       "T",         {'T'},                           CommentOn},
     {nullptr, nullptr, {}, nullptr},
+    {TrLater("&Print..."),         "Ctrl+P",    {WXK_CONTROL_P},                 PrintFileOf},
     {TrLater("&Delete"),           "Del",       {WXK_DELETE},                    Of<&ViewFrame::DeleteFile>},
     {TrLater("&Copy picture"),     "Ctrl+C",    {WXK_CONTROL_C},                 CopyPictureOf},
     {TrLater("&Close"),            "Esc",       {WXK_ESCAPE, WXK_RETURN, WXK_NUMPAD_ENTER}, Of<&ViewFrame::Leave>},

@@ -12,6 +12,7 @@
 #include "desktop/windows/history/use_recorder.h"
 #include "desktop/windows/info/info_frame.h"
 #include "desktop/windows/metadata/exif_edit_frame.h"
+#include "desktop/windows/pages/pages_frame.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/view/view_frame.h"
 #include "desktop/windows/widgets/bitmaps.h"
@@ -24,6 +25,10 @@ namespace fotomill::desktop {
 void ShowInfoOf(ViewFrame& view) { (new InfoFrame(view.Owner(), &view, {view.File()}))->Show(); }
 
 void EditFileOf(ViewFrame& view) { (new EditFrame(view.Owner(), {view.File()}, nullptr))->Show(); }
+
+void PrintFileOf(ViewFrame& view) {
+  (new PagesFrame(view.Owner(), {view.File()}, "print"))->Show();
+}
 
 void CropFileOf(ViewFrame& view) { (new CropFrame(view.Owner(), {view.File()}))->Show(); }
 

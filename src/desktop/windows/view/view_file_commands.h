@@ -8,6 +8,7 @@ class ViewFrame;
 void ShowInfoOf(ViewFrame& view);
 void EditFileOf(ViewFrame& view);  // in an Edit window
 void CropFileOf(ViewFrame& view);  // in a Crop window
+void PrintFileOf(ViewFrame& view);  // in a Print and pages window
 void EditExifOf(ViewFrame& view);
 void CommentOn(ViewFrame& view);  // asks for a description
 // Changes the tags by a digit key, as in the browser.

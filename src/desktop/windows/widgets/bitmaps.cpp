@@ -41,6 +41,7 @@ constexpr SymbolShape kSymbols[] = {
     {"copy", "<path d='M5.5 5.5 H13.5 V14 H5.5 Z M10.5 5.5 V2 H2.5 V10.5 H5.5'/>"},
     {"move", "<path d='M1.5 4 V13 H14.5 V5.5 H8 L6.5 3.5 H2 Z M5 9.2 H11 M9 7.2 L11 9.2 L9 11.2'/>"},
     {"trash", "<path d='M2.5 4.5 H13.5 M6 4.5 V2.5 H10 V4.5 M4 4.5 L4.7 14 H11.3 L12 4.5 M6.7 7 V11.5 M9.3 7 V11.5'/>"},
+    {"print", "<path d='M4.5 6 V2 H11.5 V6 M4.5 11.5 H2 V6 H14 V11.5 H11.5 M4.5 9.5 H11.5 V14 H4.5 Z'/>"},
     {"info", "<circle cx='8' cy='8' r='6.2'/><path d='M8 7.2 V11.5 M8 4.4 V5.4'/>"},
     {"exif", "<path d='M1.5 4.5 H4.5 L6 2.5 H10 L11.5 4.5 H14.5 V13 H1.5 Z'/><circle cx='8' cy='8.5' r='2.6'/>"},
     {"setup",
