@@ -6,6 +6,6 @@ namespace fotomill {
 
 // The rows of the table of kinds, each beside the code for its options.
 extern const PageKind kContactKind, kCatalogKind, kPhotoKind, kPrintKind, kPosterKind, kCubeKind,
-    kDodecahedronKind;
+    kDodecahedronKind, kGalleryKind;
 
 }  // namespace fotomill

@@ -31,8 +31,9 @@ constexpr PageOption kShared[] = {
 };
 // clang-format on
 
-constexpr const PageKind* kKinds[] = {&kContactKind, &kCatalogKind, &kPhotoKind,       &kPrintKind,
-                                      &kPosterKind,  &kCubeKind,    &kDodecahedronKind};
+constexpr const PageKind* kKinds[] = {&kContactKind,      &kCatalogKind, &kPhotoKind,
+                                      &kPrintKind,        &kPosterKind,  &kCubeKind,
+                                      &kDodecahedronKind, &kGalleryKind};
 
 std::string ReadSetup(const PageKind& kind, const PageValues& values, PageSetup& setup) {
   const std::string& name = values.Text("paper");
@@ -60,6 +61,7 @@ std::span<const PageOption> SharedPageOptions() { return kShared; }
 
 std::string PlanPages(const PageKind& kind, const PageValues& values, PagePlan& plan) {
   PageSetup setup;
+  if (!kind.onPaper) return kind.complete(values, setup, plan);
   if (std::string wrong = ReadSetup(kind, values, setup); !wrong.empty()) return wrong;
   plan = {};
   plan.run.reading.upright = settings.ExifAdjustOrientation != 0;

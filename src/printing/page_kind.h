@@ -31,6 +31,7 @@ struct PageKind {
   std::span<const PageOption> options;
   // Completes a plan. Returns what is wrong with the values, empty on success.
   std::string (*complete)(const PageValues& values, const PageSetup& setup, PagePlan& plan);
+  bool onPaper = true;  // else web pages: values are only checked, see gallery_plan.h
 };
 
 std::span<const PageKind* const> PageKinds();

@@ -5,9 +5,11 @@ import os
 import re
 import resource
 import shutil
+import signal
 import subprocess
 import sys
 import tempfile
+import time
 from pathlib import Path
 
 try:
@@ -278,6 +280,16 @@ def test_outputs(work):
     refused = run("pages", "contact", work / "wide.jpg", "--printer", "empty", environment=path,
                   status=1)
     check(b"did not take" in refused.stderr, True, "a printer that fails")
+    # a printer that never answers does not keep the program
+    printer.write_text(f'#!/bin/sh\ntouch "{work}/waits"\nexec sleep 60\n')
+    waiting = subprocess.Popen([FOTOMILL, "pages", "contact", str(work / "wide.jpg"),
+                                "--printer", "x"], env=dict(os.environ, **path), stderr=subprocess.DEVNULL)
+    while not (work / "waits").exists() and waiting.poll() is None:
+        time.sleep(0.02)
+    start = time.monotonic()
+    waiting.terminate()
+    check(waiting.wait(30), 128 + signal.SIGTERM, "status after SIGTERM")
+    check(time.monotonic() - start < 5, True, "the end while lp runs")
 
 
 def make_pictures(work):

@@ -10,6 +10,7 @@
 #include "desktop/models/pages/page_order.h"
 #include "desktop/models/pages/page_preview.h"
 #include "desktop/models/pages/page_work.h"
+#include "printing/gallery_plan.h"
 #include "settings/settings.h"
 #include "support/files.h"
 #include "support/scoped_settings.h"
@@ -360,6 +361,31 @@ TEST(PageWork, WritesPdfAndReportsEachPicture) {
   EXPECT_EQ(no, 0u);
   EXPECT_EQ(folder.Names(),
             (std::vector<std::string>{"a.bmp", "b.bmp", "c.bmp", "d.bmp", "x.pdf"}));
+}
+
+TEST(PageWork, BuildsGalleries) {
+  const test::TemporaryFolder folder;
+  PageOrder order("gallery");
+  const struct {
+    const char *option, *value;
+    bool good;
+  } kRows[] = {{"sizes", "480,320", false}, {"sizes", "100,200", true}, {"caption", "%Q", false},
+               {"caption", "%F", true},     {"theme", "/no/theme", false}, {"theme", "", true}};
+  for (const auto& row : kRows) {
+    order.Set(OptionOf(order, row.option), row.value);
+    EXPECT_EQ(Plan(order).empty(), row.good) << row.option << " " << row.value;
+  }
+  GalleryOptions gallery;
+  ASSERT_EQ(PlanGallery(order.Values(), folder.Path("web"), gallery), "");
+  BatchJob job = NewBatchJob();
+  job.boxSettings.closeWhenDone = false;
+  EXPECT_EQ(WriteGallery(Pictures(folder), gallery, job), Status::Ok);
+  EXPECT_EQ(job.uses.size(), 3u);
+  EXPECT_TRUE(job.errors);
+  const std::string page = test::ReadText(folder.Path("web/index.html"));
+  EXPECT_NE(page.find("<title>web</title>"), std::string::npos);
+  EXPECT_NE(page.find("c.bmp"), std::string::npos);
+  EXPECT_EQ(page.find("d.bmp"), std::string::npos);
 }
 
 }  // namespace

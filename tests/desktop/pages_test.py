@@ -79,8 +79,8 @@ def options_change_the_pages(folder):
         desktop.key("Page_Down")
         desktop.wait(r"pages-preview .* page=2/2 status=0")
         desktop.key("ctrl+Home")
-        desktop.wait(r"pages-preview .* page=1/2 status=0")
-        width = int(desktop.wait(r"pages-preview", again=True).split("pixels=")[1].split("x")[0])
+        line = desktop.wait(r"pages-preview .* page=1/2 status=0")
+        width = int(line.split("pixels=")[1].split("x")[0])
         desktop.key("ctrl+plus")
         line = desktop.wait(r"pages-preview .* page=1/2 status=0")
         assert int(line.split("pixels=")[1].split("x")[0]) > width * 1.2, line
@@ -123,8 +123,8 @@ def an_abort_leaves_no_file(folder):
         pdf = folder / "prints.pdf"
         save_pdf(desktop, pdf)
         desktop.wait(r"batch opened")
-        desktop.focus("^Progress$")
-        desktop.key("Escape")
+        desktop.focus("^Progress$", settle=False)
+        desktop.key("alt+a")
         desktop.wait(r"batch ended status=4")
         assert not [path.name for path in folder.iterdir() if ".pdf" in path.name]
 
@@ -136,9 +136,12 @@ def prints_go_to_the_printer(folder):
     settings = folder / "home/.config/gtk-3.0/settings.ini"
     settings.parent.mkdir(parents=True)
     settings.write_text("[Settings]\ngtk-print-backends=file\n")
+    printed = folder / "output.pdf"  # in the current folder
+    os.chdir(folder)
     with Desktop(folder, pictures, settings=["NewPrintSizeMode=4", "PrintWorkshopUnits=1",
                                              "PrintWorkshopSizeWidth=10", "PrintSize=12",
                                              "PrintWorkshopSizeDepth=10"]) as desktop:
+        os.chdir(PROJECT)
         desktop.wait(r"lines=2 .*listing=0")
         line = open_pages(desktop, "ctrl+p", "print")
         assert " page=1/2 " in line and " size=279x216 " in line, line  # Letter, turned
@@ -146,12 +149,20 @@ def prints_go_to_the_printer(folder):
         desktop.wait(r"prompt print")
         desktop.focus("^Print$", native=True)
         desktop.screenshot("pages-print-dialog")
-        desktop.key("Tab", "Down", "space")
+        desktop.key("Tab", "Down")
         desktop.settle()
         desktop.key("Return")
         desktop.wait(r"pages-printed pages=2 status=0 done=1")
-        made = [path for place in (folder / "home", PROJECT, folder) for path in place.rglob("*.pdf")]
-        print(made)
+        desktop.focus("^Print and pages")
+        desktop.key("ctrl+p")
+        desktop.wait(r"prompt print")
+        desktop.focus("^Print$", native=True)
+        desktop.key("Escape")
+        desktop.wait(r"pages-printed pages=0 status=0 done=0")
+    assert pdf_facts(printed) == (2, 612, 792), pdf_facts(printed)
+    # 10 x 7.5 cm on each sheet, which is turned.
+    shares = [dark_share(printed, page) for page in (1, 2)]
+    assert all(0.1 < share < 0.14 for share in shares), shares
 
 
 run(options_change_the_pages, an_abort_leaves_no_file, prints_go_to_the_printer)

@@ -11,6 +11,7 @@
 #include <termios.h>
 #include <unistd.h>
 
+#include <algorithm>
 #include <atomic>
 #include <cerrno>
 #include <cstdlib>
@@ -136,7 +137,19 @@ bool RunProgram(const std::vector<std::string>& arguments, bool wait) {
 std::optional<int> RunAndWait(const std::vector<std::string>& arguments) {
   const pid_t child = Start(arguments, false);
   if (child == 0) return std::nullopt;
-  const int status = WaitFor(child);
+  constexpr int kShortestMs = 2, kLongestMs = 50, kGraceMs = 500;
+  int status = 0, pause = kShortestMs, asked = 0;  // asked: milliseconds since it was told to end
+  while (true) {
+    const pid_t ended = waitpid(child, &status, WNOHANG);
+    if (ended == child) break;
+    if (ended < 0 && errno != EINTR) return std::nullopt;
+    if (PendingExit() != 0) {
+      if (asked == 0 || asked > kGraceMs) kill(child, asked == 0 ? SIGTERM : SIGKILL);
+      asked += pause;
+    }
+    (void)poll(nullptr, 0, pause);
+    pause = std::min(2 * pause, kLongestMs);
+  }
   return WIFEXITED(status) ? std::optional(WEXITSTATUS(status)) : std::nullopt;
 }
 

@@ -123,6 +123,7 @@ class PageWriter {
     const auto result = platform::RunAndWait(
         {"lp", "-s", "-d", options_.printer, "-t", plan_.run.title, "--", file.Path()});
     if (result == 0) return Status::Ok;
+    if (!output_.GoesOn()) return Status::FunctionCancelled;
     hint_ = result ? Tr("Printer \"%1\" did not take the pages.", options_.printer)
                    : Tr("The print command \"lp\" was not found; it comes with CUPS (package "
                         "cups-client).");

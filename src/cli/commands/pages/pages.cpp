@@ -1,10 +1,9 @@
 #include "cli/commands/pages/pages.h"
 
-#include <cstdlib>
-#include <deque>
 #include <memory>
 #include <utility>
 
+#include "cli/commands/pages/option_variables.h"
 #include "cli/commands/pages/page_command.h"
 #include "cli/frame/options.h"
 
@@ -12,59 +11,12 @@ namespace fotomill::cli {
 
 namespace {
 
-// Where the parser puts the value of an option.
-struct Variable {
-  const PageOption* option = nullptr;
-  std::string text;
-  std::vector<std::string> texts;
-  int32_t number = 0;
-  bool flag = false;
-
-  std::string Value() const {
-    switch (option->kind) {
-      case PageOptionKind::Flag: return flag ? "yes" : "";
-      case PageOptionKind::Number: return std::to_string(number);
-      case PageOptionKind::Texts: break;
-      default: return text;
-    }
-    std::string all;
-    for (const std::string& one : texts) all += (all.empty() ? "" : ",") + one;
-    return all;
-  }
-};
-
 struct KindCommand : PageCommandOptions {
-  std::deque<Variable> variables;
+  OptionVariables variables;
 };
-
-void AddOption(CLI::App& app, const PageOption& option, KindCommand& command) {
-  Variable& variable = command.variables.emplace_back();
-  variable.option = &option;
-  variable.text = option.usual;
-  const std::string name = std::string("--") + option.name;
-  switch (option.kind) {
-    case PageOptionKind::Flag: AddFlag(app, name.c_str(), variable.flag, option.help); return;
-    case PageOptionKind::Text:
-      AddText(app, name.c_str(), variable.text, option.shownAs, option.help);
-      return;
-    case PageOptionKind::Texts:
-      AddRepeatedText(app, name.c_str(), variable.texts, option.shownAs, option.help);
-      return;
-    case PageOptionKind::Number:
-      variable.number = std::atoi(option.usual);
-      AddNumber(app, name.c_str(), variable.number, option.shownAs, option.least, option.most,
-                option.help);
-      return;
-    case PageOptionKind::Choice:
-      AddChoice(app, name.c_str(), variable.text, option.shownAs, option.help, option.choices);
-      return;
-  }
-}
 
 int RunKind(const PageKind& kind, const KindCommand& command, const CommandContext& context) {
-  PageValues values;
-  for (const Variable& variable : command.variables)
-    values.Set(variable.option->name, variable.Value());
+  PageValues values = command.variables.Values();
   if (command.dpi > 0) values.Set("dpi", std::to_string(command.dpi));
   PagePlan plan;
   if (const std::string wrong = PlanPages(kind, values, plan); !wrong.empty())
@@ -77,8 +29,8 @@ void SetUp(CLI::App& app, CommandContext& context, const char* name, const char*
   const PageKind& kind = PageKindOf(name);
   auto command = std::make_shared<KindCommand>();
   AddPageOutput(app, *command, context);
-  for (const PageOption& option : SharedPageOptions()) AddOption(app, option, *command);
-  for (const PageOption& option : kind.options) AddOption(app, option, *command);
+  command->variables.Add(app, SharedPageOptions());
+  command->variables.Add(app, kind.options);
   SetFooter(app, notes, example);
   context.run = [command, &kind, &context] { return RunKind(kind, *command, context); };
 }

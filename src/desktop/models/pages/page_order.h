@@ -28,13 +28,13 @@ class PageOrder {
   PaperSize Paper() const;
   // Makes a plan. Returns what is wrong, translated; empty on success.
   std::string Plan(PagePlan& plan) const;
+  PageValues Values() const;
 
  private:
   struct ByKind {
     PageValues values;
     bool loaded = false;
   };
-  PageValues Values() const;
 
   const PageKind* kind_ = nullptr;
   PageValues paper_;  // of all kinds

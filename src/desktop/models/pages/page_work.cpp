@@ -29,6 +29,11 @@ PageRunHost HostOf(BatchJob& job) {
           .tick = tick};
 }
 
+void NoteUse(BatchJob& job, const std::string& file, FileFunction function) {
+  job.uses.push_back({platform::AbsolutePath(file), function, kOwnTime,
+                      static_cast<int32_t>(platform::Now()), false});
+}
+
 }  // namespace
 
 std::vector<BatchFile> FilesOf(const std::vector<std::string>& paths) {
@@ -55,6 +60,7 @@ FileFunction HistoryFunctionOf(const PageKind& kind) {
   const std::string_view name = kind.name;
   if (name == "contact") return FileFunction::ContactSheet;
   if (name == "catalog") return FileFunction::Catalog;
+  if (name == "gallery") return FileFunction::WebGallery;
   return name == "photo" ? FileFunction::PhotoWorkshop : FileFunction::Print;
 }
 
@@ -78,15 +84,49 @@ Status WritePagesPdf(std::span<const BatchFile> files, const PagePlan& plan, Fil
       file.status = Status::UnsuitableImage;
       file.hint = plan.leftOut;
     }
-    if (file.status == Status::Ok)
-      job.uses.push_back({platform::AbsolutePath(file.source), function, kOwnTime,
-                          static_cast<int32_t>(platform::Now()), false});
+    if (file.status == Status::Ok) NoteUse(job, file.source, function);
     ReportOutcome(job, file, i, count);
   }
   if (status == Status::Ok) {
     job.filesChanged = !run.Pages().empty();
   } else if (status != Status::FunctionCancelled) {
     ReportOutcome(job, {.source = path, .status = status, .hint = reason}, count - 1, count);
+  }
+  FinishProgress(job);
+  return status;
+}
+
+Status WriteGallery(std::vector<BatchFile> files, const GalleryOptions& gallery, BatchJob& job) {
+  if (!OpenProgressBox(job)) return Status::FunctionCancelled;
+  LeaveOutRepeated(gallery.folder, files);
+  const PageRunHost host = HostOf(job);
+  std::vector<GalleryOutcome> outcomes;
+  std::string failed;
+  const auto count = static_cast<uint32_t>(files.size());
+  const Status status =
+      BuildGallery(files, gallery,
+                   {.progress = host.progress,
+                    .goesOn = host.goesOn,
+                    .tick = host.tick,
+                    .countText =
+                        [](size_t pictures) {
+                          return TrCount("%1 picture", "%1 pictures", pictures, pictures);
+                        }},
+                   outcomes, failed);
+  const std::string reason = PageFailureHint(status, failed);
+  for (uint32_t i = 0; i < count; ++i) {
+    const FileOutcome file{.source = files[i].name,
+                           .destination = outcomes[i].destination,
+                           .status = outcomes[i].status,
+                           .hint = outcomes[i].hint};
+    if (file.status == Status::Ok && status != Status::Ok) continue;
+    if (file.status == Status::Ok) NoteUse(job, file.source, FileFunction::WebGallery);
+    ReportOutcome(job, file, i, count);
+  }
+  if (status == Status::Ok) {
+    job.filesChanged = true;
+  } else if (status != Status::FunctionCancelled) {
+    ReportOutcome(job, {.source = failed, .status = status, .hint = reason}, 0, count);
   }
   FinishProgress(job);
   return status;

@@ -6,6 +6,7 @@
 
 #include "batch/job.h"
 #include "catalog/history/file_history.h"
+#include "pages/gallery/gallery_build.h"
 #include "pages/page_run.h"
 #include "printing/page_kind.h"
 
@@ -26,5 +27,8 @@ FileFunction HistoryFunctionOf(const PageKind& kind);
 // file cannot be written.
 Status WritePagesPdf(std::span<const BatchFile> files, const PagePlan& plan, FileFunction function,
                      const std::string& path, BatchJob& job);
+
+// Builds a web gallery, with a progress box likewise. Statuses of BuildGallery.
+Status WriteGallery(std::vector<BatchFile> files, const GalleryOptions& gallery, BatchJob& job);
 
 }  // namespace fotomill::desktop

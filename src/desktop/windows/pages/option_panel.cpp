@@ -38,8 +38,10 @@ void OptionPanel::ShowKind() {
   row_ = 0;
   AddHeading(Label(order_.Kind().label));
   for (const PageOption& option : order_.Kind().options) AddRow(option);
-  AddHeading(Label("Page"));
-  for (const PageOption& option : SharedPageOptions()) AddRow(option);
+  if (order_.Kind().onPaper) {
+    AddHeading(Label("Page"));
+    for (const PageOption& option : SharedPageOptions()) AddRow(option);
+  }
   if (!grid_->IsColGrowable(1)) grid_->AddGrowableCol(1);
   ShowValues();
   Layout();

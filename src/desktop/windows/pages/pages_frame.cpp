@@ -2,6 +2,7 @@
 
 #include <wx/button.h>
 #include <wx/checkbox.h>
+#include <wx/dirdlg.h>
 #include <wx/filedlg.h>
 #include <wx/listbox.h>
 #include <wx/msgdlg.h>
@@ -29,6 +30,7 @@
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/folders.h"
 #include "platform/paths.h"
+#include "printing/gallery_plan.h"
 #include "settings/configuration.h"
 #include "settings/settings.h"
 #include "texts/status_text.h"
@@ -159,9 +161,9 @@ wxSizer* PagesFrame::BuildButtons(wxWindow* parent) {
     row->Add(button, wxSizerFlags().Border(wxLEFT, FromDIP(8)));
     return button;
   };
-  add(wxID_ANY, Label("Page set&up..."), [this] { AskPaper(); });
+  setup_ = add(wxID_ANY, Label("Page set&up..."), [this] { AskPaper(); });
   add(wxID_CLOSE, "", [this] { Close(); });
-  save_ = add(wxID_ANY, Label("&Save as PDF..."), [this] { SavePdf(); });
+  save_ = add(wxID_ANY, Label("&Save as PDF..."), [this] { Save(); });
   print_ = add(wxID_ANY, Label("&Print..."), [this] { Print(); });
   return row;
 }
@@ -187,8 +189,12 @@ void PagesFrame::OrderChanged() {
     options_ = std::move(plan.run);
     RequestPage();
   }
+  const bool onPaper = order_.Kind().onPaper;
+  save_->SetLabel(onPaper ? Label("&Save as PDF...") : Label("&Build gallery..."));
+  save_->GetContainingSizer()->Layout();
   save_->Enable(wrong.empty());
-  print_->Enable(wrong.empty());
+  print_->Enable(wrong.empty() && onPaper);
+  setup_->Enable(onPaper);
 }
 
 bool PagesFrame::MakePlan(PagePlan& plan) {
@@ -207,8 +213,10 @@ void PagesFrame::SetPreview(bool on) {
 
 void PagesFrame::RequestPage() {
   if (preview_ == nullptr || orderNumber_ == 0) return;  // not built yet
-  waits_ = preview_->GetValue();
-  if (waits_) {
+  waits_ = preview_->GetValue() && order_.Kind().onPaper;
+  if (!order_.Kind().onPaper) {
+    canvas_->ShowText(Label("A web gallery is a folder with pages for browsers."));
+  } else if (waits_) {
     const wxSize pane = canvas_->PaneSize();
     maker_->Request({.order = orderNumber_,
                      .options = options_,
@@ -224,7 +232,7 @@ void PagesFrame::RequestPage() {
 
 void PagesFrame::PageCame() {
   const PageViewPointer view = maker_->Fetch();
-  if (view == nullptr || !preview_->GetValue()) return;
+  if (view == nullptr || !preview_->GetValue() || !order_.Kind().onPaper) return;
   waits_ = view->order != orderNumber_;
   std::string problems;
   for (const std::string& line : view->problems) problems += line + "; ";
@@ -299,11 +307,35 @@ void PagesFrame::AskPaper() {
 
 void PagesFrame::Print() {
   PagePlan plan;
+  if (!order_.Kind().onPaper) return wxBell();
   if (!MakePlan(plan)) return;
   if (!PrintOrder(*this, files_, order_, plan, printData_)) return;
   std::vector<std::string> names;
   for (const BatchFile& file : files_) names.push_back(platform::AbsolutePath(file.name));
   shell_.Uses().NoteAll(names, HistoryFunctionOf(order_.Kind()));
+}
+
+void PagesFrame::Save() { order_.Kind().onPaper ? SavePdf() : BuildGallery(); }
+
+// An existing folder is taken if it has no pages of others.
+void PagesFrame::BuildGallery() {
+  wxDirDialog dialog(this, Label("Folder of the gallery"), "", wxDD_DEFAULT_STYLE);
+  LogEvent("prompt", "gallery-folder");
+  if (dialog.ShowModal() != wxID_OK) return;
+  GalleryOptions gallery;
+  std::string wrong = PlanGallery(order_.Values(), Utf8(dialog.GetPath()), gallery);
+  if (wrong.empty()) {
+    if (const std::string path = ForeignFile(gallery, files_.size()); !path.empty())
+      wrong = Tr("\"%1\" already exists and does not belong to a gallery.", path);
+  }
+  if (!wrong.empty()) {
+    LogEvent("prompt", "gallery-problem " + wrong);
+    wxMessageBox(Shown(wrong), GetTitle(), wxOK | wxICON_WARNING, this);
+    return;
+  }
+  shell_.Batches().Run(NewBatchJob(), [files = files_, gallery](BatchJob& job) {
+    return WriteGallery(files, gallery, job);
+  });
 }
 
 void PagesFrame::SavePdf() {
@@ -343,7 +375,7 @@ bool PagesFrame::PageKey(int key, bool control) {
     case '0':
     case WXK_NUMPAD0: canvas_->SetZoom(1); return true;
     case 'P': return control ? (Print(), true) : false;
-    case 'S': return control ? (SavePdf(), true) : false;
+    case 'S': return control ? (Save(), true) : false;
     default: return false;
   }
 }

@@ -44,7 +44,9 @@ class PagesFrame : public wxFrame {
   void SetPreview(bool on);
   void AskPaper();
   void Print();
+  void Save();
   void SavePdf();
+  void BuildGallery();
   bool MakePlan(PagePlan& plan);  // false after a message
   void OnCharHook(wxKeyEvent& event);
   bool PageKey(int key, bool control);
@@ -64,7 +66,7 @@ class PagesFrame : public wxFrame {
   wxStaticText* place_ = nullptr;
   wxButton *first_ = nullptr, *previous_ = nullptr, *next_ = nullptr, *last_ = nullptr;
   wxCheckBox* preview_ = nullptr;
-  wxButton *save_ = nullptr, *print_ = nullptr;
+  wxButton *setup_ = nullptr, *save_ = nullptr, *print_ = nullptr;
   std::unique_ptr<PagePreview> maker_;
 };
 

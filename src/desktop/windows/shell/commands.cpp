@@ -139,6 +139,7 @@ void Print(Shell& shell) { PrintSelection(shell, "print"); }
 void MakeContactSheet(Shell& shell) { PrintSelection(shell, "contact"); }
 void MakeCatalog(Shell& shell) { PrintSelection(shell, "catalog"); }
 void MakePhotoPrints(Shell& shell) { PrintSelection(shell, "photo"); }
+void MakeGallery(Shell& shell) { PrintSelection(shell, "gallery"); }
 void MakePoster(Shell& shell) { PrintSelection(shell, "poster"); }
 void NewTab(Shell& shell) { shell.Tabs().Open(shell.Tabs().CurrentFolder()); }
 void CloseTab(Shell& shell) { shell.Tabs().Close(); }
@@ -297,6 +298,7 @@ constexpr Command kCommands[] = {
     {kFunctions, TrLater("Catalog..."),     "",             TrLater("Puts the selected pictures on pages with details and a footer."), Needs::Files, MakeCatalog},
     {kFunctions, TrLater("Photo prints..."), "",            TrLater("Prints the selected pictures in exact sizes, packed on sheets."), Needs::Files, MakePhotoPrints},
     {kFunctions, TrLater("Poster..."),      "",             TrLater("Prints each selected picture over many sheets."), Needs::Files, MakePoster},
+    {kFunctions, TrLater("Web gallery..."), "",             TrLater("Builds web pages with the selected pictures."), Needs::Files, MakeGallery},
     {kFunctions, TrLater("&Get info..."),   "Alt+Return",   TrLater("Shows information about the selected files."), Needs::Files, ShowInfo, "info", true},
     {kFunctions, TrLater("E&XIF..."),       "Alt+Shift+Return", TrLater("Shows the EXIF data of the focused picture."), Needs::Files, ShowExif, "exif", true},
     {kFunctions, TrLater("Remove metada&ta..."), "Ctrl+Alt+M", TrLater("Removes EXIF, GPS, comments and other metadata from the selected files."), Needs::Files, StripSelection, nullptr, true},
