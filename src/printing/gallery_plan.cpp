@@ -109,7 +109,6 @@ constexpr PageKind kGalleryKind{"gallery", TrLater("Web gallery"), nullptr, kOpt
 std::string PlanGallery(const PageValues& values, const std::string& folder,
                         GalleryOptions& gallery) {
   const std::string &sizes = values.Text("sizes"), &theme = values.Text("theme");
-  gallery = {};
   gallery.theme = BuiltInTheme();
   if (!sizes.empty() && !ReadSizes(sizes, gallery.sides))
     return Tr("\"%1\" is not one to three increasing numbers such as 480,960,1920.", sizes);

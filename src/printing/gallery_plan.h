@@ -7,7 +7,7 @@
 
 namespace fotomill {
 
-// Options for a web gallery in `folder` from values of the options of the kind "gallery", and from
+// Completes a default `gallery` in `folder` by values of the options of the kind "gallery", and by
 // the settings. Reads the files of a theme. Returns what is wrong with the values, translated;
 // empty on success.
 std::string PlanGallery(const PageValues& values, const std::string& folder,

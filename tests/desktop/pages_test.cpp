@@ -384,8 +384,8 @@ TEST(PageWork, BuildsGalleries) {
   EXPECT_TRUE(job.errors);
   const std::string page = test::ReadText(folder.Path("web/index.html"));
   EXPECT_NE(page.find("<title>web</title>"), std::string::npos);
-  EXPECT_NE(page.find("c.bmp"), std::string::npos);
-  EXPECT_EQ(page.find("d.bmp"), std::string::npos);
+  EXPECT_NE(page.find("pictures/c-"), std::string::npos);
+  EXPECT_EQ(page.find("pictures/d-"), std::string::npos);
 }
 
 }  // namespace
