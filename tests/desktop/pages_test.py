@@ -1,14 +1,14 @@
 #!/usr/bin/env python3
-"""The Print and pages window of the real program: live pages, PDF files."""
+"""The Print and pages window of the real program: live pages, PDF files, the system's printer."""
 import os
 import re
 import shutil
 import subprocess
 import sys
 
-from driven_desktop import PROJECT, Desktop, make_pictures, run
+from driven_desktop import PROJECT, Desktop, make_pictures, needs_manager, run
 
-for program in ("pdfinfo", "pdftotext"):
+for program in ("pdfinfo", "pdftotext", "pdftoppm"):
     if shutil.which(program) is None:
         print(f"{program} is not installed: left out")
         sys.exit(77)
@@ -24,6 +24,15 @@ def pdf_facts(path):
 def pdf_text(path):
     return subprocess.run(["pdftotext", str(path), "-"], check=True, capture_output=True,
                           text=True).stdout
+
+
+def dark_share(path, page):
+    """The part of a page that is not white, as drawn at 20 dots per inch."""
+    data = subprocess.run(["pdftoppm", "-r", "20", "-gray", "-f", str(page), "-l", str(page),
+                           str(path)], check=True, capture_output=True).stdout
+    width, height = map(int, data.split(b"\n")[1].split())
+    pixels = data[-width * height:]
+    return sum(pixel < 250 for pixel in pixels) / len(pixels)
 
 
 def open_pages(desktop, keys, kind):
@@ -120,4 +129,35 @@ def an_abort_leaves_no_file(folder):
         assert not [path.name for path in folder.iterdir() if ".pdf" in path.name]
 
 
-run(options_change_the_pages, an_abort_leaves_no_file)
+@needs_manager
+def prints_go_to_the_printer(folder):
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["a.bmp", "b.bmp"])
+    # The system's printer that writes a file needs no print server.
+    settings = folder / "home/.config/gtk-3.0/settings.ini"
+    settings.parent.mkdir(parents=True)
+    settings.write_text("[Settings]\ngtk-print-backends=file\n")
+    printed = folder / "output.pdf"  # in the current folder
+    os.chdir(folder)
+    with Desktop(folder, pictures, settings=["NewPrintSizeMode=4", "PrintWorkshopUnits=1",
+                                             "PrintWorkshopSizeWidth=10", "PrintSize=12",
+                                             "PrintWorkshopSizeDepth=10"]) as desktop:
+        os.chdir(PROJECT)
+        desktop.wait(r"lines=2 .*listing=0")
+        line = open_pages(desktop, "ctrl+p", "print")
+        assert " page=1/2 " in line and " size=279x216 " in line, line  # Letter, turned
+        desktop.key("ctrl+p")
+        desktop.wait(r"prompt print")
+        desktop.focus("^Print$", native=True)
+        desktop.screenshot("pages-print-dialog")
+        desktop.key("Tab", "Down")
+        desktop.settle()
+        desktop.key("Return")
+        desktop.wait(r"pages-printed pages=2 status=0 done=1")
+    assert pdf_facts(printed) == (2, 612, 792), pdf_facts(printed)
+    # 10 x 7.5 cm on each sheet, which is turned.
+    shares = [dark_share(printed, page) for page in (1, 2)]
+    assert all(0.1 < share < 0.14 for share in shares), shares
+
+
+run(options_change_the_pages, an_abort_leaves_no_file, prints_go_to_the_printer)
