@@ -115,7 +115,9 @@ TEST(SimilarGroups, AreLinkedWithinTheLimit) {
   }
   EXPECT_EQ(FindSimilar(Plain({5, ~PictureHash{5}}), 0, false, {}).size(), 0u);
   EXPECT_EQ(FindSimilar(Plain({5, ~PictureHash{5}}), 0, true, {}).size(), 1u) << "one is the other turned";
-  EXPECT_TRUE(FindSimilar(pictures, 3, false, [] { return false; }).empty());
+  const auto stopped = FindSimilar(pictures, 3, false, [] { return false; });
+  ASSERT_EQ(stopped.size(), 1u) << "equal ones need no comparing";
+  EXPECT_EQ(stopped[0].members, (std::vector<size_t>{1, 6}));
 }
 
 TEST(SimilarGroups, IndexedSearchMatchesAllPairs) {

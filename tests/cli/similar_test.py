@@ -71,6 +71,16 @@ with tempfile.TemporaryDirectory() as name:
     expect("turned", search(data, work, "--transforms"),
            [["a.png", "b.jpg", "c.bmp", "d.png"], ["e.png", "f.bmp"]])
     expect("exact", search(data, work, "--exact"), [["e.png", "f.bmp"]])
+    pages = work / "pages"
+    pages.mkdir()
+    other, cover = scene(4), scene(5)
+    for name, compression, second in [("a.tif", "raw", other), ("b.tif", "tiff_lzw", other),
+                                      ("c.tif", "raw", one), ("d.gif", None, other),
+                                      ("e.gif", None, one), ("f.tif", "raw", None)]:
+        cover.convert("P" if name.endswith("gif") else "RGB").save(
+            pages / name, save_all=True, append_images=[second] if second else [],
+            **({"compression": compression} if compression else {}))
+    expect("pages", search(data, pages, "--exact"), [["a.tif", "b.tif"]])
     expect("named twice", search(data, work / "a.png", work / "a.png", work / "g.png"), [])
     expect("nothing", search(data, work / "a.png", work / "g.png"), [])
 

@@ -113,8 +113,7 @@ int32_t Apart(const PictureHashes& picture, PictureHash other, bool turned) {
   return least;
 }
 
-// False if stopped.
-bool JoinNear(const Distinct& distinct, int32_t most, bool turned,
+void JoinNear(const Distinct& distinct, int32_t most, bool turned,
               const std::function<bool()>& goesOn, Sets& sets) {
   const size_t count = distinct.hashes.size(), ways = turned ? PictureHashes().size() : 1;
   const bool byParts = most <= kMostByParts;
@@ -122,7 +121,7 @@ bool JoinNear(const Distinct& distinct, int32_t most, bool turned,
   const std::vector<uint32_t> masks =
       FewBits(byParts ? most / static_cast<int32_t>(kParts) : 0);
   for (size_t i = 0; i < count; ++i) {
-    if (i % kAskedEvery == 0 && goesOn && !goesOn()) return false;
+    if (i % kAskedEvery == 0 && goesOn && !goesOn()) return;
     for (size_t way = 0; way < ways; ++way) {
       const PictureHash hash = distinct.turned[i][way];
       if (byParts) {
@@ -134,7 +133,6 @@ bool JoinNear(const Distinct& distinct, int32_t most, bool turned,
       }
     }
   }
-  return true;
 }
 
 // Groups pictures with equal `keys`, ordered by their first members.
@@ -157,7 +155,7 @@ std::vector<SimilarGroup> FindSimilar(std::span<const PictureHashes> pictures, i
                                       bool turned, const std::function<bool()>& goesOn) {
   const Distinct distinct = DistinctOf(pictures);
   Sets sets(distinct.hashes.size());
-  if (!JoinNear(distinct, most, turned, goesOn, sets)) return {};
+  JoinNear(distinct, most, turned, goesOn, sets);
   std::vector<size_t> keys;
   for (const size_t place : distinct.of) keys.push_back(sets.Of(place));
   std::vector<SimilarGroup> groups = GroupsOf(keys);

@@ -5,8 +5,10 @@
 #include <utility>
 
 #include "catalog/similar/sharpness.h"
+#include "core/md5.h"
 #include "core/workers/ordered_run.h"
 #include "metadata/exif/picture_exif.h"
+#include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/folders.h"
 #include "platform/process.h"
@@ -114,6 +116,31 @@ Status SimilarSearch::Digest(ComparedFile& file) const {
   RETURN_IF_BAD(DigestPixels(*picture, file.record.digest));
   file.record.width = picture->width;  // upright
   file.record.height = picture->height;
+  return picture->pageCount > 1 ? AddPages(*picture, file) : Status::Ok;
+}
+
+// Adds the other pages to the digest; of animations the bytes of the file, as their frames take
+// long.
+Status SimilarSearch::AddPages(const PictureRecord& first, ComparedFile& file) const {
+  std::string all = file.record.digest;
+  const FormatEntry& row = FormatRow(first.formatIndex);
+  if (row.animate != nullptr || (row.flags & FMT_ANIMATED) != 0) {
+    platform::FileView whole;
+    if (!whole.Open(file.name)) return Status::FileOpenError;
+    all += Md5Text(whole.Bytes());
+    if (!whole.Intact()) return Status::FileReadError;
+  } else {
+    for (int32_t page = 1; page < first.pageCount; ++page) {
+      PicturePointer picture;
+      std::string digest;
+      RETURN_IF_BAD(
+          LoadPicture({.fileName = file.name, .page = page, .options = options_.read}, picture));
+      RETURN_IF_BAD(TurnUpright(*picture));
+      RETURN_IF_BAD(DigestPixels(*picture, digest));
+      all += digest;
+    }
+  }
+  file.record.digest = Md5Text({reinterpret_cast<const uint8_t*>(all.data()), all.size()});
   return Status::Ok;
 }
 

@@ -56,8 +56,8 @@ class SimilarSearch {
   // Determines what is compared, on all cores. Files that have a status already are ignored; those
   // that cannot be read get one. If ended, some of the others are not `known`.
   void Read(std::vector<ComparedFile>& files, const SimilarEvents& events);
-  // Groups of these files, as their indices; only those that were read are compared. No groups if
-  // `goesOn` returns false.
+  // Groups of these files, as their indices; only those that were read are compared. Once
+  // `goesOn` returns false, no more are compared.
   std::vector<SimilarGroup> Group(const std::vector<ComparedFile>& files,
                                   const std::function<bool()>& goesOn) const;
   // Measures the sharpness of the files with these indices, unless it is known.
@@ -72,6 +72,7 @@ class SimilarSearch {
   void ForEach(const std::vector<ComparedFile*>& files, Work work, const SimilarEvents& events);
   Status Look(ComparedFile& file) const;
   Status Digest(ComparedFile& file) const;
+  Status AddPages(const PictureRecord& first, ComparedFile& file) const;
   Status FindSharpness(ComparedFile& file) const;
 
   const SimilarOptions options_;

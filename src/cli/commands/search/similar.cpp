@@ -56,7 +56,9 @@ class Similar {
     if (!search_.Kept()) output_.Note(Tr("Results cannot be stored in \"%1\".", store));
     if (output_.GoesOn()) {
       for (const ComparedFile& file : files_) Count(file);
-      for (const SimilarGroup& group : search_.Group(files_, goesOn)) Print(group);
+      const std::vector<SimilarGroup> groups = search_.Group(files_, goesOn);
+      if (!output_.GoesOn()) return output_.Finish();
+      for (const SimilarGroup& group : groups) Print(group);
     }
     return output_.Finish();
   }
