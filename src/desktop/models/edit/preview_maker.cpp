@@ -20,12 +20,6 @@
 
 namespace fotomill::desktop {
 
-namespace {
-
-constexpr double kQuickSeconds = 0.025;  // for the steps of a quick answer
-
-}  // namespace
-
 // A picture with what is computed from it once. Pixels do not change after loading.
 struct PreviewMaker::Source {
   std::string path;
@@ -99,10 +93,8 @@ struct PreviewMaker::Source {
 
   // The steps took this long for a quick answer; chooses the share for the next one.
   void Took(double seconds) {
-    constexpr double kLeast = 0.25, kMeasurable = 0.001;
     const std::lock_guard lock(reducing);
-    share =
-        std::clamp(share * std::sqrt(kQuickSeconds / std::max(seconds, kMeasurable)), kLeast, 1.0);
+    share = NextShare(share, seconds);
   }
 
   // What operations need of a picture besides its pixels.

@@ -67,4 +67,10 @@ size_t LocalSteps(std::span<const Step> steps) {
   return count;
 }
 
+double NextShare(double share, double seconds) {
+  constexpr double kLeast = 0.25, kMostGrowth = 1.1, kMeasurable = 0.001;
+  const double fit = std::sqrt(kQuickSeconds / std::max(seconds, kMeasurable));
+  return std::clamp(share * std::min(fit, kMostGrowth), kLeast, 1.0);
+}
+
 }  // namespace fotomill::desktop
