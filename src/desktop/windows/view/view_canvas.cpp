@@ -34,10 +34,11 @@ wxColour ColorOf(Color color) {
 }  // namespace
 
 ViewCanvas::ViewCanvas(wxWindow* parent, Events events)
-    : events_(std::move(events)), around_(static_cast<Color>(settings.ViewModeBackground)) {
+    : events_(std::move(events)) {
   SetBackgroundStyle(wxBG_STYLE_PAINT);
   Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxWANTS_CHARS | wxBORDER_NONE,
          Label("Picture"));
+  around_ = BackdropFor(*this).around;
   scaler_ = std::make_unique<ViewScaler>(
       [this, post = calls_.Poster()] { post([this] { ScaledCame(); }); });
   transform_.SetModeFromKey(settings.DefaultViewZoom);

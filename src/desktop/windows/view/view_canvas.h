@@ -51,7 +51,7 @@ class ViewCanvas : public wxWindow {
   void SetOverlay(const std::vector<std::string>& lines);
   // A remark about the picture at the top of the window; may be empty.
   void SetNote(const wxString& note);
-  // The color around the picture; ViewModeBackground at first.
+  // The color around the picture; that of BackdropFor at first.
   void SetAround(Color color);
 
   // Zooms around the center of the window by a step, to actual size, or to a mode.
@@ -103,7 +103,7 @@ class ViewCanvas : public wxWindow {
   std::unique_ptr<ViewScaler::Scaled> scaled_;
   ViewTransform transform_;
   wxString overlay_, note_;
-  Color around_;
+  Color around_ = 0;
   wxBitmap drawn_;  // the picture as last painted
   wxPoint drag_;
   const WindowCalls calls_;  // of the scaler

@@ -15,6 +15,7 @@
 #include "desktop/windows/shell/browser_tabs.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/view/animation_bar.h"
+#include "desktop/windows/view/canvas_backdrop.h"
 #include "desktop/windows/view/overlay_bar.h"
 #include "desktop/windows/view/view_animation.h"
 #include "desktop/windows/view/view_commands.h"
@@ -363,8 +364,8 @@ void ViewFrame::ViewChanged() {
 
 void ViewFrame::ToggleFullScreen() {
   ShowFullScreen(!IsFullScreen());
-  canvas_->SetAround(static_cast<Color>(IsFullScreen() ? settings.ViewModeFullScreenBackground
-                                                       : settings.ViewModeBackground));
+  canvas_->SetAround(IsFullScreen() ? static_cast<Color>(settings.ViewModeFullScreenBackground)
+                                    : BackdropFor(*canvas_).around);
   animation_->HideBar(IsFullScreen());
   HidePointerLater();
 }
