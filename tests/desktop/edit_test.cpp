@@ -197,7 +197,7 @@ TEST(ChoiceText, KnowsEveryWordOfTheOperations) {
 TEST(PreviewSteps, TheShareFallsAtOnceAndGrowsSlowly) {
   const struct {
     double share, seconds, next;
-  } kRows[] = {{1, 0.1, 0.5},   {1, 0.025, 1},   {0.5, 0.0001, 0.55},
+  } kRows[] = {{1, 0.1, 0.5},      {1, 0.025, 1},  {0.5, 0.0001, 0.55},
                {0.5, 0.024, 0.51}, {0.3, 4, 0.25}, {0.95, 0.001, 1}};
   for (const auto& row : kRows)
     EXPECT_NEAR(NextShare(row.share, row.seconds), row.next, 0.001) << row.seconds;

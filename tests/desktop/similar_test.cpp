@@ -115,6 +115,7 @@ TEST(GroupList, FollowsWhatBecomesOfFiles) {
       {"one changed: it is not the best, nor ticked",
        {Same, Same, Changed, Same, Unknown},
        "b*ac|d*e"},
+      {"the last one is not shown", {Same, Same, Same, Same, Gone}, "c*ab"},
       {"single ones are not shown", {Gone, Same, Gone, Gone, Same}, ""},
       {"nothing is suggested", {Changed, Changed, Gone, Same, Same}, "ab|e*d"},
   };
@@ -124,7 +125,12 @@ TEST(GroupList, FollowsWhatBecomesOfFiles) {
     list.UntickAll();
     EXPECT_EQ(Text(list), row.text);
   }
+  list.SetStates({Same, Same, Same, Same, Same});
+  list.TickAllButBest();
+  list.SetStates({Same, Same, Same, Same, Gone});
+  EXPECT_EQ(list.TickedCount(), 2u) << "the last of its group does not count";
   list.SetStates({Same, Changed, Same, Same, Same});
+  list.UntickAll();
   list.TickAllButBest();
   EXPECT_EQ(Text(list), "c*(a)b|e*(d)");
   EXPECT_FALSE(list.Tick(2, true));

@@ -1,5 +1,7 @@
 #include "desktop/models/similar/similar_run.h"
 
+#include <atomic>
+#include <memory>
 #include <numeric>
 #include <set>
 #include <utility>
@@ -21,6 +23,7 @@ namespace fotomill::desktop {
 namespace {
 
 constexpr double kReportInterval = 0.1;  // seconds
+constexpr double kGrace = 0.4;           // seconds that a step may still take after a stop
 
 int64_t DateNumberOf(int64_t seconds) {
   const platform::LocalTime time = platform::LocalTimeOf(seconds);
@@ -49,7 +52,7 @@ class Run {
     for (const std::string& folder : question_.folders) List(folder);
     search_.Read(files_, EventsOf(SimilarStage::Reading));
     Report({SimilarStage::Comparing, 0, files_.size()}, true);
-    const std::vector<SimilarGroup> groups = search_.Group(files_, {});
+    const std::vector<SimilarGroup> groups = search_.Group(files_, Grace());
     Date(groups);
     if (question_.sharpness) Measure(groups);
     for (const SimilarGroup& group : groups) Add(group);
@@ -86,6 +89,16 @@ class Run {
                 }};
   }
 
+  // For a step that shows what was read until a stop: it may go on for a while.
+  std::function<bool()> Grace() const {
+    return [this, end = std::make_shared<std::atomic<double>>(0)] {
+      if (!stop_.Asked()) return true;
+      const double now = platform::MonotonicSeconds();
+      if (*end == 0) *end = now + kGrace;
+      return now < *end;
+    };
+  }
+
   void List(const std::string& folder) {
     const auto take = [&](const std::vector<std::string>& names) {
       for (const std::string& name : names) {
@@ -104,7 +117,8 @@ class Run {
                 .problem = [this](const std::string& why) { findings_.problems.push_back(why); }});
   }
 
-  // Reads the dates of the pictures in groups, even after a stop: a group is shown completely.
+  // Reads the dates of the pictures in groups. Those for which a stop leaves no time get the date
+  // of the file.
   void Date(const std::vector<SimilarGroup>& groups) {
     std::vector<size_t> places;
     for (const SimilarGroup& group : groups)
@@ -114,14 +128,15 @@ class Run {
                     [&](size_t i) {
                       const size_t place = places[i];
                       dates_[place] = TakenDate(files_[place].name);
-                      if (dates_[place] <= 0)
-                        dates_[place] = DateNumberOf(files_[place].record.modified);
                       return Status::Ok;
                     },
                 .deliver = [](size_t, Status) {},
-                .goesOn = [] { return true; },
+                .goesOn = Grace(),
                 .tick = {}})
         .Run(places.size(), platform::CoreCount());
+    for (const size_t place : places) {
+      if (dates_[place] <= 0) dates_[place] = DateNumberOf(files_[place].record.modified);
+    }
   }
 
   void Measure(const std::vector<SimilarGroup>& groups) {

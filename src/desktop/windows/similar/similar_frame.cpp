@@ -61,6 +61,14 @@ constexpr KeyCommand<SimilarFrame> kCommands[] = {
     {TrLater("&Redo"), "Ctrl+Y", {}, Of<&SimilarFrame::Redo>},
 };
 
+using States = std::vector<FileNow>;
+
+States StatesOf(const std::vector<SimilarPicture>& pictures) {
+  States states;
+  for (const SimilarPicture& picture : pictures) states.push_back(StateNow(picture));
+  return states;
+}
+
 BestRule lastRule = BestRule::Largest;  // until the program ends
 
 }  // namespace
@@ -259,8 +267,8 @@ void SimilarFrame::Start(
   work_.Start([work, halt = halt_.Token()](const StopToken&,
                                            const LooseWork::Report& report) { work(halt, report); },
               [this] {
-                status_->SetLabel(Label("There is not enough memory."));
                 Ended();
+                status_->SetLabel(Label("There is not enough memory."));
               });
   ShowProgress({});
   UpdateControls();
@@ -317,6 +325,8 @@ void SimilarFrame::Found(const SimilarFindings& findings) {
     for (const SimilarPicture& picture : group.pictures) found.push_back(picture.path);
   }
   shell_.Uses().NoteAll(found, FileFunction::FindSimilar);
+  states_.Forget();  // those of the previous groups
+  beforeTrash_.Forget();
   list_.SetGroups(findings.groups);
   canvas_->SetNote(
       Shown(TrGroupedCount("No similar pictures among %1 picture.",
@@ -328,6 +338,7 @@ void SimilarFrame::Found(const SimilarFindings& findings) {
   const bool any = !list_.Cells().empty();
   Ended();
   if (any) canvas_->SetFocus();
+  FilesChanged();  // while the search ran
 }
 
 void SimilarFrame::Ended() {
@@ -383,6 +394,27 @@ void SimilarFrame::TrashTicked() {
   if (list_.TickedCount() == 0 || work_.Started()) return wxBell();
   if (shell_.Files().Busy())
     return status_->SetLabel(Label("Please wait for the previous file operation."));
+  // Another program may have deleted what is to stay.
+  beforeTrash_.Ask<States>(
+      [pictures = list_.All()] { return StatesOf(pictures); },
+      [this, ticked = list_.TickedCount()](const States& states) {
+        if (!work_.Started()) TrashUnlessChanged(ticked, states);
+      },
+      [this] { status_->SetLabel(Label("Waiting for the files...")); });
+}
+
+void SimilarFrame::TrashUnlessChanged(size_t ticked, const std::vector<FileNow>& states) {
+  ShowStates(states);
+  if (const size_t left = ticked - std::min(ticked, list_.TickedCount()); left > 0) {
+    LogEvent("prompt", "similar-left " + std::to_string(left));
+    wxMessageBox(
+        LabelCount("%1 picture is left alone: it has changed, is gone, or is the last one of its "
+                   "group.",
+                   "%1 pictures are left alone: they have changed, are gone, or are the last ones "
+                   "of their groups.",
+                   left),
+        Label("Move to the trash"), wxOK | wxICON_INFORMATION, this);
+  }
   if (const size_t full = list_.FullyTicked(); full > 0) {
     wxMessageDialog dialog(
         this,
@@ -398,7 +430,7 @@ void SimilarFrame::TrashTicked() {
   std::vector<FileStep> steps;
   for (const SimilarPicture& picture : list_.Ticked())
     steps.push_back({.from = picture.path, .to = {}, .seen = picture.stamp});
-  shell_.Files().TrashSteps(this, std::move(steps));
+  if (!steps.empty()) shell_.Files().TrashSteps(this, std::move(steps));
 }
 
 void SimilarFrame::Undo() { shell_.Files().Undo(); }
@@ -420,22 +452,17 @@ void SimilarFrame::ShowProblems() { ShowProblemBox(*this, problems_); }
 
 void SimilarFrame::FilesChanged() {
   if (list_.All().empty()) return;
-  using States = std::vector<FileNow>;
-  states_.Ask<States>(
-      [pictures = list_.All()] {
-        States states;
-        for (const SimilarPicture& picture : pictures) states.push_back(StateNow(picture));
-        return states;
-      },
-      [this, count = list_.All().size()](const States& states) {
-        if (states.size() != count || list_.All().size() != count) return;
-        list_.SetStates(states);
-        canvas_->SetNote(Label("There are no similar pictures any more."));
-        canvas_->ListChanged();
-        UpdateControls();
-        LogEvent("similar-states", "groups=" + std::to_string(list_.Starts().size()) +
-                                       " pictures=" + std::to_string(list_.Cells().size()));
-      });
+  states_.Ask<States>([pictures = list_.All()] { return StatesOf(pictures); },
+                      [this](const States& states) { ShowStates(states); });
+}
+
+void SimilarFrame::ShowStates(const std::vector<FileNow>& states) {
+  list_.SetStates(states);
+  canvas_->SetNote(Label("There are no similar pictures any more."));
+  canvas_->ListChanged();
+  UpdateControls();
+  LogEvent("similar-states", "groups=" + std::to_string(list_.Starts().size()) +
+                                 " pictures=" + std::to_string(list_.Cells().size()));
 }
 
 void SimilarFrame::UpdateControls() {

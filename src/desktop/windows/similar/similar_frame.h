@@ -63,6 +63,8 @@ class SimilarFrame : public wxFrame {
   void Found(const SimilarFindings& findings);
   void Ended();
   void RuleChosen();
+  void ShowStates(const std::vector<FileNow>& states);
+  void TrashUnlessChanged(size_t ticked, const std::vector<FileNow>& states);
   void ShowProblems();
   void UpdateControls();
   void OnKey(wxKeyEvent& event);
@@ -77,7 +79,7 @@ class SimilarFrame : public wxFrame {
   bool halted_ = false;
   SimilarStage stage_ = SimilarStage::Listing;
   double stageBegan_ = 0;
-  FileQuestion states_;
+  FileQuestion states_, beforeTrash_;
   GroupCanvas* canvas_ = nullptr;
   wxTextCtrl* place_ = nullptr;
   wxCheckBox* subfolders_ = nullptr;

@@ -33,8 +33,7 @@ wxColour ColorOf(Color color) {
 
 }  // namespace
 
-ViewCanvas::ViewCanvas(wxWindow* parent, Events events)
-    : events_(std::move(events)) {
+ViewCanvas::ViewCanvas(wxWindow* parent, Events events) : events_(std::move(events)) {
   SetBackgroundStyle(wxBG_STYLE_PAINT);
   Create(parent, wxID_ANY, wxDefaultPosition, wxDefaultSize, wxWANTS_CHARS | wxBORDER_NONE,
          Label("Picture"));
