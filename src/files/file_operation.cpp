@@ -25,6 +25,8 @@ namespace {
 constexpr const char* kTaken = TrLater("A file of that name already exists.");
 constexpr const char* kGone = TrLater("It no longer exists.");
 constexpr const char* kChanged = TrLater("It was changed since, so it was left alone.");
+constexpr const char* kCopyChanged =
+    TrLater("The copy was changed since, so it was left alone.");
 constexpr const char* kNotWritten = TrLater("The copy could not be written; the disk may be full.");
 constexpr const char* kTooDeep = TrLater("The folders are nested too deeply.");
 constexpr int kDeepest = 64;  // of nested folders
@@ -103,10 +105,11 @@ Outcome MoveOne(const std::string& from, const std::string& to) {
   if (result == platform::CommitResult::Done) return {};
   if (result == platform::CommitResult::Taken) return Tr(kTaken);
   if (SameVolume(from, to)) return WithReason(Tr("It could not be renamed."));
-  // Across volumes a move is copy and delete; a partial copy is deleted if copying fails.
+  // Across volumes a move is copy and delete; a partial copy is deleted if copying fails. Files are
+  // copied as a whole or not at all: one that is there then is another's.
   Outcome outcome = CopyTree(from, to, 0);
   if (!outcome.empty()) {
-    if (outcome != Tr(kTaken)) (void)DeleteTree(to, 0);
+    if (outcome != Tr(kTaken) && platform::IsFolder(from)) (void)DeleteTree(to, 0);
     return outcome;
   }
   return DeleteTree(from, 0);
@@ -172,11 +175,17 @@ Outcome DoStep(FileOperationKind kind, const FileStep& step) {
   return TrashOne(step.from);
 }
 
-// Trashes a copy, unless it was edited since.
+bool IsGone(const std::string& path) {
+  return platform::FactsOf(path).kind == platform::FileKind::Missing;
+}
+
+// Trashes a copy, unless it or a sidecar that went along was edited since.
 Outcome RemoveCopy(const FileStep& step) {
-  if (platform::FactsOf(step.to).kind == platform::FileKind::Missing) return Tr(kGone);
-  if (step.made.there && platform::StampOf(step.to) != step.made)
-    return Tr("The copy was changed since, so it was left alone.");
+  if (IsGone(step.to)) return Tr(kGone);
+  if (step.made.there && platform::StampOf(step.to) != step.made) return Tr(kCopyChanged);
+  for (const FileAlong& one : step.along) {
+    if (!IsGone(one.path) && platform::StampOf(one.path) != one.made) return Tr(kCopyChanged);
+  }
   return TrashOne(step.to);
 }
 
@@ -224,25 +233,30 @@ bool AnyTaken(const std::vector<RenamedFile>& sidecars) {
 }
 
 // Removes a file by `remove`, then its sidecars. Returns those that went along.
-std::vector<std::string> RemoveWithSidecars(const std::string& path,
-                                            const std::string& commentExtension,
-                                            Outcome (*remove)(const std::string&), Outcome& outcome,
-                                            AlongTheWay& besides) {
-  std::vector<std::string> sidecars = platform::IsRegularFile(path)
-                                          ? SidecarsOf(path, commentExtension)
-                                          : std::vector<std::string>();
+std::vector<FileAlong> RemoveWithSidecars(const std::string& path,
+                                          const std::string& commentExtension,
+                                          Outcome (*remove)(const std::string&), Outcome& outcome,
+                                          AlongTheWay& besides) {
+  const std::vector<std::string> sidecars = platform::IsRegularFile(path)
+                                                ? SidecarsOf(path, commentExtension)
+                                                : std::vector<std::string>();
+  std::vector<FileAlong> removed;
   outcome = remove(path);
-  if (!outcome.empty()) return {};
-  std::erase_if(sidecars, [&](const std::string& sidecar) {
+  if (!outcome.empty()) return removed;
+  for (const std::string& sidecar : sidecars) {
     const Outcome along = remove(sidecar);
-    if (!along.empty()) besides.failures.push_back({sidecar, along});
-    return !along.empty();
-  });
-  besides.settled.insert(sidecars.begin(), sidecars.end());
-  return sidecars;
+    if (!along.empty()) {
+      besides.failures.push_back({sidecar, along});
+      continue;
+    }
+    besides.settled.insert(sidecar);
+    removed.push_back({sidecar});
+  }
+  return removed;
 }
 
-// A step with the sidecars of its file. Notes in the step what went to the trash along with it.
+// A step with the sidecars of its file. Notes in the step what went to the trash along with it, or
+// was copied.
 Outcome DoWithSidecars(const FileOperation& operation, FileStep& step, AlongTheWay& besides) {
   if (operation.kind == FileOperationKind::Trash) {
     Outcome outcome = CheckSeen(step);
@@ -251,39 +265,48 @@ Outcome DoWithSidecars(const FileOperation& operation, FileStep& step, AlongTheW
         RemoveWithSidecars(step.from, operation.commentExtension, TrashOne, outcome, besides);
     return outcome;
   }
-  std::vector<RenamedFile> sidecars = SidecarsAlong(operation, step.from, step.to);
-  std::erase_if(sidecars, [&](const RenamedFile& one) { return besides.settled.contains(one.to); });
-  if (AnyTaken(sidecars)) return Tr(kTaken);
+  const std::vector<RenamedFile> sidecars = SidecarsAlong(operation, step.from, step.to);
+  std::vector<RenamedFile> left = sidecars;  // others are there already
+  std::erase_if(left, [&](const RenamedFile& one) { return besides.settled.contains(one.to); });
+  if (AnyTaken(left)) return Tr(kTaken);
   Outcome outcome = DoStep(operation.kind, step);
   if (!outcome.empty()) return outcome;
   if (!step.to.empty()) besides.settled.insert(step.to);
-  for (const RenamedFile& sidecar : sidecars) {
+  for (const RenamedFile& sidecar : left) {
     const Outcome along = DoStep(operation.kind, {sidecar.from, sidecar.to});
     if (along.empty()) besides.settled.insert(sidecar.to);
     if (!along.empty()) besides.failures.push_back({sidecar.from, along});
   }
+  step.along.clear();
+  for (const RenamedFile& sidecar : sidecars) {
+    if (operation.kind == FileOperationKind::Copy && besides.settled.contains(sidecar.to))
+      step.along.push_back({sidecar.to, platform::StampOf(sidecar.to)});
+  }
   return {};
 }
 
-// Undoes a step; adds the places that sidecars left.
+// Undoes a step; adds the places that sidecars left. Only those that were copied or removed by the
+// step are removed or restored with it, but all are renamed and moved.
 Outcome UndoWithSidecars(const FileOperation& operation, const FileStep& step,
                          AlongTheWay& besides) {
   const bool copy = operation.kind == FileOperationKind::Copy;
-  const std::vector<RenamedFile> sidecars = copy ? SidecarsAlong(operation, step.from, step.to)
-                                                 : SidecarsAlong(operation, step.to, step.from);
-  if (!copy && AnyTaken(sidecars)) return Tr(kTaken);
+  const std::vector<RenamedFile> sidecars =
+      copy ? std::vector<RenamedFile>() : SidecarsAlong(operation, step.to, step.from);
+  if (AnyTaken(sidecars)) return Tr(kTaken);
   Outcome outcome = UndoStep(operation.kind, step);
   if (!outcome.empty()) return outcome;
+  const auto note = [&besides](const std::string& path, const Outcome& along) {
+    if (!along.empty()) besides.failures.push_back({path, along});
+  };
   for (const RenamedFile& sidecar : sidecars) {
-    if (copy && platform::ExistenceOf(sidecar.to) == platform::Existence::No) continue;
-    const Outcome along =
-        copy ? RemoveCopy({sidecar.from, sidecar.to}) : MoveOne(sidecar.from, sidecar.to);
-    besides.settled.insert(copy ? sidecar.to : sidecar.from);
-    if (!along.empty()) besides.failures.push_back({copy ? sidecar.to : sidecar.from, along});
+    note(sidecar.from, MoveOne(sidecar.from, sidecar.to));
+    besides.settled.insert(sidecar.from);
   }
-  for (const std::string& sidecar : step.along) {
-    if (const Outcome along = Restore(sidecar); !along.empty())
-      besides.failures.push_back({sidecar, along});
+  for (const FileAlong& one : step.along) {
+    if (!copy) note(one.path, Restore(one.path));
+    if (!copy) continue;
+    if (!IsGone(one.path)) note(one.path, TrashOne(one.path));
+    besides.settled.insert(one.path);
   }
   return {};
 }

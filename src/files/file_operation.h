@@ -29,6 +29,12 @@ enum class FileOperationKind {
 
 class PreviousFile;
 
+// A sidecar or comment file that went along with a picture.
+struct FileAlong {
+  std::string path;
+  platform::FileStamp made = {};  // its state, if it is a copy
+};
+
 // One file of an operation; absolute paths.
 struct FileStep {
   std::string from;
@@ -39,8 +45,8 @@ struct FileStep {
   platform::FileStamp made = {};
   // Times: those before and after they were set
   platform::FileTimes oldTimes = {}, newTimes = {};
-  // Trash: the sidecars and the comment file that went along
-  std::vector<std::string> along = {};
+  // Trash: the sidecars and the comment file that went along; Copy: their copies
+  std::vector<FileAlong> along = {};
   // Trash: the state that the file must have; not there: any
   platform::FileStamp seen = {};
 };

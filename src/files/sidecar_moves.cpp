@@ -7,7 +7,6 @@
 #include "core/text.h"
 #include "metadata/tags/sidecar.h"
 #include "metadata/xmp/xmp_tags.h"
-#include "platform/existence.h"
 #include "platform/file_view.h"
 #include "platform/files.h"
 #include "platform/folders.h"
@@ -20,7 +19,8 @@ namespace {
 constexpr std::string_view kExtension = ".xmp";
 
 // Whether a folder has other files "photo.*" beside a picture "photo.nef", apart from sidecars and
-// thumbnails.
+// thumbnails, or a file "photo", whose own sidecar would be "photo.xmp": that of a comment file
+// "photo.jpg.txt" is the picture's.
 bool HasNamesakes(const std::string& picture) {
   const platform::PathParts parts = platform::SplitPath(picture);
   const auto entries = platform::ListFolder(platform::FolderOf(picture).empty()
@@ -28,9 +28,11 @@ bool HasNamesakes(const std::string& picture) {
                                                 : std::string(platform::FolderOf(picture)));
   if (!entries) return true;  // unknown
   return std::ranges::any_of(*entries, [&](const platform::FolderEntry& entry) {
+    if (entry.name == platform::FileNameOf(picture)) return false;
+    if (entry.name == parts.base) return entry.kind == platform::FileKind::Regular;
     const platform::PathParts other = platform::SplitPath(entry.name);
-    return other.base == parts.base && entry.name != platform::FileNameOf(picture) &&
-           !other.extension.empty() && !EqualIgnoringCase(other.extension, kExtension) &&
+    return other.base == parts.base && !other.extension.empty() &&
+           !EqualIgnoringCase(other.extension, kExtension) &&
            !EqualIgnoringCase(other.extension, kThumbnailExtension);
   });
 }
@@ -56,10 +58,12 @@ std::vector<std::string> NamesBeside(const std::string& picture,
   return names;
 }
 
-// Whether the i-th name is that of an existing file that belongs to the picture.
+// Whether the i-th name is that of an existing file that belongs to the picture; a folder never
+// does. The first name, too, may be shared if the picture has no extension.
 bool Belongs(const std::vector<std::string>& names, size_t i, const std::string& picture) {
-  if (names[i].empty() || platform::ExistenceOf(names[i]) != platform::Existence::Yes) return false;
-  return i != 1 || GoesWith(names[i], picture);
+  if (names[i].empty() || !platform::IsRegularFile(names[i])) return false;
+  const bool shared = i == 1 || (i == 0 && platform::ExtensionOf(picture).empty());
+  return !shared || GoesWith(names[i], picture);
 }
 
 // Sidecars have none of their own.

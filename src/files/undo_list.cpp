@@ -60,6 +60,10 @@ void UndoList::FollowFiles(const FileOperation& operation) {
   for (auto* list : {&done_, &undone_}) {
     for (FileOperation& other : *list) {
       for (FileStep& step : other.steps) {
+        for (FileAlong& one : step.along) {
+          const auto along = files.find(one.path);
+          if (along != files.end() && one.made.there) along->second->Update(one.made);
+        }
         const auto found = files.find(step.to.empty() ? step.from : step.to);
         if (found == files.end()) continue;
         if (step.previous != nullptr) step.previous->Follow(*found->second);

@@ -146,6 +146,67 @@ TEST_F(FileOperationTest, SidecarsAreRemovedWithTheirPictures) {
   EXPECT_TRUE(platform::FileExists(From("a.nef.xmp")));
 }
 
+// Comment files, files without an extension and folders take no sidecar of a picture along.
+TEST_F(FileOperationTest, SidecarsOfOthersStay) {
+  const auto remove = [this](const char* name) {
+    const FileOperation operation{FileOperationKind::Trash, {{From(name), {}}}, "txt"};
+    EXPECT_THAT(DeleteForGood(operation).failures, IsEmpty());
+  };
+  for (const char* name : {"a.png.xmp", "a.png.txt", "b", "b.xmp"}) WriteText(From(name), name);
+  std::filesystem::create_directory(From("b.png.xmp"));
+  WriteText(From("b.png.xmp/d.png"), "d");
+  const std::vector<std::string> before = Names("from");
+  for (const char* name : {"a.png.txt", "b"}) {
+    SCOPED_TRACE(name);
+    const FileOperation move{FileOperationKind::Rename, {{From(name), To("c.d")}}, "txt"};
+    const FileOperationResult moved = CarryOut(move);
+    EXPECT_THAT(Names("to"), ElementsAre("c.d"));
+    EXPECT_THAT(Revert(moved.done).failures, IsEmpty());
+    EXPECT_EQ(Names("from"), before);
+    remove(name);
+    EXPECT_EQ(Names("from").size(), before.size() - 1);
+    WriteText(From(name), name);
+  }
+  std::filesystem::remove(From("b"));
+  remove("b.png");
+  EXPECT_THAT(Names("from"), ElementsAre("a.png", "a.png.txt", "a.png.xmp", "b.png.xmp", "sub"));
+  EXPECT_EQ(ReadText(From("b.png.xmp/d.png")), "d");
+}
+
+// Undoing a copy removes the copies of sidecars, but none that came later, and nothing if one of
+// them was changed.
+TEST_F(FileOperationTest, UndoneCopiesTakeTheirOwnSidecars) {
+  WriteText(From("a.png.xmp"), "side");
+  const FileOperation plan =
+      PlanFileOperation(FileOperationKind::Copy, {From("a.png"), From("b.png")}, folder_.Path("to"));
+  FileOperationResult done = CarryOut(plan);
+  WriteText(To("a.png.xmp"), "other");
+  for (const std::string& name : {From("b.png.xmp"), To("b.png.xmp")}) WriteText(name, "later");
+  const FileOperationResult undone = Revert(done.done);
+  ASSERT_EQ(undone.failures.size(), 1u);
+  EXPECT_EQ(undone.failures[0].path, To("a.png"));
+  EXPECT_THAT(Names("to"), ElementsAre("a.png", "a.png.xmp", "b.png.xmp"));
+  EXPECT_EQ(ReadText(To("b.png.xmp")), "later");
+
+  // a change that was undone is none
+  for (const auto& entry : std::filesystem::directory_iterator(folder_.Path("to")))
+    std::filesystem::remove(entry);
+  done = CarryOut({FileOperationKind::Copy, {{From("a.png"), To("a.png")}}});
+  PreviousFiles kept(FileOperationKind::Tag);
+  ASSERT_TRUE(kept.Keep(To("a.png.xmp")));
+  WriteText(To("a.png.xmp"), "other");
+  kept.Replaced(To("a.png.xmp"));
+  UndoList list(5);
+  list.Add(done.done);
+  list.Add(kept.Operation());
+  for (int i = 0; i < 2; ++i) {
+    FileOperationResult step = Revert(list.PopUndo());
+    EXPECT_THAT(step.failures, IsEmpty());
+    list.Undone(std::move(step.done));
+  }
+  EXPECT_THAT(Names("to"), IsEmpty());
+}
+
 // Every operation on the system fails once: what did not go to the trash is where it was, and undo
 // brings back the rest.
 TEST_F(FileOperationTest, FaultsInTheTrashLoseNothing) {
