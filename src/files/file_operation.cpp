@@ -25,8 +25,7 @@ namespace {
 constexpr const char* kTaken = TrLater("A file of that name already exists.");
 constexpr const char* kGone = TrLater("It no longer exists.");
 constexpr const char* kChanged = TrLater("It was changed since, so it was left alone.");
-constexpr const char* kCopyChanged =
-    TrLater("The copy was changed since, so it was left alone.");
+constexpr const char* kCopyChanged = TrLater("The copy was changed since, so it was left alone.");
 constexpr const char* kNotWritten = TrLater("The copy could not be written; the disk may be full.");
 constexpr const char* kTooDeep = TrLater("The folders are nested too deeply.");
 constexpr int kDeepest = 64;  // of nested folders

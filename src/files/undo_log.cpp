@@ -66,7 +66,10 @@ bool UndoLog::Begin(bool fresh) {
 bool UndoLog::Append(const UndoRecord& record) {
   const std::string bytes = BytesOf(record);
   before_ = file_.Size();
-  return file_.WriteAt(before_, {reinterpret_cast<const uint8_t*>(bytes.data()), bytes.size()});
+  if (file_.WriteAt(before_, {reinterpret_cast<const uint8_t*>(bytes.data()), bytes.size()}))
+    return true;
+  (void)file_.Resize(before_);  // or the next record would seem to be the rest of this one
+  return false;
 }
 
 bool UndoLog::Intend(const UndoRecord& record) {

@@ -177,8 +177,8 @@ TEST_F(FileOperationTest, SidecarsOfOthersStay) {
 // them was changed.
 TEST_F(FileOperationTest, UndoneCopiesTakeTheirOwnSidecars) {
   WriteText(From("a.png.xmp"), "side");
-  const FileOperation plan =
-      PlanFileOperation(FileOperationKind::Copy, {From("a.png"), From("b.png")}, folder_.Path("to"));
+  const FileOperation plan = PlanFileOperation(FileOperationKind::Copy,
+                                               {From("a.png"), From("b.png")}, folder_.Path("to"));
   FileOperationResult done = CarryOut(plan);
   WriteText(To("a.png.xmp"), "other");
   for (const std::string& name : {From("b.png.xmp"), To("b.png.xmp")}) WriteText(name, "later");

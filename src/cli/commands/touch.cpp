@@ -99,6 +99,7 @@ int RunUndo(const TouchOptions& options, const CommandContext& context) {
     return all || only.contains(file.path);
   };
   output.Expect(static_cast<size_t>(std::ranges::count_if(*log, wanted)));
+  if (log->empty()) return output.Finish();  // another run may be starting one
   std::vector<ChangedTimes> left;
   for (; !log->empty(); log->pop_back()) {
     const ChangedTimes& file = log->back();
