@@ -52,9 +52,12 @@ bool GoesWith(const std::string& sidecar, const std::string& picture) {
 std::vector<std::string> NamesBeside(const std::string& picture,
                                      const std::string& commentExtension) {
   std::vector<std::string> names = SidecarNames(picture);
-  if (names.size() < 2) names.emplace_back();
-  names.push_back(commentExtension.empty() ? std::string()
-                                           : CommentFileName(picture, {}, commentExtension));
+  const bool extended = names.size() > 1;
+  if (!extended) names.emplace_back();
+  // a text "README.txt" is none of "README"
+  names.push_back(commentExtension.empty() || !extended
+                      ? std::string()
+                      : CommentFileName(picture, {}, commentExtension));
   return names;
 }
 

@@ -10,7 +10,8 @@ namespace fotomill {
 // What goes along with a picture that is renamed or removed, as absolute paths if that of the
 // picture is: "photo.nef.xmp" always; "photo.xmp" if it names the picture's extension as its own,
 // or else with the last picture of that name, as it may be shared; and the comment file
-// "photo.nef.txt", for the extension "txt". No extension: there are no comment files.
+// "photo.nef.txt", for the extension "txt", unless the picture has no extension of its own. No
+// extension: there are no comment files.
 
 // The files that move along when a picture gets a new path, with theirs.
 std::vector<RenamedFile> SidecarMoves(const std::string& from, const std::string& to,

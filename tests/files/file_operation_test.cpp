@@ -152,7 +152,8 @@ TEST_F(FileOperationTest, SidecarsOfOthersStay) {
     const FileOperation operation{FileOperationKind::Trash, {{From(name), {}}}, "txt"};
     EXPECT_THAT(DeleteForGood(operation).failures, IsEmpty());
   };
-  for (const char* name : {"a.png.xmp", "a.png.txt", "b", "b.xmp"}) WriteText(From(name), name);
+  for (const char* name : {"a.png.xmp", "a.png.txt", "b", "b.xmp", "b.txt"})
+    WriteText(From(name), name);
   std::filesystem::create_directory(From("b.png.xmp"));
   WriteText(From("b.png.xmp/d.png"), "d");
   const std::vector<std::string> before = Names("from");
@@ -167,7 +168,7 @@ TEST_F(FileOperationTest, SidecarsOfOthersStay) {
     EXPECT_EQ(Names("from").size(), before.size() - 1);
     WriteText(From(name), name);
   }
-  std::filesystem::remove(From("b"));
+  for (const char* name : {"b", "b.txt"}) std::filesystem::remove(From(name));
   remove("b.png");
   EXPECT_THAT(Names("from"), ElementsAre("a.png", "a.png.txt", "a.png.xmp", "b.png.xmp", "sub"));
   EXPECT_EQ(ReadText(From("b.png.xmp/d.png")), "d");
