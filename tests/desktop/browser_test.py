@@ -78,6 +78,12 @@ def open_select_view(folder):
         desktop.xdotool("mousemove", "--window", window, 330, 280)
         desktop.xdotool("mousemove", "--window", window, 335, 285)
         desktop.wait(r"tip ")
+        # It does not stay above a dialog.
+        desktop.key("ctrl+k")
+        desktop.focus("Find command")
+        desktop.wait(r"tip hidden")
+        desktop.key("Escape")
+        desktop.focus("Fotomill Professional")
         desktop.xdotool("mousemove", 5, 5)
         desktop.key("ctrl+f")
         desktop.type("a?.")

@@ -37,8 +37,8 @@ def media_and_recent_files(folder):
         desktop.screenshot("large-names")
         # A sound is played by its program, and the window comes back when that ends.
         desktop.key("Home", "Right", "Return")
-        desktop.wait(r"open-with Player$")
         desktop.wait(r"external-program starts for .*b c.wav")
+        desktop.wait(r"open-with Player$")
         desktop.wait(r"external-program ended, raised")
         if marker.read_text() != str(pictures / "b c.wav"):
             raise Failure(marker.read_text())

@@ -3,6 +3,7 @@
 shown."""
 import os
 import shutil
+import signal
 
 from driven_desktop import PROJECT, Desktop, make_pictures, run
 
@@ -135,4 +136,49 @@ def folders_that_cannot_be_shown(folder):
         desktop.wait(rf"tabs=1 .*listing=0 .*folder={pictures}$")
 
 
-run(selection_after_undo, place_at_a_start, folders_that_cannot_be_shown)
+def changes_by_others(folder):
+    """The list of a view window and the tree follow the folder; messages go away."""
+    pictures = folder / "pictures"
+    make_pictures(pictures, ["b.bmp", "d.bmp"])
+    with Desktop(folder, pictures, settings=QUIET) as desktop:
+        desktop.wait(r"lines=2 .*listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "Return")
+        desktop.wait(r"view place=1/2 .*b.bmp")
+        make_pictures(pictures, ["a.bmp", "c.bmp"])
+        desktop.wait("view-list 2/4")
+        # The picture of a deleted file stays until another one is chosen.
+        (pictures / "b.bmp").unlink()
+        desktop.wait("view-list 2/4")
+        desktop.focus("View$")
+        desktop.key("space")
+        desktop.wait(r"view place=2/3 .*c.bmp")
+        # Deleting a file that others deleted meanwhile is not about the trash.
+        os.kill(desktop.program.pid, signal.SIGSTOP)
+        desktop.key("Delete")
+        (pictures / "c.bmp").unlink()
+        os.kill(desktop.program.pid, signal.SIGCONT)
+        desktop.wait("files Deletion of c.bmp done=0 failed=1")
+        desktop.wait("prompt failures")
+        desktop.focus("Some files failed", native=True)
+        desktop.key("Return", "Escape")
+        desktop.focus("Fotomill Professional")
+        (folder / "new").mkdir()  # beside the folder shown, in the tree
+        desktop.wait(rf"tree-names \d+ {folder}$")
+        # A name that is being typed survives a change of the list.
+        desktop.key("Home", "F2")
+        desktop.settle()
+        desktop.type("x")
+        make_pictures(pictures, ["0.bmp"])
+        desktop.wait(r"lines=3 .*listing=0")
+        desktop.type("y")
+        desktop.key("Return")
+        desktop.wait("files Rename done=1")
+        desktop.wait(r"lines=3 .*listing=0 .*focus=xy.bmp")
+        assert sorted(os.listdir(pictures)) == ["0.bmp", "d.bmp", "xy.bmp"]
+        desktop.key("Left", "Delete")
+        desktop.wait("status Deletion of d.bmp")
+        desktop.wait("status$")
+
+
+run(selection_after_undo, place_at_a_start, folders_that_cannot_be_shown, changes_by_others)

@@ -222,6 +222,7 @@ std::vector<bool> BrowserModel::SelectedItems() const {
 
 void BrowserModel::BuildLines(const std::vector<bool>& selectedItems, size_t focusItem,
                               size_t anchorItem) {
+  ++generation_;
   lines_.clear();
   groups_.clear();
   std::vector<bool> selected;

@@ -74,6 +74,8 @@ class BrowserModel {
   size_t ItemCount() const { return items_.size(); }
   const FolderItem& Item(size_t item) const { return items_[item]; }  // below ItemCount
   size_t LineCount() const { return lines_.size(); }                  // at most ItemCount
+  // Changes whenever the lines do, or their order.
+  uint64_t Generation() const { return generation_; }
   size_t ItemOfLine(size_t line) const { return lines_[line]; }       // below LineCount
   const FolderItem& Line(size_t line) const { return items_[lines_[line]]; }
   std::string PathOfLine(size_t line) const;  // folder and name
@@ -121,6 +123,7 @@ class BrowserModel {
 
   std::string folder_;
   bool listed_ = false;
+  uint64_t generation_ = 0;
   FolderView view_;
   std::string filter_;
   TagFilter tagFilter_ = TagFilter::All;

@@ -114,7 +114,7 @@ namespace {
 
 // Converts a result for the screen.
 Status ToScreen(PictureRecord& picture, const ViewLook& look, ViewPixels& pixels) {
-  if (look.profiles) ToScreenColors(picture.metadata.icc, picture.image);
+  if (look.profiles) ToScreenColors(picture.metadata.icc, look.screen, picture.image);
   picture.metadata.exif.clear();  // it is upright
   RETURN_IF_BAD(PrepareWithAlpha(picture));
   pixels.image = std::move(picture.image);

@@ -21,10 +21,15 @@ class ViewList {
 
   // The place some files further or back; the first file follows the last one.
   size_t PlaceAfter(int64_t steps) const;
-  void GoTo(size_t place) { place_ = place; }  // below Count
+  void GoTo(size_t place);  // below Count
   // Takes other files and stays at the current one. False, with no change, if they do not contain
   // it.
   bool Replace(const std::vector<std::string>& files);
+  // Takes the files of a folder that has changed. A current file that is gone stays in its place
+  // until another one is chosen.
+  void Follow(const std::vector<std::string>& files);
+  // Takes the new names after a file or folder was renamed. Whether the current file has one.
+  bool FollowRename(const std::string& from, const std::string& to);
   // Removes a file, unless it is the only one. The one after the current file takes its place.
   void Remove(const std::string& file);
 
@@ -35,6 +40,7 @@ class ViewList {
  private:
   std::vector<std::string> files_;
   size_t place_ = 0;
+  bool isGone_ = false;  // the current file is no longer in the folder
 };
 
 }  // namespace fotomill::desktop

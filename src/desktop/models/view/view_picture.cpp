@@ -22,7 +22,14 @@ namespace fotomill::desktop {
 
 namespace {
 
-std::vector<uint8_t> screenProfile;
+std::mutex screenMutex;
+std::vector<std::vector<uint8_t>> screenProfiles;
+
+// Empty for sRGB.
+std::vector<uint8_t> ScreenProfile(size_t screen) {
+  const std::lock_guard lock(screenMutex);
+  return screen < screenProfiles.size() ? screenProfiles[screen] : std::vector<uint8_t>();
+}
 
 constexpr uint64_t kRecordBytes = 64 * 1024;  // of a decoded picture besides its pixels
 
@@ -36,14 +43,16 @@ Status Shrink(const PictureRecord& picture, int32_t width, int32_t height, ViewP
                        shrunk.alpha);
 }
 
-// The transform for the thread's last profile, as the pictures in a folder and frames of an
+// The transform for the thread's last profiles, as the pictures in a folder and frames of an
 // animation mostly share theirs.
-const ColorTransform& TransformOf(const std::vector<uint8_t>& profile) {
-  thread_local std::vector<uint8_t> last;
+const ColorTransform& TransformOf(const std::vector<uint8_t>& profile,
+                                  const std::vector<uint8_t>& screen) {
+  thread_local std::vector<uint8_t> last, lastScreen;
   thread_local std::unique_ptr<ColorTransform> transform;
-  if (transform == nullptr || profile != last) {
-    transform = std::make_unique<ColorTransform>(profile, screenProfile);
+  if (transform == nullptr || profile != last || screen != lastScreen) {
+    transform = std::make_unique<ColorTransform>(profile, screen);
     last = profile;
+    lastScreen = screen;
   }
   return *transform;
 }
@@ -81,10 +90,14 @@ Status LoadInto(const ViewRequest& request, ViewPicture& view, ProgressSink* pro
 
 }  // namespace
 
-void SetScreenProfile(std::vector<uint8_t> profile) { screenProfile = std::move(profile); }
+void SetScreenProfiles(std::vector<std::vector<uint8_t>> profiles) {
+  const std::lock_guard lock(screenMutex);
+  screenProfiles = std::move(profiles);
+}
 
-void ToScreenColors(const std::vector<uint8_t>& icc, PackedImage& image) {
-  if (!icc.empty() || !screenProfile.empty()) (void)TransformOf(icc).Apply(image);
+void ToScreenColors(const std::vector<uint8_t>& icc, size_t screen, PackedImage& image) {
+  const std::vector<uint8_t> profile = ScreenProfile(screen);
+  if (!icc.empty() || !profile.empty()) (void)TransformOf(icc, profile).Apply(image);
 }
 
 ViewLook ViewLook::FromSettings() {
@@ -102,7 +115,8 @@ uint64_t ViewPicture::Bytes() const {
 Status PrepareView(PicturePointer picture, ViewPicture& view) {
   const ViewRequest& request = view.request;
   // Before compositing with the background, whose color is already for the screen.
-  if (request.look.profiles) ToScreenColors(picture->metadata.icc, picture->image);
+  if (request.look.profiles)
+    ToScreenColors(picture->metadata.icc, request.look.screen, picture->image);
   if (request.look.keepAlpha) {
     RETURN_IF_BAD(PrepareWithAlpha(*picture));
   } else {
@@ -146,10 +160,11 @@ bool ViewPicture::HasChanged() const {
 
 Status PixelsForOthers(const ViewPicture& view, Color background, RgbImage& pixels) {
   RETURN_IF_BAD(ToRgb(view.picture->image, view.picture->alpha, background, pixels));
-  if (!view.request.look.profiles || screenProfile.empty()) return Status::Ok;
+  const std::vector<uint8_t> screen = ScreenProfile(view.request.look.screen);
+  if (!view.request.look.profiles || screen.empty()) return Status::Ok;
   PackedImage image;
   RETURN_IF_BAD(ToPacked(pixels, image));
-  (void)ColorTransform(screenProfile).Apply(image);
+  (void)ColorTransform(screen).Apply(image);
   return ToRgb(image, pixels);
 }
 

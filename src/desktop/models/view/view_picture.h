@@ -22,17 +22,18 @@ namespace fotomill::desktop {
 struct ViewLook {
   bool profiles = false;   // apply color profiles
   bool keepAlpha = false;  // keep the alpha plane instead of using ViewModeBackground
+  size_t screen = 0;       // number of the screen whose profile applies
 
   // From the current settings.
   static ViewLook FromSettings();
   bool operator==(const ViewLook&) const = default;
 };
 
-// Sets the screen's color profile for pictures made from now on; empty for sRGB. Call before
-// requesting the first picture.
-void SetScreenProfile(std::vector<uint8_t> profile);
-// Converts pixels with an ICC profile, empty for sRGB, to the screen's colors. Any thread.
-void ToScreenColors(const std::vector<uint8_t>& icc, PackedImage& image);
+// Sets the color profiles of the screens, by their number, for pictures made from now on; empty or
+// missing: sRGB. Thread-safe.
+void SetScreenProfiles(std::vector<std::vector<uint8_t>> profiles);
+// Converts pixels with an ICC profile, empty for sRGB, to the colors of a screen. Any thread.
+void ToScreenColors(const std::vector<uint8_t>& icc, size_t screen, PackedImage& image);
 
 // A picture for a view window: a page of a
 // file, and the size of the window to fit.

@@ -59,7 +59,8 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
                },
                [this](const PlacedItems& found, bool last) { ShowFacts(found, last); },
                [this](const PlacedItems& found, bool last) { ShowTags(found, last); }}),
-      watch_([this] { Reload(); }),
+      watch_(wxFSW_EVENT_ALL & ~(wxFSW_EVENT_ACCESS | wxFSW_EVENT_WARNING | wxFSW_EVENT_ERROR),
+             [this](const std::vector<std::string>&) { Reload(); }),
       offer_(this, {[this] { FocusList(); }, [this] { canvas_->WantThumbnails(); }}) {
   model_.SetView(view);
   model_.SetGrouping(GroupingFromSettings());
@@ -95,7 +96,7 @@ BrowserPage::BrowserPage(wxWindow* parent, BrowserHost& host, ThumbnailService& 
     if (!digit || !TagByKey(event.GetKeyCode())) event.Skip();
   });
   SetDropTarget(
-      new FolderDrop([this](const wxPoint&) { return model_.Folder(); },
+      new FolderDrop([this](const wxPoint& place) { return FolderAt(place); },
                      [this](const std::vector<std::string>& files, const std::string& folder,
                             bool move) { host_.DropFiles(files, folder, move); }));
 }
@@ -174,7 +175,7 @@ void BrowserPage::ShowFolder(const std::string& folder, const std::string& focus
 
 // Empties the browser for another folder, whose view is set next.
 void BrowserPage::EnterFolder(const std::string& folder) {
-  watch_.Watch({});
+  watch_.UnwatchAll();
   offer_.Forget();
   model_.SetFolder(folder);
   bar_->ShowFolder(folder);
@@ -199,6 +200,7 @@ void BrowserPage::UseView(const BrowserModes& chosen) {
 }
 
 void BrowserPage::Reload() {
+  watch_.ReadingBegan();
   if (found_) return reader_.ListFound(model_.Folder(), *found_);
   reader_.List(model_.Folder(), model_.ItemCount() == 0, subfolders_);
   late_.StartOnce(kPatienceMs);
@@ -231,6 +233,7 @@ void BrowserPage::ShowListing(FolderListing listing, bool complete) {
   }
   if (otherView) ShowView();
   host_.BrowserChanged();
+  if (complete) watch_.ReadingEnded();
 }
 
 // Shows the new lines, with the selection, focus and place waited for. `first`: there were none
@@ -441,8 +444,15 @@ void BrowserPage::Activate(size_t line) {
   host_.ViewFile(path);
 }
 
+// A folder in the list, else the folder of the list.
+std::string BrowserPage::FolderAt(const wxPoint& place) const {
+  if (ShowsDetails() || !canvas_->IsShownOnScreen()) return model_.Folder();
+  const size_t line = canvas_->LineAt(canvas_->ScreenToClient(ClientToScreen(place)));
+  return line != kNoLine && model_.Line(line).folder ? model_.PathOfLine(line) : model_.Folder();
+}
+
 void BrowserPage::BeginDrag() {
-  const std::vector<std::string> chosen = model_.FilesForFunction();
+  const std::vector<std::string> chosen = model_.PathsForFunction();
   if (chosen.empty()) return;
   FileListData files(chosen);
   wxDropSource source(files, this);

@@ -148,6 +148,7 @@ class BrowserPage : public wxPanel {
   void ChooseView(const FolderView& view);
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
   void Activate(size_t line);
+  std::string FolderAt(const wxPoint& place) const;
   void BeginDrag();
 
   BrowserHost& host_;

@@ -1,6 +1,7 @@
 #include "desktop/windows/browser/folder_tree.h"
 
 #include <wx/app.h>
+#include <wx/dnd.h>
 #include <wx/menu.h>
 #include <wx/textdlg.h>
 
@@ -9,6 +10,7 @@
 #include "core/workers/background_task.h"
 #include "desktop/models/browser/folder_listing.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/files/file_list_data.h"
 #include "desktop/windows/widgets/bitmaps.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/folders.h"
@@ -18,6 +20,8 @@
 namespace fotomill::desktop {
 
 namespace {
+
+constexpr int kOpenMs = 900;  // dragging over a folder opens it
 
 enum Image { kFolderImage, kHomeImage, kFavoriteImage, kVolumeImage };
 
@@ -42,7 +46,12 @@ FolderTree::FolderTree(wxWindow* parent, const Favorites& favorites, Events even
                      wxTR_FULL_ROW_HIGHLIGHT | wxBORDER_NONE,
                  wxDefaultValidator, Label("Folders")),
       favorites_(favorites),
-      events_(std::move(events)) {
+      events_(std::move(events)),
+      watch_(wxFSW_EVENT_CREATE | wxFSW_EVENT_DELETE | wxFSW_EVENT_RENAME,
+             [this](std::vector<std::string> folders) {
+               watch_.ReadingBegan();
+               Read(std::move(folders));
+             }) {
   LoadImages();
   Bind(wxEVT_SYS_COLOUR_CHANGED, [this](wxSysColourChangedEvent& event) {
     LoadImages();
@@ -62,6 +71,18 @@ FolderTree::FolderTree(wxWindow* parent, const Favorites& favorites, Events even
     if (following_ || folder.empty()) return;
     followed_ = folder;
     events_.chosen(folder);
+  });
+  Bind(wxEVT_TREE_BEGIN_DRAG, [this](wxTreeEvent& event) { BeginDrag(event.GetItem()); });
+  openTimer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
+    if (drop_.IsOk()) Expand(drop_);
+  });
+  // The tree gets its size after it followed the first folder.
+  Bind(wxEVT_SIZE, [this](wxSizeEvent& event) {
+    event.Skip();
+    CallAfter([this] {
+      if (FolderOf(GetSelection()) == followed_ && !followed_.empty())
+        EnsureVisible(GetSelection());
+    });
   });
   Bind(wxEVT_TREE_ITEM_MENU,
        [this](wxTreeEvent& event) { ShowMenu(event.GetItem(), event.GetPoint()); });
@@ -102,8 +123,10 @@ void FolderTree::UpdatePlaces() {
     return FolderOf(item) == place.folder && GetItemImage(item) == place.image;
   };
   for (const wxTreeItemId& item : ChildrenOf(GetRootItem())) {
-    if (std::ranges::none_of(places, [&](const Place& place) { return shows(item, place); }))
+    if (std::ranges::none_of(places, [&](const Place& place) { return shows(item, place); })) {
+      MarkDrop(nullptr);
       Delete(item);
+    }
   }
   size_t at = 0;
   for (const wxTreeItemId& item : ChildrenOf(GetRootItem())) {
@@ -162,14 +185,18 @@ void FolderTree::Reread() {
 }
 
 void FolderTree::Read(std::vector<std::string> folders) {
-  (void)RunLoose([this, alive = std::weak_ptr(alive_), folders = std::move(folders)] {
+  const bool begun = RunLoose([this, alive = std::weak_ptr(alive_), folders = std::move(folders)] {
     for (const std::string& folder : folders) {
       if (alive.expired()) return;
       wxTheApp->CallAfter([this, alive, folder, names = SubfolderNames(folder)] {
         if (!alive.expired()) ShowNames(folder, names);
       });
     }
+    wxTheApp->CallAfter([this, alive] {
+      if (!alive.expired()) watch_.ReadingEnded();
+    });
   });
+  if (!begun) watch_.ReadingEnded();
 }
 
 void FolderTree::ShowNames(const std::string& folder, const std::vector<std::string>& names) {
@@ -181,8 +208,32 @@ void FolderTree::ShowNames(const std::string& folder, const std::vector<std::str
     if (item.IsOk() && static_cast<FolderData*>(GetItemData(item))->filled)
       MergeNames(item, folder, names);
   }
+  LogEvent("tree-names", std::to_string(names.size()) + " " + folder);
   opening_.erase(folder);
+  watch_.Watch(folder);
   FollowOn();
+}
+
+// --- dragging ---
+
+void FolderTree::BeginDrag(const wxTreeItemId& item) {
+  const std::string folder = FolderOf(item);
+  if (platform::FileNameOf(folder).empty()) return;
+  FileListData files(std::vector{folder});
+  wxDropSource source(files, this);
+  source.DoDragDrop(wxDrag_AllowMove);
+}
+
+void FolderTree::MarkDrop(const wxPoint* point) {
+  int flags = 0;
+  const wxTreeItemId item = point == nullptr ? wxTreeItemId() : HitTest(*point, flags);
+  if (item == drop_) return;
+  if (drop_.IsOk()) SetItemDropHighlight(drop_, false);
+  drop_ = item;
+  if (item.IsOk()) SetItemDropHighlight(item, true);
+  if (item.IsOk()) openTimer_.StartOnce(kOpenMs);
+  if (!item.IsOk()) openTimer_.Stop();
+  LogEvent("tree-drop", FolderOf(item));
 }
 
 // Keeps the state of existing folders, expanded or not.
@@ -191,7 +242,10 @@ void FolderTree::MergeNames(const wxTreeItemId& item, const std::string& folder,
   following_ = true;
   const std::set<std::string> there(names.begin(), names.end());
   for (const wxTreeItemId& child : ChildrenOf(item)) {
-    if (!there.contains(std::string(platform::FileNameOf(FolderOf(child))))) Delete(child);
+    if (there.contains(std::string(platform::FileNameOf(FolderOf(child))))) continue;
+    watch_.Unwatch(FolderOf(child));  // a renamed folder would be watched by its old name
+    MarkDrop(nullptr);  // it may lie in this folder; the next motion marks it again
+    Delete(child);
   }
   std::set<std::string> shown;
   for (const wxTreeItemId& child : ChildrenOf(item)) shown.insert(FolderOf(child));

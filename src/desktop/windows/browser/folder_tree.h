@@ -1,5 +1,6 @@
 #pragma once
 
+#include <wx/timer.h>
 #include <wx/treectrl.h>
 
 #include <functional>
@@ -10,6 +11,7 @@
 #include <vector>
 
 #include "desktop/models/shell/favorites.h"
+#include "desktop/windows/browser/folder_watch.h"
 
 namespace fotomill::desktop {
 
@@ -36,6 +38,9 @@ class FolderTree : public wxTreeCtrl {
   void Follow(const std::string& folder);
   // The folder of an item; empty if invalid.
   std::string FolderOf(const wxTreeItemId& item) const;
+  // Marks the item at a point of the window as the place of a drop, and opens it after a while.
+  // Null: none.
+  void MarkDrop(const wxPoint* point);
   // The folder at a point of the window; empty if there is none.
   std::string FolderAt(const wxPoint& point) const;
 
@@ -49,6 +54,7 @@ class FolderTree : public wxTreeCtrl {
   void ShowNames(const std::string& folder, const std::vector<std::string>& names);
   void MergeNames(const wxTreeItemId& item, const std::string& folder,
                   const std::vector<std::string>& names);
+  void BeginDrag(const wxTreeItemId& item);
   // Expands further toward the followed folder, as far as folders have been read.
   void FollowOn();
   wxTreeItemId FindChild(const wxTreeItemId& item, const std::string& folder) const;
@@ -65,6 +71,9 @@ class FolderTree : public wxTreeCtrl {
   std::set<std::string> opening_;
   // the selection was changed by Follow, not by the user
   bool following_ = false;
+  FolderWatch watch_;  // folders read so far, for those made or removed by others
+  wxTreeItemId drop_;  // marked item
+  wxTimer openTimer_;  // until the marked item is opened
   // for threads that outlive the window
   const std::shared_ptr<bool> alive_ = std::make_shared<bool>(true);
 };

@@ -5,22 +5,39 @@
 
 #include <functional>
 #include <memory>
+#include <set>
 #include <string>
+#include <vector>
+
+#include "desktop/models/browser/reread_pace.h"
 
 namespace fotomill::desktop {
 
-// Watches a folder for changes; reports several changes at once.
+// Watches folders for changes; reports several changes at once, and those of a folder that keeps
+// changing less often. Works only while the event loop runs, and unless WatchFolders is off.
 class FolderWatch : public wxEvtHandler {
  public:
-  explicit FolderWatch(std::function<void()> changed);
-  // Watches another folder, unless WatchFolders is off; empty: none. Works only while the event
-  // loop runs.
+  // `changed` gets the watched folders that have changed, to be read again. `kinds` are flags
+  // of wxFSW_EVENT.
+  FolderWatch(int kinds, std::function<void(std::vector<std::string> folders)> changed);
+  // Watches one more folder, up to a limit.
   void Watch(const std::string& folder);
+  // No longer watches a folder and those in it.
+  void Unwatch(const std::string& folder);
+  void UnwatchAll();
+  // Call when reading folders begins and ends.
+  void ReadingBegan();
+  void ReadingEnded();
 
  private:
-  const std::function<void()> changed_;
-  std::string folder_;
-  std::unique_ptr<wxFileSystemWatcher> watcher_;
+  void OnChange(wxFileSystemWatcherEvent& event);
+  void Report();
+
+  const int kinds_;
+  const std::function<void(std::vector<std::string> folders)> changed_;
+  std::unique_ptr<wxFileSystemWatcher> watcher_;  // created when the event loop runs
+  std::set<std::string> watched_, news_;
+  RereadPace pace_;
   wxTimer gather_;
 };
 

@@ -3,6 +3,7 @@
 #include <wx/window.h>
 
 #include <algorithm>
+#include <utility>
 
 #include "desktop/models/browser/file_tip.h"
 #include "desktop/models/shell/event_log.h"
@@ -35,7 +36,17 @@ void HoverTip::Over(const std::string& folder, const FolderItem* item, Status kn
     wait_.StartOnce(std::clamp(settings.FileTipDelay - kSystemsDelayMs, 1, 60'000));
 }
 
+// The toolkit would leave the tip above a dialog.
+void HoverTip::OnActivate(wxActivateEvent& event) {
+  event.Skip();
+  if (event.GetActive() || item_.name.empty()) return;
+  Over(folder_, nullptr, Status::Ok);
+  LogEvent("tip", "hidden");
+}
+
 void HoverTip::Read() {
+  if (!std::exchange(listens_, true))
+    wxGetTopLevelParent(&window_)->Bind(wxEVT_ACTIVATE, &HoverTip::OnActivate, this);
   reading_.Start([this, folder = folder_, item = item_, known = known_](
                      const StopToken&, const LooseWork::Report& report) {
     report([this, lines = FileTipLines(folder, item, known)] {

@@ -21,12 +21,14 @@ class HoverTip : public wxEvtHandler {
 
  private:
   void Read();
+  void OnActivate(wxActivateEvent& event);
 
   wxWindow& window_;
   wxTimer wait_;
   std::string folder_;
   FolderItem item_;  // empty name: none
   Status known_ = Status::Ok;
+  bool listens_ = false;  // to the activation of its frame
   LooseWork reading_;
 };
 

@@ -110,9 +110,9 @@ void ThumbnailCanvas::MeasureCells() {
 
 void ThumbnailCanvas::ModelChanged() {
   restored_.reset();
-  editor_.Finish(false);
   MeasureCells();
   scroll_ = std::clamp<int64_t>(scroll_, 0, layout_.LargestScroll());
+  KeepEditing();
   UpdateScrollbar();
   WaitForRest();
   WantThumbnails();
@@ -478,20 +478,32 @@ void ThumbnailCanvas::EditName(size_t line) {
   editor_.Finish(true);
   if (line >= model_.LineCount()) return;
   ShowLine(line);
-  const Rect cell = layout_.Cell(line);
   const std::string name(ShownName(model_.Line(line)));
-  const int height = textHeight_ + FromDIP(12);
-  const int top = static_cast<int>(cell.y - scroll_) + cell.height - height;
   const size_t base = model_.Line(line).folder
                           ? name.size()
                           : name.size() - platform::SplitPath(name).extension.size();
   editedLine_ = line;
-  editor_.Begin(wxRect(cell.x, top, std::max(cell.width, FromDIP(160)), height), Label("New name"),
-                name, base, [this, line](const std::string& changed) {
-                  if (line < model_.LineCount() && changed != ShownName(model_.Line(line)) &&
-                      events_.renamed)
-                    events_.renamed(line, changed);
-                });
+  editedPath_ = model_.PathOfLine(line);
+  editor_.Begin(EditorPlace(), Label("New name"), name, base, [this](const std::string& changed) {
+    if (editedLine_ < model_.LineCount() && changed != ShownName(model_.Line(editedLine_)) &&
+        events_.renamed)
+      events_.renamed(editedLine_, changed);
+  });
+}
+
+wxRect ThumbnailCanvas::EditorPlace() const {
+  const Rect cell = layout_.Cell(editedLine_);
+  const int height = textHeight_ + FromDIP(12);
+  const int top = static_cast<int>(cell.y - scroll_) + cell.height - height;
+  return {cell.x, top, std::max(cell.width, FromDIP(160)), height};
+}
+
+// What is typed stays when others change the folder, unless the file is gone.
+void ThumbnailCanvas::KeepEditing() {
+  if (!editor_.Open()) return;
+  editedLine_ = model_.LineOfPath(editedPath_);
+  if (editedLine_ == kNoLine) return editor_.Finish(false);
+  editor_.MoveTo(EditorPlace());
 }
 
 }  // namespace fotomill::desktop

@@ -53,6 +53,8 @@ class ThumbnailCanvas : public wxWindow {
   void RestorePlace(int64_t scroll, size_t line);
   // Whether at least a part of the line is visible; false for kNoLine.
   bool InSight(size_t line) const;
+  // The line at a point of the window; kNoLine if there is none.
+  size_t LineAt(const wxPoint& point) const;
   // Lets the user rename a file in place.
   void EditName(size_t line);
   // The number of visible thumbnails not loaded yet.
@@ -102,7 +104,8 @@ class ThumbnailCanvas : public wxWindow {
   size_t RoomAhead(const CellLayout::Range& visible);
   void ShowRestored();
   void DropBitmaps();
-  size_t LineAt(const wxPoint& point) const;
+  wxRect EditorPlace() const;
+  void KeepEditing();
   void MoveFocus(Step step, const wxKeyEvent& event);
   void ReportFocus();
   void ReportSelection();
@@ -155,6 +158,7 @@ class ThumbnailCanvas : public wxWindow {
   HoverTip tip_;
   InPlaceEditor editor_;
   size_t editedLine_ = kNoLine;
+  std::string editedPath_;
 };
 
 }  // namespace fotomill::desktop

@@ -34,11 +34,15 @@ int AskKind(const std::string& folder) {
 }  // namespace
 
 wxDragResult FolderDrop::OnDragOver(wxCoord x, wxCoord y, wxDragResult) {
-  if (folderAt_(wxPoint(x, y)).empty()) return wxDragNone;
+  const wxPoint place(x, y);
+  const bool accepts = !folderAt_(place).empty();
+  MarkPlace(accepts ? &place : nullptr);
+  if (!accepts) return wxDragNone;
   return KindNow() == DropKind::Move ? wxDragMove : wxDragCopy;
 }
 
 wxDragResult FolderDrop::OnData(wxCoord x, wxCoord y, wxDragResult suggested) {
+  MarkPlace(nullptr);
   if (!GetData()) return wxDragNone;
   std::vector<std::string> files = static_cast<FileListData*>(GetDataObject())->Paths();
   return Drop(folderAt_(wxPoint(x, y)), std::move(files)) ? suggested : wxDragNone;
@@ -47,7 +51,10 @@ wxDragResult FolderDrop::OnData(wxCoord x, wxCoord y, wxDragResult suggested) {
 // False if there is nothing to do.
 bool FolderDrop::Drop(const std::string& folder, std::vector<std::string> files) const {
   if (folder.empty() || files.empty()) return false;
-  // Ignore files already in the folder.
+  // Ignore files already in the folder, and folders on themselves.
+  for (const std::string& file : files) {
+    if (platform::JoinFolder(folder, "").starts_with(platform::JoinFolder(file, ""))) return false;
+  }
   if (platform::SplitPath(files.front()).folder == platform::JoinFolder(folder, "")) return false;
   const bool asks = KindNow() == DropKind::Move && settings.PromptBeforeMoving != 0;
   const DropKind kind = asks ? DropKind::Ask : KindNow();

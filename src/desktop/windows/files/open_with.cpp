@@ -26,14 +26,22 @@ namespace {
 constexpr size_t kMostWaitedFor = 16;
 constexpr double kHandOverSeconds = 2;  // earlier exit: passed on to another process
 
-// Runs the chosen command, or else the registered program. Reports to the window's thread as long
-// as the window exists.
+// Runs the chosen command, or else the first registered program. Reports to the window's thread as
+// long as the window exists.
 class Host : public ExternalProgramHost {
  public:
   Host(Shell& shell, StopToken stop, std::vector<std::string> command)
       : shell_(shell), stop_(std::move(stop)), command_(std::move(command)) {}
 
-  std::vector<std::string> CommandFor(const std::string&) override { return command_; }
+  std::vector<std::string> CommandFor(const std::string& file) override {
+    if (!command_.empty()) return command_;
+    const std::vector<platform::Program> programs = platform::ProgramsFor(file);
+    if (programs.empty()) return {};
+    OnWindow([name = programs.front().name] { LogEvent("open-with", name); });
+    std::vector<std::vector<std::string>> commands =
+        platform::CommandsFor(programs.front(), {file});
+    return commands.empty() ? std::vector<std::string>() : std::move(commands.front());
+  }
   void ShowMessage(std::string_view text) override {
     OnWindow([&shell = shell_, text] {
       LogEvent("prompt", std::string(text));
@@ -75,11 +83,7 @@ void ExternalPrograms::Start(const std::string& file, std::vector<std::string> c
   if (!RunLoose(run)) host->ShowMessage(kNoExternalProgram);
 }
 
-void ExternalPrograms::Open(const std::string& file) {
-  const std::vector<platform::Program> programs = platform::ProgramsFor(file);
-  if (programs.empty()) return Start(file, {}, 0);
-  OpenWith(programs.front(), {file});
-}
+void ExternalPrograms::Open(const std::string& file) { Start(file, {}, 0); }
 
 void ExternalPrograms::OpenWith(const platform::Program& program,
                                 const std::vector<std::string>& files) {
@@ -90,22 +94,29 @@ void ExternalPrograms::OpenWith(const platform::Program& program,
   for (size_t i = 0; i < commands.size(); ++i) Start(files[i], std::move(commands[i]), flags);
 }
 
-wxMenu* NewOpenWithMenu(Shell& shell, const std::vector<std::string>& files) {
-  if (files.empty()) return nullptr;
-  const std::vector<platform::Program> programs = platform::ProgramsFor(files.front());
+OpenWithMenu::OpenWithMenu(Shell& shell, const std::vector<std::string>& files)
+    : shell_(shell), files_(files), waiting_(Append(wxID_ANY, Label("Searching..."))) {
+  waiting_->Enable(false);
+  programs_.Ask<std::vector<platform::Program>>(
+      [file = files.front()] { return platform::ProgramsFor(file); },
+      [this](const std::vector<platform::Program>& programs) { Fill(programs); });
+}
+
+void OpenWithMenu::Fill(const std::vector<platform::Program>& programs) {
   std::string names;
-  for (const platform::Program& program : programs) names += program.name + ";";
-  LogEvent("programs", names);
-  if (programs.empty()) return nullptr;
-  auto* menu = new wxMenu;
   for (const platform::Program& program : programs) {
-    const int id = menu->Append(wxID_ANY, wxControl::EscapeMnemonics(Shown(program.name)))->GetId();
-    menu->Bind(
+    names += program.name + ";";
+    const int id = Append(wxID_ANY, wxControl::EscapeMnemonics(Shown(program.name)))->GetId();
+    Bind(
         wxEVT_MENU,
-        [&shell, program, files](wxCommandEvent&) { shell.Programs().OpenWith(program, files); },
-        id);
+        [this, program](wxCommandEvent&) { shell_.Programs().OpenWith(program, files_); }, id);
   }
-  return menu;
+  if (programs.empty()) {
+    waiting_->SetItemLabel(Label("No programs"));
+  } else {
+    Destroy(waiting_);
+  }
+  LogEvent("programs", names);
 }
 
 }  // namespace fotomill::desktop

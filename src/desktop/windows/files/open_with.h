@@ -1,13 +1,14 @@
 #pragma once
 
+#include <wx/menu.h>
+
 #include <cstdint>
 #include <string>
 #include <vector>
 
 #include "core/workers/stop_token.h"
+#include "desktop/windows/widgets/file_question.h"
 #include "platform/programs.h"
-
-class wxMenu;
 
 namespace fotomill::desktop {
 
@@ -35,8 +36,19 @@ class ExternalPrograms {
   const StopSource stop_;
 };
 
-// Creates a menu of the programs registered for the first file's type; each opens all files. Null
-// if there are none.
-wxMenu* NewOpenWithMenu(Shell& shell, const std::vector<std::string>& files);
+// A menu of the programs registered for the first file's type; each opens all files. The system is
+// asked in the background, so they may appear a moment after the menu.
+class OpenWithMenu : public wxMenu {
+ public:
+  OpenWithMenu(Shell& shell, const std::vector<std::string>& files);  // at least one
+
+ private:
+  void Fill(const std::vector<platform::Program>& programs);
+
+  Shell& shell_;
+  const std::vector<std::string> files_;
+  wxMenuItem* const waiting_;
+  FileQuestion programs_;
+};
 
 }  // namespace fotomill::desktop

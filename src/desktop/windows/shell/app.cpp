@@ -108,9 +108,7 @@ class App : public wxApp {
     ApplyPluginSettings();
     EnablePlugins();
     DeleteOldPreviousFiles();
-    std::vector<uint8_t> screen = ReadScreenProfile();
-    LogEvent("screen-profile", std::to_string(screen.size()));
-    SetScreenProfile(std::move(screen));
+    TakeScreenProfiles();
     const EarlySettings early = ReadEarlySettings();
     ShowStartupWindow(early);
     frame_ = new MainFrame;

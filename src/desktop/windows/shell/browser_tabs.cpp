@@ -9,6 +9,7 @@
 #include "desktop/models/shell/favorites.h"
 #include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/files/file_actions.h"
+#include "desktop/windows/files/folder_drop.h"
 #include "desktop/windows/shell/flat_tab_art.h"
 #include "desktop/windows/shell/frame_menus.h"
 #include "desktop/windows/shell/picture_windows.h"
@@ -178,7 +179,19 @@ void BrowserTabs::OnTabChanged(wxAuiNotebookEvent& event) {
   if (left != wxNOT_FOUND && static_cast<size_t>(left) < book_->GetPageCount())
     PageAt(static_cast<size_t>(left))->KeepColumns();
   for (wxWindow* const window : book_->GetChildren()) {
-    if (dynamic_cast<wxAuiTabCtrl*>(window) != nullptr) window->SetName(Label("Tabs"));
+    auto* const tabs = dynamic_cast<wxAuiTabCtrl*>(window);
+    if (tabs == nullptr) continue;
+    tabs->SetName(Label("Tabs"));
+    if (tabs->GetDropTarget() != nullptr) continue;
+    // Files dropped on a tab go to its folder.
+    const auto folder = [tabs](const wxPoint& place) {
+      wxWindow* page = nullptr;
+      const bool hit = tabs->TabHitTest(place.x, place.y, &page);
+      return hit ? static_cast<BrowserPage*>(page)->Model().Folder() : std::string();
+    };
+    const auto drop = [this](const std::vector<std::string>& files, const std::string& to,
+                             bool move) { DropFiles(files, to, move); };
+    tabs->SetDropTarget(new FolderDrop(folder, drop));
   }
   if (BrowserPage* browser = Front()) {
     browser->Activated();

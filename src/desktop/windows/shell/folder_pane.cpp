@@ -41,7 +41,8 @@ FolderPane::FolderPane(Shell& shell) : shell_(shell) {
   tree_->SetDropTarget(
       new FolderDrop([this](const wxPoint& place) { return tree_->FolderAt(place); },
                      [this](const std::vector<std::string>& files, const std::string& folder,
-                            bool move) { shell_.Files().Drop(files, folder, move); }));
+                            bool move) { shell_.Files().Drop(files, folder, move); },
+                     [this](const wxPoint* place) { tree_->MarkDrop(place); }));
 }
 
 wxWindow* FolderPane::Parent() const { return splitter_; }

@@ -230,9 +230,9 @@ void FrameMenus::ShowContextMenu(wxWindow& window, const wxPoint& place) {
     menu.Append(CommandId(command), MenuText(command), Label(command.help));
   }
   menu.AppendSubMenu(NewQuickMenu(), Label("&Quick actions"));
-  if (wxMenu* programs = NewOpenWithMenu(shell_, shell_.Tabs().SelectedFiles())) {
+  if (const std::vector<std::string> files = shell_.Tabs().SelectedFiles(); !files.empty()) {
     menu.AppendSeparator();
-    menu.AppendSubMenu(programs, Label("Open &with"));
+    menu.AppendSubMenu(new OpenWithMenu(shell_, files), Label("Open &with"));
   }
   window.PopupMenu(&menu, place);
 }

@@ -6,6 +6,7 @@
 #include <vector>
 
 #include "batch/external_program.h"
+#include "desktop/models/shell/event_log.h"
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/files/file_actions.h"
 #include "desktop/windows/files/open_with.h"
@@ -17,6 +18,7 @@
 #include "desktop/windows/shell/function_toolbar.h"
 #include "desktop/windows/shell/picture_windows.h"
 #include "desktop/windows/shell/side_pane.h"
+#include "desktop/windows/view/screen_profile.h"
 #include "desktop/windows/widgets/unsaved_work.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/files.h"
@@ -35,6 +37,7 @@ namespace {
 constexpr const char* kTitle = "Fotomill Professional";
 const wxSize kUsualSize(1180, 760), kLeastSize(400, 300);  // device-independent pixels
 enum StatusField { kCountField, kMessageField, kFieldCount };
+constexpr int kMessageMs = 8000;  // until a message goes away
 
 }  // namespace
 
@@ -52,6 +55,7 @@ MainFrame::MainFrame()
                                         [this] { BrowserChanged(); });
   side_->PlaceBeside(tabs_->Window());
   folders_->PlaceBeside(*side_->Parent());
+  messageTimer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) { Report({}); });
   session_ = std::make_unique<FrameSession>(*this);
   pictures_ = std::make_unique<PictureWindows>(*this);
   CreateStatusBar(kFieldCount);
@@ -64,6 +68,10 @@ MainFrame::MainFrame()
   });
   files_ = std::make_unique<FileActions>(*this);
   batches_ = std::make_unique<BatchRunner>(*this);
+  Bind(wxEVT_DISPLAY_CHANGED, [](wxDisplayChangedEvent& event) {
+    TakeScreenProfiles();
+    event.Skip();
+  });
   Bind(wxEVT_CLOSE_WINDOW, &MainFrame::OnClose, this);
   // Volumes may have changed while the window was inactive.
   Bind(wxEVT_ACTIVATE, [this](wxActivateEvent& event) {
@@ -157,6 +165,7 @@ void MainFrame::FilesChanged() {
 void MainFrame::FollowRename(const std::string& from, const std::string& to) {
   folders_->FollowRename(from, to);
   tabs_->FollowRename(from, to);
+  pictures_->FollowRename(from, to);
 }
 
 void MainFrame::SettingsChanged() {
@@ -168,7 +177,11 @@ void MainFrame::SettingsChanged() {
   FilesChanged();
 }
 
-void MainFrame::Report(const std::string& text) { SetStatusText(Shown(text), kMessageField); }
+void MainFrame::Report(const std::string& text) {
+  SetStatusText(Shown(text), kMessageField);
+  LogEvent("status", text);
+  if (!text.empty()) messageTimer_.StartOnce(kMessageMs);
+}
 
 void MainFrame::OnClose(wxCloseEvent& event) {
   if (event.CanVeto() && !CloseWorkWindows()) return event.Veto();

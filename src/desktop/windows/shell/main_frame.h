@@ -1,6 +1,7 @@
 #pragma once
 
 #include <wx/frame.h>
+#include <wx/timer.h>
 
 #include <functional>
 #include <memory>
@@ -56,6 +57,7 @@ class MainFrame : public wxFrame, public Shell {
   void OnClose(wxCloseEvent& event);
 
   wxString count_;  // of the status bar
+  wxTimer messageTimer_;
   ThumbnailService thumbnails_;
   std::unique_ptr<UseRecorder> uses_;
   std::unique_ptr<FrameMenus> menus_;

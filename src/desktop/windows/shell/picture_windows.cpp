@@ -35,7 +35,9 @@ void PictureWindows::ViewFromBrowser(const std::string& path, bool another) {
   if (browser == nullptr) return;
   if (NeedsExternalProgram(path)) return shell_.Programs().Open(path);
   const std::vector<std::string> selected = browser->Model().FilesForFunction();
-  View(selected.size() > 1 ? selected : browser->Model().ShownFiles(), path, another);
+  const bool some = selected.size() > 1 || browser->ShowsFound();
+  View(selected.size() > 1 ? selected : browser->Model().ShownFiles(), path, another)
+      .FollowFolder(some ? std::string() : browser->Model().Folder());
 }
 
 void PictureWindows::ViewBeforeFolder(const std::string& path, std::function<void()> showFolder) {
@@ -52,14 +54,39 @@ void PictureWindows::ViewBeforeFolder(const std::string& path, std::function<voi
   });
 }
 
+std::vector<ViewFrame*> PictureWindows::Views() const {
+  std::vector<ViewFrame*> views;
+  for (wxWindow* window : shell_.Window().GetChildren()) {
+    if (auto* view = dynamic_cast<ViewFrame*>(window)) views.push_back(view);
+  }
+  return views;
+}
+
 void PictureWindows::OfferList(const BrowserPage& browser) {
-  if (wantsList_ == nullptr || browser.Listing()) return;
-  if (wantsList_->UseList(browser.Model().ShownFiles())) wantsList_ = nullptr;
+  const BrowserModel& model = browser.Model();
+  if (browser.Listing() || browser.ShowsFound() || !model.Listed()) return;
+  if (wantsList_ == nullptr && model.Generation() == offered_ && model.Folder() == offeredFolder_)
+    return;
+  offered_ = model.Generation();
+  offeredFolder_ = model.Folder();
+  std::vector<std::string> files;
+  for (ViewFrame* const view : Views()) {
+    if (view != wantsList_ && view->FollowedFolder() != model.Folder()) continue;
+    if (files.empty()) files = model.ShownFiles();
+    if (view->UseList(files) && view == wantsList_) {
+      view->FollowFolder(model.Folder());
+      wantsList_ = nullptr;
+    }
+  }
+}
+
+void PictureWindows::FollowRename(const std::string& from, const std::string& to) {
+  for (ViewFrame* const view : Views()) view->FollowRename(from, to);
 }
 
 void PictureWindows::FilesChanged() {
+  for (ViewFrame* const view : Views()) view->FilesChanged();
   for (wxWindow* window : shell_.Window().GetChildren()) {
-    if (auto* view = dynamic_cast<ViewFrame*>(window)) view->FilesChanged();
     if (auto* compare = dynamic_cast<CompareFrame*>(window)) compare->FilesChanged();
   }
   RefreshExifEditors();

@@ -29,14 +29,20 @@ class PictureWindows {
   // picture is on the screen; the picture keeps the focus, and gets its neighbors after that folder
   // is listed.
   void ViewBeforeFolder(const std::string& path, std::function<void()> showFolder);
-  // Call when the current browser has changed; a window may be waiting for its list.
+  // Call when the current browser has changed: view windows that show its folder get its list.
   void OfferList(const BrowserPage& browser);
+  // Call after a file or folder may have been renamed.
+  void FollowRename(const std::string& from, const std::string& to);
   // Call after files were written, to reload changed pictures.
   void FilesChanged();
 
  private:
+  std::vector<ViewFrame*> Views() const;
+
   Shell& shell_;
   wxWeakRef<ViewFrame> lastUsed_;
+  uint64_t offered_ = 0;  // generation of the list last offered, and its folder
+  std::string offeredFolder_;
   wxWeakRef<ViewFrame> wantsList_;  // waiting for the listing of its folder
 };
 

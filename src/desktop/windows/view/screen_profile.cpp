@@ -1,12 +1,21 @@
 #include "desktop/windows/view/screen_profile.h"
 
+#include <wx/display.h>
+#include <wx/window.h>
+
+#include <string>
+#include <utility>
+
+#include "desktop/models/shell/event_log.h"
+#include "desktop/models/view/view_picture.h"
 #include "platform/shared_library.h"
 
 namespace fotomill::desktop {
 
 namespace {
 
-constexpr char kProperty[] = "_ICC_PROFILE";  // "ICC Profiles in X", version 0.4
+// "ICC Profiles in X", version 0.4; the names of further screens end with their number.
+constexpr char kProperty[] = "_ICC_PROFILE";
 constexpr size_t kLargestProfile = 8 << 20;
 constexpr int kByteFormat = 8;  // bits per value
 
@@ -65,9 +74,20 @@ class Gdk {
 
 }  // namespace
 
-std::vector<uint8_t> ReadScreenProfile() {
+void TakeScreenProfiles() {
   const Gdk gdk;
-  return gdk.OnX11() ? gdk.BytesOfRoot(kProperty) : std::vector<uint8_t>();
+  std::vector<std::vector<uint8_t>> profiles;
+  for (unsigned screen = 0; gdk.OnX11() && screen < wxDisplay::GetCount(); ++screen) {
+    const std::string number = screen == 0 ? std::string() : "_" + std::to_string(screen);
+    profiles.push_back(gdk.BytesOfRoot((kProperty + number).c_str()));
+    LogEvent("screen-profile", std::to_string(profiles.back().size()));
+  }
+  SetScreenProfiles(std::move(profiles));
+}
+
+size_t ScreenOf(const wxWindow& window) {
+  const int screen = wxDisplay::GetFromWindow(&window);
+  return screen == wxNOT_FOUND ? 0 : static_cast<size_t>(screen);
 }
 
 }  // namespace fotomill::desktop

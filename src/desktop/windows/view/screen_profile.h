@@ -3,10 +3,15 @@
 #include <cstdint>
 #include <vector>
 
+class wxWindow;
+
 namespace fotomill::desktop {
 
-// The color profile of the screen: X11 desktops store that of the first monitor at the root window.
-// Empty if there is none, and on other systems.
-std::vector<uint8_t> ReadScreenProfile();
+// Reads the color profiles of all screens and sets them for pictures: X11 desktops store them at
+// the root window. Call at the start, and when the screens have changed.
+void TakeScreenProfiles();
+
+// The number of the screen that shows most of a window.
+size_t ScreenOf(const wxWindow& window);
 
 }  // namespace fotomill::desktop

@@ -8,6 +8,7 @@
 #include "batch/picture_failure.h"
 #include "catalog/history/file_history.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/models/shell/favorites.h"
 #include "desktop/models/view/view_status.h"
 #include "desktop/windows/edit/quick_menu.h"
 #include "desktop/windows/files/file_actions.h"
@@ -17,6 +18,7 @@
 #include "desktop/windows/view/animation_bar.h"
 #include "desktop/windows/view/canvas_backdrop.h"
 #include "desktop/windows/view/overlay_bar.h"
+#include "desktop/windows/view/screen_profile.h"
 #include "desktop/windows/view/view_animation.h"
 #include "desktop/windows/view/view_commands.h"
 #include "desktop/windows/view/view_file_commands.h"
@@ -77,6 +79,7 @@ ViewFrame::ViewFrame(Shell& shell, const std::vector<std::string>& list, const s
       },
       pointerTimer_.GetId());
   noteTimer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) { canvas_->SetNote({}); });
+  Bind(wxEVT_MOVE, [this](wxMoveEvent& event) { Moved(), event.Skip(); });
   if (settings.MaximizeViewWindow != 0) Maximize();
   ShowPlace();
 }
@@ -109,6 +112,14 @@ void ViewFrame::BuildCanvas() {
           .show = [this](size_t place) { GoTo(place); }});
 }
 
+// Another screen may have another color profile.
+void ViewFrame::Moved() {
+  const size_t screen = ScreenOf(*this);
+  if (std::exchange(screen_, screen) == screen) return;
+  LogEvent("view-screen", std::to_string(screen));
+  if (canvas_ != nullptr && !AskForPicture()) ViewChanged();
+}
+
 ViewFrame::~ViewFrame() {
   animation_.reset();  // before the windows that it uses
   DestroyInBackground(std::move(loader_));
@@ -121,13 +132,16 @@ ViewFrame::~ViewFrame() {
 void ViewFrame::ShowList(const std::vector<std::string>& list, const std::string& file) {
   slideshow_.Stop();
   list_ = ViewList(list, file);
+  folder_.clear();
   StartAfresh();
   canvas_->SetFocus();
 }
 
 ViewRequest ViewFrame::RequestOf(size_t place) const {
   const wxSize size = canvas_->DeviceSize();
-  return {list_.Files()[place], place == list_.Place() ? page_ : 0, size.x, size.y};
+  ViewRequest request{list_.Files()[place], place == list_.Place() ? page_ : 0, size.x, size.y};
+  request.look.screen = screen_;
+  return request;
 }
 
 void ViewFrame::Step(int files) { GoTo(list_.PlaceAfter(files)); }
@@ -138,6 +152,11 @@ void ViewFrame::GoTo(size_t place) {
     return;
   list_.GoTo(place);
   StartAfresh();
+}
+
+void ViewFrame::FollowRename(const std::string& from, const std::string& to) {
+  if (LiesIn(folder_, from)) folder_ = RenamedPath(folder_, from, to);
+  if (list_.FollowRename(from, to)) StartAfresh();
 }
 
 void ViewFrame::StepPage(int pages) {
@@ -278,7 +297,10 @@ void ViewFrame::WhenShown(std::function<void()> shown) {
 }
 
 bool ViewFrame::UseList(const std::vector<std::string>& list) {
-  if (!list_.Replace(list)) return false;
+  if (list == list_.Files()) return true;
+  if (folder_.empty() && !list_.Replace(list)) return false;
+  if (!folder_.empty()) list_.Follow(list);
+  slideshow_.ListChanged(list_.Place(), list_.Count());
   WantPictures();
   ViewChanged();
   LogEvent("view-list", PlaceText());

@@ -34,7 +34,7 @@ class ViewFrame : public wxFrame {
   ViewFrame(Shell& shell, const std::vector<std::string>& list, const std::string& file);
   ~ViewFrame() override;
 
-  // Shows another file among other neighbors.
+  // Shows another file among other neighbors; no longer follows a folder.
   void ShowList(const std::vector<std::string>& list, const std::string& file);
   // Commands of keys and menu.
   void Step(int files);
@@ -57,9 +57,14 @@ class ViewFrame : public wxFrame {
   void FilesChanged();
   // Calls `shown` once, when the first picture is shown or the window is closed.
   void WhenShown(std::function<void()> shown);
-  // Replaces the list of neighbors. False, with no
-  // change, if it does not contain the current file.
+  // Replaces the list of neighbors. False, with no change, if it does not contain the current file,
+  // unless this window follows a folder: then its picture stays until another one is chosen.
   bool UseList(const std::vector<std::string>& list);
+  // The folder whose whole list this window shows; empty: a selection.
+  void FollowFolder(const std::string& folder) { folder_ = folder; }
+  const std::string& FollowedFolder() const { return folder_; }
+  // Call after a file or folder may have been renamed.
+  void FollowRename(const std::string& from, const std::string& to);
   // Changes the tags of a file; the picture stays on the screen meanwhile.
   void TagFile(const std::string& path, const TagChanges& changes);
   Shell& Owner() { return shell_; }
@@ -75,6 +80,7 @@ class ViewFrame : public wxFrame {
   void WantPictures();
   void Resized();
   void ReloadIfChanged();
+  void Moved();
   void FileGone(const std::string& path);
   void PictureCame();
   void ShowProgress(const std::string& path, int percent);
@@ -98,7 +104,9 @@ class ViewFrame : public wxFrame {
 
   Shell& shell_;
   ViewList list_;
+  std::string folder_;  // of the list; empty if that is a selection
   int32_t page_ = 0;
+  size_t screen_ = 0;                        // which shows this window
   Orientation turn_ = Orientation::Upright;  // of the view relative to the file
   ViewPicturePointer loaded_;                // unturned, as in the file
   bool saving_ = false;

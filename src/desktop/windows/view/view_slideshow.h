@@ -30,6 +30,8 @@ class ViewSlideshow {
   }  // from Start until Stop or the last picture
   // This place is now on the screen; starts its time.
   void ShownAt(size_t place, size_t count);
+  // Call when the list has changed, but not the picture shown.
+  void ListChanged(size_t place, size_t count) { place_ = place, count_ = count; }
   // The place to decode ahead in addition to the neighbors.
   std::optional<size_t> Upcoming() const { return Running() ? order_->Upcoming() : std::nullopt; }
   // Asks for settings and saves them. False if canceled.

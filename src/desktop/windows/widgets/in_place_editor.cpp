@@ -30,6 +30,10 @@ void InPlaceEditor::Begin(const wxRect& place, const wxString& name, const std::
   field_->SetSelection(0, static_cast<long>(shown.length()));
 }
 
+void InPlaceEditor::MoveTo(const wxRect& place) {
+  if (field_ != nullptr) field_->SetSize(place);
+}
+
 void InPlaceEditor::Finish(bool accept) {
   if (field_ == nullptr) return;
   wxTextCtrl* field = std::exchange(field_, nullptr);

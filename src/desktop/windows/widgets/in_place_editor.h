@@ -24,6 +24,8 @@ class InPlaceEditor {
   void Begin(const wxRect& place, const wxString& name, const std::string& text, size_t selected,
              Changed changed);
   bool Open() const { return field_ != nullptr; }
+  // Moves the field, if there is one, with the text typed so far.
+  void MoveTo(const wxRect& place);
   // Removes the field, if there is one.
   void Finish(bool accept);
 
