@@ -82,7 +82,6 @@ def hanging_pictures(folder):
             desktop.key("Right", "Escape")
             desktop.focus("Fotomill Professional")
             desktop.key("ctrl+a", "ctrl+shift+Return")
-            desktop.wait("compare-focus 1/3")
             desktop.focus("Compare")
             desktop.key("Escape")
             desktop.focus("Fotomill Professional")
