@@ -160,7 +160,8 @@ int32_t WriteFrames(const char* fileName, const FMW_FRAMES* frames,
     if (error != 0) return error;
     JxlFrameHeader header;
     JxlEncoderInitFrameHeader(&header);
-    header.duration = static_cast<uint32_t>(std::max(frames->delays[i], 0));
+    // a frame without duration is no frame but a layer of the next one
+    header.duration = static_cast<uint32_t>(std::max(frames->delays[i], 1));
     if (JxlEncoderSetFrameHeader(encoding.settings, &header) != JXL_ENC_SUCCESS ||
         !AddPixels(encoding.settings, given, false))
       return FMW_ERROR_UNSUITABLE;

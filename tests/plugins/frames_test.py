@@ -22,7 +22,8 @@ extensions = {row["extension"] for row in json.loads(
 if missing or not {"avif", "jxl"} <= extensions:
     print("skipped: not installed: " + " ".join(missing or ["the modules"]))
     sys.exit(77)
-DELAYS = [40, 80, 120, 160, 200]
+DELAYS = [40, 0, 120, 160, 200]
+SEEN = [max(delay, 1) for delay in DELAYS]  # both formats need durations
 SIZE = (90, 61)
 faults = []
 
@@ -69,7 +70,7 @@ def test_jxl(source, folder, options):
     for i in range(again.n_frames):
         again.seek(i)
         delays.append(round(again.info["duration"]))
-    check("jxl: delays", delays, DELAYS)
+    check("jxl: delays", delays, SEEN)
 
 
 def test_avif(source, folder, options):
@@ -79,7 +80,7 @@ def test_avif(source, folder, options):
     check(f"avif: {result.stderr}", result.returncode, 0)
     report = run("avifdec", "--info", written).stdout.decode()
     check("avif: delays", re.findall(r"duration [\d.]+ \((\d+) timescales", report),
-          [str(delay) for delay in DELAYS])
+          [str(delay) for delay in SEEN])
     check("avif: size", f"{SIZE[0]}x{SIZE[1]}" in report, True)
     own = folder / "own-avif.png"
     run(FOTOMILL, "-q", "convert", written, "--to", "png", "--out", own)
