@@ -8,6 +8,8 @@
 // Source: Microsoft, "Programming Guide for DDS" and the enumeration DXGI_FORMAT.
 #include <algorithm>
 #include <bit>
+#include <filesystem>
+#include <system_error>
 #include <vector>
 
 #include "blocks.h"
@@ -97,12 +99,19 @@ struct Header {
   }
   // Where a copy of a surface starts in the file.
   uint64_t PlaceOf(uint32_t surface, uint32_t copy) const {
-    uint64_t before = 0, all = 0;
-    for (uint32_t i = 0; i < copies; ++i) {
-      if (i < copy) before += SizeOf(i);
-      all += SizeOf(i);
-    }
-    return start + surface * all + before;
+    return start + surface * SizeOfCopies(copies) + SizeOfCopies(copy);
+  }
+  // What a file is said to have, but no more than one that is missing.
+  uint32_t SurfacesOf(uint64_t fileSize) const {
+    const uint64_t there = fileSize / SizeOfCopies(copies);
+    return static_cast<uint32_t>(std::min<uint64_t>(surfaces, there + 1));
+  }
+
+ private:
+  uint64_t SizeOfCopies(uint32_t count) const {
+    uint64_t size = 0;
+    for (uint32_t i = 0; i < count; ++i) size += SizeOf(i);
+    return size;
   }
 };
 
@@ -268,7 +277,10 @@ int32_t Describe(const char* fileName, FMW_PICTURE_INFO* info) {
   info->width = static_cast<int32_t>(header.width);
   info->height = static_cast<int32_t>(header.height);
   info->bitsPerPixel = header.Bits();
-  info->frame = static_cast<int32_t>(header.surfaces);
+  std::error_code unknown;
+  const uint64_t size = std::filesystem::file_size(fileName, unknown);
+  if (unknown) return FMW_ERROR_READ;
+  info->frame = static_cast<int32_t>(header.SurfacesOf(size));
   FmwGrayPalette(info);
   if (header.compression != nullptr) {
     snprintf(info->typeName, sizeof info->typeName, "DDS, %s", header.compression->name);

@@ -32,6 +32,8 @@ int32_t Caught(const char* fileName, Work work) {
   if (!known) return FMW_ERROR_DAMAGED;
   try {
     Imf::RgbaInputFile exr(fileName, 0);
+    // only layers with names of their own, or depths
+    if ((exr.channels() & (Imf::WRITE_RGB | Imf::WRITE_Y)) == 0) return FMW_ERROR_FORMAT;
     return work(exr);
   } catch (const std::bad_alloc&) {
     return FMW_ERROR_MEMORY;

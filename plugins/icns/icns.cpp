@@ -4,10 +4,10 @@
 //   "icns", size of the file; entries: type, size with these 8 bytes, data; all big-endian
 //
 // Colors are packed by component: a byte below 128 is followed by that many bytes and one more, any
-// other by one byte that stands for that many, less 125. Alpha is an entry of its own, not packed;
-// "ARGB" entries have it before the colors, packed as well.
-// Source: the format as Apple's IconStorage.h (2001) and the Archive Team's file format wiki
-// describe it.
+// other by one byte that stands for that many, less 125. Data of just the size of the pixels are
+// not packed: red, green, blue of one pixel after the other. Alpha is an entry of its own, not
+// packed; "ARGB" entries have it before the colors, packed as well. Source: the format as Apple's
+// IconStorage.h (2001) and the Archive Team's file format wiki describe it.
 #include <png.h>
 
 #include <algorithm>
@@ -152,13 +152,15 @@ bool Unpack(Bytes& data, size_t place, const FmwBitmap& bitmap) {
 int32_t ReadPacked(const Icon& icon, const FmwBitmap& bitmap) {
   const size_t count = size_t{icon.width} * icon.height;
   Bytes data = icon.data;
+  const bool plain = !HasOwnAlpha(*icon.packed) && data.size() == 3 * count;
   if (HasOwnAlpha(*icon.packed)) {
     if (!Unpack(data, 3, bitmap)) return FMW_ERROR_READ;
   } else {
     for (size_t i = 0; i < count; ++i)
       bitmap.rows[4 * i + 3] = icon.mask.empty() ? 255 : icon.mask[i];
   }
-  for (size_t place = 3; place-- > 0;) {
+  for (size_t i = 0; plain && i < 3 * count; ++i) bitmap.rows[i / 3 * 4 + 2 - i % 3] = data[i];
+  for (size_t place = 3; !plain && place-- > 0;) {
     if (!Unpack(data, place, bitmap)) return FMW_ERROR_READ;
   }
   return 0;

@@ -65,7 +65,7 @@ static inline void FmwLightPixel(const FmwLight* light, float red, float green, 
   float gain = light->gain;
   if (light->compressed) {
     const float luminance = gain * (0.2126F * red + 0.7152F * green + 0.0722F * blue);
-    if (luminance > 0) gain /= 1 + luminance;
+    if (luminance > 0 && luminance < INFINITY) gain /= 1 + luminance;
   }
   pixel[0] = FmwLightSample(light, blue * gain);
   pixel[1] = FmwLightSample(light, green * gain);

@@ -126,6 +126,10 @@ def test_dds_values(folder):
         seen = list(rgba(convert(path, "png")).getdata())
         check(f"{name}: {seen}", seen == expected)
     second = folder / "second.png"
+    many = folder / "many.dds"
+    many.write_bytes(dds(1, 1, bytes(4), b"DX10", 28, surfaces=0xffffffff))
+    pages = json.loads(run(FOTOMILL, "info", "--json", many).stdout)[0]["pages"]
+    check(f"surfaces that are not there: {pages}", 1 < pages < 99)
     run(FOTOMILL, "-q", "convert", folder / "two pages.dds", "--page", "2", "--to", "png", "--out",
         second)
     check("the second page", list(rgba(second).getdata()) == [(1, 2, 3, 255)])
@@ -186,6 +190,9 @@ def test_icns(folder):
         path = folder / f"{side}{len(mask)}.icns"
         path.write_bytes(icns((b"TOC ", bytes(8)), (kind, colors), *masks))
         alike(path.name, rgba(convert(path, "png")), picture)
+    plain = color.resize((16, 16)).convert("RGB")
+    (folder / "plain.icns").write_bytes(icns((b"is32", plain.tobytes())))
+    alike("not packed", rgba(convert(folder / "plain.icns", "png")), plain)
     only = folder / "jp2.icns"
     only.write_bytes(icns((b"ic08", b"\0\0\0\x0cjP  \r\n\x87\n" + bytes(40))))
     message = run(FOTOMILL, "info", only).stderr.decode()
@@ -247,6 +254,45 @@ def test_hdr(folder):
 
 
 # ---- EXR ----
+
+def exr(names, samples, shown=(0, 0, 0, 0)):
+    """A picture of one pixel of floats at the origin."""
+    channels = b"".join(name.encode() + struct.pack("<xi4xii", 2, 1, 1) for name in names) + b"\0"
+    attributes = [("channels", "chlist", channels), ("compression", "compression", b"\0"),
+                  ("dataWindow", "box2i", bytes(16)),
+                  ("displayWindow", "box2i", struct.pack("<4i", *shown)),
+                  ("lineOrder", "lineOrder", b"\0"),
+                  ("pixelAspectRatio", "float", struct.pack("<f", 1)),
+                  ("screenWindowCenter", "v2f", bytes(8)),
+                  ("screenWindowWidth", "float", struct.pack("<f", 1))]
+    head = struct.pack("<ii", 20000630, 2) + b"".join(
+        f"{name}\0{kind}\0".encode() + struct.pack("<i", len(value)) + value
+        for name, kind, value in attributes) + b"\0"
+    data = struct.pack(f"<{len(samples)}f", *samples)
+    return head + struct.pack("<Qii", len(head) + 8, 0, len(data)) + data
+
+
+def test_exr_windows(folder):
+    least, most = -2**31, 2**31 - 1
+    cases = [
+        ("one", exr("BGR", (1, 0, 1)), [(255, 0, 255, 255)]),
+        ("shown elsewhere", exr("BGR", (1, 1, 1), (5, 5, 6, 5)), [(0, 0, 0, 255)] * 2),
+        ("left of it", exr("BGR", (1, 0, 1), (-1, 0, 0, 0)), [(0, 0, 0, 255), (255, 0, 255, 255)]),
+        ("upside down", exr("BGR", (1, 1, 1), (1, 1, 0, 0)), "Damaged file."),
+        ("huge", exr("BGR", (1, 1, 1), (least, least, most, most)), "Damaged file."),
+        ("named layer", exr(["a.B", "a.G", "a.R"], (1, 1, 1)), "Unsupported format."),
+        ("depths", exr("Z", (1,)), "Unsupported format."),
+    ]
+    for name, contents, expected in cases:
+        path = folder / (name + ".exr")
+        path.write_bytes(contents)
+        if isinstance(expected, str):
+            message = run(FOTOMILL, "convert", path, "--to", "png").stderr.decode()
+            check(f"{name}: {message}", expected in message)
+        else:
+            seen = list(rgba(convert(path, "png")).getdata())
+            check(f"{name}: {seen}", seen == expected)
+
 
 def test_exr(folder):
     if not shutil.which("ffmpeg"):
@@ -332,6 +378,7 @@ def test_damaged(folder):
 
 for extension, test in [("dds", test_dds), ("dds", test_dds_values), ("dds", test_thumbnails),
                         ("icns", test_icns), ("hdr", test_hdr), ("exr", test_exr),
+                        ("exr", test_exr_windows),
                         ("pam", test_pam), ("pam", test_damaged)]:
     if extension in EXTENSIONS:
         with tempfile.TemporaryDirectory() as place:
