@@ -185,6 +185,7 @@ TEST(HashStore, StoresHashes) {
     HashRecord digested = RecordOf(11, 22);
     digested.digest = "00112233445566778899aabbccddeeff";
     digested.sharpness = 12.5F;
+    digested.severalPages = true;
     store.Put("/a", digested);
     store.Put("/b", RecordOf(33, 44));
     HashRecord fresh = RecordOf(1, 1);
@@ -202,6 +203,7 @@ TEST(HashStore, StoresHashes) {
   EXPECT_EQ(a->sharpness, 12.5F);
   EXPECT_EQ(a->width, 7);
   EXPECT_TRUE(a->hasHashes);
+  EXPECT_TRUE(a->severalPages);
   ASSERT_TRUE(store.Find("/b", 55, 1000));
   EXPECT_EQ(store.Find("/b", 55, 1000)->digest, "");
   EXPECT_LT(store.Find("/b", 55, 1000)->sharpness, 0);

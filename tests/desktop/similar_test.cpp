@@ -99,6 +99,12 @@ TEST(GroupList, KeepsOneOfEachGroupUnlessAllAreTicked) {
   EXPECT_EQ(Text(list), "(c*)a(b)|e*(d)");
   list.UntickAll();
   EXPECT_EQ(list.TickedCount(), 0u);
+  // Only the first page was compared.
+  std::vector<FoundGroup> groups = TwoGroups();
+  groups[0].pictures[0].severalPages = true;
+  list.SetGroups(groups);
+  list.TickAllButBest();
+  EXPECT_EQ(Text(list), "c*a(b)|e*(d)");
 }
 
 TEST(GroupList, FollowsWhatBecomesOfFiles) {
@@ -267,6 +273,24 @@ TEST_F(SimilarRun, NamesOfOneFileAreNotCopies) {
   std::filesystem::create_symlink(Path("elsewhere.bmp"), Path("in/link.bmp"));
   std::filesystem::create_hard_link(Path("in/other.bmp"), Path("in/same.bmp"));
   EXPECT_EQ(Names(Find(Question())), "a.bmp b.bmp c.bmp |");
+}
+
+TEST_F(SimilarRun, OtherPagesAndArchivesMayHoldMore) {
+  using namespace std::string_literals;
+  const std::string frame = ",\0\0\0\0\1\0\1\0\0\2\2D\1\0"s;
+  for (const char* name : {"in/p.gif", "in/q.gif"})
+    test::WriteText(Path(name),
+                    "GIF89a\1\0\1\0\x80\0\0\0\0\0\xff\xff\xff"s + frame + frame + ";");
+  test::WriteText(Path("in/archive.zip"), "PK");
+  SimilarQuestion question = Question();
+  for (const bool exact : {false, true}) {
+    question.options.exact = exact;
+    const SimilarFindings findings = Find(question);
+    EXPECT_THAT(findings.problems, ElementsAre());
+    ASSERT_EQ(findings.groups.size(), 2u);
+    EXPECT_FALSE(findings.groups[0].pictures[0].severalPages);
+    EXPECT_EQ(findings.groups[1].pictures[0].severalPages, !exact);
+  }
 }
 
 TEST_F(SimilarRun, KeepsWhatWasFoundWhenStopped) {

@@ -12,7 +12,8 @@ namespace {
 
 constexpr RecordLayout kLayout{"FMWHASH1", 96};
 constexpr uint64_t kDigestBytes = 16;
-constexpr uint32_t kHasHashes = 1, kHasDigest = 2, kHasSharpness = 4;
+constexpr uint32_t kHasHashes = 1, kHasDigest = 2, kHasSharpness = 4, kSeveralPages = 8,
+                   kKnowsPages = 16;
 
 void AddLittle(std::string& data, uint64_t value, int count) {
   for (int i = 0; i < count; ++i) data.push_back(static_cast<char>(value >> (8 * i)));
@@ -34,7 +35,8 @@ std::string DataOf(const HashRecord& record) {
   const bool sharpness = record.sharpness >= 0;
   AddLittle(data,
             (record.hasHashes ? kHasHashes : 0) | (digest ? kHasDigest : 0) |
-                (sharpness ? kHasSharpness : 0),
+                (sharpness ? kHasSharpness : 0) | (record.severalPages ? kSeveralPages : 0) |
+                kKnowsPages,
             4);
   AddLittle(data, sharpness ? std::bit_cast<uint32_t>(record.sharpness) : 0, 4);
   return data;
@@ -65,6 +67,8 @@ std::optional<HashRecord> HashStore::Find(const std::string& path, uint64_t size
   for (PictureHash& hash : record.hashes) hash = reader.Le64();
   const auto digest = reader.Take(kDigestBytes);
   const uint32_t flags = reader.Le32();
+  if ((flags & kKnowsPages) == 0) return std::nullopt;
+  record.severalPages = (flags & kSeveralPages) != 0;
   record.hasHashes = (flags & kHasHashes) != 0;
   if ((flags & kHasDigest) != 0) record.digest = DigestText(digest);
   if ((flags & kHasSharpness) != 0) record.sharpness = std::bit_cast<float>(reader.Le32());

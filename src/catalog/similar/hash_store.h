@@ -16,9 +16,10 @@ struct HashRecord {
   uint64_t size = 0;     // of the file, bytes
   int64_t modified = 0;  // seconds since 1970 UTC
   int32_t width = 0, height = 0;
+  bool severalPages = false;  // or frames; the hashes are those of the first
   bool hasHashes = false;
   PictureHashes hashes{};
-  std::string digest = {};  // of the pixels, 32 characters; empty if not computed
+  std::string digest = {};  // of all pages, 32 characters; empty if not computed
   float sharpness = -1;     // as MeasureSharpness; negative if not measured
 };
 
@@ -29,7 +30,9 @@ struct HashRecord {
 //        0    8  width and height, 4 bytes each
 //        8   64  eight hashes
 //       72   16  digest of the pixels
-//       88    4  bit 0: has hashes, bit 1: has a digest, bit 2: has a sharpness
+//       88    4  bit 0: has hashes, bit 1: has a digest, bit 2: has a sharpness,
+//                 bit 3: several pages, bit 4: always set; other records are ignored, as
+//                 they know nothing of pages
 //       92    4  sharpness, IEEE 754 single; else 0
 inline constexpr std::string_view kHashStoreName = "Fotomill.hashes";
 

@@ -106,6 +106,7 @@ Status SimilarSearch::Look(ComparedFile& file) const {
   }
   file.record.width = picture->width;
   file.record.height = picture->height;
+  file.record.severalPages = picture->pageCount > 1;
   return Status::Ok;
 }
 

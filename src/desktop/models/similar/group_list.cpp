@@ -107,7 +107,8 @@ bool GroupList::Tick(size_t cell, bool ticked) {
 }
 
 void GroupList::TickAllButBest() {
-  for (size_t i = 0; i < cells_.size(); ++i) (void)Tick(i, !cells_[i].best);
+  for (size_t i = 0; i < cells_.size(); ++i)
+    (void)Tick(i, !cells_[i].best && !Picture(i).severalPages);
 }
 
 void GroupList::UntickAll() {

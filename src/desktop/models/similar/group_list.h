@@ -57,6 +57,7 @@ class GroupList {
 
   // False if the picture has changed, so it cannot be ticked.
   bool Tick(size_t cell, bool ticked);
+  // Files with several pages stay, too: the others may be in no other file.
   void TickAllButBest();
   void UntickAll();
   size_t TickedCount() const;

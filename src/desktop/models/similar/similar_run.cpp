@@ -8,6 +8,7 @@
 
 #include "batch/picture_failure.h"
 #include "core/workers/ordered_run.h"
+#include "desktop/models/archive/archive_listing.h"
 #include "desktop/models/batch/progress_status.h"
 #include "desktop/models/files/folder_walk.h"
 #include "metadata/exif/taken_date.h"
@@ -103,6 +104,7 @@ class Run {
     const auto take = [&](const std::vector<std::string>& names) {
       for (const std::string& name : names) {
         if (stop_.Asked()) return;
+        if (IsArchiveName(name)) continue;
         std::string path = platform::JoinFolder(folder, name);
         const platform::FileStamp stamp = platform::StampOf(path);
         if (!stamp.there || stamp.link) continue;
@@ -156,7 +158,9 @@ class Run {
                                 .width = record.width,
                                 .height = record.height,
                                 .date = dates_[place],
-                                .sharpness = record.sharpness});
+                                .sharpness = record.sharpness,
+                                .severalPages =
+                                    record.severalPages && !question_.options.exact});
     }
     findings_.groups.push_back(std::move(found));
   }

@@ -19,6 +19,7 @@ struct SimilarPicture {
   int32_t width = 0, height = 0;   // pixels
   int64_t date = 0;                // when taken, else modified: 20040831223208 in local time
   float sharpness = -1;            // as MeasureSharpness; negative if not measured
+  bool severalPages = false;       // of which only the first was compared
 };
 
 // Pictures that are similar to each other.
@@ -52,8 +53,8 @@ struct SimilarFindings {
 };
 
 // Searches folders, in the background. If stopped, compares the pictures read until then. Links are
-// left out, as are further names of a file that has several: they are not copies. What was read is
-// kept in the store.
+// left out, as are further names of a file that has several: they are not copies. So are archives,
+// of which only the first picture would be compared. What was read is kept in the store.
 SimilarFindings FindSimilarPictures(const SimilarQuestion& question, const StopToken& stop,
                                     const std::function<void(const SimilarProgress&)>& report);
 

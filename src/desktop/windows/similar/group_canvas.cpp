@@ -233,9 +233,9 @@ void GroupCanvas::DrawTexts(wxDC& dc, size_t cell, const wxRect& square,
   std::string folder = platform::FolderOf(picture.path);
   if (folder.size() > 1 && folder.back() == platform::kSeparator) folder.pop_back();
   draw(Shown(folder), weak, square.x);
-  draw(Shown(std::to_string(picture.width) + " x " + std::to_string(picture.height) + ", " +
-             SizeText(picture.stamp.size, choice::kSizeFitting)),
-       weak, square.x);
+  const std::string size = std::to_string(picture.width) + " x " + std::to_string(picture.height) +
+                           ", " + SizeText(picture.stamp.size, choice::kSizeFitting);
+  draw(Shown(picture.severalPages ? size + ", " + Tr("several pages") : size), weak, square.x);
   const Shade warning = focused ? strong : palette.fault;
   switch (shown.now) {
     case FileNow::Changed: return draw(Label("Changed since the search"), warning, square.x);

@@ -468,6 +468,7 @@ void SimilarFrame::ShowStates(const std::vector<FileNow>& states) {
 void SimilarFrame::UpdateControls() {
   const bool busy = work_.Started(), any = !list_.Cells().empty();
   const size_t ticked = list_.TickedCount();
+  const wxWindow* const focused = FindFocus();
   search_->SetLabel(busy ? Label("&Stop") : Label("&Search"));
   for (wxWindow* control : std::initializer_list<wxWindow*>{place_, subfolders_, kind_, rule_})
     control->Enable(!busy);
@@ -484,6 +485,9 @@ void SimilarFrame::UpdateControls() {
   problemsButton_->SetLabel(LabelCount("%1 p&roblem...", "%1 p&roblems...", problems_.size()));
   if (!busy && any) status_->SetLabel(Shown(list_.CountText()));
   if (!busy && !any) status_->SetLabel("");
+  // Keys reach nothing while a disabled control has the focus.
+  if (focused != nullptr && focused->GetParent() == canvas_->GetParent() && !focused->IsEnabled())
+    canvas_->SetFocus();
   trash_->GetContainingSizer()->Layout();
   GetChildren().front()->Layout();
 }
