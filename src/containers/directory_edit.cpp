@@ -343,6 +343,9 @@ class Editor : DirectoryBytes {
       released_.push_back(old);
       return 0;
     }
+    const uint64_t most = wide_ ? limits.exifEntries : uint64_t{UINT16_MAX};
+    overfull_ =
+        overfull_ || directory.entries.size() > std::min<uint64_t>(most, limits.exifEntries);
     std::vector<uint8_t> bytes = Laid(directory);
     if (directory.at != 0 && bytes.size() <= old.end - old.begin && Exclusive(old)) {
       bytes.resize(old.end - old.begin);
@@ -403,6 +406,7 @@ class Editor : DirectoryBytes {
   }
 
   Status CheckGrowth() {
+    if (overfull_) return Damaged();
     if (edit_.tail.empty()) return Status::Ok;
     if (pointsBeyond_) {
       reason_ = Tr("Its directories point beyond their end, so nothing can be added safely.");
@@ -425,6 +429,7 @@ class Editor : DirectoryBytes {
   uint64_t mappedNext_ = 0, mappedEntries_ = 0, pieces_ = 0;
   bool pointsBeyond_ = false;  // something refers to data past the end
   bool shared_ = false;        // a directory is reached twice: do not edit in place
+  bool overfull_ = false;      // a directory would have more entries than can be counted
 };
 
 }  // namespace

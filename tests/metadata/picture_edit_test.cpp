@@ -169,6 +169,21 @@ TEST(PictureEdit, RefusesWhatCannotBeKept) {
               Contains("Person who created the image=Ann"));  // in another directory
 }
 
+// The number of entries has 16 bits: one more than these would be stored as none.
+TEST(PictureEdit, FullDirectoriesAreRefused) {
+  Bytes block = Hex("49492A0008000000 FFFF");
+  for (uint32_t i = 0; i < 0xFFFF; ++i) {
+    const Bytes entry = Hex("00E0 0100 01000000 00000000");
+    block.insert(block.end(), entry.begin(), entry.end());
+  }
+  block.resize(block.size() + 4);
+  Bytes made;
+  std::string reason;
+  EXPECT_EQ(Edit(block, {Typed("Artist", "someone")}, made, reason), Status::DamagedFile);
+  EXPECT_NE(reason, "");
+  EXPECT_EQ(made, block);
+}
+
 Bytes Jpeg(const Bytes& block,
            std::string_view others = "FFE0 0010 4A46494600 010100 0001 0001 0000") {
   Bytes file = Hex("FFD8"), more = Hex(others);
