@@ -1,6 +1,8 @@
 #include "desktop/models/shell/key_map.h"
 
 #include <algorithm>
+#include <array>
+#include <utility>
 
 #include "core/data_folder.h"
 #include "core/limits.h"
@@ -12,6 +14,49 @@ namespace fotomill::desktop {
 namespace {
 
 constexpr const char* kFile = "MyKeys.txt";
+
+// Keys that lists and text fields need, unless they are pressed with Ctrl or Alt.
+constexpr std::array<std::string_view, 13> kNeededAlone = {
+    "Left", "Right", "Up", "Down", "Home", "End", "PageUp", "PageDown", "Return", "Space",
+    "Back", "Tab", "Escape"};
+
+// Second names of keys, for example those that the toolkit gives to pressed keys.
+constexpr std::pair<std::string_view, std::string_view> kOtherNames[] = {
+    {"Enter", "Return"}, {"Page Up", "PageUp"}, {"PgUp", "PageUp"}, {"Page Down", "PageDown"},
+    {"PgDn", "PageDown"}, {"Backspace", "Back"}, {"Del", "Delete"}, {"Ins", "Insert"},
+    {"Esc", "Escape"},
+};
+
+// A key as it is compared.
+struct KeyParts {
+  bool control = false, alt = false, shift = false;
+  bool known = true;  // false if there are other modifiers
+  std::string name;   // in upper case, without them; empty: none
+  bool operator==(const KeyParts&) const = default;
+};
+
+KeyParts PartsOf(std::string_view key) {
+  KeyParts parts;
+  for (size_t plus = key.find('+'); plus != std::string_view::npos && plus > 0;
+       plus = key.find('+')) {
+    const std::string_view modifier = key.substr(0, plus);
+    const bool numeric = EqualIgnoringCase(modifier, "Num ");  // "Num +"
+    if (numeric) break;
+    parts.control |= EqualIgnoringCase(modifier, "Ctrl");
+    parts.alt |= EqualIgnoringCase(modifier, "Alt");
+    parts.shift |= EqualIgnoringCase(modifier, "Shift");
+    parts.known &= EqualIgnoringCase(modifier, "Ctrl") || EqualIgnoringCase(modifier, "Alt") ||
+                   EqualIgnoringCase(modifier, "Shift");
+    key.remove_prefix(plus + 1);
+  }
+  for (const auto& [other, name] : kOtherNames) {
+    if (EqualIgnoringCase(key, other)) key = name;
+  }
+  parts.name = UpperCase(key);
+  return parts;
+}
+
+bool SameKey(std::string_view a, std::string_view b) { return PartsOf(a) == PartsOf(b); }
 
 }  // namespace
 
@@ -58,7 +103,7 @@ std::string KeyMap::KeyOf(const KeyedCommand& command) const {
 }
 
 void KeyMap::Set(const KeyedCommand& command, std::optional<std::string> key) {
-  if (key && *key != command.builtIn) {
+  if (key && !SameKey(*key, command.builtIn)) {
     chosen_.insert_or_assign(command.name, std::move(*key));
   } else {
     chosen_.erase(command.name);
@@ -75,7 +120,7 @@ const KeyedCommand* KeyMap::Conflict(const std::vector<KeyedCommand>& commands,
                                      const KeyedCommand& command, const std::string& key) const {
   if (key.empty()) return nullptr;
   const auto found = std::ranges::find_if(commands, [&](const KeyedCommand& other) {
-    return other.name != command.name && EqualIgnoringCase(KeyOf(other), key);
+    return other.name != command.name && SameKey(KeyOf(other), key);
   });
   return found == commands.end() ? nullptr : &*found;
 }
@@ -86,11 +131,13 @@ KeyMap& UserKeys() {
 }
 
 bool MayBeKey(std::string_view key) {
-  const size_t plus = key.rfind('+', key.size() < 2 ? 0 : key.size() - 2);
-  const std::string_view last = plus == std::string_view::npos ? key : key.substr(plus + 1);
-  const std::string_view with = plus == std::string_view::npos ? "" : key.substr(0, plus);
-  const bool single = last.size() < 2;
-  return !last.empty() && (!single || (!with.empty() && with != "Shift"));
+  const KeyParts parts = PartsOf(key);
+  const bool ascii = std::ranges::none_of(parts.name, [](char c) { return (c & 0x80) != 0; });
+  if (parts.name.empty() || !parts.known || !ascii) return false;
+  if (parts.control || parts.alt) return true;
+  return parts.name.size() > 1 && std::ranges::none_of(kNeededAlone, [&](std::string_view name) {
+    return EqualIgnoringCase(parts.name, name);
+  });
 }
 
 }  // namespace fotomill::desktop

@@ -47,7 +47,8 @@ class KeyMap {
 // The user's keys, shared by all windows; loaded at the first call. Window's thread only.
 KeyMap& UserKeys();
 
-// Whether a key may be given to a command: letters and digits alone are for searching in lists.
+// Whether a key may be given to a command: without Ctrl or Alt, characters are for searching in
+// lists, and arrows and the like for moving in lists and text fields.
 bool MayBeKey(std::string_view key);
 
 }  // namespace fotomill::desktop

@@ -8,6 +8,9 @@
 #include <wx/stattext.h>
 #include <wx/textctrl.h>
 
+#include <algorithm>
+#include <iterator>
+
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/widgets/looks.h"
 #include "desktop/windows/widgets/wx_text.h"
@@ -16,10 +19,20 @@ namespace fotomill::desktop {
 
 namespace {
 
-// A pressed key in the notation of the commands; empty for modifiers alone.
+// Whether it is a modifier or a lock, or a key that accelerators have no name for, such as letters
+// outside ASCII and media keys.
+bool CannotBeNamed(int key) {
+  constexpr int kWithoutMeaning[] = {WXK_NONE, WXK_SHIFT,   WXK_CONTROL,      WXK_ALT,
+                                     WXK_CAPITAL, WXK_NUMLOCK, WXK_SCROLL, WXK_WINDOWS_LEFT,
+                                     WXK_WINDOWS_RIGHT};
+  return std::ranges::find(kWithoutMeaning, key) != std::end(kWithoutMeaning) ||
+         (key > WXK_DELETE && key < WXK_START) || key > WXK_WINDOWS_MENU;
+}
+
+// A pressed key in the notation of the commands; empty if it cannot be one.
 std::string KeyText(const wxKeyEvent& event) {
   const int key = event.GetKeyCode();
-  if (key == WXK_SHIFT || key == WXK_CONTROL || key == WXK_ALT || key == WXK_NONE) return {};
+  if (CannotBeNamed(key)) return {};
   int flags = 0;
   if (event.ControlDown()) flags |= wxACCEL_CTRL;
   if (event.AltDown()) flags |= wxACCEL_ALT;

@@ -146,15 +146,17 @@ void FrameMenus::ListRecipesInMenu() {
 
 void FrameMenus::BindSecondKeys() {
   std::vector<wxAcceleratorEntry> keys;
+  const auto taken = [commands = KeyedCommands()](const std::string& key) {
+    return UserKeys().Conflict(commands, {}, key) != nullptr;
+  };
   for (const Command& command : Commands()) {
     wxAcceleratorEntry key(0, 0, CommandId(command));
     if (command.secondKey == nullptr || KeyOf(command) != command.accelerator) continue;
-    const bool taken = UserKeys().Conflict(KeyedCommands(), {}, command.secondKey) != nullptr;
-    if (!taken && key.FromString(wxString("\t") + command.secondKey)) keys.push_back(key);
+    if (!taken(command.secondKey) && key.FromString(wxString("\t") + command.secondKey)) keys.push_back(key);
   }
   const int32_t code = settings.JumpWindowHotKey;
   const char letter = code > 0 && code < 0x80 ? UpperCase(static_cast<char>(code)) : '\0';
-  if (IsLetter(letter) || IsDigit(letter))
+  if ((IsLetter(letter) || IsDigit(letter)) && !taken(std::string("Ctrl+Shift+") + letter))
     keys.emplace_back(wxACCEL_CTRL | wxACCEL_SHIFT, letter, CommandId(JumpCommand()));
   shell_.Window().SetAcceleratorTable(
       wxAcceleratorTable(static_cast<int>(keys.size()), keys.data()));
