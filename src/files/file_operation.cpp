@@ -15,6 +15,7 @@
 #include "platform/folders.h"
 #include "platform/output_file.h"
 #include "platform/paths.h"
+#include "platform/reason.h"
 #include "texts/system_reason.h"
 #include "texts/texts.h"
 
@@ -116,9 +117,10 @@ Outcome MoveOne(const std::string& from, const std::string& to) {
 
 Outcome TrashOne(const std::string& path) {
   if (!platform::FileExists(path)) return Tr(kGone);
-  return platform::MoveToTrash(path)
-             ? Outcome()
-             : Outcome(Tr("There is no trash on this volume; Shift+Delete deletes permanently."));
+  if (platform::MoveToTrash(path)) return {};
+  return platform::SystemReason().empty()
+             ? Tr("There is no trash on this volume; Shift+Delete deletes permanently.")
+             : WithReason(Tr("It could not be moved to the trash."));
 }
 
 // Whether a file may be trashed or deleted.

@@ -5,6 +5,8 @@
 
 #include "platform/clock.h"
 #include "platform/files.h"
+#include "platform/reason.h"
+#include "platform/rights.h"
 #include "support/child.h"
 #include "support/faults.h"
 #include "support/files.h"
@@ -149,6 +151,29 @@ bool MountVolume(const std::string& folder) {
 }
 
 constexpr int kNotAllowed = 77;
+
+TEST_F(TrashTest, SaysWhyAFileCannotBeMoved) {
+  constexpr auto kAll = fs::perms::all;
+  WriteText(Picture("a"), "1");
+  EXPECT_TRUE(MayBeMoved(Picture("a")));
+  fs::create_directories(Trash("files"));
+  for (const char* folder : {"", "data", "data/Trash", "data/Trash/files"})
+    fs::permissions(folder_.Path(folder), kAll);
+  fs::permissions(Picture(""), fs::perms::others_write, fs::perm_options::remove);
+  const int status = test::InChild([&] {
+    if (getuid() == 0 && (setgid(65534) != 0 || setuid(65534) != 0)) _exit(kNotAllowed);
+    if (getuid() != 65534) fs::permissions(Picture(""), fs::perms::owner_read | fs::perms::owner_exec);
+    const bool refused = !MayBeMoved(Picture("a")) && !MoveToTrash(Picture("a"));
+    _exit(refused && SystemReason() == "Permission denied" ? 0 : 1);
+  });
+  fs::permissions(Picture(""), kAll);
+  ASSERT_TRUE(WIFEXITED(status));
+  if (WEXITSTATUS(status) == kNotAllowed) GTEST_SKIP() << "another user is not allowed";
+  EXPECT_EQ(WEXITSTATUS(status), 0);
+  EXPECT_TRUE(MoveToTrash(Picture("a")));
+  EXPECT_FALSE(MoveToTrash(Picture("a")));
+  EXPECT_EQ(SystemReason(), "");
+}
 
 TEST_F(TrashTest, OtherVolumesHaveTheirOwn) {
   const int status = test::InChild([&] {

@@ -31,6 +31,9 @@
 #include "platform/folders.h"
 #include "platform/paths.h"
 #include "platform/posix/handle.h"
+#include "platform/posix/kept_reason.h"
+#include "platform/reason.h"
+#include "platform/rights.h"
 
 namespace fotomill::platform {
 
@@ -220,6 +223,7 @@ bool MoveTo(const Place& place, const Victim& victim) {
       made.Keep();
       return true;
     }
+    if (errno != EXDEV) KeepErrno();  // a trash on another volume is none
     unlink(infoPath.c_str());
     if (result == CommitResult::Failed) return false;
   }
@@ -256,7 +260,12 @@ bool MayWriteTo(const std::string& folder) { return access(folder.c_str(), W_OK 
 
 bool MoveToTrash(const std::string& path) {
   Victim victim;
+  ForgetReason();
   if (!FindVictim(path, victim)) return false;
+  if (!MayWriteTo(victim.folder)) {
+    KeepErrno();
+    return false;
+  }
   for (const Place& place : PlacesFor(victim)) {
     if (MoveTo(place, victim)) return true;
   }
@@ -282,6 +291,11 @@ bool RestoreFromTrash(const std::string& path) {
     return true;
   }
   return false;
+}
+
+bool MayBeMoved(const std::string& path) {
+  Victim victim;
+  return FindVictim(path, victim) && MayWriteTo(victim.folder);
 }
 
 bool HasTrash(const std::string& path) {

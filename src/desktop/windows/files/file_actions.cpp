@@ -29,6 +29,7 @@
 #include "metadata/tags/tag_lines.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "platform/rights.h"
 #include "settings/configuration.h"
 #include "settings/history_list.h"
 #include "settings/search_options.h"
@@ -65,6 +66,12 @@ std::vector<std::string> PathsOf(const FileOperation& operation) {
   std::vector<std::string> paths;
   for (const FileStep& step : operation.steps) paths.push_back(step.from);
   return paths;
+}
+
+// With an upper-case first letter, in any language.
+std::string Capitalized(const std::string& text) {
+  const wxString shown = Shown(text);
+  return Utf8(shown.Left(1).Upper() + shown.Mid(1));
 }
 
 std::string Count(size_t files) { return TrGroupedCount("%1 file", "%1 files", files); }
@@ -134,11 +141,9 @@ void FileActions::Do(FileOperationKind kind, const std::vector<std::string>& pat
   std::vector<std::string> changed{folder};
   if (kind == FileOperationKind::Move) changed.insert(changed.end(), paths.begin(), paths.end());
   if (RefusesChange(&shell_.Window(), changed)) return;
-  FileOperation name{kind, std::vector<FileStep>(paths.size(), FileStep{paths.front(), {}})};
-  std::string what = FileOperationName(name);
-  what[0] = static_cast<char>(what[0] - 'a' + 'A');
+  const FileOperation name{kind, std::vector<FileStep>(paths.size(), FileStep{paths.front(), {}})};
   Run(
-      what,
+      Capitalized(FileOperationName(name)),
       [kind, paths, folder,
        options = FileOperationOptionsFromSettings()](const FileOperationProgress& progress) {
         return CarryOut(PlanFileOperation(kind, paths, folder, options), progress);
@@ -190,12 +195,11 @@ void FileActions::StartTagging() {
   if (busy_ || tagging_.empty()) return;
   const Tagging next = std::move(tagging_.front());
   tagging_.pop_front();
-  FileOperation name{FileOperationKind::Tag,
-                     std::vector<FileStep>(next.paths.size(), FileStep{next.paths.front(), {}})};
-  std::string what = FileOperationName(name);
-  what[0] = UpperCase(what[0]);
+  const FileOperation name{
+      FileOperationKind::Tag,
+      std::vector<FileStep>(next.paths.size(), FileStep{next.paths.front(), {}})};
   Run(
-      what,
+      Capitalized(FileOperationName(name)),
       [next, options = TagFilesOptionsFromSettings()](const FileOperationProgress& progress) {
         return TagFiles(next.paths, next.changes, options, progress);
       },
@@ -219,13 +223,12 @@ void FileActions::TrashSteps(wxWindow* parent, std::vector<FileStep> steps) {
 void FileActions::Trash(const FileOperation& operation, const Asker& asker) {
   if (operation.steps.empty() || RefusesChange(ParentOf(asker), PathsOf(operation))) return;
   const auto noTrash = std::make_shared<bool>(false);
-  std::string what = FileOperationName(operation);
-  what[0] = static_cast<char>(what[0] - 'a' + 'A');
   Run(
-      what,
+      Capitalized(FileOperationName(operation)),
       [operation, noTrash](const FileOperationProgress& progress) {
         const std::string& first = operation.steps.front().from;
-        *noTrash = platform::FileExists(first) && !platform::HasTrash(first);
+        *noTrash = platform::FileExists(first) && platform::MayBeMoved(first) &&
+                   !platform::HasTrash(first);
         return *noTrash ? FileOperationResult{{FileOperationKind::Trash, {}}, {}}
                         : CarryOut(operation, progress);
       },
