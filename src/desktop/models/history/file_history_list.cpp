@@ -118,10 +118,4 @@ bool FileHistoryList::Clear() {
   return path.empty() || !platform::FileExists(path) || platform::DeleteFile(path);
 }
 
-bool GetsThumbnail(const std::string& path) {
-  if (settings.FileHistoryThumbnailMode == choice::kHistoryNoThumbnails) return false;
-  return (settings.FileHistoryDriveTypes >> static_cast<int>(platform::VolumeOf(path).kind) & 1) ==
-         0;
-}
-
 }  // namespace fotomill::desktop

@@ -60,8 +60,4 @@ class FileHistoryList {
   bool reversed_ = false;
 };
 
-// Whether to load a row's thumbnail: not from types of drives set in FileHistoryDriveTypes (by
-// default 2 removable, 16 optical), where reading may be slow.
-bool GetsThumbnail(const std::string& path);
-
 }  // namespace fotomill::desktop

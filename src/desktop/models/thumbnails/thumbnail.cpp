@@ -16,6 +16,7 @@
 #include "metadata/exif/exif_walk.h"
 #include "platform/files.h"
 #include "platform/paths.h"
+#include "platform/volumes.h"
 #include "processing/faces/face_finder.h"
 #include "processing/geometry/scale.h"
 #include "registry/registry.h"
@@ -193,6 +194,11 @@ Status MakeFromPicture(const ThumbnailRequest& request, Thumbnail& thumbnail) {
   return ScaleDown(picture->image, request.side, thumbnail.pixels);
 }
 
+bool IsLeftOut(const ThumbnailRequest& request) {
+  const int kind = static_cast<int>(platform::VolumeOf(request.path).kind);
+  return (request.drivesLeftOut >> kind & 1) != 0;
+}
+
 // That of the first picture which has one; empty if there is none among the first few.
 ThumbnailPointer LoadFolderThumbnail(const ThumbnailRequest& asked) {
   constexpr size_t kTried = 5;
@@ -219,12 +225,16 @@ ThumbnailPointer LoadFolderThumbnail(const ThumbnailRequest& asked) {
 ThumbnailPointer LoadThumbnail(const ThumbnailRequest& asked) {
   if (asked.folder) return LoadFolderThumbnail(asked);
   ThumbnailRequest request = asked;
+  auto thumbnail = std::make_shared<Thumbnail>();
+  if (request.drivesLeftOut != 0 && IsLeftOut(request)) return thumbnail;
   if (request.modified == 0 && request.size == 0) {
     const platform::FileFacts facts = platform::FactsOf(request.path);
+    thumbnail->status = Status::FileOpenError;
+    if (facts.kind != platform::FileKind::Regular) return thumbnail;
+    thumbnail->status = Status::Ok;
     request.modified = facts.modified;
     request.size = facts.size;
   }
-  auto thumbnail = std::make_shared<Thumbnail>();
   if (ReadReady(request, *thumbnail) || ReadCopy(request, *thumbnail)) {
     ReadFacts(request, *thumbnail);
     return thumbnail;

@@ -21,6 +21,8 @@ struct ThumbnailRequest {
   bool standIn = false;  // return whatever is available immediately, until the proper one is loaded
   ThumbnailOptions options = {};
   bool folder = false;  // the path is a folder; its first picture's
+  // bit set of platform::DriveKind: files on such drives get none, as reading may be slow
+  int32_t drivesLeftOut = 0;
 
   bool operator==(const ThumbnailRequest&) const = default;
 };

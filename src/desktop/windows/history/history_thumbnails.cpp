@@ -6,9 +6,8 @@
 #include <cstring>
 
 #include "core/choice_lists.h"
-#include "desktop/models/history/file_history_list.h"
-#include "platform/files.h"
 #include "settings/job_options.h"
+#include "settings/settings.h"
 
 namespace fotomill::desktop {
 
@@ -41,13 +40,15 @@ void HistoryThumbnails::Want(const std::vector<std::string>& paths, int side, do
   side_ = side;
   scale_ = scale;
   empty_ = side == 0 ? wxBitmapBundle() : OnSquare({}, side, scale);
+  const bool none = side == 0 || settings.FileHistoryThumbnailMode == choice::kHistoryNoThumbnails;
   std::vector<ThumbnailRequest> requests;
   for (const std::string& path : paths) {
-    if (side == 0 || bitmaps_.contains(path) || !GetsThumbnail(path)) continue;
-    const platform::FileFacts facts = platform::FactsOf(path);
-    if (facts.kind != platform::FileKind::Regular) continue;
-    requests.push_back({path, facts.modified, facts.size, side, choice::kDiskBased, false,
-                        ThumbnailOptionsFromSettings()});
+    if (none || bitmaps_.contains(path)) continue;
+    // The volume may be slow: time and size of the file are left to the loader's thread.
+    ThumbnailRequest request{.path = path, .side = side, .mode = choice::kDiskBased};
+    request.options = ThumbnailOptionsFromSettings();
+    request.drivesLeftOut = settings.FileHistoryDriveTypes;
+    requests.push_back(std::move(request));
   }
   loader_.Want(std::move(requests));
 }
