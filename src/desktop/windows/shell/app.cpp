@@ -5,6 +5,7 @@
 #include <wx/translation.h>
 #include <wx/weakref.h>
 
+#include <cstdio>
 #include <cstdlib>
 #include <functional>
 #include <memory>
@@ -89,6 +90,14 @@ class App : public wxApp {
 
   bool OnInit() override {
     platform::FillStandardStreams();
+#ifdef NDEBUG
+    // The toolkit's own checks are for developers; it goes on after a failed one.
+    wxSetAssertHandler([](const wxString& file, int line, const wxString&, const wxString& condition,
+                          const wxString& message) {
+      const wxString text = file + ":" + std::to_string(line) + ": " + condition + " " + message;
+      std::fprintf(stderr, "%s\n", Utf8(text).c_str());
+    });
+#endif
     StartTranslations();
     StartEventLog();
     SetAppName("fotomill-desktop");
