@@ -9,6 +9,8 @@
 #include <random>
 #include <thread>
 
+#include "catalog/thumbnails/database_upkeep.h"
+#include "core/data_folder.h"
 #include "platform/clock.h"
 #include "platform/files.h"
 #include "platform/volumes.h"
@@ -101,6 +103,41 @@ TEST_F(Database, HasTheDocumentedLayout) {
   EXPECT_EQ(database.CompactThumbnailDatabase(false), Compacted::Done);
   EXPECT_EQ(Size(), 60u);
   EXPECT_THAT(folder_.Names(), ElementsAre("Fotomill.tdb"));
+}
+
+TEST_F(Database, IsPurgedOfVanishedPicturesWhenItPays) {
+  const std::string dataBefore = DataFolder();
+  SetDataFolder(folder_.Path("data"));
+  std::filesystem::create_directory(folder_.Path("data"));
+  constexpr int32_t kDays = 30;
+  constexpr int64_t kStart = 0x65432100, kDay = 86'400;
+  ThumbnailDatabase database;
+  ASSERT_EQ(database.OpenThumbnailDatabase(Path(), true), Opened::Done);
+  for (const char* name : {"a", "b", "c", "d", "e", "f"}) {
+    WriteText(folder_.Path(name), name);
+    ASSERT_TRUE(Append(database, folder_.Path(name), VolumeKeyFor(folder_.Path(name)), 1));
+  }
+  ASSERT_TRUE(Append(database, "/no/such/picture", "ANOTHER:1", 1));  // a drive that is not there
+  const StopSource stopped;
+  stopped.Stop();
+  const struct {
+    const char* removed;  // a file, before the check
+    int64_t day;
+    bool stop, checked;
+    size_t records;
+  } rows[] = {{"a", 0, true, false, 7},   {"a", 0, false, true, 7},  // one of seven is not enough
+              {"b", 29, false, false, 7}, {"b", 30, false, true, 5},
+              {"c", 59, false, false, 5}, {"d", 60, false, true, 3}};
+  for (const auto& row : rows) {
+    SCOPED_TRACE(row.day);
+    std::filesystem::remove(folder_.Path(row.removed));
+    platform::FixNow(kStart + row.day * kDay);
+    const StopToken stop = row.stop ? stopped.Token() : StopToken();
+    EXPECT_EQ(PurgeDatabaseWhenDue(Path(), kDays, false, stop), row.checked);
+    EXPECT_EQ(Records().size(), row.records);
+  }
+  EXPECT_FALSE(PurgeDatabaseWhenDue({}, kDays, false, {}));
+  SetDataFolder(dataBefore);
 }
 
 TEST_F(Database, RecordsGoForThePicturesTheyWereMadeOf) {

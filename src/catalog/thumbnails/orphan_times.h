@@ -7,7 +7,7 @@ namespace fotomill {
 
 // Times of the last removal of orphaned thumbnail files per folder, stored in the file
 // "FMWThumbnailCleanUp.txt" in the data folder: lines "SECONDS,FOLDER", seconds since 1970 UTC,
-// latest first, at most 5,000 folders.
+// latest first, at most 5,000 folders. A check of a database has its path in place of FOLDER.
 
 // 0: never or unknown.
 int64_t LastOrphanRemoval(const std::string& folder);

@@ -10,6 +10,7 @@
 #include "catalog/thumbnails/thumbnail_lookup.h"
 #include "catalog/thumbnails/thumbnail_store.h"
 #include "core/choice_lists.h"
+#include "core/data_folder.h"
 #include "core/natural_order.h"
 #include "desktop/models/browser/folder_listing.h"
 #include "metadata/exif/exif_source.h"
@@ -152,13 +153,16 @@ void AddToDatabase(const std::string& database, const ThumbnailRequest& request,
                              request.options.hidden);
 }
 
-// Small pictures are shown in their own size, which a record does not have.
+// Small pictures are shown in their own size, which a record does not have. A disk that is almost
+// full is left to what matters more.
 void KeepCopy(const ThumbnailRequest& request, const PictureRecord& picture) {
+  constexpr uint64_t kLeastRoom = uint64_t{256} * 1024 * 1024;  // bytes
   const bool small = std::max(picture.width, picture.height) <= kSmallThumbnailSide;
   ThumbnailOptions options = request.options;
   options.quick = false;  // the picture may be decoded in a smaller size
   ThumbnailRecord record;
-  if (!small && KeepsCopy(request) && MakeThumbnailRecord(record, picture, options))
+  if (!small && KeepsCopy(request) && platform::FreeSpace(DataFolder()) >= kLeastRoom &&
+      MakeThumbnailRecord(record, picture, options))
     AddToDatabase(ThumbnailDatabasePath({}), request, record);
 }
 

@@ -408,6 +408,7 @@ void FileActions::PathsToClipboard(const std::vector<std::string>& paths) {
 }
 
 void FileActions::Paste(const std::string& folder) {
+  if (busy_) return shell_.Report(Tr("Please wait for the previous file operation."));
   if (RefusesChange(&shell_.Window(), {folder})) return;
   FileListData files;
   wxCustomDataObject marked{wxDataFormat(kGnomeFiles)};

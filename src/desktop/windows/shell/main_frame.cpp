@@ -6,6 +6,8 @@
 #include <vector>
 
 #include "batch/external_program.h"
+#include "catalog/thumbnails/database_upkeep.h"
+#include "catalog/thumbnails/thumbnail_database.h"
 #include "desktop/models/shell/event_log.h"
 #include "desktop/windows/batch/batch_runner.h"
 #include "desktop/windows/files/file_actions.h"
@@ -73,6 +75,7 @@ MainFrame::MainFrame()
     event.Skip();
   });
   Bind(wxEVT_CLOSE_WINDOW, &MainFrame::OnClose, this);
+  PurgeThumbnailsLater();
   // Volumes may have changed while the window was inactive.
   Bind(wxEVT_ACTIVATE, [this](wxActivateEvent& event) {
     if (event.GetActive()) folders_->UpdatePlaces();
@@ -88,6 +91,19 @@ MainFrame::~MainFrame() {
   thumbnails_.SetListener(nullptr);
   // Child windows use its parts until the end, so destroy them first.
   DestroyChildren();
+}
+
+void MainFrame::PurgeThumbnailsLater() {
+  constexpr int kDelay = 60'000;  // milliseconds, so that the start is not slowed down
+  purgeTimer_.Bind(wxEVT_TIMER, [this](wxTimerEvent&) {
+    const int32_t days = std::max(settings.ThumbnailCompactInterval, 1);
+    const bool hidden = settings.WriteHiddenThumbnails != 0;
+    purge_.Start(Lane::Blocking, [days, hidden](const StopToken& stop) {
+      (void)PurgeDatabaseWhenDue(ThumbnailDatabasePath({}), days, hidden, stop);
+      return Status::Ok;
+    });
+  });
+  purgeTimer_.StartOnce(kDelay);
 }
 
 void MainFrame::ShowStartFolder(std::string folder, bool restore) {

@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "core/workers/background_task.h"
 #include "desktop/windows/browser/thumbnail_service.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/file_question.h"
@@ -55,6 +56,7 @@ class MainFrame : public wxFrame, public Shell {
   void ShowStartFolder(std::string folder, bool restore);
   void NoteRecentFile(const std::string& path);
   void OnClose(wxCloseEvent& event);
+  void PurgeThumbnailsLater();
 
   wxString count_;  // of the status bar
   wxTimer messageTimer_;
@@ -71,6 +73,8 @@ class MainFrame : public wxFrame, public Shell {
   std::unique_ptr<FileActions> files_;
   std::unique_ptr<BatchRunner> batches_;
   std::vector<std::unique_ptr<FileQuestion>> questions_;
+  wxTimer purgeTimer_;    // until the start is over
+  BackgroundTask purge_;  // of the thumbnails of vanished pictures
 };
 
 }  // namespace fotomill::desktop
