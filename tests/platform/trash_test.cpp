@@ -162,7 +162,8 @@ TEST_F(TrashTest, SaysWhyAFileCannotBeMoved) {
   fs::permissions(Picture(""), fs::perms::others_write, fs::perm_options::remove);
   const int status = test::InChild([&] {
     if (getuid() == 0 && (setgid(65534) != 0 || setuid(65534) != 0)) _exit(kNotAllowed);
-    if (getuid() != 65534) fs::permissions(Picture(""), fs::perms::owner_read | fs::perms::owner_exec);
+    if (getuid() != 65534)
+      fs::permissions(Picture(""), fs::perms::owner_read | fs::perms::owner_exec);
     const bool refused = !MayBeMoved(Picture("a")) && !MoveToTrash(Picture("a"));
     _exit(refused && SystemReason() == "Permission denied" ? 0 : 1);
   });

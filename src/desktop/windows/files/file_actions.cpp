@@ -290,7 +290,9 @@ void FileActions::MoveTo(const std::vector<std::string>& paths, const std::strin
 
 void FileActions::Drop(const std::vector<std::string>& paths, const std::string& folder,
                        bool move) {
-  Do(move ? FileOperationKind::Move : FileOperationKind::Copy, paths, folder);
+  std::vector<std::string> others = paths;
+  std::erase(others, folder);  // a slip of the mouse drops a folder on itself
+  Do(move ? FileOperationKind::Move : FileOperationKind::Copy, others, folder);
 }
 
 void FileActions::Rename(const std::string& path, const std::string& name) {

@@ -92,8 +92,8 @@ class App : public wxApp {
     platform::FillStandardStreams();
 #ifdef NDEBUG
     // The toolkit's own checks are for developers; it goes on after a failed one.
-    wxSetAssertHandler([](const wxString& file, int line, const wxString&, const wxString& condition,
-                          const wxString& message) {
+    wxSetAssertHandler([](const wxString& file, int line, const wxString&,
+                          const wxString& condition, const wxString& message) {
       const wxString text = file + ":" + std::to_string(line) + ": " + condition + " " + message;
       std::fprintf(stderr, "%s\n", Utf8(text).c_str());
     });

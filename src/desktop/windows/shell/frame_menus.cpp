@@ -152,7 +152,8 @@ void FrameMenus::BindSecondKeys() {
   for (const Command& command : Commands()) {
     wxAcceleratorEntry key(0, 0, CommandId(command));
     if (command.secondKey == nullptr || KeyOf(command) != command.accelerator) continue;
-    if (!taken(command.secondKey) && key.FromString(wxString("\t") + command.secondKey)) keys.push_back(key);
+    if (!taken(command.secondKey) && key.FromString(wxString("\t") + command.secondKey))
+      keys.push_back(key);
   }
   const int32_t code = settings.JumpWindowHotKey;
   const char letter = code > 0 && code < 0x80 ? UpperCase(static_cast<char>(code)) : '\0';
