@@ -219,11 +219,12 @@ struct AlongTheWay {
 // The sidecars and comment files that go along when a file is renamed, moved or copied.
 std::vector<RenamedFile> SidecarsAlong(const FileOperation& operation, const std::string& from,
                                        const std::string& to) {
-  const bool goes = operation.kind == FileOperationKind::Rename ||
-                    operation.kind == FileOperationKind::Move ||
-                    operation.kind == FileOperationKind::Copy;
-  return goes && platform::IsRegularFile(from) ? SidecarMoves(from, to, operation.commentExtension)
-                                               : std::vector<RenamedFile>();
+  const bool copy = operation.kind == FileOperationKind::Copy;
+  const bool goes = copy || operation.kind == FileOperationKind::Rename ||
+                    operation.kind == FileOperationKind::Move;
+  return goes && platform::IsRegularFile(from)
+             ? SidecarMoves(from, to, operation.commentExtension, copy)
+             : std::vector<RenamedFile>();
 }
 
 bool AnyTaken(const std::vector<RenamedFile>& sidecars) {
@@ -266,21 +267,21 @@ Outcome DoWithSidecars(const FileOperation& operation, FileStep& step, AlongTheW
         RemoveWithSidecars(step.from, operation.commentExtension, TrashOne, outcome, besides);
     return outcome;
   }
-  const std::vector<RenamedFile> sidecars = SidecarsAlong(operation, step.from, step.to);
-  std::vector<RenamedFile> left = sidecars;  // others are there already
-  std::erase_if(left, [&](const RenamedFile& one) { return besides.settled.contains(one.to); });
-  if (AnyTaken(left)) return Tr(kTaken);
+  std::vector<RenamedFile> sidecars = SidecarsAlong(operation, step.from, step.to);
+  std::erase_if(sidecars, [&](const RenamedFile& one) { return besides.settled.contains(one.to); });
+  if (AnyTaken(sidecars)) return Tr(kTaken);
   Outcome outcome = DoStep(operation.kind, step);
   if (!outcome.empty()) return outcome;
   if (!step.to.empty()) besides.settled.insert(step.to);
-  for (const RenamedFile& sidecar : left) {
-    const Outcome along = DoStep(operation.kind, {sidecar.from, sidecar.to});
-    if (along.empty()) besides.settled.insert(sidecar.to);
-    if (!along.empty()) besides.failures.push_back({sidecar.from, along});
-  }
   step.along.clear();
   for (const RenamedFile& sidecar : sidecars) {
-    if (operation.kind == FileOperationKind::Copy && besides.settled.contains(sidecar.to))
+    const Outcome along = DoStep(operation.kind, {sidecar.from, sidecar.to});
+    if (!along.empty()) {
+      besides.failures.push_back({sidecar.from, along});
+      continue;
+    }
+    besides.settled.insert(sidecar.to);
+    if (operation.kind == FileOperationKind::Copy)
       step.along.push_back({sidecar.to, platform::StampOf(sidecar.to)});
   }
   return {};

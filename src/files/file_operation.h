@@ -97,9 +97,9 @@ FileOperation PlanFileOperation(FileOperationKind kind, const std::vector<std::s
 
 // Performs the steps of an operation. Never replaces a file: a step fails if its destination exists
 // by then. Keeps file times. Sidecars and comment files go along with their pictures; a sidecar
-// that pictures share goes with the last one. Thumbnail files follow their pictures or are deleted
-// with them, and database records of pictures that are no longer there are marked as deleted. May
-// take long; any thread.
+// that pictures share goes with the last one, and with each copy. Thumbnail files follow their
+// pictures or are deleted with them, and database records of pictures that are no longer there are
+// marked as deleted. May take long; any thread.
 FileOperationResult CarryOut(const FileOperation& operation,
                              const FileOperationProgress& progress = {});
 // Undoes an operation, last step first: files are moved back, outputs and unmodified copies go to

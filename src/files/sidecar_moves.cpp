@@ -37,14 +37,16 @@ bool HasNamesakes(const std::string& picture) {
   });
 }
 
-// Whether "photo.xmp" goes with a picture "photo.nef".
-bool GoesWith(const std::string& sidecar, const std::string& picture) {
+// Whether "photo.xmp" goes with a picture "photo.nef"; to copies also if others share it.
+bool GoesWith(const std::string& sidecar, const std::string& picture, bool copied) {
   platform::FileView file;
   XmpTags tags;
   if (file.Open(sidecar) && ReadXmpTags(file.Bytes(), tags) == Status::Ok &&
       !tags.sidecarFor.empty())
     return EqualIgnoringCase(tags.sidecarFor, platform::ExtensionOf(picture));
-  return !HasNamesakes(picture);
+  const platform::PathParts parts = platform::SplitPath(picture);
+  if (!copied || parts.extension.empty()) return !HasNamesakes(picture);
+  return !platform::IsRegularFile(platform::JoinPath({parts.drive, parts.folder, parts.base, {}}));
 }
 
 // The names a picture's sidecars may have, and that of its comment file; the first is always its
@@ -63,10 +65,11 @@ std::vector<std::string> NamesBeside(const std::string& picture,
 
 // Whether the i-th name is that of an existing file that belongs to the picture; a folder never
 // does. The first name, too, may be shared if the picture has no extension.
-bool Belongs(const std::vector<std::string>& names, size_t i, const std::string& picture) {
+bool Belongs(const std::vector<std::string>& names, size_t i, const std::string& picture,
+             bool copied = false) {
   if (names[i].empty() || !platform::IsRegularFile(names[i])) return false;
   const bool shared = i == 1 || (i == 0 && platform::ExtensionOf(picture).empty());
-  return !shared || GoesWith(names[i], picture);
+  return !shared || GoesWith(names[i], picture, copied);
 }
 
 // Sidecars have none of their own.
@@ -77,12 +80,12 @@ bool IsSidecar(const std::string& path) {
 }  // namespace
 
 std::vector<RenamedFile> SidecarMoves(const std::string& from, const std::string& to,
-                                      const std::string& commentExtension) {
+                                      const std::string& commentExtension, bool copied) {
   std::vector<RenamedFile> moves;
   if (IsSidecar(from)) return moves;
   const auto old = NamesBeside(from, commentExtension), wanted = NamesBeside(to, commentExtension);
   for (size_t i = 0; i < old.size(); ++i) {
-    if (old[i] != wanted[i] && !wanted[i].empty() && Belongs(old, i, from))
+    if (old[i] != wanted[i] && !wanted[i].empty() && Belongs(old, i, from, copied))
       moves.push_back({old[i], wanted[i]});
   }
   return moves;

@@ -13,9 +13,11 @@ namespace fotomill {
 // "photo.nef.txt", for the extension "txt", unless the picture has no extension of its own. No
 // extension: there are no comment files.
 
-// The files that move along when a picture gets a new path, with theirs.
+// The files that move along when a picture gets a new path, with theirs. If it is `copied`, those
+// that it shares, too.
 std::vector<RenamedFile> SidecarMoves(const std::string& from, const std::string& to,
-                                      const std::string& commentExtension = {});
+                                      const std::string& commentExtension = {},
+                                      bool copied = false);
 // The files that are removed with a picture.
 std::vector<std::string> SidecarsOf(const std::string& picture,
                                     const std::string& commentExtension = {});

@@ -208,6 +208,26 @@ TEST_F(FileOperationTest, UndoneCopiesTakeTheirOwnSidecars) {
   EXPECT_THAT(Names("to"), IsEmpty());
 }
 
+// A sidecar that pictures share goes to the copies of each.
+TEST_F(FileOperationTest, SharedSidecarsAreCopied) {
+  for (const char* name : {"a.nef", "a.xmp", "b.png.txt", "b.png.xmp"}) WriteText(From(name), name);
+  for (const std::vector<std::string>& listed :
+       {std::vector{From("a.nef")}, std::vector{From("a.png")},
+        std::vector{From("a.nef"), From("a.png")},
+        std::vector{From("a.xmp"), From("a.png"), From("a.nef")}}) {
+    const FileOperationResult done =
+        CarryOut(PlanFileOperation(FileOperationKind::Copy, listed, folder_.Path("to")));
+    EXPECT_THAT(done.failures, IsEmpty());
+    EXPECT_EQ(ReadText(To("a.xmp")), "a.xmp");
+    EXPECT_EQ(Names("to").size(), listed.size() == 1 ? 2u : 3u);
+    EXPECT_THAT(Revert(done.done).failures, IsEmpty());
+    EXPECT_THAT(Names("to"), IsEmpty());
+  }
+  (void)CarryOut(
+      PlanFileOperation(FileOperationKind::Copy, {From("b.png.txt")}, folder_.Path("to")));
+  EXPECT_THAT(Names("to"), ElementsAre("b.png.txt"));
+}
+
 // Every operation on the system fails once: what did not go to the trash is where it was, and undo
 // brings back the rest.
 TEST_F(FileOperationTest, FaultsInTheTrashLoseNothing) {
