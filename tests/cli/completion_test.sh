@@ -72,7 +72,7 @@ if command -v zsh > /dev/null; then
   zshCheck fotomill help "" "json:what --json prints"
   zshCheck fotomill config "" "unset:reset a key to its default"
   zshCheck fotomill --color never config get "" "UndoLevels:How many file operations"
-  zshCheck fotomill config get "" "ArchiveCopyDepth:unused in this build"
+  zshCheck fotomill config get "" "SecureDelete:unused in this build"
   zshCheck fotomill --set "" "UndoLevels=:How many"
   zshCheck fotomill convert --overwrite "" "keep-both:"
   zshCheck fotomill convert --overwrite= "keep-both:"

@@ -50,8 +50,8 @@ STEPS = [
      None),
     (["set", "AlphaBackground", "#FF80"], 2, b"", "#RRGGBB", None),
     (["set", "AlphaBackground", "transparent"], 2, b"", "a name such as orange", None),
-    (["set", "-n", "ArchiveCopyDepth", "3"], 0, b"ArchiveCopyDepth: 0 -> 3\n",
-     "This build does not use ArchiveCopyDepth.", None),
+    (["set", "-n", "SecureDelete", "1"], 0, b"SecureDelete: 0 -> 1\n",
+     "This build does not use SecureDelete.", None),
     (["describe", "PngCompression"], 0,
      b"PngCompression=9\n    Default: 9\n    Takes a number from 0 to 9.\n"
      b"    Compression effort of PNG files, 0 to 9. Always lossless; 9 takes longest\n"
@@ -107,8 +107,8 @@ def test_json(folder):
     check("number", (quality["name"], quality["type"], quality["value"], quality["default"],
                      quality["values"], quality["used"]),
           ("JpegCompression", 0x44, 75, 75, "a number from 0 to 100", True))
-    check("unused", (by_name["ArchiveCopyDepth"]["used"],
-                     by_name["ArchiveCopyDepth"]["description"]),
+    check("unused", (by_name["SecureDelete"]["used"],
+                     by_name["SecureDelete"]["description"]),
           (False, ""))
     used = run(folder, "config", "list", "--used")[1].decode("latin-1").split("\n")
     check("used", [line.split("=")[0] for line in used[:-1]],
