@@ -16,6 +16,10 @@ OutputTarget TargetOf(const std::string& source, const BatchOutput& output, cons
   return {&output, fallback.formatIndex, fallback.extension, true, {}};
 }
 
+void BindPluginRow(const OutputTarget& target) {
+  if (target.formatIndex == kSpareRow) (void)FindPluginFormat("x." + target.extension);
+}
+
 Status FindQuality(uint64_t most,
                    const std::function<Status(int32_t quality, uint64_t& bytes)>& trial,
                    int32_t& quality, uint64_t& smallest) {

@@ -50,6 +50,10 @@ struct FallbackFormat {
 OutputTarget TargetOf(const std::string& source, const BatchOutput& output, const BatchJob& job,
                       const FallbackFormat& fallback);
 
+// All plug-ins share a row of the format table, a row of its own on each thread, and reading a
+// source may bind it to the source's format. Binds it to the target's, if that is a plug-in's.
+void BindPluginRow(const OutputTarget& target);
+
 // Writes a picture in the best quality, 1 to 100, with a file size of at most `most` bytes; `write`
 // does a trial or writes the output. UnsuitableImage (13) if even the lowest quality is too large,
 // with its size in `smallest`; else the status of `write`.

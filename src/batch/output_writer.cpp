@@ -257,7 +257,6 @@ Status OutputWriter::AddPage(SequenceWriter& sequence, PictureRecord& picture, i
 
 Status OutputWriter::WriteSequence(const PreparedOutput& output, const Destination& destination,
                                    const WriteOptions& options, std::string& hint) const {
-  const FormatEntry& row = FormatRow(output.target.formatIndex);
   const ReadRequest request{.fileName = std::string(output.picture.fileName.view()),
                             .partial = function_.salvage,
                             .stop = job_.stop.Token(),
@@ -273,6 +272,9 @@ Status OutputWriter::WriteSequence(const PreparedOutput& output, const Destinati
   SequencePointer sequence;
   const SequenceFacts facts{
       .count = count, .animated = source.Animated(), .rounds = source.Rounds()};
+  BindPluginRow(output.target);  // opening the source may have bound it to another format
+  const FormatEntry& row = FormatRow(output.target.formatIndex);
+  const uint32_t kept = row.keepsMetadata;
   RETURN_IF_BAD(row.sequence(destination.path, facts, options, sequence));
   PicturePointer page;
   int32_t delayMs = 0;
@@ -281,11 +283,12 @@ Status OutputWriter::WriteSequence(const PreparedOutput& output, const Destinati
     if (status == Status::FileReadError) hint = function_.salvageHint;
     RETURN_IF_BAD(status);
     if (page->shortfall != Status::Ok) output.picture.shortfall = page->shortfall;
+    BindPluginRow(output.target);
     RETURN_IF_BAD(FitPage(*page, output.target, hint));
     RETURN_IF_BAD(AddPage(*sequence, *page, delayMs, output.target, hint));
     if (job_.stop.Token().Asked()) return Status::FunctionCancelled;
   }
-  output.picture.lostMetadata = static_cast<uint8_t>(kAllMetadata & ~row.keepsMetadata);
+  output.picture.lostMetadata = static_cast<uint8_t>(kAllMetadata & ~kept);
   return sequence->Finish();
 }
 

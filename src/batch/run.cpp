@@ -154,12 +154,14 @@ class Batch {
         status != Status::Ok) {
       return {Failure(file, status, LoadHint(file.name, status, picture.get()))};
     }
+    const bool animated =
+        picture->formatIndex != kNoFormat && FormatRow(picture->formatIndex).animate != nullptr;
     if (function_.transform && !IsOnlyPlanned()) {
       if (const Status status = function_.transform(*picture); status != Status::Ok)
         return {Failure(file, status, WorkHint(status))};
     }
     for (const size_t k : open) {
-      ChoosePages(*picture, targets[k]);
+      ChoosePages(*picture, animated, targets[k]);
       if (targets[k].pages > 0) {
         if (function_.oneFile) return {Failure(file, Status::UnsuitableImage, Tr(kOneFile))};
         if (!ProduceNumbered(i, targets[k], held, outcomes)) return {};
@@ -197,10 +199,11 @@ class Batch {
   }
 
   // Decides whether an output gets several pictures, and how.
-  void ChoosePages(const PictureRecord& picture, OutputTarget& target) const {
+  void ChoosePages(const PictureRecord& picture, bool animated, OutputTarget& target) const {
     if (picture.pageCount < 2 || function_.page > 0 || picture.formatIndex == kNoFormat) return;
-    const FormatEntry &from = FormatRow(picture.formatIndex), &to = FormatRow(target.formatIndex);
-    const bool animation = from.animate != nullptr && (to.flags & FMT_FRAMES) != 0;
+    BindPluginRow(target);
+    const FormatEntry& to = FormatRow(target.formatIndex);
+    const bool animation = animated && (to.flags & FMT_FRAMES) != 0;
     const bool all =
         function_.page == kAllPages ||
         std::ranges::find(job_.everyPage, to.extension.view()) != job_.everyPage.end();
@@ -247,9 +250,7 @@ class Batch {
       if (status != Status::Ok) return Failure(file, status);
     }
     PictureRecord& own = copy != nullptr ? *copy : *picture;
-    // The source may have bound the shared plug-in row to its own format; bind it to the
-    // destination's.
-    if (target.formatIndex == kSpareRow) (void)FindPluginFormat("x." + target.extension);
+    BindPluginRow(target);
     std::string hint;
     PreparedOutput output{.picture = own, .target = target};
     const Status status =

@@ -104,6 +104,15 @@ with tempfile.TemporaryDirectory() as place:
         for test in (test_jxl, test_avif):
             (folder / kind).mkdir(exist_ok=True)
             test(folder / (kind + ".png"), folder / kind, ["--data", folder / "data"])
+    # several at a time, on several threads, also from one plug-in's format to another's
+    (folder / "several").mkdir()
+    sources = [folder / "opaque.png", folder / "clear.png"]
+    for to in ("jxl", "avif", "png"):
+        run(FOTOMILL, "-q", "--data", folder / "data", "convert", "--jobs", "2", *sources, "--to",
+            to, "--dest", folder / "several")
+        sources = [folder / "several" / f"{kind}.{to}" for kind in ("opaque", "clear")]
+    check("several", [len(list(frames(path))) for path in sources if path.exists()],
+          [len(DELAYS)] * 2)
     # pages that are no frames get files of their own
     pages = [Image.new("RGB", (8 + i, 9), (i, 2, 3)) for i in range(2)]
     pages[0].save(folder / "pages.tif", save_all=True, append_images=pages[1:])
