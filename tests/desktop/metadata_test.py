@@ -100,6 +100,31 @@ def edit_values(folder):
         desktop.wait(r"prompt exif discard")
 
 
+def close_while_writing(folder):
+    """A large file takes a while. The values are not thrown away before it is written."""
+    if Desktop.managed:
+        return  # the progress window would take the key
+    pictures = folder / "pictures"
+    tagged(pictures, ["one.jpg"])
+    os.truncate(pictures / "one.jpg", 400 << 20)
+    with Desktop(folder, pictures, settings=["ExifConfirmWrite=0"]) as desktop:
+        desktop.wait(r"lines=1 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("ctrl+a", "ctrl+alt+e")
+        desktop.wait(r"exif-edit files=1")
+        desktop.focus("^Edit EXIF: one.jpg$")
+        choose(desktop, "Person")
+        desktop.type("x")
+        desktop.wait(r"exif-edit-value Person who created the image: ")
+        desktop.key("ctrl+s", "Escape")
+        desktop.wait(r"exif-edit writing")
+        desktop.wait(r"prompt exif writing")
+        desktop.screenshot("exif-writing")
+        desktop.key("Escape")
+        desktop.wait(r"batch ended status=0")
+        desktop.focus("^Edit EXIF: one.jpg$")
+
+
 def places_of(folder):
     return (folder / "data/Locations.gps").read_text()
 
@@ -331,4 +356,4 @@ def file_times(folder):
 
 
 if __name__ == "__main__":
-    run(edit_values, places, strip, file_times)
+    run(edit_values, close_while_writing, places, strip, file_times)

@@ -368,12 +368,22 @@ void ExifEditFrame::Written(bool errors) {
   Read();
 }
 
+// The changes are kept until all files are written, as some may fail.
 void ExifEditFrame::OnClose(wxCloseEvent& event) {
-  if (event.CanVeto() && editor_.HasChanges() && !writing_) {
-    wxMessageDialog dialog(this, Label("Close without writing the changes?"), Label("Edit EXIF"),
+  if (event.CanVeto() && editor_.HasChanges()) {
+    const wxString question =
+        writing_ ? Label(
+                       "The values are still being written. Close anyway? Changes to files that "
+                       "cannot be written would be lost.")
+                 : Label("Close without writing the changes?");
+    wxMessageDialog dialog(this, question, Label("Edit EXIF"),
                            wxOK | wxCANCEL | wxCANCEL_DEFAULT | wxICON_QUESTION);
-    dialog.SetOKCancelLabels(Label("&Discard"), Label("&Keep editing"));
-    LogEvent("prompt", "exif discard");
+    if (writing_) {
+      dialog.SetOKCancelLabels(Label("&Close"), Label("&Keep open"));
+    } else {
+      dialog.SetOKCancelLabels(Label("&Discard"), Label("&Keep editing"));
+    }
+    LogEvent("prompt", writing_ ? "exif writing" : "exif discard");
     if (dialog.ShowModal() != wxID_OK) return event.Veto();
   }
   event.Skip();
