@@ -39,6 +39,7 @@ void FolderReader::List(const std::string& folder, bool namesFirst, bool subfold
 
 void FolderReader::ListFound(const std::string& folder, std::vector<std::string> names) {
   facts_.Stop();
+  tags_.Stop();  // as they are by number of an item
   listing_.Start(
       [this, folder, names = std::move(names)](const StopToken& stop,
                                                const LooseWork::Report& report) {
