@@ -2,6 +2,7 @@
 
 #include <wx/frame.h>
 #include <wx/msgdlg.h>
+#include <wx/richmsgdlg.h>
 
 #include <algorithm>
 #include <map>
@@ -21,6 +22,7 @@
 #include "platform/held_file.h"
 #include "platform/paths.h"
 #include "platform/temporary_folder.h"
+#include "settings/configuration.h"
 #include "settings/settings.h"
 #include "texts/texts.h"
 
@@ -65,7 +67,9 @@ void Finish(Shell& shell, const std::string& archive, const std::shared_ptr<Unpa
 
 void OpenArchiveFolder(Shell& shell, const std::string& archive) {
   const auto known = Kept().find(archive);
-  if (known != Kept().end() && known->second->stamp == platform::StampOf(archive)) {
+  // Systems clean up their temporary folders.
+  if (known != Kept().end() && known->second->stamp == platform::StampOf(archive) &&
+      platform::IsFolder(known->second->folder)) {
     shell.Tabs().Show(known->second->folder);
     return;
   }
@@ -108,6 +112,21 @@ bool RefusesChange(wxWindow* parent, const std::vector<std::string>& paths) {
   if (!unpacked) return false;
   LogEvent("prompt", "archive-stays");
   wxMessageBox(Label(kUnpackedFilesStay), Label("Archive"), wxOK | wxICON_INFORMATION, parent);
+  return true;
+}
+
+bool MayOpenCopy(wxWindow* parent, const wxString& question) {
+  if (settings.ArchivePromptExternal == 0) return true;
+  wxRichMessageDialog dialog(parent, question, Label("Archive"), wxOK | wxCANCEL | wxICON_QUESTION);
+  dialog.SetExtendedMessage(Label("This is a temporary copy. Changes to it will be lost."));
+  dialog.SetOKCancelLabels(Label("&Open"), wxID_CANCEL);
+  dialog.ShowCheckBox(Label("Do not ask again (can be re-enabled in Setup)"));
+  LogEvent("prompt", "external");
+  if (dialog.ShowModal() != wxID_OK) return false;
+  if (dialog.IsCheckBoxChecked()) {
+    settings.ArchivePromptExternal = 0;
+    (void)SaveConfiguration();
+  }
   return true;
 }
 

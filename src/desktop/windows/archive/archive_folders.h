@@ -3,6 +3,7 @@
 #include <string>
 #include <vector>
 
+class wxString;
 class wxWindow;
 
 namespace fotomill::desktop {
@@ -22,6 +23,10 @@ std::string ArchiveOfFolder(const std::string& folder);
 bool RefusesChange(wxWindow* parent, const std::vector<std::string>& paths);
 // Why, a sentence in English, for translation.
 extern const char* const kUnpackedFilesStay;
+
+// Asks before another program opens a temporary copy of a file in an archive, unless this is turned
+// off by ArchivePromptExternal. True to go on.
+bool MayOpenCopy(wxWindow* parent, const wxString& question);
 
 // The folder for results of functions on a folder: that of the archive, if the folder belongs to an
 // unpacked one, else the folder itself.

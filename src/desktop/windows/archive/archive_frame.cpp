@@ -7,7 +7,6 @@
 #include <wx/frame.h>
 #include <wx/msgdlg.h>
 #include <wx/panel.h>
-#include <wx/richmsgdlg.h>
 #include <wx/sizer.h>
 #include <wx/stattext.h>
 
@@ -300,20 +299,10 @@ void ArchiveFrame::View() {
 
 void ArchiveFrame::Opened(const std::string& file) {
   const bool picture = FindFormatByName(file) != kNoFormat;
-  if (!picture && settings.ArchivePromptExternal != 0) {
-    wxRichMessageDialog dialog(
-        this, Label("Open %1 with its program?", Shown(platform::FileNameOf(file))), Label("View"),
-        wxOK | wxCANCEL | wxICON_QUESTION);
-    dialog.SetExtendedMessage(Label("This is a copy; changes do not go into the archive."));
-    dialog.SetOKCancelLabels(Label("&Open"), wxID_CANCEL);
-    dialog.ShowCheckBox(Label("Do not ask again (can be re-enabled in Setup)"));
-    LogEvent("prompt", "external");
-    if (dialog.ShowModal() != wxID_OK) return;
-    if (dialog.IsCheckBoxChecked()) {
-      settings.ArchivePromptExternal = 0;
-      (void)SaveConfiguration();
-    }
-  }
+  const auto question = [&] {
+    return Label("Open %1 with its program?", Shown(platform::FileNameOf(file)));
+  };
+  if (!picture && !MayOpenCopy(this, question())) return;
   LogEvent("archive-view", file);
   if (picture) {
     shell_.Pictures().View({file}, file);

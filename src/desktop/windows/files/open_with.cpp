@@ -6,6 +6,7 @@
 #include <wx/menu.h>
 #include <wx/msgdlg.h>
 
+#include <algorithm>
 #include <functional>
 #include <memory>
 #include <utility>
@@ -13,9 +14,11 @@
 #include "batch/external_program.h"
 #include "core/workers/background_task.h"
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/archive/archive_folders.h"
 #include "desktop/windows/shell/shell.h"
 #include "desktop/windows/widgets/wx_text.h"
 #include "platform/clock.h"
+#include "platform/paths.h"
 #include "texts/texts.h"
 
 namespace fotomill::desktop {
@@ -73,6 +76,20 @@ class Host : public ExternalProgramHost {
   const double started_ = platform::MonotonicSeconds();
 };
 
+// Asks if a file is one unpacked from an archive.
+bool MayOpen(wxWindow* parent, const platform::Program& program,
+             const std::vector<std::string>& files) {
+  const bool unpacked = std::ranges::any_of(
+      files, [](const std::string& file) { return !ArchiveOfFolder(file).empty(); });
+  if (!unpacked) return true;
+  const wxString name = Shown(program.name);
+  return MayOpenCopy(
+      parent,
+      files.size() == 1
+          ? Label("Open %1 with %2?", Shown(platform::FileNameOf(files.front())), name)
+          : LabelCount("Open %1 file with %2?", "Open %1 files with %2?", files.size(), name));
+}
+
 }  // namespace
 
 void ExternalPrograms::Start(const std::string& file, std::vector<std::string> command,
@@ -87,6 +104,7 @@ void ExternalPrograms::Open(const std::string& file) { Start(file, {}, 0); }
 
 void ExternalPrograms::OpenWith(const platform::Program& program,
                                 const std::vector<std::string>& files) {
+  if (!MayOpen(&shell_.Window(), program, files)) return;
   LogEvent("open-with", program.name);
   std::vector<std::vector<std::string>> commands = platform::CommandsFor(program, files);
   if (commands.empty()) return Start(files.front(), {}, 0);
