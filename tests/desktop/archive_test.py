@@ -49,6 +49,71 @@ def archive_as_folder(folder):
         assert any(path.stem == "one" for path in pictures.iterdir())
 
 
+def drag_to_home(desktop, place):
+    """Drags a file of the list to the first folder of the tree."""
+    window = desktop.focus("Fotomill Professional")
+    desktop.key("ctrl+a")
+    desktop.wait(r"selected=3 ")
+    desktop.xdotool("mousemove", "--window", window, 100, 300)
+    desktop.xdotool("click", "--repeat", 150, "--delay", 5, 4)
+    desktop.xdotool("mousemove", "--window", window, *place)
+    desktop.settle()
+    desktop.xdotool("mousedown", 1)
+    desktop.settle()
+    for part in range(1, 6):
+        x, y = (start + (end - start) * part // 5 for start, end in zip(place, (100, 97)))
+        desktop.xdotool("mousemove", "--window", window, x, y)
+        desktop.settle()
+    desktop.wait(r"drag 3 copy")
+    desktop.xdotool("mouseup", 1)
+    desktop.wait(r"files Copy of 3 files done=3")
+
+
+def copies_out(folder):
+    """Files are dragged out of an archive in both views, and opened with another program."""
+    pictures = archive_of_pictures(folder)
+    home, marker = folder / "home", folder / "opened"
+    programs = home / ".local/share/applications"
+    programs.mkdir(parents=True)
+    (home / ".local/share/mime").mkdir()
+    (home / ".local/share/mime/globs2").write_text("50:image/png:*.png\n")
+    (programs / "Marker.desktop").write_text(
+        f"[Desktop Entry]\nType=Application\nName=Marker\nExec=touch {marker} %F\n"
+        "MimeType=image/png;\n")
+    (programs / "mimeinfo.cache").write_text("[MIME Cache]\nimage/png=Marker.desktop;\n")
+    with Desktop(folder, pictures) as desktop:
+        desktop.wait(r"lines=1 .*missing=0 listing=0")
+        desktop.focus("Fotomill Professional")
+        desktop.key("Home", "Return")
+        desktop.wait(r"browser tabs=2 .*missing=0 listing=0 .*/trip.zip")
+        for view, place in (("ctrl+4", (420, 240)), ("ctrl+2", (400, 290))):
+            desktop.focus("Fotomill Professional")
+            desktop.key(view)
+            drag_to_home(desktop, place)
+            for name in ("one.png", "notes.txt", "sub/two.jpg"):
+                (home / name).unlink()
+            (home / "sub").rmdir()
+        desktop.key("End", "shift+F10")
+        desktop.wait(r"programs Marker;")
+        desktop.settle()
+        desktop.key("Up", "Right", "Return")
+        desktop.wait(r"prompt external")
+        desktop.focus("^Archive$", native=True)
+        desktop.screenshot("archive-open-with")
+        desktop.key("Escape")
+        desktop.focus("Fotomill Professional")
+        assert not marker.exists()
+        desktop.key("shift+F10")
+        desktop.wait(r"programs Marker;")
+        desktop.settle()
+        desktop.key("Up", "Right", "Return")
+        desktop.wait(r"prompt external")
+        desktop.focus("^Archive$", native=True)
+        desktop.key("alt+o")
+        desktop.wait(r"external-program ended")
+        assert marker.exists()
+
+
 def manager(folder):
     pictures = archive_of_pictures(folder)
     out = folder / "out"
@@ -117,4 +182,4 @@ def create(folder):
 
 
 if __name__ == "__main__":
-    run(archive_as_folder, manager, create)
+    run(archive_as_folder, copies_out, manager, create)

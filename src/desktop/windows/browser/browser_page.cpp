@@ -451,15 +451,20 @@ std::string BrowserPage::FolderAt(const wxPoint& place) const {
   return line != kNoLine && model_.Line(line).folder ? model_.PathOfLine(line) : model_.Folder();
 }
 
-void BrowserPage::BeginDrag() {
-  const std::vector<std::string> chosen = model_.PathsForFunction();
-  if (chosen.empty()) return;
-  FileListData files(chosen);
-  wxDropSource source(files, this);
+DraggedFiles BrowserPage::FilesToDrag() const {
   // unpacked files must stay for the others that use them
-  const bool mayMove = host_.NoteAbout(model_.Folder()).empty();
-  LogEvent("drag", std::to_string(chosen.size()) + (mayMove ? "" : " copy"));
-  if (source.DoDragDrop(mayMove ? wxDrag_AllowMove : wxDrag_CopyOnly) == wxDragMove) Reload();
+  DraggedFiles dragged{model_.PathsForFunction(), host_.NoteAbout(model_.Folder()).empty()};
+  LogEvent("drag", std::to_string(dragged.paths.size()) + (dragged.mayMove ? "" : " copy"));
+  return dragged;
+}
+
+void BrowserPage::BeginDrag() {
+  const DraggedFiles dragged = FilesToDrag();
+  if (dragged.paths.empty()) return;
+  FileListData files(dragged.paths);
+  wxDropSource source(files, this);
+  const int flags = dragged.mayMove ? wxDrag_AllowMove : wxDrag_CopyOnly;
+  if (source.DoDragDrop(flags) == wxDragMove) Reload();
 }
 
 }  // namespace fotomill::desktop

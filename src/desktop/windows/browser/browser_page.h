@@ -21,6 +21,7 @@ namespace fotomill::desktop {
 
 class BrowserBar;
 class DetailsList;
+struct DraggedFiles;
 class FolderNote;
 class FolderProblem;
 class ThumbnailCanvas;
@@ -149,6 +150,7 @@ class BrowserPage : public wxPanel {
   void ThumbnailsCame(const std::vector<ThumbnailLoader::Result>& results);
   void Activate(size_t line);
   std::string FolderAt(const wxPoint& place) const;
+  DraggedFiles FilesToDrag() const;
   void BeginDrag();
 
   BrowserHost& host_;

@@ -37,6 +37,7 @@ void BrowserPage::ShowView() {
     events.sort = [this](int32_t sort) {
       SetSort(sort, model_.Modes().sort == sort && !model_.Descending());
     };
+    events.dragBegins = [this] { return FilesToDrag(); };
     details_ = new DetailsList(views_, model_, host_.Columns(), thumbnails_, events);
     views_->AddPage(details_, Label("Details"));
   }

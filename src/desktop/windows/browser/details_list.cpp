@@ -3,8 +3,10 @@
 #include <wx/menu.h>
 
 #include <algorithm>
+#include <utility>
 
 #include "desktop/models/shell/event_log.h"
+#include "desktop/windows/files/file_list_data.h"
 #include "desktop/windows/widgets/text_sizes.h"
 #include "desktop/windows/widgets/wx_text.h"
 
@@ -57,6 +59,21 @@ DetailsList::DetailsList(wxWindow* parent, BrowserModel& model, DetailColumns& c
   Bind(wxEVT_DATAVIEW_ITEM_CONTEXT_MENU, [this](wxDataViewEvent& event) {
     const size_t line = event.GetItem().IsOk() ? lines_->GetRow(event.GetItem()) : kNoLine;
     events_.contextMenu(line, ScreenToClient(wxGetMousePosition()));
+  });
+  Bind(wxEVT_CHAR_HOOK, [this](wxKeyEvent& event) {
+    const int key = event.GetKeyCode();
+    const bool shiftF10 = key == WXK_F10 && event.ShiftDown();
+    if (!shiftF10 && key != WXK_WINDOWS_MENU && key != WXK_MENU) return event.Skip();
+    const size_t focus = model_.Selected().Focus();
+    const wxRect line =
+        focus == kNoLine ? wxRect() : GetItemRect(lines_->GetItem(static_cast<unsigned>(focus)));
+    events_.contextMenu(focus, line.GetBottomLeft());
+  });
+  EnableDragSource(wxDataFormat(wxDF_FILENAME));
+  Bind(wxEVT_DATAVIEW_ITEM_BEGIN_DRAG, &DetailsList::OnBeginDrag, this);
+  GetMainWindow()->Bind(wxEVT_LEFT_UP, [this](wxMouseEvent& event) {
+    beforePress_.clear();
+    event.Skip();
   });
   Bind(wxEVT_DATAVIEW_COLUMN_HEADER_CLICK, [this](wxDataViewEvent& event) {
     const int32_t sort = AllDetails()[event.GetDataViewColumn()->GetModelColumn()].sort;
@@ -181,8 +198,26 @@ void DetailsList::ReadSelection() {
   }
   const wxDataViewItem current = GetCurrentItem();
   const size_t focus = current.IsOk() ? lines_->GetRow(current) : model_.Selected().Focus();
+  if (wxGetMouseState().LeftIsDown()) beforePress_ = model_.Selected().SelectedLines();
   model_.Selected().Assign(std::move(selected), focus, focus);
   events_.selectionChanged();
+}
+
+// Pressing on one of several selected lines selects it alone, so they are selected again first.
+void DetailsList::OnBeginDrag(wxDataViewEvent& event) {
+  const size_t line = event.GetItem().IsOk() ? lines_->GetRow(event.GetItem()) : kNoLine;
+  const std::vector<size_t> before = std::exchange(beforePress_, {});
+  if (std::ranges::find(before, line) != before.end() && before.back() < model_.LineCount()) {
+    std::vector<bool> selected(model_.LineCount());
+    for (const size_t other : before) selected[other] = true;
+    model_.Selected().Assign(std::move(selected), line, line);
+    ShowSelection();
+    events_.selectionChanged();
+  }
+  const DraggedFiles dragged = events_.dragBegins();
+  if (dragged.paths.empty()) return event.Veto();
+  event.SetDataObject(new FileListData(dragged.paths));
+  event.SetDragFlags(dragged.mayMove ? wxDrag_AllowMove : wxDrag_CopyOnly);
 }
 
 }  // namespace fotomill::desktop

@@ -3,12 +3,20 @@
 #include <wx/dataview.h>
 
 #include <functional>
+#include <string>
+#include <vector>
 
 #include "desktop/models/browser/browser_model.h"
 #include "desktop/models/browser/detail_columns.h"
 #include "desktop/windows/browser/details_icons.h"
 
 namespace fotomill::desktop {
+
+// What is dragged out of a browser.
+struct DraggedFiles {
+  std::vector<std::string> paths;
+  bool mayMove = true;  // false: only copies
+};
 
 // The details view of a browser: a native list, for screen readers.
 class DetailsList : public wxDataViewCtrl {
@@ -19,7 +27,7 @@ class DetailsList : public wxDataViewCtrl {
     std::function<void(size_t line)> activated;                    // double click or Return
     std::function<void(size_t line, const wxPoint&)> contextMenu;  // relative to the list
     std::function<void(int32_t sortMode)> sort;  // a column header was clicked
-    std::function<void()> dragBegins;            // with the selection
+    std::function<DraggedFiles()> dragBegins;    // with the selection
   };
 
   // `columns` belong to the frame: all lists share them.
@@ -42,6 +50,7 @@ class DetailsList : public wxDataViewCtrl {
  private:
   class Lines;
   void ReadSelection();
+  void OnBeginDrag(wxDataViewEvent& event);
   void ShowLines();
 
   BrowserModel& model_;
@@ -51,6 +60,7 @@ class DetailsList : public wxDataViewCtrl {
   DetailsIcons icons_;
   wxObjectDataPtr<Lines> lines_;
   bool changing_ = false;  // events are caused by the program
+  std::vector<size_t> beforePress_;  // lines selected before the pressed button changed that
 };
 
 }  // namespace fotomill::desktop

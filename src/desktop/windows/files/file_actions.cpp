@@ -292,7 +292,9 @@ void FileActions::Drop(const std::vector<std::string>& paths, const std::string&
                        bool move) {
   std::vector<std::string> others = paths;
   std::erase(others, folder);  // a slip of the mouse drops a folder on itself
-  Do(move ? FileOperationKind::Move : FileOperationKind::Copy, others, folder);
+  // out of an archive, files are copied
+  const bool unpacked = !paths.empty() && !ArchiveOfFolder(paths.front()).empty();
+  Do(move && !unpacked ? FileOperationKind::Move : FileOperationKind::Copy, others, folder);
 }
 
 void FileActions::Rename(const std::string& path, const std::string& name) {

@@ -329,8 +329,7 @@ void BrowserTabs::RenameFile(const std::string& path, const std::string& name) {
 
 void BrowserTabs::DropFiles(const std::vector<std::string>& files, const std::string& folder,
                             bool move) {
-  const bool unpacked = !files.empty() && !ArchiveOfFolder(files.front()).empty();
-  shell_.Files().Drop(files, folder, move && !unpacked);
+  shell_.Files().Drop(files, folder, move);
 }
 
 void BrowserTabs::TagSelected(const TagChanges& changes) {
