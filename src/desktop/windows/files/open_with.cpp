@@ -100,7 +100,13 @@ void ExternalPrograms::Start(const std::string& file, std::vector<std::string> c
   if (!RunLoose(run)) host->ShowMessage(kNoExternalProgram);
 }
 
-void ExternalPrograms::Open(const std::string& file) { Start(file, {}, 0); }
+void ExternalPrograms::Open(const std::string& file) {
+  const wxString name = Shown(platform::FileNameOf(file));
+  if (!ArchiveOfFolder(file).empty() &&
+      !MayOpenCopy(&shell_.Window(), Label("Open %1 with its program?", name)))
+    return;
+  Start(file, {}, 0);
+}
 
 void ExternalPrograms::OpenWith(const platform::Program& program,
                                 const std::vector<std::string>& files) {
