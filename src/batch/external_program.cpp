@@ -26,7 +26,7 @@ Status OpenWithExternalProgram(ExternalProgramHost& host, const std::string& fil
 }
 
 bool NeedsExternalProgram(std::string_view fileName) {
-  const int32_t index = FindFormatByName(fileName);
+  const int32_t index = FindReaderByName(fileName);  // AVIF is not AVI, if there is a plug-in
   if (index == kNoFormat) return false;
   const FormatEntry& row = FormatRow(index);
   return (row.flags & (FMT_MEDIA | FMT_TIMED)) != 0 && !CanRead(row);

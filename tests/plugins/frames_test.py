@@ -113,6 +113,8 @@ with tempfile.TemporaryDirectory() as place:
         sources = [folder / "several" / f"{kind}.{to}" for kind in ("opaque", "clear")]
     check("several", [len(list(frames(path))) for path in sources if path.exists()],
           [len(DELAYS)] * 2)
+    found = run(FOTOMILL, "find", folder / "several", "--format", "avif").stdout
+    check("found by format", found.count(b".avif"), 2)
     # pages that are no frames get files of their own
     pages = [Image.new("RGB", (8 + i, 9), (i, 2, 3)) for i in range(2)]
     pages[0].save(folder / "pages.tif", save_all=True, append_images=pages[1:])

@@ -4,6 +4,7 @@
 #include <cstdlib>
 #include <filesystem>
 
+#include "batch/external_program.h"
 #include "core/data_folder.h"
 #include "platform/fault.h"
 #include "platform/paths.h"
@@ -426,6 +427,14 @@ TEST_F(Plugins, SampleModuleReadsEveryVariant) {
   EXPECT_EQ(LoadPicture({.fileName = folder_.Path("short.ppm")}, picture), Status::FileReadError);
   test::WriteText(folder_.Path("huge.ppm"), "P6 99999999 99999999 255\n");
   EXPECT_EQ(LoadPicture({.fileName = folder_.Path("huge.ppm")}, picture), Status::MemoryAllocationError);
+}
+
+TEST_F(Plugins, PicturesWithNamesLikeVideosAreNotPlayed) {
+  EXPECT_TRUE(NeedsExternalProgram("a.avif"));
+  EnablePlugins(SAMPLE_MODULES);
+  EXPECT_TRUE(NeedsExternalProgram("a.avi"));
+  if (FindPluginFormat("a.avif") == kNoFormat) GTEST_SKIP() << "no module for AVIF";
+  EXPECT_FALSE(NeedsExternalProgram("a.avif"));
 }
 
 TEST_F(Plugins, OnePluginFormatConvertsToAnother) {

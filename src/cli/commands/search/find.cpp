@@ -61,7 +61,7 @@ std::string ReadCriteria(FindOptions& options) {
   std::string extension;
   const std::string wrong = ReadSourceFormat(options.format, extension);
   if (wrong.empty())
-    options.criteria.formats = ExtensionsOfFormat(FindFormatByName("x." + extension));
+    options.criteria.formats = ExtensionsOfFormat(FindReaderByName("x." + extension));
   return wrong;
 }
 
