@@ -50,7 +50,7 @@ def setup_round_trip(folder):
         desktop.wait(r"setup applied changed=1")
         assert "JpegCompression=75\n" in ini.read_text(), ini.read_text()
         # A format is switched at once, however the box is closed.
-        desktop.key("Down", "Down", "Down", "Down", "Down", "Down", "Down")
+        desktop.key(*["Down"] * 8)
         desktop.wait(r"setup page=Formats")
         desktop.key("Tab", "Down", "space")
         desktop.wait(r"formats .BGA. .* off")
