@@ -84,10 +84,14 @@ TEST(PictureHash, DigestsSeePixelsOnly) {
   EXPECT_NE(own, other);
 }
 
+// Pictures with usual hashes at the distances that `hashes` have.
 std::vector<PictureHashes> Plain(std::initializer_list<PictureHash> hashes) {
+  constexpr PictureHash kStructure = 0x0f0f0f0f0f0f0f0f;
   std::vector<PictureHashes> all;
-  for (const PictureHash hash : hashes)
+  for (PictureHash hash : hashes) {
+    hash ^= kStructure;
     all.push_back({hash, ~hash, ~hash, ~hash, ~hash, ~hash, ~hash, ~hash});
+  }
   return all;
 }
 
@@ -118,6 +122,13 @@ TEST(SimilarGroups, AreLinkedWithinTheLimit) {
   const auto stopped = FindSimilar(pictures, 3, false, [] { return false; });
   ASSERT_EQ(stopped.size(), 1u) << "equal ones need no comparing";
   EXPECT_EQ(stopped[0].members, (std::vector<size_t>{1, 6}));
+}
+
+TEST(SimilarGroups, BlankPicturesAreNotSimilar) {
+  std::vector<PictureHashes> pictures;
+  for (const uint32_t color : {0x000000u, 0xff8000u, 0xffffffu})
+    pictures.push_back(HashesOf(*MakePicture(64, 48, [=](int32_t, int32_t) { return color; })));
+  EXPECT_EQ(FindSimilar(pictures, 10, true, {}).size(), 0u);
 }
 
 TEST(SimilarGroups, IndexedSearchMatchesAllPairs) {
@@ -154,7 +165,7 @@ TEST(SimilarGroups, OfAHundredThousandTakeSeconds) {
     for (size_t way = 0; way < hashes.size(); ++way)
       hashes[way] = PictureHash{Scatter(i, static_cast<int32_t>(way))} << 32 |
                     Scatter(static_cast<int32_t>(way), -i);
-    if (i % 4 == 0) hashes[0] = 12345;  // as for plain pictures
+    if (i % 4 == 0) hashes[0] = 0x0123456789abcdef;  // as for many copies
     pictures.push_back(hashes);
   }
   const auto begun = std::chrono::steady_clock::now();

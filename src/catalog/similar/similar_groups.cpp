@@ -149,10 +149,14 @@ std::vector<SimilarGroup> GroupsOf(const std::vector<Key>& keys) {
   return groups;
 }
 
-}  // namespace
+// Half of the bits are usual; blank pictures have none, whatever their color.
+bool HasStructure(const PictureHashes& picture) {
+  constexpr int kLeastBits = 8;
+  return std::popcount(picture[0]) >= kLeastBits;
+}
 
-std::vector<SimilarGroup> FindSimilar(std::span<const PictureHashes> pictures, int32_t most,
-                                      bool turned, const std::function<bool()>& goesOn) {
+std::vector<SimilarGroup> GroupsOfStructured(std::span<const PictureHashes> pictures, int32_t most,
+                                             bool turned, const std::function<bool()>& goesOn) {
   const Distinct distinct = DistinctOf(pictures);
   Sets sets(distinct.hashes.size());
   JoinNear(distinct, most, turned, goesOn, sets);
@@ -163,6 +167,24 @@ std::vector<SimilarGroup> FindSimilar(std::span<const PictureHashes> pictures, i
     const PictureHashes& first = pictures[group.members[0]];
     for (const size_t member : group.members)
       group.distance = std::max(group.distance, Apart(first, pictures[member][0], turned));
+  }
+  return groups;
+}
+
+}  // namespace
+
+std::vector<SimilarGroup> FindSimilar(std::span<const PictureHashes> pictures, int32_t most,
+                                      bool turned, const std::function<bool()>& goesOn) {
+  std::vector<PictureHashes> structured;
+  std::vector<size_t> places;
+  for (size_t i = 0; i < pictures.size(); ++i) {
+    if (!HasStructure(pictures[i])) continue;
+    structured.push_back(pictures[i]);
+    places.push_back(i);
+  }
+  std::vector<SimilarGroup> groups = GroupsOfStructured(structured, most, turned, goesOn);
+  for (SimilarGroup& group : groups) {
+    for (size_t& member : group.members) member = places[member];
   }
   return groups;
 }

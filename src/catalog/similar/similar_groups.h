@@ -20,7 +20,8 @@ struct SimilarGroup {
 // is that close to any of its members; with `turned`, in any orientation. Groups are ordered by
 // their first members. Equal hashes are compared once; up to 15 bits, candidates are found by parts
 // of 16 bits, one of which has at most a quarter of the differing bits. 100,000 pictures take
-// seconds. `goesOn` is polled; after false, what was not compared yet is in no group.
+// seconds. Blank pictures and plain gradients are in no group: their hashes are alike, whatever
+// their colors. `goesOn` is polled; after false, what was not compared yet is in no group.
 std::vector<SimilarGroup> FindSimilar(std::span<const PictureHashes> pictures, int32_t most,
                                       bool turned, const std::function<bool()>& goesOn);
 
