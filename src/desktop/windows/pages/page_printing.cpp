@@ -178,6 +178,7 @@ bool PrintOrder(wxWindow& parent, const std::vector<BatchFile>& files, const Pag
                 const PagePlan& plan, wxPrintData& data) {
   FillPrintData(order, data);
   wxPrintDialogData choice(data);
+  choice.SetAllPages(true);  // newer releases of the toolkit would choose the first page
   wxPrinter printer(&choice);
   OrderPrintout printout(parent, files, plan, Label(order.Kind().label));
   LogEvent("prompt", "print");
