@@ -277,10 +277,22 @@ TEST_F(SimilarRun, NamesOfOneFileAreNotCopies) {
 
 TEST_F(SimilarRun, OtherPagesAndArchivesMayHoldMore) {
   using namespace std::string_literals;
-  const std::string frame = ",\0\0\0\0\1\0\1\0\0\2\2D\1\0"s;
+  // 4 x 4 pixels; a clear code before each keeps the codes at 3 bits
+  std::string codes;
+  for (size_t bits = 0, count = 0; const char pixel : "1100100000010101"s) {
+    const auto add = [&](size_t code) {
+      bits |= code << count;
+      for (count += 3; count >= 8; count -= 8, bits >>= 8) codes += static_cast<char>(bits & 0xff);
+    };
+    add(4);
+    add(pixel == '1' ? 1 : 0);
+  }
+  codes += "\5"s;
+  const std::string frame =
+      ",\0\0\0\0\4\0\4\0\0\2"s + static_cast<char>(codes.size()) + codes + "\0"s;
   for (const char* name : {"in/p.gif", "in/q.gif"})
     test::WriteText(Path(name),
-                    "GIF89a\1\0\1\0\x80\0\0\0\0\0\xff\xff\xff"s + frame + frame + ";");
+                    "GIF89a\4\0\4\0\x80\0\0\0\0\0\xff\xff\xff"s + frame + frame + ";");
   test::WriteText(Path("in/archive.zip"), "PK");
   SimilarQuestion question = Question();
   for (const bool exact : {false, true}) {
